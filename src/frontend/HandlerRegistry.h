@@ -1,0 +1,34 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <span>
+#include <string>
+#include <string_view>
+#include <variant>
+
+namespace tavisk {
+
+class ServerCommands;
+
+/// A handler with no, one or two arguments.
+using Handler = std::variant<void (ServerCommands::*)(),                    //
+                             void (ServerCommands::*)(const std::string&),  //
+                             void (ServerCommands::*)(const std::string&, const std::string&)>;
+
+/// One selector of the command table and the member function behind it.
+struct HandlerRow {
+  std::string_view selector;
+  Handler handler;
+};
+
+/// The rows of each family, defined beside the family's handlers.
+std::span<const HandlerRow> helpHandlers();
+std::span<const HandlerRow> dateAndTimeHandlers();
+std::span<const HandlerRow> timeZoneHandlers();
+std::span<const HandlerRow> networkTimeHandlers();
+
+/// Null when no family has the selector.
+const Handler* findHandler(std::string_view selector);
+
+}  // namespace tavisk

@@ -1,0 +1,32 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace tavisk {
+
+/// Well-formed UTF-8 (RFC 3629: no overlong forms, no surrogates, at most U+10FFFF).
+bool isUtf8(std::string_view bytes);
+
+/// A text that is not ours, made harmless for a terminal, a log or a report: C0 and C1 controls, DEL, bidirectional
+/// controls and bytes that are not UTF-8 become \xNN or \u{NNNN}, a backslash is doubled. No control byte leaves it.
+std::string escaped(std::string_view text);
+
+/// ASCII letters in lower case; all other bytes stay.
+std::string lowerCased(std::string_view text);
+
+/// Less than, equal to or greater than 0, by ASCII letters without regard to case.
+int compareIgnoringCase(std::string_view left, std::string_view right);
+
+/// The usual leading-integer conversion: white space, an optional sign, digits; 0 when there are none. Saturates at the
+/// limits of 64 bits.
+std::int64_t leadingInteger(std::string_view text);
+
+/// The pieces between runs of any of the separator characters; no empty pieces.
+std::vector<std::string> split(std::string_view text, std::string_view separators);
+
+}  // namespace tavisk

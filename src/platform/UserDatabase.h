@@ -1,0 +1,26 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace tavisk {
+
+using UserId = unsigned;
+using GroupId = unsigned;
+
+/// Who runs the tool, and the group database.
+class UserDatabase {
+ public:
+  virtual ~UserDatabase() = default;
+
+  virtual UserId realUserId() = 0;
+  /// The process's supplementary groups as getgroups(2) answers with room for `room` ids: absent when there are more.
+  virtual std::optional<std::vector<GroupId>> supplementaryGroups(std::size_t room) = 0;
+  /// Absent when the database has no such group.
+  virtual std::optional<GroupId> groupNamed(const std::string& name) = 0;
+};
+
+}  // namespace tavisk
