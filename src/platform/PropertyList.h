@@ -99,11 +99,13 @@ inline constexpr PropertyListLimits ownFileLimits{64U << 20U, 64, 8'000'000};
 inline constexpr PropertyListLimits foreignFileLimits{1U << 20U, 64, 100'000};
 
 /// Reads XML text. A document type line is accepted and ignored, an internal subset refused; only the five named
-/// entities and numeric ones exist; nothing is fetched. The failure names the offset in bytes and what was expected.
+/// entities and numeric ones exist; nothing is fetched. The root is a value, alone or in a `plist` element. A repeated
+/// key is refused; attributes are ignored. The failure ("read property list", on nothing: the caller knows the path)
+/// names the offset in bytes and what was expected.
 Result<PropertyList> parsePropertyList(std::string_view xml, const PropertyListLimits& limits);
 
 /// XML text with tabs and a final newline. Fails for a text that XML 1.0 cannot hold (control characters, bytes that
-/// are not UTF-8).
+/// are not UTF-8) and for a date outside the years 1 to 9999.
 Result<std::string> writePropertyList(const PropertyList& value);
 
 }  // namespace tavisk

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -12,8 +13,18 @@ namespace tavisk {
 /// Well-formed UTF-8 (RFC 3629: no overlong forms, no surrogates, at most U+10FFFF).
 bool isUtf8(std::string_view bytes);
 
-/// A text that is not ours, made harmless for a terminal, a log or a report: C0 and C1 controls, DEL, bidirectional
-/// controls and bytes that are not UTF-8 become \xNN or \u{NNNN}, a backslash is doubled. No control byte leaves it.
+/// Takes one well-formed code point off the front; absent, and nothing taken, when none stands there.
+std::optional<char32_t> takeCodePoint(std::string_view& bytes);
+
+/// `codePoint` is at most U+10FFFF and no surrogate.
+void appendUtf8(std::string& text, char32_t codePoint);
+
+/// A code point that may change what a terminal shows of other text: C0 and C1 controls, DEL, line and paragraph
+/// separators, bidirectional controls. All are below U+10000.
+bool isControl(char32_t codePoint);
+
+/// A text that is not ours, made harmless for a terminal, a log or a report: what isControl() names and bytes that
+/// are not UTF-8 become \xNN or \u{NNNN}, a backslash is doubled. No control byte leaves it.
 std::string escaped(std::string_view text);
 
 /// ASCII letters in lower case; all other bytes stay.

@@ -1,0 +1,42 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gtest/gtest.h>
+
+#include <limits>
+
+#include "platform/Json.h"
+
+namespace tavisk {
+namespace {
+
+TEST(Json, joinsMembersOfEveryKind) {
+  EXPECT_EQ(JsonObject().str(), "{}");
+  EXPECT_EQ(JsonObject()
+                .text("a", "b")
+                .integer("n", std::numeric_limits<std::int64_t>::min())
+                .boolean("t", true)
+                .boolean("f", false)
+                .null("z")
+                .json("o", JsonObject().json("l", "[1]").str())
+                .str(),
+            R"({"a":"b","n":-9223372036854775808,"t":true,"f":false,"z":null,"o":{"l":[1]}})");
+}
+
+TEST(Json, escapesTexts) {
+  const std::pair<std::string, const char*> cases[] = {
+      {"", R"("")"},
+      {"\"\\/", R"("\"\\/")"},
+      {"\b\f\n\r\t", R"("\b\f\n\r\t")"},
+      {std::string("\0\x1B\x7F", 3), R"("\u0000\u001b\u007f")"},
+      {"\u009B\u202E", R"("\u009b\u202e")"},
+      {"\u00E9\U0001F600", "\"\u00E9\U0001F600\""},
+      {"a\xFF\xE2\x82z", "\"a\uFFFD\uFFFD\uFFFDz\""},
+  };
+  for (const auto& [text, expected] : cases) {
+    EXPECT_EQ(JsonObject().text("", text).str(), "{\"\":" + std::string(expected) + "}");
+    EXPECT_EQ(JsonObject().null(text).str(), "{" + std::string(expected) + ":null}");
+  }
+}
+
+}  // namespace
+}  // namespace tavisk
