@@ -12,8 +12,9 @@ class AdminAuthenticator {
   /// Asks for authorization, once and at once; the host may ask the user for credentials. A refusal is recorded as an
   /// effect.
   virtual void authenticate() = 0;
+  /// This and deauthenticate are also called by the thread that ends the run.
   virtual bool isAuthenticated() = 0;
-  /// Gives the authorization up. Also called by the thread that ends the run.
+  /// Gives the authorization up.
   virtual void deauthenticate() = 0;
 };
 

@@ -19,6 +19,9 @@ struct Failure {
   bool operator==(const Failure&) const = default;
 };
 
+/// "TRIED on ON: WHY", escaped() and on one line; an empty `on` is left out.
+std::string describe(const Failure& failure);
+
 /// A value, or the reason why there is none.
 template <typename Value>
 class [[nodiscard]] Result {
