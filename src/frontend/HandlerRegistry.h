@@ -21,12 +21,16 @@ struct HandlerRow {
   std::string_view selector;
   Handler handler;
 };
+using HandlerRows = std::span<const HandlerRow>;
 
 /// The rows of each family, defined beside the family's handlers.
-std::span<const HandlerRow> helpHandlers();
-std::span<const HandlerRow> dateAndTimeHandlers();
-std::span<const HandlerRow> timeZoneHandlers();
-std::span<const HandlerRow> networkTimeHandlers();
+HandlerRows helpHandlers();
+HandlerRows dateAndTimeHandlers();
+HandlerRows timeZoneHandlers();
+HandlerRows networkTimeHandlers();
+
+/// All families.
+std::span<const HandlerRows> handlerFamilies();
 
 /// Null when no family has the selector.
 const Handler* findHandler(std::string_view selector);

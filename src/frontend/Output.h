@@ -2,9 +2,11 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <cstdio>
+#include <exception>
 #include <mutex>
-#include <stdexcept>
+#include <optional>
 #include <string>
 
 namespace tavisk {
@@ -12,10 +14,9 @@ namespace tavisk {
 /// Standard output as the handlers see it: the one place that prints.
 class Output {
  public:
-  /// Thrown by print and flush when the stream cannot be written; it ends the run.
-  struct Lost : std::runtime_error {
-    Lost(int error, const std::string& message) : std::runtime_error(message), error(error) {}
-    int error;  ///< errno of the failed write
+  /// Thrown when the stream cannot be written; it ends the run. finish() tells why.
+  struct Lost : std::exception {
+    const char* what() const noexcept override { return "standard output cannot be written"; }
   };
 
   /// The stream is not owned.
@@ -26,14 +27,23 @@ class Output {
   void putLine(const char* text);
   void flush();
 
-  /// What has been printed since the last call, for the report.
+  /// Writes out what was printed, for the last time. The errno by which the stream was lost, now or before; absent when
+  /// everything was written. From any thread.
+  std::optional<int> finish();
+
+  /// From now on, keeps what is printed for takePrinted.
+  void keepPrinted() { _keeping = true; }
+  /// What has been printed since the last call; at most the first MiB of it. From any thread.
   std::string takePrinted();
 
  private:
   void write(const std::string& text);
+  [[noreturn]] void lose();
 
   std::FILE* _stream;
-  std::mutex _mutex;  // the thread that ends the run takes what was printed, too
+  std::atomic<int> _lostBy = 0;
+  bool _keeping = false;
+  std::mutex _mutex;  // guards _printed, and is never held while the stream is written
   std::string _printed;
 };
 

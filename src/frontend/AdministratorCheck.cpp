@@ -1,0 +1,60 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <algorithm>
+#include <chrono>
+#include <optional>
+#include <vector>
+
+#include "frontend/RemoteServerSettings.h"
+
+namespace tavisk {
+
+namespace {
+constexpr std::size_t groupsAtMost = 16;
+}
+
+bool RemoteServerSettings::myIsAuthenticatedAsAdministrator() {
+  UserDatabase& users = _context.host.users();
+  if (users.realUserId() == 0) return true;
+  const std::optional<std::vector<GroupId>> groups = users.supplementaryGroups(groupsAtMost);
+  if (!groups || groups->empty()) return false;
+  const std::optional<GroupId> admin = users.groupNamed("admin");
+  if (!admin) {
+    _context.output.putLine("myAuthenticatedAsAdministrator: Could not find admin group.");
+    return false;
+  }
+  return std::find(groups->begin(), groups->end(), *admin) != groups->end();
+}
+
+bool RemoteServerSettings::authenticate() {
+  if (!myIsAuthenticatedAsAdministrator()) {
+    _context.output.putLine("You need administrator access to run this tool... exiting!");
+    if (_report) _report->runRefused("not an administrator", _context.output.takePrinted());
+    return false;
+  }
+  AdminAuthenticator& authenticator = _context.host.authenticator();
+  {
+    const std::lock_guard lock(_authorizationMutex);
+    _authenticator = &authenticator;
+  }
+  authenticator.authenticate();
+  _startUp = _context.runLoop.after(std::chrono::seconds(0), [this] { adminDidAuthenticateNotification(); });
+  return true;
+}
+
+void RemoteServerSettings::adminDidAuthenticateNotification() {
+  untilOutputIsLost([this] { startLoop(); });
+  _context.notifications.removeObserver(this);
+}
+
+bool RemoteServerSettings::isLumaronServer() {
+  return _context.host.files().exists("/System/Library/CoreServices/ServerVersion.plist");
+}
+
+void RemoteServerSettings::giveUpAuthorization() {
+  const std::lock_guard lock(_authorizationMutex);
+  if (_authenticator && _authenticator->isAuthenticated()) _authenticator->deauthenticate();
+  _authenticator = nullptr;
+}
+
+}  // namespace tavisk

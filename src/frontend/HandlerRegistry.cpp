@@ -1,0 +1,28 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "frontend/HandlerRegistry.h"
+
+#include <array>
+
+namespace tavisk {
+
+std::span<const HandlerRows> handlerFamilies() {
+  static const std::array families = {
+      helpHandlers(),
+      dateAndTimeHandlers(),
+      timeZoneHandlers(),
+      networkTimeHandlers(),
+  };
+  return families;
+}
+
+const Handler* findHandler(std::string_view selector) {
+  for (const HandlerRows& family : handlerFamilies()) {
+    for (const HandlerRow& row : family) {
+      if (row.selector == selector) return &row.handler;
+    }
+  }
+  return nullptr;
+}
+
+}  // namespace tavisk

@@ -1,0 +1,45 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <cstddef>
+#include <optional>
+
+#include "frontend/RemoteServerSettings.h"
+#include "platform/Text.h"
+
+namespace tavisk {
+
+namespace {
+
+constexpr std::size_t lineBufferSize = 2056;
+
+bool beginsWith(const std::string& line, std::string_view word) {
+  return compareIgnoringCase(std::string_view(line).substr(0, word.size()), word) == 0;
+}
+
+}  // namespace
+
+bool RemoteServerSettings::doInteractiveTool() {
+  if (_firstPrompt) {
+    _serverCommands->setInteractive(true);
+    _context.output.putLine("> tavisk\n> type -help for help.");
+    _firstPrompt = false;
+  }
+  return readInput();
+}
+
+bool RemoteServerSettings::readInput() {
+  std::optional<std::string> line = _context.input.readLine("> ", lineBufferSize);
+  if (!line) {
+    _context.output.putLine("Error: fgets returned NULL.");
+    return false;
+  }
+  if (beginsWith(*line, "quit") || beginsWith(*line, "exit")) return false;
+  if (*line == "\n") return true;
+  // The last character is dropped whatever it is: also that of a piece of a longer line, or of a last line without a
+  // newline.
+  if (!line->empty()) line->pop_back();
+  parseCommand(getCommandArray(*line));
+  return true;
+}
+
+}  // namespace tavisk

@@ -1,0 +1,97 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "frontend/RemoteServerSettings.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <system_error>
+
+namespace tavisk {
+
+RemoteServerSettings::RemoteServerSettings(const CommandContext& context, EffectSink& effects, Report* report,
+                                           std::string_view commandTable)
+    : _context(context), _effects(effects), _report(report), _commandTable(commandTable) {
+  if (_report) _context.output.keepPrinted();
+}
+
+RemoteServerSettings::~RemoteServerSettings() {
+  _context.notifications.removeObserver(this);
+}
+
+bool RemoteServerSettings::runTool(int argc, char** withArguments) {
+  bool started = false;
+  untilOutputIsLost([&] { started = setUp(argc, withArguments); });
+  return started;
+}
+
+bool RemoteServerSettings::setUp(int argc, char** withArguments) {
+  if (!loadCommands() || !authenticate()) {
+    exit();
+    return false;
+  }
+  {
+    const std::lock_guard lock(_serverCommandsMutex);
+    _serverCommands = std::make_unique<ServerCommands>(_commandDict, _context);
+  }
+  _serverCommands->setParent(this);
+  setPromptUser(true);
+  _interactive = argc == 1;
+  if (!_interactive) {
+    _argc = argc;
+    _argv = withArguments;
+  }
+  return true;
+}
+
+void RemoteServerSettings::startLoop() {
+  executeTool();
+}
+
+void RemoteServerSettings::executeTool() {
+  if (_interactive) {
+    while (!_ended && doInteractiveTool()) _context.runLoop.runPass();
+  } else {
+    parseCommandLineArgumentsAndExit(_argc, _argv);
+  }
+  deauthenticate();
+}
+
+void RemoteServerSettings::deauthenticate() {
+  giveUpAuthorization();
+  exit();
+}
+
+void RemoteServerSettings::exit() {
+  _exitStatus = statusOfErrorFlag();
+  if (_report) _report->commandEnds(_exitStatus != 0, _context.output.takePrinted());
+  const std::optional<int> lostBy = _context.output.finish();
+  if (lostBy && *lostBy != EPIPE) {
+    std::fprintf(stderr, "tavisk: standard output: %s\n", std::generic_category().message(*lostBy).c_str());
+    _exitStatus = 1;
+  }
+  _context.runLoop.stop();
+}
+
+void RemoteServerSettings::untilOutputIsLost(const std::function<void()>& work) {
+  try {
+    work();
+  } catch (const Output::Lost&) {
+    deauthenticate();
+  }
+}
+
+int RemoteServerSettings::statusOfErrorFlag() const {
+  const std::lock_guard lock(_serverCommandsMutex);
+  return _serverCommands && _serverCommands->error() ? 1 : 0;
+}
+
+void RemoteServerSettings::endedBySignal(const std::string& signal) {
+  _ended = true;
+  _context.input.restoreTerminal();
+  giveUpAuthorization();
+  _effects.interrupt("the run was ended by " + signal);
+  if (_report) _report->runEndedBySignal(signal, statusOfErrorFlag() != 0, _context.output.takePrinted());
+  _context.output.finish();
+}
+
+}  // namespace tavisk

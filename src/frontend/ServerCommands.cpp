@@ -1,0 +1,30 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "frontend/ServerCommands.h"
+
+#include <utility>
+
+#include "frontend/RemotePrefsExtra.h"
+
+namespace tavisk {
+
+ServerCommands::ServerCommands(std::shared_ptr<const CommandTable> commandDict, const CommandContext& context)
+    : _context(context), _commandDict(std::move(commandDict)) {}
+
+bool ServerCommands::checkForEmptyString(const std::string& value, const char* command, const char* withInfo,
+                                         const char* andUseage) {
+  if (!value.empty()) return false;
+  _context.output.print("%s: Error, you must specify %s. Command usage: '%s'\n", command, withInfo, andUseage);
+  setError(true);
+  return true;
+}
+
+std::optional<bool> ServerCommands::readOnOff(const std::string& value, const char* command) {
+  if (caseInsensitiveEqualTo(value, "On")) return true;
+  if (caseInsensitiveEqualTo(value, "Off")) return false;
+  _context.output.print("%s: Error, %s is not recognized, Use 'On' or 'Off'\n", command, value.c_str());
+  setError(true);
+  return std::nullopt;
+}
+
+}  // namespace tavisk
