@@ -1,0 +1,112 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <array>
+#include <cmath>
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+#include "frontend/HandlerRegistry.h"
+#include "frontend/ServerCommands.h"
+#include "platform/Text.h"
+
+namespace tavisk {
+
+namespace {
+
+/// The three numbers of "mm:dd:yy" or "hh:mm:ss"; what is missing or no number is 0.
+std::array<std::int64_t, 3> readFields(const std::string& text) {
+  const std::vector<std::string> fields = split(text, "/:");
+  std::array<std::int64_t, 3> numbers{};
+  for (std::size_t i = 0; i < numbers.size() && i < fields.size(); ++i) numbers[i] = leadingInteger(fields[i]);
+  return numbers;
+}
+
+/// Compared without a sign, so that no negative number is at most `limit`.
+bool isAtMost(std::int64_t number, std::uint64_t limit) {
+  return static_cast<std::uint64_t>(number) <= limit;
+}
+
+bool isTime(std::int64_t hour, std::int64_t minute, std::int64_t second) {
+  return isAtMost(hour, 24) && isAtMost(minute, 59) && isAtMost(second, 59) &&
+         (hour != 24 || (minute == 0 && second == 0));
+}
+
+bool isDate(std::int64_t month, std::int64_t day, std::int64_t year) {
+  return month != 0 && isAtMost(month, 12) && day != 0 && isAtMost(day, 31) && isAtMost(year, 9999);
+}
+
+}  // namespace
+
+DateTime ServerCommands::localNow() {
+  ClockService& clock = _context.host.clock();
+  setDefaultTimeZone(clock.rulesOf(localTimeZone()));
+  return localDateTime(clock.now());
+}
+
+void ServerCommands::setClock(const DateTime& local) {
+  _context.host.clock().setTime(static_cast<std::int64_t>(std::trunc(secondsSince1970(local))));
+}
+
+bool ServerCommands::refuseWhileNetworkTimeRuns(const char* error) {
+  if (!_context.host.networkTime().isRunning()) return false;
+  _context.output.print("%s", error);
+  _context.output.putLine("Use '-setusingnetworktime' to turn network time off.");
+  setError(true);
+  return true;
+}
+
+void ServerCommands::getDate() {
+  const DateTime now = localNow();
+  _context.output.print("Date: %ld/%ld/%ld\n", now.month, now.day, now.year);
+  setError(false);
+}
+
+void ServerCommands::setDate(const std::string& date) {
+  if (refuseWhileNetworkTimeRuns("setDate: Error, you cannot set the date while network time is running. ")) return;
+  if (checkForEmptyString(date, "setdate", "a valid date", "setdate <mm:dd:yy>")) return;
+  setError(false);
+  const auto [month, day, yearAsTyped] = readFields(date);
+  if (!isDate(month, day, yearAsTyped)) {
+    _context.output.print("setdate: Error: %s is invalid date format... use mm:dd:yy\n", date.c_str());
+    setError(true);
+    return;
+  }
+  const std::int64_t year = yearAsTyped <= 99 ? yearAsTyped + 2000 : yearAsTyped;
+  const DateTime now = localNow();
+  setClock({year, month, day, now.hour, now.minute, now.second});
+  _context.output.print("setdate: %02ld/%02ld/%02ld\n", month, day, year);
+}
+
+void ServerCommands::getTime() {
+  const DateTime now = localNow();
+  _context.output.print("Time: %02ld:%02ld:%02ld\n", now.hour, now.minute, now.second);
+  setError(false);
+}
+
+void ServerCommands::setTime(const std::string& time) {
+  if (refuseWhileNetworkTimeRuns("settime: Error, you cannot set time while network time is running. ")) return;
+  if (checkForEmptyString(time, "settime", "a valid time", "settime <hh:mm:ss>")) return;
+  setError(false);
+  const auto [hour, minute, second] = readFields(time);
+  if (!isTime(hour, minute, second)) {
+    _context.output.print("settime: Error, %s is invalid time format... use hh:mm:ss\n", time.c_str());
+    setError(true);
+    return;
+  }
+  const DateTime now = localNow();
+  setClock({now.year, now.month, now.day, hour, minute, second});
+  _context.output.print("Set Time: %02ld:%02ld:%02ld\n", hour, minute, second);
+}
+
+HandlerRows dateAndTimeHandlers() {
+  static constexpr HandlerRow rows[] = {
+      {"getDate", &ServerCommands::getDate},
+      {"setDate:", &ServerCommands::setDate},
+      {"getTime", &ServerCommands::getTime},
+      {"setTime:", &ServerCommands::setTime},
+  };
+  return rows;
+}
+
+}  // namespace tavisk
