@@ -1,0 +1,50 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "terminal/Surroundings.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <csignal>
+#include <cstdlib>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace tavisk {
+
+namespace {
+
+bool openMissingDescriptors() {
+  for (const int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+    if (fcntl(descriptor, F_GETFD) < 0 && open("/dev/null", O_RDONLY) != descriptor) return false;
+  }
+  return true;
+}
+
+bool isKept(std::string_view variable) {
+  constexpr std::array kept = {"LANG=", "TERM=", "NO_COLOR=", "XDG_CONFIG_HOME=", "TAVISK_", "LC_"};
+  return std::any_of(kept.begin(), kept.end(), [&](const char* start) { return variable.starts_with(start); });
+}
+
+void keepKnownVariables() {
+  std::vector<std::string> others;
+  for (char** variable = environ; variable && *variable; ++variable) {
+    const std::string_view text(*variable);
+    if (!isKept(text)) others.emplace_back(text.substr(0, text.find('=')));
+  }
+  for (const std::string& name : others) unsetenv(name.c_str());
+}
+
+}  // namespace
+
+bool prepareProcess() {
+  std::signal(SIGPIPE, SIG_IGN);
+  std::signal(SIGXFSZ, SIG_IGN);
+  keepKnownVariables();
+  return openMissingDescriptors();
+}
+
+}  // namespace tavisk

@@ -1,0 +1,25 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "terminal/TerminalLog.h"
+
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <string_view>
+
+#include "platform/Text.h"
+
+namespace tavisk {
+
+bool TerminalLog::wanted() {
+  const char* log = std::getenv("TAVISK_LOG");
+  return isatty(STDERR_FILENO) != 0 || (log && std::string_view(log) == "stderr");
+}
+
+void TerminalLog::record(const Effect& effect) {
+  if (effect.outcome != Outcome::failed || !effect.failure) return;
+  std::fprintf(stderr, "tavisk: %s: %s\n", escaped(effect.setting).c_str(), describe(*effect.failure).c_str());
+}
+
+}  // namespace tavisk

@@ -1,0 +1,18 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "platform/EffectSink.h"
+
+namespace tavisk {
+
+/// Tells each failure on standard error, in one line: "tavisk: SETTING: what was tried on what: why".
+class TerminalLog : public EffectChannel {
+ public:
+  /// When standard error is a terminal, or TAVISK_LOG is "stderr".
+  static bool wanted();
+
+  void record(const Effect& effect) override;
+};
+
+}  // namespace tavisk
