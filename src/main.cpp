@@ -1,0 +1,100 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <exception>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "frontend/RemoteServerSettings.h"
+#include "platform/Report.h"
+#include "platform/Text.h"
+#include "platform/linux/LinuxHost.h"
+#include "platform/scratch/ScratchHost.h"
+#include "terminal/SignalWaiter.h"
+#include "terminal/StreamLineSource.h"
+#include "terminal/Surroundings.h"
+#include "terminal/TerminalLog.h"
+
+namespace tavisk {
+
+namespace {
+
+constexpr int refusedStatus = 1;
+
+/// A run that cannot start says why on standard error and in the report.
+int refuse(const std::string& why, Report* report) {
+  std::fprintf(stderr, "tavisk: %s\n", why.c_str());
+  if (report) report->runRefused(why, "");
+  return refusedStatus;
+}
+
+std::optional<std::string> environmentVariable(const char* name) {
+  const char* value = std::getenv(name);
+  return value ? std::optional<std::string>(value) : std::nullopt;
+}
+
+Result<std::unique_ptr<Host>> openScratchHost(const std::string& directory, EffectSink& effects, RunLoop& runLoop) {
+  if (isatty(STDERR_FILENO) != 0) std::fprintf(stderr, "tavisk: rehearsing on %s\n", escaped(directory).c_str());
+  Result<std::unique_ptr<ScratchHost>> host = ScratchHost::open(directory, effects, runLoop);
+  if (!host) return host.failure();
+  return std::unique_ptr<Host>(std::move(host).value());
+}
+
+Result<std::unique_ptr<Host>> chooseHost(EffectSink& effects, RunLoop& runLoop) {
+  const std::string scratch = "scratch:";
+  const std::optional<std::string> name = environmentVariable("TAVISK_HOST");
+  if (!name) return std::unique_ptr<Host>(std::make_unique<LinuxHost>(effects, runLoop));
+  if (name->starts_with(scratch)) return openScratchHost(name->substr(scratch.size()), effects, runLoop);
+  return Failure{"choose the host", "TAVISK_HOST=" + *name, "unset or scratch:DIR is expected"};
+}
+
+int run(Report* report, int argc, char** argv) {
+  const EndingSignals signals;
+  TerminalLog log;
+  EffectSink effects;
+  if (report) effects.addChannel(*report);
+  if (TerminalLog::wanted()) effects.addChannel(log);
+  RunLoop runLoop;
+  const Result<std::unique_ptr<Host>> host = chooseHost(effects, runLoop);
+  if (!host) return refuse(describe(host.failure()), report);
+
+  NotificationCenter notifications;
+  Output output(stdout);
+  StreamLineSource input(stdin, output);
+  RemoteServerSettings settings({**host, runLoop, notifications, output, input}, effects, report);
+  const auto waiter = SignalWaiter::start(
+      signals, [&](const std::string& signal) { settings.endedBySignal(signal); },
+      [&] { return settings.statusOfErrorFlag(); });
+  if (!waiter) {
+    output.putLine("Error installing handler!");
+    signals.unblock();
+  }
+  if (settings.runTool(argc, argv)) runLoop.run();
+  return settings.exitStatus();
+}
+
+int start(int argc, char** argv) {
+  if (argc < 1) return refuse("started without its name as the first argument", nullptr);
+  const std::optional<std::string> destination = environmentVariable("TAVISK_REPORT");
+  if (!destination) return run(nullptr, argc, argv);
+  const Result<std::unique_ptr<Report>> report = Report::open(*destination);
+  if (!report) return refuse(describe(report.failure()), nullptr);
+  return run(report->get(), argc, argv);
+}
+
+}  // namespace
+
+}  // namespace tavisk
+
+int main(int argc, char** argv) {
+  if (!tavisk::prepareProcess()) return tavisk::refusedStatus;
+  try {
+    return tavisk::start(argc, argv);
+  } catch (const std::exception& error) {
+    return tavisk::refuse(error.what(), nullptr);
+  }
+}
