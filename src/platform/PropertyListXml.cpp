@@ -155,8 +155,9 @@ PropertyList::Date dateOf(pugi::xml_node element) {
                                          std::chrono::day(static_cast<unsigned>(day))};
   const bool hasStrayCharacter = std::any_of(fields.begin(), fields.end(), [](int value) { return value < 0; });
   if (hasStrayCharacter || year == 0 || !date.ok() || hour > 23 || minute > 59 || second > 59) throw notADate;
-  const std::chrono::sys_seconds midnight = std::chrono::sys_days(date);
-  return {midnight.time_since_epoch().count() + (hour * 60 + minute) * 60 + second};
+  const std::chrono::sys_seconds moment = std::chrono::sys_days(date) + std::chrono::hours(hour) +
+                                          std::chrono::minutes(minute) + std::chrono::seconds(second);
+  return {moment.time_since_epoch().count()};
 }
 
 /// 0 to 63; -1 for a character that is not in the alphabet (RFC 4648, 4).
