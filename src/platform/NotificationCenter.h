@@ -4,6 +4,7 @@
 
 #include <any>
 #include <functional>
+#include <memory>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -16,6 +17,7 @@ struct Notification {
 };
 
 /// Tells observers of named events, at once and in the order in which they were added. Main thread only.
+/// Handlers may post, add and remove: an observer added meanwhile is told from the next post on, a removed one no more.
 class NotificationCenter {
  public:
   using Handler = std::function<void(const Notification&)>;
@@ -31,8 +33,9 @@ class NotificationCenter {
     const void* observer;
     std::string name;
     Handler handler;
+    bool hasEnded = false;
   };
-  std::vector<Observation> _observations;
+  std::vector<std::shared_ptr<Observation>> _observations;
 };
 
 }  // namespace tavisk
