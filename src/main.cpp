@@ -11,6 +11,7 @@
 
 #include "frontend/RemoteServerSettings.h"
 #include "platform/Report.h"
+#include "platform/StandardError.h"
 #include "platform/Text.h"
 #include "platform/linux/LinuxHost.h"
 #include "platform/scratch/ScratchHost.h"
@@ -27,7 +28,7 @@ constexpr int refusedStatus = 1;
 
 /// A run that cannot start says why on standard error and in the report.
 int refuse(const std::string& why, Report* report) {
-  std::fprintf(stderr, "tavisk: %s\n", why.c_str());
+  complain(why);
   if (report) report->runRefused(why, "");
   return refusedStatus;
 }
@@ -38,7 +39,7 @@ std::optional<std::string> environmentVariable(const char* name) {
 }
 
 Result<std::unique_ptr<Host>> openScratchHost(const std::string& directory, EffectSink& effects, RunLoop& runLoop) {
-  if (isatty(STDERR_FILENO) != 0) std::fprintf(stderr, "tavisk: rehearsing on %s\n", escaped(directory).c_str());
+  if (isatty(STDERR_FILENO) != 0) complain("rehearsing on " + escaped(directory));
   Result<std::unique_ptr<ScratchHost>> host = ScratchHost::open(directory, effects, runLoop);
   if (!host) return host.failure();
   return std::unique_ptr<Host>(std::move(host).value());

@@ -1,12 +1,12 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <algorithm>
-#include <cstdio>
 #include <utility>
 #include <variant>
 
 #include "frontend/HandlerRegistry.h"
 #include "frontend/RemoteServerSettings.h"
+#include "platform/StandardError.h"
 #include "platform/Text.h"
 
 namespace tavisk {
@@ -104,7 +104,7 @@ void RemoteServerSettings::callHandler(const std::string& word, const CommandTab
   if (const Handler* handler = findHandler(entry.selector)) {
     std::visit(Call{*_serverCommands, arguments}, *handler);
   } else {
-    std::fprintf(stderr, "tavisk: %s: not built yet\n", word.c_str());
+    complain(word + ": not built yet");
     _serverCommands->setError(true);
   }
   if (_report) _report->commandEnds(_serverCommands->error(), _context.output.takePrinted());

@@ -21,7 +21,7 @@ void Output::print(const char* format, ...) {
   const int size = std::vsnprintf(nullptr, 0, format, arguments);
   va_end(arguments);
   std::string text(static_cast<std::size_t>(std::max(size, 0)), '\0');
-  std::vsnprintf(text.data(), text.size() + 1, format, again);
+  (void)std::vsnprintf(text.data(), text.size() + 1, format, again);
   va_end(again);
   write(text);
 }

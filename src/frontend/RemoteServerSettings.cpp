@@ -3,8 +3,9 @@
 #include "frontend/RemoteServerSettings.h"
 
 #include <cerrno>
-#include <cstdio>
 #include <system_error>
+
+#include "platform/StandardError.h"
 
 namespace tavisk {
 
@@ -66,7 +67,7 @@ void RemoteServerSettings::exit() {
   if (_report) _report->commandEnds(_exitStatus != 0, _context.output.takePrinted());
   const std::optional<int> lostBy = _context.output.finish();
   if (lostBy && *lostBy != EPIPE) {
-    std::fprintf(stderr, "tavisk: standard output: %s\n", std::generic_category().message(*lostBy).c_str());
+    complain("standard output: " + std::generic_category().message(*lostBy));
     _exitStatus = 1;
   }
   _context.runLoop.stop();

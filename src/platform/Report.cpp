@@ -8,12 +8,12 @@
 
 #include <cerrno>
 #include <charconv>
-#include <cstdio>
 #include <string_view>
 #include <system_error>
 #include <utility>
 
 #include "platform/Json.h"
+#include "platform/StandardError.h"
 
 namespace tavisk {
 
@@ -148,9 +148,9 @@ std::string Report::toJson(const Entry& entry, bool failed, const std::string& o
   return object.str();
 }
 
-void Report::append(const Entry& entry, bool failed, const std::string& output) {
+void Report::append(const Entry& entry, bool failed, const std::string& output) const {
   const int error = writeAll(_descriptor, toJson(entry, failed, output) + "\n");
-  if (error != 0) std::fprintf(stderr, "tavisk: report: %s\n", std::generic_category().message(error).c_str());
+  if (error != 0) complain("report: " + std::generic_category().message(error));
 }
 
 }  // namespace tavisk

@@ -63,7 +63,7 @@ class Report : public EffectChannel {
   Report(int descriptor, bool owned) : _descriptor(descriptor), _owned(owned) {}
   static std::string toJson(const Entry& entry, bool failed, const std::string& output);
   Entry takeEntry();
-  void append(const Entry& entry, bool failed, const std::string& output);
+  void append(const Entry& entry, bool failed, const std::string& output) const;
 
   const int _descriptor;
   const bool _owned;

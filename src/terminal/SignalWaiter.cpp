@@ -2,10 +2,10 @@
 // SPDX-License-Identifier: MIT
 #include "terminal/SignalWaiter.h"
 
-#include <string.h>
-#include <time.h>
 #include <unistd.h>
 
+#include <cstring>
+#include <ctime>
 #include <exception>
 #include <system_error>
 #include <utility>
@@ -42,7 +42,7 @@ SignalWaiter::SignalWaiter(const EndingSignals& signals, End end, Status status)
 
 SignalWaiter::~SignalWaiter() {
   State expected = State::waiting;
-  if (_state.compare_exchange_strong(expected, State::stopped)) pthread_kill(_thread.native_handle(), SIGTERM);
+  if (_state.compare_exchange_strong(expected, State::stopped)) pthread_kill(_thread.native_handle(), SIGINT);
   _thread.join();
 }
 

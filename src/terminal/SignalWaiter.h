@@ -2,9 +2,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <signal.h>
-
 #include <atomic>
+#include <csignal>
 #include <functional>
 #include <memory>
 #include <string>

@@ -11,7 +11,8 @@ std::optional<std::string> StreamLineSource::readLine(const std::string& prompt,
   std::clearerr(_stream);
   std::string buffer(room, '\0');
   if (!std::fgets(buffer.data(), static_cast<int>(room), _stream)) return std::nullopt;
-  return std::string(buffer.c_str());
+  buffer.resize(buffer.find('\0'));
+  return buffer;
 }
 
 }  // namespace tavisk

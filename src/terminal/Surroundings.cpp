@@ -8,10 +8,7 @@
 #include <algorithm>
 #include <array>
 #include <csignal>
-#include <cstdlib>
-#include <string>
 #include <string_view>
-#include <vector>
 
 namespace tavisk {
 
@@ -30,19 +27,19 @@ bool isKept(std::string_view variable) {
 }
 
 void keepKnownVariables() {
-  std::vector<std::string> others;
-  for (char** variable = environ; variable && *variable; ++variable) {
-    const std::string_view text(*variable);
-    if (!isKept(text)) others.emplace_back(text.substr(0, text.find('=')));
+  if (!environ) return;
+  char** end = environ;
+  for (char** variable = environ; *variable; ++variable) {
+    if (isKept(*variable)) *end++ = *variable;
   }
-  for (const std::string& name : others) unsetenv(name.c_str());
+  *end = nullptr;
 }
 
 }  // namespace
 
 bool prepareProcess() {
-  std::signal(SIGPIPE, SIG_IGN);
-  std::signal(SIGXFSZ, SIG_IGN);
+  (void)std::signal(SIGPIPE, SIG_IGN);
+  (void)std::signal(SIGXFSZ, SIG_IGN);
   keepKnownVariables();
   return openMissingDescriptors();
 }

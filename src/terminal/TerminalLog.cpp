@@ -4,10 +4,10 @@
 
 #include <unistd.h>
 
-#include <cstdio>
 #include <cstdlib>
 #include <string_view>
 
+#include "platform/StandardError.h"
 #include "platform/Text.h"
 
 namespace tavisk {
@@ -19,7 +19,7 @@ bool TerminalLog::wanted() {
 
 void TerminalLog::record(const Effect& effect) {
   if (effect.outcome != Outcome::failed || !effect.failure) return;
-  std::fprintf(stderr, "tavisk: %s: %s\n", escaped(effect.setting).c_str(), describe(*effect.failure).c_str());
+  complain(escaped(effect.setting) + ": " + describe(*effect.failure));
 }
 
 }  // namespace tavisk
