@@ -1,0 +1,25 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+
+#include "platform/PropertyList.h"
+
+namespace tavisk {
+
+/// The boot loader's preference file, a property list at one fixed path of the machine.
+class BootLoaderFile {
+ public:
+  virtual ~BootLoaderFile() = default;
+
+  static constexpr const char* path = "/Library/Preferences/SystemConfiguration/com.velmar.Boot.plist";
+
+  /// Absent when it is missing, cannot be read or is no property-list dictionary.
+  virtual std::optional<PropertyList::Dictionary> read() = 0;
+  /// Replaces the file whole, or makes it and its folder. A file that read() cannot understand is kept beside it as
+  /// NAME.damaged first. Whether it was written; the reason why not goes to the effects.
+  virtual bool write(const PropertyList::Dictionary& contents) = 0;
+};
+
+}  // namespace tavisk

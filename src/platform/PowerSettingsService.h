@@ -1,0 +1,50 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+namespace tavisk {
+
+/// What feeds the machine, by name ("AC Power"); each source has settings of its own.
+struct PowerSource {
+  std::string name;
+};
+
+struct Minutes {
+  unsigned long count;  ///< 0 is never
+  bool operator==(const Minutes&) const = default;
+};
+
+enum class SleepTimer { system, display, disk };
+
+/// How long the machine, its display or its disks are idle before they sleep.
+class SleepTimersService {
+ public:
+  virtual ~SleepTimersService() = default;
+
+  virtual Minutes untilSleep(SleepTimer timer, const PowerSource& source) = 0;
+  /// The result goes to the effects.
+  virtual void setUntilSleep(SleepTimer timer, const PowerSource& source, Minutes minutes) = 0;
+};
+
+enum class PowerSwitch { wakeOnRing, wakeOnLAN, autoRestart, powerButtonSleep };
+
+/// What wakes, restarts or puts to sleep the machine. Results of the setters go to the effects.
+class PowerSwitchesService {
+ public:
+  virtual ~PowerSwitchesService() = default;
+
+  virtual bool supports(PowerSwitch which, const PowerSource& source) = 0;
+  /// False when the machine does not support it.
+  virtual bool isOn(PowerSwitch which, const PowerSource& source) = 0;
+  virtual void setOn(PowerSwitch which, const PowerSource& source, bool on) = 0;
+
+  /// Whether the machine restarts after a freeze, whatever feeds it.
+  virtual bool restartsOnHang() = 0;
+  virtual void setRestartsOnHang(bool restarts) = 0;
+};
+
+class PowerSettingsService : public SleepTimersService, public PowerSwitchesService {};
+
+}  // namespace tavisk

@@ -1,0 +1,18 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+namespace tavisk {
+
+/// The SSH server.
+class RemoteShellService {
+ public:
+  virtual ~RemoteShellService() = default;
+
+  /// False also when the machine has none.
+  virtual bool isEnabled() = 0;
+  /// Starts or stops it, now and with the machine. The result goes to the effects.
+  virtual void setEnabled(bool enabled) = 0;
+};
+
+}  // namespace tavisk
