@@ -40,7 +40,7 @@ class Descriptor {
   /// Takes the count out of an eventfd or timerfd, so that it is ready no more.
   void drain() const {
     std::uint64_t count = 0;
-    static_cast<void>(read(_descriptor, &count, sizeof count));
+    [[maybe_unused]] const ssize_t taken = read(_descriptor, &count, sizeof count);
   }
 
  private:
