@@ -1,0 +1,18 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include "platform/FileDescriptor.h"
+
+namespace tavisk {
+
+/// open(2) of a path as if the folder `root` were the root directory; no magic links. Sets errno when it comes back
+/// empty.
+FileDescriptor openBeneath(const FileDescriptor& root, const std::string& path, int flags, unsigned mode = 0);
+
+/// As openat(2), of a single name, and closed on exec.
+FileDescriptor openNamed(const FileDescriptor& folder, const std::string& name, int flags, unsigned mode = 0);
+
+}  // namespace tavisk
