@@ -1,0 +1,68 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <thread>
+
+#include "platform/EffectSink.h"
+#include "platform/PropertyList.h"
+#include "platform/Result.h"
+#include "platform/RunLoop.h"
+#include "platform/SystemRoot.h"
+#include "platform/scratch/MachineSection.h"
+
+namespace tavisk {
+
+/// DIR/machine.plist: a property list that describes a machine. Only what was checked against the key table is ever
+/// handed out. Any thread may read and change it.
+class MachineFile {
+ public:
+  using Dictionary = PropertyList::Dictionary;
+  using Contents = std::shared_ptr<const Dictionary>;
+  using Edit = std::function<void(Dictionary& machine)>;
+  using Observer = std::function<void(const Contents& before, const Contents& now)>;
+
+  /// The folder must exist; a missing machine.plist is an empty dictionary. The failure says what is wrong
+  /// where.
+  static Result<std::unique_ptr<MachineFile>> open(const std::string& directory, EffectSink& effects);
+
+  /// The folder itself, whose root is DIR: for the logs beside the file.
+  const SystemRoot& folder() const { return _folder; }
+  const std::string& path() const { return _path; }
+
+  /// As the file is now. While it cannot be read the last good contents stand, and one effect says so.
+  Contents contents();
+  /// A dictionary at the top of the file.
+  MachineSection section(std::string_view name);
+
+  /// Locks, reads again, edits, and replaces the file (SystemRoot::write). What another run changed meanwhile is kept.
+  /// A lock that another run holds is waited for 5 s, and 50 ms on any thread but the one that opened the file.
+  Result<void> change(const Edit& edit);
+
+  /// Tells, from the run loop, when the contents are others than those last told; `told` are the first.
+  [[nodiscard]] RunLoop::Registration observeChanges(RunLoop& runLoop, Contents told, Observer observer);
+
+ private:
+  MachineFile(const std::string& directory, EffectSink& effects);
+  Result<Dictionary> read() const;
+  Result<FileDescriptor> lock() const;
+  Failure inFolder(const Failure& failure) const;
+  void recordFailure(const Failure& failure, const char* note);
+
+  std::string _directory;
+  std::string _path;
+  SystemRoot _folder;
+  EffectSink& _effects;
+  std::thread::id _owner = std::this_thread::get_id();
+  std::mutex _mutex;  ///< of the two below; never held while the file is read
+  Contents _contents = std::make_shared<Dictionary>();
+  std::optional<FileStamp> _stamp;  ///< of the file when it was last read, or failed to be
+};
+
+}  // namespace tavisk

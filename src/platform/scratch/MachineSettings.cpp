@@ -1,0 +1,72 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/scratch/MachineSettings.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* machineName = "the rehearsed machine";
+
+}  // namespace
+
+MachineSetting switchAt(std::string name, std::string section, std::string key) {
+  return {std::move(name), "",
+          [=](MachineFile& machine) -> MachineSetting::Value {
+            return std::optional<std::string>(machine.section(section).boolean(key) ? "on" : "off");
+          },
+          [=](MachineFile::Dictionary& machine, const std::string& value) {
+            machine.dictionary(section).set(key, value == "on");
+          }};
+}
+
+MachineSetting textAt(std::string name, std::string section, std::string key) {
+  return {
+      std::move(name), "",
+      [=](MachineFile& machine) -> MachineSetting::Value { return std::optional(machine.section(section).text(key)); },
+      [=](MachineFile::Dictionary& machine, const std::string& value) { machine.dictionary(section).set(key, value); }};
+}
+
+void countUp(MachineFile::Dictionary& machine, std::string_view section, std::string_view key) {
+  auto& values = machine.dictionary(section);
+  const auto* count = values.find(key);
+  values.set(key, (count ? *count->asInteger() : 0) + 1);
+}
+
+std::optional<std::string> MachineSettings::read(const MachineSetting& setting) {
+  return observe(parts(setting), _effects);
+}
+
+void MachineSettings::change(const MachineSetting& setting, const std::string& asked) {
+  carryOut(parts(setting), asked, _effects, _runLoop);
+}
+
+Setting MachineSettings::parts(const MachineSetting& setting) {
+  Setting parts;
+  parts.name = setting.name;
+  parts.unit = setting.unit;
+  parts.where = _file.path();
+  if (setting.read) parts.live = parts.stored = [this, &setting] { return readUnlessRefused(setting); };
+  parts.store = [this, &setting](const std::string& value) { return writeUnlessRefused(setting, value); };
+  parts.always = true;
+  return parts;
+}
+
+MachineSetting::Value MachineSettings::readUnlessRefused(const MachineSetting& setting) {
+  if (auto reason = refusal(setting.name, " (read)")) return Failure{"read", machineName, *reason};
+  return setting.read(_file);
+}
+
+Result<void> MachineSettings::writeUnlessRefused(const MachineSetting& setting, const std::string& value) {
+  if (auto reason = refusal(setting.name, "")) return Failure{"set", machineName, *reason};
+  return _file.change([&](MachineFile::Dictionary& machine) { setting.write(machine, value); });
+}
+
+std::optional<std::string> MachineSettings::refusal(const std::string& setting, const char* suffix) {
+  auto refusals = _file.section("Refusals");
+  const auto* reason = refusals.find(setting + suffix);
+  if (!reason) reason = refusals.find(std::string("*") + suffix);
+  if (!reason) return std::nullopt;
+  return *reason->asString();
+}
+
+}  // namespace tavisk

@@ -1,0 +1,60 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "platform/EffectSink.h"
+#include "platform/RunLoop.h"
+#include "platform/SettingChange.h"
+#include "platform/scratch/MachineFile.h"
+
+namespace tavisk {
+
+/// A setting as the machine file keeps it.
+struct MachineSetting {
+  using Value = Result<std::optional<std::string>>;  ///< absent: the setting has no value
+  using Read = std::function<Value(MachineFile& machine)>;
+  using Write = std::function<void(MachineFile::Dictionary& machine, const std::string& value)>;
+
+  std::string name;  ///< one of platform/SettingNames.h
+  std::string unit;  ///< see SettingValue
+  Read read;         ///< empty: nothing can be read
+  Write write;
+};
+
+/// One key as a setting: a boolean reads as "on" or "off".
+MachineSetting switchAt(std::string name, std::string section, std::string key);
+MachineSetting textAt(std::string name, std::string section, std::string key);
+
+/// Adds one to a count.
+void countUp(MachineFile::Dictionary& machine, std::string_view section, std::string_view key);
+
+/// Reads and changes the settings of the machine, and tells the effects. The one place that heeds "Refusals".
+class MachineSettings {
+ public:
+  MachineSettings(MachineFile& file, EffectSink& effects, RunLoop& runLoop)
+      : _file(file), _effects(effects), _runLoop(runLoop) {}
+
+  /// Absent when reading is refused, or there is no value.
+  std::optional<std::string> read(const MachineSetting& setting);
+  bool isOn(const MachineSetting& setting) { return read(setting) == "on"; }
+  /// Writes also when the machine has the value already.
+  void change(const MachineSetting& setting, const std::string& asked);
+  void turn(const MachineSetting& setting, bool on) { change(setting, on ? "on" : "off"); }
+
+ private:
+  Setting parts(const MachineSetting& setting);
+  MachineSetting::Value readUnlessRefused(const MachineSetting& setting);
+  Result<void> writeUnlessRefused(const MachineSetting& setting, const std::string& value);
+  std::optional<std::string> refusal(const std::string& setting, const char* suffix);
+
+  MachineFile& _file;
+  EffectSink& _effects;
+  RunLoop& _runLoop;
+};
+
+}  // namespace tavisk

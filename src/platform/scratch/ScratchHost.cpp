@@ -1,0 +1,29 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/scratch/ScratchHost.h"
+
+namespace tavisk {
+
+Result<std::unique_ptr<ScratchHost>> ScratchHost::open(const std::string& directory, EffectSink& effects,
+                                                       RunLoop& runLoop) {
+  auto machine = MachineFile::open(directory, effects);
+  if (!machine) return machine.failure();
+  std::unique_ptr<ScratchHost> host(new ScratchHost(directory, std::move(machine).value(), effects, runLoop));
+  effects.addChannel(host->_effectsLog);
+  return host;
+}
+
+ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFile> machine, EffectSink& effects,
+                         RunLoop& runLoop)
+    : _machine(std::move(machine)),
+      _settings(*_machine, effects, runLoop),
+      _effectsLog(_machine->folder()),
+      _root(directory + "/root"),
+      _files(_root),
+      _users(*_machine),
+      _authenticator(_settings),
+      _systemLog(_machine->folder(), effects),
+      _clock(_settings),
+      _networkTime(_settings) {}
+
+}  // namespace tavisk

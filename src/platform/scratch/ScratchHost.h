@@ -1,0 +1,52 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <string>
+
+#include "platform/Host.h"
+#include "platform/RootedFileSystem.h"
+#include "platform/scratch/EffectsLog.h"
+#include "platform/scratch/MachineFile.h"
+#include "platform/scratch/MachineSettings.h"
+#include "platform/scratch/ScratchAdminAuthenticator.h"
+#include "platform/scratch/ScratchClockService.h"
+#include "platform/scratch/ScratchNetworkTimeService.h"
+#include "platform/scratch/ScratchSystemLog.h"
+#include "platform/scratch/ScratchUserDatabase.h"
+
+namespace tavisk {
+
+/// A machine that the files of one folder, DIR, describe: machine.plist its settings, root/ its files, system.log and
+/// effects.log what it was told.
+class ScratchHost final : public Host {
+ public:
+  /// Fails when DIR is no folder or its machine.plist is not sound. Adds the effects.log to the channels of `effects`;
+  /// the host must be alive whenever effects are told.
+  static Result<std::unique_ptr<ScratchHost>> open(const std::string& directory, EffectSink& effects, RunLoop& runLoop);
+
+  UserDatabase& users() override { return _users; }
+  AdminAuthenticator& authenticator() override { return _authenticator; }
+  FileSystem& files() override { return _files; }
+  SystemLog& systemLog() override { return _systemLog; }
+  ClockService& clock() override { return _clock; }
+  NetworkTimeService& networkTime() override { return _networkTime; }
+
+ private:
+  ScratchHost(const std::string& directory, std::unique_ptr<MachineFile> machine, EffectSink& effects,
+              RunLoop& runLoop);
+
+  std::unique_ptr<MachineFile> _machine;
+  MachineSettings _settings;
+  EffectsLog _effectsLog;
+  SystemRoot _root;
+  RootedFileSystem _files;
+  ScratchUserDatabase _users;
+  ScratchAdminAuthenticator _authenticator;
+  ScratchSystemLog _systemLog;
+  ScratchClockService _clock;
+  ScratchNetworkTimeService _networkTime;
+};
+
+}  // namespace tavisk

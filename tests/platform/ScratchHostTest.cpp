@@ -1,0 +1,126 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "ScratchMachine.h"
+#include "contract/AdminAuthenticatorContract.h"
+#include "contract/ClockContract.h"
+#include "contract/FileSystemContract.h"
+#include "contract/NetworkTimeContract.h"
+#include "contract/UserDatabaseContract.h"
+
+namespace tavisk {
+namespace {
+
+using testing::ElementsAre;
+
+PropertyList::Array integers(const std::vector<GroupId>& numbers) {
+  PropertyList::Array list;
+  for (auto number : numbers) list.emplace_back(std::int64_t{number});
+  return list;
+}
+
+struct ScratchUsers {
+  static constexpr bool choosesUser = true;
+  UserDatabase& service() { return machine.host().users(); }
+  void haveUser(UserId id, const std::vector<GroupId>& groups) {
+    machine.set("User", "ID", std::int64_t{id});
+    machine.set("User", "Groups", integers(groups));
+  }
+  void haveGroup(const std::string& name, GroupId id) { machine.set("Group Database", name, std::int64_t{id}); }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, UserDatabaseContract, ScratchUsers);
+
+struct ScratchAuthenticator {
+  AdminAuthenticator& service() { return machine.host().authenticator(); }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, AdminAuthenticatorContract, ScratchAuthenticator);
+
+struct ScratchClock {
+  static constexpr bool setsClock = true;
+  ClockService& service() { return machine.host().clock(); }
+  void haveZones(const std::vector<std::string>& names) {
+    machine.set("Clock", "Known Time Zones", PropertyList::Array(names.begin(), names.end()));
+  }
+  std::vector<std::string> effects() { return machine.effectsLog(); }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, ClockContract, ScratchClock);
+
+struct ScratchNetworkTime {
+  static constexpr bool takesAnyText = true;
+  NetworkTimeService& service() { return machine.host().networkTime(); }
+  bool launchesAtStartup() { return machine.get("Network Time", "Launch At Startup") == PropertyList(true); }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, NetworkTimeContract, ScratchNetworkTime);
+
+struct ScratchFiles {
+  FileSystem& service() { return machine.host().files(); }
+  std::filesystem::path root() {
+    auto folder = std::filesystem::path(machine.directory()) / "root";
+    std::filesystem::create_directory(folder);
+    return folder;
+  }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, FileSystemContract, ScratchFiles);
+
+TEST(ScratchHost, HasEveryDefaultWithoutAMachineFile) {
+  ScratchMachine machine;
+  auto& host = machine.host();
+  EXPECT_EQ(host.users().realUserId(), 0U);
+  EXPECT_TRUE(host.users().supplementaryGroups(16)->empty());
+  EXPECT_EQ(host.users().groupNamed("admin"), 80U);
+  EXPECT_GT(host.clock().knownTimeZones().size(), 100U);
+  EXPECT_FALSE(host.files().exists("/"));
+  EXPECT_FALSE(std::filesystem::exists(machine.directory() + "/machine.plist"));
+}
+
+TEST(ScratchHost, TakesNoNumberThatIsNoIdForTheSuperUser) {
+  ScratchMachine machine;
+  for (std::int64_t number : {std::int64_t{1} << 32, std::int64_t{-1} << 32, std::int64_t{-1}}) {
+    machine.set("User", "ID", number);
+    EXPECT_NE(machine.host().users().realUserId(), 0U) << number;
+  }
+}
+
+TEST(ScratchHost, StandsStillAtTheTimeOfTheFile) {
+  ScratchMachine machine;
+  machine.set("Clock", "Time", -1);
+  auto& clock = machine.host().clock();
+  EXPECT_EQ(clock.now(), -1);
+  clock.setTime(253'402'300'799);
+  EXPECT_EQ(machine.get("Clock", "Time"), PropertyList(std::int64_t{253'402'300'799}));
+  EXPECT_EQ(machine.get("Clock", "Offset"), std::nullopt);
+}
+
+TEST(ScratchHost, CountsEveryOperation) {
+  ScratchMachine machine;
+  auto& host = machine.host();
+  for (int times = 0; times < 2; ++times) {
+    host.authenticator().deauthenticate();
+    host.networkTime().restartAsynchronously();
+    host.networkTime().stop();
+  }
+  EXPECT_EQ(machine.get("Authorization", "Deauthentications"), PropertyList(2));
+  EXPECT_EQ(machine.get("Network Time", "Restarts"), PropertyList(2));
+  EXPECT_EQ(machine.get("Network Time", "Running"), PropertyList(false));
+  EXPECT_EQ(machine.effectsLog().size(), 6U);
+}
+
+TEST(ScratchHost, KeepsTheZoneAndItsFileTogether) {
+  ScratchMachine machine;
+  machine.host().clock().setTimeZone("/usr/share/zoneinfo/America/Los_Angeles");
+  EXPECT_EQ(machine.get("Clock", "Time Zone"), PropertyList("America/Los_Angeles"));
+  EXPECT_EQ(machine.get("Clock", "Time Zone File"), PropertyList("/usr/share/zoneinfo/America/Los_Angeles"));
+}
+
+TEST(ScratchHost, WritesOneLineAMessage) {
+  ScratchMachine machine;
+  for (const char* message : {"one\n", "two\nlines\n\n", "", "three"}) machine.host().systemLog().write(message);
+  EXPECT_THAT(machine.systemLog(), ElementsAre("one", "two\\nlines\\n", "", "three"));
+}
+
+}  // namespace
+}  // namespace tavisk

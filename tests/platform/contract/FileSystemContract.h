@@ -1,0 +1,118 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/socket.h>
+#include <sys/stat.h>
+#include <sys/un.h>
+#include <unistd.h>
+
+#include <filesystem>
+#include <string>
+
+#include "platform/FileSystem.h"
+
+namespace tavisk {
+
+/// `Machine` offers: service(), and root(), an empty folder on this machine with the files of that machine.
+template <typename Machine>
+class FileSystemContract : public testing::Test {
+ protected:
+  std::filesystem::path at(const char* path) { return machine.root() / std::filesystem::path(path).relative_path(); }
+  void link(const char* path, const std::string& target) { std::filesystem::create_symlink(target, at(path)); }
+
+  void SetUp() override {
+    std::filesystem::create_directories(at("/Volumes/Backup/System"));
+    std::ofstream(at("/Volumes/Backup/System/boot.efi")) << "loader";
+    link("/startup", "Volumes/Backup");
+    link("/absolute", "/Volumes/Backup/System");
+    link("/out", "../../../../../../../../../../Volumes");
+    link("/loop", "/loop");
+    link("/dangling", "/no/such");
+  }
+  Machine machine;
+};
+
+TYPED_TEST_SUITE_P(FileSystemContract);
+
+TYPED_TEST_P(FileSystemContract, FollowsLinksInsideTheRootOnly) {
+  for (const char* path : {"/Volumes/Backup/System/boot.efi", "/startup/System/boot.efi", "/absolute/boot.efi",
+                           "/out/Backup/System/boot.efi", "//startup/./System/../System/boot.efi",
+                           "/../../Volumes/Backup/System/boot.efi"}) {
+    EXPECT_TRUE(this->machine.service().exists(path)) << path;
+    EXPECT_EQ(this->machine.service().read(path, 6).valueOr("none"), "loader") << path;
+  }
+  for (const char* path : {"", "Volumes", "/dangling", "/loop", "/Volumes/Backup/System/boot.efi/", "/no/../Volumes"})
+    EXPECT_FALSE(this->machine.service().exists(path)) << path;
+  EXPECT_FALSE(this->machine.service().exists(std::string("/Volumes\0/x", 11)));
+}
+
+TYPED_TEST_P(FileSystemContract, StandardizesAPathAsFarAsItExists) {
+  const std::pair<const char*, const char*> cases[] = {
+      {"/", "/"},
+      {"/../..", "/"},
+      {"//Volumes///Backup/./", "/Volumes/Backup"},
+      {"/startup/System", "/Volumes/Backup/System"},
+      {"/absolute", "/Volumes/Backup/System"},
+      {"/absolute/..", "/Volumes/Backup"},
+      {"/out/Backup", "/Volumes/Backup"},
+      {"/dangling/more", "/no/such/more"},
+      {"/no/such/../startup", "/no/startup"},
+      {"/no/../startup/x/y", "/Volumes/Backup/x/y"},
+      {"/startup/System/boot.efi/x", "/Volumes/Backup/System/boot.efi/x"},
+  };
+  for (const auto& [path, standardized] : cases)
+    EXPECT_EQ(this->machine.service().standardized(path).valueOr("none"), standardized) << path;
+}
+
+TYPED_TEST_P(FileSystemContract, TellsWhatWasTriedOnWhichPathAndWhy) {
+  auto& files = this->machine.service();
+  this->link("/a", std::string(200, 'x') + "/../b");
+  std::ofstream(this->at("/large")) << std::string(100, 'x');
+  const std::pair<std::string, std::string> cases[] = {
+      {"/no/such", "No such file or directory"},
+      {"/loop", "Too many levels of symbolic links"},
+      {"/" + std::string(300, 'x'), "File name too long"},
+      {"/Volumes", "not a regular file"},
+      {"Volumes", "not an absolute path"},
+      {"/large", "larger than 99 bytes"},
+  };
+  for (const auto& [path, why] : cases) {
+    auto read = files.read(path, 99);
+    ASSERT_FALSE(read) << path;
+    EXPECT_EQ(read.failure().on, path);
+    EXPECT_EQ(read.failure().why, why);
+    EXPECT_FALSE(read.failure().tried.empty());
+  }
+  EXPECT_EQ(files.standardized("/loop/x").failure().why, "Too many levels of symbolic links");
+}
+
+TYPED_TEST_P(FileSystemContract, OpensNothingButRegularFiles) {
+  ASSERT_EQ(::mkfifo(this->at("/fifo").c_str(), 0600), 0);
+  int socket = ::socket(AF_UNIX, SOCK_STREAM, 0);
+  sockaddr_un address{};
+  address.sun_family = AF_UNIX;
+  this->at("/socket").string().copy(address.sun_path, sizeof address.sun_path - 1);
+  ASSERT_EQ(::bind(socket, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+  for (const char* path : {"/fifo", "/socket"}) {
+    EXPECT_TRUE(this->machine.service().exists(path));
+    EXPECT_EQ(this->machine.service().read(path, 99).failure().why, "not a regular file") << path;
+  }
+  ::close(socket);
+}
+
+TYPED_TEST_P(FileSystemContract, EndsOnAnEndlessChainOfLinks) {
+  this->link("/chain0", "/Volumes");
+  for (int index = 1; index <= 1000; ++index)
+    this->link(("/chain" + std::to_string(index)).c_str(), "/chain" + std::to_string(index - 1));
+  EXPECT_EQ(this->machine.service().standardized("/chain1000").failure().why, "Too many levels of symbolic links");
+  EXPECT_EQ(this->machine.service().standardized("/chain30").valueOr("none"), "/Volumes");
+}
+
+REGISTER_TYPED_TEST_SUITE_P(FileSystemContract, FollowsLinksInsideTheRootOnly, StandardizesAPathAsFarAsItExists,
+                            TellsWhatWasTriedOnWhichPathAndWhy, OpensNothingButRegularFiles,
+                            EndsOnAnEndlessChainOfLinks);
+
+}  // namespace tavisk
