@@ -1,0 +1,39 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "platform/RunLoop.h"
+#include "platform/SystemRoot.h"
+#include "platform/linux/Daemons.h"
+
+namespace tavisk {
+
+/// Daemons of a machine without the service manager: the scripts in /etc/init.d, the links to them in the folders of
+/// the run levels, and the processes that run.
+class InitScriptDaemons : public Daemons {
+ public:
+  /// Both must outlive the object.
+  InitScriptDaemons(const SystemRoot& root, RunLoop& runLoop) : _root(root), _runLoop(runLoop) {}
+
+  Result<Presence> presence(const Daemon& daemon) override;
+  Result<bool> isRunning(const Daemon& daemon) override;
+  Result<bool> startsAtBoot(const Daemon& daemon) override;
+  Result<void> setStartsAtBoot(const Daemon& daemon, bool starts) override;
+  Result<void> start(const Daemon& daemon) override;
+  Result<void> stop(const Daemon& daemon) override;
+  Result<void> restartIfRunning(const Daemon& daemon) override;
+
+ private:
+  bool hasLink(const Daemon& daemon, const char* kinds) const;
+  Result<void> awaitEnd(const Daemon& daemon);
+  Result<void> runScript(const Daemon& daemon, const char* action);
+  Result<void> run(const std::vector<std::string>& words);
+
+  const SystemRoot& _root;
+  RunLoop& _runLoop;
+};
+
+}  // namespace tavisk

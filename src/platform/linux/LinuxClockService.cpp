@@ -1,0 +1,114 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/LinuxClockService.h"
+
+#include <chrono>
+
+#include "platform/SettingNames.h"
+#include "platform/Text.h"
+#include "platform/ZoneList.h"
+#include "platform/linux/LocalTime.h"
+#include "platform/linux/SystemClock.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* withoutZone = "UTC";
+constexpr const char* timeUnit = "seconds since 1970";
+
+/// The clock as it was at one moment, also when it is read later.
+class ClockAtMoment {
+ public:
+  void isNow() { _moment = RunLoop::Clock::now(); }
+  std::int64_t time() const {
+    if (!_moment) return systemTime();
+    auto since = std::chrono::system_clock::now() - (RunLoop::Clock::now() - *_moment);
+    return std::chrono::round<std::chrono::seconds>(since.time_since_epoch()).count();
+  }
+
+ private:
+  std::optional<RunLoop::Clock::time_point> _moment;
+};
+
+}  // namespace
+
+std::int64_t LinuxClockService::now() {
+  auto time = systemTime();
+  _machine.effects.observe({setting::time, std::to_string(time), std::nullopt, timeUnit});
+  return time;
+}
+
+/// The clock of the machine that runs the tool is not that of any tree of files.
+std::optional<Failure> LinuxClockService::whyNoClock() const {
+  if (_machine.root.prefix() != "/")
+    return Failure{"set the clock", _machine.root.prefix(), "a tree of files has no clock"};
+  if (auto failure = whyNeedsRoot("set the clock", "CLOCK_REALTIME")) return failure;
+  if (!maySetSystemTime())
+    return Failure{"set the clock", "CLOCK_REALTIME",
+                   "no CAP_SYS_TIME here: set it on the machine that hosts this container"};
+  return std::nullopt;
+}
+
+void LinuxClockService::setTime(std::int64_t secondsSince1970) {
+  ClockAtMoment clock;
+  Setting time;
+  time.name = setting::time;
+  time.unit = timeUnit;
+  time.where = _machine.root.exists(hardwareClock) ? hardwareClock : "";
+  time.live = [&clock] { return std::optional(std::to_string(clock.time())); };
+  time.apply = [&](const std::string&) -> Result<void> {
+    clock.isNow();
+    return changeTime(secondsSince1970);
+  };
+  carryOut(time, std::to_string(secondsSince1970), _machine.effects, _machine.runLoop);
+}
+
+Result<void> LinuxClockService::changeTime(std::int64_t secondsSince1970) {
+  if (auto failure = whyOutOfClockRange(secondsSince1970)) return *failure;
+  if (auto failure = whyNoClock()) return *failure;
+  if (auto set = setSystemTime(secondsSince1970); !set) return set;
+  return setHardwareClock(_machine.root, secondsSince1970);
+}
+
+std::vector<std::string> LinuxClockService::knownTimeZones() {
+  auto zones = installedZones(_machine.root);
+  if (zones) return *zones;
+  Effect effect;
+  effect.setting = setting::knownTimeZones;
+  effect.outcome = Outcome::failed;
+  effect.failure = zones.failure();
+  _machine.effects.record(effect);
+  return {};
+}
+
+/// The link counts; a second copy of the name that says something else is told with it.
+Setting LinuxClockService::timeZoneSetting() const {
+  Setting zone;
+  zone.name = setting::timeZone;
+  zone.where = "/etc/localtime";
+  zone.live = [&root = _machine.root] { return machineTimeZone(root); };
+  zone.stored = [&root = _machine.root] {
+    auto second = timeZoneFileName(root);
+    return second ? second : machineTimeZone(root);
+  };
+  return zone;
+}
+
+std::string LinuxClockService::timeZone() {
+  return observe(timeZoneSetting(), _machine.effects).value_or(withoutZone);
+}
+
+void LinuxClockService::setTimeZone(const std::string& zoneFile) {
+  auto zone = timeZoneSetting();
+  zone.store = [this](const std::string& name) { return updateTimeZoneFile(_machine.root, name); };
+  zone.apply = [this](const std::string& name) { return linkLocalTime(_machine.root, name); };
+  carryOut(zone, zoneOfPath(zoneFile).value_or(zoneFile), _machine.effects, _machine.runLoop);
+}
+
+std::string LinuxClockService::rulesOf(const std::string& timeZone) {
+  auto file = zoneFolder + timeZone;
+  const auto& prefix = _machine.root.prefix();
+  return (prefix == "/" ? "" : prefix) + zoneFolder + zoneOfPath(file).value_or(withoutZone);
+}
+
+}  // namespace tavisk

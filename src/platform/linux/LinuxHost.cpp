@@ -1,0 +1,19 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/LinuxHost.h"
+
+namespace tavisk {
+
+LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& root)
+    : _root(root),
+      _journalLog(_root),
+      _services(_root, runLoop),
+      _machine{_root, effects, runLoop, _services},
+      _files(_root),
+      _systemLog(_root),
+      _clock(_machine),
+      _networkTime(_machine) {
+  effects.addChannel(_journalLog);
+}
+
+}  // namespace tavisk

@@ -1,0 +1,47 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include "platform/Host.h"
+#include "platform/RootedFileSystem.h"
+#include "platform/linux/JournalLog.h"
+#include "platform/linux/LinuxAdminAuthenticator.h"
+#include "platform/linux/LinuxClockService.h"
+#include "platform/linux/LinuxMachine.h"
+#include "platform/linux/LinuxNetworkTimeService.h"
+#include "platform/linux/LinuxSystemLog.h"
+#include "platform/linux/LinuxUserDatabase.h"
+
+namespace tavisk {
+
+/// The machine that the tool runs on. Nothing is asked of it until a service is used.
+class LinuxHost final : public Host {
+ public:
+  /// Adds the system log to the channels of `effects`; the host must be alive whenever effects are told. With a root
+  /// other than "/" the files, sockets and processes are those beneath that folder; the users and the clock are this
+  /// machine's, and the clock is not set.
+  LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& root = "/");
+
+  UserDatabase& users() override { return _users; }
+  AdminAuthenticator& authenticator() override { return _authenticator; }
+  FileSystem& files() override { return _files; }
+  SystemLog& systemLog() override { return _systemLog; }
+  ClockService& clock() override { return _clock; }
+  NetworkTimeService& networkTime() override { return _networkTime; }
+
+ private:
+  SystemRoot _root;
+  JournalLog _journalLog;
+  ServiceAccess _services;
+  LinuxMachine _machine;
+  LinuxUserDatabase _users;
+  LinuxAdminAuthenticator _authenticator;
+  RootedFileSystem _files;
+  LinuxSystemLog _systemLog;
+  LinuxClockService _clock;
+  LinuxNetworkTimeService _networkTime;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,162 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/LinuxNetworkTimeService.h"
+
+#include "platform/SettingNames.h"
+#include "platform/linux/HostName.h"
+#include "platform/linux/Program.h"
+
+namespace tavisk {
+namespace {
+
+using Value = std::optional<std::string>;
+
+const char* onOff(bool on) {
+  return on ? "on" : "off";
+}
+
+Result<Value> asOnOff(const Result<bool>& on) {
+  if (!on) return on.failure();
+  return Value(onOff(*on));
+}
+
+Failure noClient() {
+  std::string names;
+  for (const auto& daemon : timeDaemons()) names += (names.empty() ? "" : ", ") + std::string(daemon.daemon.unit);
+  return {"find a network-time client", names, "none of them is installed"};
+}
+
+}  // namespace
+
+Daemons& LinuxNetworkTimeService::daemons() {
+  return _machine.services.daemons();
+}
+
+Result<const TimeDaemon*> LinuxNetworkTimeService::client() {
+  const TimeDaemon* masked = nullptr;
+  for (const auto& candidate : timeDaemons()) {
+    auto presence = daemons().presence(candidate.daemon);
+    if (!presence) return presence.failure();
+    if (*presence == Daemons::Presence::installed) return &candidate;
+    if (*presence == Daemons::Presence::masked && masked == nullptr) masked = &candidate;
+  }
+  return masked;
+}
+
+template <typename Answer, typename Use>
+Result<Answer> LinuxNetworkTimeService::withClient(Use use) {
+  auto found = client();
+  if (!found) return found.failure();
+  if (*found == nullptr) return noClient();
+  return use(**found);
+}
+
+/// A client that cannot be asked for is no reason: whatever is done with it then tells why.
+std::optional<Failure> LinuxNetworkTimeService::whyNotSupported() {
+  auto found = client();
+  if (!found || *found != nullptr) return std::nullopt;
+  return noClient();
+}
+
+Setting LinuxNetworkTimeService::named(const char* name) {
+  Setting setting;
+  setting.name = name;
+  setting.supported = [this] { return whyNotSupported(); };
+  return setting;
+}
+
+Setting LinuxNetworkTimeService::runningSetting() {
+  auto setting = named(setting::networkTime);
+  setting.live = [this]() -> Result<Value> {
+    auto found = client();
+    if (!found) return found.failure();
+    return asOnOff(*found == nullptr ? Result<bool>(false) : daemons().isRunning((*found)->daemon));
+  };
+  setting.apply = [this](const std::string& value) {
+    return withClient<void>([&](const TimeDaemon& client) {
+      return value == onOff(true) ? daemons().start(client.daemon) : daemons().stop(client.daemon);
+    });
+  };
+  return setting;
+}
+
+bool LinuxNetworkTimeService::isRunning() {
+  return observe(runningSetting(), _machine.effects) == onOff(true);
+}
+
+void LinuxNetworkTimeService::start() {
+  change(runningSetting(), onOff(true));
+}
+
+void LinuxNetworkTimeService::stop() {
+  change(runningSetting(), onOff(false));
+}
+
+void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
+  auto setting = named(setting::networkTimeAtStartup);
+  setting.stored = [this] {
+    return withClient<Value>([&](const TimeDaemon& client) { return asOnOff(daemons().startsAtBoot(client.daemon)); });
+  };
+  setting.store = [this](const std::string& value) {
+    return withClient<void>(
+        [&](const TimeDaemon& client) { return daemons().setStartsAtBoot(client.daemon, value == onOff(true)); });
+  };
+  change(setting, onOff(launch));
+}
+
+Setting LinuxNetworkTimeService::serverSetting() {
+  auto setting = named(setting::networkTimeServer);
+  setting.stored = [this]() -> Result<Value> {
+    auto found = client();
+    if (!found) return found.failure();
+    return *found == nullptr ? Value() : Value((*found)->server(_machine.root));
+  };
+  return setting;
+}
+
+NetworkTimeServer LinuxNetworkTimeService::server() {
+  return {observe(serverSetting(), _machine.effects).value_or("")};
+}
+
+void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
+  auto setting = serverSetting();
+  if (auto found = client(); found && *found != nullptr) {
+    setting.where = (*found)->serverFile;
+    setting.supported = [&] { return (*found)->whyNotRead(_machine.root); };
+  }
+  setting.store = [this](const std::string& address) {
+    return withClient<void>([&](const TimeDaemon& client) { return storeServer(client, address); });
+  };
+  change(setting, server.address);
+}
+
+Result<void> LinuxNetworkTimeService::storeServer(const TimeDaemon& client, const std::string& address) {
+  constexpr const char* tried = "set the server";
+  if (!isHostNameOrAddress(address))
+    return Failure{tried, client.serverFile, "only a host name or an address is stored"};
+  if (auto failure = whyNeedsRoot(tried, client.serverFile)) return *failure;
+  return _machine.root.write(client.serverFile, client.serverLines(address));
+}
+
+void LinuxNetworkTimeService::restartAsynchronously() {
+  auto setting = named(setting::networkTimeRestart);
+  setting.apply = [this](const std::string&) {
+    return withClient<void>([&](const TimeDaemon& client) { return reload(client); });
+  };
+  setting.always = true;
+  change(setting, "restart");
+}
+
+Result<void> LinuxNetworkTimeService::reload(const TimeDaemon& client) {
+  if (client.reload.empty()) return daemons().restartIfRunning(client.daemon);
+  if (auto failure = whyNeedsRoot("run", client.reload.front())) return *failure;
+  auto printed = runProgram(_machine.root, {client.reload.begin(), client.reload.end()}, _machine.runLoop);
+  if (!printed) return printed.failure();
+  return {};
+}
+
+void LinuxNetworkTimeService::change(const Setting& setting, const std::string& asked) {
+  carryOut(setting, asked, _machine.effects, _machine.runLoop);
+}
+
+}  // namespace tavisk

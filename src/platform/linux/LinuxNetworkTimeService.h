@@ -1,0 +1,43 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "platform/NetworkTimeService.h"
+#include "platform/SettingChange.h"
+#include "platform/linux/LinuxMachine.h"
+#include "platform/linux/TimeDaemons.h"
+
+namespace tavisk {
+
+/// The network-time daemon that is installed, and the tool's own file among its servers.
+class LinuxNetworkTimeService : public NetworkTimeService {
+ public:
+  explicit LinuxNetworkTimeService(const LinuxMachine& machine) : _machine(machine) {}
+
+  bool isRunning() override;
+  void setLaunchAtStartup(bool launch) override;
+  void start() override;
+  void stop() override;
+  NetworkTimeServer server() override;
+  void setServer(const NetworkTimeServer& server) override;
+  void restartAsynchronously() override;
+
+ private:
+  Daemons& daemons();
+  /// The first daemon that is installed, else the first that is masked, else none.
+  Result<const TimeDaemon*> client();
+  /// What `use` answers for the client; a failure when there is none.
+  template <typename Answer, typename Use>
+  Result<Answer> withClient(Use use);
+  std::optional<Failure> whyNotSupported();
+  Setting named(const char* name);
+  Setting runningSetting();
+  Setting serverSetting();
+  void change(const Setting& setting, const std::string& asked);
+  Result<void> storeServer(const TimeDaemon& client, const std::string& address);
+  Result<void> reload(const TimeDaemon& client);
+
+  LinuxMachine _machine;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,39 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "platform/SystemRoot.h"
+
+namespace tavisk {
+
+/// The first line of every file that this host writes for itself alone.
+inline constexpr const char* dropInHeader = "# Written by tavisk. Changes made here are replaced.\n";
+
+/// The configuration of one of the service manager's daemons, as it reads it (systemd-timesyncd's timesyncd.conf(5)
+/// describes the order): the main file, then the drop-ins of all folders by name, where /etc hides /run and /run hides
+/// /usr.
+class SystemdConfig {
+ public:
+  /// `file` is the name of the main file: "timesyncd.conf". The root must outlive the object.
+  SystemdConfig(const SystemRoot& root, std::string file) : _root(root), _file(std::move(file)) {}
+
+  /// The words of a key that collects values, such as "NTP": an empty assignment forgets the ones before it.
+  std::vector<std::string> words(std::string_view section, std::string_view key) const;
+  /// The tool's own drop-in.
+  std::string ownDropIn() const;
+
+ private:
+  std::vector<std::string> files() const;
+
+  const SystemRoot& _root;
+  std::string _file;
+};
+
+/// The values of a key in one file of such a kind, in order; later lines come later.
+std::vector<std::string> assignments(std::string_view text, std::string_view section, std::string_view key);
+
+}  // namespace tavisk

@@ -1,0 +1,130 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/TimeDaemons.h"
+
+#include <algorithm>
+#include <string_view>
+#include <vector>
+
+#include "platform/Text.h"
+#include "platform/linux/SystemdConfig.h"
+
+namespace tavisk {
+namespace {
+
+constexpr std::size_t fileLimit = std::size_t{1} << 20U;
+constexpr const char* chronyConfig = "/etc/chrony/chrony.conf";
+constexpr const char* chronyServerFile = "/etc/chrony/sources.d/60-tavisk.sources";
+constexpr const char* ntpsecConfig = "/etc/ntpsec/ntp.conf";
+constexpr const char* ntpsecServerFile = "/etc/ntpsec/ntp.d/60-tavisk.conf";
+constexpr const char* timesyncdServerFile = "/etc/systemd/timesyncd.conf.d/60-tavisk.conf";
+
+/// The lines of a file as words: chrony.conf(5) and ntp.conf(5) agree on comments and on one directive a line.
+std::vector<std::vector<std::string>> directives(const SystemRoot& root, const std::string& file) {
+  std::vector<std::vector<std::string>> found;
+  for (const auto& line : split(root.read(file, fileLimit).valueOr(""), "\n")) {
+    auto words = split(line, " \t\r");
+    if (words.empty() || std::string_view("#%;!").find(words[0][0]) != std::string_view::npos) continue;
+    words[0] = lowerCased(words[0]);
+    found.push_back(std::move(words));
+  }
+  return found;
+}
+
+/// The server that a directive names; empty when it names none.
+std::string serverOf(const std::vector<std::string>& directive) {
+  constexpr std::string_view kinds[] = {"server", "pool", "peer"};
+  if (directive.size() < 2 || std::ranges::find(kinds, directive[0]) == std::end(kinds)) return {};
+  return directive[1];
+}
+
+std::string firstServer(const SystemRoot& root, const std::string& file) {
+  for (const auto& directive : directives(root, file))
+    if (auto server = serverOf(directive); !server.empty()) return server;
+  return {};
+}
+
+std::string firstServerInFolder(const SystemRoot& root, const std::string& folder, std::string_view ending) {
+  for (const auto& name : root.list(folder).valueOr({})) {
+    if (!name.ends_with(ending)) continue;
+    if (auto server = firstServer(root, folder + "/" + name); !server.empty()) return server;
+  }
+  return {};
+}
+
+/// As chronyd reads its configuration: "confdir" and "sourcedir" lines take in the files of folders.
+std::string chronyConfiguredServer(const SystemRoot& root) {
+  for (const auto& directive : directives(root, chronyConfig)) {
+    auto server = serverOf(directive);
+    for (std::size_t i = 1; i < directive.size() && server.empty(); ++i) {
+      if (directive[0] == "confdir") server = firstServerInFolder(root, directive[i], ".conf");
+      if (directive[0] == "sourcedir") server = firstServerInFolder(root, directive[i], ".sources");
+    }
+    if (!server.empty()) return server;
+  }
+  return {};
+}
+
+std::string chronyServer(const SystemRoot& root) {
+  auto own = firstServer(root, chronyServerFile);
+  return own.empty() ? chronyConfiguredServer(root) : own;
+}
+
+std::optional<Failure> chronyWhyNotRead(const SystemRoot& root) {
+  for (const auto& directive : directives(root, chronyConfig))
+    if (directive[0] == "sourcedir" && std::ranges::find(directive, "/etc/chrony/sources.d") != directive.end())
+      return std::nullopt;
+  return Failure{
+      "set the server", chronyServerFile,
+      "chronyd does not read it: " + std::string(chronyConfig) + " has no line \"sourcedir /etc/chrony/sources.d\""};
+}
+
+std::string ntpsecServer(const SystemRoot& root) {
+  auto own = firstServer(root, ntpsecServerFile);
+  if (own.empty()) own = firstServer(root, ntpsecConfig);
+  return own.empty() ? firstServerInFolder(root, "/etc/ntpsec/ntp.d", ".conf") : own;
+}
+
+std::string timesyncdServer(const SystemRoot& root) {
+  auto servers = SystemdConfig(root, "timesyncd.conf").words("Time", "NTP");
+  return servers.empty() ? std::string() : servers.front();
+}
+
+std::string serverDirective(const std::string& server) {
+  return dropInHeader + ("server " + server) + " iburst\n";
+}
+
+/// The empty assignment takes the place of servers in files before this one.
+std::string timesyncdLines(const std::string& server) {
+  return dropInHeader + ("[Time]\nNTP=\nNTP=" + server) + "\n";
+}
+
+std::optional<Failure> alwaysRead(const SystemRoot&) {
+  return std::nullopt;
+}
+
+constexpr const char* chronyReload[] = {"/usr/bin/chronyc", "reload", "sources"};
+
+constexpr TimeDaemon daemons[] = {
+    {{"chrony.service", "chrony", "chronyd"},
+     chronyServerFile,
+     chronyServer,
+     serverDirective,
+     chronyWhyNotRead,
+     chronyReload},
+    {{"ntpsec.service", "ntpsec", "ntpd"}, ntpsecServerFile, ntpsecServer, serverDirective, alwaysRead, {}},
+    {{"systemd-timesyncd.service", "", "systemd-timesyncd"},
+     timesyncdServerFile,
+     timesyncdServer,
+     timesyncdLines,
+     alwaysRead,
+     {}},
+};
+
+}  // namespace
+
+std::span<const TimeDaemon> timeDaemons() {
+  return daemons;
+}
+
+}  // namespace tavisk

@@ -1,0 +1,33 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <span>
+#include <string>
+
+#include "platform/Result.h"
+#include "platform/SystemRoot.h"
+#include "platform/linux/Daemons.h"
+
+namespace tavisk {
+
+/// A network-time daemon: how it is called and how it keeps its server.
+struct TimeDaemon {
+  Daemon daemon;
+  const char* serverFile;  ///< the tool's own file for the server
+
+  /// The server that comes first: the tool's own, else the first one configured; empty when there is none.
+  std::string (*server)(const SystemRoot& root);
+  /// The contents of the server file.
+  std::string (*serverLines)(const std::string& server);
+  /// Why the daemon would not read the server file; absent when it does.
+  std::optional<Failure> (*whyNotRead)(const SystemRoot& root);
+  /// The program by which the running daemon reads its servers again, with its arguments; without one it is restarted.
+  std::span<const char* const> reload;
+};
+
+/// The daemons that this host knows, the preferred one first.
+std::span<const TimeDaemon> timeDaemons();
+
+}  // namespace tavisk
