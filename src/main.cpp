@@ -50,7 +50,7 @@ Result<std::unique_ptr<Host>> chooseHost(EffectSink& effects, RunLoop& runLoop) 
   const std::optional<std::string> name = environmentVariable("TAVISK_HOST");
   if (!name) return std::unique_ptr<Host>(std::make_unique<LinuxHost>(effects, runLoop));
   if (name->starts_with(scratch)) return openScratchHost(name->substr(scratch.size()), effects, runLoop);
-  return Failure{"choose the host", "TAVISK_HOST=" + *name, "unset or scratch:DIR is expected"};
+  return Failure{"use TAVISK_HOST=" + *name, "", "unset or scratch:DIR is expected"};
 }
 
 int run(Report* report, int argc, char** argv) {
