@@ -1,0 +1,66 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdio>
+#include <cstdlib>
+#include <memory>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "ScratchMachine.h"
+#include "frontend/RemoteServerSettings.h"
+#include "terminal/StreamLineSource.h"
+
+namespace tavisk {
+
+struct CloseStream {
+  void operator()(std::FILE* stream) const { std::fclose(stream); }
+};
+using Stream = std::unique_ptr<std::FILE, CloseStream>;
+
+/// A stream to read the text from.
+inline Stream streamOf(std::string_view text) {
+  Stream stream(std::tmpfile());
+  std::fwrite(text.data(), 1, text.size(), stream.get());
+  std::rewind(stream.get());
+  return stream;
+}
+
+inline std::string textOf(std::FILE* stream) {
+  std::string text;
+  std::rewind(stream);
+  for (int byte = std::fgetc(stream); byte != EOF; byte = std::fgetc(stream)) text += static_cast<char>(byte);
+  return text;
+}
+
+struct RunOptions {
+  std::string_view typed = {};  ///< standard input
+  Report* report = nullptr;     ///< must be a channel of the machine's effects already
+  std::string_view commandTable = CommandTable::text();
+  std::FILE* output = nullptr;  ///< instead of ToolResult::output
+};
+
+struct ToolResult {
+  std::string output;
+  int status;
+};
+
+/// One run of the tool on the machine, in this process: all that the program does but for hosts and signals.
+inline ToolResult runTool(ScratchMachine& machine, std::vector<std::string> words, const RunOptions& options = {}) {
+  const Stream printed(std::tmpfile());
+  const Stream typed = streamOf(options.typed);
+  Output output(options.output ? options.output : printed.get());
+  StreamLineSource input(typed.get(), output);
+  NotificationCenter notifications;
+  RemoteServerSettings settings({machine.host(), machine.runLoop, notifications, output, input}, machine.effects,
+                                options.report, options.commandTable);
+  words.insert(words.begin(), "tavisk");
+  std::vector<char*> arguments;
+  for (std::string& word : words) arguments.push_back(word.data());
+  if (settings.runTool(static_cast<int>(arguments.size()), arguments.data())) machine.runLoop.run();
+  return {textOf(printed.get()), settings.exitStatus()};
+}
+
+}  // namespace tavisk

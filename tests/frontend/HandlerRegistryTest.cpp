@@ -1,0 +1,92 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <set>
+
+#include "frontend/CommandTable.h"
+#include "frontend/HandlerRegistry.h"
+#include "frontend/Help.h"
+#include "frontend/ServerCommands.h"
+
+namespace tavisk {
+
+namespace {
+
+const std::set<std::string> notBuiltYet = {
+    "getSleep",
+    "setSleep:",
+    "getComputerSleep",
+    "setComputerSleep:",
+    "getDisplaySleep",
+    "setDisplaySleep:",
+    "getHardDiskSleep",
+    "setHardDiskSleep:",
+    "getWakeOnModem",
+    "setWakeOnModem:",
+    "getWakeOnNetworkAccess",
+    "setWakeOnNetworkAccess:",
+    "getRestartPowerFailure",
+    "setRestartPowerFailure:",
+    "getRestartFreeze",
+    "setRestartFreeze:",
+    "getAllowPowerButtonToSleepComputer",
+    "setAllowPowerButtonToSleepComputer:",
+    "getRemoteLogin",
+    "setRemoteLogin:",
+    "getRemoteVelmarEvents",
+    "setRemoteVelmarEvents:",
+    "getComputerName",
+    "setComputerName:",
+    "getLocalSubnetName",
+    "setLocalSubnetName:",
+    "getStartupDisk",
+    "setStartupDisk:",
+    "listStartupDisk",
+    "getWaitForStartupAfterPowerFailure",
+    "setWaitForStartupAfterPowerFailure:",
+    "getDisableKeyBoardWhenEnclosureLockIsEngaged",
+    "setDisableKeyBoardWhenEnclosureLockIsEngaged:",
+    "getKernelBootArchitectureSetting",
+    "setKernelBootArchitecture:",
+};
+
+CommandTable productTable() {
+  return CommandTable::parse(CommandTable::text()).value();
+}
+
+TEST(HandlerRegistry, agreesWithTheCommandTable) {
+  const CommandTable table = productTable();
+  std::multiset<std::string> expected(notBuiltYet.begin(), notBuiltYet.end());
+  for (const HandlerRows& family : handlerFamilies()) {
+    for (const HandlerRow& row : family) expected.emplace(row.selector);
+  }
+  std::multiset<std::string> selectors;
+  for (const auto& [word, entry] : table.entries()) {
+    selectors.insert(entry.selector);
+    EXPECT_EQ(entry.arguments, entry.selector.ends_with(':') ? 1 : 0) << word;
+    const Handler* handler = findHandler(entry.selector);
+    EXPECT_TRUE(!handler || static_cast<std::int64_t>(handler->index()) == entry.arguments) << word;
+  }
+  EXPECT_EQ(selectors.size(), 49U);
+  EXPECT_EQ(selectors, expected);
+}
+
+TEST(HandlerRegistry, agreesWithTheHelp) {
+  const CommandTable table = productTable();
+  std::set<std::string> untold;
+  for (const auto& [word, entry] : table.entries()) untold.insert(word);
+  for (const HelpEntry& entry : helpEntries()) {
+    std::string word = entry.word;
+    if (word == "-printCommands") word = "-printcommands";
+    const CommandTable::Entry* row = table.find(word);
+    ASSERT_TRUE(row) << word;
+    EXPECT_EQ(*entry.placeholder != '\0', row->arguments == 1) << word;
+    EXPECT_EQ(untold.erase(word), 1U) << word;
+  }
+  EXPECT_THAT(untold, ::testing::ElementsAre("-getkernelbootarchitecturesetting", "-setkernelbootarchitecture"));
+}
+
+}  // namespace
+
+}  // namespace tavisk
