@@ -45,6 +45,16 @@ void EffectSink::record(const Effect& effect) {
   for (EffectChannel* channel : _channels) channel->record(effect);
 }
 
+void EffectSink::recordFailure(const std::string& setting, const Failure& failure,
+                               const std::optional<std::string>& asked) {
+  Effect effect;
+  effect.setting = setting;
+  effect.outcome = Outcome::failed;
+  effect.asked = asked;
+  effect.failure = failure;
+  record(effect);
+}
+
 void EffectSink::observe(const SettingValue& value) {
   const std::lock_guard lock(_mutex);
   for (EffectChannel* channel : _channels) channel->observe(value);

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <mutex>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -30,6 +31,9 @@ class EffectSink {
   void changeBegins(const std::string& setting, const std::string& asked);
   /// The end of the change that began under this name, or a failed read.
   void record(const Effect& effect);
+  /// A failed effect: a read that failed, or a write that has nothing to be read back.
+  void recordFailure(const std::string& setting, const Failure& failure,
+                     const std::optional<std::string>& asked = std::nullopt);
   /// A value that a getter read.
   void observe(const SettingValue& value);
 

@@ -40,13 +40,18 @@ void MachineSettings::change(const MachineSetting& setting, const std::string& a
   carryOut(parts(setting), asked, _effects, _runLoop);
 }
 
+void MachineSettings::note(const MachineSetting& setting, const std::string& asked) {
+  const Result<void> written = write(setting, asked, refusalNamed(setting.name));
+  if (!written) _effects.recordFailure(setting.name, written.failure(), asked);
+}
+
 Setting MachineSettings::parts(const MachineSetting& setting) {
   Setting parts;
   parts.name = setting.name;
   parts.unit = setting.unit;
   parts.where = _file.path();
   if (setting.read) parts.live = parts.stored = [this, &setting] { return readUnlessRefused(setting); };
-  parts.store = [this, &setting](const std::string& value) { return writeUnlessRefused(setting, value); };
+  parts.store = [this, &setting](const std::string& value) { return write(setting, value, refusal(setting.name, "")); };
   parts.always = true;
   return parts;
 }
@@ -56,17 +61,21 @@ MachineSetting::Value MachineSettings::readUnlessRefused(const MachineSetting& s
   return setting.read(_file);
 }
 
-Result<void> MachineSettings::writeUnlessRefused(const MachineSetting& setting, const std::string& value) {
-  if (auto reason = refusal(setting.name, "")) return Failure{"set", machineName, *reason};
+Result<void> MachineSettings::write(const MachineSetting& setting, const std::string& value,
+                                    const std::optional<std::string>& refusal) {
+  if (refusal) return Failure{"set", machineName, *refusal};
   return _file.change([&](MachineFile::Dictionary& machine) { setting.write(machine, value); });
 }
 
 std::optional<std::string> MachineSettings::refusal(const std::string& setting, const char* suffix) {
-  auto refusals = _file.section("Refusals");
-  const auto* reason = refusals.find(setting + suffix);
-  if (!reason) reason = refusals.find(std::string("*") + suffix);
-  if (!reason) return std::nullopt;
-  return *reason->asString();
+  const auto reason = refusalNamed(setting + suffix);
+  return reason ? reason : refusalNamed(std::string("*") + suffix);
+}
+
+std::optional<std::string> MachineSettings::refusalNamed(const std::string& name) {
+  const auto refusals = _file.section("Refusals");
+  const auto* reason = refusals.find(name);
+  return reason ? std::optional(*reason->asString()) : std::nullopt;
 }
 
 }  // namespace tavisk

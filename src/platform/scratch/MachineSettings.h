@@ -45,12 +45,17 @@ class MachineSettings {
   /// Writes also when the machine has the value already.
   void change(const MachineSetting& setting, const std::string& asked);
   void turn(const MachineSetting& setting, bool on) { change(setting, on ? "on" : "off"); }
+  /// Writes what is no setting of the machine but the run's own doing: only a failure is an effect, and "*" does not
+  /// refuse it.
+  void note(const MachineSetting& setting, const std::string& asked);
 
  private:
   Setting parts(const MachineSetting& setting);
   MachineSetting::Value readUnlessRefused(const MachineSetting& setting);
-  Result<void> writeUnlessRefused(const MachineSetting& setting, const std::string& value);
+  Result<void> write(const MachineSetting& setting, const std::string& value,
+                     const std::optional<std::string>& refusal);
   std::optional<std::string> refusal(const std::string& setting, const char* suffix);
+  std::optional<std::string> refusalNamed(const std::string& name);
 
   MachineFile& _file;
   EffectSink& _effects;

@@ -16,7 +16,7 @@ MachineSetting authenticated() {
 }  // namespace
 
 void ScratchAdminAuthenticator::authenticate() {
-  _settings.turn(authenticated(), true);
+  _settings.note(authenticated(), "on");
 }
 
 bool ScratchAdminAuthenticator::isAuthenticated() {
@@ -29,7 +29,7 @@ void ScratchAdminAuthenticator::deauthenticate() {
     store(machine, value);
     countUp(machine, section, "Deauthentications");
   };
-  _settings.turn(counted, false);
+  _settings.note(counted, "off");
 }
 
 }  // namespace tavisk

@@ -24,13 +24,7 @@ std::string oneLine(std::string_view message) {
 
 void ScratchSystemLog::write(const std::string& message) {
   auto written = appendLine(_folder, "/system.log", oneLine(message));
-  if (written) return;
-  Effect effect;
-  effect.setting = "System Log";
-  effect.outcome = Outcome::failed;
-  effect.asked = message;
-  effect.failure = written.failure();
-  _effects.record(effect);
+  if (!written) _effects.recordFailure("System Log", written.failure(), message);
 }
 
 }  // namespace tavisk
