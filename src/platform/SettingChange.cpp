@@ -35,7 +35,8 @@ class Change {
     const bool isLiveThere = hasValue(_setting.live, _effect.live);
     const bool isStoredThere = hasValue(_setting.stored, _effect.stored);
     _effect.before = _setting.live ? _effect.live : _effect.stored;
-    _effect.outcome = isLiveThere && isStoredThere ? Outcome::unchanged : Outcome::applied;
+    const bool isRead = _setting.live || _setting.stored;
+    _effect.outcome = isRead && isLiveThere && isStoredThere ? Outcome::unchanged : Outcome::applied;
     return _setting.always || _effect.outcome == Outcome::applied;
   }
 

@@ -78,6 +78,12 @@ TEST_F(SettingChangeTest, writesNothingThatIsThereAlready) {
   EXPECT_THAT(steps, ElementsAre("store", "apply"));
 }
 
+TEST_F(SettingChangeTest, appliesWhatCannotBeRead) {
+  setting.live = setting.stored = nullptr;
+  EXPECT_EQ(change("now"), R"({"setting":"Sleep","outcome":"applied","asked":"now"})");
+  EXPECT_THAT(steps, ElementsAre("store", "apply"));
+}
+
 TEST_F(SettingChangeTest, writesWhenOnlyOneOfLiveAndStoredIsRight) {
   for (auto* wrong : {&live, &stored}) {
     steps.clear();
