@@ -66,7 +66,7 @@ struct ScratchFiles {
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, FileSystemContract, ScratchFiles);
 
-TEST(ScratchHost, HasEveryDefaultWithoutAMachineFile) {
+TEST(ScratchHost, hasEveryDefaultWithoutAMachineFile) {
   ScratchMachine machine;
   auto& host = machine.host();
   EXPECT_EQ(host.users().realUserId(), 0U);
@@ -77,7 +77,7 @@ TEST(ScratchHost, HasEveryDefaultWithoutAMachineFile) {
   EXPECT_FALSE(std::filesystem::exists(machine.directory() + "/machine.plist"));
 }
 
-TEST(ScratchHost, TakesNoNumberThatIsNoIdForTheSuperUser) {
+TEST(ScratchHost, takesNoNumberThatIsNoIdForTheSuperUser) {
   ScratchMachine machine;
   for (std::int64_t number : {std::int64_t{1} << 32, std::int64_t{-1} << 32, std::int64_t{-1}}) {
     machine.set("User", "ID", number);
@@ -85,7 +85,7 @@ TEST(ScratchHost, TakesNoNumberThatIsNoIdForTheSuperUser) {
   }
 }
 
-TEST(ScratchHost, StandsStillAtTheTimeOfTheFile) {
+TEST(ScratchHost, standsStillAtTheTimeOfTheFile) {
   ScratchMachine machine;
   machine.set("Clock", "Time", -1);
   auto& clock = machine.host().clock();
@@ -95,7 +95,7 @@ TEST(ScratchHost, StandsStillAtTheTimeOfTheFile) {
   EXPECT_EQ(machine.get("Clock", "Offset"), std::nullopt);
 }
 
-TEST(ScratchHost, CountsEveryOperation) {
+TEST(ScratchHost, countsEveryOperation) {
   ScratchMachine machine;
   auto& host = machine.host();
   for (int times = 0; times < 2; ++times) {
@@ -109,14 +109,14 @@ TEST(ScratchHost, CountsEveryOperation) {
   EXPECT_EQ(machine.effectsLog().size(), 4U);
 }
 
-TEST(ScratchHost, KeepsTheZoneAndItsFileTogether) {
+TEST(ScratchHost, keepsTheZoneAndItsFileTogether) {
   ScratchMachine machine;
   machine.host().clock().setTimeZone("/usr/share/zoneinfo/America/Los_Angeles");
   EXPECT_EQ(machine.get("Clock", "Time Zone"), PropertyList("America/Los_Angeles"));
   EXPECT_EQ(machine.get("Clock", "Time Zone File"), PropertyList("/usr/share/zoneinfo/America/Los_Angeles"));
 }
 
-TEST(ScratchHost, WritesOneLineAMessage) {
+TEST(ScratchHost, writesOneLineAMessage) {
   ScratchMachine machine;
   for (const char* message : {"one\n", "two\nlines\n\n", "", "three"}) machine.host().systemLog().write(message);
   EXPECT_THAT(machine.systemLog(), ElementsAre("one", "two\\nlines\\n", "", "three"));

@@ -7,6 +7,7 @@
 
 #include <cerrno>
 #include <chrono>
+#include <cstdlib>
 
 #include "platform/SystemFailure.h"
 #include "platform/scratch/FolderWatch.h"
@@ -22,16 +23,22 @@ constexpr const char* lockName = "/machine.lock";
 constexpr const char* rehearsal = "rehearse";
 constexpr const char* settingName = "Machine";
 
+/// The times of files go in steps of some milliseconds: what was written within the last step may be written again and
+/// look the same.
+bool tellsVersions(const std::optional<FileStamp>& stamp) {
+  constexpr std::int64_t step = 20'000'000;  // nanoseconds; 10 ms at the slowest kernel clock
+  auto now = std::chrono::nanoseconds(std::chrono::system_clock::now().time_since_epoch()).count();
+  return !stamp || std::abs(now - stamp->changed) > step;
+}
+
 }  // namespace
 
 Result<std::unique_ptr<MachineFile>> MachineFile::open(const std::string& directory, EffectSink& effects) {
   std::unique_ptr<MachineFile> file(new MachineFile(directory, effects));
   if (auto folder = file->_folder.open("/", O_RDONLY | O_DIRECTORY); !folder)
     return Failure{rehearsal, directory, folder.failure().why};
-  auto stamp = file->_folder.stamp(fileName);
   auto machine = file->read();
   if (!machine) return Failure{rehearsal, machine.failure().on, machine.failure().why};
-  file->_stamp = stamp;
   file->_contents = std::make_shared<const Dictionary>(std::move(machine).value());
   return file;
 }
@@ -46,15 +53,22 @@ MachineFile::Contents MachineFile::contents() {
     if (stamp == _stamp) return _contents;
   }
   auto machine = read();
-  Contents current;
-  {
-    std::lock_guard held(_mutex);
-    _stamp = stamp;
-    if (machine) _contents = std::make_shared<const Dictionary>(std::move(machine).value());
-    current = _contents;
+  if (auto failure = keep(stamp, machine)) recordFailure(*failure, "the contents last read stand");
+  std::lock_guard held(_mutex);
+  return _contents;
+}
+
+std::optional<Failure> MachineFile::keep(const std::optional<FileStamp>& stamp, Result<Dictionary>& machine) {
+  std::lock_guard held(_mutex);
+  _stamp = tellsVersions(stamp) ? stamp : FileStamp{};
+  if (machine) {
+    _contents = std::make_shared<const Dictionary>(std::move(machine).value());
+    _failure.reset();
+    return std::nullopt;
   }
-  if (!machine) recordFailure(machine.failure(), "the contents last read stand");
-  return current;
+  bool known = _failure == machine.failure();
+  _failure = machine.failure();
+  return known ? std::nullopt : _failure;
 }
 
 MachineSection MachineFile::section(std::string_view name) {
@@ -74,8 +88,6 @@ Result<void> MachineFile::change(const Edit& edit) {
   if (!text) return Failure{"write", _path, text.failure().why};
   auto written = _folder.write(fileName, *text);
   if (!written) return inFolder(written.failure());
-  std::lock_guard guard(_mutex);
-  _stamp = FileStamp{};
   return {};
 }
 

@@ -51,6 +51,8 @@ class MachineFile {
  private:
   MachineFile(const std::string& directory, EffectSink& effects);
   Result<Dictionary> read() const;
+  /// Takes over what was read; a failure that is to be told comes back.
+  std::optional<Failure> keep(const std::optional<FileStamp>& stamp, Result<Dictionary>& machine);
   Result<FileDescriptor> lock() const;
   Failure inFolder(const Failure& failure) const;
   void recordFailure(const Failure& failure, const char* note);
@@ -60,9 +62,10 @@ class MachineFile {
   SystemRoot _folder;
   EffectSink& _effects;
   std::thread::id _owner = std::this_thread::get_id();
-  std::mutex _mutex;  ///< of the two below; never held while the file is read
-  Contents _contents = std::make_shared<Dictionary>();
-  std::optional<FileStamp> _stamp;  ///< of the file when it was last read, or failed to be
+  std::mutex _mutex;  ///< of what follows; never held while the file is read
+  Contents _contents;
+  std::optional<FileStamp> _stamp = FileStamp{};  ///< of the file as last read; no file has this one
+  std::optional<Failure> _failure;                ///< told, and not over
 };
 
 }  // namespace tavisk

@@ -19,7 +19,7 @@ class AdminAuthenticatorContract : public testing::Test {
 
 TYPED_TEST_SUITE_P(AdminAuthenticatorContract);
 
-TYPED_TEST_P(AdminAuthenticatorContract, HoldsTheAuthorizationUntilItIsGivenUp) {
+TYPED_TEST_P(AdminAuthenticatorContract, holdsTheAuthorizationUntilItIsGivenUp) {
   auto& authenticator = this->machine.service();
   EXPECT_FALSE(authenticator.isAuthenticated());
   authenticator.authenticate();
@@ -28,14 +28,14 @@ TYPED_TEST_P(AdminAuthenticatorContract, HoldsTheAuthorizationUntilItIsGivenUp) 
   EXPECT_FALSE(authenticator.isAuthenticated());
 }
 
-TYPED_TEST_P(AdminAuthenticatorContract, LetsAnotherThreadGiveItUp) {
+TYPED_TEST_P(AdminAuthenticatorContract, letsAnotherThreadGiveItUp) {
   auto& authenticator = this->machine.service();
   authenticator.authenticate();
   std::thread([&] { authenticator.deauthenticate(); }).join();
   EXPECT_FALSE(authenticator.isAuthenticated());
 }
 
-REGISTER_TYPED_TEST_SUITE_P(AdminAuthenticatorContract, HoldsTheAuthorizationUntilItIsGivenUp,
-                            LetsAnotherThreadGiveItUp);
+REGISTER_TYPED_TEST_SUITE_P(AdminAuthenticatorContract, holdsTheAuthorizationUntilItIsGivenUp,
+                            letsAnotherThreadGiveItUp);
 
 }  // namespace tavisk

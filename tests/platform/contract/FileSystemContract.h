@@ -37,7 +37,7 @@ class FileSystemContract : public testing::Test {
 
 TYPED_TEST_SUITE_P(FileSystemContract);
 
-TYPED_TEST_P(FileSystemContract, FollowsLinksInsideTheRootOnly) {
+TYPED_TEST_P(FileSystemContract, followsLinksInsideTheRootOnly) {
   for (const char* path : {"/Volumes/Backup/System/boot.efi", "/startup/System/boot.efi", "/absolute/boot.efi",
                            "/out/Backup/System/boot.efi", "//startup/./System/../System/boot.efi",
                            "/../../Volumes/Backup/System/boot.efi"}) {
@@ -49,7 +49,7 @@ TYPED_TEST_P(FileSystemContract, FollowsLinksInsideTheRootOnly) {
   EXPECT_FALSE(this->machine.service().exists(std::string("/Volumes\0/x", 11)));
 }
 
-TYPED_TEST_P(FileSystemContract, StandardizesAPathAsFarAsItExists) {
+TYPED_TEST_P(FileSystemContract, standardizesAPathAsFarAsItExists) {
   const std::pair<const char*, const char*> cases[] = {
       {"/", "/"},
       {"/../..", "/"},
@@ -67,7 +67,7 @@ TYPED_TEST_P(FileSystemContract, StandardizesAPathAsFarAsItExists) {
     EXPECT_EQ(this->machine.service().standardized(path).valueOr("none"), standardized) << path;
 }
 
-TYPED_TEST_P(FileSystemContract, TellsWhatWasTriedOnWhichPathAndWhy) {
+TYPED_TEST_P(FileSystemContract, tellsWhatWasTriedOnWhichPathAndWhy) {
   auto& files = this->machine.service();
   this->link("/a", std::string(200, 'x') + "/../b");
   std::ofstream(this->at("/large")) << std::string(100, 'x');
@@ -89,7 +89,7 @@ TYPED_TEST_P(FileSystemContract, TellsWhatWasTriedOnWhichPathAndWhy) {
   EXPECT_EQ(files.standardized("/loop/x").failure().why, "Too many levels of symbolic links");
 }
 
-TYPED_TEST_P(FileSystemContract, OpensNothingButRegularFiles) {
+TYPED_TEST_P(FileSystemContract, opensNothingButRegularFiles) {
   ASSERT_EQ(::mkfifo(this->at("/fifo").c_str(), 0600), 0);
   int socket = ::socket(AF_UNIX, SOCK_STREAM, 0);
   sockaddr_un address{};
@@ -103,7 +103,7 @@ TYPED_TEST_P(FileSystemContract, OpensNothingButRegularFiles) {
   ::close(socket);
 }
 
-TYPED_TEST_P(FileSystemContract, EndsOnAnEndlessChainOfLinks) {
+TYPED_TEST_P(FileSystemContract, endsOnAnEndlessChainOfLinks) {
   this->link("/chain0", "/Volumes");
   for (int index = 1; index <= 1000; ++index)
     this->link(("/chain" + std::to_string(index)).c_str(), "/chain" + std::to_string(index - 1));
@@ -111,8 +111,8 @@ TYPED_TEST_P(FileSystemContract, EndsOnAnEndlessChainOfLinks) {
   EXPECT_EQ(this->machine.service().standardized("/chain30").valueOr("none"), "/Volumes");
 }
 
-REGISTER_TYPED_TEST_SUITE_P(FileSystemContract, FollowsLinksInsideTheRootOnly, StandardizesAPathAsFarAsItExists,
-                            TellsWhatWasTriedOnWhichPathAndWhy, OpensNothingButRegularFiles,
-                            EndsOnAnEndlessChainOfLinks);
+REGISTER_TYPED_TEST_SUITE_P(FileSystemContract, followsLinksInsideTheRootOnly, standardizesAPathAsFarAsItExists,
+                            tellsWhatWasTriedOnWhichPathAndWhy, opensNothingButRegularFiles,
+                            endsOnAnEndlessChainOfLinks);
 
 }  // namespace tavisk

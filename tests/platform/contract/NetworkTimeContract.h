@@ -19,7 +19,7 @@ class NetworkTimeContract : public testing::Test {
 
 TYPED_TEST_SUITE_P(NetworkTimeContract);
 
-TYPED_TEST_P(NetworkTimeContract, RunsBetweenStartAndStop) {
+TYPED_TEST_P(NetworkTimeContract, runsBetweenStartAndStop) {
   auto& client = this->machine.service();
   EXPECT_FALSE(client.isRunning());
   for (int times = 0; times < 2; ++times) {
@@ -31,7 +31,7 @@ TYPED_TEST_P(NetworkTimeContract, RunsBetweenStartAndStop) {
   }
 }
 
-TYPED_TEST_P(NetworkTimeContract, KeepsLaunchAtStartupApartFromRunning) {
+TYPED_TEST_P(NetworkTimeContract, keepsLaunchAtStartupApartFromRunning) {
   auto& client = this->machine.service();
   EXPECT_FALSE(this->machine.launchesAtStartup());
   client.setLaunchAtStartup(true);
@@ -41,7 +41,7 @@ TYPED_TEST_P(NetworkTimeContract, KeepsLaunchAtStartupApartFromRunning) {
   EXPECT_FALSE(this->machine.launchesAtStartup());
 }
 
-TYPED_TEST_P(NetworkTimeContract, AnswersTheServerThatWasSetLast) {
+TYPED_TEST_P(NetworkTimeContract, answersTheServerThatWasSetLast) {
   auto& client = this->machine.service();
   EXPECT_EQ(client.server().address, "");
   for (const char* address : {"time.example", "192.0.2.7", "2001:db8::7"}) {
@@ -53,7 +53,7 @@ TYPED_TEST_P(NetworkTimeContract, AnswersTheServerThatWasSetLast) {
   EXPECT_EQ(client.server().address, "2001:db8::7");
 }
 
-TYPED_TEST_P(NetworkTimeContract, StoresTextThatIsNoHostNameWholeOrNotAtAll) {
+TYPED_TEST_P(NetworkTimeContract, storesTextThatIsNoHostNameWholeOrNotAtAll) {
   auto& client = this->machine.service();
   client.setServer({"time.example"});
   for (const char* text : {"two words", "time.example\npool evil.example", "Zeit\xC3\xBC.example", "a;b#c"}) {
@@ -62,7 +62,7 @@ TYPED_TEST_P(NetworkTimeContract, StoresTextThatIsNoHostNameWholeOrNotAtAll) {
   }
 }
 
-REGISTER_TYPED_TEST_SUITE_P(NetworkTimeContract, RunsBetweenStartAndStop, KeepsLaunchAtStartupApartFromRunning,
-                            AnswersTheServerThatWasSetLast, StoresTextThatIsNoHostNameWholeOrNotAtAll);
+REGISTER_TYPED_TEST_SUITE_P(NetworkTimeContract, runsBetweenStartAndStop, keepsLaunchAtStartupApartFromRunning,
+                            answersTheServerThatWasSetLast, storesTextThatIsNoHostNameWholeOrNotAtAll);
 
 }  // namespace tavisk

@@ -19,15 +19,15 @@ class UserDatabaseContract : public testing::Test {
 
 TYPED_TEST_SUITE_P(UserDatabaseContract);
 
-TYPED_TEST_P(UserDatabaseContract, KnowsWhoRunsTheTool) {
-  if (!TypeParam::choosesUser) GTEST_SKIP() << "the user is the one who runs the tests";
+TYPED_TEST_P(UserDatabaseContract, knowsWhoRunsTheTool) {
+  if (!TypeParam::choosesUser) return;
   this->machine.haveUser(501, {20, 80});
   EXPECT_EQ(this->machine.service().realUserId(), 501U);
   EXPECT_THAT(this->machine.service().supplementaryGroups(16).value(), testing::ElementsAre(20, 80));
 }
 
-TYPED_TEST_P(UserDatabaseContract, HasNoAnswerForMoreGroupsThanThereIsRoomFor) {
-  if (!TypeParam::choosesUser) GTEST_SKIP() << "the user is the one who runs the tests";
+TYPED_TEST_P(UserDatabaseContract, hasNoAnswerForMoreGroupsThanThereIsRoomFor) {
+  if (!TypeParam::choosesUser) return;
   std::vector<GroupId> groups(16, 7);
   this->machine.haveUser(501, groups);
   EXPECT_EQ(this->machine.service().supplementaryGroups(16), groups);
@@ -36,14 +36,14 @@ TYPED_TEST_P(UserDatabaseContract, HasNoAnswerForMoreGroupsThanThereIsRoomFor) {
   EXPECT_EQ(this->machine.service().supplementaryGroups(16), std::nullopt);
 }
 
-TYPED_TEST_P(UserDatabaseContract, FindsGroupsByTheirExactName) {
+TYPED_TEST_P(UserDatabaseContract, findsGroupsByTheirExactName) {
   this->machine.haveGroup("staff", 20);
   EXPECT_EQ(this->machine.service().groupNamed("staff"), 20U);
   for (const char* name : {"", "Staff", "staf", "staff ", "admin"})
     EXPECT_EQ(this->machine.service().groupNamed(name), std::nullopt) << name;
 }
 
-REGISTER_TYPED_TEST_SUITE_P(UserDatabaseContract, KnowsWhoRunsTheTool, HasNoAnswerForMoreGroupsThanThereIsRoomFor,
-                            FindsGroupsByTheirExactName);
+REGISTER_TYPED_TEST_SUITE_P(UserDatabaseContract, knowsWhoRunsTheTool, hasNoAnswerForMoreGroupsThanThereIsRoomFor,
+                            findsGroupsByTheirExactName);
 
 }  // namespace tavisk
