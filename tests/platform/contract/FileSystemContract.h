@@ -105,9 +105,9 @@ TYPED_TEST_P(FileSystemContract, opensNothingButRegularFiles) {
 
 TYPED_TEST_P(FileSystemContract, endsOnAnEndlessChainOfLinks) {
   this->link("/chain0", "/Volumes");
-  for (int index = 1; index <= 1000; ++index)
+  for (int index = 1; index <= 100; ++index)
     this->link(("/chain" + std::to_string(index)).c_str(), "/chain" + std::to_string(index - 1));
-  EXPECT_EQ(this->machine.service().standardized("/chain1000").failure().why, "Too many levels of symbolic links");
+  EXPECT_EQ(this->machine.service().standardized("/chain100").failure().why, "Too many levels of symbolic links");
   EXPECT_EQ(this->machine.service().standardized("/chain30").valueOr("none"), "/Volumes");
 }
 
