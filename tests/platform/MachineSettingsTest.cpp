@@ -19,8 +19,6 @@ struct Operation {
 };
 
 constexpr Operation sets[] = {
-    {setting::authorization, [](Host& host) { host.authenticator().authenticate(); }},
-    {setting::authorization, [](Host& host) { host.authenticator().deauthenticate(); }},
     {setting::time, [](Host& host) { host.clock().setTime(1); }},
     {setting::timeZone, [](Host& host) { host.clock().setTimeZone("/usr/share/zoneinfo/Asia/Tokyo"); }},
     {setting::networkTime, [](Host& host) { host.networkTime().start(); }},
@@ -100,6 +98,15 @@ TEST_F(RefusalsTest, aSetThatCannotBeReadBackIsDoneAndFailed) {
     EXPECT_THAT(machine.effectsLog().back(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("blind")));
   }
   EXPECT_EQ(machine.get("Clock", "Time Zone"), PropertyList("Asia/Tokyo"));
+}
+
+TEST_F(RefusalsTest, theAuthorizationIsRefusedByItsNameOnly) {
+  machine.refuse("*", "maintenance");
+  machine.host().authenticator().deauthenticate();
+  EXPECT_EQ(machine.get("Authorization", "Authenticated"), PropertyList(false));
+  EXPECT_TRUE(machine.effectsLog().empty());
+  machine.refuse(setting::authorization, "not you");
+  expectRefused({setting::authorization, [](Host& host) { host.authenticator().authenticate(); }}, "not you");
 }
 
 TEST_F(RefusalsTest, nothingElseIsRefused) {
