@@ -36,7 +36,9 @@ struct FolderWriter::Temporary {
   Temporary(const FileDescriptor& inFolder, std::string itsName, FileDescriptor opened)
       : folder(&inFolder), name(std::move(itsName)), file(std::move(opened)) {}
   Temporary(Temporary&&) = default;
+  Temporary(const Temporary&) = delete;
   Temporary& operator=(Temporary&&) = delete;
+  Temporary& operator=(const Temporary&) = delete;
   ~Temporary() {
     if (file) ::unlinkat(folder->number(), name.c_str(), 0);
   }

@@ -76,9 +76,8 @@ std::optional<std::string> whyWrongAt(std::string_view place, const PropertyList
   for (const auto& [key, value] : values) {
     const auto* row = findKey(place, key);
     if (!row) continue;
-    auto named = [&] { return "\"" + key + "\""; };
-    if (!fits(value, row->type)) return named() + ": expected " + shapeOf(row->type).words;
-    if (auto wrong = whyWrongInside(*row, value)) return named() + " " + *wrong;
+    if (!fits(value, row->type)) return "\"" + key + "\": expected " + shapeOf(row->type).words;
+    if (auto wrong = whyWrongInside(*row, value)) return "\"" + key + "\" " + *wrong;
   }
   return std::nullopt;
 }

@@ -9,7 +9,7 @@ constexpr const char* machineName = "the rehearsed machine";
 
 }  // namespace
 
-MachineSetting switchAt(std::string name, std::string section, std::string key) {
+MachineSetting switchAt(std::string name, const std::string& section, const std::string& key) {
   return {std::move(name), "",
           [=](MachineFile& machine) -> MachineSetting::Value {
             return std::optional<std::string>(machine.section(section).boolean(key) ? "on" : "off");
@@ -19,7 +19,7 @@ MachineSetting switchAt(std::string name, std::string section, std::string key) 
           }};
 }
 
-MachineSetting textAt(std::string name, std::string section, std::string key) {
+MachineSetting textAt(std::string name, const std::string& section, const std::string& key) {
   return {
       std::move(name), "",
       [=](MachineFile& machine) -> MachineSetting::Value { return std::optional(machine.section(section).text(key)); },

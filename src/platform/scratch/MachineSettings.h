@@ -27,8 +27,8 @@ struct MachineSetting {
 };
 
 /// One key as a setting: a boolean reads as "on" or "off".
-MachineSetting switchAt(std::string name, std::string section, std::string key);
-MachineSetting textAt(std::string name, std::string section, std::string key);
+MachineSetting switchAt(std::string name, const std::string& section, const std::string& key);
+MachineSetting textAt(std::string name, const std::string& section, const std::string& key);
 
 /// Adds one to a count.
 void countUp(MachineFile::Dictionary& machine, std::string_view section, std::string_view key);
