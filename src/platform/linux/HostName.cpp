@@ -36,7 +36,8 @@ bool isHostName(std::string_view name) {
 
 bool isHostNameOrAddress(const std::string& text) {
   in6_addr address{};
-  return ::inet_pton(AF_INET6, text.c_str(), &address) == 1 || isHostName(text);
+  const bool holdsNul = text.find('\0') != std::string::npos;
+  return (!holdsNul && ::inet_pton(AF_INET6, text.c_str(), &address) == 1) || isHostName(text);
 }
 
 }  // namespace tavisk

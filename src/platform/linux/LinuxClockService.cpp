@@ -86,7 +86,7 @@ Setting LinuxClockService::timeZoneSetting() const {
   Setting zone;
   zone.name = setting::timeZone;
   zone.where = "/etc/localtime";
-  zone.live = [&root = _machine.root] { return machineTimeZone(root); };
+  zone.live = [&root = _machine.root] { return std::optional(machineTimeZone(root).value_or(withoutZone)); };
   zone.stored = [&root = _machine.root] {
     auto second = timeZoneFileName(root);
     return second ? second : machineTimeZone(root);
@@ -95,14 +95,19 @@ Setting LinuxClockService::timeZoneSetting() const {
 }
 
 std::string LinuxClockService::timeZone() {
-  return observe(timeZoneSetting(), _machine.effects).value_or(withoutZone);
+  return *observe(timeZoneSetting(), _machine.effects);
 }
 
 void LinuxClockService::setTimeZone(const std::string& zoneFile) {
   auto zone = timeZoneSetting();
-  zone.store = [this](const std::string& name) { return updateTimeZoneFile(_machine.root, name); };
-  zone.apply = [this](const std::string& name) { return linkLocalTime(_machine.root, name); };
+  zone.store = [this](const std::string& name) { return changeTimeZone(name); };
   carryOut(zone, zoneOfPath(zoneFile).value_or(zoneFile), _machine.effects, _machine.runLoop);
+}
+
+Result<void> LinuxClockService::changeTimeZone(const std::string& zone) {
+  if (auto failure = whyNeedsRoot("set the time zone", "/etc/localtime")) return *failure;
+  if (auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
+  return updateTimeZoneFile(_machine.root, zone);
 }
 
 std::string LinuxClockService::rulesOf(const std::string& timeZone) {

@@ -24,6 +24,7 @@ class LinuxClockService : public ClockService {
   Setting timeZoneSetting() const;
   std::optional<Failure> whyNoClock() const;
   Result<void> changeTime(std::int64_t secondsSince1970);
+  Result<void> changeTimeZone(const std::string& zone);
 
   LinuxMachine _machine;
 };

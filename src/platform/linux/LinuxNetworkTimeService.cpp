@@ -122,7 +122,7 @@ void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
   auto setting = serverSetting();
   if (auto found = client(); found && *found != nullptr) {
     setting.where = (*found)->serverFile;
-    setting.supported = [&] { return (*found)->whyNotRead(_machine.root); };
+    setting.supported = [this, client = *found] { return client->whyNotRead(_machine.root); };
   }
   setting.store = [this](const std::string& address) {
     return withClient<void>([&](const TimeDaemon& client) { return storeServer(client, address); });
@@ -143,7 +143,6 @@ void LinuxNetworkTimeService::restartAsynchronously() {
   setting.apply = [this](const std::string&) {
     return withClient<void>([&](const TimeDaemon& client) { return reload(client); });
   };
-  setting.always = true;
   change(setting, "restart");
 }
 

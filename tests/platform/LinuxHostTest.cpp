@@ -1,0 +1,51 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "LinuxTree.h"
+#include "contract/AdminAuthenticatorContract.h"
+#include "contract/ClockContract.h"
+#include "contract/FileSystemContract.h"
+#include "contract/NetworkTimeContract.h"
+
+namespace tavisk {
+namespace {
+
+TEST(LinuxUserDatabase, AnswersForTheProcessAndTheMachine) {
+  LinuxTree tree;
+  auto& users = tree.host().users();
+  EXPECT_EQ(users.realUserId(), ::getuid());
+  EXPECT_EQ(users.supplementaryGroups(65536)->size(), static_cast<std::size_t>(::getgroups(0, nullptr)));
+  EXPECT_EQ(users.groupNamed("root"), 0U);
+  for (const char* name : {"", "Root", "root ", "no such group"}) EXPECT_EQ(users.groupNamed(name), std::nullopt);
+}
+
+struct LinuxAuthenticator {
+  AdminAuthenticator& service() { return tree.host().authenticator(); }
+  LinuxTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, AdminAuthenticatorContract, LinuxAuthenticator);
+
+struct LinuxClock {
+  static constexpr bool setsClock = false;
+  ClockService& service() { return tree.host().clock(); }
+  void haveZones(const std::vector<std::string>& names) {
+    for (const auto& name : names) tree.write("/usr/share/zoneinfo/" + name, "TZif");
+  }
+  std::vector<std::string> effects() {
+    std::vector<std::string> effects;
+    for (const auto& line : tree.log.lines)
+      if (line.find("\"outcome\"") != std::string::npos) effects.push_back(line);
+    return effects;
+  }
+  LinuxTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, ClockContract, LinuxClock);
+
+struct LinuxFiles {
+  FileSystem& service() { return tree.host().files(); }
+  std::filesystem::path root() { return tree.at("/"); }
+  LinuxTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, FileSystemContract, LinuxFiles);
+
+}  // namespace
+}  // namespace tavisk
