@@ -23,7 +23,7 @@ using Stream = std::unique_ptr<std::FILE, CloseStream>;
 /// A stream to read the text from.
 inline Stream streamOf(std::string_view text) {
   Stream stream(std::tmpfile());
-  std::fwrite(text.data(), 1, text.size(), stream.get());
+  if (!text.empty()) std::fwrite(text.data(), 1, text.size(), stream.get());
   std::rewind(stream.get());
   return stream;
 }
