@@ -5,6 +5,8 @@
 #include <optional>
 
 #include "platform/PropertyList.h"
+#include "platform/PropertyListFile.h"
+#include "platform/SettingChange.h"
 
 namespace tavisk {
 
@@ -14,12 +16,20 @@ class BootLoaderFile {
   virtual ~BootLoaderFile() = default;
 
   static constexpr const char* path = "/Library/Preferences/SystemConfiguration/com.velmar.Boot.plist";
+  /// The processor architecture in which the kernel is started, a string; absent: as the system decides.
+  static constexpr const char* architectureKey = "Kernel Architecture";
 
   /// Absent when it is missing, cannot be read or is no property-list dictionary.
   virtual std::optional<PropertyList::Dictionary> read() = 0;
-  /// Replaces the file whole, or makes it and its folder. A file that read() cannot understand is kept beside it as
+  /// Replaces the file whole, or makes it and its folders. A file that read() cannot understand is kept beside it as
   /// NAME.damaged first. Whether it was written; the reason why not goes to the effects.
   virtual bool write(const PropertyList::Dictionary& contents) = 0;
 };
+
+/// The architecture in the file, as the setting by which a host tells the effects; "default" when the key is absent.
+/// A change writes `contents`. Both must outlive the setting.
+Setting kernelArchitecture(const PropertyListFile& file, const PropertyList::Dictionary& contents);
+/// The value that a change of kernelArchitecture to these contents asks for.
+std::string architectureIn(const PropertyList::Dictionary& contents);
 
 }  // namespace tavisk

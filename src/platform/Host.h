@@ -3,9 +3,18 @@
 #pragma once
 
 #include "platform/AdminAuthenticator.h"
+#include "platform/BootLoaderFile.h"
 #include "platform/ClockService.h"
+#include "platform/DynamicStore.h"
 #include "platform/FileSystem.h"
+#include "platform/HostConfigService.h"
 #include "platform/NetworkTimeService.h"
+#include "platform/PowerController.h"
+#include "platform/PowerSettingsService.h"
+#include "platform/PreferencesStore.h"
+#include "platform/ProcessUtilities.h"
+#include "platform/RemoteEventsService.h"
+#include "platform/RemoteShellService.h"
 #include "platform/SystemLog.h"
 #include "platform/UserDatabase.h"
 
@@ -22,6 +31,15 @@ class Host {
   virtual SystemLog& systemLog() = 0;
   virtual ClockService& clock() = 0;
   virtual NetworkTimeService& networkTime() = 0;
+  virtual PowerSettingsService& powerSettings() = 0;
+  virtual PowerController& powerController() = 0;
+  virtual RemoteShellService& remoteShell() = 0;
+  virtual RemoteEventsService& remoteEvents() = 0;
+  virtual HostConfigService& hostConfiguration() = 0;
+  virtual DynamicStore& dynamicStore() = 0;
+  virtual BootLoaderFile& bootLoaderFile() = 0;
+  virtual PreferencesStore& preferences() = 0;
+  virtual ProcessUtilities& processes() = 0;
 };
 
 }  // namespace tavisk

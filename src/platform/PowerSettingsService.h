@@ -45,6 +45,10 @@ class PowerSwitchesService {
   virtual void setRestartsOnHang(bool restarts) = 0;
 };
 
+/// By which effects and reports call them.
+const char* nameOf(SleepTimer timer);
+const char* nameOf(PowerSwitch which);
+
 class PowerSettingsService : public SleepTimersService, public PowerSwitchesService {};
 
 }  // namespace tavisk

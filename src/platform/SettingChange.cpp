@@ -17,6 +17,7 @@ class Change {
     _effect.asked = asked;
     _effect.where = setting.where;
     _effect.undoneBy = setting.undoneBy;
+    _effect.note = setting.note;
   }
 
   const Effect& effect() const { return _effect; }

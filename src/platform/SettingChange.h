@@ -22,6 +22,7 @@ struct Setting {
   std::string unit;                                   ///< see SettingValue
   std::string where;                                  ///< see Effect
   std::string undoneBy;                               ///< see Effect
+  std::string note;                                   ///< see Effect
   std::function<std::optional<Failure>()> supported;  ///< the reason when this machine cannot have the setting
   Read live;
   Read stored;

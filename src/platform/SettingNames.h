@@ -13,5 +13,24 @@ inline constexpr const char* networkTime = "Network Time";
 inline constexpr const char* networkTimeAtStartup = "Network Time At Startup";
 inline constexpr const char* networkTimeServer = "Network Time Server";
 inline constexpr const char* networkTimeRestart = "Network Time Restart";
+inline constexpr const char* computerSleep = "Computer Sleep";
+inline constexpr const char* displaySleep = "Display Sleep";
+inline constexpr const char* hardDiskSleep = "Hard Disk Sleep";
+inline constexpr const char* wakeOnModem = "Wake On Modem";
+inline constexpr const char* wakeOnNetworkAccess = "Wake On Network Access";
+inline constexpr const char* restartAfterPowerFailure = "Restart After Power Failure";
+inline constexpr const char* restartAfterFreeze = "Restart After Freeze";
+inline constexpr const char* powerButtonSleep = "Power Button Sleep";
+inline constexpr const char* startupDelay = "Startup Delay";
+inline constexpr const char* remoteLogin = "Remote Login";
+inline constexpr const char* remoteEvents = "Remote Events";
+inline constexpr const char* computerName = "Computer Name";
+inline constexpr const char* localSubnetName = "Local Subnet Name";
+inline constexpr const char* dynamicStore = "Dynamic Store";
+inline constexpr const char* kernelArchitecture = "Kernel Architecture";
+inline constexpr const char* keyboardLock = "Keyboard Lock";
+inline constexpr const char* keyboardLockPreference = "Keyboard Lock Preference";
+inline constexpr const char* preferencesWrite = "Preferences Write";
+inline constexpr const char* signalToProcess = "Signal To Process";
 
 }  // namespace tavisk::setting

@@ -12,7 +12,15 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _files(_root),
       _systemLog(_root),
       _clock(_machine),
-      _networkTime(_machine) {
+      _networkTime(_machine),
+      _powerSettings(effects),
+      _remoteShell(effects),
+      _remoteEvents(effects),
+      _hostConfiguration(effects),
+      _dynamicStore(effects),
+      _bootLoaderFile(_machine),
+      _preferences(effects),
+      _processes(effects) {
   effects.addChannel(_journalLog);
 }
 

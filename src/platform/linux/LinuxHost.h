@@ -8,11 +8,16 @@
 #include "platform/RootedFileSystem.h"
 #include "platform/linux/JournalLog.h"
 #include "platform/linux/LinuxAdminAuthenticator.h"
+#include "platform/linux/LinuxBootLoaderFile.h"
 #include "platform/linux/LinuxClockService.h"
 #include "platform/linux/LinuxMachine.h"
 #include "platform/linux/LinuxNetworkTimeService.h"
 #include "platform/linux/LinuxSystemLog.h"
 #include "platform/linux/LinuxUserDatabase.h"
+#include "platform/linux/UnbuiltNames.h"
+#include "platform/linux/UnbuiltPower.h"
+#include "platform/linux/UnbuiltProcesses.h"
+#include "platform/linux/UnbuiltRemoteAccess.h"
 
 namespace tavisk {
 
@@ -30,6 +35,15 @@ class LinuxHost final : public Host {
   SystemLog& systemLog() override { return _systemLog; }
   ClockService& clock() override { return _clock; }
   NetworkTimeService& networkTime() override { return _networkTime; }
+  PowerSettingsService& powerSettings() override { return _powerSettings; }
+  PowerController& powerController() override { return _powerController; }
+  RemoteShellService& remoteShell() override { return _remoteShell; }
+  RemoteEventsService& remoteEvents() override { return _remoteEvents; }
+  HostConfigService& hostConfiguration() override { return _hostConfiguration; }
+  DynamicStore& dynamicStore() override { return _dynamicStore; }
+  BootLoaderFile& bootLoaderFile() override { return _bootLoaderFile; }
+  PreferencesStore& preferences() override { return _preferences; }
+  ProcessUtilities& processes() override { return _processes; }
 
  private:
   SystemRoot _root;
@@ -42,6 +56,15 @@ class LinuxHost final : public Host {
   LinuxSystemLog _systemLog;
   LinuxClockService _clock;
   LinuxNetworkTimeService _networkTime;
+  UnbuiltPowerSettings _powerSettings;
+  UnbuiltPowerController _powerController;
+  UnbuiltRemoteShell _remoteShell;
+  UnbuiltRemoteEvents _remoteEvents;
+  UnbuiltHostConfig _hostConfiguration;
+  UnbuiltDynamicStore _dynamicStore;
+  LinuxBootLoaderFile _bootLoaderFile;
+  UnbuiltPreferences _preferences;
+  UnbuiltProcesses _processes;
 };
 
 }  // namespace tavisk

@@ -8,6 +8,15 @@
 #include "platform/scratch/KeyTable.h"
 
 namespace tavisk {
+namespace {
+
+const KeyRow& rowOf(const std::string& place, std::string_view key) {
+  const auto* row = findKey(place, key);
+  if (!row) throw std::logic_error("no key: " + place + "/" + std::string(key));
+  return *row;
+}
+
+}  // namespace
 
 bool MachineSection::boolean(std::string_view key) const {
   const auto* value = find(key);
@@ -24,10 +33,22 @@ std::string MachineSection::text(std::string_view key) const {
   return value ? *value->asString() : std::string(defaultOf(key));
 }
 
+std::optional<std::string> MachineSection::optionalText(std::string_view key) const {
+  const auto* value = find(key);
+  if (value) return *value->asString();
+  if (const auto& otherwise = rowOf(_place, key).otherwise) return std::string(*otherwise);
+  return std::nullopt;
+}
+
+MachineSection MachineSection::section(std::string_view key) const {
+  const auto* value = find(key);
+  return {_place + "/" + std::string(rowOf(_place, key).key), Values(_values, value ? value->asDictionary() : nullptr)};
+}
+
 std::string_view MachineSection::defaultOf(std::string_view key) const {
-  const auto* row = findKey(_place, key);
-  if (!row || !row->otherwise) throw std::logic_error("no default: " + _place + "/" + std::string(key));
-  return *row->otherwise;
+  const auto& row = rowOf(_place, key);
+  if (!row.otherwise) throw std::logic_error("no default: " + _place + "/" + std::string(key));
+  return *row.otherwise;
 }
 
 }  // namespace tavisk

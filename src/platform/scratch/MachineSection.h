@@ -24,6 +24,10 @@ class MachineSection {
   bool boolean(std::string_view key) const;
   std::int64_t integer(std::string_view key) const;
   std::string text(std::string_view key) const;
+  /// Absent when neither the machine nor the table has one.
+  std::optional<std::string> optionalText(std::string_view key) const;
+  /// The dictionary under a key, with nothing in it when the machine has none.
+  MachineSection section(std::string_view key) const;
 
   bool isAbsent() const { return !_values; }
   /// The value itself; null when the machine has none.

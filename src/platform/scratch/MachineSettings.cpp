@@ -2,10 +2,16 @@
 // SPDX-License-Identifier: MIT
 #include "platform/scratch/MachineSettings.h"
 
+#include <utility>
+
 namespace tavisk {
 namespace {
 
 constexpr const char* machineName = "the rehearsed machine";
+
+Failure refusedChange(const std::string& reason) {
+  return {"set", machineName, reason};
+}
 
 }  // namespace
 
@@ -22,26 +28,38 @@ MachineSetting switchAt(std::string name, const std::string& section, const std:
 MachineSetting textAt(std::string name, const std::string& section, const std::string& key) {
   return {
       std::move(name), "",
-      [=](MachineFile& machine) -> MachineSetting::Value { return std::optional(machine.section(section).text(key)); },
+      [=](MachineFile& machine) -> MachineSetting::Value { return machine.section(section).optionalText(key); },
       [=](MachineFile::Dictionary& machine, const std::string& value) { machine.dictionary(section).set(key, value); }};
 }
 
+void countUp(MachineFile::Dictionary& dictionary, std::string_view key) {
+  const auto* count = dictionary.find(key);
+  dictionary.set(key, (count ? *count->asInteger() : 0) + 1);
+}
+
 void countUp(MachineFile::Dictionary& machine, std::string_view section, std::string_view key) {
-  auto& values = machine.dictionary(section);
-  const auto* count = values.find(key);
-  values.set(key, (count ? *count->asInteger() : 0) + 1);
+  countUp(machine.dictionary(section), key);
 }
 
 std::optional<std::string> MachineSettings::read(const MachineSetting& setting) {
-  return observe(parts(setting), _effects);
+  return observe(parts(setting));
 }
 
-void MachineSettings::change(const MachineSetting& setting, const std::string& asked) {
-  carryOut(parts(setting), asked, _effects, _runLoop);
+Effect MachineSettings::change(const MachineSetting& setting, const std::string& asked) {
+  return carryOut(parts(setting), asked);
+}
+
+std::optional<std::string> MachineSettings::observe(Setting setting) {
+  return tavisk::observe(heedingRefusals(std::move(setting)), _effects);
+}
+
+Effect MachineSettings::carryOut(Setting setting, const std::string& asked) {
+  return tavisk::carryOut(heedingRefusals(std::move(setting)), asked, _effects, _runLoop);
 }
 
 void MachineSettings::note(const MachineSetting& setting, const std::string& asked) {
-  const Result<void> written = write(setting, asked, refusalNamed(setting.name));
+  const auto refusal = refusalNamed(setting.name);
+  const Result<void> written = refusal ? refusedChange(*refusal) : write(setting, asked);
   if (!written) _effects.recordFailure(setting.name, written.failure(), asked);
 }
 
@@ -50,21 +68,27 @@ Setting MachineSettings::parts(const MachineSetting& setting) {
   parts.name = setting.name;
   parts.unit = setting.unit;
   parts.where = _file.path();
-  if (setting.read) parts.live = parts.stored = [this, &setting] { return readUnlessRefused(setting); };
-  parts.store = [this, &setting](const std::string& value) { return write(setting, value, refusal(setting.name, "")); };
+  if (setting.read) parts.live = parts.stored = [this, &setting] { return setting.read(_file); };
+  parts.store = [this, &setting](const std::string& value) { return write(setting, value); };
   parts.always = true;
   return parts;
 }
 
-MachineSetting::Value MachineSettings::readUnlessRefused(const MachineSetting& setting) {
-  if (auto reason = refusal(setting.name, " (read)")) return Failure{"read", machineName, *reason};
-  return setting.read(_file);
+Result<void> MachineSettings::write(const MachineSetting& setting, const std::string& value) {
+  return _file.change([&](MachineFile::Dictionary& machine) { setting.write(machine, value); });
 }
 
-Result<void> MachineSettings::write(const MachineSetting& setting, const std::string& value,
-                                    const std::optional<std::string>& refusal) {
-  if (refusal) return Failure{"set", machineName, *refusal};
-  return _file.change([&](MachineFile::Dictionary& machine) { setting.write(machine, value); });
+Setting MachineSettings::heedingRefusals(Setting setting) {
+  const auto unlessRefused = [&](const Setting::Read& read) {
+    auto reason = refusal(setting.name, " (read)");
+    if (!read || !reason) return read;
+    return Setting::Read([=] { return Failure{"read", machineName, *reason}; });
+  };
+  setting.live = unlessRefused(setting.live);
+  setting.stored = unlessRefused(setting.stored);
+  if (auto reason = refusal(setting.name, ""))
+    setting.store = [=](const std::string&) { return refusedChange(*reason); };
+  return setting;
 }
 
 std::optional<std::string> MachineSettings::refusal(const std::string& setting, const char* suffix) {

@@ -26,11 +26,12 @@ struct MachineSetting {
   Write write;
 };
 
-/// One key as a setting: a boolean reads as "on" or "off".
+/// One key as a setting: a boolean reads as "on" or "off", and a text as absent where it has neither value nor default.
 MachineSetting switchAt(std::string name, const std::string& section, const std::string& key);
 MachineSetting textAt(std::string name, const std::string& section, const std::string& key);
 
-/// Adds one to a count.
+/// Adds one to a count, which may be at the top.
+void countUp(MachineFile::Dictionary& dictionary, std::string_view key);
 void countUp(MachineFile::Dictionary& machine, std::string_view section, std::string_view key);
 
 /// Reads and changes the settings of the machine, and tells the effects. The one place that heeds "Refusals".
@@ -39,21 +40,27 @@ class MachineSettings {
   MachineSettings(MachineFile& file, EffectSink& effects, RunLoop& runLoop)
       : _file(file), _effects(effects), _runLoop(runLoop) {}
 
+  /// What is no setting is read here: no refusal applies and no effect is told.
+  MachineSection section(std::string_view name) { return _file.section(name); }
+
   /// Absent when reading is refused, or there is no value.
   std::optional<std::string> read(const MachineSetting& setting);
   bool isOn(const MachineSetting& setting) { return read(setting) == "on"; }
   /// Writes also when the machine has the value already.
-  void change(const MachineSetting& setting, const std::string& asked);
+  Effect change(const MachineSetting& setting, const std::string& asked);
   void turn(const MachineSetting& setting, bool on) { change(setting, on ? "on" : "off"); }
   /// Writes what is no setting of the machine but the run's own doing: only a failure is an effect, and "*" does not
   /// refuse it.
   void note(const MachineSetting& setting, const std::string& asked);
 
+  /// The same for a setting that the machine keeps outside its file.
+  std::optional<std::string> observe(Setting setting);
+  Effect carryOut(Setting setting, const std::string& asked);
+
  private:
   Setting parts(const MachineSetting& setting);
-  MachineSetting::Value readUnlessRefused(const MachineSetting& setting);
-  Result<void> write(const MachineSetting& setting, const std::string& value,
-                     const std::optional<std::string>& refusal);
+  Result<void> write(const MachineSetting& setting, const std::string& value);
+  Setting heedingRefusals(Setting setting);
   std::optional<std::string> refusal(const std::string& setting, const char* suffix);
   std::optional<std::string> refusalNamed(const std::string& name);
 

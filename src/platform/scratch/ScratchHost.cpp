@@ -24,6 +24,15 @@ ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFi
       _authenticator(_settings),
       _systemLog(_machine->folder(), effects),
       _clock(_settings),
-      _networkTime(_settings) {}
+      _networkTime(_settings),
+      _powerSettings(_settings),
+      _powerController(_settings, effects),
+      _remoteShell(_settings),
+      _remoteEvents(_settings),
+      _hostConfiguration(_settings),
+      _dynamicStore(_settings),
+      _bootLoaderFile(_root, _settings),
+      _preferences(_settings),
+      _processes(_settings, _preferences) {}
 
 }  // namespace tavisk

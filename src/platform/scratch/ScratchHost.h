@@ -11,8 +11,17 @@
 #include "platform/scratch/MachineFile.h"
 #include "platform/scratch/MachineSettings.h"
 #include "platform/scratch/ScratchAdminAuthenticator.h"
+#include "platform/scratch/ScratchBootLoaderFile.h"
 #include "platform/scratch/ScratchClockService.h"
+#include "platform/scratch/ScratchDynamicStore.h"
+#include "platform/scratch/ScratchHostConfigService.h"
 #include "platform/scratch/ScratchNetworkTimeService.h"
+#include "platform/scratch/ScratchPowerController.h"
+#include "platform/scratch/ScratchPowerSettingsService.h"
+#include "platform/scratch/ScratchPreferencesStore.h"
+#include "platform/scratch/ScratchProcessUtilities.h"
+#include "platform/scratch/ScratchRemoteEventsService.h"
+#include "platform/scratch/ScratchRemoteShellService.h"
 #include "platform/scratch/ScratchSystemLog.h"
 #include "platform/scratch/ScratchUserDatabase.h"
 
@@ -32,6 +41,15 @@ class ScratchHost final : public Host {
   SystemLog& systemLog() override { return _systemLog; }
   ClockService& clock() override { return _clock; }
   NetworkTimeService& networkTime() override { return _networkTime; }
+  PowerSettingsService& powerSettings() override { return _powerSettings; }
+  PowerController& powerController() override { return _powerController; }
+  RemoteShellService& remoteShell() override { return _remoteShell; }
+  RemoteEventsService& remoteEvents() override { return _remoteEvents; }
+  HostConfigService& hostConfiguration() override { return _hostConfiguration; }
+  DynamicStore& dynamicStore() override { return _dynamicStore; }
+  BootLoaderFile& bootLoaderFile() override { return _bootLoaderFile; }
+  PreferencesStore& preferences() override { return _preferences; }
+  ProcessUtilities& processes() override { return _processes; }
 
  private:
   ScratchHost(const std::string& directory, std::unique_ptr<MachineFile> machine, EffectSink& effects,
@@ -47,6 +65,15 @@ class ScratchHost final : public Host {
   ScratchSystemLog _systemLog;
   ScratchClockService _clock;
   ScratchNetworkTimeService _networkTime;
+  ScratchPowerSettingsService _powerSettings;
+  ScratchPowerController _powerController;
+  ScratchRemoteShellService _remoteShell;
+  ScratchRemoteEventsService _remoteEvents;
+  ScratchHostConfigService _hostConfiguration;
+  ScratchDynamicStore _dynamicStore;
+  ScratchBootLoaderFile _bootLoaderFile;
+  ScratchPreferencesStore _preferences;
+  ScratchProcessUtilities _processes;
 };
 
 }  // namespace tavisk

@@ -1,0 +1,19 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/LinuxBootLoaderFile.h"
+
+namespace tavisk {
+
+std::optional<PropertyList::Dictionary> LinuxBootLoaderFile::read() {
+  if (!observe(kernelArchitecture(_file, {}), _machine.effects)) return std::nullopt;
+  return _file.read().valueOr(std::nullopt);
+}
+
+bool LinuxBootLoaderFile::write(const PropertyList::Dictionary& contents) {
+  auto setting = kernelArchitecture(_file, contents);
+  setting.note = "stored; no boot loader here reads it";
+  const auto effect = carryOut(setting, architectureIn(contents), _machine.effects, _machine.runLoop);
+  return effect.outcome != Outcome::failed;
+}
+
+}  // namespace tavisk

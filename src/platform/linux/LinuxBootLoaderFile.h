@@ -1,0 +1,23 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "platform/BootLoaderFile.h"
+#include "platform/linux/LinuxMachine.h"
+
+namespace tavisk {
+
+/// The file itself is the setting: no boot loader of a Linux machine reads it, and the effects say so.
+class LinuxBootLoaderFile final : public BootLoaderFile {
+ public:
+  explicit LinuxBootLoaderFile(const LinuxMachine& machine) : _machine(machine), _file(machine.root, path) {}
+
+  std::optional<PropertyList::Dictionary> read() override;
+  bool write(const PropertyList::Dictionary& contents) override;
+
+ private:
+  LinuxMachine _machine;
+  PropertyListFile _file;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,28 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "platform/PowerSettingsService.h"
+#include "platform/scratch/MachineSettings.h"
+
+namespace tavisk {
+
+/// "Power Sources" and "Power".
+class ScratchPowerSettingsService final : public PowerSettingsService {
+ public:
+  explicit ScratchPowerSettingsService(MachineSettings& settings) : _settings(settings) {}
+
+  Minutes untilSleep(SleepTimer timer, const PowerSource& source) override;
+  void setUntilSleep(SleepTimer timer, const PowerSource& source, Minutes minutes) override;
+
+  bool supports(PowerSwitch which, const PowerSource& source) override;
+  bool isOn(PowerSwitch which, const PowerSource& source) override;
+  void setOn(PowerSwitch which, const PowerSource& source, bool on) override;
+  bool restartsOnHang() override;
+  void setRestartsOnHang(bool restarts) override;
+
+ private:
+  MachineSettings& _settings;
+};
+
+}  // namespace tavisk
