@@ -8,10 +8,9 @@ namespace tavisk {
 
 std::span<const HandlerRows> handlerFamilies() {
   static const std::array families = {
-      helpHandlers(),
-      dateAndTimeHandlers(),
-      timeZoneHandlers(),
-      networkTimeHandlers(),
+      helpHandlers(),         dateAndTimeHandlers(),    timeZoneHandlers(),         networkTimeHandlers(),
+      sleepTimersHandlers(),  wakeAndRestartHandlers(), startupDelayHandlers(),     remoteLoginHandlers(),
+      remoteEventsHandlers(), computerNameHandlers(),   bootArchitectureHandlers(), keyboardLockHandlers(),
   };
   return families;
 }

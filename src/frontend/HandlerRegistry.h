@@ -28,6 +28,14 @@ HandlerRows helpHandlers();
 HandlerRows dateAndTimeHandlers();
 HandlerRows timeZoneHandlers();
 HandlerRows networkTimeHandlers();
+HandlerRows sleepTimersHandlers();
+HandlerRows wakeAndRestartHandlers();
+HandlerRows startupDelayHandlers();
+HandlerRows remoteLoginHandlers();
+HandlerRows remoteEventsHandlers();
+HandlerRows computerNameHandlers();
+HandlerRows bootArchitectureHandlers();
+HandlerRows keyboardLockHandlers();
 
 /// All families.
 std::span<const HandlerRows> handlerFamilies();

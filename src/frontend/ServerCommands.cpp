@@ -5,11 +5,14 @@
 #include <utility>
 
 #include "frontend/RemotePrefsExtra.h"
+#include "settings/SpecialPMUSettings.h"
 
 namespace tavisk {
 
 ServerCommands::ServerCommands(std::shared_ptr<const CommandTable> commandDict, const CommandContext& context)
     : _context(context), _commandDict(std::move(commandDict)) {}
+
+ServerCommands::~ServerCommands() = default;
 
 bool ServerCommands::checkForEmptyString(const std::string& value, const char* command, const char* withInfo,
                                          const char* andUseage) {

@@ -18,6 +18,9 @@
 namespace tavisk {
 
 class RemoteServerSettings;
+class SpecialPMUSettings;
+struct SleepTimerSetter;
+struct SourceSwitch;
 
 /// What a run works with; nothing is owned.
 struct CommandContext {
@@ -33,6 +36,9 @@ struct CommandContext {
 class ServerCommands {
  public:
   ServerCommands(std::shared_ptr<const CommandTable> commandDict, const CommandContext& context);
+  ~ServerCommands();
+  ServerCommands(const ServerCommands&) = delete;
+  ServerCommands& operator=(const ServerCommands&) = delete;
 
   /// The parent is not owned and outlives this object.
   void setParent(RemoteServerSettings* parent) { _parent = parent; }
@@ -63,6 +69,92 @@ class ServerCommands {
   void getNetworkTimeServer();
   void setNetworkTimeServer(const std::string& address);
 
+  /// Sleep timers
+  void getSleep();
+  void setSleep(const std::string& minutes);
+  void getComputerSleep();
+  void setComputerSleep(const std::string& minutes);
+  void getDisplaySleep();
+  void setDisplaySleep(const std::string& minutes);
+  void getHardDiskSleep();
+  void setHardDiskSleep(const std::string& minutes);
+  /// The one power source whose settings are read and changed.
+  static std::string getPMKey();
+
+  /// Wake and restart switches
+  void getWakeOnModem();
+  void setWakeOnModem(const std::string& onOff);
+  void getWakeOnNetworkAccess();
+  void setWakeOnNetworkAccess(const std::string& onOff);
+  void getRestartPowerFailure();
+  void setRestartPowerFailure(const std::string& onOff);
+  void getRestartFreeze();
+  void setRestartFreeze(const std::string& onOff);
+  void getAllowPowerButtonToSleepComputer();
+  void setAllowPowerButtonToSleepComputer(const std::string& onOff);
+
+  /// Start-up delay after a power failure
+  void getWaitForStartupAfterPowerFailure();
+  void setWaitForStartupAfterPowerFailure(const std::string& seconds);
+
+  /// Remote login
+  void getRemoteLogin();
+  void setRemoteLogin(const std::string& onOff);
+  /// Asks until the answer is yes (true) or no.
+  bool promptForRemoteLogin();
+  /// Of the SSH server; 0 when it does not run. Kept; nothing asks it.
+  ProcessId remoteLoginPID();
+  /// Lets the watchdog daemon read its configuration again. Kept; nothing calls it.
+  void setWatchdogSignal();
+
+  /// Remote events
+  void getRemoteVelmarEvents();
+  void setRemoteVelmarEvents(const std::string& onOff);
+
+  /// Computer name and local subnet name
+  void getComputerName();
+  void setComputerName(const std::string& name);
+  void getLocalSubnetName();
+  void setLocalSubnetName(const std::string& name);
+
+  /// Kernel boot architecture
+  void getKernelBootArchitectureSetting();
+  void setKernelBootArchitecture(const std::string& architecture);
+
+  /// Keyboard lock with the enclosure lock
+  void getDisableKeyBoardWhenEnclosureLockIsEngaged();
+  void setDisableKeyBoardWhenEnclosureLockIsEngaged(const std::string& yesNo);
+
+  /// Reserved: uninterruptible power supply. No command reaches these; they do nothing yet.
+  static std::string getUPSKey();
+  void listUPSSupportedShutdownOption();
+  std::nullopt_t getUPSSHutDownOptionListHelper(const std::string& options);
+  void setUPSShutdownOption(const std::string& option, const std::string& value);
+  void getUPSShutdownOption();
+  void getUPSBatteryLevel();
+  void getUPSModel();
+  void getUPSSleep();
+  void setUPSSleep(const std::string& minutes);
+  void getUPSHardDiskSleep();
+  void setUPSHardDiskSleep(const std::string& minutes);
+  void getUPSDisplaySleep();
+  void setUPSDisplaySleep(const std::string& minutes);
+  void getUPSComputerSleep();
+  void setUPSComputerSleep(const std::string& minutes);
+  void listUPSProcessorPerformanceOptions();
+  void setUPSProcessorPerformance(const std::string& performance);
+  void getUPSProccessorPerformance();
+
+  /// Reserved: scheduled power events. No command reaches these; they only leave a line in the system log.
+  void setScheduledShutDownTime(const std::string& date, const std::string& andTime);
+  void getScheduledShutDownTime();
+  void setScheduledStartupTime(const std::string& date, const std::string& andTime);
+  void getScheduledStartupTime();
+  void setScheduledWakeTime(const std::string& date, const std::string& andTime);
+  void getScheduledWakeTime();
+  void setScheduledSleepTime(const std::string& date, const std::string& andTime);
+  void getScheduledSleepTime();
+
  private:
   /// True when the value is empty: then the usage was printed and the error flag set.
   bool checkForEmptyString(const std::string& value, const char* command, const char* withInfo, const char* andUseage);
@@ -75,6 +167,17 @@ class ServerCommands {
   void setClock(const DateTime& local);
   /// True while the network time client runs: then the error was printed and the error flag set.
   bool refuseWhileNetworkTimeRuns(const char* error);
+  void showSleepTimer(const char* label, SleepTimer timer);
+  void setSleepTimers(const SleepTimerSetter& setter, const std::string& value);
+  void showSourceSwitch(const SourceSwitch& row);
+  void setSourceSwitch(const SourceSwitch& row, const std::string& onOff);
+  void allowPowerButton(const std::string& onOff);
+  /// Made at its first use.
+  SpecialPMUSettings& sharedSpecialPMU();
+  void showName(const char* label, const char* command, std::optional<std::string> (DynamicStore::Session::*read)());
+  void chooseKernelArchitecture(const std::string& architecture);
+  void chooseDefaultKernelArchitecture();
+  void tellWhetherSaved(bool saved);
 
   CommandContext _context;
   std::shared_ptr<const CommandTable> _commandDict;  ///< kept for the handlers' use
@@ -82,6 +185,7 @@ class ServerCommands {
   std::atomic<bool> _error = false;
   RemoteServerSettings* _parent = nullptr;
   std::optional<std::string> _timeZone;  ///< set by setTimeZone
+  std::unique_ptr<SpecialPMUSettings> _specialPMU;
 };
 
 }  // namespace tavisk

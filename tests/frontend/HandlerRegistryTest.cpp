@@ -13,43 +13,7 @@ namespace tavisk {
 
 namespace {
 
-const std::set<std::string> notBuiltYet = {
-    "getSleep",
-    "setSleep:",
-    "getComputerSleep",
-    "setComputerSleep:",
-    "getDisplaySleep",
-    "setDisplaySleep:",
-    "getHardDiskSleep",
-    "setHardDiskSleep:",
-    "getWakeOnModem",
-    "setWakeOnModem:",
-    "getWakeOnNetworkAccess",
-    "setWakeOnNetworkAccess:",
-    "getRestartPowerFailure",
-    "setRestartPowerFailure:",
-    "getRestartFreeze",
-    "setRestartFreeze:",
-    "getAllowPowerButtonToSleepComputer",
-    "setAllowPowerButtonToSleepComputer:",
-    "getRemoteLogin",
-    "setRemoteLogin:",
-    "getRemoteVelmarEvents",
-    "setRemoteVelmarEvents:",
-    "getComputerName",
-    "setComputerName:",
-    "getLocalSubnetName",
-    "setLocalSubnetName:",
-    "getStartupDisk",
-    "setStartupDisk:",
-    "listStartupDisk",
-    "getWaitForStartupAfterPowerFailure",
-    "setWaitForStartupAfterPowerFailure:",
-    "getDisableKeyBoardWhenEnclosureLockIsEngaged",
-    "setDisableKeyBoardWhenEnclosureLockIsEngaged:",
-    "getKernelBootArchitectureSetting",
-    "setKernelBootArchitecture:",
-};
+const std::set<std::string> notBuiltYet = {"getStartupDisk", "setStartupDisk:", "listStartupDisk"};
 
 CommandTable productTable() {
   return CommandTable::parse(CommandTable::text()).value();

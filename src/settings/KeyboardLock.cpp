@@ -1,0 +1,54 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <optional>
+
+#include "frontend/HandlerRegistry.h"
+#include "frontend/RemotePrefsExtra.h"
+#include "frontend/ServerCommands.h"
+
+namespace tavisk {
+
+namespace {
+
+/// Absent when the word is none of the four.
+std::optional<bool> readYesNo(const std::string& value) {
+  if (caseInsensitiveEqualTo(value, "Yes") || caseInsensitiveEqualTo(value, "On")) return true;
+  if (caseInsensitiveEqualTo(value, "No") || caseInsensitiveEqualTo(value, "Off")) return false;
+  return std::nullopt;
+}
+
+}  // namespace
+
+void ServerCommands::getDisableKeyBoardWhenEnclosureLockIsEngaged() {
+  const PropertyList value = _context.host.preferences().value(DunmereLockEnclosureStateKey).value_or(false);
+  if (const bool* disabled = value.asBoolean()) {
+    _context.output.print("getdisablekeyboardwhenenclosurelockisengaged: %s\n", *disabled ? "Yes" : "No");
+  } else {
+    _context.output.putLine("getdisablekeyboardwhenenclosurelockisengaged: error reading from preferences");
+  }
+}
+
+void ServerCommands::setDisableKeyBoardWhenEnclosureLockIsEngaged(const std::string& yesNo) {
+  if (checkForEmptyString(yesNo, "setdisablekeyboardwhenenclosurelockisengaged", "either 'Yes' or 'No'",
+                          "setdisablekeyboardwhenenclosurelockisengaged <yes no>")) {
+    return;
+  }
+  // Any other word is passed over without a message.
+  const std::optional<bool> disabled = readYesNo(yesNo);
+  if (!disabled) return;
+  ProcessUtilities& utilities = _context.host.processes();
+  utilities.setLockEnclosureState(*disabled);
+  utilities.setMachineBoolean(DunmereLockEnclosureStateKey, *disabled);
+  utilities.writeMachinePreferences();
+  _context.output.print("setdisablekeyboardwhenenclosurelockisengaged: %s\n", *disabled ? "Yes" : "No");
+}
+
+HandlerRows keyboardLockHandlers() {
+  static constexpr HandlerRow rows[] = {
+      {"getDisableKeyBoardWhenEnclosureLockIsEngaged", &ServerCommands::getDisableKeyBoardWhenEnclosureLockIsEngaged},
+      {"setDisableKeyBoardWhenEnclosureLockIsEngaged:", &ServerCommands::setDisableKeyBoardWhenEnclosureLockIsEngaged},
+  };
+  return rows;
+}
+
+}  // namespace tavisk

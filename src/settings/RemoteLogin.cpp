@@ -1,0 +1,95 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <algorithm>
+#include <cstddef>
+#include <limits>
+#include <optional>
+#include <string_view>
+
+#include "frontend/HandlerRegistry.h"
+#include "frontend/RemoteServerSettings.h"
+#include "frontend/ServerCommands.h"
+#include "platform/Text.h"
+
+namespace tavisk {
+
+namespace {
+
+constexpr const char* question =
+    "Do you really want to turn remote login off? If you do, you will lose this connection and can only turn it back "
+    "on locally at the server (yes/no)? ";
+constexpr std::size_t answerBufferSize = 1024;
+
+constexpr const char* watchdogFile = "/var/run/watchdog.pid";
+constexpr std::size_t longestWatchdogFile = 1 << 16;
+constexpr std::size_t longestWatchdogLine = 63;
+constexpr int hangUp = 1;
+
+bool beginsWith(std::string_view line, std::string_view word) {
+  return compareIgnoringCase(line.substr(0, word.size()), word) == 0;
+}
+
+/// Only how the line begins counts: "yesterday" is a yes. Absent when it is neither.
+std::optional<bool> readYesNo(std::string_view line) {
+  if (beginsWith(line, "YES")) return true;
+  if (beginsWith(line, "NO")) return false;
+  return std::nullopt;
+}
+
+ProcessId processIdIn(std::string_view line) {
+  using Limits = std::numeric_limits<ProcessId>;
+  return static_cast<ProcessId>(std::clamp<std::int64_t>(leadingInteger(line), Limits::min(), Limits::max()));
+}
+
+}  // namespace
+
+void ServerCommands::getRemoteLogin() {
+  setError(false);
+  _context.output.print("Remote Login: %s\n", _context.host.remoteShell().isEnabled() ? "On" : "Off");
+}
+
+void ServerCommands::setRemoteLogin(const std::string& onOff) {
+  RemoteShellService& remoteShell = _context.host.remoteShell();
+  const bool enabled = remoteShell.isEnabled();
+  setError(false);
+  if (checkForEmptyString(onOff, "setremotelogin", "either 'On' or 'Off'", "setremotelogin <on off>")) return;
+  const std::optional<bool> on = readOnOff(onOff, "setremotelogin");
+  if (!on) return;
+  // Asked also when it is off already: the answer comes before the look at the state.
+  if (!*on && _parent->promptUser() && !promptForRemoteLogin()) return;
+  if (*on == enabled) {
+    _context.output.print("setremotelogin: remote login is already %s.\n", enabled ? "On" : "Off");
+  } else {
+    remoteShell.setEnabled(*on);
+  }
+}
+
+bool ServerCommands::promptForRemoteLogin() {
+  // The end of the input is no answer: the question goes on until a signal or a lost output ends the run.
+  while (true) {
+    const std::optional<std::string> line = _context.input.readLine(question, answerBufferSize);
+    const std::optional<bool> answer = line ? readYesNo(*line) : std::nullopt;
+    if (answer) return *answer;
+  }
+}
+
+ProcessId ServerCommands::remoteLoginPID() {
+  return _context.host.processes().processNamed("sshd");
+}
+
+void ServerCommands::setWatchdogSignal() {
+  const std::string contents = _context.host.files().read(watchdogFile, longestWatchdogFile).valueOr("");
+  const std::string_view firstLine = std::string_view(contents).substr(0, contents.find('\n'));
+  const ProcessId watchdog = processIdIn(firstLine.substr(0, longestWatchdogLine));
+  if (watchdog != 0) _context.host.processes().sendSignal(hangUp, watchdog);
+}
+
+HandlerRows remoteLoginHandlers() {
+  static constexpr HandlerRow rows[] = {
+      {"getRemoteLogin", &ServerCommands::getRemoteLogin},
+      {"setRemoteLogin:", &ServerCommands::setRemoteLogin},
+  };
+  return rows;
+}
+
+}  // namespace tavisk

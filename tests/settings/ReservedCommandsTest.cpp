@@ -1,0 +1,74 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include "ToolRun.h"
+
+namespace tavisk {
+
+namespace {
+
+/// The handlers that no command reaches, called as a coming command would.
+class ReservedCommands : public testing::Test {
+ protected:
+  ScratchMachine machine;
+  Stream stream{std::tmpfile()};
+  Output output{stream.get()};
+  StreamLineSource input{stream.get(), output};
+  NotificationCenter notifications;
+  ServerCommands commands{nullptr, {machine.host(), machine.runLoop, notifications, output, input}};
+};
+
+TEST_F(ReservedCommands, leaveALineInTheSystemLogAtMost) {
+  commands.setError(true);
+  commands.setScheduledShutDownTime("d", "t");
+  commands.getScheduledShutDownTime();
+  commands.setScheduledStartupTime("d", "t");
+  commands.getScheduledStartupTime();
+  commands.setScheduledWakeTime("d", "t");
+  commands.getScheduledWakeTime();
+  commands.setScheduledSleepTime("d", "t");
+  commands.getScheduledSleepTime();
+  commands.setUPSSleep("5");
+  EXPECT_THAT(machine.systemLog(), testing::ElementsAre("setScheduledShutDownTime: d t", "getScheduledShutDownTime",
+                                                        "setScheduledStartupTime: d  t", "getScheduledStartupTime",
+                                                        "setScheduledWakeTime:  d t", "getScheduledWakeTime",
+                                                        "setScheduledSleepTime: d t", "getScheduledSleepTime"));
+  EXPECT_TRUE(commands.error());
+  EXPECT_EQ(textOf(stream.get()), "");
+  EXPECT_EQ(ServerCommands::getUPSKey(), ServerCommands::getPMKey());
+}
+
+TEST_F(ReservedCommands, signalTheWatchdogByItsFile) {
+  struct Case {
+    const char* contents;
+    int signalled;
+  };
+  const Case cases[] = {
+      {"", 0}, {"0\n", 0}, {"\n77\n", 0}, {"none", 0}, {"77\n", 77}, {"  78 and more\n5\n", 78}, {"79", 79},
+  };
+  commands.setWatchdogSignal();
+  std::vector<PropertyList> expected;
+  for (const auto& test : cases) {
+    machine.writeFile("/var/run/watchdog.pid", test.contents);
+    commands.setWatchdogSignal();
+    if (test.signalled == 0) continue;
+    PropertyList::Dictionary sent;
+    sent.set("Process", test.signalled);
+    sent.set("Signal", 1);
+    expected.emplace_back(sent);
+  }
+  EXPECT_EQ(*machine.description().find("Signals")->asArray(), expected);
+}
+
+TEST_F(ReservedCommands, findTheServerOfRemoteLogin) {
+  EXPECT_EQ(commands.remoteLoginPID(), 0);
+  machine.set("Processes", "sshd", 4711);
+  machine.set("Processes", "sshd-session", 4712);
+  EXPECT_EQ(commands.remoteLoginPID(), 4711);
+}
+
+}  // namespace
+
+}  // namespace tavisk
