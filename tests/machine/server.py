@@ -1,0 +1,73 @@
+# SPDX-FileCopyrightText: 2026 The tavisk developers
+# SPDX-License-Identifier: MIT
+"""A Debian server with UEFI firmware, a disk and a clock of its own."""
+
+import shutil
+
+import emulator
+import trees
+
+FIRMWARE = "/usr/share/OVMF/OVMF_CODE_4M.fd"
+FIRMWARE_VARIABLES = "/usr/share/OVMF/OVMF_VARS_4M.fd"
+SECTOR = 512
+BOOT_START = 2048            # sectors
+BOOT_SIZE = 64 * 1024        # KiB
+ROOT_SIZE = 1536 * 1024      # KiB
+ROOT_START = BOOT_START * SECTOR + BOOT_SIZE * 1024  # bytes
+BOOT_ENTRY = """title Debian
+linux /vmlinuz
+initrd /initrd
+options root=PARTLABEL=root rw console=ttyS0 systemd.log_color=0
+"""
+AGENT_UNIT = """[Unit]
+Description=Commands of the tests
+After=multi-user.target
+
+[Service]
+ExecStart=/bin/sh /usr/lib/agent.sh /dev/ttyS1
+
+[Install]
+WantedBy=graphical.target
+"""
+
+
+class Server(emulator.Emulated):
+    has = frozenset({"bus", "clock", "server", "systemd-timesyncd"})
+    cannot = "wake from sleep, lose its power"
+    reboot = "systemctl reboot"
+
+    def __init__(self):
+        tree = trees.layered("server-tree", trees.SERVER)
+        disk = trees.WORK / "server.img"
+        variables = trees.WORK / "server-variables.fd"
+        super().__init__("server", [
+            "-drive", f"if=pflash,format=raw,readonly=on,file={FIRMWARE}",
+            "-drive", f"if=pflash,format=raw,file={variables}", "-drive", f"if=virtio,format=raw,file={disk}"])
+        shutil.copy(FIRMWARE_VARIABLES, variables)
+        _add_agent(tree)
+        _make_disk(tree, disk)
+
+
+def _add_agent(tree):
+    shutil.copy(emulator.AGENT, tree / "usr/lib/agent.sh")
+    (tree / "etc/systemd/system/agent.service").write_text(AGENT_UNIT)
+    trees.run("systemctl", f"--root={tree}", "enable", "agent.service")
+
+
+def _make_disk(tree, disk):
+    trees.run("truncate", "-s", ROOT_START + (ROOT_SIZE + 1024) * 1024, disk)
+    trees.run("sgdisk", f"--new=1:{BOOT_START}:+{BOOT_SIZE}K", "--typecode=1:ef00", f"--new=2:0:+{ROOT_SIZE}K",
+              "--change-name=2:root", disk)
+    trees.run("mkfs.ext4", "-q", "-F", "-d", tree, "-E", f"offset={ROOT_START}", disk, f"{ROOT_SIZE}k")
+    trees.run("mkfs.vfat", "-F", "32", "-s", "1", f"--offset={BOOT_START}", disk, BOOT_SIZE)
+    _fill_boot_partition(tree, f"{disk}@@{BOOT_START * SECTOR}")
+
+
+def _fill_boot_partition(tree, partition):
+    entry = trees.WORK / "debian.conf"
+    entry.write_text(BOOT_ENTRY)
+    loader = tree / "usr/lib/systemd/boot/efi/systemd-bootx64.efi"
+    trees.run("mmd", "-i", partition, "::/EFI", "::/EFI/BOOT", "::/loader", "::/loader/entries")
+    for source, target in ((loader, "EFI/BOOT/BOOTX64.EFI"), (trees.kernel(tree), "vmlinuz"),
+                           (trees.initial_files(tree), "initrd"), (entry, "loader/entries/debian.conf")):
+        trees.run("mcopy", "-i", partition, source, "::/" + target)
