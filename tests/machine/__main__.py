@@ -3,7 +3,6 @@
 """Proves the installed program on the machines that are named, or on all of them; see script/test-machine."""
 
 import argparse
-import signal
 import subprocess
 import sys
 import time
@@ -57,7 +56,6 @@ def prove(make, results, keep):
 
 def main():
     chosen = arguments()
-    signal.signal(signal.SIGTERM, lambda number, frame: sys.exit("ended"))
     guard.refuse_unless_isolated()
     trees.prepare_work()
     results = check.Results()
