@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "platform/linux/LinuxClockService.h"
 
+#include <unistd.h>
+
 #include <chrono>
 
 #include "platform/SettingNames.h"
@@ -14,6 +16,7 @@ namespace tavisk {
 namespace {
 
 constexpr const char* withoutZone = "UTC";
+constexpr const char* inContainer = "no CAP_SYS_TIME here: set it on the machine that hosts this container";
 constexpr const char* timeUnit = "seconds since 1970";
 
 /// The clock as it was at one moment, also when it is read later.
@@ -30,6 +33,22 @@ class ClockAtMoment {
   std::optional<RunLoop::Clock::time_point> _moment;
 };
 
+BusObject timeDaemon() {
+  return {"org.freedesktop.timedate1", "/org/freedesktop/timedate1", "org.freedesktop.timedate1"};
+}
+
+/// Whether the daemon is not there, or does not set a clock that a network-time client holds.
+bool leavesItToOthers(const Failure& failure) {
+  return isBusError(failure, serviceUnknown) ||
+         isBusError(failure, "org.freedesktop.timedate1.AutomaticTimeSyncEnabled");
+}
+
+/// In a container the daemon has no more rights than this process.
+Failure withAdvice(Failure failure) {
+  if (::geteuid() == 0 && !maySetSystemTime()) failure.why += std::string("; ") + inContainer;
+  return failure;
+}
+
 }  // namespace
 
 std::int64_t LinuxClockService::now() {
@@ -43,10 +62,15 @@ std::optional<Failure> LinuxClockService::whyNoClock() const {
   if (_machine.root.prefix() != "/")
     return Failure{"set the clock", _machine.root.prefix(), "a tree of files has no clock"};
   if (auto failure = whyNeedsRoot("set the clock", "CLOCK_REALTIME")) return failure;
-  if (!maySetSystemTime())
-    return Failure{"set the clock", "CLOCK_REALTIME",
-                   "no CAP_SYS_TIME here: set it on the machine that hosts this container"};
+  if (!maySetSystemTime()) return Failure{"set the clock", "CLOCK_REALTIME", inContainer};
   return std::nullopt;
+}
+
+std::string LinuxClockService::whoCorrectsTheClock() {
+  auto bus = _machine.services.systemBus();
+  if (!bus) return {};
+  auto corrected = (*bus)->property(timeDaemon(), "NTP", "b");
+  return corrected && std::move(corrected).value().readBoolean() ? "the network-time client" : "";
 }
 
 void LinuxClockService::setTime(std::int64_t secondsSince1970) {
@@ -55,6 +79,7 @@ void LinuxClockService::setTime(std::int64_t secondsSince1970) {
   time.name = setting::time;
   time.unit = timeUnit;
   time.where = _machine.root.exists(hardwareClock) ? hardwareClock : "";
+  time.undoneBy = whoCorrectsTheClock();
   time.live = [&clock] { return std::optional(std::to_string(clock.time())); };
   time.apply = [&](const std::string&) -> Result<void> {
     clock.isNow();
@@ -64,7 +89,19 @@ void LinuxClockService::setTime(std::int64_t secondsSince1970) {
 }
 
 Result<void> LinuxClockService::changeTime(std::int64_t secondsSince1970) {
+  constexpr std::int64_t microseconds = 1'000'000;
+  constexpr bool relative = false;
   if (auto failure = whyOutOfClockRange(secondsSince1970)) return *failure;
+  if (auto bus = _machine.services.systemBus()) {
+    auto set =
+        (*bus)->call(timeDaemon(), "SetTime", "", secondsSince1970 * microseconds, relative, (*bus)->isInteractive());
+    if (set) return {};
+    if (!leavesItToOthers(set.failure())) return withAdvice(set.failure());
+  }
+  return changeTimeDirectly(secondsSince1970);
+}
+
+Result<void> LinuxClockService::changeTimeDirectly(std::int64_t secondsSince1970) const {
   if (auto failure = whyNoClock()) return *failure;
   if (auto set = setSystemTime(secondsSince1970); !set) return set;
   return setHardwareClock(_machine.root, secondsSince1970);
@@ -105,9 +142,25 @@ void LinuxClockService::setTimeZone(const std::string& zoneFile) {
 }
 
 Result<void> LinuxClockService::changeTimeZone(const std::string& zone) {
+  if (auto bus = _machine.services.systemBus()) {
+    auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone, (*bus)->isInteractive());
+    if (!set && !leavesItToOthers(set.failure())) return set.failure();
+    if (set) return updateNameFile(zone);
+  }
+  return changeTimeZoneDirectly(zone);
+}
+
+Result<void> LinuxClockService::changeTimeZoneDirectly(const std::string& zone) const {
   if (auto failure = whyNeedsRoot("set the time zone", "/etc/localtime")) return *failure;
   if (auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
   return updateTimeZoneFile(_machine.root, zone);
+}
+
+/// The daemon leaves Debian's second copy of the name alone.
+Result<void> LinuxClockService::updateNameFile(const std::string& zone) const {
+  auto updated = updateTimeZoneFile(_machine.root, zone);
+  if (updated) return updated;
+  return whyNeedsRoot("write", "/etc/timezone").value_or(updated.failure());
 }
 
 std::string LinuxClockService::rulesOf(const std::string& timeZone) {

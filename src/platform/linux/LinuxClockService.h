@@ -23,8 +23,12 @@ class LinuxClockService : public ClockService {
  private:
   Setting timeZoneSetting() const;
   std::optional<Failure> whyNoClock() const;
+  std::string whoCorrectsTheClock();
   Result<void> changeTime(std::int64_t secondsSince1970);
+  Result<void> changeTimeDirectly(std::int64_t secondsSince1970) const;
   Result<void> changeTimeZone(const std::string& zone);
+  Result<void> changeTimeZoneDirectly(const std::string& zone) const;
+  Result<void> updateNameFile(const std::string& zone) const;
 
   LinuxMachine _machine;
 };

@@ -9,6 +9,7 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _journalLog(_root),
       _services(_root, runLoop),
       _machine{_root, effects, runLoop, _services},
+      _authenticator(_machine),
       _files(_root),
       _systemLog(_root),
       _clock(_machine),

@@ -3,24 +3,41 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 
 #include "platform/RunLoop.h"
 #include "platform/SystemRoot.h"
+#include "platform/linux/Bus.h"
 #include "platform/linux/Daemons.h"
 
 namespace tavisk {
 
-/// What this machine has to run its services, found out once, when it is first asked for.
+/// How the services of this machine are reached: over the system bus, straight from the service manager where the bus
+/// is down, or, where the machine has no service manager, by files and programs. Found out when it is first asked for.
 class ServiceAccess {
  public:
   /// Both must outlive the object.
   ServiceAccess(const SystemRoot& root, RunLoop& runLoop) : _root(root), _runLoop(runLoop) {}
 
+  /// Whether the service manager runs the machine (sd_booted(3)).
+  bool hasServiceManager() const;
+  /// Fails too where the machine has no service manager. Opened again after the bus went away.
+  Result<Bus*> systemBus();
+  Result<Bus*> serviceManager();
+  /// A connection of the caller's own, for use by another thread than the main one. systemBus() was called before.
+  Result<std::unique_ptr<Bus>> openSystemBus() const;
+
   Daemons& daemons();
 
  private:
+  Result<const SystemdLibrary*> library();
+  Result<Bus*> keep(std::unique_ptr<Bus>& place, const char* socket, Bus::Kind kind);
+
   const SystemRoot& _root;
   RunLoop& _runLoop;
+  std::optional<SystemdLibrary> _library;
+  std::unique_ptr<Bus> _systemBus;
+  std::unique_ptr<Bus> _manager;
   std::unique_ptr<Daemons> _daemons;
 };
 

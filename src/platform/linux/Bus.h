@@ -1,0 +1,103 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <chrono>
+#include <functional>
+#include <memory>
+#include <string>
+#include <string_view>
+
+#include "platform/FileDescriptor.h"
+#include "platform/Result.h"
+#include "platform/SystemRoot.h"
+#include "platform/linux/BusMessage.h"
+#include "platform/linux/SystemdLibrary.h"
+
+namespace tavisk {
+
+/// Whom a call is for: the well-known name of a service, one of its objects, an interface of that.
+struct BusObject {
+  const char* service;
+  std::string path;
+  const char* interface;
+};
+
+/// Whether a failure is this error of the bus: "org.freedesktop.DBus.Error.ServiceUnknown".
+bool isBusError(const Failure& failure, std::string_view name);
+
+inline constexpr std::string_view serviceUnknown = "org.freedesktop.DBus.Error.ServiceUnknown";
+
+/// A connection to the message bus, or straight to one service. Used by one thread. A failure of a call begins its
+/// reason with the name of the error; a reply of another signature than expected is a failure.
+class Bus {
+ public:
+  enum class Kind { messageBus, straightToService };
+
+  static constexpr std::chrono::seconds usualTime{5};
+
+  /// Connects to a socket beneath the root; no variable of the environment says where. `library` must outlive it.
+  static Result<std::unique_ptr<Bus>> open(const SystemdLibrary& library, const SystemRoot& root,
+                                           const std::string& socket, Kind kind);
+  Bus(const Bus&) = delete;
+  Bus& operator=(const Bus&) = delete;
+  ~Bus();
+
+  bool isOpen() const;
+  /// Whether services may ask the user to authenticate while a call waits: the user is not root and sits at a terminal.
+  /// Calls then have all the time they need.
+  bool isInteractive() const { return _interactive; }
+
+  /// By which others on the message bus know this connection.
+  std::string uniqueName() const;
+
+  using Writer = std::function<void(BusMessage&)>;
+  /// Calls and waits for the reply.
+  Result<BusMessage> call(const BusObject& object, const char* member, const char* replySignature,
+                          const Writer& arguments, std::chrono::seconds longest = usualTime);
+  template <typename... Arguments>
+  Result<BusMessage> call(const BusObject& object, const char* member, const char* replySignature,
+                          const Arguments&... arguments) {
+    return call(object, member, replySignature, Writer([&](BusMessage& message) { (message.write(arguments), ...); }));
+  }
+  /// The value of a property, ready to be read.
+  Result<BusMessage> property(const BusObject& object, const char* name, const char* signature);
+
+  using SignalHandler = std::function<void(BusMessage&)>;
+  /// Keeps a handler; its end takes the handler out. It ends before the bus.
+  class Subscription {
+   public:
+    Subscription(const SystemdLibrary& library, SignalHandler handler);
+    Subscription(const Subscription&) = delete;
+    Subscription& operator=(const Subscription&) = delete;
+    ~Subscription();
+
+   private:
+    friend class Bus;
+    static int receive(sd_bus_message* message, void* subscription, sd_bus_error* error);
+
+    const SystemdLibrary& _library;
+    SignalHandler _handler;
+    sd_bus_slot* _slot = nullptr;
+  };
+  /// The handler is called from process() with each signal.
+  Result<std::unique_ptr<Subscription>> subscribe(const BusObject& object, const char* signal, SignalHandler handler);
+
+  /// Readable when there is something to process.
+  int descriptor() const;
+  /// Handles what has arrived; never waits.
+  void process();
+
+ private:
+  Bus(const SystemdLibrary& library, sd_bus* bus, Kind kind);
+  int start(const FileDescriptor& connection);
+  int awaitReady();
+  const char* destination(const BusObject& object) const;
+
+  const SystemdLibrary& _library;
+  sd_bus* _bus;
+  Kind _kind;
+  bool _interactive;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,111 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/RunningProgram.h"
+
+#include <fcntl.h>
+#include <spawn.h>
+#include <sys/syscall.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <utility>
+
+#include "platform/SystemFailure.h"
+
+namespace tavisk {
+namespace {
+
+/// The attributes and file actions of posix_spawn(3).
+class SpawnSetup {
+ public:
+  explicit SpawnSetup(const ProgramFiles& files) {
+    ::posix_spawnattr_init(&_attributes);
+    ::posix_spawn_file_actions_init(&_actions);
+    resetSignals();
+    if (files.output >= 0) {
+      ::posix_spawn_file_actions_addopen(&_actions, STDIN_FILENO, "/dev/null", O_RDONLY, 0);
+      ::posix_spawn_file_actions_adddup2(&_actions, files.output, STDOUT_FILENO);
+      ::posix_spawn_file_actions_adddup2(&_actions, files.output, STDERR_FILENO);
+    }
+    if (files.third >= 0) ::posix_spawn_file_actions_adddup2(&_actions, files.third, 3);
+  }
+  SpawnSetup(const SpawnSetup&) = delete;
+  SpawnSetup& operator=(const SpawnSetup&) = delete;
+  ~SpawnSetup() {
+    ::posix_spawn_file_actions_destroy(&_actions);
+    ::posix_spawnattr_destroy(&_attributes);
+  }
+  const posix_spawnattr_t* attributes() const { return &_attributes; }
+  const posix_spawn_file_actions_t* actions() const { return &_actions; }
+
+ private:
+  void resetSignals() {
+    sigset_t signals;
+    ::sigemptyset(&signals);
+    ::posix_spawnattr_setsigmask(&_attributes, &signals);
+    ::sigfillset(&signals);
+    ::posix_spawnattr_setsigdefault(&_attributes, &signals);
+    ::posix_spawnattr_setflags(&_attributes, POSIX_SPAWN_SETSIGMASK | POSIX_SPAWN_SETSIGDEF);
+  }
+
+  posix_spawnattr_t _attributes{};
+  posix_spawn_file_actions_t _actions{};
+};
+
+std::vector<char*> pointersTo(std::vector<std::string>& words) {
+  std::vector<char*> pointers;
+  for (auto& word : words) pointers.push_back(word.data());
+  pointers.push_back(nullptr);
+  return pointers;
+}
+
+}  // namespace
+
+Result<RunningProgram> RunningProgram::start(const SystemRoot& root, std::vector<std::string> words,
+                                             const ProgramFiles& files) {
+  auto program = root.standardized(words.front());
+  if (!program) return program.failure();
+  auto path = root.prefix() == "/" ? *program : root.prefix() + *program;
+  std::vector<std::string> environment = {"PATH=/usr/sbin:/usr/bin:/sbin:/bin", "LC_ALL=C"};
+  const SpawnSetup setup(files);
+  pid_t id = 0;
+  const int error = ::posix_spawn(&id, path.c_str(), setup.actions(), setup.attributes(), pointersTo(words).data(),
+                                  pointersTo(environment).data());
+  if (error != 0) return systemFailure("run", words.front(), error);
+  return RunningProgram(id);
+}
+
+RunningProgram::RunningProgram(int id) : _id(id), _handle(static_cast<int>(::syscall(SYS_pidfd_open, id, 0))) {}
+
+RunningProgram::RunningProgram(RunningProgram&& other) noexcept
+    : _id(other._id),
+      _handle(std::move(other._handle)),
+      _status(other._status),
+      _ended(std::exchange(other._ended, true)) {}
+
+RunningProgram& RunningProgram::operator=(RunningProgram&& other) noexcept {
+  std::swap(_id, other._id);
+  std::swap(_handle, other._handle);
+  std::swap(_status, other._status);
+  std::swap(_ended, other._ended);
+  return *this;
+}
+
+RunningProgram::~RunningProgram() {
+  if (hasEnded()) return;
+  ::kill(_id, SIGKILL);
+  ::waitpid(_id, nullptr, 0);
+}
+
+bool RunningProgram::hasEnded() {
+  _ended = _ended || ::waitpid(_id, &_status, WNOHANG) == _id;
+  return _ended;
+}
+
+bool RunningProgram::endsBefore(RunLoop::Clock::time_point deadline, RunLoop& runLoop) {
+  auto watching = runLoop.watch(_handle.number(), RunLoop::Readiness::readable, [] {});
+  return runLoop.runUntil(deadline, [this] { return hasEnded(); });
+}
+
+}  // namespace tavisk

@@ -1,0 +1,44 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include "platform/RunLoop.h"
+#include "platform/linux/Bus.h"
+#include "platform/linux/Daemons.h"
+
+namespace tavisk {
+
+class ServiceAccess;
+
+/// Daemons of a machine with the service manager: its units, and the links by which they start
+/// (org.freedesktop.systemd1, see org.freedesktop.systemd1(5)).
+class UnitDaemons : public Daemons {
+ public:
+  /// Both must outlive the object.
+  UnitDaemons(ServiceAccess& services, RunLoop& runLoop) : _services(services), _runLoop(runLoop) {}
+
+  Result<Presence> presence(const Daemon& daemon) override;
+  Result<bool> isRunning(const Daemon& daemon) override;
+  Result<bool> startsAtBoot(const Daemon& daemon) override;
+  Result<void> setStartsAtBoot(const Daemon& daemon, bool starts) override;
+  Result<void> start(const Daemon& daemon) override;
+  Result<void> stop(const Daemon& daemon) override;
+  Result<void> restartIfRunning(const Daemon& daemon) override;
+
+ private:
+  /// Calls the manager about a unit.
+  template <typename... Arguments>
+  Result<BusMessage> ask(const Daemon& daemon, const char* member, const char* replySignature,
+                         const Arguments&... arguments);
+  Result<BusMessage> unitProperty(const Daemon& daemon, const char* name, const char* signature);
+  /// Runs a job to its end.
+  Result<void> runJob(const Daemon& daemon, const char* method);
+  Failure whyNotRunning(const Daemon& daemon);
+
+  ServiceAccess& _services;
+  RunLoop& _runLoop;
+};
+
+}  // namespace tavisk

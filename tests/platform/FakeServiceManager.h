@@ -1,0 +1,64 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <atomic>
+#include <filesystem>
+#include <map>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <vector>
+
+struct sd_bus_message;
+struct sd_bus;
+
+namespace tavisk {
+
+/// A unit as the manager knows it, and what its next job comes to.
+struct FakeUnit {
+  std::string load = "loaded";
+  std::string active = "inactive";
+  std::string file = "disabled";
+  std::string jobResult = "done";  ///< empty: the job never ends
+  bool conditionHolds = true;      ///< else a job is done and the unit stays as it is
+};
+
+/// Serves the interface of the service manager on a socket, straight to each caller, from a thread of its own.
+class FakeServiceManager {
+ public:
+  explicit FakeServiceManager(const std::filesystem::path& socket);
+  FakeServiceManager(const FakeServiceManager&) = delete;
+  FakeServiceManager& operator=(const FakeServiceManager&) = delete;
+  ~FakeServiceManager();
+
+  void set(const std::string& unit, const FakeUnit& state);
+  FakeUnit get(const std::string& unit);
+  /// The methods that change something, in the order of their calls: "StartUnit chrony.service".
+  std::vector<std::string> calls();
+  /// The next call of this method is answered with an error, with a reply of another type, or by hanging up.
+  enum class Fault { error, wrongType, hangUp };
+  void breakNext(const std::string& method, Fault fault);
+
+ private:
+  static int receive(sd_bus_message* message, void* manager, void* error);
+  int answer(sd_bus_message* message, const std::string& member);
+  int answerFault(sd_bus_message* message, Fault fault);
+  int answerProperty(sd_bus_message* message);
+  int answerJob(sd_bus_message* message, const std::string& member);
+  int answerFiles(sd_bus_message* message, const std::string& member);
+  void serve();
+  void serveOne(int connection);
+
+  int _listener;
+  int _wake;
+  std::mutex _mutex;
+  std::map<std::string, FakeUnit> _units;
+  std::map<std::string, Fault> _faults;
+  std::vector<std::string> _calls;
+  std::atomic<bool> _hangUp = false;
+  unsigned _jobs = 0;
+  std::thread _thread;
+};
+
+}  // namespace tavisk
