@@ -32,12 +32,7 @@ bool RemoteServerSettings::authenticate() {
     if (_report) _report->runRefused("not an administrator", _context.output.takePrinted());
     return false;
   }
-  AdminAuthenticator& authenticator = _context.host.authenticator();
-  {
-    const std::lock_guard lock(_authorizationMutex);
-    _authenticator = &authenticator;
-  }
-  authenticator.authenticate();
+  takeAuthorization();
   _startUp = _context.runLoop.after(std::chrono::seconds(0), [this] { adminDidAuthenticateNotification(); });
   return true;
 }
@@ -49,6 +44,13 @@ void RemoteServerSettings::adminDidAuthenticateNotification() {
 
 bool RemoteServerSettings::isLumaronServer() {
   return _context.host.files().exists("/System/Library/CoreServices/ServerVersion.plist");
+}
+
+void RemoteServerSettings::takeAuthorization() {
+  const std::lock_guard lock(_authorizationMutex);
+  if (_ended) return;
+  _authenticator = &_context.host.authenticator();
+  _authenticator->authenticate();
 }
 
 void RemoteServerSettings::giveUpAuthorization() {

@@ -62,6 +62,7 @@ class RemoteServerSettings {
   void adminDidAuthenticateNotification();
   /// Whether this is the server edition. Kept; nothing asks it.
   bool isLumaronServer();
+  void takeAuthorization();
   /// Once, whichever thread comes first; the other one waits until it is done.
   void giveUpAuthorization();
 
@@ -96,7 +97,7 @@ class RemoteServerSettings {
   RunLoop::Registration _startUp;
   std::atomic<bool> _ended = false;
 
-  std::mutex _authorizationMutex;
+  std::mutex _authorizationMutex;                // held while it is taken and given up, so that none is left behind
   AdminAuthenticator* _authenticator = nullptr;  ///< set while there is an authorization to give up
 };
 

@@ -21,8 +21,8 @@ namespace {
 
 constexpr std::string_view descriptorPrefix = "fd:";
 
-Failure failure(const char* tried, const std::string& destination, int error) {
-  return {tried, "the report " + destination, std::generic_category().message(error)};
+Failure failure(const std::string& destination, const std::string& why) {
+  return {"write the report", destination, why};
 }
 
 /// Absent when the text is not "fd:" and a number.
@@ -36,7 +36,7 @@ std::optional<int> namedDescriptor(std::string_view destination) {
 Result<int> checkDescriptor(const std::string& destination) {
   const std::optional<int> descriptor = namedDescriptor(destination);
   const int flags = descriptor ? fcntl(*descriptor, F_GETFL) : -1;
-  if (flags < 0 || (flags & O_ACCMODE) == O_RDONLY) return failure("write to", destination, EBADF);
+  if (flags < 0 || (flags & O_ACCMODE) == O_RDONLY) return failure(destination, std::generic_category().message(EBADF));
   return *descriptor;
 }
 
@@ -44,11 +44,11 @@ Result<int> openFile(const std::string& path) {
   // O_NONBLOCK: opening a FIFO must not wait for its reader.
   const int descriptor = ::open(
       path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_NOFOLLOW | O_CLOEXEC | O_NOCTTY | O_NONBLOCK, S_IRUSR | S_IWUSR);
-  if (descriptor < 0) return failure("open", path, errno);
+  if (descriptor < 0) return failure(path, std::generic_category().message(errno));
   struct stat status {};
   if (fstat(descriptor, &status) == 0 && S_ISREG(status.st_mode)) return descriptor;
   close(descriptor);
-  return Failure{"open", "the report " + path, "not a regular file"};
+  return failure(path, "not a regular file");
 }
 
 /// The errno of the failure, or 0.
