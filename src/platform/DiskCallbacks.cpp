@@ -1,0 +1,36 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/DiskCallbacks.h"
+
+#include <algorithm>
+
+namespace tavisk {
+
+namespace {
+
+DiskEvent watchedPart(const DiskEvent& event, const std::vector<DiskKey>& watch) {
+  DiskEvent watched{event.kind, event.disk, {}};
+  std::copy_if(event.changed.begin(), event.changed.end(), std::back_inserter(watched.changed),
+               [&](DiskKey key) { return std::find(watch.begin(), watch.end(), key) != watch.end(); });
+  return watched;
+}
+
+}  // namespace
+
+void DiskCallbacks::remove(DiskCallback callback, const void* context) {
+  std::erase_if(_requests, [&](const DiskCallbackRequest& request) {
+    return request.callback == callback && request.context == context;
+  });
+}
+
+void DiskCallbacks::tell(const DiskEvent& event, const DiskDescription& disk) const {
+  const auto requests = _requests;  // a callback may take registrations back
+  for (const auto& request : requests) {
+    if (request.kind != event.kind || !request.match.accepts(disk)) continue;
+    const DiskEvent watched = watchedPart(event, request.watch);
+    if (event.kind != DiskEvent::Kind::descriptionChanged || !watched.changed.empty())
+      request.callback(watched, request.context);
+  }
+}
+
+}  // namespace tavisk

@@ -1,0 +1,78 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "platform/DiskDescription.h"
+
+namespace tavisk {
+
+enum class DiskTrait { internal, cd, dvd, optical };
+/// The connection protocols that have a meaning to the callers.
+enum class DiskProtocol { usb, diskImage };
+
+/// A status as the contract of these services has it: 0 is success.
+using ServiceStatus = int;
+
+/// Questions about one disk. From any thread; an unknown disk has no trait, no protocol and no scheme.
+class DiskQueries {
+ public:
+  virtual ~DiskQueries() = default;
+
+  struct OpticalBootability {
+    ServiceStatus status = 0;
+    bool bootable = false;  ///< means something only with status 0
+  };
+
+  virtual bool is(DiskTrait trait, const DiskName& disk) = 0;
+  /// The disk's connection protocol; empty when there is none.
+  virtual std::string protocolOf(const DiskName& disk) = 0;
+  /// The host's name for a protocol, as protocolOf answers it.
+  virtual std::string nameOf(DiskProtocol protocol) = 0;
+  /// The code of the partition map: 0 none known, 1 the map that Open Firmware starts from, 2 GPT; others are the
+  /// host's.
+  virtual int partitionScheme(const DiskName& disk) = 0;
+  /// Whether the optical disc can start this machine.
+  virtual OpticalBootability opticalBootability(const DiskName& disk) = 0;
+};
+
+/// What the machine starts from, and the firmware's variables. A write that fails has a non-zero status, and its
+/// reason is in the effects; so has a read. Nothing is written then.
+class BootSettings {
+ public:
+  virtual ~BootSettings() = default;
+
+  struct LegacyBootSupport {
+    ServiceStatus status = 0;
+    bool supported = false;
+  };
+  struct BootPreference {
+    ServiceStatus status = 0;
+    std::optional<DiskName> disk;
+  };
+  struct NetworkBootPreference {
+    ServiceStatus status = 0;
+    std::optional<std::string> value;
+    std::optional<std::string> server;
+    std::optional<std::string> interface;  ///< BSD name
+  };
+  struct BootChoice {
+    DiskName disk;
+    std::string systemFolder;  ///< absolute path
+    bool lumara9 = false;
+  };
+
+  /// 0: no pre-boot environment known; 1: Open Firmware; 2: a firmware that loads "boot.efi". From any thread.
+  virtual int preBootEnvironment() = 0;
+  virtual LegacyBootSupport legacyBootSupport() = 0;
+  virtual BootPreference bootPreference() = 0;
+  virtual NetworkBootPreference networkBootPreference() = 0;
+  virtual ServiceStatus setBootPreference(const BootChoice& choice) = 0;
+  virtual ServiceStatus setFirmwareVariable(const std::string& name, const std::string& value) = 0;
+};
+
+class DiskManagementService : public DiskQueries, public BootSettings {};
+
+}  // namespace tavisk
