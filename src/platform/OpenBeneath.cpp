@@ -10,12 +10,11 @@
 #include <cerrno>
 
 namespace tavisk {
+namespace {
 
-FileDescriptor openBeneath(const FileDescriptor& root, const std::string& path, int flags, unsigned mode) {
-  open_how how{};
-  how.flags = static_cast<unsigned>(flags | O_CLOEXEC);
-  how.mode = mode;
-  how.resolve = RESOLVE_IN_ROOT | RESOLVE_NO_MAGICLINKS;
+FileDescriptor openHow(const FileDescriptor& root, const std::string& path, open_how how) {
+  how.flags |= O_CLOEXEC;
+  how.resolve |= RESOLVE_IN_ROOT | RESOLVE_NO_MAGICLINKS;
   // The kernel answers EAGAIN when something was renamed or mounted while it resolved a "..".
   constexpr int enoughTries = 256;
   for (int tries = 0;; ++tries) {
@@ -23,6 +22,22 @@ FileDescriptor openBeneath(const FileDescriptor& root, const std::string& path, 
     bool again = number < 0 && (errno == EINTR || errno == EAGAIN);
     if (!again || tries == enoughTries) return FileDescriptor(number);
   }
+}
+
+}  // namespace
+
+FileDescriptor openBeneath(const FileDescriptor& root, const std::string& path, int flags, unsigned mode) {
+  open_how how{};
+  how.flags = static_cast<unsigned>(flags);
+  how.mode = mode;
+  return openHow(root, path, how);
+}
+
+bool existsWithoutLinks(const FileDescriptor& root, const std::string& path) {
+  open_how how{};
+  how.flags = O_PATH;
+  how.resolve = RESOLVE_NO_SYMLINKS;
+  return static_cast<bool>(openHow(root, path, how));
 }
 
 FileDescriptor openNamed(const FileDescriptor& folder, const std::string& name, int flags, unsigned mode) {

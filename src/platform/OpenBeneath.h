@@ -12,6 +12,9 @@ namespace tavisk {
 /// empty.
 FileDescriptor openBeneath(const FileDescriptor& root, const std::string& path, int flags, unsigned mode = 0);
 
+/// Whether the path exists beneath the root and has no symbolic link in it.
+bool existsWithoutLinks(const FileDescriptor& root, const std::string& path);
+
 /// As openat(2), of a single name, and closed on exec.
 FileDescriptor openNamed(const FileDescriptor& folder, const std::string& name, int flags, unsigned mode = 0);
 

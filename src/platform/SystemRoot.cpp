@@ -36,6 +36,17 @@ std::int64_t nanoseconds(const timespec& time) {
   return std::int64_t{time.tv_sec} * 1'000'000'000 + time.tv_nsec;
 }
 
+/// The path as names with "/" before them, where one look is enough for it: it exists, without a link in it.
+std::optional<std::string> plainPath(const FileDescriptor& prefix, const std::string& path) {
+  std::string plain;
+  for (const auto& name : split(path, "/")) {
+    if (name == "..") return std::nullopt;
+    if (name != ".") plain += "/" + name;
+  }
+  if (plain.empty()) plain.push_back('/');
+  return existsWithoutLinks(prefix, plain) ? std::optional(plain) : std::nullopt;
+}
+
 /// A path cut before its last name.
 struct Place {
   std::string folder;
@@ -86,9 +97,8 @@ bool SystemRoot::exists(const std::string& path) const {
 }
 
 std::optional<FileStamp> SystemRoot::stamp(const std::string& path) const {
-  auto file = open(path, O_PATH);
   struct stat status {};
-  if (!file || ::fstat(file->number(), &status) != 0) return std::nullopt;
+  if (::stat((_prefix + path).c_str(), &status) != 0) return std::nullopt;
   return FileStamp{status.st_dev, status.st_ino, status.st_size, nanoseconds(status.st_mtim),
                    nanoseconds(status.st_ctim)};
 }
@@ -123,6 +133,7 @@ Result<std::vector<std::string>> SystemRoot::list(const std::string& path) const
 Result<std::string> SystemRoot::standardized(const std::string& path) const {
   auto prefix = openPrefix(path);
   if (!prefix) return prefix.failure();
+  if (auto plain = plainPath(*prefix, path)) return std::move(*plain);
   return PathResolver(*prefix).resolve(path);
 }
 
