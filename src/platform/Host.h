@@ -5,18 +5,27 @@
 #include "platform/AdminAuthenticator.h"
 #include "platform/BootLoaderFile.h"
 #include "platform/ClockService.h"
+#include "platform/DiskEventSession.h"
+#include "platform/DiskManagementService.h"
 #include "platform/DynamicStore.h"
 #include "platform/FileSystem.h"
 #include "platform/HostConfigService.h"
+#include "platform/IORegistry.h"
+#include "platform/KernelValues.h"
+#include "platform/KeyboardInputService.h"
+#include "platform/NetworkInterfaces.h"
 #include "platform/NetworkTimeService.h"
 #include "platform/PowerController.h"
 #include "platform/PowerSettingsService.h"
 #include "platform/PreferencesStore.h"
+#include "platform/ProcessTermination.h"
 #include "platform/ProcessUtilities.h"
+#include "platform/ProgramRunner.h"
 #include "platform/RemoteEventsService.h"
 #include "platform/RemoteShellService.h"
 #include "platform/SystemLog.h"
 #include "platform/UserDatabase.h"
+#include "platform/UserDefaults.h"
 
 namespace tavisk {
 
@@ -40,6 +49,16 @@ class Host {
   virtual BootLoaderFile& bootLoaderFile() = 0;
   virtual PreferencesStore& preferences() = 0;
   virtual ProcessUtilities& processes() = 0;
+
+  virtual DiskEventSession& diskEvents() = 0;
+  virtual DiskManagementService& diskManagement() = 0;
+  virtual IORegistry& registry() = 0;
+  virtual NetworkInterfaces& networkInterfaces() = 0;
+  virtual KernelValues& kernel() = 0;
+  virtual KeyboardInputService& keyboardInput() = 0;
+  virtual UserDefaults& userDefaults() = 0;
+  virtual ProgramRunner& programs() = 0;
+  virtual ProcessTermination& processTermination() = 0;
 };
 
 }  // namespace tavisk

@@ -32,5 +32,9 @@ inline constexpr const char* keyboardLock = "Keyboard Lock";
 inline constexpr const char* keyboardLockPreference = "Keyboard Lock Preference";
 inline constexpr const char* preferencesWrite = "Preferences Write";
 inline constexpr const char* signalToProcess = "Signal To Process";
+inline constexpr const char* startupDisk = "Startup Disk";
+inline constexpr const char* networkStartupDisk = "Network Startup Disk";
+/// Before the name of a firmware variable: "Firmware Variable prev-lang:kbd".
+inline constexpr const char* firmwareVariable = "Firmware Variable ";
 
 }  // namespace tavisk::setting

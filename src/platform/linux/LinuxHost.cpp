@@ -21,7 +21,8 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _dynamicStore(effects),
       _bootLoaderFile(_machine),
       _preferences(effects),
-      _processes(effects) {
+      _processes(effects),
+      _startupDisk(_machine) {
   effects.addChannel(_journalLog);
 }
 

@@ -18,6 +18,7 @@
 #include "platform/linux/UnbuiltPower.h"
 #include "platform/linux/UnbuiltProcesses.h"
 #include "platform/linux/UnbuiltRemoteAccess.h"
+#include "platform/linux/UnbuiltStartupDisk.h"
 
 namespace tavisk {
 
@@ -45,6 +46,16 @@ class LinuxHost final : public Host {
   PreferencesStore& preferences() override { return _preferences; }
   ProcessUtilities& processes() override { return _processes; }
 
+  DiskEventSession& diskEvents() override { return _startupDisk; }
+  DiskManagementService& diskManagement() override { return _startupDisk; }
+  IORegistry& registry() override { return _startupDisk; }
+  NetworkInterfaces& networkInterfaces() override { return _startupDisk; }
+  KernelValues& kernel() override { return _startupDisk; }
+  KeyboardInputService& keyboardInput() override { return _startupDisk; }
+  UserDefaults& userDefaults() override { return _startupDisk; }
+  ProgramRunner& programs() override { return _startupDisk; }
+  ProcessTermination& processTermination() override { return _startupDisk; }
+
  private:
   SystemRoot _root;
   JournalLog _journalLog;
@@ -65,6 +76,7 @@ class LinuxHost final : public Host {
   LinuxBootLoaderFile _bootLoaderFile;
   UnbuiltPreferences _preferences;
   UnbuiltProcesses _processes;
+  UnbuiltStartupDisk _startupDisk;
 };
 
 }  // namespace tavisk

@@ -42,7 +42,15 @@ std::optional<std::string> MachineSection::optionalText(std::string_view key) co
 
 MachineSection MachineSection::section(std::string_view key) const {
   const auto* value = find(key);
-  return {_place + "/" + std::string(rowOf(_place, key).key), Values(_values, value ? value->asDictionary() : nullptr)};
+  auto place = (_place.empty() ? "" : _place + "/") + std::string(rowOf(_place, key).key);
+  return {std::move(place), Values(_values, value ? value->asDictionary() : nullptr)};
+}
+
+std::vector<std::string> MachineSection::keys() const {
+  std::vector<std::string> keys;
+  if (!_values) return keys;
+  for (const auto& [key, value] : *_values) keys.push_back(key);
+  return keys;
 }
 
 std::string_view MachineSection::defaultOf(std::string_view key) const {

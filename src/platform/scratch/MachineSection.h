@@ -7,6 +7,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "platform/PropertyList.h"
 
@@ -29,6 +30,8 @@ class MachineSection {
   /// The dictionary under a key, with nothing in it when the machine has none.
   MachineSection section(std::string_view key) const;
 
+  /// In the order of the file.
+  std::vector<std::string> keys() const;
   bool isAbsent() const { return !_values; }
   /// The value itself; null when the machine has none.
   const PropertyList* find(std::string_view key) const { return _values ? _values->find(key) : nullptr; }

@@ -33,6 +33,15 @@ ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFi
       _dynamicStore(_settings),
       _bootLoaderFile(_root, _settings),
       _preferences(_settings),
-      _processes(_settings, _preferences) {}
+      _processes(_settings, _preferences),
+      _disks(*_machine),
+      _diskEvents(*_machine, _disks, _files),
+      _diskManagement(*_machine, _settings, _disks),
+      _registry(*_machine),
+      _networkInterfaces(*_machine),
+      _kernel(*_machine),
+      _keyboardInput(*_machine),
+      _userDefaults(*_machine),
+      _programs(*_machine) {}
 
 }  // namespace tavisk

@@ -13,17 +13,27 @@
 #include "platform/scratch/ScratchAdminAuthenticator.h"
 #include "platform/scratch/ScratchBootLoaderFile.h"
 #include "platform/scratch/ScratchClockService.h"
+#include "platform/scratch/ScratchDiskEventSession.h"
+#include "platform/scratch/ScratchDiskManagement.h"
+#include "platform/scratch/ScratchDisks.h"
 #include "platform/scratch/ScratchDynamicStore.h"
 #include "platform/scratch/ScratchHostConfigService.h"
+#include "platform/scratch/ScratchIORegistry.h"
+#include "platform/scratch/ScratchKernelValues.h"
+#include "platform/scratch/ScratchKeyboardInputService.h"
+#include "platform/scratch/ScratchNetworkInterfaces.h"
 #include "platform/scratch/ScratchNetworkTimeService.h"
 #include "platform/scratch/ScratchPowerController.h"
 #include "platform/scratch/ScratchPowerSettingsService.h"
 #include "platform/scratch/ScratchPreferencesStore.h"
+#include "platform/scratch/ScratchProcessTermination.h"
 #include "platform/scratch/ScratchProcessUtilities.h"
+#include "platform/scratch/ScratchProgramRunner.h"
 #include "platform/scratch/ScratchRemoteEventsService.h"
 #include "platform/scratch/ScratchRemoteShellService.h"
 #include "platform/scratch/ScratchSystemLog.h"
 #include "platform/scratch/ScratchUserDatabase.h"
+#include "platform/scratch/ScratchUserDefaults.h"
 
 namespace tavisk {
 
@@ -51,6 +61,16 @@ class ScratchHost final : public Host {
   PreferencesStore& preferences() override { return _preferences; }
   ProcessUtilities& processes() override { return _processes; }
 
+  DiskEventSession& diskEvents() override { return _diskEvents; }
+  DiskManagementService& diskManagement() override { return _diskManagement; }
+  IORegistry& registry() override { return _registry; }
+  NetworkInterfaces& networkInterfaces() override { return _networkInterfaces; }
+  KernelValues& kernel() override { return _kernel; }
+  KeyboardInputService& keyboardInput() override { return _keyboardInput; }
+  UserDefaults& userDefaults() override { return _userDefaults; }
+  ProgramRunner& programs() override { return _programs; }
+  ProcessTermination& processTermination() override { return _processTermination; }
+
  private:
   ScratchHost(const std::string& directory, std::unique_ptr<MachineFile> machine, EffectSink& effects,
               RunLoop& runLoop);
@@ -74,6 +94,16 @@ class ScratchHost final : public Host {
   ScratchBootLoaderFile _bootLoaderFile;
   ScratchPreferencesStore _preferences;
   ScratchProcessUtilities _processes;
+  ScratchDisks _disks;
+  ScratchDiskEventSession _diskEvents;
+  ScratchDiskManagement _diskManagement;
+  ScratchIORegistry _registry;
+  ScratchNetworkInterfaces _networkInterfaces;
+  ScratchKernelValues _kernel;
+  ScratchKeyboardInputService _keyboardInput;
+  ScratchUserDefaults _userDefaults;
+  ScratchProgramRunner _programs;
+  ScratchProcessTermination _processTermination;
 };
 
 }  // namespace tavisk
