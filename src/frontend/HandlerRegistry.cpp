@@ -11,6 +11,7 @@ std::span<const HandlerRows> handlerFamilies() {
       helpHandlers(),         dateAndTimeHandlers(),    timeZoneHandlers(),         networkTimeHandlers(),
       sleepTimersHandlers(),  wakeAndRestartHandlers(), startupDelayHandlers(),     remoteLoginHandlers(),
       remoteEventsHandlers(), computerNameHandlers(),   bootArchitectureHandlers(), keyboardLockHandlers(),
+      startupDiskHandlers(),
   };
   return families;
 }

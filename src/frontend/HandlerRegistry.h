@@ -36,6 +36,7 @@ HandlerRows remoteEventsHandlers();
 HandlerRows computerNameHandlers();
 HandlerRows bootArchitectureHandlers();
 HandlerRows keyboardLockHandlers();
+HandlerRows startupDiskHandlers();
 
 /// All families.
 std::span<const HandlerRows> handlerFamilies();

@@ -6,6 +6,7 @@
 
 #include "frontend/RemotePrefsExtra.h"
 #include "settings/SpecialPMUSettings.h"
+#include "startupdisk/StartupDisk.h"
 
 namespace tavisk {
 

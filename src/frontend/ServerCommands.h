@@ -21,6 +21,8 @@ class RemoteServerSettings;
 class SpecialPMUSettings;
 struct SleepTimerSetter;
 struct SourceSwitch;
+class SDController;
+class StartupDisk;
 
 /// What a run works with; nothing is owned.
 struct CommandContext {
@@ -154,6 +156,10 @@ class ServerCommands {
   void getScheduledWakeTime();
   void setScheduledSleepTime(const std::string& date, const std::string& andTime);
   void getScheduledSleepTime();
+  /// Startup disk
+  void listStartupDisk();
+  void getStartupDisk();
+  void setStartupDisk(const std::string& disk);
 
  private:
   /// True when the value is empty: then the usage was printed and the error flag set.
@@ -179,6 +185,9 @@ class ServerCommands {
   void chooseDefaultKernelArchitecture();
   void tellWhetherSaved(bool saved);
 
+  /// The one controller of the run, made at the first call.
+  SDController& sharedController();
+
   CommandContext _context;
   std::shared_ptr<const CommandTable> _commandDict;  ///< kept for the handlers' use
   bool _interactive = false;                         ///< kept; no handler reads it
@@ -186,6 +195,7 @@ class ServerCommands {
   RemoteServerSettings* _parent = nullptr;
   std::optional<std::string> _timeZone;  ///< set by setTimeZone
   std::unique_ptr<SpecialPMUSettings> _specialPMU;
+  std::unique_ptr<StartupDisk> _startupDisk;
 };
 
 }  // namespace tavisk

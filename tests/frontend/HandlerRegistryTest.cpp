@@ -13,15 +13,13 @@ namespace tavisk {
 
 namespace {
 
-const std::set<std::string> notBuiltYet = {"getStartupDisk", "setStartupDisk:", "listStartupDisk"};
-
 CommandTable productTable() {
   return CommandTable::parse(CommandTable::text()).value();
 }
 
 TEST(HandlerRegistry, agreesWithTheCommandTable) {
   const CommandTable table = productTable();
-  std::multiset<std::string> expected(notBuiltYet.begin(), notBuiltYet.end());
+  std::multiset<std::string> expected;
   for (const HandlerRows& family : handlerFamilies()) {
     for (const HandlerRow& row : family) expected.emplace(row.selector);
   }

@@ -1,0 +1,128 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <mutex>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "platform/DiskEventSession.h"
+#include "platform/DiskManagementService.h"
+#include "platform/RunLoop.h"
+#include "startupdisk/FoundSystems.h"
+#include "startupdisk/SDEnvironment.h"
+#include "startupdisk/SDSystemSearcher.h"
+#include "startupdisk/SystemSearcherProtocol.h"
+
+namespace tavisk {
+
+/// Knows which systems on the machine's volumes can start it, and which one it starts from. It follows the volumes as
+/// they come, go and change, and announces what happens with the notifications of SDNotifications.h.
+/// Main thread only, except for currentBootDevice, which several threads may ask.
+class SDController : public SystemSearcherProtocol {
+ public:
+  /// Runs the run loop for 0.2 seconds (longer when the host's first report takes longer): afterwards the systems of
+  /// the volumes that were mounted already are known. The environment is not owned.
+  explicit SDController(SDEnvironment& environment);
+  ~SDController() override;
+  SDController(const SDController&) = delete;
+  SDController& operator=(const SDController&) = delete;
+
+  void startFindingEvents();
+  void killDACallbacks();
+
+  /// In the order in which they were found.
+  std::vector<SDDiskRef> systems() const { return _validSystems.all(); }
+  std::vector<SDRecordRef> wirestartSystems() const;
+  /// The systems, then the network images.
+  std::vector<SDRecordRef> allSystems() const;
+  /// The system-folder paths of `systems`, which a later run may give to searchSystemWithCache.
+  std::vector<std::string> foundSystemPathsForCache() const;
+  /// Searches the volumes of these folders; a path without a disk is passed over.
+  void searchSystemWithCache(const std::vector<std::string>& paths);
+  /// Pauses come in pairs with their ends.
+  void setSearchPaused(bool paused) { _systemSearcher->setSearchPaused(paused); }
+
+  void foundSystemOnVolume(SDDiskRef system) override;
+  void searchActivity() override;
+  void searchCompleted() override;
+
+  /// Boot device
+  /// What the machine starts from; null when that cannot be found. Once known it is not asked again.
+  SDRecordRef currentBootDevice();
+  /// Whether the current boot device is this system: any system on the same disk is. `bootDisk` only has to be there.
+  bool doesCurrentBootDeviceMatchSystemFolder(const SDRecord& system, const SDRecord* withCurrentBootDisk);
+  /// Makes the system the startup disk, and remembers it as the boot device. A network image is only remembered.
+  bool setDeviceForBoot(const SDRecordRef& system);
+  /// Lets the machine start as a disk for another one, once.
+  ServiceStatus setTargetDiskMode();
+
+  /// Network boot images
+  virtual bool supportsWirestart() const { return false; }
+  void addWirestartImage(const SDRecordRef& image);
+  void removeWirestartImageWithIdentifier(const std::optional<std::string>& identifier);
+  /// Arms the rescan timer where network images are supported.
+  void setupWirestartUpdating();
+  void scanWirestartImages();
+  bool selectedWSImageMatchesBootDevice(const SDRecord& image);
+  double wirestartScanInterval() const { return _wirestartScanInterval; }  ///< seconds
+
+ private:
+  static void diskAppeared(const DiskEvent& event, void* controller);
+  static void diskDisappeared(const DiskEvent& event, void* controller);
+  static void diskDescriptionChanged(const DiskEvent& event, void* controller);
+
+  /// Volume events
+  void _volumeAppeared(const DiskName& disk);
+  void _volumeDisappeared(const DiskName& disk);
+  bool _canSearch(const SDDisk& volume) const;
+  SDDiskRef _recordOf(const DiskName& disk) const;
+  void _dropSystem(const std::string& path);
+
+  /// Machine support
+  bool _canBootLegacyOS() const;
+  bool _canBootThisSystem(const SDDisk& volume) const;
+  bool _canBootOpticalDisc(const SDDisk& volume) const;
+  bool _isDiskImage(const SDDisk& volume) const;
+  bool _isExcludedSystem(const SDRecord& system) const;
+  bool _excludesLumara9() const;
+  bool _startedFromNetwork() const;
+
+  /// Boot device
+  SDRecordRef _knownBootDevice();
+  void _rememberBootDevice(SDRecordRef device);
+  void _askBootPreference();
+  SDDiskRef _takeBootPreference();
+  void _announceBootSystem(const SDRecord& bootDisk);
+  void _askNetworkBootPreference();
+  SDRecordRef _selectedImageOn(const std::string& interface) const;
+  bool _writeBootChoice(const SDDisk& system);
+  void _logBootChoice(const SDDisk& system) const;
+  std::string _languageAndKeyboard() const;
+
+  /// Network boot images
+  SDRecordRef _removeImage(const std::string& identifier);
+  double _allowedInterval(double wanted) const;
+
+  void _post(const char* notification, std::any object = {}) const;
+
+  SDEnvironment& _environment;
+  DiskManagementService& _dmm;
+  DiskEventSession& _daSession;
+  FoundSystems _validSystems;
+  std::vector<std::pair<std::string, SDRecordRef>> _wirestartSystems;  ///< by their "id"
+  SDRecordRef _curBootDevice;                                          ///< guarded by _bootLock
+  std::unique_ptr<SDSystemSearcher> _systemSearcher;
+  std::mutex _bootSearchLock;  ///< held while the host is asked for the boot preference; only tried, never waited for
+  std::mutex _bootLock;        ///< taken after _bootSearchLock; never held across a call to the host
+  bool _eventsSetup = false;
+  [[maybe_unused]] bool _hasChanged = false;            ///< kept by the contract
+  [[maybe_unused]] bool _curDeviceIsWirestart = false;  ///< kept by the contract
+  RunLoop::Registration _wirestartScanTimer;
+  double _wirestartScanInterval = 180.0;  ///< seconds
+  std::int64_t _preBootEnvironmentFlag;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,27 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+
+#include "startupdisk/SDController.h"
+#include "startupdisk/SDEnvironment.h"
+
+namespace tavisk {
+
+/// The startup-disk code's state of one run.
+class StartupDisk {
+ public:
+  /// Nothing that is given is owned.
+  StartupDisk(Host& host, RunLoop& runLoop, NotificationCenter& notifications)
+      : _environment(host, runLoop, notifications) {}
+
+  /// The one controller, made at the first call.
+  SDController& sharedController();
+
+ private:
+  SDEnvironment _environment;
+  std::unique_ptr<SDController> _controller;
+};
+
+}  // namespace tavisk
