@@ -205,8 +205,8 @@ TEST_F(RunLoopTest, remembersAStopWhileAnotherRunIsMade) {
 
 TEST_F(RunLoopTest, runsUntilAConditionHolds) {
   bool holds = false;
-  const auto timer = loop.after(milliseconds(5), [&] { holds = true; });
   EXPECT_FALSE(loop.runUntil(RunLoop::Clock::now() + milliseconds(1), [&] { return holds; }));
+  const auto timer = loop.after(milliseconds(5), [&] { holds = true; });
   const auto begin = RunLoop::Clock::now();
   EXPECT_TRUE(loop.runUntil(begin + seconds(10), [&] { return holds; }));
   EXPECT_LT(RunLoop::Clock::now() - begin, seconds(5));

@@ -41,6 +41,9 @@ RULES = [
 
 def files_of(tree):
     for folder, folders, names in os.walk(tree):
+        if "CMakeCache.txt" in names:
+            folders.clear()
+            continue
         folders[:] = sorted(set(folders) - {".git", ".cache", "build", "dist", "__pycache__"})
         for name in sorted(names):
             yield os.path.relpath(os.path.join(folder, name), tree)
