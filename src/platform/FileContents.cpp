@@ -13,7 +13,7 @@ namespace tavisk {
 
 Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const std::string& path) {
   std::string contents;
-  std::array<char, 65536> buffer;
+  std::array<char, 65536> buffer{};
   while (true) {
     auto count = ::read(file.number(), buffer.data(), buffer.size());
     if (count == 0) return contents;

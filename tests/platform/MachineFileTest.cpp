@@ -111,6 +111,8 @@ TEST_F(MachineFileTest, refusesWhatIsNoMachine) {
   std::filesystem::remove(machine.directory() + "/machine.plist");
   std::filesystem::create_symlink("../elsewhere", machine.directory() + "/machine.plist");
   EXPECT_THAT(whyNotOpened(), HasSubstr("/machine.plist: No such file or directory"));
+  EXPECT_EQ(MachineFile::open(machine.directory() + "//", machine.effects).failure().on,
+            machine.directory() + "/machine.plist");
   EXPECT_EQ(MachineFile::open("/no/such", machine.effects).failure(),
             (Failure{"rehearse", "/no/such", "No such file or directory"}));
   EXPECT_EQ(MachineFile::open("/etc/passwd", machine.effects).failure().why, "Not a directory");

@@ -16,7 +16,7 @@ namespace tavisk {
 namespace {
 
 void drain(const FileDescriptor& events) {
-  std::array<char, 4096> unused;
+  std::array<char, 4096> unused{};
   while (::read(events.number(), unused.data(), unused.size()) > 0) continue;
 }
 

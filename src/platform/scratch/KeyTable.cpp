@@ -13,15 +13,15 @@ constexpr std::nullopt_t absent = std::nullopt;
 constexpr KeyRow rows[] = {
     {"", "Refusals", dictionary, absent, "what this machine refuses"},
     {"Refusals", "*", string, absent,
-     "by the name of a setting as the effects call it: a set of it changes nothing and is recorded as failed for this "
-     "reason; with \" (read)\" after the name its reads fail and are recorded. \"*\" is every set, \"* (read)\" every "
-     "read."},
+     "why the setting of that name, as the effects call it, is not set: nothing changes, a failure is recorded. With "
+     R"-(" (read)" after the name: why its reads fail. "*" is every setting but the authorization, "* (read)" every )-"
+     "read"},
 
     {"", "User", dictionary, absent, "who runs the tool"},
     {"User", "ID", integer, "0", "real user id"},
     {"User", "Groups", integers, "", "supplementary group ids; more than 16 answer as getgroups(2) with room for 16"},
 
-    {"", "Group Database", dictionary, absent, "without it \"admin\" is 80"},
+    {"", "Group Database", dictionary, absent, R"(without it "admin" is 80)"},
     {"Group Database", "*", integer, absent, "id of the group of that name"},
 
     {"", "Authorization", dictionary, absent, "administrator authorization"},
@@ -31,7 +31,7 @@ constexpr KeyRow rows[] = {
     {"", "Clock", dictionary, absent, "date, time and time zone"},
     {"Clock", "Time", integer, absent,
      "seconds since 1970 UTC, negative before; when present the clock stands still there and setting it replaces it"},
-    {"Clock", "Offset", integer, "0", "seconds added to the real clock while there is no \"Time\"; setting stores it"},
+    {"Clock", "Offset", integer, "0", R"(seconds added to the real clock while there is no "Time"; setting stores it)"},
     {"Clock", "Time Zone", string, "UTC", "name of the zone; its rules are those of the running machine, or UTC"},
     {"Clock", "Time Zone File", string, absent, "the zone file last set"},
     {"Clock", "Known Time Zones", strings, absent, "absent: the zones installed where the tool runs"},
@@ -42,7 +42,7 @@ constexpr KeyRow rows[] = {
     {"Network Time", "Server", string, "", "its server"},
     {"Network Time", "Restarts", integer, "0", "how often it was told to read its server again"},
 
-    {"", "Power Sources", dictionary, absent, "by name, such as \"AC Power\""},
+    {"", "Power Sources", dictionary, absent, R"(by name, such as "AC Power")"},
     {"Power Sources", "*", dictionary, absent, "settings while this source feeds the machine"},
     {"Power Sources/*", "System Sleep", integer, "0", "minutes; 0 is never"},
     {"Power Sources/*", "Display Sleep", integer, "0", "minutes; 0 is never"},
@@ -87,7 +87,7 @@ constexpr KeyRow rows[] = {
 
     {"", "User Defaults", dictionary, absent, "defaults of the user who runs the tool"},
     {"User Defaults", "StartupDiskDebug", boolean, "false", "log the search for startup disks"},
-    {"User Defaults", "VelmarLanguages", strings, absent, "preferred languages; absent or empty: \"en\""},
+    {"User Defaults", "VelmarLanguages", strings, absent, R"(preferred languages; absent or empty: "en")"},
     {"User Defaults", "SDWirestartScanInterval", number, absent, "seconds between two searches"},
 
     {"", "Registry", dictionary, absent, "the device registry"},
@@ -98,7 +98,7 @@ constexpr KeyRow rows[] = {
     {"Registry/Services/*", "Open Status", integer, "0", "answer to opening it"},
     {"Registry/Services/*", "Set Status", integer, "0", "answer to setting its property"},
     {"Registry/Services/*", "Close Status", integer, "0", "answer to closing it"},
-    {"Registry", "Device Tree", dictionary, absent, "by path; the root is \"/\", without it there is no entry"},
+    {"Registry", "Device Tree", dictionary, absent, R"(by path; the root is "/", without it there is no entry)"},
     {"Registry/Device Tree", "*", dictionary, absent, "the properties of the entry"},
     {"Registry/Device Tree/*", "*", data, absent, "the property of that name"},
     {"Registry", "Interfaces", dictionary, absent, "network interfaces"},
@@ -125,7 +125,7 @@ constexpr KeyRow rows[] = {
     {"Firmware", "Variables", dictionary, absent, "also what the program /usr/sbin/nvram prints"},
     {"Firmware/Variables", "*", string, absent, "the variable of that name"},
     {"Firmware", "Boot Preference", dictionary, absent,
-     "absent, or of a disk that is not in \"Disks\": the query answers 1"},
+     R"(absent, or of a disk that is not in "Disks": the query answers 1)"},
     {"Firmware/Boot Preference", "Disk", string, absent, "name of the disk"},
     {"Firmware/Boot Preference", "Folder", string, absent, "path of the system folder"},
     {"Firmware/Boot Preference", "Lumara 9", boolean, "false", "whether it is such a system"},
@@ -136,11 +136,11 @@ constexpr KeyRow rows[] = {
     {"Firmware", "Set Boot Preference Status", integer, "0", "not 0: nothing is written and this is the answer"},
     {"Firmware", "Set Variable Status", integer, "0", "not 0: nothing is written and this is the answer"},
 
-    {"", "Disks", dictionary, absent, "by name, such as \"disk0s2\"; reported in this order"},
+    {"", "Disks", dictionary, absent, R"(by name, such as "disk0s2"; reported in this order)"},
     {"Disks", "*", dictionary, absent, "a disk or volume"},
-    {"Disks/*", "Volume Name", string, absent, "of the one mounted at \"/\": the name under which \"/\" is displayed"},
+    {"Disks/*", "Volume Name", string, absent, R"(of the one mounted at "/": the name under which "/" is displayed)"},
     {"Disks/*", "Mount Point", string, absent, "absent: not mounted"},
-    {"Disks/*", "Kind", string, absent, "file-system type, such as \"msdos\", \"ntfs\", \"cd9660\", \"udf\""},
+    {"Disks/*", "Kind", string, absent, R"(file-system type, such as "msdos", "ntfs", "cd9660", "udf")"},
     {"Disks/*", "Device Path", string, absent, "path in the device tree"},
     {"Disks/*", "Content", string, absent, "content of the partition"},
     {"Disks/*", "UUID", string, absent, "identity of the volume"},
@@ -155,10 +155,10 @@ constexpr KeyRow rows[] = {
     {"Disks/*", "Optical", boolean, "false", ""},
     {"Disks/*", "Optical Bootable", boolean, "false", "result of the bootability check"},
     {"Disks/*", "Optical Status", integer, "0", "answer to the bootability check"},
-    {"Disks/*", "Protocol", string, "ATA", "\"USB\" and \"Disk Image\" are the values of those two"},
+    {"Disks/*", "Protocol", string, "ATA", R"("USB" and "Disk Image" are the values of those two)"},
     {"Disks/*", "Scheme", integer, "2", "partition-map scheme code of its disk"},
     {"Disks/*", "Whole Disk", string, absent,
-     "needs no entry of its own; absent: the name without a final \"s\" and digits, else the name itself"},
+     R"(needs no entry of its own; absent: the name without a final "s" and digits, else the name itself)"},
 };
 
 using PlaceRows = std::unordered_map<std::string_view, const KeyRow*>;

@@ -13,8 +13,8 @@ using Type = PropertyList::Type;
 
 /// What a key of a type holds: a value of that type, or an array of such.
 struct Shape {
-  const char* words;
-  Type type;
+  const char* words = "a dictionary";
+  Type type = Type::dictionary;
   bool array = false;
 };
 
@@ -40,7 +40,11 @@ Shape shapeOf(KeyType type) {
     case KeyType::anything:
       break;
   }
-  return {"a dictionary", Type::dictionary};
+  return {};
+}
+
+std::string quoted(const std::string& key) {
+  return "\"" + key + "\"";
 }
 
 bool isArrayOf(const PropertyList& value, Type type) {
@@ -76,8 +80,8 @@ std::optional<std::string> whyWrongAt(std::string_view place, const PropertyList
   for (const auto& [key, value] : values) {
     const auto* row = findKey(place, key);
     if (!row) continue;
-    if (!fits(value, row->type)) return "\"" + key + "\": expected " + shapeOf(row->type).words;
-    if (auto wrong = whyWrongInside(*row, value)) return "\"" + key + "\" " + *wrong;
+    if (!fits(value, row->type)) return quoted(key) + ": expected " + shapeOf(row->type).words;
+    if (auto wrong = whyWrongInside(*row, value)) return quoted(key) + " " + *wrong;
   }
   return std::nullopt;
 }

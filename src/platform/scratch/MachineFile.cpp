@@ -44,7 +44,10 @@ Result<std::unique_ptr<MachineFile>> MachineFile::open(const std::string& direct
 }
 
 MachineFile::MachineFile(const std::string& directory, EffectSink& effects)
-    : _directory(directory), _path(directory + fileName), _folder(directory), _effects(effects) {}
+    : _directory(directory.substr(0, directory.find_last_not_of('/') + 1)),
+      _path(_directory + fileName),
+      _folder(directory),
+      _effects(effects) {}
 
 MachineFile::Contents MachineFile::contents() {
   auto stamp = _folder.stamp(fileName);
@@ -52,15 +55,17 @@ MachineFile::Contents MachineFile::contents() {
     std::lock_guard held(_mutex);
     if (stamp == _stamp) return _contents;
   }
+  // What counts is when reading begins.
+  auto telling = tellsVersions(stamp) ? stamp : FileStamp{};
   auto machine = read();
-  if (auto failure = keep(stamp, machine)) recordFailure(*failure, "the contents last read stand");
+  if (auto failure = keep(telling, machine)) recordFailure(*failure, "the contents last read stand");
   std::lock_guard held(_mutex);
   return _contents;
 }
 
 std::optional<Failure> MachineFile::keep(const std::optional<FileStamp>& stamp, Result<Dictionary>& machine) {
   std::lock_guard held(_mutex);
-  _stamp = tellsVersions(stamp) ? stamp : FileStamp{};
+  _stamp = stamp;
   if (machine) {
     _contents = std::make_shared<const Dictionary>(std::move(machine).value());
     _failure.reset();

@@ -52,7 +52,7 @@ MachineSetting timeSetting() {
 
 std::string joined(const std::vector<std::string>& names) {
   std::string lines;
-  for (const auto& name : names) lines += name + "\n";
+  for (const auto& name : names) lines += (lines.empty() ? "" : "\n") + name;
   return lines;
 }
 
