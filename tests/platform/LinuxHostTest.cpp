@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "LinuxTree.h"
 #include "contract/AdminAuthenticatorContract.h"
+#include "contract/BootLoaderFileContract.h"
 #include "contract/ClockContract.h"
 #include "contract/FileSystemContract.h"
 #include "contract/NetworkTimeContract.h"
@@ -46,6 +47,14 @@ struct LinuxFiles {
   LinuxTree tree;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, FileSystemContract, LinuxFiles);
+
+struct LinuxBootLoader {
+  BootLoaderFile& service() { return tree.host().bootLoaderFile(); }
+  void put(const std::string& path, const char* contents) { tree.write(path, contents); }
+  std::string file(const std::string& path) { return tree.file(path); }
+  LinuxTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, BootLoaderFileContract, LinuxBootLoader);
 
 }  // namespace
 }  // namespace tavisk

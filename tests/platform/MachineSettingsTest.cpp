@@ -18,6 +18,8 @@ struct Operation {
   void (*carryOut)(Host& host);
 };
 
+const PowerSource source{"AC Power"};
+
 constexpr Operation sets[] = {
     {setting::time, [](Host& host) { host.clock().setTime(1); }},
     {setting::timeZone, [](Host& host) { host.clock().setTimeZone("/usr/share/zoneinfo/Asia/Tokyo"); }},
@@ -26,6 +28,17 @@ constexpr Operation sets[] = {
     {setting::networkTimeAtStartup, [](Host& host) { host.networkTime().setLaunchAtStartup(true); }},
     {setting::networkTimeServer, [](Host& host) { host.networkTime().setServer({"time.example"}); }},
     {setting::networkTimeRestart, [](Host& host) { host.networkTime().restartAsynchronously(); }},
+    {setting::computerSleep, [](Host& host) { host.powerSettings().setUntilSleep(SleepTimer::system, source, {1}); }},
+    {setting::displaySleep, [](Host& host) { host.powerSettings().setUntilSleep(SleepTimer::display, source, {1}); }},
+    {setting::hardDiskSleep, [](Host& host) { host.powerSettings().setUntilSleep(SleepTimer::disk, source, {1}); }},
+    {setting::wakeOnModem, [](Host& host) { host.powerSettings().setOn(PowerSwitch::wakeOnRing, source, true); }},
+    {setting::restartAfterFreeze, [](Host& host) { host.powerSettings().setRestartsOnHang(false); }},
+    {setting::remoteLogin, [](Host& host) { host.remoteShell().setEnabled(false); }},
+    {setting::remoteEvents, [](Host& host) { host.remoteEvents().setEnabled(false); }},
+    {setting::computerName, [](Host& host) { host.hostConfiguration().setComputerName("new"); }},
+    {setting::localSubnetName, [](Host& host) { host.hostConfiguration().setLocalNetworkName("new"); }},
+    {setting::keyboardLock, [](Host& host) { host.processes().setLockEnclosureState(true); }},
+    {setting::keyboardLockPreference, [](Host& host) { host.processes().setMachineBoolean("key", false); }},
 };
 
 constexpr Operation reads[] = {
@@ -35,6 +48,15 @@ constexpr Operation reads[] = {
     {setting::knownTimeZones, [](Host& host) { EXPECT_TRUE(host.clock().knownTimeZones().empty()); }},
     {setting::networkTime, [](Host& host) { EXPECT_FALSE(host.networkTime().isRunning()); }},
     {setting::networkTimeServer, [](Host& host) { EXPECT_EQ(host.networkTime().server().address, ""); }},
+    {setting::computerSleep,
+     [](Host& host) { EXPECT_EQ(host.powerSettings().untilSleep(SleepTimer::system, source).count, 0U); }},
+    {setting::wakeOnModem,
+     [](Host& host) { EXPECT_FALSE(host.powerSettings().isOn(PowerSwitch::wakeOnRing, source)); }},
+    {setting::restartAfterFreeze, [](Host& host) { EXPECT_FALSE(host.powerSettings().restartsOnHang()); }},
+    {setting::remoteLogin, [](Host& host) { EXPECT_FALSE(host.remoteShell().isEnabled()); }},
+    {setting::remoteEvents, [](Host& host) { EXPECT_FALSE(host.remoteEvents().isEnabled()); }},
+    {setting::computerName, [](Host& host) { EXPECT_FALSE(host.dynamicStore().open("test")->computerName()); }},
+    {setting::keyboardLockPreference, [](Host& host) { EXPECT_FALSE(host.preferences().value("key")); }},
 };
 
 /// A machine whose every value differs from what its key reads as when absent.
@@ -46,6 +68,18 @@ class RefusalsTest : public testing::Test {
     machine.set("Clock", "Time Zone", "Europe/Paris");
     machine.set("Network Time", "Running", true);
     machine.set("Network Time", "Server", "old.example");
+    machine.set("Power Sources", "AC Power", acPower());
+    machine.set("Power", "Restart On Hang", true);
+    machine.set("Remote Shell", "Enabled", true);
+    machine.set("Remote Events", "Enabled", true);
+    machine.set("Dynamic Store", "Computer Name", "old");
+    machine.set("Preferences", "key", true);
+  }
+  static PropertyList::Dictionary acPower() {
+    PropertyList::Dictionary settings;
+    settings.set("System Sleep", 5);
+    settings.set("Wake On Ring", true);
+    return settings;
   }
   void expectRefused(const Operation& operation, const char* reason) {
     auto before = machine.description();

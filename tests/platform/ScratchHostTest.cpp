@@ -2,9 +2,13 @@
 // SPDX-License-Identifier: MIT
 #include "ScratchMachine.h"
 #include "contract/AdminAuthenticatorContract.h"
+#include "contract/BootLoaderFileContract.h"
 #include "contract/ClockContract.h"
 #include "contract/FileSystemContract.h"
+#include "contract/HostNamesContract.h"
 #include "contract/NetworkTimeContract.h"
+#include "contract/PowerSettingsContract.h"
+#include "contract/RemoteAccessContract.h"
 #include "contract/UserDatabaseContract.h"
 
 namespace tavisk {
@@ -65,6 +69,48 @@ struct ScratchFiles {
   ScratchMachine machine;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, FileSystemContract, ScratchFiles);
+
+struct ScratchRemoteShell {
+  RemoteShellService& service() { return machine.host().remoteShell(); }
+  ScratchMachine machine;
+};
+struct ScratchRemoteEvents {
+  RemoteEventsService& service() { return machine.host().remoteEvents(); }
+  ScratchMachine machine;
+};
+using ScratchRemoteAccess = testing::Types<ScratchRemoteShell, ScratchRemoteEvents>;
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, RemoteAccessContract, ScratchRemoteAccess);
+
+struct ScratchNames {
+  HostConfigService& configuration() { return machine.host().hostConfiguration(); }
+  DynamicStore& store() { return machine.host().dynamicStore(); }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, HostNamesContract, ScratchNames);
+
+struct ScratchPower {
+  static constexpr const char* keys[] = {"Wake On Ring", "Wake On LAN", "Auto Restart", "Power Button Sleep"};
+  ScratchPower() {
+    for (const char* key : keys) source.set(key, false);
+    machine.set("Power Sources", "AC Power", source);
+  }
+  PowerSettingsService& service() { return machine.host().powerSettings(); }
+  void lack(PowerSwitch which) {
+    source.remove(keys[static_cast<int>(which)]);
+    machine.set("Power Sources", "AC Power", source);
+  }
+  ScratchMachine machine;
+  PropertyList::Dictionary source;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PowerSettingsContract, ScratchPower);
+
+struct ScratchBootLoader {
+  BootLoaderFile& service() { return machine.host().bootLoaderFile(); }
+  void put(const std::string& path, const char* contents) { machine.writeFile(path, contents); }
+  std::string file(const std::string& path) { return machine.file(path); }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, BootLoaderFileContract, ScratchBootLoader);
 
 TEST(ScratchHost, hasEveryDefaultWithoutAMachineFile) {
   ScratchMachine machine;
