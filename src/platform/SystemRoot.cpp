@@ -98,7 +98,11 @@ bool SystemRoot::exists(const std::string& path) const {
 
 std::optional<FileStamp> SystemRoot::stamp(const std::string& path) const {
   struct stat status {};
-  if (::stat((_prefix + path).c_str(), &status) != 0) return std::nullopt;
+  if (::lstat((_prefix + path).c_str(), &status) != 0) return std::nullopt;
+  if (S_ISLNK(status.st_mode)) {
+    auto target = open(path, O_PATH);
+    if (!target || ::fstat(target->number(), &status) != 0) return std::nullopt;
+  }
   return FileStamp{status.st_dev, status.st_ino, status.st_size, nanoseconds(status.st_mtim),
                    nanoseconds(status.st_ctim)};
 }

@@ -37,8 +37,8 @@ class SystemRoot {
   /// `flags` and `mode` are those of open(2); the descriptor is closed on exec.
   Result<FileDescriptor> open(const std::string& path, int flags, unsigned mode = 0) const;
   bool exists(const std::string& path) const;
-  /// Absent when there is no such file or it cannot be looked at. Links are followed out of the prefix too: this only
-  /// tells whether to read again, and is asked often.
+  /// Absent when there is no such file or it cannot be looked at. Links among the folders of the path are followed out
+  /// of the prefix too: this only tells whether to read again, and is asked often.
   std::optional<FileStamp> stamp(const std::string& path) const;
   /// A regular file of at most `limit` bytes. Nothing else is opened: no FIFO, no device, no socket.
   Result<std::string> read(const std::string& path, std::size_t limit) const;

@@ -151,6 +151,17 @@ TEST_F(MachineFileTest, isReadAgainOnlyWhenItChanged) {
   }
 }
 
+TEST_F(MachineFileTest, mayBeALinkInsideItsFolder) {
+  machine.set("Clock", "Offset", 1);
+  std::filesystem::rename(machine.directory() + "/machine.plist", machine.directory() + "/real");
+  std::filesystem::create_symlink("/real", machine.directory() + "/machine.plist");
+  auto file = open();
+  EXPECT_EQ(file->section("Clock").integer("Offset"), 1);
+  EXPECT_TRUE(file->change([](auto& values) { values.dictionary("Clock").set("Offset", 2); }));
+  EXPECT_EQ(file->section("Clock").integer("Offset"), 2);
+  EXPECT_THAT(names(), ElementsAre("machine.lock", "machine.plist", "real"));
+}
+
 TEST_F(MachineFileTest, standsAtTheLastGoodContentsAndSaysSoOnce) {
   machine.set("Clock", "Offset", 1);
   auto& host = machine.host();
