@@ -55,6 +55,7 @@ class SpawnSetup {
 
 std::vector<char*> pointersTo(std::vector<std::string>& words) {
   std::vector<char*> pointers;
+  pointers.reserve(words.size() + 1);
   for (auto& word : words) pointers.push_back(word.data());
   pointers.push_back(nullptr);
   return pointers;

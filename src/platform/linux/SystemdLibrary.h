@@ -40,7 +40,7 @@ namespace tavisk {
 
 /// The functions of libsystemd, by their own names.
 struct SystemdLibrary {
-#define TAVISK_DECLARE_FUNCTION(name) decltype(&::name) name = nullptr
+#define TAVISK_DECLARE_FUNCTION(name) decltype(&::name) name = nullptr  // NOLINT(bugprone-macro-parentheses)
   TAVISK_SYSTEMD_FUNCTIONS(TAVISK_DECLARE_FUNCTION);
 #undef TAVISK_DECLARE_FUNCTION
 };

@@ -47,7 +47,7 @@ std::string firstServer(const SystemRoot& root, const std::string& file) {
 std::string firstServerInFolder(const SystemRoot& root, const std::string& folder, std::string_view ending) {
   for (const auto& name : root.list(folder).valueOr({})) {
     if (!name.ends_with(ending)) continue;
-    if (auto server = firstServer(root, folder + "/" + name); !server.empty()) return server;
+    if (auto server = firstServer(root, (folder + "/").append(name)); !server.empty()) return server;
   }
   return {};
 }

@@ -35,7 +35,8 @@ std::string unmetCondition(BusMessage& conditions) {
     bool triggers = conditions.readBoolean();
     bool negated = conditions.readBoolean();
     auto parameter = conditions.readText();
-    if (conditions.readInt32() < 0) unmet = name + "=" + (triggers ? "|" : "") + (negated ? "!" : "") + parameter;
+    if (conditions.readInt32() < 0)
+      unmet = std::move(name).append("=").append(triggers ? "|" : "").append(negated ? "!" : "").append(parameter);
     conditions.exit();
   }
   return unmet;
