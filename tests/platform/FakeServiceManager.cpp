@@ -128,8 +128,11 @@ int FakeServiceManager::answerFault(sd_bus_message* message, Fault fault) {
       return sd_bus_reply_method_return(message, "t", std::uint64_t{7});
     case Fault::hangUp:
       _hangUp = true;
+      return 1;
+    case Fault::silence:
+      return 1;
   }
-  return 1;
+  return 0;
 }
 
 int FakeServiceManager::answer(sd_bus_message* message, const std::string& member) {

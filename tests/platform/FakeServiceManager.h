@@ -36,8 +36,8 @@ class FakeServiceManager {
   FakeUnit get(const std::string& unit);
   /// The methods that change something, in the order of their calls: "StartUnit chrony.service".
   std::vector<std::string> calls();
-  /// The next call of this method is answered with an error, with a reply of another type, or by hanging up.
-  enum class Fault { error, wrongType, hangUp };
+  /// The next call of this method is answered with an error, with a reply of another type, by hanging up, or never.
+  enum class Fault { error, wrongType, hangUp, silence };
   void breakNext(const std::string& method, Fault fault);
 
  private:

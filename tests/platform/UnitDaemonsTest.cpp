@@ -85,6 +85,15 @@ TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
   }
 }
 
+TEST(UnitDaemons, WaitOnceForAManagerThatIsSilent) {
+  ManagedTree tree;
+  const auto began = RunLoop::Clock::now();
+  tree.manager.breakNext("LoadUnit", Fault::silence);
+  tree.host().networkTime().start();
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("answer")));
+  EXPECT_LT(RunLoop::Clock::now() - began, Bus::usualTime + std::chrono::milliseconds(500));
+}
+
 TEST(UnitDaemons, DoNotLookElsewhereWhenTheManagerCannotBeReached) {
   LinuxTree tree;
   tree.write("/run/systemd/system/x", "");

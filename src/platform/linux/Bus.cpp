@@ -99,8 +99,14 @@ const char* Bus::destination(const BusObject& object) const {
   return _kind == Kind::messageBus ? object.service : nullptr;
 }
 
+bool Bus::wasSilent(const BusObject& object) const {
+  auto since = _silentSince.find(object.service);
+  return since != _silentSince.end() && std::chrono::steady_clock::now() - since->second < timeWithoutRetry;
+}
+
 Result<BusMessage> Bus::call(const BusObject& object, const char* member, const char* replySignature,
                              const Writer& arguments, std::chrono::seconds longest) {
+  if (wasSilent(object)) return Failure{member, object.path, "this service has just left a call without an answer"};
   sd_bus_message* handle = nullptr;
   int result = _library.sd_bus_message_new_method_call(_bus, &handle, destination(object), object.path.c_str(),
                                                        object.interface, member);
@@ -114,6 +120,7 @@ Result<BusMessage> Bus::call(const BusObject& object, const char* member, const 
   sd_bus_message* answer = nullptr;
   auto time = microseconds(_interactive ? timeForQuestions : longest);
   result = _library.sd_bus_call(_bus, handle, time, error.handle(), &answer);
+  if (result == -ETIMEDOUT) _silentSince[object.service] = std::chrono::steady_clock::now();
   if (result < 0) return error.failure(member, object, result);
   BusMessage reply(_library, answer);
   if (_library.sd_bus_message_has_signature(answer, replySignature) <= 0)

@@ -4,6 +4,7 @@
 
 #include <chrono>
 #include <functional>
+#include <map>
 #include <memory>
 #include <string>
 #include <string_view>
@@ -35,6 +36,7 @@ class Bus {
   enum class Kind { messageBus, straightToService };
 
   static constexpr std::chrono::seconds usualTime{5};
+  static constexpr std::chrono::seconds timeWithoutRetry{10};
 
   /// Connects to a socket beneath the root; no variable of the environment says where. `library` must outlive it.
   static Result<std::unique_ptr<Bus>> open(const SystemdLibrary& library, const SystemRoot& root,
@@ -52,7 +54,8 @@ class Bus {
   std::string uniqueName() const;
 
   using Writer = std::function<void(BusMessage&)>;
-  /// Calls and waits for the reply.
+  /// Calls and waits for the reply. A service that has not answered in time is not asked again for a while: calls to it
+  /// fail at once.
   Result<BusMessage> call(const BusObject& object, const char* member, const char* replySignature,
                           const Writer& arguments, std::chrono::seconds longest = usualTime);
   template <typename... Arguments>
@@ -93,11 +96,13 @@ class Bus {
   int start(const FileDescriptor& connection);
   int awaitReady();
   const char* destination(const BusObject& object) const;
+  bool wasSilent(const BusObject& object) const;
 
   const SystemdLibrary& _library;
   sd_bus* _bus;
   Kind _kind;
   bool _interactive;
+  std::map<std::string, std::chrono::steady_clock::time_point, std::less<>> _silentSince;  ///< by service
 };
 
 }  // namespace tavisk

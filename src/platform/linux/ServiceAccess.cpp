@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "platform/linux/ServiceAccess.h"
 
+#include <chrono>
+
 #include "platform/linux/InitScriptDaemons.h"
 #include "platform/linux/UnitDaemons.h"
 
@@ -9,8 +11,7 @@ namespace tavisk {
 namespace {
 
 constexpr const char* managerMark = "/run/systemd/system/";
-constexpr const char* busSocket = "/run/dbus/system_bus_socket";
-constexpr const char* managerSocket = "/run/systemd/private";
+constexpr std::chrono::seconds slow{1};
 
 }  // namespace
 
@@ -27,31 +28,42 @@ Result<const SystemdLibrary*> ServiceAccess::library() {
   return &*_library;
 }
 
-Result<Bus*> ServiceAccess::keep(std::unique_ptr<Bus>& place, const char* socket, Bus::Kind kind) {
-  if (place && place->isOpen()) return place.get();
-  if (!hasServiceManager()) return Failure{"connect", socket, "this machine has no service manager"};
+Result<std::unique_ptr<Bus>> ServiceAccess::open(const Connection& connection) {
+  if (!hasServiceManager()) return Failure{"connect", connection.socket, "this machine has no service manager"};
   auto opened = library();
   if (!opened) return opened.failure();
-  auto bus = Bus::open(**opened, _root, socket, kind);
-  if (!bus) return bus.failure();
-  place = std::move(bus).value();
-  return place.get();
+  return Bus::open(**opened, _root, connection.socket, connection.kind);
+}
+
+Result<Bus*> ServiceAccess::use(Connection& connection) {
+  if (connection.bus && connection.bus->isOpen()) return connection.bus.get();
+  const auto began = RunLoop::Clock::now();
+  if (connection.failure && began - connection.failedAt < Bus::timeWithoutRetry) return *connection.failure;
+  connection.failure.reset();
+  auto bus = open(connection);
+  if (bus) {
+    connection.bus = std::move(bus).value();
+    return connection.bus.get();
+  }
+  connection.failedAt = RunLoop::Clock::now();
+  if (connection.failedAt - began > slow) connection.failure = bus.failure();
+  return bus.failure();
 }
 
 Result<Bus*> ServiceAccess::systemBus() {
-  return keep(_systemBus, busSocket, Bus::Kind::messageBus);
+  return use(_systemBus);
 }
 
 Result<Bus*> ServiceAccess::serviceManager() {
   auto bus = systemBus();
   if (bus) return bus;
-  auto manager = keep(_manager, managerSocket, Bus::Kind::straightToService);
+  auto manager = use(_manager);
   return manager ? manager : bus;
 }
 
 Result<std::unique_ptr<Bus>> ServiceAccess::openSystemBus() const {
-  if (!_library) return Failure{"connect", busSocket, "the bus was not used before"};
-  return Bus::open(*_library, _root, busSocket, Bus::Kind::messageBus);
+  if (!_library) return Failure{"connect", _systemBus.socket, "the bus was not used before"};
+  return Bus::open(*_library, _root, _systemBus.socket, _systemBus.kind);
 }
 
 Daemons& ServiceAccess::daemons() {

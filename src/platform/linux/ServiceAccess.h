@@ -31,13 +31,22 @@ class ServiceAccess {
 
  private:
   Result<const SystemdLibrary*> library();
-  Result<Bus*> keep(std::unique_ptr<Bus>& place, const char* socket, Bus::Kind kind);
+  /// A connection that is kept; one that could not be had in time is not tried again for a while.
+  struct Connection {
+    const char* socket;
+    Bus::Kind kind;
+    std::unique_ptr<Bus> bus = nullptr;
+    std::optional<Failure> failure = std::nullopt;
+    RunLoop::Clock::time_point failedAt = {};
+  };
+  Result<Bus*> use(Connection& connection);
+  Result<std::unique_ptr<Bus>> open(const Connection& connection);
 
   const SystemRoot& _root;
   RunLoop& _runLoop;
   std::optional<SystemdLibrary> _library;
-  std::unique_ptr<Bus> _systemBus;
-  std::unique_ptr<Bus> _manager;
+  Connection _systemBus{"/run/dbus/system_bus_socket", Bus::Kind::messageBus};
+  Connection _manager{"/run/systemd/private", Bus::Kind::straightToService};
   std::unique_ptr<Daemons> _daemons;
 };
 
