@@ -10,6 +10,8 @@ import shutil
 import subprocess
 import tempfile
 
+SANITIZER_OPTIONS = {name: value for name, value in os.environ.items() if name.endswith("SAN_OPTIONS")}
+
 
 def decoded(value):
     """JSON to property list: {"data": "00ff"} alone is data, everything else is as it stands."""
@@ -75,7 +77,8 @@ class ScratchMachine:
         return [json.loads(line) for line in self.lines("effects.log")]
 
     def environment(self, **more):
-        return {"PATH": "/usr/sbin:/usr/bin:/sbin:/bin", "TAVISK_HOST": f"scratch:{self.directory}", **more}
+        path = "/usr/sbin:/usr/bin:/sbin:/bin"
+        return {"PATH": path, "TAVISK_HOST": f"scratch:{self.directory}", **SANITIZER_OPTIONS, **more}
 
     def start(self, words, environment=None, **how):
         return subprocess.Popen([self.program, *words], env=self.environment(**(environment or {})), **how)
