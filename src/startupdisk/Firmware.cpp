@@ -14,6 +14,10 @@ constexpr const char* nvramTool = "/usr/sbin/nvram";
 constexpr int openFirmware = 1;
 constexpr std::string_view deviceTreePrefix = "IODeviceTree:";
 
+bool isAscii(std::string_view text) {
+  return std::all_of(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x80; });
+}
+
 /// Whether a list of texts, each ended by a NUL byte, has this one.
 bool listHas(const IORegistry::Data& list, std::string_view wanted) {
   for (auto begin = list.begin();;) {
@@ -55,7 +59,8 @@ std::optional<std::string> runNVRAMTool(SDEnvironment& environment, const std::s
   const auto output = environment.host.programs().run(nvramTool, {argument});
   if (!output) return std::nullopt;
   environment.log.debug("%@ %@ (exit status %d)", {nvramTool, argument, output->exitStatus});
-  if (output->exitStatus != 0 || output->text.size() <= argument.size() + 2) return std::nullopt;
+  if (output->exitStatus != 0 || !isAscii(output->text)) return std::nullopt;
+  if (output->text.size() <= argument.size() + 2) return std::nullopt;
   std::string value = output->text.substr(argument.size() + 1);
   if (value.ends_with('\n')) value.pop_back();
   return value;

@@ -79,7 +79,7 @@ void SDController::_announceBootSystem(const SDRecord& bootDisk) {
 }
 
 void SDController::_askNetworkBootPreference() {
-  if (std::exchange(_environment.facts.networkPreferenceAsked, true)) return;
+  if (_environment.facts.networkPreferenceAsked.exchange(true)) return;
   const auto preference = _dmm.networkBootPreference();
   if (preference.status != 0 || !preference.interface) return;
   if (auto image = _selectedImageOn(*preference.interface)) {

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <map>
 #include <optional>
 #include <string>
@@ -15,11 +16,12 @@
 
 namespace tavisk {
 
-/// What the startup-disk code has learnt of the machine; each is worked out once a run. Main thread only.
+/// What the startup-disk code has learnt of the machine; each is worked out once a run. Main thread only, but for the
+/// flag.
 struct SDMachineFacts {
   std::optional<bool> excludesLumara9;
   std::optional<bool> startedFromNetwork;
-  bool networkPreferenceAsked = false;
+  std::atomic<bool> networkPreferenceAsked = false;
   std::optional<std::string> bootDevice;                              ///< the firmware variable "boot-device"
   std::optional<std::map<std::string, std::string>> interfaceOfPath;  ///< from device-tree path to BSD name
 };

@@ -116,19 +116,24 @@ ServiceStatus ScratchDiskManagement::setFirmwareVariable(const std::string& name
 
 ServiceStatus ScratchDiskManagement::change(const std::string& setting, const std::string& asked, const char* statusKey,
                                             const MachineSetting::Read& read, const MachineFile::Edit& store) {
-  ServiceStatus status = 0;
+  ServiceStatus status = failed;  // what a refusal leaves
   Setting parts;
   parts.name = setting;
   parts.where = _machine.path();
   parts.live = parts.stored = [&] { return read(_machine); };
   parts.store = [&](const std::string&) -> Result<void> {
-    status = static_cast<ServiceStatus>(_machine.section(section).integer(statusKey));
-    if (status != 0) return Failure{"set", "the rehearsed firmware", "status " + std::to_string(status)};
-    return _machine.change(store);
+    const auto answer = static_cast<ServiceStatus>(_machine.section(section).integer(statusKey));
+    if (answer != 0) {
+      status = answer;
+      return Failure{"set", "the rehearsed firmware", "status " + std::to_string(answer)};
+    }
+    auto written = _machine.change(store);
+    if (written) status = 0;
+    return written;
   };
   parts.always = true;
-  const auto effect = _settings.carryOut(parts, asked);
-  return effect.outcome == Outcome::failed && status == 0 ? failed : status;
+  _settings.carryOut(parts, asked);
+  return status;
 }
 
 }  // namespace tavisk

@@ -1,0 +1,234 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <thread>
+
+#include "StartupDiskTest.h"
+#include "startupdisk/SDImage.h"
+
+namespace tavisk {
+namespace {
+
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::IsEmpty;
+
+const std::string folderOfA = "/Volumes/A/System/Library/CoreServices";
+
+SDRecordRef image(const SDImage::Values& values) {
+  return std::make_shared<SDImage>(values);
+}
+
+/// A machine that starts from disk0s2.
+struct BootMachine : StartupMachine {
+  BootMachine() {
+    addLumaraX("disk0s2", "A");
+    addLumaraX("disk1s2", "B", keys({{"Device Path", "IODeviceTree:/b"}}));
+    set("Firmware", "Boot Preference", keys({{"Disk", "disk0s2"}}));
+  }
+  std::string bootDevice() {
+    const auto device = controller().currentBootDevice();
+    return device ? device->description() : "none";
+  }
+  std::string variable(const char* name) {
+    const auto variables = get("Firmware", "Variables");
+    const auto* const value = variables ? variables->asDictionary()->find(name) : nullptr;
+    return value == nullptr ? "none" : *value->asString();
+  }
+};
+
+TEST(BootDevice, IsAskedOnceAndAnnounced) {
+  BootMachine machine;
+  machine.controller();
+  machine.debug();
+  NotificationRecorder recorder(machine.notifications);
+  EXPECT_EQ(machine.bootDevice(), "disk0s2 A");
+  EXPECT_THAT(recorder.take(), ElementsAre("SDBootSystemDetermined disk0s2 A"));
+  EXPECT_THAT(machine.systemLog(),
+              ElementsAre("currentBootDevice: being checked by DiskManagement",
+                          "currentBootDevice found _curBootDevice: disk0s2 A", "currentBootDevice cached: disk0s2 A",
+                          "doesCurrentBootDeviceMatchSystemFolder: " + folderOfA,
+                          "currentBootDevice matched existing cell: disk0s2 A", "currentBootDevice: disk0s2 A"));
+  machine.set("Firmware", "Boot Preference", keys({{"Disk", "disk1s2"}}));
+  EXPECT_EQ(machine.bootDevice(), "disk0s2 A");
+  EXPECT_EQ(machine.systemLog().back(), "currentBootDevice cached: disk0s2 A");
+  EXPECT_THAT(recorder.take(), IsEmpty());
+}
+
+TEST(BootDevice, IsNoneWhereTheHostKnowsNone) {
+  for (const char* const disk : {"", "disk9s9"}) {
+    BootMachine machine;
+    machine.set("Firmware", "Boot Preference", *disk == '\0' ? Keys() : keys({{"Disk", disk}}));
+    machine.controller();
+    machine.debug();
+    EXPECT_EQ(machine.bootDevice(), "none");
+    EXPECT_EQ(machine.systemLog().back(), "currentBootDevice: (null)");
+    EXPECT_FALSE(machine.controller().doesCurrentBootDeviceMatchSystemFolder(*machine.volume("disk0s2"),
+                                                                             machine.volume("disk0s2").get()));
+    EXPECT_EQ(machine.systemLog().back(), "dCBDMSF doesn't know boot-dev yet to check " + folderOfA);
+  }
+}
+
+TEST(BootDevice, AFailedReadIsInTheEffects) {
+  BootMachine machine;
+  machine.set("Refusals", "Startup Disk (read)", "a broken chip");
+  EXPECT_EQ(machine.bootDevice(), "none");
+  EXPECT_THAT(machine.effectsLog(), ElementsAre(AllOf(HasSubstr("Startup Disk"), HasSubstr("a broken chip"))));
+}
+
+TEST(BootDevice, MatchesEverySystemOfItsDisk) {
+  BootMachine machine;
+  auto& controller = machine.controller();
+  const auto device = controller.currentBootDevice();
+  const auto matches = [&](const char* disk) {
+    return controller.doesCurrentBootDeviceMatchSystemFolder(*machine.volume(disk), device.get());
+  };
+  EXPECT_TRUE(matches("disk0s2"));
+  EXPECT_FALSE(matches("disk1s2"));
+  EXPECT_FALSE(controller.doesCurrentBootDeviceMatchSystemFolder(*machine.volume("disk0s2"), nullptr));
+}
+
+TEST(BootDevice, MayBeANetworkImage) {
+  BootMachine machine;
+  machine.set("Firmware", "Network Preference", keys({{"Interface", "en0"}}));
+  auto& controller = machine.controller();
+  controller.addWirestartImage(image({{"id", "other"}, {"interface", "en1"}, {"IsSelected", "x"}}));
+  controller.addWirestartImage(image({{"id", "unselected"}, {"interface", "en0"}}));
+  controller.addWirestartImage(
+      image({{"id", "chosen"}, {"interface", "en0"}, {"IsSelected", "x"}, {"Wirestart", "list"}}));
+  EXPECT_EQ(machine.bootDevice(), "{IsSelected = x; Wirestart = list; id = chosen; interface = en0}");
+
+  const SDImage::Values systems[] = {
+      {{"IsSelected", "x"}, {"interface", "en0"}}, {{"Wirestart", "any"}}, {{"Wirestart", "list"}}};
+  const auto boot = controller.currentBootDevice();
+  for (const auto& system : systems)
+    EXPECT_TRUE(controller.doesCurrentBootDeviceMatchSystemFolder(*image(system), boot.get()));
+  EXPECT_FALSE(controller.doesCurrentBootDeviceMatchSystemFolder(*machine.volume("disk0s2"), boot.get()));
+}
+
+TEST(BootDevice, IsAnyImageWhereNothingElseIsKnown) {
+  BootMachine machine;
+  machine.set("Firmware", "Boot Preference", Keys());
+  machine.set("Firmware", "Network Preference", keys({{"Interface", "en0"}}));
+  machine.controller();
+  machine.debug();
+  const auto device = machine.controller().currentBootDevice();
+  EXPECT_EQ(device->textForKey(recordkey::wirestart), "any");
+  EXPECT_EQ(machine.systemLog()[1], "currentBootDevice: Wirestart, ");
+  EXPECT_TRUE(machine.controller().doesCurrentBootDeviceMatchSystemFolder(*image({{"IsSelected", "x"}}), device.get()));
+}
+
+TEST(BootDevice, IsChosenWithLanguageAndKeyboard) {
+  struct Case {
+    PropertyList languages;
+    std::optional<int> layout;
+    const char* variable;
+  };
+  const Case cases[] = {
+      {PropertyList::Array{"German", "en"}, 3, "de:3"},
+      {PropertyList::Array{}, -2, "en:-2"},
+      {PropertyList::Array{"pt-br"}, std::nullopt, "pt_BR:0"},
+  };
+  for (const auto& test : cases) {
+    BootMachine machine;
+    machine.set("User Defaults", "VelmarLanguages", test.languages);
+    if (test.layout) machine.set("Keyboard Input", "Layout Number", *test.layout);
+    auto& controller = machine.controller();
+    machine.debug();
+    EXPECT_TRUE(controller.setDeviceForBoot(controller.systems().back()));
+    EXPECT_EQ(machine.variable("prev-lang:kbd"), test.variable);
+    const auto folder = "/Volumes/B/System/Library/CoreServices";
+    EXPECT_EQ(machine.get("Firmware", "Boot Preference"),
+              keys({{"Disk", "disk1s2"}, {"Folder", folder}, {"Lumara 9", false}}));
+    EXPECT_EQ(machine.bootDevice(), "disk1s2 B");
+    EXPECT_THAT(machine.systemLog(),
+                ElementsAre("Setting Startup Disk: disk1s2 B",
+                            "***************************** Setting Startup Disk *****************************",
+                            "******         Volume: B", "******  System Folder: " + std::string(folder),
+                            "****** System Version: 10", "****** OF Device Path: IODeviceTree:/b",
+                            "currentBootDevice cached: disk1s2 B"));
+  }
+}
+
+TEST(BootDevice, TellsTheHostOfOtherSystemsThanLumaraX) {
+  const std::pair<std::optional<ContextValue>, bool> versions[] = {{std::int64_t{10}, false},
+                                                                   {std::int64_t{9}, true},
+                                                                   {std::int64_t{95}, true},
+                                                                   {std::nullopt, false},
+                                                                   {"10", false}};
+  BootMachine machine;
+  auto& controller = machine.controller();
+  const auto system = controller.systems().front();
+  for (const auto& [version, lumara9] : versions) {
+    system->removeObjectForKey(recordkey::systemVersionMajor);
+    if (version) system->setObject(*version, recordkey::systemVersionMajor);
+    EXPECT_TRUE(controller.setDeviceForBoot(system));
+    EXPECT_EQ(*machine.get("Firmware", "Boot Preference")->asDictionary()->find("Lumara 9"), PropertyList(lumara9));
+  }
+}
+
+TEST(BootDevice, StaysWhereAChoiceFails) {
+  struct Case {
+    std::function<void(BootMachine&)> sabotage;
+    const char* storedDisk;
+    const char* effect;
+  };
+  const Case cases[] = {
+      {[](auto& machine) { machine.set("Firmware", "Set Boot Preference Status", 7); }, "disk0s2", "status 7"},
+      {[](auto& machine) { machine.set("Firmware", "Set Variable Status", 8); }, "disk1s2", "status 8"},
+      {[](auto& machine) { machine.refuse("Startup Disk", "locked"); }, "disk0s2", "locked"},
+      {[](auto& machine) { machine.refuse("Firmware Variable prev-lang:kbd", "no room"); }, "disk1s2", "no room"},
+      {[](auto& machine) { machine.refuse("*", "read-only"); }, "disk0s2", "read-only"},
+  };
+  for (const auto& test : cases) {
+    BootMachine machine;
+    test.sabotage(machine);
+    auto& controller = machine.controller();
+    EXPECT_FALSE(controller.setDeviceForBoot(controller.systems().back()));
+    EXPECT_EQ(*machine.get("Firmware", "Boot Preference")->asDictionary()->find("Disk"), PropertyList(test.storedDisk));
+    EXPECT_EQ(machine.variable("prev-lang:kbd"), "none");
+    EXPECT_THAT(machine.effectsLog().back(), AllOf(HasSubstr("\"failed\""), HasSubstr(test.effect)));
+    EXPECT_EQ(machine.bootDevice(), std::string(test.storedDisk) == "disk0s2" ? "disk0s2 A" : "disk1s2 B");
+  }
+}
+
+TEST(BootDevice, ANetworkImageIsOnlyRemembered) {
+  BootMachine machine;
+  auto& controller = machine.controller();
+  EXPECT_TRUE(controller.setDeviceForBoot(image({{"Wirestart", "any"}})));
+  EXPECT_EQ(machine.bootDevice(), "{Wirestart = any}");
+  EXPECT_THAT(machine.effectsLog(), IsEmpty());
+  EXPECT_FALSE(controller.setDeviceForBoot(image({{"id", "not marked"}})));
+}
+
+TEST(BootDevice, TargetDiskModeDependsOnTheFirmware) {
+  const std::tuple<int, const char*, const char*> cases[] = {
+      {2, "target-mode", "1"},
+      {1, "boot-command", "\" halb-boot\" \" boot-command\" $setenv target-mode"},
+      {0, "boot-command", "\" halb-boot\" \" boot-command\" $setenv target-mode"},
+  };
+  for (const auto& [firmware, name, value] : cases) {
+    BootMachine machine;
+    machine.set("Firmware", "Pre-Boot Environment", firmware);
+    EXPECT_EQ(machine.controller().setTargetDiskMode(), 0);
+    EXPECT_EQ(machine.variable(name), value);
+    machine.set("Firmware", "Set Variable Status", 9);
+    EXPECT_EQ(machine.controller().setTargetDiskMode(), 9);
+  }
+}
+
+TEST(BootDevice, MayBeAskedByTwoAtOnce) {
+  BootMachine machine;
+  auto& controller = machine.controller();
+  const auto ask = [&] {
+    for (int round = 0; round < 100; ++round) controller.currentBootDevice();
+  };
+  std::thread other(ask);
+  ask();
+  other.join();
+  EXPECT_EQ(machine.bootDevice(), "disk0s2 A");
+}
+
+}  // namespace
+}  // namespace tavisk

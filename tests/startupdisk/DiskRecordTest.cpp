@@ -1,0 +1,105 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include "StartupDiskTest.h"
+
+namespace tavisk {
+namespace {
+
+TEST(DiskRecord, WithoutADiskAnswersNothing) {
+  StartupMachine machine;
+  SDDisk record(machine.environment().diskServices(), std::nullopt);
+  for (const auto& text : {record.diskIdentifier(), record.protocol(), record.mountPoint(), record.description(),
+                           *record.filesystemType(), *record.deviceTreePath(), *record.volumeName()})
+    EXPECT_EQ(text, "");
+  EXPECT_FALSE(record.isInternal() || record.isCDROM() || record.isDVDROM() || record.isOptical());
+  EXPECT_FALSE(record.contextObject());
+  EXPECT_FALSE(SDDisk::wholeDiskFromSDDisk(record));
+  record.setObject("any", recordkey::wirestart);
+  EXPECT_EQ(SDDisk(machine.environment().diskServices(), std::nullopt).textForKey(recordkey::wirestart), "any");
+}
+
+TEST(DiskRecord, AnswersWhatTheHostKnows) {
+  StartupMachine machine;
+  machine.addVolume("disk0s3", "Data",
+                    keys({{"Kind", "udf"},
+                          {"Device Path", "IODeviceTree:/disk"},
+                          {"Protocol", "SATA"},
+                          {"CD", true},
+                          {"DVD", true},
+                          {"Optical", true},
+                          {"Internal", false}}));
+  machine.set("Disks", "disk1", Keys());
+  const auto disc = machine.volume("disk0s3");
+  EXPECT_EQ(disc->filesystemType(), "udf");
+  EXPECT_EQ(disc->deviceTreePath(), "IODeviceTree:/disk");
+  EXPECT_EQ(disc->mountPoint(), "/Volumes/Data");
+  EXPECT_EQ(disc->protocol(), "SATA");
+  EXPECT_EQ(disc->description(), "disk0s3 Data");
+  EXPECT_TRUE(disc->isCDROM() && disc->isDVDROM() && disc->isOptical() && !disc->isInternal());
+  const auto bare = machine.volume("disk1");
+  EXPECT_TRUE(bare->isInternal() && !bare->isCDROM() && !bare->isOptical());
+  EXPECT_EQ(bare->mountPoint(), "");
+  EXPECT_EQ(bare->description(), "disk1 (null)");
+  EXPECT_EQ(machine.volume("disk9")->description(), "(null) (null)");
+}
+
+TEST(DiskRecord, ADiskHasOneContextForAllItsRecords) {
+  StartupMachine machine;
+  machine.addVolume("disk0s3", "Data");
+  const auto record = machine.volume("disk0s3");
+  EXPECT_FALSE(record->contextObject());
+  EXPECT_FALSE(record->objectForKey("Key"));
+  record->removeObjectForKey("Key");
+  record->setVolumeName("Other");
+  const auto second = SDDisk::diskFromDisk(*record);
+  EXPECT_EQ(second->volumeName(), "Other");
+  second->setObject(std::int64_t{10}, "Key");
+  EXPECT_EQ(machine.volume("disk0s3")->integerForKey("Key"), 10);
+  EXPECT_EQ(record->contextObject()->size(), 2U);
+  record->removeObjectForKey(recordkey::volumeName);
+  EXPECT_EQ(second->volumeName(), "Data");
+  EXPECT_FALSE(machine.volume("disk0")->contextObject());
+}
+
+TEST(DiskRecord, IsMadeFromAnyPathOfItsVolume) {
+  StartupMachine machine;
+  machine.addVolume("disk0s2", "Main", keys({{"Mount Point", "/"}}));
+  machine.addVolume("disk1s2", "Data");
+  machine.addVolume("disk2s2", "Data2");
+  machine.writeFile("/Volumes/Data/folder/file", "");
+  const std::pair<const char*, const char*> cases[] = {
+      {"/Volumes/Data/folder/file", "disk1s2"},
+      {"/Volumes/Data/", "disk1s2"},
+      {"/Volumes/Data2", "disk2s2"},
+      {"/Volumes/Data/../Data2", "disk2s2"},
+      {"/Volumes", "disk0s2"},
+      {"/", "disk0s2"},
+      {"/Volumes/Missing", "none"},
+      {"Volumes/Data", "none"},
+  };
+  for (const auto& [path, disk] : cases) {
+    const auto record = SDDisk::initWithDADiskFromPath(path, machine.environment().diskServices());
+    EXPECT_EQ(record ? record->diskIdentifier() : "none", disk) << path;
+  }
+}
+
+TEST(DiskRecord, FindsItsWholeDisk) {
+  StartupMachine machine;
+  machine.set("Disks", "disk7", keys({{"Whole Disk", "disk0"}}));
+  for (const char* const name : {"disk0s3", "sda2", "disk1", "disk2s"}) machine.set("Disks", name, Keys());
+  const std::pair<const char*, const char*> cases[] = {
+      {"disk0s3", "disk0"}, {"disk1", "disk1"}, {"disk2s", "disk2s"}, {"sda2", "sda2"}, {"disk7", "disk0"}};
+  for (const auto& [disk, whole] : cases) {
+    const auto record = machine.volume(disk);
+    record->setObject("here", "Key");
+    const auto wholeRecord = SDDisk::wholeDiskFromSDDisk(*record);
+    EXPECT_EQ(wholeRecord->diskIdentifier(), whole);
+    EXPECT_EQ(wholeRecord->has("Key"), std::string(disk) == whole);
+    EXPECT_EQ(record->diskIdentifier(), disk);
+  }
+}
+
+}  // namespace
+}  // namespace tavisk

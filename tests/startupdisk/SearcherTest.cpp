@@ -1,0 +1,158 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <atomic>
+#include <thread>
+
+#include "StartupDiskTest.h"
+
+namespace tavisk {
+namespace {
+
+using testing::ElementsAre;
+
+TEST(Searcher, NeedsADelegate) {
+  StartupMachine machine;
+  const SearcherServices services{machine.host().diskManagement(), machine.host().files(), machine.runLoop,
+                                  machine.environment().log};
+  EXPECT_FALSE(SDSystemSearcher::initWithDelegate(nullptr, false, true, false, services));
+  EXPECT_THAT(machine.systemLog(),
+              ElementsAre("-[SDSystemSearcher initWithDelegate:onOldWorld:canBootNative9:canBootLegacyOS:] "
+                          "Delegate should not be nil!"));
+}
+
+TEST(Searcher, ReportsInALaterPass) {
+  StartupMachine machine;
+  machine.addLumaraX("disk0s2", "V");
+  RecordingDelegate delegate;
+  const auto searcher = machine.searcher(delegate, false);
+  searcher->searchForSystemOnVolume(machine.volume("disk0s2"));
+  EXPECT_EQ(delegate.activities, 0);
+  EXPECT_TRUE(delegate.found.empty());
+  machine.runPasses(1);
+  EXPECT_EQ(delegate.activities, 2) << "its creation, and the search";
+  EXPECT_EQ(delegate.found.size(), 1U);
+  EXPECT_EQ(delegate.completions, 0);
+}
+
+TEST(Searcher, DeliversNothingAfterItsEnd) {
+  StartupMachine machine;
+  machine.addLumaraX("disk0s2", "V");
+  RecordingDelegate delegate;
+  machine.searcher(delegate, false)->searchForSystemOnVolume(machine.volume("disk0s2"));
+  machine.runPasses(2);
+  EXPECT_EQ(delegate.activities, 0);
+  EXPECT_TRUE(delegate.found.empty());
+}
+
+TEST(Searcher, KeepsVolumesUntilTheyAreWithdrawn) {
+  StartupMachine machine;
+  machine.addVolume("disk0s2", "V");
+  machine.addVolume("disk1s2", "W");
+  RecordingDelegate delegate;
+  const auto searcher = machine.searcher(delegate, false);
+  const auto twice = machine.volume("disk0s2");
+  for (const auto& volume : {machine.volume("disk1s2"), twice, twice, machine.volume("disk0s2")})
+    searcher->searchForSystemOnVolume(volume);
+  const std::pair<const char*, std::size_t> withdrawals[] = {{"disk9s2", 4}, {"disk0s2", 2}, {"disk0s2", 1},
+                                                             {"disk0s2", 1}, {"disk1s2", 0}, {"disk1s2", 0}};
+  for (const auto& [disk, left] : withdrawals) {
+    searcher->cancelSearchOnVolume(*machine.volume(disk));
+    EXPECT_EQ(searcher->waitingVolumes(), left) << disk;
+  }
+}
+
+/// A worker for the long search, on a thread of the test's own.
+class Worker {
+ public:
+  explicit Worker(SDSystemSearcher& searcher, SDDiskRef last)
+      : _searcher(searcher), _last(std::move(last)), _thread([this] {
+          while (!_ends) _searcher._searchOldestVolume();
+        }) {}
+  /// One more volume wakes a worker that sleeps.
+  ~Worker() {
+    _ends = true;
+    _searcher.setSearchPaused(false);
+    _searcher.searchForSystemOnVolume(_last);
+    _thread.join();
+  }
+  Worker(const Worker&) = delete;
+  Worker& operator=(const Worker&) = delete;
+
+ private:
+  SDSystemSearcher& _searcher;
+  SDDiskRef _last;
+  std::atomic<bool> _ends = false;
+  std::thread _thread;
+};
+
+TEST(Searcher, AWorkerSearchesTheRootsOfVolumesOldestFirst) {
+  StartupMachine machine;
+  const auto disc = keys({{"Kind", "cd9660"}, {"Optical", true}, {"Optical Bootable", true}});
+  machine.addVolume("disk0s1", "A", keys({{"Kind", "ntfs"}}));
+  machine.addVolume("disk1", "B", disc);
+  machine.addVolume("disk2s1", "C", keys({{"Kind", "msdos"}}));
+  for (const char* const volume : {"A", "C"}) machine.writeFile("/Volumes/" + std::string(volume) + "/SYSTEM.INI", "");
+  RecordingDelegate delegate;
+  const auto searcher = machine.searcher(delegate, true);
+  for (const char* const disk : {"disk0s1", "disk1", "disk2s1"})
+    searcher->searchForSystemOnVolume(machine.volume(disk));
+
+  searcher->setSearchPaused(true);
+  const Worker worker(*searcher, machine.volume("disk9"));
+  machine.runLoop.runUntil(RunLoop::Clock::now() + std::chrono::milliseconds(50));
+  EXPECT_GE(searcher->waitingVolumes(), 2U) << "a pause stops the worker before its next volume";
+  EXPECT_TRUE(delegate.found.empty());
+  searcher->setSearchPaused(false);
+  EXPECT_TRUE(machine.runLoop.runUntil(RunLoop::Clock::now() + std::chrono::seconds(30),
+                                       [&] { return delegate.found.size() == 3; }));
+  std::vector<std::string> windows;
+  for (const auto& system : delegate.found)
+    windows.push_back(system->description() + *system->textForKey(recordkey::systemFolderPath));
+  EXPECT_THAT(windows,
+              testing::UnorderedElementsAre("disk0s1 A/Volumes/A", "disk1 B/Volumes/B", "disk2s1 C/Volumes/C"));
+  EXPECT_LT(std::find(windows.begin(), windows.end(), "disk0s1 A/Volumes/A"),
+            std::find(windows.begin(), windows.end(), "disk2s1 C/Volumes/C"));
+}
+
+TEST(Searcher, TheWorkersRoutineRunsForEver) {
+  const auto run = [] {
+    StartupMachine machine;
+    machine.addVolume("disk0s1", "A", keys({{"Kind", "ntfs"}}));
+    machine.writeFile("/Volumes/A/SYSTEM.INI", "");
+    RecordingDelegate delegate;
+    const auto searcher = machine.searcher(delegate, true);
+    std::thread([&] { searcher->_longSearchQueueThread(); }).detach();
+    searcher->searchForSystemOnVolume(machine.volume("disk0s1"));
+    const bool found = machine.runLoop.runUntil(RunLoop::Clock::now() + std::chrono::seconds(30),
+                                                [&] { return !delegate.found.empty(); });
+    std::_Exit(found ? 0 : 1);
+  };
+  EXPECT_EXIT(run(), testing::ExitedWithCode(0), "");
+}
+
+TEST(Searcher, BearsVolumesThatComeAndGoAndPausesBesideAWorker) {
+  StartupMachine machine;
+  for (int number = 0; number < 8; ++number)
+    machine.addLumaraX("disk" + std::to_string(number) + "s1", "V" + std::to_string(number),
+                       keys({{"Kind", number % 2 == 0 ? "ntfs" : "udf"}, {"Optical", number % 2 == 1}}));
+  machine.host().diskEvents().schedule(machine.runLoop);
+  RecordingDelegate delegate;
+  const auto searcher = machine.searcher(delegate, true);
+  const Worker worker(*searcher, machine.volume("disk9"));
+  for (int round = 0; round < 1'000; ++round) {
+    if (round % 50 == 0) machine.addVolume("disk9s1", "V9", keys({{"Size", round}}));
+    const auto volume = machine.volume("disk" + std::to_string(round % 8) + "s1");
+    searcher->searchForSystemOnVolume(volume);
+    if (round % 3 == 0) searcher->setSearchPaused(true);
+    if (round % 2 == 0) searcher->cancelSearchOnVolume(*SDDisk::diskFromDisk(*volume));
+    searcher->setSearchPaused(false);
+    if (round % 5 == 0) machine.runPasses(1);
+  }
+  machine.runPasses(1);
+  EXPECT_GE(delegate.found.size(), 1'000U);
+}
+
+}  // namespace
+}  // namespace tavisk
