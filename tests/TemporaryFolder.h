@@ -5,7 +5,7 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <iterator>
+#include <sstream>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -15,7 +15,9 @@ namespace tavisk {
 
 inline std::string contentsOf(const std::filesystem::path& path) {
   std::ifstream file(path, std::ios::binary);
-  return {std::istreambuf_iterator<char>(file), {}};
+  std::ostringstream contents;
+  contents << file.rdbuf();
+  return contents.str();
 }
 
 inline std::vector<std::string> linesOf(const std::filesystem::path& path) {
