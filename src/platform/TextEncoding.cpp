@@ -5,6 +5,8 @@
 #include <cstdint>
 #include <vector>
 
+#include "platform/Text.h"
+
 namespace tavisk {
 
 namespace {
@@ -26,26 +28,6 @@ std::vector<char32_t> units(std::string_view bytes, bool bigEndian) {
     units.push_back(bigEndian ? first * 256U + second : second * 256U + first);
   }
   return units;
-}
-
-void appendUtf8(std::string& text, char32_t character) {
-  const auto byte = [&](char32_t bits) { text += static_cast<char>(bits); };
-  const auto continuation = [&](unsigned shift) { byte(0x80U | ((character >> shift) & 0x3FU)); };
-  if (character < 0x80) {
-    byte(character);
-  } else if (character < 0x800) {
-    byte(0xC0U | (character >> 6U));
-    continuation(0);
-  } else if (character < 0x10000) {
-    byte(0xE0U | (character >> 12U));
-    continuation(6);
-    continuation(0);
-  } else {
-    byte(0xF0U | (character >> 18U));
-    continuation(12);
-    continuation(6);
-    continuation(0);
-  }
 }
 
 std::string fromUtf16(std::string_view bytes, bool bigEndian) {

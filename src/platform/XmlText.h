@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <optional>
 #include <string_view>
@@ -17,15 +18,22 @@ constexpr bool isXmlCharacter(char32_t codePoint) {
          (codePoint >= 0x10000 && codePoint <= 0x10FFFF);
 }
 
+/// What most of a text is: printable ASCII and line ends.
+constexpr bool isPlainText(char byte) {
+  return (byte >= ' ' && byte <= '~') || byte == '\n' || byte == '\t';
+}
+
 /// Where the first byte stands that is not UTF-8 or begins a character that XML cannot hold.
 inline std::optional<std::size_t> offsetOfNonXml(std::string_view text) {
   std::string_view rest = text;
-  while (!rest.empty()) {
+  while (true) {
+    rest.remove_prefix(
+        static_cast<std::size_t>(std::find_if_not(rest.begin(), rest.end(), isPlainText) - rest.begin()));
+    if (rest.empty()) return std::nullopt;
     const std::size_t offset = text.size() - rest.size();
     const std::optional<char32_t> codePoint = takeCodePoint(rest);
     if (!codePoint || !isXmlCharacter(*codePoint)) return offset;
   }
-  return std::nullopt;
 }
 
 }  // namespace tavisk

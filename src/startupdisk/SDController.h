@@ -40,7 +40,7 @@ class SDController : public SystemSearcherProtocol {
   std::vector<SDRecordRef> allSystems() const;
   /// The system-folder paths of `systems`, which a later run may give to searchSystemWithCache.
   std::vector<std::string> foundSystemPathsForCache() const;
-  /// Searches the volumes of these folders; a path without a disk is passed over.
+  /// Searches the volumes of these folders; a path without a disk is passed over. Kept; nothing calls it.
   void searchSystemWithCache(const std::vector<std::string>& paths);
   /// Pauses come in pairs with their ends.
   void setSearchPaused(bool paused) { _systemSearcher->setSearchPaused(paused); }
@@ -56,10 +56,10 @@ class SDController : public SystemSearcherProtocol {
   bool doesCurrentBootDeviceMatchSystemFolder(const SDRecord& system, const SDRecord* withCurrentBootDisk);
   /// Makes the system the startup disk, and remembers it as the boot device. A network image is only remembered.
   bool setDeviceForBoot(const SDRecordRef& system);
-  /// Lets the machine start as a disk for another one, once.
+  /// Lets the machine start as a disk for another one, once. Kept; nothing calls it.
   ServiceStatus setTargetDiskMode();
 
-  /// Network boot images
+  /// Network boot images. Kept, and switched off: nothing makes one.
   virtual bool supportsWirestart() const { return false; }
   void addWirestartImage(const SDRecordRef& image);
   void removeWirestartImageWithIdentifier(const std::optional<std::string>& identifier);

@@ -30,7 +30,7 @@ class SDDisk final : public SDRecord {
   static std::shared_ptr<SDDisk> initWithDADiskFromPath(const std::string& path, const SDDiskServices& andSession);
   /// A second record of the same disk, and so with the same context.
   static std::shared_ptr<SDDisk> diskFromDisk(const SDDisk& disk);
-  /// The record of the whole disk that holds the given one; null when that has no disk.
+  /// The record of the whole disk that holds the given one; null when that has no disk. Kept; nothing asks it.
   static std::shared_ptr<SDDisk> wholeDiskFromSDDisk(const SDDisk& disk);
 
   const std::optional<DiskName>& disk() const { return _disk; }

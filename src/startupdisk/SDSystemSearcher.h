@@ -42,7 +42,7 @@ class SDSystemSearcher {
   void cancelSearchOnVolume(const SDDisk& volume);
   /// Pauses come in pairs with their ends: a second pause waits for the end of the first.
   void setSearchPaused(bool paused);
-  /// Checks the folder that the record's context already holds, by all rules.
+  /// Checks the folder that the record's context already holds, by all rules. Kept; nothing calls it.
   void searchKnownSystem(const SDDiskRef& volume);
   std::size_t waitingVolumes() const { return _searchQueue.count(); }
 
