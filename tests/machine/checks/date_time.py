@@ -17,10 +17,10 @@ CHECKS = [
           then={"date -u +%H:%M": "07:32\n", "cut -c1-5 /sys/class/rtc/rtc0/time": "07:32\n"}),
     Check("a year that the kernel refuses is told, and leaves the clock", needs=CLOCK,
           do="TAVISK_LOG=stderr tavisk -setdate 1/1/1950", prints="setdate: 01/01/1950\n",
-          errors=re.compile(r"tavisk: Time: set the clock .*\n"), then=ON_THAT_DAY),
+          errors=re.compile(r"tavisk: Time: .*\n"), then=ON_THAT_DAY),
     Check("a clock that is another machine's is told", needs=frozenset({"container"}),
           do="TAVISK_LOG=stderr tavisk -setusingnetworktime off -settime 1:2:3",
           prints=re.compile(r"[^\n]*[Oo]ff\.?\nSet Time: 01:02:03\n"),
-          errors=re.compile(r"tavisk: Time: set the clock .*CAP_SYS_TIME.*\n"),
+          errors=re.compile(r"tavisk: Time: .*CAP_SYS_TIME.*\n"),
           then={"journalctl -b -t tavisk TAVISK_SETTING=Time -n 1 -o cat": re.compile(r"Time: failed, .*CAP_SYS_TIME.*\n")}),
 ]

@@ -5,6 +5,7 @@ import re
 from check import Check
 
 BUS = frozenset({"bus"})
+CONTAINER = frozenset({"container"})
 ZONE_LINK = {"readlink -f /etc/localtime": "/usr/share/zoneinfo/Asia/Kolkata\n", "date +%z": "+0530\n"}
 WITHOUT_LINK = """(while :; do [ -L /etc/localtime ] || echo absent; done) >/run/absent 2>&1 & watch=$!
 for zone in Europe/Paris America/Lima Europe/Paris America/Lima; do tavisk -settimezone $zone; done
@@ -15,9 +16,9 @@ CHECKS = [
     Check("the zones are those of timedatectl", needs=BUS,
           do="""tavisk -listtimezones | tail -n +2 | cut -c2- | LC_ALL=C sort >/run/zones
                 timedatectl list-timezones | LC_ALL=C sort | diff - /run/zones"""),
-    Check("/etc/localtime is never absent while zones change", needs=BUS, do=WITHOUT_LINK,
+    Check("/etc/localtime is never absent while zones change", needs=CONTAINER, do=WITHOUT_LINK,
           prints="".join(f"Set TimeZone: {zone}\n" for zone in 2 * ["Europe/Paris", "America/Lima"])),
-    Check("a zone is set while the bus is away", needs=BUS,
+    Check("a zone is set while the bus is away", needs=CONTAINER,
           do="systemctl stop dbus.socket dbus; tavisk -settimezone Asia/Tokyo -gettimezone; systemctl start dbus.socket",
           prints="Set TimeZone: Asia/Tokyo\nTime Zone: Asia/Tokyo\n",
           then={"timedatectl show --property Timezone --value": "Asia/Tokyo\n"}),
@@ -25,12 +26,13 @@ CHECKS = [
           prints="Set TimeZone: Asia/Kolkata\nTime Zone: Asia/Kolkata\n", then=ZONE_LINK),
     Check("the zone is the machine's own, and is kept", needs=BUS, kept=True, do="tavisk -gettimezone",
           prints="Time Zone: Asia/Kolkata\n",
-          then=ZONE_LINK | {"cat /etc/timezone": "Asia/Kolkata\n", "tavisk -gettimezone": "Time Zone: Asia/Kolkata\n"}),
+          then=ZONE_LINK | {"timedatectl show --property Timezone --value": "Asia/Kolkata\n",
+                            "cat /etc/timezone": "Asia/Kolkata\n", "tavisk -gettimezone": "Time Zone: Asia/Kolkata\n"}),
     Check("a change is in the journal", needs=BUS,
           do="journalctl -b -t tavisk TAVISK_SETTING='Time Zone' TAVISK_OUTCOME=applied -n 1 -o verbose",
           prints=re.compile(r".*\bTAVISK_NEW=Asia/Kolkata\n.*", re.DOTALL),
           then={"journalctl -b -t tavisk -n 1 -o cat TAVISK_OUTCOME=applied TAVISK_UID=0":
-                re.compile(r'Time Zone: applied, was "Asia/Tokyo", asked "Asia/Kolkata"\n')}),
+                re.compile(r'Time Zone: applied, .*asked "Asia/Kolkata"\n')}),
     Check("what is no zone changes nothing", do="tavisk -settimezone ../../etc/passwd", status=1,
           prints=re.compile(r"\.\./\.\./etc/passwd is not a valid timezone\. .*\n"), then=ZONE_LINK),
 ]

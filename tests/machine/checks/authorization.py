@@ -1,0 +1,38 @@
+# SPDX-FileCopyrightText: 2026 The tavisk developers
+# SPDX-License-Identifier: MIT
+import re
+
+from check import Check
+
+CONTAINER = frozenset({"container"})
+RULE = "/etc/polkit-1/rules.d/10-test.rules"
+ZONE = "readlink -f /etc/localtime"
+PARIS = "TAVISK_LOG=stderr tavisk -settimezone Europe/Paris"
+
+
+def by(user, command):
+    return f"setpriv --reuid {user} --regid {user} --init-groups env {command}"
+
+
+def with_rule(answer, command):
+    text = f'polkit.addRule(function(a, s) {{ if (s.isInGroup("admin")) return polkit.Result.{answer}; }});'
+    renewed = "systemctl reset-failed polkit 2>/dev/null; systemctl restart polkit"
+    return f"echo '{text}' >{RULE}; {renewed}; {command}; status=$?; rm {RULE}; {renewed}; exit $status"
+
+
+CHECKS = [
+    Check("who is no administrator is refused", needs=CONTAINER, do=by("mallory", "tavisk -getdate"),
+          prints=re.compile(r"You need administrator access to run this tool\.\.\. exiting!\n?")),
+    Check("an administrator reads without being asked", needs=CONTAINER,
+          do="tavisk -settimezone America/Lima >/run/printed; " + by("alice", "tavisk -gettimezone"),
+          prints="Time Zone: America/Lima\n"),
+    Check("an administrator whom a rule forbids changes nothing", needs=CONTAINER, do=with_rule("NO", by("alice", PARIS)),
+          prints="Set TimeZone: Europe/Paris\n", errors=re.compile(r"(tavisk: (Time Zone|Authorization): [^\n]*\n)+"),
+          then={ZONE: "/usr/share/zoneinfo/America/Lima\n"}),
+    Check("an administrator whom a rule allows it sets the zone", needs=CONTAINER, do=with_rule("YES", by("alice", PARIS)),
+          prints="Set TimeZone: Europe/Paris\n", then={ZONE: "/usr/share/zoneinfo/Europe/Paris\n"}),
+    Check("an administrator is told what only root can store", needs=CONTAINER,
+          do=with_rule("YES", by("alice", "TAVISK_LOG=stderr tavisk -setnetworktimeserver time.example")),
+          prints="setNetworkTimeServer: time.example\n", errors=re.compile(r"(tavisk: [^\n]*sudo tavisk [^\n]*\n)+"),
+          then={"journalctl -b -t tavisk -n 1 -o verbose | grep -c TAVISK_UID=$(id -u alice)": "1\n"}),
+]
