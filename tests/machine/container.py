@@ -14,7 +14,7 @@ import trees
 
 
 class Container(machine.Machine):
-    cannot = "set a clock, run a time daemon, reach firmware or devices"
+    cannot = "set a clock, let a time daemon correct one, reach firmware or devices"
 
     def __init__(self, time_daemon):
         self.name = f"container with {time_daemon}"
