@@ -101,9 +101,11 @@ void RemoteServerSettings::callHandler(const std::string& word, const CommandTab
     _context.output.takePrinted();
     _report->commandBegins(word, arguments, entry.selector);
   }
-  if (const Handler* handler = findHandler(entry.selector)) {
+  try {
+    const Handler* handler = findHandler(entry.selector);
+    if (!handler) throw NotBuiltYet();
     std::visit(Call{*_serverCommands, arguments}, *handler);
-  } else {
+  } catch (const NotBuiltYet&) {
     complain(word + ": not built yet");
     _serverCommands->setError(true);
   }

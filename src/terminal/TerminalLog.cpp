@@ -18,7 +18,7 @@ bool TerminalLog::wanted() {
 }
 
 void TerminalLog::record(const Effect& effect) {
-  if (effect.outcome != Outcome::failed || !effect.failure) return;
+  if (!effect.failure) return;
   complain(escaped(effect.setting) + ": " + describe(*effect.failure));
 }
 

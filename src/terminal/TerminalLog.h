@@ -6,7 +6,8 @@
 
 namespace tavisk {
 
-/// Tells each failure on standard error, in one line: "tavisk: SETTING: what was tried on what: why".
+/// Tells on standard error, in one line each, what failed and what this machine does not support: "tavisk: SETTING:
+/// what was tried on what: why".
 class TerminalLog : public EffectChannel {
  public:
   /// When standard error is a terminal, or TAVISK_LOG is "stderr".

@@ -14,15 +14,7 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _systemLog(_root),
       _clock(_machine),
       _networkTime(_machine),
-      _powerSettings(effects),
-      _remoteShell(effects),
-      _remoteEvents(effects),
-      _hostConfiguration(effects),
-      _dynamicStore(effects),
-      _bootLoaderFile(_machine),
-      _preferences(effects),
-      _processes(effects),
-      _startupDisk(_machine) {
+      _bootLoaderFile(_machine) {
   effects.addChannel(_journalLog);
 }
 

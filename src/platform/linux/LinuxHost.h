@@ -14,11 +14,6 @@
 #include "platform/linux/LinuxNetworkTimeService.h"
 #include "platform/linux/LinuxSystemLog.h"
 #include "platform/linux/LinuxUserDatabase.h"
-#include "platform/linux/UnbuiltNames.h"
-#include "platform/linux/UnbuiltPower.h"
-#include "platform/linux/UnbuiltProcesses.h"
-#include "platform/linux/UnbuiltRemoteAccess.h"
-#include "platform/linux/UnbuiltStartupDisk.h"
 
 namespace tavisk {
 
@@ -36,25 +31,25 @@ class LinuxHost final : public Host {
   SystemLog& systemLog() override { return _systemLog; }
   ClockService& clock() override { return _clock; }
   NetworkTimeService& networkTime() override { return _networkTime; }
-  PowerSettingsService& powerSettings() override { return _powerSettings; }
-  PowerController& powerController() override { return _powerController; }
-  RemoteShellService& remoteShell() override { return _remoteShell; }
-  RemoteEventsService& remoteEvents() override { return _remoteEvents; }
-  HostConfigService& hostConfiguration() override { return _hostConfiguration; }
-  DynamicStore& dynamicStore() override { return _dynamicStore; }
+  PowerSettingsService& powerSettings() override { throw NotBuiltYet(); }
+  PowerController& powerController() override { throw NotBuiltYet(); }
+  RemoteShellService& remoteShell() override { throw NotBuiltYet(); }
+  RemoteEventsService& remoteEvents() override { throw NotBuiltYet(); }
+  HostConfigService& hostConfiguration() override { throw NotBuiltYet(); }
+  DynamicStore& dynamicStore() override { throw NotBuiltYet(); }
   BootLoaderFile& bootLoaderFile() override { return _bootLoaderFile; }
-  PreferencesStore& preferences() override { return _preferences; }
-  ProcessUtilities& processes() override { return _processes; }
+  PreferencesStore& preferences() override { throw NotBuiltYet(); }
+  ProcessUtilities& processes() override { throw NotBuiltYet(); }
 
-  DiskEventSession& diskEvents() override { return _startupDisk; }
-  DiskManagementService& diskManagement() override { return _startupDisk; }
-  IORegistry& registry() override { return _startupDisk; }
-  NetworkInterfaces& networkInterfaces() override { return _startupDisk; }
-  KernelValues& kernel() override { return _startupDisk; }
-  KeyboardInputService& keyboardInput() override { return _startupDisk; }
-  UserDefaults& userDefaults() override { return _startupDisk; }
-  ProgramRunner& programs() override { return _startupDisk; }
-  ProcessTermination& processTermination() override { return _startupDisk; }
+  DiskEventSession& diskEvents() override { throw NotBuiltYet(); }
+  DiskManagementService& diskManagement() override { throw NotBuiltYet(); }
+  IORegistry& registry() override { throw NotBuiltYet(); }
+  NetworkInterfaces& networkInterfaces() override { throw NotBuiltYet(); }
+  KernelValues& kernel() override { throw NotBuiltYet(); }
+  KeyboardInputService& keyboardInput() override { throw NotBuiltYet(); }
+  UserDefaults& userDefaults() override { throw NotBuiltYet(); }
+  ProgramRunner& programs() override { throw NotBuiltYet(); }
+  ProcessTermination& processTermination() override { throw NotBuiltYet(); }
 
  private:
   SystemRoot _root;
@@ -67,16 +62,7 @@ class LinuxHost final : public Host {
   LinuxSystemLog _systemLog;
   LinuxClockService _clock;
   LinuxNetworkTimeService _networkTime;
-  UnbuiltPowerSettings _powerSettings;
-  UnbuiltPowerController _powerController;
-  UnbuiltRemoteShell _remoteShell;
-  UnbuiltRemoteEvents _remoteEvents;
-  UnbuiltHostConfig _hostConfiguration;
-  UnbuiltDynamicStore _dynamicStore;
   LinuxBootLoaderFile _bootLoaderFile;
-  UnbuiltPreferences _preferences;
-  UnbuiltProcesses _processes;
-  UnbuiltStartupDisk _startupDisk;
 };
 
 }  // namespace tavisk
