@@ -12,7 +12,7 @@ import subprocess
 SUITE = "bookworm"
 COMMON = ["dbus", "libblkid1", "libedit2", "libpam-systemd", "libudev1", "login", "polkitd", "procps", "systemd",
           "systemd-sysv", "tzdata"]
-SERVER = ["busybox-static", "initramfs-tools", "kmod", "linux-image-amd64", "systemd-boot-efi", "systemd-timesyncd",
+SERVER = ["busybox-static", "ethtool", "initramfs-tools", "kmod", "linux-image-amd64", "systemd-boot-efi", "systemd-timesyncd",
           "udev", "zstd"]
 HOOK = pathlib.Path(__file__).with_name("tree-hook.sh")
 CACHE = pathlib.Path(os.environ.get("TAVISK_CACHE", "/var/cache/tavisk"))
