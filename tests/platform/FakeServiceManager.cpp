@@ -30,6 +30,25 @@ int listenAt(const std::filesystem::path& path) {
   return listener;
 }
 
+sd_bus* greeted(int connection) {
+  sd_bus* bus = nullptr;
+  sd_bus_new(&bus);
+  sd_bus_set_fd(bus, connection, connection);
+  sd_bus_set_server(bus, 1, SD_ID128_MAKE(1, 2, 3, 4, 5, 6, 7, 8, 9, a, b, c, d, e, f, 0));
+  sd_bus_start(bus);
+  return bus;
+}
+
+sd_bus* joined(const std::filesystem::path& socket) {
+  sd_bus* bus = nullptr;
+  sd_bus_new(&bus);
+  sd_bus_set_address(bus, ("unix:path=" + socket.string()).c_str());
+  sd_bus_set_bus_client(bus, 1);
+  if (sd_bus_start(bus) < 0 || sd_bus_request_name(bus, "org.freedesktop.systemd1", 0) < 0)
+    throw std::runtime_error("no place on the bus for the fake service manager");
+  return bus;
+}
+
 std::string firstText(sd_bus_message* message) {
   const char* text = "";
   sd_bus_message_read_basic(message, 's', &text);
@@ -55,8 +74,15 @@ std::string unitAt(const char* path) {
 
 }  // namespace
 
-FakeServiceManager::FakeServiceManager(const std::filesystem::path& socket)
-    : _listener(listenAt(socket)), _wake(::eventfd(0, EFD_CLOEXEC)), _thread([this] { serve(); }) {}
+FakeServiceManager::FakeServiceManager(const std::filesystem::path& socket, Reached reached)
+    : _wake(::eventfd(0, EFD_CLOEXEC)) {
+  if (reached == Reached::straight) {
+    _listener = listenAt(socket);
+    _thread = std::thread([this] { serveCallers(); });
+  } else {
+    _thread = std::thread([this, bus = joined(socket)] { serve(bus); });
+  }
+}
 
 FakeServiceManager::~FakeServiceManager() {
   ::eventfd_write(_wake, 1);
@@ -85,22 +111,17 @@ void FakeServiceManager::breakNext(const std::string& method, Fault fault) {
   _faults[method] = fault;
 }
 
-void FakeServiceManager::serve() {
+void FakeServiceManager::serveCallers() {
   pollfd waiting[] = {{_listener, POLLIN, 0}, {_wake, POLLIN, 0}};
-  while (::poll(waiting, 2, -1) > 0 && waiting[1].revents == 0) serveOne(::accept(_listener, nullptr, nullptr));
+  while (::poll(waiting, 2, -1) > 0 && waiting[1].revents == 0) serve(greeted(::accept(_listener, nullptr, nullptr)));
 }
 
-void FakeServiceManager::serveOne(int connection) {
-  sd_bus* bus = nullptr;
-  sd_bus_new(&bus);
-  sd_bus_set_fd(bus, connection, connection);
-  sd_bus_set_server(bus, 1, SD_ID128_MAKE(1, 2, 3, 4, 5, 6, 7, 8, 9, a, b, c, d, e, f, 0));
+void FakeServiceManager::serve(sd_bus* bus) {
   auto filter = [](sd_bus_message* message, void* manager, sd_bus_error* error) {
     return receive(message, manager, error);
   };
   sd_bus_add_filter(bus, nullptr, filter, this);
   _hangUp = false;
-  sd_bus_start(bus);
   while (!_hangUp && sd_bus_is_open(bus) > 0) {
     int result = sd_bus_process(bus, nullptr);
     if (result < 0) break;
@@ -137,6 +158,7 @@ int FakeServiceManager::answerFault(sd_bus_message* message, Fault fault) {
 
 int FakeServiceManager::answer(sd_bus_message* message, const std::string& member) {
   if (member == "Get") return answerProperty(message);
+  if (member == "GetAll") return answerAllProperties(message);
   if (member == "LoadUnit") return sd_bus_reply_method_return(message, "o", pathOf(firstText(message)).c_str());
   if (member == "GetUnitFileState")
     return sd_bus_reply_method_return(message, "s", _units[firstText(message)].file.c_str());
@@ -147,10 +169,19 @@ int FakeServiceManager::answer(sd_bus_message* message, const std::string& membe
   return member.ends_with("Files") ? answerFiles(message, member) : answerJob(message, member);
 }
 
+FakeUnit FakeServiceManager::unitOf(sd_bus_message* message) {
+  auto known = _units.find(unitAt(sd_bus_message_get_path(message)));
+  return known == _units.end() ? FakeUnit{"not-found"} : known->second;
+}
+
+int FakeServiceManager::answerAllProperties(sd_bus_message* message) {
+  const auto state = unitOf(message);
+  return sd_bus_reply_method_return(message, "a{sv}", 3, "LoadState", "s", state.load.c_str(), "ActiveState", "s",
+                                    state.active.c_str(), "UnitFileState", "s", state.file.c_str());
+}
+
 int FakeServiceManager::answerProperty(sd_bus_message* message) {
-  const auto unit = unitAt(sd_bus_message_get_path(message));
-  auto known = _units.find(unit);
-  const auto state = known == _units.end() ? FakeUnit{"not-found"} : known->second;
+  const auto state = unitOf(message);
   firstText(message);
   const auto name = firstText(message);
   if (name == "LoadState") return sd_bus_reply_method_return(message, "v", "s", state.load.c_str());

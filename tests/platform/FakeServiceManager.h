@@ -24,10 +24,12 @@ struct FakeUnit {
   bool conditionHolds = true;      ///< else a job is done and the unit stays as it is
 };
 
-/// Serves the interface of the service manager on a socket, straight to each caller, from a thread of its own.
+/// Serves the interface of the service manager from a thread of its own.
 class FakeServiceManager {
  public:
-  explicit FakeServiceManager(const std::filesystem::path& socket);
+  /// At a socket of its own, straight to each caller; or over the message bus whose socket it is.
+  enum class Reached { straight, overBus };
+  explicit FakeServiceManager(const std::filesystem::path& socket, Reached reached = Reached::straight);
   FakeServiceManager(const FakeServiceManager&) = delete;
   FakeServiceManager& operator=(const FakeServiceManager&) = delete;
   ~FakeServiceManager();
@@ -45,12 +47,14 @@ class FakeServiceManager {
   int answer(sd_bus_message* message, const std::string& member);
   int answerFault(sd_bus_message* message, Fault fault);
   int answerProperty(sd_bus_message* message);
+  int answerAllProperties(sd_bus_message* message);
+  FakeUnit unitOf(sd_bus_message* message);
   int answerJob(sd_bus_message* message, const std::string& member);
   int answerFiles(sd_bus_message* message, const std::string& member);
-  void serve();
-  void serveOne(int connection);
+  void serveCallers();
+  void serve(sd_bus* bus);
 
-  int _listener;
+  int _listener = -1;
   int _wake;
   std::mutex _mutex;
   std::map<std::string, FakeUnit> _units;

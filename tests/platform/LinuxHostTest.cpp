@@ -1,11 +1,9 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "LinuxTree.h"
+#include "LinuxContractMachines.h"
 #include "contract/AdminAuthenticatorContract.h"
 #include "contract/BootLoaderFileContract.h"
-#include "contract/ClockContract.h"
 #include "contract/FileSystemContract.h"
-#include "contract/NetworkTimeContract.h"
 
 namespace tavisk {
 namespace {
@@ -25,21 +23,7 @@ struct LinuxAuthenticator {
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, AdminAuthenticatorContract, LinuxAuthenticator);
 
-struct LinuxClock {
-  static constexpr bool setsClock = false;
-  ClockService& service() { return tree.host().clock(); }
-  void haveZones(const std::vector<std::string>& names) {
-    for (const auto& name : names) tree.write("/usr/share/zoneinfo/" + name, "TZif");
-  }
-  std::vector<std::string> effects() {
-    std::vector<std::string> effects;
-    for (const auto& line : tree.log.lines)
-      if (line.find("\"outcome\"") != std::string::npos) effects.push_back(line);
-    return effects;
-  }
-  LinuxTree tree;
-};
-INSTANTIATE_TYPED_TEST_SUITE_P(Linux, ClockContract, LinuxClock);
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, ClockContract, ClockOf<LinuxTree>);
 
 struct LinuxFiles {
   FileSystem& service() { return tree.host().files(); }

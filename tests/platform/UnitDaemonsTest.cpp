@@ -3,8 +3,7 @@
 #include <gmock/gmock.h>
 
 #include "FakeServiceManager.h"
-#include "LinuxTree.h"
-#include "contract/NetworkTimeContract.h"
+#include "LinuxContractMachines.h"
 
 namespace tavisk {
 namespace {
@@ -15,23 +14,12 @@ using Fault = FakeServiceManager::Fault;
 /// A machine whose message bus is down, with a service manager and chrony.
 class ManagedTree : public LinuxTree {
  public:
-  ManagedTree() : manager((write("/run/systemd/system/x", ""), at("/run/systemd/private"))) {
-    manager.set(chrony, {});
-    write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\n");
-    writeProgram("/usr/bin/chronyc", "#!/bin/sh\n");
-  }
+  ManagedTree() : manager((write("/run/systemd/system/x", ""), at("/run/systemd/private"))) { haveChrony(*this); }
 
-  static constexpr const char* chrony = "chrony.service";
   FakeServiceManager manager;
 };
 
-struct ManagedNetworkTime {
-  static constexpr bool takesAnyText = false;
-  NetworkTimeService& service() { return tree.host().networkTime(); }
-  bool launchesAtStartup() { return tree.manager.get(ManagedTree::chrony).file == "enabled"; }
-  ManagedTree tree;
-};
-INSTANTIATE_TYPED_TEST_SUITE_P(LinuxWithUnits, NetworkTimeContract, ManagedNetworkTime);
+INSTANTIATE_TYPED_TEST_SUITE_P(LinuxWithUnits, NetworkTimeContract, NetworkTimeOf<ManagedTree>);
 
 TEST(UnitDaemons, EnablesAndReloadsBeforeItStarts) {
   ManagedTree tree;
@@ -48,7 +36,7 @@ TEST(UnitDaemons, PrefersTheFirstLoadedAndNeverUnmasks) {
   auto& client = tree.host().networkTime();
   tree.manager.set("ntpsec.service", {.active = "activating"});
   EXPECT_FALSE(client.isRunning()) << "chrony comes first";
-  tree.manager.set(ManagedTree::chrony, {.load = "masked"});
+  tree.manager.set(chrony, {.load = "masked"});
   EXPECT_TRUE(client.isRunning());
   tree.manager.set("ntpsec.service", {.load = "not-found"});
   EXPECT_FALSE(client.isRunning());
@@ -59,7 +47,7 @@ TEST(UnitDaemons, PrefersTheFirstLoadedAndNeverUnmasks) {
 
 TEST(UnitDaemons, RestartsOtherClientsWithoutWaiting) {
   ManagedTree tree;
-  tree.manager.set(ManagedTree::chrony, {.load = "not-found"});
+  tree.manager.set(chrony, {.load = "not-found"});
   tree.manager.set("systemd-timesyncd.service", {.active = "active", .jobResult = ""});
   tree.host().networkTime().restartAsynchronously();
   EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"applied")"));
@@ -77,7 +65,7 @@ TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
   };
   for (const auto& [unit, fault, why] : cases) {
     ManagedTree tree;
-    tree.manager.set(ManagedTree::chrony, unit);
+    tree.manager.set(chrony, unit);
     if (fault) tree.manager.breakNext("StartUnit", *fault);
     tree.host().networkTime().start();
     EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("StartUnit"), HasSubstr(why)));

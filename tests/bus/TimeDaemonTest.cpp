@@ -1,0 +1,75 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "BusTree.h"
+#include "platform/LinuxContractMachines.h"
+
+namespace tavisk {
+namespace {
+
+using testing::AllOf, testing::ElementsAreArray, testing::HasSubstr;
+
+class ChronyBusTree : public BusTree {
+ public:
+  ChronyBusTree() {
+    haveChrony(*this);
+    write("/etc/systemd/ntp-units.d/10-chrony.list", "chrony.service\n");
+  }
+};
+
+INSTANTIATE_TYPED_TEST_SUITE_P(OnTheBus, ClockContract, ClockOf<BusTree>);
+INSTANTIATE_TYPED_TEST_SUITE_P(OnTheBus, NetworkTimeContract, NetworkTimeOf<ChronyBusTree>);
+
+/// What the daemon itself answers.
+class TimeDaemon {
+ public:
+  explicit TimeDaemon(const BusTree& tree) : _root(tree.at("/")), _services(_root, _runLoop) {}
+  std::string zone() { return bus().property(object, "Timezone", "s").value().readText(); }
+  std::vector<std::string> zones() { return bus().call(object, "ListTimezones", "as").value().readTexts(); }
+
+ private:
+  Bus& bus() { return *_services.systemBus().value(); }
+  const BusObject object{"org.freedesktop.timedate1", "/org/freedesktop/timedate1", "org.freedesktop.timedate1"};
+  SystemRoot _root;
+  RunLoop _runLoop;
+  ServiceAccess _services;
+};
+
+TEST(TimeDaemon, KnowsTheZonesThatWeList) {
+  const auto names = contentsOf("/usr/share/zoneinfo/tzdata.zi");
+  BusTree tree;
+  tree.write("/usr/share/zoneinfo/tzdata.zi", names);
+  const auto zones = TimeDaemon(tree).zones();
+  EXPECT_GT(zones.size(), 400U);
+  EXPECT_THAT(tree.host().clock().knownTimeZones(), ElementsAreArray(zones));
+}
+
+TEST(TimeDaemon, IsToldTheZoneAndTheNameFileFollows) {
+  BusTree tree;
+  tree.write("/usr/share/zoneinfo/Asia/Tokyo", "TZif2");
+  tree.write("/etc/timezone", "Etc/UTC\n");
+  tree.host().clock().setTimeZone("/usr/share/zoneinfo/Asia/Tokyo");
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"applied")"));
+  EXPECT_EQ(tree.file("/etc/timezone"), "Asia/Tokyo\n");
+  EXPECT_EQ(TimeDaemon(tree).zone(), "Asia/Tokyo");
+
+  tree.host().clock().setTimeZone("/usr/share/zoneinfo/Mars/Olympus");
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("SetTimezone")));
+  EXPECT_EQ(TimeDaemon(tree).zone(), "Asia/Tokyo");
+}
+
+TEST(TimeDaemon, RefusesAClockThatIsOutOfReach) {
+  ChronyBusTree tree;
+  tree.host().clock().setTime(1'166'999'400);
+  EXPECT_THAT(tree.lastTold(),
+              AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("SetTime"), HasSubstr("no CAP_SYS_TIME here")));
+}
+
+TEST(TimeDaemon, LeavesToUsTheClockThatAClientHolds) {
+  ChronyBusTree tree;
+  tree.manager.set(chrony, {.active = "active", .file = "enabled"});
+  tree.host().clock().setTime(1'166'999'400);
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr("the network-time client"), HasSubstr("a tree of files has no clock")));
+}
+
+}  // namespace
+}  // namespace tavisk
