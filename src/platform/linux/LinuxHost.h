@@ -10,6 +10,8 @@
 #include "platform/linux/LinuxAdminAuthenticator.h"
 #include "platform/linux/LinuxBootLoaderFile.h"
 #include "platform/linux/LinuxClockService.h"
+#include "platform/linux/LinuxDynamicStore.h"
+#include "platform/linux/LinuxHostConfigService.h"
 #include "platform/linux/LinuxMachine.h"
 #include "platform/linux/LinuxNetworkTimeService.h"
 #include "platform/linux/LinuxSystemLog.h"
@@ -35,8 +37,8 @@ class LinuxHost final : public Host {
   PowerController& powerController() override { throw NotBuiltYet(); }
   RemoteShellService& remoteShell() override { throw NotBuiltYet(); }
   RemoteEventsService& remoteEvents() override { throw NotBuiltYet(); }
-  HostConfigService& hostConfiguration() override { throw NotBuiltYet(); }
-  DynamicStore& dynamicStore() override { throw NotBuiltYet(); }
+  HostConfigService& hostConfiguration() override { return _hostConfiguration; }
+  DynamicStore& dynamicStore() override { return _dynamicStore; }
   BootLoaderFile& bootLoaderFile() override { return _bootLoaderFile; }
   PreferencesStore& preferences() override { throw NotBuiltYet(); }
   ProcessUtilities& processes() override { throw NotBuiltYet(); }
@@ -62,6 +64,8 @@ class LinuxHost final : public Host {
   LinuxSystemLog _systemLog;
   LinuxClockService _clock;
   LinuxNetworkTimeService _networkTime;
+  LinuxHostConfigService _hostConfiguration;
+  LinuxDynamicStore _dynamicStore;
   LinuxBootLoaderFile _bootLoaderFile;
 };
 

@@ -1,0 +1,19 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace tavisk {
+
+/// The value of a variable in a text of shell-like assignments, one a line (os-release(5) describes the format); of
+/// several assignments the last one counts. Absent when there is none.
+std::optional<std::string> assignedValue(std::string_view text, std::string_view variable);
+
+/// The text with this value, quoted, in place of the variable's assignments or else at the end; an empty value takes
+/// them out. All other lines stay as they are. The value holds no newline.
+std::string withAssignment(std::string_view text, std::string_view variable, std::string_view value);
+
+}  // namespace tavisk
