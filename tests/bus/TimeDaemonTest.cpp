@@ -57,6 +57,18 @@ TEST(TimeDaemon, IsToldTheZoneAndTheNameFileFollows) {
   EXPECT_EQ(TimeDaemon(tree).zone(), "Asia/Tokyo");
 }
 
+TEST(TimeDaemon, IsPassedByWhereItTakesAChangeForNone) {
+  BusTree tree;
+  for (const char* zone : {"UTC", "Asia/Tokyo"}) tree.write(std::string("/usr/share/zoneinfo/") + zone, "TZif2");
+  EXPECT_EQ(TimeDaemon(tree).zone(), "UTC");
+  for (const char* change : {"no link", "another link since"}) {
+    tree.host().clock().setTimeZone("/usr/share/zoneinfo/UTC");
+    EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"applied")")) << change;
+    EXPECT_EQ(std::filesystem::read_symlink(tree.at("/etc/localtime")), "../usr/share/zoneinfo/UTC") << change;
+    tree.link("/etc/localtime", "../usr/share/zoneinfo/Asia/Tokyo");
+  }
+}
+
 TEST(TimeDaemon, RefusesAClockThatIsOutOfReach) {
   ChronyBusTree tree;
   tree.host().clock().setTime(1'166'999'400);

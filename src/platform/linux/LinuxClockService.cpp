@@ -145,7 +145,8 @@ Result<void> LinuxClockService::changeTimeZone(const std::string& zone) {
   if (auto bus = _machine.services.systemBus()) {
     auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone, (*bus)->isInteractive());
     if (!set && !leavesItToOthers(set.failure())) return set.failure();
-    if (set) return updateNameFile(zone);
+    // The daemon does nothing for the zone that it found when it started, whatever the link says since.
+    if (set && machineTimeZone(_machine.root) == zone) return updateNameFile(zone);
   }
   return changeTimeZoneDirectly(zone);
 }
