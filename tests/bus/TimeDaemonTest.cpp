@@ -83,5 +83,16 @@ TEST(TimeDaemon, LeavesToUsTheClockThatAClientHolds) {
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr("the network-time client"), HasSubstr("a tree of files has no clock")));
 }
 
+TEST(TimeDaemon, TellsTheServerInUseWhereNoneIsConfigured) {
+  BusTree tree;
+  tree.manager.set("systemd-timesyncd.service", {});
+  EXPECT_EQ(tree.host().networkTime().server().address, "");
+  tree.manager.set("systemd-timesyncd.service", {.active = "active"});
+  EXPECT_EQ(tree.host().networkTime().server().address, "fallback.example");
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("live":"fallback.example")"));
+  tree.host().networkTime().setServer({"time.example"});
+  EXPECT_EQ(tree.host().networkTime().server().address, "time.example");
+}
+
 }  // namespace
 }  // namespace tavisk

@@ -44,7 +44,8 @@ sd_bus* joined(const std::filesystem::path& socket) {
   sd_bus_new(&bus);
   sd_bus_set_address(bus, ("unix:path=" + socket.string()).c_str());
   sd_bus_set_bus_client(bus, 1);
-  if (sd_bus_start(bus) < 0 || sd_bus_request_name(bus, "org.freedesktop.systemd1", 0) < 0)
+  if (sd_bus_start(bus) < 0 || sd_bus_request_name(bus, "org.freedesktop.systemd1", 0) < 0 ||
+      sd_bus_request_name(bus, "org.freedesktop.timesync1", 0) < 0)
     throw std::runtime_error("no place on the bus for the fake service manager");
   return bus;
 }
@@ -186,6 +187,7 @@ int FakeServiceManager::answerProperty(sd_bus_message* message) {
   const auto name = firstText(message);
   if (name == "LoadState") return sd_bus_reply_method_return(message, "v", "s", state.load.c_str());
   if (name == "ActiveState") return sd_bus_reply_method_return(message, "v", "s", state.active.c_str());
+  if (name == "ServerName") return sd_bus_reply_method_return(message, "v", "s", "fallback.example");
   if (name == "ConditionResult") return sd_bus_reply_method_return(message, "v", "b", state.conditionHolds ? 1 : 0);
   return sd_bus_reply_method_return(message, "v", "a(sbbsi)", 2, "ConditionCapability", 0, 0, "CAP_SYS_TIME", 1,
                                     "ConditionVirtualization", 0, 1, "container", -1);

@@ -27,7 +27,8 @@ struct FakeUnit {
 /// Serves the interface of the service manager from a thread of its own.
 class FakeServiceManager {
  public:
-  /// At a socket of its own, straight to each caller; or over the message bus whose socket it is.
+  /// At a socket of its own, straight to each caller; or over the message bus whose socket it is, also as the
+  /// systemd-timesyncd that uses fallback.example.
   enum class Reached { straight, overBus };
   explicit FakeServiceManager(const std::filesystem::path& socket, Reached reached = Reached::straight);
   FakeServiceManager(const FakeServiceManager&) = delete;

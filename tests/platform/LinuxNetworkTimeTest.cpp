@@ -72,10 +72,14 @@ TEST(LinuxNetworkTime, WritesTheServerWhereTheClientReadsIt) {
   EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"applied")"));
   EXPECT_EQ(tree.file("/reloaded"), "reload sources LC_ALL=C\nPATH=/usr/sbin:/usr/bin:/sbin:/bin\n");
 
+  tree.write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\npool pool.example iburst\n");
+  client.setServer({"next.example"});
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("note":"configured elsewhere, pool.example stays in use beside it")"));
+
   tree.write("/etc/chrony/chrony.conf", "pool pool.example iburst\n");
   client.setServer({"other.example"});
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("sourcedir")));
-  EXPECT_EQ(client.server().address, "time.example");
+  EXPECT_EQ(client.server().address, "pool.example") << "chronyd does not read the tool's own file any more";
 }
 
 TEST(LinuxNetworkTime, TellsWhenSuccessChangedNothing) {
@@ -148,6 +152,15 @@ TEST(TimeDaemons, ReadServersAsNtpdDoes) {
        "own.example"},
   };
   for (const auto& each : cases) EXPECT_EQ(firstServer("ntpd", each), each.server) << each.files[0].second;
+}
+
+TEST(LinuxNetworkTime, LeavesTheFileOfOpenntpdAlone) {
+  LinuxTree tree;
+  tree.writeProgram("/etc/init.d/openntpd", "#!/bin/sh\n");
+  tree.write("/etc/openntpd/ntpd.conf", "listen on *\nservers pool.example weight 5\n");
+  tree.host().networkTime().setServer({"time.example"});
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("/etc/openntpd/ntpd.conf")));
+  EXPECT_EQ(tree.host().networkTime().server().address, "pool.example");
 }
 
 TEST(HostName, IsOneWordThatNamesAHost) {

@@ -114,15 +114,36 @@ Setting LinuxNetworkTimeService::serverSetting() {
   return setting;
 }
 
+/// A server that the network offered, or the daemon's own last resort.
+std::string LinuxNetworkTimeService::serverInUseWithoutAny() {
+  auto found = client();
+  if (!found || *found == nullptr || (*found)->busService == nullptr || !(*found)->server(_machine.root).empty())
+    return {};
+  auto bus = _machine.services.systemBus();
+  if (!bus || !daemons().isRunning((*found)->daemon).valueOr(false)) return {};
+  const BusObject manager{(*found)->busService, "/org/freedesktop/timesync1", "org.freedesktop.timesync1.Manager"};
+  auto name = (*bus)->property(manager, "ServerName", "s");
+  return name ? std::move(name).value().readText() : std::string();
+}
+
 NetworkTimeServer LinuxNetworkTimeService::server() {
-  return {observe(serverSetting(), _machine.effects).value_or("")};
+  auto setting = serverSetting();
+  if (auto inUse = serverInUseWithoutAny(); !inUse.empty()) setting.live = [inUse] { return Value(inUse); };
+  return {observe(setting, _machine.effects).value_or("")};
+}
+
+std::string LinuxNetworkTimeService::whatStaysInUse(const TimeDaemon& client) const {
+  auto other = client.otherServer == nullptr ? std::string() : client.otherServer(_machine.root);
+  return other.empty() ? other : "configured elsewhere, " + other + " stays in use beside it";
 }
 
 void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
   auto setting = serverSetting();
   if (auto found = client(); found && *found != nullptr) {
     setting.where = (*found)->serverFile;
-    setting.supported = [this, client = *found] { return client->whyNotRead(_machine.root); };
+    setting.note = whatStaysInUse(**found);
+    if ((*found)->whyNotRead != nullptr)
+      setting.supported = [this, client = *found] { return client->whyNotRead(_machine.root); };
   }
   setting.store = [this](const std::string& address) {
     return withClient<void>([&](const TimeDaemon& client) { return storeServer(client, address); });

@@ -33,6 +33,8 @@ class LinuxNetworkTimeService : public NetworkTimeService {
   Setting named(const char* name);
   Setting runningSetting();
   Setting serverSetting();
+  std::string serverInUseWithoutAny();
+  std::string whatStaysInUse(const TimeDaemon& client) const;
   void change(const Setting& setting, const std::string& asked);
   Result<void> storeServer(const TimeDaemon& client, const std::string& address);
   Result<void> reload(const TimeDaemon& client);

@@ -13,10 +13,12 @@ namespace tavisk {
 namespace {
 
 constexpr std::size_t fileLimit = std::size_t{1} << 20U;
+constexpr const char* ownPrefix = "60-tavisk.";
 constexpr const char* chronyConfig = "/etc/chrony/chrony.conf";
 constexpr const char* chronyServerFile = "/etc/chrony/sources.d/60-tavisk.sources";
 constexpr const char* ntpsecConfig = "/etc/ntpsec/ntp.conf";
 constexpr const char* ntpsecServerFile = "/etc/ntpsec/ntp.d/60-tavisk.conf";
+constexpr const char* openntpdConfig = "/etc/openntpd/ntpd.conf";
 constexpr const char* timesyncdServerFile = "/etc/systemd/timesyncd.conf.d/60-tavisk.conf";
 
 /// The lines of a file as words: chrony.conf(5) and ntp.conf(5) agree on comments and on one directive a line.
@@ -33,7 +35,7 @@ std::vector<std::vector<std::string>> directives(const SystemRoot& root, const s
 
 /// The server that a directive names; empty when it names none.
 std::string serverOf(const std::vector<std::string>& directive) {
-  constexpr std::string_view kinds[] = {"server", "pool", "peer"};
+  constexpr std::string_view kinds[] = {"server", "servers", "pool", "peer"};
   if (directive.size() < 2 || std::ranges::find(kinds, directive[0]) == std::end(kinds)) return {};
   return directive[1];
 }
@@ -44,16 +46,17 @@ std::string firstServer(const SystemRoot& root, const std::string& file) {
   return {};
 }
 
+/// The tool's own file aside.
 std::string firstServerInFolder(const SystemRoot& root, const std::string& folder, std::string_view ending) {
   for (const auto& name : root.list(folder).valueOr({})) {
-    if (!name.ends_with(ending)) continue;
+    if (!name.ends_with(ending) || name.starts_with(ownPrefix)) continue;
     if (auto server = firstServer(root, (folder + "/").append(name)); !server.empty()) return server;
   }
   return {};
 }
 
 /// As chronyd reads its configuration: "confdir" and "sourcedir" lines take in the files of folders.
-std::string chronyConfiguredServer(const SystemRoot& root) {
+std::string chronyOtherServer(const SystemRoot& root) {
   for (const auto& directive : directives(root, chronyConfig)) {
     auto server = serverOf(directive);
     for (std::size_t i = 1; i < directive.size() && server.empty(); ++i) {
@@ -65,11 +68,6 @@ std::string chronyConfiguredServer(const SystemRoot& root) {
   return {};
 }
 
-std::string chronyServer(const SystemRoot& root) {
-  auto own = firstServer(root, chronyServerFile);
-  return own.empty() ? chronyConfiguredServer(root) : own;
-}
-
 std::optional<Failure> chronyWhyNotRead(const SystemRoot& root) {
   for (const auto& directive : directives(root, chronyConfig))
     if (directive[0] == "sourcedir" && std::ranges::find(directive, "/etc/chrony/sources.d") != directive.end())
@@ -79,10 +77,27 @@ std::optional<Failure> chronyWhyNotRead(const SystemRoot& root) {
       "chronyd does not read it: " + std::string(chronyConfig) + " has no line \"sourcedir /etc/chrony/sources.d\""};
 }
 
+std::string ntpsecOtherServer(const SystemRoot& root) {
+  auto server = firstServer(root, ntpsecConfig);
+  return server.empty() ? firstServerInFolder(root, "/etc/ntpsec/ntp.d", ".conf") : server;
+}
+
+std::string chronyServer(const SystemRoot& root) {
+  auto own = chronyWhyNotRead(root) ? std::string() : firstServer(root, chronyServerFile);
+  return own.empty() ? chronyOtherServer(root) : own;
+}
+
 std::string ntpsecServer(const SystemRoot& root) {
   auto own = firstServer(root, ntpsecServerFile);
-  if (own.empty()) own = firstServer(root, ntpsecConfig);
-  return own.empty() ? firstServerInFolder(root, "/etc/ntpsec/ntp.d", ".conf") : own;
+  return own.empty() ? ntpsecOtherServer(root) : own;
+}
+
+std::string openntpdServer(const SystemRoot& root) {
+  return firstServer(root, openntpdConfig);
+}
+
+std::optional<Failure> openntpdWhyNotRead(const SystemRoot&) {
+  return Failure{"set the server", openntpdConfig, "openntpd reads this file only, and it is the administrator's"};
 }
 
 std::string timesyncdServer(const SystemRoot& root) {
@@ -99,26 +114,31 @@ std::string timesyncdLines(const std::string& server) {
   return dropInHeader + ("[Time]\nNTP=\nNTP=" + server) + "\n";
 }
 
-std::optional<Failure> alwaysRead(const SystemRoot&) {
-  return std::nullopt;
-}
-
 constexpr const char* chronyReload[] = {"/usr/bin/chronyc", "reload", "sources"};
 
 constexpr TimeDaemon daemons[] = {
-    {{"chrony.service", "chrony", "chronyd"},
-     chronyServerFile,
-     chronyServer,
-     serverDirective,
-     chronyWhyNotRead,
-     chronyReload},
-    {{"ntpsec.service", "ntpsec", "ntpd"}, ntpsecServerFile, ntpsecServer, serverDirective, alwaysRead, {}},
-    {{"systemd-timesyncd.service", "", "systemd-timesyncd"},
-     timesyncdServerFile,
-     timesyncdServer,
-     timesyncdLines,
-     alwaysRead,
-     {}},
+    {.daemon = {"chrony.service", "chrony", "chronyd"},
+     .serverFile = chronyServerFile,
+     .server = chronyServer,
+     .otherServer = chronyOtherServer,
+     .serverLines = serverDirective,
+     .whyNotRead = chronyWhyNotRead,
+     .reload = chronyReload},
+    {.daemon = {"ntpsec.service", "ntpsec", "ntpd"},
+     .serverFile = ntpsecServerFile,
+     .server = ntpsecServer,
+     .otherServer = ntpsecOtherServer,
+     .serverLines = serverDirective},
+    {.daemon = {"openntpd.service", "openntpd", "ntpd"},
+     .serverFile = openntpdConfig,
+     .server = openntpdServer,
+     .serverLines = serverDirective,
+     .whyNotRead = openntpdWhyNotRead},
+    {.daemon = {"systemd-timesyncd.service", "", "systemd-timesyncd"},
+     .serverFile = timesyncdServerFile,
+     .server = timesyncdServer,
+     .serverLines = timesyncdLines,
+     .busService = "org.freedesktop.timesync1"},
 };
 
 }  // namespace

@@ -19,12 +19,17 @@ struct TimeDaemon {
 
   /// The server that comes first: the tool's own, else the first one configured; empty when there is none.
   std::string (*server)(const SystemRoot& root);
+  /// The first server that stays in use beside the tool's own; null: the tool's own takes the place of all others.
+  std::string (*otherServer)(const SystemRoot& root) = nullptr;
   /// The contents of the server file.
   std::string (*serverLines)(const std::string& server);
-  /// Why the daemon would not read the server file; absent when it does.
-  std::optional<Failure> (*whyNotRead)(const SystemRoot& root);
+  /// Why the daemon would not read the server file; null: it does.
+  std::optional<Failure> (*whyNotRead)(const SystemRoot& root) = nullptr;
   /// The program by which the running daemon reads its servers again, with its arguments; without one it is restarted.
-  std::span<const char* const> reload;
+  std::span<const char* const> reload = {};
+  /// Where the running daemon tells which server it uses when none is configured (org.freedesktop.timesync1(5)); null:
+  /// it uses none then.
+  const char* busService = nullptr;
 };
 
 /// The daemons that this host knows, the preferred one first.
