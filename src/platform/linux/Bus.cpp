@@ -106,6 +106,16 @@ bool Bus::wasSilent(const BusObject& object) const {
 
 Result<BusMessage> Bus::call(const BusObject& object, const char* member, const char* replySignature,
                              const Writer& arguments, std::chrono::seconds longest) {
+  return exchange(object, member, replySignature, arguments, _interactive, _interactive ? timeForQuestions : longest);
+}
+
+Result<BusMessage> Bus::query(const BusObject& object, const char* member, const char* replySignature,
+                              const Writer& arguments) {
+  return exchange(object, member, replySignature, arguments, false, usualTime);
+}
+
+Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, const char* replySignature,
+                                 const Writer& arguments, bool mayAsk, std::chrono::seconds longest) {
   if (wasSilent(object)) return Failure{member, object.path, "this service has just left a call without an answer"};
   sd_bus_message* handle = nullptr;
   int result = _library.sd_bus_message_new_method_call(_bus, &handle, destination(object), object.path.c_str(),
@@ -114,12 +124,11 @@ Result<BusMessage> Bus::call(const BusObject& object, const char* member, const 
   BusMessage request(_library, handle);
   arguments(request);
   if (request.error() < 0) return systemFailure(member, object.path, -request.error());
-  _library.sd_bus_message_set_allow_interactive_authorization(handle, _interactive ? 1 : 0);
+  _library.sd_bus_message_set_allow_interactive_authorization(handle, mayAsk ? 1 : 0);
 
   BusError error(_library);
   sd_bus_message* answer = nullptr;
-  auto time = microseconds(_interactive ? timeForQuestions : longest);
-  result = _library.sd_bus_call(_bus, handle, time, error.handle(), &answer);
+  result = _library.sd_bus_call(_bus, handle, microseconds(longest), error.handle(), &answer);
   if (result == -ETIMEDOUT) _silentSince[object.service] = std::chrono::steady_clock::now();
   if (result < 0) return error.failure(member, object, result);
   BusMessage reply(_library, answer);
@@ -130,7 +139,7 @@ Result<BusMessage> Bus::call(const BusObject& object, const char* member, const 
 
 Result<BusMessage> Bus::property(const BusObject& object, const char* name, const char* signature) {
   const BusObject properties{object.service, object.path, "org.freedesktop.DBus.Properties"};
-  auto reply = call(properties, "Get", "v", object.interface, name);
+  auto reply = query(properties, "Get", "v", object.interface, name);
   if (!reply) return Failure{name, object.path, reply.failure().why};
   auto value = std::move(reply).value();
   if (!value.enter('v', signature)) return Failure{name, object.path, "the value has another type than expected"};

@@ -63,6 +63,14 @@ class Bus {
                           const Arguments&... arguments) {
     return call(object, member, replySignature, Writer([&](BusMessage& message) { (message.write(arguments), ...); }));
   }
+  /// As call(), of what only reads: the user is not asked, and it takes no longer than usual.
+  Result<BusMessage> query(const BusObject& object, const char* member, const char* replySignature,
+                           const Writer& arguments);
+  template <typename... Arguments>
+  Result<BusMessage> query(const BusObject& object, const char* member, const char* replySignature,
+                           const Arguments&... arguments) {
+    return query(object, member, replySignature, Writer([&](BusMessage& message) { (message.write(arguments), ...); }));
+  }
   /// The value of a property, ready to be read.
   Result<BusMessage> property(const BusObject& object, const char* name, const char* signature);
 
@@ -95,6 +103,8 @@ class Bus {
   Bus(const SystemdLibrary& library, sd_bus* bus, Kind kind);
   int start(const FileDescriptor& connection);
   int awaitReady();
+  Result<BusMessage> exchange(const BusObject& object, const char* member, const char* replySignature,
+                              const Writer& arguments, bool mayAsk, std::chrono::seconds longest);
   const char* destination(const BusObject& object) const;
   bool wasSilent(const BusObject& object) const;
 

@@ -72,9 +72,17 @@ class EndedJobs {
 
 }  // namespace
 
+Result<BusMessage> UnitDaemons::ask(const Daemon& daemon, const char* member, const char* replySignature) {
+  auto bus = _services.serviceManager();
+  if (!bus) return bus.failure();
+  auto reply = (*bus)->query(manager(), member, replySignature, daemon.unit);
+  if (!reply) return about(daemon, reply.failure());
+  return reply;
+}
+
 template <typename... Arguments>
-Result<BusMessage> UnitDaemons::ask(const Daemon& daemon, const char* member, const char* replySignature,
-                                    const Arguments&... arguments) {
+Result<BusMessage> UnitDaemons::order(const Daemon& daemon, const char* member, const char* replySignature,
+                                      const Arguments&... arguments) {
   auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
   auto reply = (*bus)->call(manager(), member, replySignature, arguments...);
@@ -83,7 +91,7 @@ Result<BusMessage> UnitDaemons::ask(const Daemon& daemon, const char* member, co
 }
 
 Result<BusMessage> UnitDaemons::unitProperty(const Daemon& daemon, const char* name, const char* signature) {
-  auto unit = ask(daemon, "LoadUnit", "o", daemon.unit);
+  auto unit = ask(daemon, "LoadUnit", "o");
   if (!unit) return unit.failure();
   auto path = std::move(unit).value().readText();
   auto bus = _services.serviceManager();
@@ -109,7 +117,7 @@ Result<bool> UnitDaemons::isRunning(const Daemon& daemon) {
 }
 
 Result<bool> UnitDaemons::startsAtBoot(const Daemon& daemon) {
-  auto state = ask(daemon, "GetUnitFileState", "s", daemon.unit);
+  auto state = ask(daemon, "GetUnitFileState", "s");
   if (!state) return state.failure();
   return std::move(state).value().readText() == "enabled";
 }
@@ -118,8 +126,8 @@ Result<void> UnitDaemons::setStartsAtBoot(const Daemon& daemon, bool starts) {
   const std::vector<std::string> files{daemon.unit};
   constexpr bool untilRestart = false;
   constexpr bool replaceLinks = false;
-  auto changed = starts ? ask(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
-                        : ask(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
+  auto changed = starts ? order(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
+                        : order(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
   if (!changed) return changed.failure();
   auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
@@ -175,7 +183,7 @@ Result<void> UnitDaemons::stop(const Daemon& daemon) {
 }
 
 Result<void> UnitDaemons::restartIfRunning(const Daemon& daemon) {
-  auto job = ask(daemon, "TryRestartUnit", "o", daemon.unit, "replace");
+  auto job = order(daemon, "TryRestartUnit", "o", daemon.unit, "replace");
   if (!job) return job.failure();
   return {};
 }

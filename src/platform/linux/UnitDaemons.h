@@ -28,10 +28,12 @@ class UnitDaemons : public Daemons {
   Result<void> restartIfRunning(const Daemon& daemon) override;
 
  private:
-  /// Calls the manager about a unit.
+  /// Asks the manager about a unit.
+  Result<BusMessage> ask(const Daemon& daemon, const char* member, const char* replySignature);
+  /// Has the manager change something about a unit.
   template <typename... Arguments>
-  Result<BusMessage> ask(const Daemon& daemon, const char* member, const char* replySignature,
-                         const Arguments&... arguments);
+  Result<BusMessage> order(const Daemon& daemon, const char* member, const char* replySignature,
+                           const Arguments&... arguments);
   Result<BusMessage> unitProperty(const Daemon& daemon, const char* name, const char* signature);
   /// Runs a job to its end.
   Result<void> runJob(const Daemon& daemon, const char* method);
