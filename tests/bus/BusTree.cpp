@@ -17,21 +17,23 @@ constexpr const char* policy =
 
 }  // namespace
 
-Overlaid::Overlaid(LinuxTree& tree, const char* folder) : _folder(folder) {
-  std::filesystem::create_directories(tree.at(folder));
-  if (::mount(tree.at(folder).c_str(), folder, nullptr, MS_BIND, nullptr) != 0)
-    throw std::runtime_error(std::string("no mount on ") + folder);
+Shown::Shown(const std::filesystem::path& source, const std::filesystem::path& place) : _place(place) {
+  if (::mount(source.c_str(), place.c_str(), nullptr, MS_BIND, nullptr) != 0)
+    throw std::runtime_error("no mount on " + place.string());
 }
 
-Overlaid::~Overlaid() {
-  ::umount2(_folder, MNT_DETACH);
+Shown::~Shown() {
+  ::umount2(_place.c_str(), MNT_DETACH);
 }
 
 MessageBus::MessageBus(LinuxTree& tree) {
   const std::string address = "unix:path=" + tree.at(socket).string();
   const std::string services = tree.at("/services");
-  tree.write("/services/org.freedesktop.timedate1.service",
-             "[D-BUS Service]\nName=org.freedesktop.timedate1\nExec=/lib/systemd/systemd-timedated\n");
+  for (const auto& [name, daemon] : {std::pair("timedate1", "timedated"), std::pair("hostname1", "hostnamed")}) {
+    const auto full = std::string("org.freedesktop.") + name;
+    tree.write("/services/" + full + ".service",
+               "[D-BUS Service]\nName=" + full + "\nExec=/lib/systemd/systemd-" + daemon + "\n");
+  }
   tree.write("/bus.conf", "<busconfig><listen>" + address + "</listen><servicedir>" + services + "</servicedir>" +
                               policy + "</busconfig>");
   std::filesystem::create_directories(tree.at(socket).parent_path());

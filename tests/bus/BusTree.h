@@ -9,16 +9,16 @@
 
 namespace tavisk {
 
-/// Shows a folder of the tree in the place of this machine's own, to all processes of the tests.
-class Overlaid {
+/// Shows a file or folder at another place, to all processes of the tests.
+class Shown {
  public:
-  Overlaid(LinuxTree& tree, const char* folder);
-  Overlaid(const Overlaid&) = delete;
-  Overlaid& operator=(const Overlaid&) = delete;
-  ~Overlaid();
+  Shown(const std::filesystem::path& source, const std::filesystem::path& place);
+  Shown(const Shown&) = delete;
+  Shown& operator=(const Shown&) = delete;
+  ~Shown();
 
  private:
-  const char* _folder;
+  std::filesystem::path _place;
 };
 
 /// The message bus of a tree, with the real daemons, which start when they are first called.
@@ -37,10 +37,20 @@ class MessageBus {
 };
 
 /// A tree of files with a message bus and the real daemons, which find the tree's files in /etc and among the zones.
-/// The service manager is a fake on the same bus.
+/// The kernel's host name is that of the tests. The service manager is a fake on the same bus.
 class BusTree : public LinuxTree {
-  Overlaid _etc{*this, "/etc"};
-  Overlaid _zones{*this, "/usr/share/zoneinfo"};
+  std::filesystem::path made(const char* file) {
+    write(std::string(file), "");
+    return at(file);
+  }
+  std::filesystem::path madeFolder(const char* folder) {
+    return made((std::string(folder) + "/x").c_str()).parent_path();
+  }
+
+  static constexpr const char* _kernelName = "/proc/sys/kernel/hostname";
+  Shown _name{_kernelName, made(_kernelName)};
+  Shown _etc{madeFolder("/etc"), "/etc"};
+  Shown _zones{madeFolder("/usr/share/zoneinfo"), "/usr/share/zoneinfo"};
   MessageBus _bus{*this};
 
  public:

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "BusTree.h"
 #include "platform/LinuxContractMachines.h"
+#include "platform/contract/HostNamesContract.h"
 
 namespace tavisk {
 namespace {
@@ -18,6 +19,13 @@ class ChronyBusTree : public BusTree {
 
 INSTANTIATE_TYPED_TEST_SUITE_P(OnTheBus, ClockContract, ClockOf<BusTree>);
 INSTANTIATE_TYPED_TEST_SUITE_P(OnTheBus, NetworkTimeContract, NetworkTimeOf<ChronyBusTree>);
+
+struct NamesOnTheBus {
+  HostConfigService& configuration() { return tree.host().hostConfiguration(); }
+  DynamicStore& store() { return tree.host().dynamicStore(); }
+  BusTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(OnTheBus, HostNamesContract, NamesOnTheBus);
 
 /// What the daemon itself answers.
 class TimeDaemon {
@@ -92,6 +100,19 @@ TEST(TimeDaemon, TellsTheServerInUseWhereNoneIsConfigured) {
   EXPECT_THAT(tree.lastTold(), HasSubstr(R"("live":"fallback.example")"));
   tree.host().networkTime().setServer({"time.example"});
   EXPECT_EQ(tree.host().networkTime().server().address, "time.example");
+}
+
+TEST(NameDaemon, GivesTheMachineTheNameEverywhere) {
+  BusTree tree;
+  tree.write("/etc/hostname", "machine\n");
+  tree.write("/etc/hosts", "127.0.1.1\tmachine\n");
+  tree.host().hostConfiguration().setLocalNetworkName("mail-2.example");
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"applied")"), HasSubstr(R"("live":"mail-2.example")")));
+  EXPECT_EQ(tree.file("/etc/hostname"), "mail-2.example\n");
+  EXPECT_EQ(tree.file("/etc/hosts"), "127.0.1.1\tmail-2.example mail-2\n");
+  tree.host().hostConfiguration().setComputerName("Mail Server 2");
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"applied")"), HasSubstr(R"("live":"Mail Server 2")")));
+  EXPECT_EQ(tree.file("/etc/machine-info"), "PRETTY_HOSTNAME=\"Mail Server 2\"\n");
 }
 
 }  // namespace
