@@ -16,8 +16,8 @@
 #include "platform/linux/LinuxHost.h"
 #include "platform/scratch/ScratchHost.h"
 #include "terminal/SignalWaiter.h"
-#include "terminal/StreamLineSource.h"
 #include "terminal/Surroundings.h"
+#include "terminal/TerminalLineSource.h"
 #include "terminal/TerminalLog.h"
 
 namespace tavisk {
@@ -60,12 +60,13 @@ int run(Report* report, int argc, char** argv) {
   if (report) effects.addChannel(*report);
   if (TerminalLog::wanted()) effects.addChannel(log);
   RunLoop runLoop;
+  Output output(stdout);
+  TerminalLineSource input(output, runLoop);
+  log.printThrough([&input](const auto& print) { input.printAside(print); });
   const Result<std::unique_ptr<Host>> host = chooseHost(effects, runLoop);
   if (!host) return refuse(describe(host.failure()), report);
 
   NotificationCenter notifications;
-  Output output(stdout);
-  StreamLineSource input(stdin, output);
   RemoteServerSettings settings({**host, runLoop, notifications, output, input}, effects, report);
   const auto waiter = SignalWaiter::start(
       signals, [&](const std::string& signal) { settings.endedBySignal(signal); },

@@ -3,6 +3,7 @@
 #include <cstddef>
 #include <optional>
 
+#include "frontend/Completion.h"
 #include "frontend/RemoteServerSettings.h"
 #include "platform/Text.h"
 
@@ -28,7 +29,8 @@ bool RemoteServerSettings::doInteractiveTool() {
 }
 
 bool RemoteServerSettings::readInput() {
-  std::optional<std::string> line = _context.input.readLine("> ", lineBufferSize);
+  std::optional<std::string> line = _context.input.readCommandLine(
+      "> ", lineBufferSize, [this](const std::string& text) { return completions(text); });
   if (!line) {
     _context.output.putLine("Error: fgets returned NULL.");
     return false;
@@ -40,6 +42,14 @@ bool RemoteServerSettings::readInput() {
   if (!line->empty()) line->pop_back();
   parseCommand(getCommandArray(*line));
   return true;
+}
+
+std::vector<std::string> RemoteServerSettings::completions(const std::string& text) {
+  return completionsOf(text, [this](ArgumentKind kind) -> std::vector<std::string> {
+    if (kind == ArgumentKind::timeZone) return _context.host.clock().knownTimeZones();
+    if (kind == ArgumentKind::startupDisk) return _serverCommands->knownStartupDisks();
+    return {};
+  });
 }
 
 }  // namespace tavisk

@@ -78,6 +78,7 @@ class RemoteServerSettings {
 
   bool doInteractiveTool();
   bool readInput();
+  std::vector<std::string> completions(const std::string& text);
 
   CommandContext _context;
   EffectSink& _effects;

@@ -160,6 +160,8 @@ class ServerCommands {
   void listStartupDisk();
   void getStartupDisk();
   void setStartupDisk(const std::string& disk);
+  /// What a startup disk can be called, of the disks that a command of this run has found; searches for none.
+  std::vector<std::string> knownStartupDisks() const;
 
  private:
   /// True when the value is empty: then the usage was printed and the error flag set.

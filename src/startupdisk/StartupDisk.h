@@ -18,6 +18,8 @@ class StartupDisk {
 
   /// The one controller, made at the first call.
   SDController& sharedController();
+  /// Null before that call.
+  const SDController* madeController() const { return _controller.get(); }
 
  private:
   SDEnvironment _environment;

@@ -24,6 +24,16 @@ std::string systemFolderMeantBy(const std::string& disk, DiskEventSession& disks
   return "/Volumes/" + disk + coreServicesFolder;
 }
 
+/// The other way round: the shortest name by which a system folder is meant; absent when it has none.
+std::optional<std::string> nameMeaning(std::string_view folder, DiskEventSession& disks) {
+  if (folder == coreServicesFolder) return nameOfRoot(disks);
+  constexpr std::string_view volumes = "/Volumes/";
+  if (!folder.starts_with(volumes) || !folder.ends_with(coreServicesFolder)) return std::nullopt;
+  folder.remove_prefix(volumes.size());
+  folder.remove_suffix(std::string_view(coreServicesFolder).size());
+  return std::string(folder);
+}
+
 }  // namespace
 
 SDController& ServerCommands::sharedController() {
@@ -66,6 +76,20 @@ void ServerCommands::setStartupDisk(const std::string& disk) {
   }
   if (!matched) _context.output.print("Not a System Folder: %s\n", folder.c_str());
   setError(failed || !matched);
+}
+
+std::vector<std::string> ServerCommands::knownStartupDisks() const {
+  const SDController* controller = _startupDisk ? _startupDisk->madeController() : nullptr;
+  std::vector<std::string> names;
+  if (!controller) return names;
+  for (const auto& system : controller->systems()) {
+    const auto folder = system->textForKey(recordkey::systemFolderPath);
+    if (!folder) continue;
+    names.push_back(*folder);
+    const auto name = nameMeaning(*folder, _context.host.diskEvents());
+    if (name) names.push_back(*name);
+  }
+  return names;
 }
 
 HandlerRows startupDiskHandlers() {

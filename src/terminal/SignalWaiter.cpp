@@ -47,6 +47,9 @@ SignalWaiter::~SignalWaiter() {
 }
 
 void SignalWaiter::wait() {
+  sigset_t all;
+  sigfillset(&all);
+  pthread_sigmask(SIG_BLOCK, &all, nullptr);
   int signal = 0;
   sigwait(&_signals, &signal);
   State expected = State::waiting;

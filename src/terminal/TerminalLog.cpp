@@ -19,7 +19,7 @@ bool TerminalLog::wanted() {
 
 void TerminalLog::record(const Effect& effect) {
   if (!effect.failure) return;
-  complain(escaped(effect.setting) + ": " + describe(*effect.failure));
+  _printAside([&] { complain(escaped(effect.setting) + ": " + describe(*effect.failure)); });
 }
 
 }  // namespace tavisk

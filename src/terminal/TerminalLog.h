@@ -2,6 +2,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
+#include <utility>
+
 #include "platform/EffectSink.h"
 
 namespace tavisk {
@@ -14,6 +17,13 @@ class TerminalLog : public EffectChannel {
   static bool wanted();
 
   void record(const Effect& effect) override;
+
+  /// How to print where a line may be being typed; otherwise it is printed at once.
+  using PrintAside = std::function<void(const std::function<void()>& print)>;
+  void printThrough(PrintAside printAside) { _printAside = std::move(printAside); }
+
+ private:
+  PrintAside _printAside = [](const std::function<void()>& print) { print(); };
 };
 
 }  // namespace tavisk

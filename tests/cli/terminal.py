@@ -1,0 +1,66 @@
+# SPDX-FileCopyrightText: 2026 The tavisk developers
+# SPDX-License-Identifier: MIT
+"""The program at a terminal of its own (a pseudo-terminal)."""
+
+import fcntl
+import os
+import pty
+import select
+import struct
+import sys
+import termios
+import time
+
+PATIENCE = 10  # seconds
+
+
+class Terminal:
+    """The program as the only process of a pseudo-terminal."""
+
+    def __init__(self, machine, words=(), **environment):
+        self.end, other_end = pty.openpty()
+        self.resize(24, 80)
+        self.modes = termios.tcgetattr(other_end)
+        how = {"stdin": other_end, "stdout": other_end, "stderr": other_end, "start_new_session": True}
+        take = lambda: fcntl.ioctl(0, termios.TIOCSCTTY, 0)
+        self.process = machine.start(words, environment, preexec_fn=take, **how)
+        self.other_end = other_end
+        self.seen = ""
+
+    def resize(self, rows, columns):
+        fcntl.ioctl(self.end, termios.TIOCSWINSZ, struct.pack("HHHH", rows, columns, 0, 0))
+
+    def type(self, text):
+        os.write(self.end, text if isinstance(text, bytes) else text.encode())
+
+    def wait_for(self, text):
+        """Everything shown since the last wait, up to the text."""
+        deadline = time.monotonic() + PATIENCE
+        while text not in self.seen:
+            if not select.select([self.end], [], [], max(0, deadline - time.monotonic()))[0]:
+                raise AssertionError(f"{text!r} did not come, only {self.seen!r}")
+            self.seen += self.read()
+        shown, _, self.seen = self.seen.partition(text)
+        return (shown + text).replace("\r\n", "\n")
+
+    def read(self):
+        piece = os.read(self.end, 4096)
+        return piece.decode(errors="surrogateescape")
+
+    def status(self):
+        return self.process.wait(PATIENCE)
+
+    def close(self):
+        self.process.kill()
+        self.process.wait()
+        os.close(self.end)
+        os.close(self.other_end)
+
+
+def stop_without_terminals():
+    try:
+        for end in pty.openpty():
+            os.close(end)
+    except OSError as error:
+        print(f"skipped: no pseudo-terminals on this machine: {error}")
+        sys.exit(77)

@@ -1,0 +1,178 @@
+# SPDX-FileCopyrightText: 2026 The tavisk developers
+# SPDX-License-Identifier: MIT
+"""Lines edited at the prompt of a terminal: keys, history, completion, and what happens meanwhile."""
+
+import os
+import sys
+import termios
+import unittest
+
+from machine import ScratchMachine, program_and_arguments
+from terminal import Terminal, stop_without_terminals
+
+FOLDER = "/System/Library/CoreServices"
+UP, LEFT, HOME = "\x1b[A", "\x1b[D", "\x01"
+ENDED = "\r\n> "
+
+
+def volume(name):
+    return {"Volume Name": name, "Mount Point": f"/Volumes/{name}"}
+
+
+class AtThePrompt(unittest.TestCase):
+    def setUp(self):
+        zones = ["Europe/Madrid", "Europe/Malta", "Asia/Tokyo", "UTC"]
+        clock = {"Time": 1173258303, "Known Time Zones": zones}
+        self.machine = ScratchMachine(PROGRAM, {"Clock": clock, "Remote Shell": {"Enabled": True}})
+        self.addCleanup(self.machine.__exit__)
+        for name in ("Main", "Backup"):
+            self.machine.file(f"/Volumes/{name}{FOLDER}/boot.efi")
+            self.machine.file(f"/Volumes/{name}/mach_kernel")
+        self.open()
+
+    def open(self, **environment):
+        self.terminal = Terminal(self.machine, TERM="xterm", **environment)
+        self.addCleanup(self.terminal.close)
+        self.terminal.wait_for("help.\r\n")
+        self.terminal.wait_for("> ")
+
+    def answer(self, keys):
+        """What a line is answered, from the end of the line to the next prompt."""
+        self.terminal.type(keys + "\n")
+        self.terminal.wait_for("\r\n")
+        return self.terminal.wait_for("> ").removesuffix("\n> ")
+
+    def status(self):
+        status = self.terminal.status()
+        self.assertEqual(termios.tcgetattr(self.terminal.other_end), self.terminal.modes)
+        return status
+
+    def test_keys(self):
+        date = "Date: 3/7/2007"
+        for keys, expected in (
+            ("-getdate", date),
+            ("getdxre" + LEFT + "\x7f" * 2 + "at", date),
+            ("xgetdate" + HOME + "\x1b[3~", date),  # the key Delete
+            ("te" + HOME + "getda", date),
+            ("get date\x17date" + HOME + "\x04" * 3 + "get", "Error: get is not a valid command"),
+            ("nothing at all\x15getdate", date),
+            ("-setcomputername Zo\u00eb\u65e5\u672c\x7f", "setcomputername: Zo\u00eb\u65e5"),
+            ("\udcff\udcc3(", "Error: \udcff\udcc3( is not a valid command"),
+            ("   ", "Error, buffer == NULL"),
+            ("", ""),
+        ):
+            with self.subTest(keys):
+                self.terminal.type(keys.encode(errors="surrogateescape") + b"\n")
+                self.terminal.wait_for("\r\n")
+                self.assertEqual(self.terminal.wait_for("> ").removesuffix("> ").removesuffix("\n"), expected)
+
+    def test_history_has_commands_and_no_answers(self):
+        self.answer("getdate")
+        self.terminal.type("setremotelogin off\n")
+        self.terminal.wait_for("(yes/no)? ")
+        self.terminal.type("perhaps\n")
+        self.terminal.wait_for("(yes/no)? ")
+        self.terminal.type("NO\n")
+        self.terminal.wait_for(ENDED)
+        self.answer("  ")
+        self.assertEqual(self.answer(UP * 2), "Date: 3/7/2007")
+        self.terminal.type(UP * 2 + "\n")
+        self.terminal.wait_for("(yes/no)? ")
+        self.terminal.type("yes\n")
+        self.terminal.wait_for(ENDED)
+        self.assertFalse(self.machine.read()["Remote Shell"]["Enabled"])
+
+    def test_lines_typed_ahead_of_a_question_answer_it(self):
+        self.terminal.type("setremotelogin off\nyes\ngetremotelogin\nquit\nfor the shell\n")
+        self.terminal.wait_for("Remote Login: Off\r\n> ")
+        self.assertEqual(self.status(), 0)
+        self.assertEqual(os.read(self.terminal.other_end, 80), b"for the shell\n")
+
+    def test_tab_completes_words_and_values(self):
+        for keys, expected in (
+            ("GETDA\t", "Date: 3/7/2007"),
+            ("-printc\t\x15-versi\t", "tavisk, Version 1.4a1\r\nCopyright 2026 The tavisk developers"),
+            ("-setwakeonmodem of\t-gettimez\t", "Time Zone: UTC"),
+            ("settimezone as\t\t", "Set TimeZone: Asia/Tokyo"),
+            ("setdate -gettimez\t", "setdate: Error: -gettimez is invalid date format... use mm:dd:yy"),
+            ("-bogus getda\t", "Error: -bogus is not a valid command"),
+        ):
+            with self.subTest(keys):
+                self.terminal.type(keys + "\n")
+                self.terminal.wait_for("\r\n" + expected + ENDED)
+
+    def test_tab_lists_what_it_cannot_choose_among(self):
+        self.terminal.type("settimezone \t")
+        self.terminal.wait_for("\r\nAsia/  Europe/  UTC\r\n")
+        self.terminal.wait_for("> settimezone ")
+        self.terminal.type("europe/\t\t")
+        self.terminal.wait_for("\r\nEurope/Madrid  Europe/Malta\r\n")
+        self.terminal.wait_for("> settimezone Europe/Ma")
+        self.assertEqual(self.answer("lt\t"), "Set TimeZone: Europe/Malta")
+
+    def test_tab_knows_the_startup_disks_that_a_command_found_and_looks_for_none(self):
+        self.machine.change({"Disks": {"disk0s1": volume("Main"), "disk1s1": volume("Two Words")}})
+        main = f"/Volumes/Main{FOLDER}"
+        for keys, expected in (
+            ("setstartupdisk m\t", f"Not a System Folder: /Volumes/m{FOLDER}"),
+            ("setstartupdisk m\t", f"Set Startup Disk to Path: {main}"),
+            (f"setstartupdisk {main[:10]}\t", f"Set Startup Disk to Path: {main}"),
+        ):
+            self.terminal.type(keys + "\n")
+            self.terminal.wait_for("\r\n" + expected + ENDED)
+
+    def test_a_volume_plugged_in_at_the_prompt_is_listed(self):
+        self.machine.change({"Disks": {"disk0s1": volume("Main")}})
+        self.assertEqual(self.answer("liststartupdisks"), f"/Volumes/Main{FOLDER}")
+        self.machine.change({"Disks": {"disk1s1": volume("Backup")}})
+        self.answer("getdate")
+        self.assertEqual(self.answer("liststartupdisks"), f"/Volumes/Main{FOLDER}\n/Volumes/Backup{FOLDER}")
+
+    def test_a_failure_meanwhile_is_told_below_the_line(self):
+        self.answer("liststartupdisks")
+        self.terminal.type("getd")
+        self.terminal.wait_for("getd")
+        self.machine.plist.write_bytes(b"<plist>")
+        self.terminal.wait_for("\r\ntavisk: ")
+        self.terminal.wait_for("\r\n> getd")
+        self.machine.plist.unlink()
+        self.assertRegex(self.answer("ate"), "^Date: ")
+
+    def test_lines_of_any_length_come_in_the_same_pieces_as_from_a_pipe(self):
+        line = "x" * 2050 + " getdate " + "y" * 3000 + "\n"
+        expected, _, _ = self.machine.run([], line.encode())
+        self.terminal.type(line + "\x04")
+        shown = self.terminal.wait_for("NULL.\r\n")
+        self.assertEqual(shown[shown.index("Error: x"):], expected[expected.index(b"Error: x"):].decode())
+        self.assertEqual(self.status(), 0)
+
+    def test_the_end_of_the_input_and_the_key_for_it(self):
+        self.assertEqual(self.answer("xgetdate" + HOME + "\x04"), "Date: 3/7/2007")
+        self.terminal.type("\x04")
+        self.assertEqual(self.terminal.wait_for("\r\n"), "Error: fgets returned NULL.\n")
+        self.assertEqual(self.status(), 0)
+
+    def test_control_c_ends_the_session_and_gives_the_terminal_back(self):
+        self.answer("settime 99")
+        self.terminal.type("getdate\x03")
+        self.assertEqual(self.status(), 1)
+        self.assertEqual(self.machine.read()["Authorization"]["Deauthentications"], 1)
+
+    def test_a_resized_screen_and_a_stop_leave_the_line_as_it_is(self):
+        self.terminal.type("getd")
+        self.terminal.resize(10, 40)
+        self.terminal.wait_for("\r> getd")
+        self.terminal.type("\x1aate\n")  # nobody could continue this process: the system does not stop it
+        self.terminal.wait_for("\r\nDate: 3/7/2007" + ENDED)
+
+    def test_without_the_library_lines_are_read_as_they_come(self):
+        self.machine.file("/lib/libedit.so.2")
+        self.open(LD_LIBRARY_PATH=str(self.machine.directory / "root" / "lib"))
+        self.assertEqual(self.answer("getdate"), "Date: 3/7/2007")
+        self.assertIn("not a valid", self.answer("getda\t"))
+
+
+if __name__ == "__main__":
+    stop_without_terminals()
+    PROGRAM, _ = program_and_arguments(sys.argv)
+    unittest.main(argv=sys.argv[:1])
