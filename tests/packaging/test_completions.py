@@ -1,0 +1,67 @@
+# SPDX-FileCopyrightText: 2026 The tavisk developers
+# SPDX-License-Identifier: MIT
+"""What the shells offer after the words of a command line.
+
+usage: test_completions.py PROGRAM FILLED-DOCUMENTS SOURCES
+"""
+
+import os
+import pathlib
+import shutil
+import subprocess
+import sys
+import tempfile
+
+import shells
+
+NOT_IN_HELP = ["-getkernelbootarchitecturesetting", "-setkernelbootarchitecture"]
+SYSTEM_OF_EXAMPLE = "/Volumes/Spare System/System/Library/CoreServices"
+
+# What is typed, and all that is offered.
+CASES = [
+    ("-gett", ["-gettime", "-gettimezone"]),
+    ("GETT", ["gettime", "gettimezone"]),
+    ("-Print", ["-printcommands"]),
+    ("-f setUsing", ["setusingnetworktime"]),
+    ("-setusingnetworktime ", ["Off", "On"]),
+    ("SETUSINGNETWORKTIME of", ["Off"]),
+    ("-setcomputersleep N", ["Never"]),
+    ("-setdisablekeyboardwhenenclosurelockisengaged ", ["No", "Yes"]),
+    ("-settimezone europe/par", ["Europe/Paris"]),
+    ("-settimezone Asia/Calc", ["Asia/Calcutta"]),
+    ("-setdate ", []),
+    ("-setdate 11:21:26 -settime 10:00:00 -getd", ["-getdate", "-getdisablekeyboardwhenenclosurelockisengaged",
+                                                 "-getdisplaysleep"]),
+    ("-setcomputername -getdate -gettimez", ["-gettimezone"]),
+    ("-setstartupdisk /Volumes/S", [SYSTEM_OF_EXAMPLE] if os.geteuid() == 0 else []),
+]
+
+
+def command_words(environment):
+    printed = subprocess.run(["tavisk", "-printcommands"], env=environment, capture_output=True, text=True, check=True)
+    return [line.split()[1].lower() for line in printed.stdout.splitlines()]
+
+
+def wrong_offers(shell, offered, cases):
+    for typed, expected in cases:
+        offers = sorted(offered("tavisk " + typed))
+        if offers != sorted(expected):
+            yield f"{shell}: tavisk {typed}: expected {expected}, offered {offers}"
+
+
+def main(program, documents, sources):
+    if missing := [shell for shell in shells.SHELLS if not shutil.which(shell)]:
+        print("skipped: there is no", *missing)
+        return 77
+    with tempfile.TemporaryDirectory() as folder:
+        machine = shutil.copytree(pathlib.Path(sources, "packaging/machines/two-systems"), pathlib.Path(folder, "m"))
+        environment = {**os.environ, "PATH": f"{pathlib.Path(program).parent}:{os.environ['PATH']}", "TERM": "dumb",
+                       "TAVISK_HOST": f"scratch:{machine}"}
+        cases = [*CASES, ("-", command_words(environment) + NOT_IN_HELP)]
+        wrong = [line for shell, offered in shells.SHELLS.items() for line in wrong_offers(
+            shell, lambda line: offered(pathlib.Path(documents, "share"), line, environment), cases)]
+    print("\n".join(wrong) or "every offer is as expected")
+    return 1 if wrong else 0
+
+
+sys.exit(main(*sys.argv[1:]))
