@@ -33,9 +33,13 @@ void replaceAll(std::string& text, const std::string& what, const std::string& b
 }
 
 constexpr std::pair<ArgumentKind, const char*> kinds[] = {
-    {ArgumentKind::none, "none"},          {ArgumentKind::onOff, "on-off"},
-    {ArgumentKind::yesNo, "yes-no"},       {ArgumentKind::minutes, "minutes"},
-    {ArgumentKind::timeZone, "time-zone"}, {ArgumentKind::startupDisk, "startup-disk"},
+    {ArgumentKind::none, "none"},
+    {ArgumentKind::onOff, "on-off"},
+    {ArgumentKind::yesNo, "yes-no"},
+    {ArgumentKind::minutes, "minutes"},
+    {ArgumentKind::timeZone, "time-zone"},
+    {ArgumentKind::startupDisk, "startup-disk"},
+    {ArgumentKind::architecture, "architecture"},
     {ArgumentKind::text, "text"},
 };
 

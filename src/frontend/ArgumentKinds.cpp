@@ -21,10 +21,12 @@ constexpr Placeholder placeholders[] = {
     {"<minutes>", ArgumentKind::minutes},
     {"<timezone>", ArgumentKind::timeZone},
     {"<disk>", ArgumentKind::startupDisk},
+    {"<architecture>", ArgumentKind::architecture},
 };
 
 constexpr std::string_view onOffWords[] = {"On", "Off"};
 constexpr std::string_view yesNoWords[] = {"Yes", "No"};
+constexpr std::string_view architectures[] = {"i386", "x86_64", "default"};
 constexpr std::string_view neverWords[] = {"Never", "Off"};
 
 }  // namespace
@@ -42,6 +44,8 @@ std::span<const std::string_view> fixedValues(ArgumentKind kind) {
       return yesNoWords;
     case ArgumentKind::minutes:
       return neverWords;
+    case ArgumentKind::architecture:
+      return architectures;
     case ArgumentKind::none:
     case ArgumentKind::timeZone:
     case ArgumentKind::startupDisk:

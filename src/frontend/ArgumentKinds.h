@@ -11,13 +11,14 @@ namespace tavisk {
 
 /// What can be typed as the argument of a command, as far as completions can tell.
 enum class ArgumentKind {
-  none,         ///< the command takes no argument
-  onOff,        ///< a switch
-  yesNo,        ///< a switch that is asked in other words
-  minutes,      ///< a number, or a word for never
-  timeZone,     ///< one of the zones that -listtimezones lists
-  startupDisk,  ///< one of the disks that -liststartupdisks lists, by folder or by name
-  text,         ///< anything: dates, numbers, names, addresses
+  none,          ///< the command takes no argument
+  onOff,         ///< a switch
+  yesNo,         ///< a switch that is asked in other words
+  minutes,       ///< a number, or a word for never
+  timeZone,      ///< one of the zones that -listtimezones lists
+  startupDisk,   ///< one of the disks that -liststartupdisks lists, by folder or by name
+  architecture,  ///< of the kernel
+  text,          ///< anything: dates, numbers, names, addresses
 };
 
 ArgumentKind argumentKind(const HelpEntry& command);

@@ -27,6 +27,7 @@ CASES = [
     ("SETUSINGNETWORKTIME of", ["Off"]),
     ("-setcomputersleep N", ["Never"]),
     ("-setdisablekeyboardwhenenclosurelockisengaged ", ["No", "Yes"]),
+    ("-setkernelbootarchitecture ", ["default", "i386", "x86_64"]),
     ("-settimezone europe/par", ["Europe/Paris"]),
     ("-settimezone Asia/Calc", ["Asia/Calcutta"]),
     ("-setdate ", []),
