@@ -11,6 +11,8 @@ struct Daemon {
   const char* unit;
   const char* script;
   const char* program;
+  /// Where the program writes its process id, when others of its name are no daemons; else empty.
+  const char* processFile = "";
 };
 
 /// Starts and stops daemons, now and at every start of the machine.

@@ -10,8 +10,8 @@
 #include <vector>
 
 #include "platform/FileDescriptor.h"
+#include "platform/Text.h"
 #include "platform/linux/LinuxMachine.h"
-#include "platform/linux/ProcessScan.h"
 #include "platform/linux/Program.h"
 
 namespace tavisk {
@@ -20,7 +20,9 @@ namespace {
 // Debian's run level of a started machine (init(8)).
 constexpr const char* levelFolder = "/etc/rc2.d";
 constexpr const char* linkTool = "/usr/sbin/update-rc.d";
+constexpr std::chrono::seconds longestStart{3};
 constexpr std::chrono::seconds longestStop{3};
+constexpr std::size_t processFileLimit = 64;
 
 std::string scriptOf(const Daemon& daemon) {
   return std::string("/etc/init.d/") + daemon.script;
@@ -38,8 +40,16 @@ Result<Daemons::Presence> InitScriptDaemons::presence(const Daemon& daemon) {
   return installed ? Presence::installed : Presence::absent;
 }
 
+std::vector<ProcessId> InitScriptDaemons::processes(const Daemon& daemon) const {
+  auto found = processesNamed(_root, daemon.program);
+  if (*daemon.processFile == '\0') return found;
+  const auto written = leadingInteger(_root.read(daemon.processFile, processFileLimit).valueOr(""));
+  std::erase_if(found, [written](ProcessId id) { return id != written; });
+  return found;
+}
+
 Result<bool> InitScriptDaemons::isRunning(const Daemon& daemon) {
-  return !processesNamed(_root, daemon.program).empty();
+  return !processes(daemon).empty();
 }
 
 bool InitScriptDaemons::hasLink(const Daemon& daemon, const char* kinds) const {
@@ -61,7 +71,7 @@ Result<void> InitScriptDaemons::setStartsAtBoot(const Daemon& daemon, bool start
 
 Result<void> InitScriptDaemons::start(const Daemon& daemon) {
   if (auto started = runScript(daemon, "start"); !started) return started;
-  if (!processesNamed(_root, daemon.program).empty()) return {};
+  if (awaitBeginning(daemon)) return {};
   return Failure{"start", scriptOf(daemon),
                  "it reported success, but " + std::string(daemon.program) + " does not run"};
 }
@@ -71,16 +81,24 @@ Result<void> InitScriptDaemons::stop(const Daemon& daemon) {
   return awaitEnd(daemon);
 }
 
+/// A daemon may write the file with its process id after its script has ended.
+bool InitScriptDaemons::awaitBeginning(const Daemon& daemon) {
+  auto runs = [&] { return !processes(daemon).empty(); };
+  if (*daemon.processFile == '\0') return runs();
+  auto looking = _runLoop.every(std::chrono::milliseconds(20), [] {});
+  return _runLoop.runUntil(RunLoop::Clock::now() + longestStart, runs);
+}
+
 /// The script may have sent a signal and not waited.
 Result<void> InitScriptDaemons::awaitEnd(const Daemon& daemon) {
   std::vector<FileDescriptor> handles;
   std::vector<RunLoop::Registration> watches;
-  for (auto process : processesNamed(_root, daemon.program)) {
+  for (auto process : processes(daemon)) {
     handles.emplace_back(static_cast<int>(::syscall(SYS_pidfd_open, process, 0)));
     auto ended = [&watches, index = watches.size()] { watches[index].cancel(); };
     watches.push_back(_runLoop.watch(handles.back().number(), RunLoop::Readiness::readable, ended));
   }
-  auto isGone = [&] { return processesNamed(_root, daemon.program).empty(); };
+  auto isGone = [&] { return processes(daemon).empty(); };
   if (_runLoop.runUntil(RunLoop::Clock::now() + longestStop, isGone)) return {};
   return Failure{"stop", scriptOf(daemon), "it reported success, but " + std::string(daemon.program) + " still runs"};
 }

@@ -8,6 +8,7 @@
 #include "platform/RunLoop.h"
 #include "platform/SystemRoot.h"
 #include "platform/linux/Daemons.h"
+#include "platform/linux/ProcessScan.h"
 
 namespace tavisk {
 
@@ -27,7 +28,9 @@ class InitScriptDaemons : public Daemons {
   Result<void> restartIfRunning(const Daemon& daemon) override;
 
  private:
+  std::vector<ProcessId> processes(const Daemon& daemon) const;
   bool hasLink(const Daemon& daemon, const char* kinds) const;
+  bool awaitBeginning(const Daemon& daemon);
   Result<void> awaitEnd(const Daemon& daemon);
   Result<void> runScript(const Daemon& daemon, const char* action);
   Result<void> run(const std::vector<std::string>& words);

@@ -14,6 +14,8 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _systemLog(_root),
       _clock(_machine),
       _networkTime(_machine),
+      _remoteShell(_machine),
+      _remoteEvents(_machine),
       _hostConfiguration(_machine),
       _dynamicStore(_machine),
       _bootLoaderFile(_machine) {

@@ -14,6 +14,8 @@
 #include "platform/linux/LinuxHostConfigService.h"
 #include "platform/linux/LinuxMachine.h"
 #include "platform/linux/LinuxNetworkTimeService.h"
+#include "platform/linux/LinuxRemoteEventsService.h"
+#include "platform/linux/LinuxRemoteShellService.h"
 #include "platform/linux/LinuxSystemLog.h"
 #include "platform/linux/LinuxUserDatabase.h"
 
@@ -35,8 +37,8 @@ class LinuxHost final : public Host {
   NetworkTimeService& networkTime() override { return _networkTime; }
   PowerSettingsService& powerSettings() override { throw NotBuiltYet(); }
   PowerController& powerController() override { throw NotBuiltYet(); }
-  RemoteShellService& remoteShell() override { throw NotBuiltYet(); }
-  RemoteEventsService& remoteEvents() override { throw NotBuiltYet(); }
+  RemoteShellService& remoteShell() override { return _remoteShell; }
+  RemoteEventsService& remoteEvents() override { return _remoteEvents; }
   HostConfigService& hostConfiguration() override { return _hostConfiguration; }
   DynamicStore& dynamicStore() override { return _dynamicStore; }
   BootLoaderFile& bootLoaderFile() override { return _bootLoaderFile; }
@@ -64,6 +66,8 @@ class LinuxHost final : public Host {
   LinuxSystemLog _systemLog;
   LinuxClockService _clock;
   LinuxNetworkTimeService _networkTime;
+  LinuxRemoteShellService _remoteShell;
+  LinuxRemoteEventsService _remoteEvents;
   LinuxHostConfigService _hostConfiguration;
   LinuxDynamicStore _dynamicStore;
   LinuxBootLoaderFile _bootLoaderFile;

@@ -4,21 +4,13 @@
 
 #include "platform/SettingNames.h"
 #include "platform/linux/HostName.h"
+#include "platform/linux/OnOff.h"
 #include "platform/linux/Program.h"
 
 namespace tavisk {
 namespace {
 
 using Value = std::optional<std::string>;
-
-const char* onOff(bool on) {
-  return on ? "on" : "off";
-}
-
-Result<Value> asOnOff(const Result<bool>& on) {
-  if (!on) return on.failure();
-  return Value(onOff(*on));
-}
 
 Failure noClient() {
   std::string names;

@@ -12,6 +12,7 @@ namespace tavisk {
 namespace {
 
 constexpr const char* service = "org.freedesktop.systemd1";
+constexpr const char* enabledUntilRestart = "enabled-runtime";
 constexpr std::chrono::seconds longestJob{3};
 // The manager reads all unit files again.
 constexpr std::chrono::seconds longestReload{10};
@@ -116,16 +117,25 @@ Result<bool> UnitDaemons::isRunning(const Daemon& daemon) {
   return word == "active" || word == "activating" || word == "reloading";
 }
 
-Result<bool> UnitDaemons::startsAtBoot(const Daemon& daemon) {
+Result<std::string> UnitDaemons::fileState(const Daemon& daemon) {
   auto state = ask(daemon, "GetUnitFileState", "s");
+  if (state) return std::move(state).value().readText();
+  if (isBusError(state.failure(), "org.freedesktop.DBus.Error.FileNotFound")) return std::string();
+  return state.failure();
+}
+
+Result<bool> UnitDaemons::startsAtBoot(const Daemon& daemon) {
+  auto state = fileState(daemon);
   if (!state) return state.failure();
-  return std::move(state).value().readText() == "enabled";
+  return *state == "enabled" || *state == enabledUntilRestart;
 }
 
 Result<void> UnitDaemons::setStartsAtBoot(const Daemon& daemon, bool starts) {
   const std::vector<std::string> files{daemon.unit};
-  constexpr bool untilRestart = false;
   constexpr bool replaceLinks = false;
+  const auto state = fileState(daemon);
+  if (!state) return state.failure();
+  const bool untilRestart = !starts && *state == enabledUntilRestart;
   auto changed = starts ? order(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
                         : order(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
   if (!changed) return changed.failure();

@@ -35,6 +35,8 @@ class UnitDaemons : public Daemons {
   Result<BusMessage> order(const Daemon& daemon, const char* member, const char* replySignature,
                            const Arguments&... arguments);
   Result<BusMessage> unitProperty(const Daemon& daemon, const char* name, const char* signature);
+  /// A word such as "enabled", as systemctl(1) lists them; empty when there is no such unit file.
+  Result<std::string> fileState(const Daemon& daemon);
   /// Runs a job to its end.
   Result<void> runJob(const Daemon& daemon, const char* method);
   Failure whyNotRunning(const Daemon& daemon);

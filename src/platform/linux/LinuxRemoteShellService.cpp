@@ -1,0 +1,140 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/LinuxRemoteShellService.h"
+
+#include <algorithm>
+
+#include "platform/SettingNames.h"
+#include "platform/Text.h"
+#include "platform/linux/OnOff.h"
+#include "platform/linux/Program.h"
+#include "platform/linux/ServicesConfig.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* serverConfig = "/etc/ssh/sshd_config";
+constexpr std::size_t configLimit = std::size_t{1} << 20U;
+// The sessions of the server are processes of the same name: its own is in the file.
+constexpr const char* serverProcess = "/run/sshd.pid";
+
+std::vector<Daemon> openSshUnits() {
+  return {{"ssh.service", "ssh", "sshd", serverProcess},
+          {"ssh.socket", "", ""},
+          {"sshd.service", "sshd", "sshd", serverProcess},
+          {"sshd.socket", "", ""}};
+}
+
+bool hasHostKey(const SystemRoot& root) {
+  const auto isKey = [](const std::string& name) { return name.starts_with("ssh_host_") && name.ends_with("_key"); };
+  return std::ranges::any_of(root.list("/etc/ssh").valueOr({}), isKey);
+}
+
+/// Whether the administrator keeps the keys elsewhere (sshd_config(5)).
+bool namesHostKeys(const SystemRoot& root) {
+  const auto names = [](const std::string& line) {
+    const auto words = split(line, " \t\r=\"");
+    return !words.empty() && lowerCased(words.front()) == "hostkey";
+  };
+  return std::ranges::any_of(split(root.read(serverConfig, configLimit).valueOr(""), "\n"), names);
+}
+
+}  // namespace
+
+Result<DaemonGroup> LinuxRemoteShellService::knownServer() {
+  auto& daemons = _machine.services.daemons();
+  auto units = configuredUnits(_machine.root, "remote-shell");
+  if (!units) return units.failure();
+  return units->empty() ? DaemonGroup(daemons, openSshUnits()) : DaemonGroup(daemons, std::move(units).value());
+}
+
+Result<DaemonGroup> LinuxRemoteShellService::server() {
+  const auto known = knownServer();
+  return known ? known->present() : known;
+}
+
+template <typename Answer, typename Use>
+Result<Answer> LinuxRemoteShellService::withServer(Use use) {
+  const auto found = server();
+  if (!found) return found.failure();
+  return use(*found);
+}
+
+std::optional<Failure> LinuxRemoteShellService::whyNotSupported() {
+  const auto known = knownServer();
+  const auto found = server();
+  if (!known || !found || !found->members().empty()) return std::nullopt;
+  return Failure{"find an SSH server", known->names(), "none of them is installed"};
+}
+
+Result<bool> LinuxRemoteShellService::isOnInAnyWay() {
+  return withServer<bool>([](const DaemonGroup& server) -> Result<bool> {
+    const auto starting = server.startingAtBoot();
+    if (!starting) return starting.failure();
+    const auto running = server.running();
+    if (!running) return running.failure();
+    return !starting->empty() || !running->empty();
+  });
+}
+
+bool LinuxRemoteShellService::isEnabled() {
+  Setting setting;
+  setting.name = setting::remoteLogin;
+  setting.live = [this] { return asOnOff(isOnInAnyWay()); };
+  return observe(setting, _machine.effects) == onOff(true);
+}
+
+void LinuxRemoteShellService::setEnabled(bool enabled) {
+  const auto anyOf = [this](Result<std::vector<Daemon>> (DaemonGroup::*those)() const) {
+    return asOnOff(withServer<bool>([those](const DaemonGroup& server) -> Result<bool> {
+      const auto found = (server.*those)();
+      return found ? Result<bool>(!found->empty()) : found.failure();
+    }));
+  };
+  Setting setting;
+  setting.name = setting::remoteLogin;
+  setting.supported = [this] { return whyNotSupported(); };
+  setting.live = [&] { return anyOf(&DaemonGroup::running); };
+  setting.stored = [&] { return anyOf(&DaemonGroup::startingAtBoot); };
+  setting.store = [&](const std::string&) { return store(enabled); };
+  setting.apply = [&](const std::string&) { return apply(enabled); };
+  if (!enabled) setting.note = "open sessions stay open";
+  carryOut(setting, onOff(enabled), _machine.effects, _machine.runLoop);
+}
+
+Result<void> LinuxRemoteShellService::store(bool enabled) {
+  return withServer<void>([&](const DaemonGroup& server) -> Result<void> {
+    if (!enabled) return server.setAllStartAtBoot(false);
+    if (auto keys = ensureHostKeys(); !keys) return keys;
+    const auto starting = server.startingAtBoot();
+    if (!starting) return starting.failure();
+    if (!starting->empty()) return {};
+    return _machine.services.daemons().setStartsAtBoot(server.members().front(), true);
+  });
+}
+
+/// Starts what will start with the machine too.
+Result<void> LinuxRemoteShellService::apply(bool enabled) {
+  return withServer<void>([&](const DaemonGroup& server) -> Result<void> {
+    if (!enabled) return server.stopAll();
+    const auto running = server.running();
+    if (!running) return running.failure();
+    if (!running->empty()) return {};
+    const auto starting = server.startingAtBoot();
+    if (!starting) return starting.failure();
+    return _machine.services.daemons().start(starting->empty() ? server.members().front() : starting->front());
+  });
+}
+
+Result<void> LinuxRemoteShellService::ensureHostKeys() {
+  const bool isOtherServer = !_machine.root.exists("/usr/sbin/sshd");
+  if (isOtherServer || hasHostKey(_machine.root) || namesHostKeys(_machine.root)) return {};
+  constexpr const char* maker = "/usr/bin/ssh-keygen";
+  if (auto failure = whyNeedsRoot("make host keys", "/etc/ssh")) return *failure;
+  const auto made = runProgram(_machine.root, {maker, "-A"}, _machine.runLoop);
+  if (!made) return made.failure();
+  if (hasHostKey(_machine.root)) return {};
+  return Failure{"make host keys", maker, "it reported success, but there is no key in /etc/ssh"};
+}
+
+}  // namespace tavisk

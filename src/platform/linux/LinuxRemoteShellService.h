@@ -1,0 +1,37 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "platform/RemoteShellService.h"
+#include "platform/SettingChange.h"
+#include "platform/linux/DaemonGroup.h"
+#include "platform/linux/LinuxMachine.h"
+
+namespace tavisk {
+
+/// The SSH server's service and socket, under whichever of their names, or the units that the administrator names for
+/// "remote-shell". One of them is enough to be on; none of them is left when it is off. Open sessions stay.
+class LinuxRemoteShellService final : public RemoteShellService {
+ public:
+  explicit LinuxRemoteShellService(const LinuxMachine& machine) : _machine(machine) {}
+
+  bool isEnabled() override;
+  void setEnabled(bool enabled) override;
+
+ private:
+  Result<DaemonGroup> knownServer();
+  /// What this machine has of it.
+  Result<DaemonGroup> server();
+  template <typename Answer, typename Use>
+  Result<Answer> withServer(Use use);
+  std::optional<Failure> whyNotSupported();
+  Result<bool> isOnInAnyWay();
+  Result<void> store(bool enabled);
+  Result<void> apply(bool enabled);
+  /// Where no host key is, a connection would be taken and dropped.
+  Result<void> ensureHostKeys();
+
+  LinuxMachine _machine;
+};
+
+}  // namespace tavisk
