@@ -1,6 +1,6 @@
 # SPDX-FileCopyrightText: 2026 The tavisk developers
 # SPDX-License-Identifier: MIT
-"""What three shells offer when a line is completed at its end."""
+"""What three shells offer when lines are completed at their ends: for each line, the offers."""
 
 import contextlib
 import os
@@ -10,18 +10,31 @@ import re
 import subprocess
 import tempfile
 
-SECONDS = 20
+SECONDS = 60
+NEXT = "next line"  # no offer
 
 BASH = r"""
 source /usr/share/bash-completion/bash_completion
 source "$1"
-shift
-COMP_LINE=$1 COMP_POINT=${#1} COMP_WORDS=("${@:2}") COMP_CWORD=$(($# - 2))
-_tavisk tavisk "${COMP_WORDS[-1]}" "${COMP_WORDS[-2]}"
-for offer in "${COMPREPLY[@]}"; do echo "$offer"; done
+while IFS=$'\t' read -r line words; do
+  IFS=$'\037' read -ra COMP_WORDS <<<"$words"
+  [[ $line == *' ' ]] && COMP_WORDS+=('')
+  COMP_LINE=$line COMP_POINT=${#line} COMP_CWORD=$((${#COMP_WORDS[@]} - 1))
+  _tavisk tavisk "${COMP_WORDS[-1]}" "${COMP_WORDS[-2]}"
+  for offer in "${COMPREPLY[@]}"; do echo "$offer"; done
+  echo next line
+done
 """
 
-# The widget completes a whole line that it is given, and every match that is added is written down.
+FISH = r"""
+source $argv[1]
+while read --null line
+  complete -C $line
+  echo next line
+end
+"""
+
+# The widget completes whole lines that it is given, and every match that is added is written down.
 ZSH = r"""
 fpath=($1 $fpath)
 autoload -Uz compinit
@@ -36,54 +49,59 @@ compadd() {
   (( $#matches )) && print -rl -- $matches >>$offers
   builtin compadd "$@"
 }
-complete-line() {
-  BUFFER=$line CURSOR=$#line
-  zle list-line
+complete-lines() {
+  for BUFFER in ${(f)"$(<$lines)"}; do
+    CURSOR=$#BUFFER
+    zle list-line
+    print next line >>$offers
+  done
   exit 0
 }
 zle -C list-line list-choices _main_complete
-zle -N complete-line
-bindkey '^X' complete-line
+zle -N complete-lines
+bindkey '^X' complete-lines
 """
 
 
-def _words(line):
-    """As bash divides a line: a colon is a word of its own."""
-    words = re.findall(r":+|[^\s:]+", line)
-    return words if re.search(r"[^\s:]$", line) else [*words, ""]
+def _offers(text):
+    """An offer may be described, behind a tab, and be quoted as it is to be typed."""
+    found = [[]]
+    for line in text.splitlines():
+        if line == NEXT:
+            found.append([])
+        else:
+            found[-1].append(line.split("\t")[0].replace("\\ ", " "))
+    return found[:-1]
 
 
-def _lines(command, environment):
-    result = subprocess.run([str(word) for word in command], stdin=subprocess.DEVNULL, capture_output=True, text=True,
+def _run(command, typed, environment):
+    result = subprocess.run([str(word) for word in command], input=typed, capture_output=True, text=True,
                             env=environment, timeout=SECONDS, check=True)
     assert not result.stderr, result.stderr
-    return result.stdout.splitlines()
+    return _offers(result.stdout)
 
 
-def _unquoted(offer):
-    return offer.replace("\\ ", " ")
-
-
-def bash(share, line, environment):
+def bash(share, lines, environment):
+    # bash divides a line into words at colons too.
+    typed = "".join(line + "\t" + "\037".join(re.findall(r":+|[^\s:]+", line)) + "\n" for line in lines)
     completion = share / "bash-completion/completions/tavisk"
-    return _lines(["bash", "--norc", "-c", BASH, "bash", completion, line, *_words(line)], environment)
+    return _run(["bash", "--norc", "-c", BASH, "bash", completion], typed, environment)
 
 
-def fish(share, line, environment):
+def fish(share, lines, environment):
     completion = share / "fish/vendor_completions.d/tavisk.fish"
-    offers = _lines(["fish", "--no-config", "-c", 'source "$argv[1]"; complete -C "$argv[2]"', completion, line],
-                    environment)
-    return [_unquoted(offer.split("\t")[0]) for offer in offers]
+    return _run(["fish", "--no-config", "-c", FISH, completion], "".join(line + "\0" for line in lines), environment)
 
 
-def zsh(share, line, environment):
+def zsh(share, lines, environment):
     with tempfile.TemporaryDirectory() as folder:
-        setup, offers = pathlib.Path(folder, "setup"), pathlib.Path(folder, "offers")
-        setup.write_text(ZSH)
-        offers.touch()
-        _type_into_zsh(f". {setup} {share}/zsh/site-functions\r\x18".encode(),
-                       {**environment, "line": line, "offers": str(offers), "HOME": folder})
-        return [_unquoted(offer) for offer in offers.read_text().splitlines()]
+        files = {name: pathlib.Path(folder, name) for name in ("setup", "lines", "offers")}
+        files["setup"].write_text(ZSH)
+        files["lines"].write_text("\n".join(lines))
+        files["offers"].touch()
+        _type_into_zsh(f". {files['setup']} {share}/zsh/site-functions\r\x18".encode(),
+                       {**environment, **{name: str(file) for name, file in files.items()}, "HOME": folder})
+        return _offers(files["offers"].read_text())
 
 
 def _type_into_zsh(typed, environment):

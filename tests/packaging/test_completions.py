@@ -44,9 +44,8 @@ def command_words(environment):
 
 
 def wrong_offers(shell, offered, cases):
-    for typed, expected in cases:
-        offers = sorted(offered("tavisk " + typed))
-        if offers != sorted(expected):
+    for (typed, expected), offers in zip(cases, offered, strict=True):
+        if sorted(offers) != sorted(expected):
             yield f"{shell}: tavisk {typed}: expected {expected}, offered {offers}"
 
 
@@ -59,8 +58,9 @@ def main(program, documents, sources):
         environment = {**os.environ, "PATH": f"{pathlib.Path(program).parent}:{os.environ['PATH']}", "TERM": "dumb",
                        "TAVISK_HOST": f"scratch:{machine}"}
         cases = [*CASES, ("-", command_words(environment) + NOT_IN_HELP)]
-        wrong = [line for shell, offered in shells.SHELLS.items() for line in wrong_offers(
-            shell, lambda line: offered(pathlib.Path(documents, "share"), line, environment), cases)]
+        lines = ["tavisk " + typed for typed, _ in cases]
+        wrong = [line for shell, complete in shells.SHELLS.items() for line in wrong_offers(
+            shell, complete(pathlib.Path(documents, "share"), lines, environment), cases)]
     print("\n".join(wrong) or "every offer is as expected")
     return 1 if wrong else 0
 
