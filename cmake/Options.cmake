@@ -16,10 +16,12 @@ endif()
 # The same sources give the same bytes, whichever folder they are built in.
 add_compile_options(-ffile-prefix-map=${PROJECT_SOURCE_DIR}=. -Wdate-time)
 
-# A package build (no build type) brings its own hardening.
-set(hardening -O2 -D_FORTIFY_SOURCE=2 -D_GLIBCXX_ASSERTIONS
-    -fstack-protector-strong -fstack-clash-protection -fcf-protection)
-add_compile_options("$<$<CONFIG:Release>:${hardening}>")
+# A package build (build type None) brings hardening of its own, though not all of it.
+include(CheckCXXCompilerFlag)
+check_cxx_compiler_flag(-fcf-protection TAVISK_PROTECTS_JUMPS) # on some processors only
+set(hardening -D_GLIBCXX_ASSERTIONS -fstack-clash-protection $<$<BOOL:${TAVISK_PROTECTS_JUMPS}>:-fcf-protection>)
+add_compile_options("$<$<CONFIG:Release>:-O2;-D_FORTIFY_SOURCE=2;-fstack-protector-strong>")
+add_compile_options("$<$<CONFIG:Release,None>:${hardening}>")
 add_link_options("$<$<CONFIG:Release>:-Wl,-z,relro,-z,now,--as-needed>")
 
 # check_pie_supported is what makes CMake link executables with -pie.
