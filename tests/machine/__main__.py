@@ -15,8 +15,9 @@ import machine
 import server
 import trees
 
+REMOTE = ["avahi-daemon", "iproute2", "openssh-server", "systemd-resolved"]
 KINDS = {
-    "container": [lambda: container.Container("systemd-timesyncd"), lambda: container.Container("chrony"),
+    "container": [lambda: container.Container("systemd-timesyncd", *REMOTE), lambda: container.Container("chrony"),
                   lambda: container.Container("ntpsec")],
     "guest": [guest.Guest],
     "server": [server.Server],

@@ -16,10 +16,10 @@ import trees
 class Container(machine.Machine):
     cannot = "set a clock, let a time daemon correct one, reach firmware or devices"
 
-    def __init__(self, time_daemon):
+    def __init__(self, time_daemon, *packages):
         self.name = f"container with {time_daemon}"
-        self.has = frozenset({"bus", "container", time_daemon})
-        self._tree = trees.layered(f"container-{time_daemon}", [time_daemon])
+        self.has = frozenset({"bus", "container", time_daemon, *packages})
+        self._tree = trees.layered(f"container-{time_daemon}", [time_daemon, *packages])
         self._log = trees.WORK / f"container-{time_daemon}.log"
         self._manager = None
         self._first_process = None

@@ -1,0 +1,36 @@
+# SPDX-FileCopyrightText: 2026 The tavisk developers
+# SPDX-License-Identifier: MIT
+import re
+
+from check import Check
+
+CONTAINER = frozenset({"container", "iproute2"})
+CONFIG = "mkdir -p /etc/tavisk; echo 'remote-events = {}' >/etc/tavisk/services.conf; "
+UNIT = "/etc/systemd/system/events.{}"
+MAKE_UNITS = f"""printf '[Socket]\\nListenStream=7007\\n[Install]\\nWantedBy=sockets.target\\n' >{UNIT.format('socket')}
+printf '[Service]\\nExecStart=sleep infinity\\n' >{UNIT.format('service')}
+systemctl daemon-reload
+""" + CONFIG.format("events.socket events.service")
+STATES = "systemctl is-active events.socket events.service"
+LISTENING = "ss -H -l -t -n 'sport = :7007' | wc -l"
+SET = "TAVISK_LOG=stderr tavisk -setremotevelmarevents {} -getremotevelmarevents"
+
+CHECKS = [
+    Check("remote events are not supported without units", needs=CONTAINER,
+          do="rm -f /etc/tavisk/services.conf; " + SET.format("on"),
+          prints="setremotevelmarevents: On\nRemote Velmar Events: Off\n",
+          errors=re.compile(r"tavisk: Remote Events: [^\n]*services\.conf[^\n]*\n")),
+    Check("a unit that the machine depends on is not touched", needs=CONTAINER,
+          do=CONFIG.format("dbus.service") + SET.format("off"),
+          prints="setremotevelmarevents: remote velmar events are already off.\nRemote Velmar Events: Off\n",
+          errors=re.compile(r"(tavisk: Remote Events: use dbus\.service [^\n]*\n)+"),
+          then={"systemctl is-active dbus.service": "active\n"}),
+    Check("remote events are turned off", needs=CONTAINER,
+          do=MAKE_UNITS + "systemctl enable --quiet --now events.socket; " + SET.format("off"),
+          prints="setremotevelmarevents: Off\nRemote Velmar Events: Off\n", errors="",
+          then={STATES: "inactive\ninactive\n", "systemctl is-enabled events.socket": "disabled\n", LISTENING: "0\n"}),
+    Check("remote events are turned on and stay so", needs=CONTAINER, kept=True, do=SET.format("on"),
+          prints="setremotevelmarevents: On\nRemote Velmar Events: On\n", errors="",
+          then={"systemctl is-active events.socket": "active\n", "systemctl is-enabled events.socket": "enabled\n",
+                LISTENING: "1\n", "tavisk -getremotevelmarevents": "Remote Velmar Events: On\n"}),
+]
