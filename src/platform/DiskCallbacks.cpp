@@ -33,4 +33,11 @@ void DiskCallbacks::tell(const DiskEvent& event, const DiskDescription& disk) co
   }
 }
 
+void DiskCallbacks::tellDifferences(const DiskSnapshot& before, const DiskSnapshot& after) const {
+  for (const auto& event : differences(before, after)) {
+    const bool gone = event.kind == DiskEvent::Kind::disappeared;
+    tell(event, *(gone ? before : after).find(event.disk));
+  }
+}
+
 }  // namespace tavisk

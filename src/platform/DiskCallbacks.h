@@ -6,6 +6,7 @@
 
 #include "platform/DiskDescription.h"
 #include "platform/DiskEventSession.h"
+#include "platform/DiskSnapshot.h"
 
 namespace tavisk {
 
@@ -18,6 +19,8 @@ class DiskCallbacks {
   /// Calls those that asked for this kind of event and match the disk; the keys of a change that a callback does not
   /// watch are left out, and without any left it is not called.
   void tell(const DiskEvent& event, const DiskDescription& disk) const;
+  /// Tells what happened from one moment to the next.
+  void tellDifferences(const DiskSnapshot& before, const DiskSnapshot& after) const;
 
  private:
   std::vector<DiskCallbackRequest> _requests;

@@ -11,7 +11,7 @@ namespace tavisk {
 
 /// Runs a program of this machine; what it prints is dropped. False when it fails or is missing.
 inline bool runTool(const std::string& commandLine) {
-  return std::system(("PATH=/usr/sbin:/usr/bin:/sbin:/bin; " + commandLine + " >/dev/null 2>&1").c_str()) == 0;
+  return std::system(("PATH=/usr/sbin:/usr/bin:/sbin:/bin; (" + commandLine + ") >/dev/null 2>&1").c_str()) == 0;
 }
 
 /// A Linux machine made of files that has disks: what sysfs and the mount table say of them, and images for nodes.

@@ -4,6 +4,7 @@
 #include "contract/AdminAuthenticatorContract.h"
 #include "contract/BootLoaderFileContract.h"
 #include "contract/ClockContract.h"
+#include "contract/DiskEventsContract.h"
 #include "contract/FileSystemContract.h"
 #include "contract/HostNamesContract.h"
 #include "contract/NetworkTimeContract.h"
@@ -50,6 +51,49 @@ struct ScratchClock {
   ScratchMachine machine;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, ClockContract, ScratchClock);
+
+class ScratchDiskEvents {
+ public:
+  template <typename Work>
+  static std::string run(const Work& work) {
+    ScratchDiskEvents machine;
+    work(machine);
+    return "";
+  }
+  DiskEventSession& service() { return _machine.host().diskEvents(); }
+  DiskName plug(const std::string& label) {
+    const DiskName disk{"disk" + std::to_string(++_last)};
+    set(disk, "Volume Name", label);
+    return disk;
+  }
+  std::string mount(const DiskName& disk) {
+    const auto path = "/Volumes/" + disk.text;
+    std::filesystem::create_directories(_machine.directory() + "/root" + path);
+    set(disk, "Mount Point", path);
+    return path;
+  }
+  void unmount(const DiskName& disk) { set(disk, "Mount Point", std::nullopt); }
+  void rename(const DiskName& disk, const std::string& label) { set(disk, "Volume Name", label); }
+  void grow(const DiskName& disk) { set(disk, "Size", std::int64_t{4096}); }
+  void pull(const DiskName& disk) {
+    auto machine = _machine.description();
+    machine.dictionary("Disks").remove(disk.text);
+    _machine.describe(*writePropertyList(std::move(machine)));
+  }
+  RunLoop& runLoop() { return _machine.runLoop; }
+
+ private:
+  void set(const DiskName& disk, const char* key, std::optional<PropertyList> value) {
+    auto machine = _machine.description();
+    auto& values = machine.dictionary("Disks").dictionary(disk.text);
+    if (value) values.set(key, *value);
+    if (!value) values.remove(key);
+    _machine.describe(*writePropertyList(std::move(machine)));
+  }
+  ScratchMachine _machine;
+  int _last = 0;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, DiskEventsContract, ScratchDiskEvents);
 
 struct ScratchNetworkTime {
   static constexpr bool takesAnyText = true;

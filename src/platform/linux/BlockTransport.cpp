@@ -14,8 +14,8 @@ struct Sign {
 };
 
 /// Devices by the beginnings of their names.
-constexpr std::array namesOfDevices = {Sign{"nbd", transport::network}, Sign{"rbd", transport::network},
-                                       Sign{"drbd", transport::network}};
+constexpr std::array namesOfDevices = {Sign{"loop", transport::diskImage}, Sign{"nbd", transport::network},
+                                       Sign{"rbd", transport::network}, Sign{"drbd", transport::network}};
 /// Folders above a disk in the device tree, by the beginnings of their names: what is nearer to the hardware than the
 /// layer that SCSI makes of it.
 constexpr std::array namesOfCarriers = {Sign{"session", transport::iscsi}, Sign{"ata", "SATA"},
@@ -67,7 +67,6 @@ std::vector<std::string> BlockDevices::carriersOf(const DiskName& disk) const {
 std::string BlockDevices::transportOf(const DiskName& disk) const {
   const auto path = pathOf(disk);
   if (!path) return "";
-  if (_root.exists("/sys" + *path + "/loop/backing_file")) return transport::diskImage;
   if (const auto* const found = byNumberedName(namesOfDevices, disk.text)) return found;
   const char* carried = nullptr;
   for (const auto& carrier : carriersOf(disk)) {

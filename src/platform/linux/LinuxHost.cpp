@@ -18,7 +18,10 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _remoteEvents(_machine),
       _hostConfiguration(_machine),
       _dynamicStore(_machine),
-      _bootLoaderFile(_machine) {
+      _bootLoaderFile(_machine),
+      _disks(_machine),
+      _diskEvents(_machine, _disks),
+      _diskManagement(_machine, _disks) {
   effects.addChannel(_journalLog);
 }
 

@@ -10,6 +10,8 @@
 #include "platform/linux/LinuxAdminAuthenticator.h"
 #include "platform/linux/LinuxBootLoaderFile.h"
 #include "platform/linux/LinuxClockService.h"
+#include "platform/linux/LinuxDiskEventSession.h"
+#include "platform/linux/LinuxDiskManagementService.h"
 #include "platform/linux/LinuxDynamicStore.h"
 #include "platform/linux/LinuxHostConfigService.h"
 #include "platform/linux/LinuxMachine.h"
@@ -45,8 +47,8 @@ class LinuxHost final : public Host {
   PreferencesStore& preferences() override { throw NotBuiltYet(); }
   ProcessUtilities& processes() override { throw NotBuiltYet(); }
 
-  DiskEventSession& diskEvents() override { throw NotBuiltYet(); }
-  DiskManagementService& diskManagement() override { throw NotBuiltYet(); }
+  DiskEventSession& diskEvents() override { return _diskEvents; }
+  DiskManagementService& diskManagement() override { return _diskManagement; }
   IORegistry& registry() override { throw NotBuiltYet(); }
   NetworkInterfaces& networkInterfaces() override { throw NotBuiltYet(); }
   KernelValues& kernel() override { throw NotBuiltYet(); }
@@ -71,6 +73,9 @@ class LinuxHost final : public Host {
   LinuxHostConfigService _hostConfiguration;
   LinuxDynamicStore _dynamicStore;
   LinuxBootLoaderFile _bootLoaderFile;
+  LinuxDisks _disks;
+  LinuxDiskEventSession _diskEvents;
+  LinuxDiskManagementService _diskManagement;
 };
 
 }  // namespace tavisk

@@ -21,11 +21,7 @@ void ScratchDiskEventSession::unschedule() {
 
 void ScratchDiskEventSession::tell(const MachineFile::Contents& machine) {
   const auto now = _disks.renew(machine);
-  const auto before = std::exchange(_told, now);
-  for (const auto& event : differences(*before, *now)) {
-    const bool gone = event.kind == DiskEvent::Kind::disappeared;
-    _callbacks.tell(event, *(gone ? before : now)->find(event.disk));
-  }
+  _callbacks.tellDifferences(*std::exchange(_told, now), *now);
   _disks.forgetOld();
 }
 

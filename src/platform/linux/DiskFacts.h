@@ -1,0 +1,29 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "platform/linux/BlockDevices.h"
+#include "platform/linux/BlockProbe.h"
+#include "platform/linux/OpticalDrive.h"
+
+namespace tavisk {
+
+/// All that is known of a block device that has a medium, whether mounted or not.
+struct DiskFacts {
+  BlockDevice device;
+  VolumeFacts volume;
+  PartitionTable table;                      ///< of a whole disk
+  std::optional<std::string> partitionType;  ///< when the device manager knows it; else it stands in the disk's table
+  std::string busPath;
+  OpticalMedium medium = OpticalMedium::none;
+  std::optional<Failure> unread;  ///< why the volume and the table are not known
+};
+
+/// Asks the device manager's database, or reads the disk where that says nothing. Absent when there is no such device
+/// or nothing in it.
+std::optional<DiskFacts> factsOf(const SystemRoot& root, const DiskName& name);
+
+}  // namespace tavisk
