@@ -12,7 +12,8 @@ using Value = std::optional<std::string>;
 /// One change under way: the steps of carryOut() and the effect that they fill in.
 class Change {
  public:
-  Change(const Setting& setting, const std::string& asked) : _setting(setting), _asked(asked) {
+  Change(const Setting& setting, const std::string& asked)
+      : _setting(setting), _asked(asked), _askedLive(setting.liveFor ? setting.liveFor(asked) : asked) {
     _effect.setting = setting.name;
     _effect.asked = asked;
     _effect.where = setting.where;
@@ -33,8 +34,8 @@ class Change {
   /// Whether something is to be written. A value that cannot be read is not a reason against it: what counts is read
   /// back afterwards.
   bool isNeeded() {
-    const bool isLiveThere = hasValue(_setting.live, _effect.live);
-    const bool isStoredThere = hasValue(_setting.stored, _effect.stored);
+    const bool isLiveThere = hasValue(_setting.live, _askedLive, _effect.live);
+    const bool isStoredThere = hasValue(_setting.stored, _asked, _effect.stored);
     _effect.before = _setting.live ? _effect.live : _effect.stored;
     const bool isRead = _setting.live || _setting.stored;
     _effect.outcome = isRead && isLiveThere && isStoredThere ? Outcome::unchanged : Outcome::applied;
@@ -49,8 +50,8 @@ class Change {
   }
 
   void readBack() {
-    readBack(_setting.live, _effect.live, _setting.name);
-    readBack(_setting.stored, _effect.stored, _setting.where.empty() ? _setting.name : _setting.where);
+    readBack(_setting.live, _askedLive, _effect.live, _setting.name);
+    readBack(_setting.stored, _asked, _effect.stored, _setting.where.empty() ? _setting.name : _setting.where);
   }
 
  private:
@@ -62,13 +63,11 @@ class Change {
     if (!_effect.failure) _effect.failure = failure;
   }
 
-  bool isAsked(const Value& value) const { return value.value_or("") == _asked; }
-
-  bool hasValue(const Setting::Read& read, Value& value) const {
+  static bool hasValue(const Setting::Read& read, const std::string& wanted, Value& value) {
     if (!read) return true;
     const Result<Value> found = read();
     value = found.valueOr(std::nullopt);
-    return found && isAsked(value);
+    return found && value.value_or("") == wanted;
   }
 
   bool succeeds(const Setting::Write& write) {
@@ -77,16 +76,17 @@ class Change {
     return static_cast<bool>(written);
   }
 
-  void readBack(const Setting::Read& read, Value& value, const std::string& place) {
+  void readBack(const Setting::Read& read, const std::string& wanted, Value& value, const std::string& place) {
     if (!read) return;
     const Result<Value> found = read();
     value = found.valueOr(std::nullopt);
     if (!found) return fail(found.failure());
-    if (!isAsked(value)) fail({"read back", place, value ? "reads " + *value : "reads nothing"});
+    if (value.value_or("") != wanted) fail({"read back", place, value ? "reads " + *value : "reads nothing"});
   }
 
   const Setting& _setting;
   const std::string& _asked;
+  const std::string _askedLive;
   Effect _effect;
 };
 

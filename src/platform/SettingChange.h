@@ -28,6 +28,8 @@ struct Setting {
   Read stored;
   Write store;
   Write apply;
+  /// The live value that comes of a value asked for, where the machine cannot do quite that; empty: the same.
+  std::function<std::string(const std::string& asked)> liveFor;
   /// Whether the live value has reached what was asked; asked again after each event, for at most 3 s.
   std::function<bool(const std::string& value)> settled;
   /// Write although live and stored already have the value (a machine that counts its operations).

@@ -2,59 +2,17 @@
 // SPDX-License-Identifier: MIT
 #include "FakeServiceManager.h"
 
-#include <poll.h>
-#include <sys/eventfd.h>
-#include <sys/socket.h>
-#include <sys/un.h>
 #include <systemd/sd-bus.h>
-#include <unistd.h>
 
-#include <stdexcept>
-#include <utility>
+#include <cstdlib>
 
 namespace tavisk {
 namespace {
 
 constexpr const char* managerPath = "/org/freedesktop/systemd1";
 constexpr const char* managerInterface = "org.freedesktop.systemd1.Manager";
+const std::vector<std::string> names = {"org.freedesktop.systemd1", "org.freedesktop.timesync1"};
 constexpr const char* unitFolder = "/org/freedesktop/systemd1/unit/";
-
-int listenAt(const std::filesystem::path& path) {
-  std::filesystem::create_directories(path.parent_path());
-  int listener = ::socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0);
-  sockaddr_un address{};
-  address.sun_family = AF_UNIX;
-  path.string().copy(address.sun_path, sizeof address.sun_path - 1);
-  if (::bind(listener, reinterpret_cast<sockaddr*>(&address), sizeof address) != 0 || ::listen(listener, 4) != 0)
-    throw std::runtime_error("no socket for the fake service manager");
-  return listener;
-}
-
-sd_bus* greeted(int connection) {
-  sd_bus* bus = nullptr;
-  sd_bus_new(&bus);
-  sd_bus_set_fd(bus, connection, connection);
-  sd_bus_set_server(bus, 1, SD_ID128_MAKE(1, 2, 3, 4, 5, 6, 7, 8, 9, a, b, c, d, e, f, 0));
-  sd_bus_start(bus);
-  return bus;
-}
-
-sd_bus* joined(const std::filesystem::path& socket) {
-  sd_bus* bus = nullptr;
-  sd_bus_new(&bus);
-  sd_bus_set_address(bus, ("unix:path=" + socket.string()).c_str());
-  sd_bus_set_bus_client(bus, 1);
-  if (sd_bus_start(bus) < 0 || sd_bus_request_name(bus, "org.freedesktop.systemd1", 0) < 0 ||
-      sd_bus_request_name(bus, "org.freedesktop.timesync1", 0) < 0)
-    throw std::runtime_error("no place on the bus for the fake service manager");
-  return bus;
-}
-
-std::string firstText(sd_bus_message* message) {
-  const char* text = "";
-  sd_bus_message_read_basic(message, 's', &text);
-  return text;
-}
 
 /// Unit names as object paths, without dots and dashes.
 std::string pathOf(const std::string& unit) {
@@ -76,21 +34,8 @@ std::string unitAt(const char* path) {
 }  // namespace
 
 FakeServiceManager::FakeServiceManager(const std::filesystem::path& socket, Reached reached)
-    : _wake(::eventfd(0, EFD_CLOEXEC)) {
-  if (reached == Reached::straight) {
-    _listener = listenAt(socket);
-    _thread = std::thread([this] { serveCallers(); });
-  } else {
-    _thread = std::thread([this, bus = joined(socket)] { serve(bus); });
-  }
-}
-
-FakeServiceManager::~FakeServiceManager() {
-  ::eventfd_write(_wake, 1);
-  _thread.join();
-  ::close(_wake);
-  ::close(_listener);
-}
+    : _peer(socket, reached == Reached::overBus ? names : std::vector<std::string>(),
+            [this](sd_bus_message* call, const std::string& member) { return receive(call, member); }) {}
 
 void FakeServiceManager::set(const std::string& unit, const FakeUnit& state) {
   const std::lock_guard lock(_mutex);
@@ -112,34 +57,10 @@ void FakeServiceManager::breakNext(const std::string& method, Fault fault) {
   _faults[method] = fault;
 }
 
-void FakeServiceManager::serveCallers() {
-  pollfd waiting[] = {{_listener, POLLIN, 0}, {_wake, POLLIN, 0}};
-  while (::poll(waiting, 2, -1) > 0 && waiting[1].revents == 0) serve(greeted(::accept(_listener, nullptr, nullptr)));
-}
-
-void FakeServiceManager::serve(sd_bus* bus) {
-  auto filter = [](sd_bus_message* message, void* manager, sd_bus_error* error) {
-    return receive(message, manager, error);
-  };
-  sd_bus_add_filter(bus, nullptr, filter, this);
-  _hangUp = false;
-  while (!_hangUp && sd_bus_is_open(bus) > 0) {
-    int result = sd_bus_process(bus, nullptr);
-    if (result < 0) break;
-    if (result > 0) continue;
-    pollfd waiting[] = {{sd_bus_get_fd(bus), POLLIN, 0}, {_wake, POLLIN, 0}};
-    if (::poll(waiting, 2, -1) < 0 || waiting[1].revents != 0) break;
-  }
-  sd_bus_close_unref(bus);
-}
-
-int FakeServiceManager::receive(sd_bus_message* message, void* manager, void* /*error*/) {
-  auto* self = static_cast<FakeServiceManager*>(manager);
-  const char* member = sd_bus_message_get_member(message);
-  if (member == nullptr || sd_bus_message_is_method_call(message, nullptr, nullptr) <= 0) return 0;
-  const std::lock_guard lock(self->_mutex);
-  auto fault = self->_faults.extract(member);
-  return fault ? self->answerFault(message, fault.mapped()) : self->answer(message, member);
+int FakeServiceManager::receive(sd_bus_message* message, const std::string& member) {
+  const std::lock_guard lock(_mutex);
+  auto fault = _faults.extract(member);
+  return fault ? answerFault(message, fault.mapped()) : answer(message, member);
 }
 
 int FakeServiceManager::answerFault(sd_bus_message* message, Fault fault) {
@@ -149,7 +70,7 @@ int FakeServiceManager::answerFault(sd_bus_message* message, Fault fault) {
     case Fault::wrongType:
       return sd_bus_reply_method_return(message, "t", std::uint64_t{7});
     case Fault::hangUp:
-      _hangUp = true;
+      _peer.hangUp();
       return 1;
     case Fault::silence:
       return 1;

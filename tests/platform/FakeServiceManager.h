@@ -2,16 +2,13 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <atomic>
 #include <filesystem>
 #include <map>
 #include <mutex>
 #include <string>
-#include <thread>
 #include <vector>
 
-struct sd_bus_message;
-struct sd_bus;
+#include "BusPeer.h"
 
 namespace tavisk {
 
@@ -31,9 +28,6 @@ class FakeServiceManager {
   /// systemd-timesyncd that uses fallback.example.
   enum class Reached { straight, overBus };
   explicit FakeServiceManager(const std::filesystem::path& socket, Reached reached = Reached::straight);
-  FakeServiceManager(const FakeServiceManager&) = delete;
-  FakeServiceManager& operator=(const FakeServiceManager&) = delete;
-  ~FakeServiceManager();
 
   void set(const std::string& unit, const FakeUnit& state);
   FakeUnit get(const std::string& unit);
@@ -44,7 +38,7 @@ class FakeServiceManager {
   void breakNext(const std::string& method, Fault fault);
 
  private:
-  static int receive(sd_bus_message* message, void* manager, void* error);
+  int receive(sd_bus_message* message, const std::string& member);
   int answer(sd_bus_message* message, const std::string& member);
   int answerFault(sd_bus_message* message, Fault fault);
   int answerProperty(sd_bus_message* message);
@@ -52,18 +46,13 @@ class FakeServiceManager {
   FakeUnit unitOf(sd_bus_message* message);
   int answerJob(sd_bus_message* message, const std::string& member);
   int answerFiles(sd_bus_message* message, const std::string& member);
-  void serveCallers();
-  void serve(sd_bus* bus);
 
-  int _listener = -1;
-  int _wake;
   std::mutex _mutex;
   std::map<std::string, FakeUnit> _units;
   std::map<std::string, Fault> _faults;
   std::vector<std::string> _calls;
-  std::atomic<bool> _hangUp = false;
   unsigned _jobs = 0;
-  std::thread _thread;
+  BusPeer _peer;  ///< the last: its thread works with the others
 };
 
 }  // namespace tavisk

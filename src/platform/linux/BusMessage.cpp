@@ -89,6 +89,9 @@ std::int32_t BusMessage::readInt32() {
 std::uint32_t BusMessage::readUint32() {
   return readNumber<std::uint32_t>('u');
 }
+std::uint64_t BusMessage::readUint64() {
+  return readNumber<std::uint64_t>('t');
+}
 
 std::vector<std::string> BusMessage::readTexts() {
   std::vector<std::string> texts;

@@ -41,6 +41,7 @@ class BusMessage {
   bool readBoolean();
   std::int32_t readInt32();
   std::uint32_t readUint32();
+  std::uint64_t readUint64();
   std::vector<std::string> readTexts();
   /// False when there is no such value here, or a surrounding array is at its end.
   bool enter(char type, const char* contents);

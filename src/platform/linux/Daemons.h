@@ -28,6 +28,8 @@ class Daemons {
   /// Success means that the daemon runs: one that was started and ended at once, or never began, is a failure.
   virtual Result<void> start(const Daemon& daemon) = 0;
   virtual Result<void> stop(const Daemon& daemon) = 0;
+  /// Success means that it has ended and started again.
+  virtual Result<void> restart(const Daemon& daemon) = 0;
   /// A daemon that does not run stays so. Returns without waiting for the restart to end.
   virtual Result<void> restartIfRunning(const Daemon& daemon) = 0;
 };

@@ -103,6 +103,10 @@ Result<void> InitScriptDaemons::awaitEnd(const Daemon& daemon) {
   return Failure{"stop", scriptOf(daemon), "it reported success, but " + std::string(daemon.program) + " still runs"};
 }
 
+Result<void> InitScriptDaemons::restart(const Daemon& daemon) {
+  return runScript(daemon, "restart");
+}
+
 Result<void> InitScriptDaemons::restartIfRunning(const Daemon& daemon) {
   auto running = isRunning(daemon);
   if (!running || !*running) return {};

@@ -25,6 +25,7 @@ class InitScriptDaemons : public Daemons {
   Result<void> setStartsAtBoot(const Daemon& daemon, bool starts) override;
   Result<void> start(const Daemon& daemon) override;
   Result<void> stop(const Daemon& daemon) override;
+  Result<void> restart(const Daemon& daemon) override;
   Result<void> restartIfRunning(const Daemon& daemon) override;
 
  private:

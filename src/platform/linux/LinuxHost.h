@@ -16,6 +16,8 @@
 #include "platform/linux/LinuxHostConfigService.h"
 #include "platform/linux/LinuxMachine.h"
 #include "platform/linux/LinuxNetworkTimeService.h"
+#include "platform/linux/LinuxPowerController.h"
+#include "platform/linux/LinuxPowerSettingsService.h"
 #include "platform/linux/LinuxRemoteEventsService.h"
 #include "platform/linux/LinuxRemoteShellService.h"
 #include "platform/linux/LinuxSystemLog.h"
@@ -37,8 +39,8 @@ class LinuxHost final : public Host {
   SystemLog& systemLog() override { return _systemLog; }
   ClockService& clock() override { return _clock; }
   NetworkTimeService& networkTime() override { return _networkTime; }
-  PowerSettingsService& powerSettings() override { throw NotBuiltYet(); }
-  PowerController& powerController() override { throw NotBuiltYet(); }
+  PowerSettingsService& powerSettings() override { return _powerSettings; }
+  PowerController& powerController() override { return _powerController; }
   RemoteShellService& remoteShell() override { return _remoteShell; }
   RemoteEventsService& remoteEvents() override { return _remoteEvents; }
   HostConfigService& hostConfiguration() override { return _hostConfiguration; }
@@ -72,6 +74,12 @@ class LinuxHost final : public Host {
   LinuxRemoteEventsService _remoteEvents;
   LinuxHostConfigService _hostConfiguration;
   LinuxDynamicStore _dynamicStore;
+  FirstConsole _console;
+  KernelNetworkCards _networkCards;
+  IpmiDevice _controllerLink;
+  ManagementController _controller;
+  LinuxPowerSettingsService _powerSettings;
+  LinuxPowerController _powerController;
   LinuxBootLoaderFile _bootLoaderFile;
   LinuxDisks _disks;
   LinuxDiskEventSession _diskEvents;

@@ -38,18 +38,37 @@ std::vector<std::string> logicalLines(std::string_view text) {
   return lines;
 }
 
-}  // namespace
-
-std::vector<std::string> assignments(std::string_view text, std::string_view section, std::string_view key) {
-  std::vector<std::string> values;
+/// Key and value of each line of a section.
+std::vector<std::pair<std::string, std::string>> allAssignments(std::string_view text, std::string_view section) {
+  std::vector<std::pair<std::string, std::string>> found;
   auto heading = "[" + std::string(section) + "]";
   bool inside = false;
   for (const auto& line : logicalLines(text)) {
     if (line.starts_with('[')) inside = line == heading;
     auto sign = line.find('=');
-    if (inside && sign != std::string::npos && trimmed(std::string_view(line).substr(0, sign)) == key)
-      values.emplace_back(trimmed(std::string_view(line).substr(sign + 1)));
+    if (inside && sign != std::string::npos)
+      found.emplace_back(trimmed(std::string_view(line).substr(0, sign)),
+                         trimmed(std::string_view(line).substr(sign + 1)));
   }
+  return found;
+}
+
+}  // namespace
+
+std::vector<std::string> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders) {
+  std::map<std::string, std::string> byName;
+  for (const auto& folder : folders)
+    for (const auto& name : root.list(folder).valueOr({}))
+      if (name.ends_with(".conf")) byName.emplace(name, folder + name);
+  std::vector<std::string> files;
+  for (auto& [name, path] : byName) files.push_back(path);
+  return files;
+}
+
+std::vector<std::string> assignments(std::string_view text, std::string_view section, std::string_view key) {
+  std::vector<std::string> values;
+  for (auto& [name, value] : allAssignments(text, section))
+    if (name == key) values.push_back(std::move(value));
   return values;
 }
 
@@ -58,13 +77,9 @@ std::vector<std::string> SystemdConfig::files() const {
   for (const auto* folder : folders)
     if (files.empty() && _root.exists(folder + _file)) files.push_back(folder + _file);
 
-  std::map<std::string, std::string> dropIns;
-  for (const auto* folder : folders) {
-    auto dropInFolder = folder + _file + ".d/";
-    for (const auto& name : _root.list(dropInFolder).valueOr({}))
-      if (name.ends_with(".conf")) dropIns.emplace(name, dropInFolder + name);
-  }
-  for (auto& [name, path] : dropIns) files.push_back(path);
+  std::vector<std::string> dropInFolders;
+  for (const auto* folder : folders) dropInFolders.push_back(folder + _file + ".d/");
+  for (auto& path : configurationFiles(_root, dropInFolders)) files.push_back(std::move(path));
   return files;
 }
 
@@ -78,6 +93,34 @@ std::vector<std::string> SystemdConfig::words(std::string_view section, std::str
     }
   }
   return words;
+}
+
+std::optional<SystemdConfig::Assignment> SystemdConfig::last(std::string_view section, std::string_view key) const {
+  std::optional<Assignment> last;
+  for (const auto& file : files())
+    for (auto& value : assignments(_root.read(file, fileLimit).valueOr(""), section, key)) last = {file, value};
+  return last && !last->value.empty() ? last : std::nullopt;
+}
+
+std::string SystemdConfig::whatHides(std::string_view section, const std::vector<std::string>& keys) const {
+  const auto own = ownDropIn();
+  const auto ownName = own.substr(own.rfind('/'));
+  for (const auto& file : files()) {
+    const bool isLater = file.find(".conf.d/") != std::string::npos && file.substr(file.rfind('/')) > ownName;
+    const auto text = isLater ? _root.read(file, fileLimit).valueOr("") : "";
+    for (const auto& key : keys)
+      if (!assignments(text, section, key).empty()) return file;
+  }
+  return {};
+}
+
+Result<void> SystemdConfig::setOwn(const std::string& section, const std::map<std::string, std::string>& values) const {
+  auto merged = values;
+  for (auto& [key, value] : allAssignments(_root.read(ownDropIn(), fileLimit).valueOr(""), section))
+    merged.emplace(key, value);
+  auto text = dropInHeader + ("[" + section + "]\n");
+  for (const auto& [key, value] : merged) text += std::string(key).append("=").append(value).append("\n");
+  return _root.write(ownDropIn(), text);
 }
 
 std::string SystemdConfig::ownDropIn() const {

@@ -192,6 +192,10 @@ Result<void> UnitDaemons::stop(const Daemon& daemon) {
   return runJob(daemon, "StopUnit");
 }
 
+Result<void> UnitDaemons::restart(const Daemon& daemon) {
+  return runJob(daemon, "RestartUnit");
+}
+
 Result<void> UnitDaemons::restartIfRunning(const Daemon& daemon) {
   auto job = order(daemon, "TryRestartUnit", "o", daemon.unit, "replace");
   if (!job) return job.failure();

@@ -1,0 +1,144 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/power/FreezeRestart.h"
+
+#include "platform/SettingNames.h"
+#include "platform/Text.h"
+#include "platform/linux/KernelFile.h"
+#include "platform/linux/TimeSpan.h"
+#include "platform/linux/power/PowerValues.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* section = "Manager";
+constexpr const char* key = "RuntimeWatchdogSec";
+constexpr const char* panicFile = "/proc/sys/kernel/panic";
+constexpr const char* panicDropIn = "/etc/sysctl.d/60-tavisk.conf";
+constexpr std::chrono::seconds watchdogTime{60};
+constexpr const char* panicSeconds = "10";
+constexpr std::size_t fileLimit = 65536;
+
+BusObject serviceManager() {
+  return {"org.freedesktop.systemd1", "/org/freedesktop/systemd1", "org.freedesktop.systemd1.Manager"};
+}
+
+std::string together(bool watchdog, bool panic) {
+  if (watchdog == panic) return onOff(panic);
+  return panic ? "on after a kernel panic only" : "on by the watchdog only";
+}
+
+bool isOnPanic(const std::string& seconds) {
+  return leadingInteger(seconds) != 0;
+}
+
+/// The value of kernel.panic in a file of sysctl.d(5).
+std::optional<std::string> panicIn(const std::string& text) {
+  std::optional<std::string> value;
+  for (const auto& line : split(text, "\n")) {
+    const auto words = split(line, " \t=");
+    if (words.size() == 2 && (words[0] == "kernel.panic" || words[0] == "kernel/panic" || words[0] == "-kernel.panic"))
+      value = words[1];
+  }
+  return value;
+}
+
+bool isWatchdogTime(const std::string& text) {
+  if (text == "off" || text.empty()) return false;
+  const auto time = timeSpan(text);
+  return !time || time->count() != 0;
+}
+
+}  // namespace
+
+bool FreezeRestart::hasWatchdog() const {
+  return _machine.root.exists("/dev/watchdog0");
+}
+
+Result<bool> FreezeRestart::isWatchdogUsed() const {
+  auto bus = _machine.services.serviceManager();
+  if (!bus) return bus.failure();
+  auto time = (*bus)->property(serviceManager(), "RuntimeWatchdogUSec", "t");
+  if (!time) return time.failure();
+  return std::move(time).value().readUint64() != 0;
+}
+
+/// Without a watchdog the kernel's part is all there is.
+Result<std::optional<std::string>> FreezeRestart::live() const {
+  const auto panic = readKernelFile(_machine.root, panicFile);
+  if (!panic) return panic.failure();
+  if (!hasWatchdog() || !_machine.services.hasServiceManager())
+    return std::optional<std::string>(onOff(isOnPanic(*panic)));
+  const auto watchdog = isWatchdogUsed();
+  if (!watchdog) return watchdog.failure();
+  return std::optional(together(*watchdog, isOnPanic(*panic)));
+}
+
+std::string FreezeRestart::storedPanic() const {
+  std::string seconds = "0";
+  for (const auto& file : configurationFiles(
+           _machine.root, {"/etc/sysctl.d/", "/run/sysctl.d/", "/usr/local/lib/sysctl.d/", "/usr/lib/sysctl.d/"}))
+    seconds = panicIn(_machine.root.read(file, fileLimit).valueOr("")).value_or(seconds);
+  return seconds;
+}
+
+std::string FreezeRestart::stored() const {
+  const auto panic = isOnPanic(storedPanic());
+  if (!_machine.services.hasServiceManager()) return onOff(panic);
+  const auto watchdog = _config.last(section, key);
+  return together(watchdog && isWatchdogTime(watchdog->value), panic);
+}
+
+Result<void> FreezeRestart::store(const std::string& value) const {
+  if (auto failure = whyNeedsRoot("write", panicDropIn)) return *failure;
+  const auto panic = std::string("kernel.panic = ") + (isOn(value) ? panicSeconds : "0") + "\n";
+  if (auto written = _machine.root.write(panicDropIn, dropInHeader + panic); !written) return written;
+  if (!_machine.services.hasServiceManager()) return {};
+  return _config.setOwn(section, {{key, isOn(value) ? std::to_string(watchdogTime.count()) : "off"}});
+}
+
+/// The manager does not take up the file over a value that was set, so it gets both.
+Result<void> FreezeRestart::setWatchdog(bool on) const {
+  auto bus = _machine.services.serviceManager();
+  if (!bus) return bus.failure();
+  const BusObject properties{"org.freedesktop.systemd1", "/org/freedesktop/systemd1",
+                             "org.freedesktop.DBus.Properties"};
+  const auto time = on ? std::chrono::microseconds(watchdogTime).count() : 0;
+  const Bus::Writer arguments = [time](BusMessage& message) {
+    message.write("org.freedesktop.systemd1.Manager");
+    message.write("RuntimeWatchdogUSec");
+    message.open('v', "t");
+    message.write(static_cast<std::uint64_t>(time));
+    message.close();
+  };
+  auto set = (*bus)->call(properties, "Set", "", arguments);
+  if (!set) return Failure{"set RuntimeWatchdogUSec", "the service manager", set.failure().why};
+  return {};
+}
+
+Result<void> FreezeRestart::apply(const std::string& value) const {
+  auto panic = writeKernelFile(_machine.root, panicFile, isOn(value) ? panicSeconds : "0");
+  auto watchdog = _machine.services.hasServiceManager() ? setWatchdog(isOn(value)) : Result<void>();
+  return panic ? watchdog : panic;
+}
+
+Setting FreezeRestart::restartAfterFreeze() const {
+  Setting setting;
+  setting.name = setting::restartAfterFreeze;
+  setting.live = [this] { return live(); };
+  setting.stored = [this] { return std::optional(stored()); };
+  return setting;
+}
+
+Setting FreezeRestart::restartAfterFreezeChange() const {
+  auto setting = restartAfterFreeze();
+  setting.where = panicDropIn;
+  setting.undoneBy = _config.whatHides(section, {key});
+  if (_machine.services.hasServiceManager()) setting.where = _config.ownDropIn() + ", " + panicDropIn;
+  if (!hasWatchdog()) setting.note = "no watchdog here: only a kernel that has panicked restarts, not one that hangs";
+  setting.store = [this](const std::string& value) { return store(value); };
+  setting.apply = [this](const std::string& value) { return apply(value); };
+  return setting;
+}
+
+}  // namespace tavisk

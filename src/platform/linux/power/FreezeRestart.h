@@ -1,0 +1,35 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "platform/SettingChange.h"
+#include "platform/linux/LinuxMachine.h"
+#include "platform/linux/SystemdConfig.h"
+
+namespace tavisk {
+
+/// Whether a machine that hangs restarts: the service manager keeps the watchdog's clock from running out
+/// (RuntimeWatchdogSec of systemd-system.conf(5)), and a kernel that has panicked restarts (kernel.panic). The parts
+/// may differ; the value then says which one is on.
+class FreezeRestart {
+ public:
+  explicit FreezeRestart(const LinuxMachine& machine) : _machine(machine), _config(machine.root, "system.conf") {}
+
+  Setting restartAfterFreeze() const;
+  Setting restartAfterFreezeChange() const;
+
+ private:
+  bool hasWatchdog() const;
+  Result<std::optional<std::string>> live() const;
+  Result<bool> isWatchdogUsed() const;
+  std::string stored() const;
+  Result<void> store(const std::string& value) const;
+  Result<void> apply(const std::string& value) const;
+  Result<void> setWatchdog(bool on) const;
+  std::string storedPanic() const;
+
+  LinuxMachine _machine;
+  SystemdConfig _config;
+};
+
+}  // namespace tavisk

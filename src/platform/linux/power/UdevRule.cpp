@@ -1,0 +1,37 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/power/UdevRule.h"
+
+#include "platform/linux/LinuxMachine.h"
+#include "platform/linux/SystemdConfig.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* valueLine = "# value: ";
+constexpr const char* managerSocket = "/run/udev/control";
+
+}  // namespace
+
+UdevRule::UdevRule(const SystemRoot& root, const std::string& setting)
+    : _root(root), _file("/etc/udev/rules.d/60-tavisk-" + setting + ".rules") {}
+
+std::optional<std::string> UdevRule::value() const {
+  constexpr std::size_t limit = 65536;
+  const auto text = _root.read(_file, limit).valueOr("");
+  const auto line = text.find(valueLine);
+  if (line == std::string::npos) return std::nullopt;
+  const auto start = line + std::string_view(valueLine).size();
+  return text.substr(start, text.find('\n', start) - start);
+}
+
+Result<void> UdevRule::write(const std::string& value, const std::string& rule) const {
+  if (auto failure = whyNeedsRoot("write", _file)) return *failure;
+  return _root.write(_file, std::string(dropInHeader) + valueLine + value + "\n" + rule + "\n");
+}
+
+std::string UdevRule::note() const {
+  return _root.exists(managerSocket) ? "" : "no device manager runs here: lasts until the restart";
+}
+
+}  // namespace tavisk
