@@ -96,6 +96,7 @@ class AtThePrompt(unittest.TestCase):
             ("settimezone as\t\t", "Set TimeZone: Asia/Tokyo"),
             ("setdate -gettimez\t", "setdate: Error: -gettimez is invalid date format... use mm:dd:yy"),
             ("-bogus getda\t", "Error: -bogus is not a valid command"),
+            ("gettimezone qui\t", "Time Zone: UTC\r\nError: qui is not a valid command"),
         ):
             with self.subTest(keys):
                 self.terminal.type(keys + "\n")
@@ -165,11 +166,36 @@ class AtThePrompt(unittest.TestCase):
         self.terminal.type("\x1aate\n")  # nobody could continue this process: the system does not stop it
         self.terminal.wait_for("\r\nDate: 3/7/2007" + ENDED)
 
-    def test_without_the_library_lines_are_read_as_they_come(self):
+
+class WithoutEditing(unittest.TestCase):
+    def setUp(self):
+        self.machine = ScratchMachine(PROGRAM, {"Clock": {"Time": 1173258303}})
+        self.addCleanup(self.machine.__exit__)
+
+    def terminal(self, words=(), **environment):
+        terminal = Terminal(self.machine, words, **environment)
+        self.addCleanup(terminal.close)
+        return terminal
+
+    def test_a_terminal_that_cannot_do_it_and_a_system_without_the_library(self):
         self.machine.file("/lib/libedit.so.2")
-        self.open(LD_LIBRARY_PATH=str(self.machine.directory / "root" / "lib"))
-        self.assertEqual(self.answer("getdate"), "Date: 3/7/2007")
-        self.assertIn("not a valid", self.answer("getda\t"))
+        without = {"TERM": "xterm", "LD_LIBRARY_PATH": f"{self.machine.directory}/root/lib"}
+        for environment in ({"TERM": "dumb"}, without):
+            with self.subTest(**environment):
+                terminal = self.terminal(**environment)
+                terminal.wait_for("\r\n> tavisk\r\n> type -help for help.\r\n> ")
+                terminal.type("getdate\tx\n")
+                terminal.wait_for("\r\nError: getdate\tx is not a valid command\r\n> ")
+                terminal.type("\x03")
+                self.assertEqual(terminal.status(), 0)
+
+    def test_a_failure_is_told_in_one_line(self):
+        self.machine.change({"Refusals": {"Time": "sealed\x85 off"}})
+        terminal = self.terminal(["-settime", "1:2:3"])
+        shown = terminal.wait_for("Set Time: 01:02:03\r\n")
+        self.assertTrue(shown.startswith(f"tavisk: rehearsing on {self.machine.directory}\ntavisk: Time: "), shown)
+        self.assertIn("sealed\\u{0085} off\n", shown)
+        self.assertEqual(terminal.status(), 0)
 
 
 if __name__ == "__main__":

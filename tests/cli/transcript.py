@@ -7,13 +7,15 @@ usage: transcript.py PROGRAM TRANSCRIPT
     == title of a case
     machine {"Clock": {"Time": 0}}     the machine, as JSON ({"data": "00ff"} is data)
     file /etc/motd some text           a file of the machine; \\n is a newline
+    link /Backup /Volumes/Backup       a symbolic link of the machine
     environment TAVISK_LOG=stderr
     $ tavisk -getdate -gettime         the words, quoted as in a shell; starts the run
     < -getdate                         a typed line, in order; `<|` types the text without a newline at the end
     Date: 1/1/1970                     the expected standard output, line by line; `|` at the end: no newline follows
     !error tavisk: what standard error says
     !status 1                          0 when not given
-    !machine {"Clock": {"Time": 5}}    what the machine holds afterwards (other keys are not looked at)
+    !machine {"Clock": {"Time": 5}}    what has changed in the machine, and nothing else; null: what is gone. The
+                                       authorization is looked at where it is named
     !effects [["Time", "applied"]]     every effect, in order
     !log a line of system.log          every line, in order
 
@@ -26,7 +28,7 @@ import re
 import shlex
 import sys
 
-from machine import ScratchMachine, decoded, program_and_arguments
+from machine import ScratchMachine, decoded, merged, program_and_arguments
 
 
 def bytes_of(text):
@@ -39,13 +41,14 @@ class Case:
         self.title = title
         self.description = None
         self.files = []
+        self.links = []
         self.environment = {}
         self.words = None
         self.typed = b""
         self.output = b""
         self.errors = []
         self.status = 0
-        self.machine = None
+        self.changes = {}
         self.effects = None
         self.log = []
 
@@ -56,6 +59,8 @@ class Case:
         elif keyword == "file":
             path, _, content = rest.partition(" ")
             self.files.append((path, bytes_of(content.replace("\\n", "\n"))))
+        elif keyword == "link":
+            self.links.append(rest.split(" "))
         elif keyword == "environment":
             name, _, value = rest.partition("=")
             self.environment[name] = value
@@ -82,30 +87,32 @@ class Case:
         elif what == "status":
             self.status = int(value)
         else:
-            setattr(self, {"machine": "machine", "effects": "effects"}[what], json.loads(value))
+            setattr(self, {"machine": "changes", "effects": "effects"}[what], json.loads(value))
+
+    def machines(self, found):
+        """The machine as it should be and as it is."""
+        expected = merged(decoded(self.description or {}), decoded(self.changes))
+        if "Authorization" not in self.changes:
+            found.pop("Authorization", None)
+            expected.pop("Authorization", None)
+        return expected, found
 
     def differences(self, program):
         with ScratchMachine(program, self.description) as machine:
             for path, content in self.files:
                 machine.file(path, content)
+            for path, target in self.links:
+                (machine.directory / "root" / path.lstrip("/")).symlink_to(target)
             output, errors, status = machine.run(self.words, self.typed, self.environment)
             errors = errors.decode(errors="replace").replace(str(machine.directory), "DIR").splitlines()
             yield from compared("output", self.output, output)
             yield from compared("standard error", self.errors, errors)
             yield from compared("status", self.status, status)
             yield from compared("system.log", self.log, machine.lines("system.log"))
-            if self.machine is not None:
-                yield from compared("machine", decoded(self.machine), held(machine.read(), decoded(self.machine)))
+            yield from compared("machine", *self.machines(machine.read()))
             if self.effects is not None:
                 found = [[effect["setting"], effect["outcome"]] for effect in machine.effects()]
                 yield from compared("effects", self.effects, found)
-
-
-def held(machine, asked):
-    """The part of the machine that was asked about."""
-    if not isinstance(asked, dict) or not isinstance(machine, dict):
-        return machine
-    return {key: held(machine.get(key), value) for key, value in asked.items()}
 
 
 def compared(what, expected, found):

@@ -12,46 +12,6 @@ struct MachineInUtc : ScratchMachine {
   MachineInUtc() { set("Clock", "Time", 1173301503); }
 };
 
-const std::string notTheTime = "settime: Error, 99 is invalid time format... use hh:mm:ss\n";
-
-TEST(Dispatch, runsTheWordsInOrder) {
-  struct Case {
-    std::vector<std::string> words;
-    std::string output;
-    int status;
-  };
-  const Case cases[] = {
-      {{"-GETDATE", "gettime", "-gettimezone"}, "Date: 3/7/2007\nTime: 21:05:03\nTime Zone: UTC\n", 0},
-      {{"GetDate"}, "Date: 3/7/2007\n", 0},
-      {{"--getdate"}, "Error: --getdate is not a valid command\n", 0},
-      {{"-getdate", "-Bogus", "-gettime"}, "Date: 3/7/2007\nError: -Bogus is not a valid command\n", 0},
-      {{"-getdate", "", "-gettime"}, "Date: 3/7/2007\nError:  is not a valid command\n", 0},
-      {{"\xff"}, "Error: \xff is not a valid command\n", 0},
-      {{"-gettime", "-settimezone", "\xe9t\xe9", "-getdate"},
-       "Time: 21:05:03\nError: \xe9t\xe9 is not a valid command\n",
-       0},
-      {{"-getdate\t"}, "Error: -getdate\t is not a valid command\n", 0},
-      {{"%s%n"}, "Error: %s%n is not a valid command\n", 0},
-      {{"-f"}, "", 0},
-      {{"-f", "-getdate"}, "Date: 3/7/2007\n", 0},
-      {{"-F", "-getdate"}, "Error: -F is not a valid command\n", 0},
-      {{"f"}, "Error: f is not a valid command\n", 0},
-      {{"-getdate", "-f"}, "Date: 3/7/2007\nError: -f is not a valid command\n", 0},
-      // The status is that of the last handler that touched the flag.
-      {{"-settime", "99"}, notTheTime, 1},
-      {{"-settime", "99", "-getdate"}, notTheTime + "Date: 3/7/2007\n", 0},
-      {{"-settime", "99", "-bogus"}, notTheTime + "Error: -bogus is not a valid command\n", 1},
-      {{"-settime", "99", "-version"}, notTheTime + "tavisk, Version 1.4a1\nCopyright 2026 The tavisk developers\n", 1},
-  };
-  for (const auto& test : cases) {
-    SCOPED_TRACE(test.words.front());
-    MachineInUtc machine;
-    const auto result = runTool(machine, test.words);
-    EXPECT_EQ(result.output, test.output);
-    EXPECT_EQ(result.status, test.status);
-  }
-}
-
 std::string tableOf(const std::string& selector, const std::string& count) {
   return "<dict><key>-word</key><dict><key>selector</key><string>" + selector +
          "</string><key>arguments</key><integer>" + count +

@@ -199,13 +199,6 @@ TEST(ScratchHost, countsEveryOperation) {
   EXPECT_EQ(machine.effectsLog().size(), 4U);
 }
 
-TEST(ScratchHost, keepsTheZoneAndItsFileTogether) {
-  ScratchMachine machine;
-  machine.host().clock().setTimeZone("/usr/share/zoneinfo/America/Los_Angeles");
-  EXPECT_EQ(machine.get("Clock", "Time Zone"), PropertyList("America/Los_Angeles"));
-  EXPECT_EQ(machine.get("Clock", "Time Zone File"), PropertyList("/usr/share/zoneinfo/America/Los_Angeles"));
-}
-
 TEST(ScratchHost, writesOneLineAMessage) {
   ScratchMachine machine;
   for (const char* message : {"one\n", "two\nlines\n\n", "", "three"}) machine.host().systemLog().write(message);

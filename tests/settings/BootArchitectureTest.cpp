@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include "SettingCase.h"
+#include "ToolRun.h"
 
 namespace tavisk {
 
