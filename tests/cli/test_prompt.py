@@ -93,10 +93,10 @@ class AtThePrompt(unittest.TestCase):
             ("GETDA\t", "Date: 3/7/2007"),
             ("-printc\t\x15-versi\t", "tavisk, Version 1.4a1\r\nCopyright 2026 The tavisk developers"),
             ("-setwakeonmodem of\t-gettimez\t", "Time Zone: UTC"),
+            ("gettimezone qui\t", "Time Zone: UTC\r\nError: qui is not a valid command"),
             ("settimezone as\t\t", "Set TimeZone: Asia/Tokyo"),
             ("setdate -gettimez\t", "setdate: Error: -gettimez is invalid date format... use mm:dd:yy"),
             ("-bogus getda\t", "Error: -bogus is not a valid command"),
-            ("gettimezone qui\t", "Time Zone: UTC\r\nError: qui is not a valid command"),
         ):
             with self.subTest(keys):
                 self.terminal.type(keys + "\n")
