@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "platform/linux/BusMessage.h"
 
+#include <fcntl.h>
+
 #include <utility>
 
 namespace tavisk {
@@ -100,6 +102,12 @@ std::vector<std::string> BusMessage::readTexts() {
   while (_library->sd_bus_message_read_basic(_message, 's', &text) > 0) texts.emplace_back(text);
   exit();
   return texts;
+}
+
+FileDescriptor BusMessage::readDescriptor() {
+  int number = -1;
+  note(_library->sd_bus_message_read_basic(_message, 'h', &number));
+  return FileDescriptor(number < 0 ? -1 : ::fcntl(number, F_DUPFD_CLOEXEC, 0));
 }
 
 bool BusMessage::enter(char type, const char* contents) {

@@ -6,6 +6,7 @@
 #include <string>
 #include <vector>
 
+#include "platform/FileDescriptor.h"
 #include "platform/linux/SystemdLibrary.h"
 
 namespace tavisk {
@@ -43,6 +44,8 @@ class BusMessage {
   std::uint32_t readUint32();
   std::uint64_t readUint64();
   std::vector<std::string> readTexts();
+  /// One of our own; the message keeps its.
+  FileDescriptor readDescriptor();
   /// False when there is no such value here, or a surrounding array is at its end.
   bool enter(char type, const char* contents);
   void exit();

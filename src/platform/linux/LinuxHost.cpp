@@ -27,7 +27,14 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _bootLoaderFile(_machine),
       _disks(_machine),
       _diskEvents(_machine, _disks),
-      _diskManagement(_machine, _disks) {
+      _diskManagement(_machine, _disks),
+      _registry(_root),
+      _networkInterfaces(effects),
+      _kernel(_root),
+      _keyboardInput(_root),
+      _userDefaults(_root),
+      _programs(_machine),
+      _processTermination(_machine) {
   effects.addChannel(_journalLog);
 }
 

@@ -14,14 +14,21 @@
 #include "platform/linux/LinuxDiskManagementService.h"
 #include "platform/linux/LinuxDynamicStore.h"
 #include "platform/linux/LinuxHostConfigService.h"
+#include "platform/linux/LinuxIORegistry.h"
+#include "platform/linux/LinuxKernelValues.h"
+#include "platform/linux/LinuxKeyboardInputService.h"
 #include "platform/linux/LinuxMachine.h"
+#include "platform/linux/LinuxNetworkInterfaces.h"
 #include "platform/linux/LinuxNetworkTimeService.h"
 #include "platform/linux/LinuxPowerController.h"
 #include "platform/linux/LinuxPowerSettingsService.h"
+#include "platform/linux/LinuxProcessTermination.h"
+#include "platform/linux/LinuxProgramRunner.h"
 #include "platform/linux/LinuxRemoteEventsService.h"
 #include "platform/linux/LinuxRemoteShellService.h"
 #include "platform/linux/LinuxSystemLog.h"
 #include "platform/linux/LinuxUserDatabase.h"
+#include "platform/linux/LinuxUserDefaults.h"
 
 namespace tavisk {
 
@@ -51,13 +58,13 @@ class LinuxHost final : public Host {
 
   DiskEventSession& diskEvents() override { return _diskEvents; }
   DiskManagementService& diskManagement() override { return _diskManagement; }
-  IORegistry& registry() override { throw NotBuiltYet(); }
-  NetworkInterfaces& networkInterfaces() override { throw NotBuiltYet(); }
-  KernelValues& kernel() override { throw NotBuiltYet(); }
-  KeyboardInputService& keyboardInput() override { throw NotBuiltYet(); }
-  UserDefaults& userDefaults() override { throw NotBuiltYet(); }
-  ProgramRunner& programs() override { throw NotBuiltYet(); }
-  ProcessTermination& processTermination() override { throw NotBuiltYet(); }
+  IORegistry& registry() override { return _registry; }
+  NetworkInterfaces& networkInterfaces() override { return _networkInterfaces; }
+  KernelValues& kernel() override { return _kernel; }
+  KeyboardInputService& keyboardInput() override { return _keyboardInput; }
+  UserDefaults& userDefaults() override { return _userDefaults; }
+  ProgramRunner& programs() override { return _programs; }
+  ProcessTermination& processTermination() override { return _processTermination; }
 
  private:
   SystemRoot _root;
@@ -84,6 +91,13 @@ class LinuxHost final : public Host {
   LinuxDisks _disks;
   LinuxDiskEventSession _diskEvents;
   LinuxDiskManagementService _diskManagement;
+  LinuxIORegistry _registry;
+  LinuxNetworkInterfaces _networkInterfaces;
+  LinuxKernelValues _kernel;
+  LinuxKeyboardInputService _keyboardInput;
+  LinuxUserDefaults _userDefaults;
+  LinuxProgramRunner _programs;
+  LinuxProcessTermination _processTermination;
 };
 
 }  // namespace tavisk

@@ -30,9 +30,12 @@ std::string howItEnded(int status) {
   return "it ended with status " + std::to_string(WEXITSTATUS(status));
 }
 
-}  // namespace
+struct EndedProgram {
+  int status;  ///< as wait(2) gives it
+  std::string printed;
+};
 
-Result<std::string> runProgram(const SystemRoot& root, const std::vector<std::string>& words, RunLoop& runLoop) {
+Result<EndedProgram> runToEnd(const SystemRoot& root, const std::vector<std::string>& words, RunLoop& runLoop) {
   // A file in memory, not a pipe: a daemon that the program leaves behind may keep it open.
   const FileDescriptor output(::memfd_create("output", MFD_CLOEXEC));
   if (!output) return systemFailure("memfd_create", words.front(), errno);
@@ -42,9 +45,23 @@ Result<std::string> runProgram(const SystemRoot& root, const std::vector<std::st
   if (!program.endsBefore(RunLoop::Clock::now() + longestRun, runLoop))
     return Failure{"run", words.front(), "it has not ended in time"};
   ::lseek(output.number(), 0, SEEK_SET);
-  auto printed = readAll(output, outputLimit, words.front()).valueOr("");
-  if (program.status() != 0) return Failure{"run", words.front(), howItEnded(program.status()) + lastLine(printed)};
-  return printed;
+  return EndedProgram{program.status(), readAll(output, outputLimit, words.front()).valueOr("")};
+}
+
+}  // namespace
+
+Result<std::string> runProgram(const SystemRoot& root, const std::vector<std::string>& words, RunLoop& runLoop) {
+  auto ended = runToEnd(root, words, runLoop);
+  if (!ended) return ended.failure();
+  if (ended->status != 0) return Failure{"run", words.front(), howItEnded(ended->status) + lastLine(ended->printed)};
+  return ended->printed;
+}
+
+Result<ProgramOutput> outputOfProgram(const SystemRoot& root, const std::vector<std::string>& words, RunLoop& runLoop) {
+  auto ended = runToEnd(root, words, runLoop);
+  if (!ended) return ended.failure();
+  if (WIFSIGNALED(ended->status)) return Failure{"run", words.front(), howItEnded(ended->status)};
+  return ProgramOutput{WEXITSTATUS(ended->status), ended->printed};
 }
 
 }  // namespace tavisk
