@@ -9,6 +9,7 @@
 #include "contract/HostNamesContract.h"
 #include "contract/NetworkTimeContract.h"
 #include "contract/PowerSettingsContract.h"
+#include "contract/PreferencesContract.h"
 #include "contract/RemoteAccessContract.h"
 #include "contract/UserDatabaseContract.h"
 
@@ -131,6 +132,14 @@ struct ScratchNames {
   ScratchMachine machine;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, HostNamesContract, ScratchNames);
+
+struct ScratchPreferences {
+  PreferencesStore& preferences() { return machine.host().preferences(); }
+  ProcessUtilities& processes() { return machine.host().processes(); }
+  void put(const PropertyList& value) { machine.set("Preferences", DunmereLockEnclosureStateKey, value); }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PreferencesContract, ScratchPreferences);
 
 struct ScratchPower {
   static constexpr const char* keys[] = {"Wake On Ring", "Wake On LAN", "Auto Restart", "Power Button Sleep"};

@@ -2,8 +2,6 @@
 // SPDX-License-Identifier: MIT
 #include "platform/linux/DaemonGroup.h"
 
-#include <ranges>
-
 namespace tavisk {
 
 DaemonGroup::DaemonGroup(Daemons& daemons, std::vector<std::string> units)
@@ -67,11 +65,11 @@ Result<void> DaemonGroup::startAll() const {
 }
 
 Result<void> DaemonGroup::stopAll() const {
-  for (const auto& member : std::views::reverse(_members)) {
-    auto runs = _daemons.isRunning(member);
+  for (auto last = _members.rbegin(); last != _members.rend(); ++last) {
+    auto runs = _daemons.isRunning(*last);
     if (!runs) return runs.failure();
     if (!*runs) continue;
-    if (auto stopped = _daemons.stop(member); !stopped) return stopped;
+    if (auto stopped = _daemons.stop(*last); !stopped) return stopped;
   }
   return {};
 }

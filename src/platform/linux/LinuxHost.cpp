@@ -34,7 +34,9 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _keyboardInput(_root),
       _userDefaults(_root),
       _programs(_machine),
-      _processTermination(_machine) {
+      _processTermination(_machine),
+      _preferences(_machine),
+      _processes(_machine, _preferences, _controller) {
   effects.addChannel(_journalLog);
 }
 

@@ -22,7 +22,9 @@
 #include "platform/linux/LinuxNetworkTimeService.h"
 #include "platform/linux/LinuxPowerController.h"
 #include "platform/linux/LinuxPowerSettingsService.h"
+#include "platform/linux/LinuxPreferencesStore.h"
 #include "platform/linux/LinuxProcessTermination.h"
+#include "platform/linux/LinuxProcessUtilities.h"
 #include "platform/linux/LinuxProgramRunner.h"
 #include "platform/linux/LinuxRemoteEventsService.h"
 #include "platform/linux/LinuxRemoteShellService.h"
@@ -53,8 +55,8 @@ class LinuxHost final : public Host {
   HostConfigService& hostConfiguration() override { return _hostConfiguration; }
   DynamicStore& dynamicStore() override { return _dynamicStore; }
   BootLoaderFile& bootLoaderFile() override { return _bootLoaderFile; }
-  PreferencesStore& preferences() override { throw NotBuiltYet(); }
-  ProcessUtilities& processes() override { throw NotBuiltYet(); }
+  PreferencesStore& preferences() override { return _preferences; }
+  ProcessUtilities& processes() override { return _processes; }
 
   DiskEventSession& diskEvents() override { return _diskEvents; }
   DiskManagementService& diskManagement() override { return _diskManagement; }
@@ -98,6 +100,8 @@ class LinuxHost final : public Host {
   LinuxUserDefaults _userDefaults;
   LinuxProgramRunner _programs;
   LinuxProcessTermination _processTermination;
+  LinuxPreferencesStore _preferences;
+  LinuxProcessUtilities _processes;
 };
 
 }  // namespace tavisk

@@ -3,13 +3,11 @@
 #include "platform/scratch/MachineFile.h"
 
 #include <fcntl.h>
-#include <sys/file.h>
 
-#include <cerrno>
 #include <chrono>
 #include <cstdlib>
 
-#include "platform/SystemFailure.h"
+#include "platform/FileLock.h"
 #include "platform/scratch/FolderWatch.h"
 #include "platform/scratch/MachineCheck.h"
 
@@ -130,16 +128,9 @@ Result<MachineFile::Dictionary> MachineFile::read() const {
 }
 
 Result<FileDescriptor> MachineFile::lock() const {
-  auto file = _folder.open(lockName, O_RDONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK, 0644);
+  const auto patience = std::this_thread::get_id() == _owner ? 5000ms : 50ms;
+  auto file = lockFile(_folder, lockName, patience);
   if (!file) return inFolder(file.failure());
-  auto patience = std::this_thread::get_id() == _owner ? 5000ms : 50ms;
-  auto deadline = std::chrono::steady_clock::now() + patience;
-  while (::flock(file->number(), LOCK_EX | LOCK_NB) != 0) {
-    if (errno != EWOULDBLOCK && errno != EINTR) return systemFailure("lock", _directory + lockName, errno);
-    if (std::chrono::steady_clock::now() > deadline)
-      return Failure{"lock", _directory + lockName, "another run keeps it locked"};
-    std::this_thread::sleep_for(1ms);
-  }
   return file;
 }
 

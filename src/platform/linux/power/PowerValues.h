@@ -7,11 +7,9 @@
 #include <string>
 #include <vector>
 
-namespace tavisk {
+#include "platform/linux/OnOff.h"
 
-inline const char* onOff(bool on) {
-  return on ? "on" : "off";
-}
+namespace tavisk {
 
 /// Whether a value of an on/off setting says that it is on, at least in part.
 inline bool isOn(const std::string& value) {

@@ -21,11 +21,6 @@ constexpr bool knows(unsigned policies, Policy policy) {
   return ((policies >> policy) & 1U) != 0;
 }
 
-Result<std::optional<std::string>> asOnOff(const Result<bool>& on) {
-  if (!on) return on.failure();
-  return std::optional<std::string>(onOff(*on));
-}
-
 }  // namespace
 
 Result<unsigned> RestartPolicy::policies() {

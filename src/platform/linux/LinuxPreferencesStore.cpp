@@ -1,0 +1,70 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "platform/linux/LinuxPreferencesStore.h"
+
+#include <chrono>
+
+#include "platform/FileLock.h"
+#include "platform/SettingNames.h"
+#include "platform/linux/OnOff.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* folder = "/etc/tavisk/preferences";
+constexpr const char* lock = "/etc/tavisk/preferences/.lock";
+constexpr const char* file = "/etc/tavisk/preferences/AnyApplication.plist";
+constexpr std::chrono::seconds longestLock{3};
+
+using Value = std::optional<std::string>;
+
+/// A value that is no boolean reads as what it is: "string".
+Value textIn(const std::optional<PropertyList::Dictionary>& preferences, const std::string& key) {
+  const auto* value = preferences ? preferences->find(key) : nullptr;
+  if (value == nullptr) return std::nullopt;
+  const auto* boolean = value->asBoolean();
+  return boolean == nullptr ? nameOf(value->type()) : onOff(*boolean);
+}
+
+}  // namespace
+
+LinuxPreferencesStore::LinuxPreferencesStore(const LinuxMachine& machine)
+    : _machine(machine), _file(machine.root, file) {}
+
+Setting LinuxPreferencesStore::preference(const std::string& key) {
+  Setting setting;
+  setting.name = setting::keyboardLockPreference;
+  setting.where = _file.path();
+  setting.stored = [this, key]() -> Result<Value> {
+    const auto preferences = _file.read();
+    return preferences ? Result<Value>(textIn(*preferences, key)) : preferences.failure();
+  };
+  return setting;
+}
+
+std::optional<PropertyList> LinuxPreferencesStore::value(const std::string& key) {
+  if (!observe(preference(key), _machine.effects)) return std::nullopt;
+  const auto preferences = _file.read().valueOr(std::nullopt);
+  const auto* value = preferences ? preferences->find(key) : nullptr;
+  return value == nullptr ? std::nullopt : std::optional(*value);
+}
+
+void LinuxPreferencesStore::writeOut() {
+  for (const auto& [key, value] : std::exchange(_pending, {})) {
+    auto setting = preference(key);
+    setting.store = [this, &key = key, value = value](const std::string&) { return store(key, value); };
+    carryOut(setting, onOff(value), _machine.effects, _machine.runLoop);
+  }
+}
+
+Result<void> LinuxPreferencesStore::store(const std::string& key, bool value) {
+  if (auto failure = whyNeedsRoot("write", _file.path())) return *failure;
+  if (auto made = _machine.root.makeFolders(folder); !made) return made;
+  const auto held = lockFile(_machine.root, lock, longestLock);
+  if (!held) return held.failure();
+  auto preferences = _file.read().valueOr(std::nullopt).value_or(PropertyList::Dictionary());
+  preferences.set(key, value);
+  return _file.write(preferences);
+}
+
+}  // namespace tavisk
