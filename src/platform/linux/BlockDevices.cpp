@@ -18,7 +18,8 @@ std::string baseName(const std::string& path) {
 }
 
 bool isFileName(const std::string& text) {
-  return !text.empty() && text != "." && text != ".." && text.find_first_of(std::string_view("/\0", 2)) == text.npos;
+  return !text.empty() && text != "." && text != ".." &&
+         text.find_first_of(std::string_view("/\0", 2)) == std::string::npos;
 }
 
 /// The value of a line "KEY=value".

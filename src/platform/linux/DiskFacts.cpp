@@ -44,7 +44,8 @@ std::string carrierOf(const BlockDevice& device) {
 std::optional<DiskFacts> factsOf(const SystemRoot& root, const DiskName& name) {
   const BlockDevices devices(root);
   const auto device = devices.find(name);
-  if (!device || device->size == 0) return std::nullopt;
+  const bool hasNode = device && device->number.major != 0;  // the paths of a multipath device have none
+  if (!hasNode || device->size == 0) return std::nullopt;
   DiskFacts facts;
   facts.device = *device;
   const auto properties = DeviceProperties::ofBlockDevice(root, device->number);

@@ -33,7 +33,7 @@ bool isNumberedApart(const std::string& type) {
 std::string kindOf(const std::string& type) {
   if (type == "vfat") return "msdos";
   if (type == "iso9660") return "cd9660";
-  return isOneOf(type, {"ntfs3", "fuseblk"}) ? "ntfs" : type;
+  return type == "ntfs3" ? "ntfs" : type;
 }
 
 std::shared_ptr<DiskDescription> networkVolume(const Mount& mount) {
@@ -122,12 +122,25 @@ void LinuxDisks::readDevices(const ChangedDevices& changed) {
     for (const auto& [name, facts] : _facts) names.insert(name);
     for (const auto& name : _devices.list()) names.insert(name.text);
   }
+  names.merge(newlyMounted());
+  for (const auto& name : names) readDevice(name);
+}
+
+/// Devices that may have got their file system, or have come, without an event.
+std::set<std::string> LinuxDisks::newlyMounted() const {
+  std::set<std::string> names;
+  std::set<DeviceNumber> known;
   for (const auto& [name, facts] : _facts) {
+    known.insert(facts.device.number);
     const auto before = _current ? _current->find({name}) : nullptr;
     const auto* const mount = mountOf(facts.device);
     if (before && mount != nullptr && before->volumePath != mount->point) names.insert(name);
   }
-  for (const auto& name : names) readDevice(name);
+  for (const auto& mount : _mounts.mounts()) {
+    if (!mount.visible || mount.device.major == 0 || !known.insert(mount.device).second) continue;
+    if (const auto device = _devices.withNumber(mount.device)) names.insert(device->name.text);
+  }
+  return names;
 }
 
 void LinuxDisks::readDevice(const std::string& name) {

@@ -6,6 +6,7 @@
 #include <memory>
 #include <mutex>
 #include <optional>
+#include <set>
 #include <string>
 
 #include "platform/DiskDescription.h"
@@ -41,6 +42,7 @@ class LinuxDisks {
   void readOnce();
   void readMounts();
   void readDevices(const ChangedDevices& changed);
+  std::set<std::string> newlyMounted() const;
   void readDevice(const std::string& name);
   void tellUnread(const DiskFacts& facts) const;
   Snapshot describe() const;

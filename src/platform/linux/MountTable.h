@@ -2,13 +2,13 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <compare>
 #include <cstddef>
 #include <cstdint>
 #include <map>
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <utility>
 #include <vector>
 
 #include "platform/Result.h"
@@ -21,7 +21,10 @@ struct DeviceNumber {
   unsigned major = 0;
   unsigned minor = 0;
 
-  auto operator<=>(const DeviceNumber&) const = default;
+  bool operator==(const DeviceNumber&) const = default;
+  bool operator<(const DeviceNumber& other) const {
+    return std::pair(major, minor) < std::pair(other.major, other.minor);
+  }
   /// Of "8:1"; 0:0 when the text is something else.
   static DeviceNumber parse(std::string_view text);
 };
