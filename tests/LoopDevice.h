@@ -34,6 +34,13 @@ class LoopDevice {
     }
   }
 
+  /// The device that the next image will probably have; empty where loop devices may not be made.
+  static std::string nextName() {
+    const FileDescriptor control(::open("/dev/loop-control", O_RDWR | O_CLOEXEC));
+    const int number = control ? ::ioctl(control.number(), LOOP_CTL_GET_FREE) : -1;
+    return number < 0 ? "" : "loop" + std::to_string(number);
+  }
+
   explicit operator bool() const { return static_cast<bool>(_device); }
   const std::string& name() const { return _name; }
   std::string node() const { return "/dev/" + _name; }

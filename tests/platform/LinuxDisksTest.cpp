@@ -20,30 +20,34 @@ class RealDisks {
   static std::string run(const Work& work) {
     if (::geteuid() != 0) return "only root makes loop devices";
     if (!runTool("command -v mkfs.ext4 && command -v e2label")) return "mkfs.ext4 is missing";
-    std::string why;
+    if (LoopDevice::nextName().empty()) return "no loop devices here";
     const bool allowed = withOwnMounts([&] {
       RealDisks machine;
-      if (!LoopDevice(machine.newImage())) {
-        why = "no loop devices here";
-      } else {
-        work(machine);
-      }
+      work(machine);
     });
-    return allowed ? why : "no mounts of one's own here";
+    return allowed ? "" : "no mounts of one's own here";
   }
+
+  RealDisks() = default;
+  ~RealDisks() {
+    for (const auto& [name, plugged] : _disks) ::umount2(pointOf({name}).c_str(), MNT_DETACH);
+  }
+  RealDisks(const RealDisks&) = delete;
+  RealDisks& operator=(const RealDisks&) = delete;
 
   DiskEventSession& service() { return _host.diskEvents(); }
   RunLoop& runLoop() { return _runLoop; }
   DiskName plug(const std::string& label) {
     const auto image = newImage();
     EXPECT_TRUE(runTool("mkfs.ext4 -q -L " + label + " " + image));
+    waitUntilGone({LoopDevice::nextName()});
     LoopDevice device(image);
     const DiskName disk{device.name()};
     _disks.insert_or_assign(disk.text, Plugged{std::move(device), image});
     return disk;
   }
   std::string mount(const DiskName& disk) {
-    const std::string point = _folder.path() / ("mounted " + disk.text);
+    const auto point = pointOf(disk);
     std::filesystem::create_directories(point);
     EXPECT_EQ(::mount(("/dev/" + disk.text).c_str(), point.c_str(), "ext4", 0, nullptr), 0);
     return point;
@@ -67,6 +71,12 @@ class RealDisks {
     LoopDevice device;
     std::string image;
   };
+  std::string pointOf(const DiskName& disk) const { return _folder.path() / ("mounted " + disk.text); }
+  /// A device that was another image's a moment ago would not appear, but change.
+  void waitUntilGone(const DiskName& disk) {
+    const auto deadline = RunLoop::Clock::now() + std::chrono::seconds(2);
+    static_cast<void>(_runLoop.runUntil(deadline, [&] { return service().description(disk) == nullptr; }));
+  }
   std::string newImage() {
     const auto image = _folder.write("image" + std::to_string(++_last), "");
     std::filesystem::resize_file(image, imageSize);
@@ -105,6 +115,10 @@ class ServerDisks : public DiskTree {
     return host().diskEvents().description({disk});
   }
   /// As LinuxHost has them; they read the same tree.
+  LinuxDisks& disks() {
+    queries();
+    return *_disks;
+  }
   LinuxDiskQueries& queries() {
     if (!_queries)
       _queries.emplace(_disks.emplace(_machine.emplace(LinuxMachine{*_root, effects, runLoop, *_services})));
@@ -190,6 +204,24 @@ TEST(LinuxDisks, FindsTheDiskOfAnyPath) {
   ASSERT_TRUE(network);
   EXPECT_TRUE(network->volumeNetwork);
   EXPECT_EQ(network->volumePath, "/net");
+}
+
+TEST(LinuxDisks, NoticesAtAMountWhatCameWithoutAnEvent) {
+  ServerDisks tree;
+  auto& disks = tree.disks();
+  tree.know("8:1", "E:ID_FS_TYPE=vfat\n");
+  ASSERT_TRUE(disks.find({"sda1"}));
+  EXPECT_EQ(disks.find({"sda1"})->volumeKind, "msdos");
+  EXPECT_FALSE(disks.find({"sdc"}));
+  tree.know("8:1", "E:ID_FS_TYPE=ntfs\n");
+  tree.addDisk("sdc", "8:32", 64);
+  tree.mount("8:1", "/dev/sda1", "/first", "ntfs3");
+  tree.mount("8:32", "/dev/sdc", "/second", "ext4");
+  disks.renew({});
+  EXPECT_EQ(disks.find({"sda1"})->volumeKind, "ntfs");
+  EXPECT_EQ(disks.find({"sda1"})->volumePath, "/first");
+  ASSERT_TRUE(disks.find({"sdc"}));
+  EXPECT_EQ(disks.find({"sdc"})->volumePath, "/second");
 }
 
 TEST(LinuxDisks, TellsKindsOfDisksApart) {

@@ -38,10 +38,15 @@ class DiskListener {
         if (line.find(" " + disk.text + " ") != std::string::npos) taken.push_back(line);
     return taken;
   }
-  /// Waits until a line has come.
-  bool hears(const std::string& line) {
-    return _runLoop.runUntil(RunLoop::Clock::now() + std::chrono::seconds(10),
-                             [&] { return std::find(_lines.begin(), _lines.end(), line) != _lines.end(); });
+  void forget() { _lines.clear(); }
+  /// Waits until a line has come, and forgets it and those before it.
+  testing::AssertionResult hears(const std::string& line) {
+    const auto place = [&] { return std::find(_lines.begin(), _lines.end(), line); };
+    const auto deadline = RunLoop::Clock::now() + std::chrono::seconds(10);
+    if (!_runLoop.runUntil(deadline, [&] { return place() != _lines.end(); }))
+      return testing::AssertionFailure() << line << " among " << testing::PrintToString(_lines);
+    _lines.erase(_lines.begin(), std::next(place()));
+    return testing::AssertionSuccess();
   }
 
  private:
@@ -111,6 +116,7 @@ TYPED_TEST_P(DiskEventsContract, tellsWhatHappensToAVolume) {
     machine.runLoop().runPass();
 
     const auto disk = machine.plug("Backup");
+    listener.forget();
     EXPECT_TRUE(listener.hears("appeared " + disk.text + " Backup"));
     EXPECT_EQ(session.description(disk)->volumePath, std::nullopt);
     const auto path = machine.mount(disk);
@@ -123,7 +129,6 @@ TYPED_TEST_P(DiskEventsContract, tellsWhatHappensToAVolume) {
     machine.grow(disk);
     EXPECT_TRUE(listener.hears("changed " + disk.text + " size"));
     EXPECT_GT(session.description(disk)->mediaSize, size);
-    listener.take({});
     machine.unmount(disk);
     EXPECT_TRUE(listener.hears("changed " + disk.text + " path"));
     EXPECT_EQ(session.description(disk)->volumePath, std::nullopt);
@@ -148,6 +153,8 @@ TYPED_TEST_P(DiskEventsContract, tellsOnlyThoseWhoAsked) {
     stopped.listen();
     stopped.stop();
     const auto disk = machine.plug("Backup");
+    all.forget();
+    ofNames.forget();
     EXPECT_TRUE(all.hears("appeared " + disk.text + " Backup"));
     machine.mount(disk);
     EXPECT_TRUE(all.hears("changed " + disk.text + " path"));
@@ -160,9 +167,16 @@ TYPED_TEST_P(DiskEventsContract, tellsOnlyThoseWhoAsked) {
 
 TYPED_TEST_P(DiskEventsContract, findsTheDiskOfAPath) {
   this->run([](TypeParam& machine) {
-    const auto disk = machine.plug("Backup");
-    const auto path = machine.mount(disk);
     auto& session = machine.service();
+    DiskListener listener(session, machine.runLoop());
+    session.schedule(machine.runLoop());
+    listener.listen();
+    machine.runLoop().runPass();
+    const auto disk = machine.plug("Backup");
+    listener.forget();
+    EXPECT_TRUE(listener.hears("appeared " + disk.text + " Backup"));
+    const auto path = machine.mount(disk);
+    EXPECT_TRUE(listener.hears("changed " + disk.text + " path"));
     EXPECT_EQ(session.diskOfPath(path), disk);
     EXPECT_EQ(session.diskOfPath(path + "/./../" + path.substr(path.rfind('/') + 1) + "/"), disk);
     EXPECT_EQ(session.diskOfPath(path + "/none"), std::nullopt);
@@ -170,6 +184,7 @@ TYPED_TEST_P(DiskEventsContract, findsTheDiskOfAPath) {
     EXPECT_EQ(session.diskOfPath("none"), std::nullopt);
     EXPECT_EQ(session.wholeDisk(disk), disk);
     EXPECT_EQ(session.description({"none"}), nullptr);
+    session.unschedule();
   });
 }
 
