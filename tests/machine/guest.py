@@ -1,23 +1,29 @@
 # SPDX-FileCopyrightText: 2026 The tavisk developers
 # SPDX-License-Identifier: MIT
-"""A kernel with one static program as its first process: no service manager, no bus, nothing kept but the clock."""
+"""A kernel with one static program as its first process: no service manager, no bus, nothing kept but the clock. Of its
+network cards only the first can wake it, and its first serial port."""
 
+import pathlib
 import shutil
 import subprocess
 
 import emulator
 import trees
 
+CARDS = {"i82559c": "e100", "vmxnet3": "vmxnet3", "rtl8139": "8139cp", "e1000e": "e1000e", "pcnet": "pcnet32"}  # drivers
+WAKING_PORT = pathlib.Path(__file__).with_name("waking-port.asl")
 INIT = """#!/bin/busybox sh
 /bin/busybox --install -s /bin
 mount -t proc proc /proc
 mount -t sysfs sysfs /sys
 mount -t devtmpfs devtmpfs /dev
+modprobe -a """ + " ".join(CARDS.values()) + """
 exec sh /agent.sh /dev/ttyS1
 """
 FOLDERS = ["bin", "dev", "etc", "lib64", "proc", "run", "sys", "tmp", "usr/lib", "usr/sbin", "usr/share"]
 WHOLE = ["usr/share/zoneinfo"]
-FILES = ["etc/group", "etc/passwd", "usr/sbin/tavisk"]
+PROGRAMS = ["usr/sbin/ethtool", "usr/sbin/tavisk"]
+FILES = ["etc/group", "etc/passwd", *PROGRAMS]
 
 
 class Guest(emulator.Emulated):
@@ -28,7 +34,8 @@ class Guest(emulator.Emulated):
     def __init__(self):
         tree = trees.layered("guest-tree", trees.SERVER)
         super().__init__("guest", ["-kernel", trees.kernel(tree), "-initrd", trees.WORK / "guest.cpio",
-                                   "-append", "console=ttyS0"])
+                                   "-append", "console=ttyS0", "-acpitable", f"file={_compiled(WAKING_PORT)}",
+                                   *(word for card in CARDS for word in ("-device", card + ",romfile="))])
         _make_root(tree, self._folder / "root")
         _pack(self._folder / "root", trees.WORK / "guest.cpio")
 
@@ -38,7 +45,7 @@ def _make_root(tree, root):
         (root / folder).mkdir(parents=True)
     for folder in WHOLE:
         shutil.copytree(tree / folder, root / folder, symlinks=True)
-    for file in FILES + _libraries(tree):
+    for file in FILES + _libraries(tree) + _modules(tree):
         (root / file).parent.mkdir(parents=True, exist_ok=True)
         shutil.copy2(tree / file, root / file)
     shutil.copy2(tree / "bin/busybox", root / "bin/busybox")
@@ -47,10 +54,24 @@ def _make_root(tree, root):
     (root / "init").chmod(0o755)
 
 
+def _compiled(table):
+    trees.run("iasl", "-p", trees.WORK / table.stem, table)
+    return trees.WORK / f"{table.stem}.aml"
+
+
 def _libraries(tree):
-    """What the program is linked with, without the leading slash."""
-    words = trees.run("chroot", tree, "ldd", "/usr/sbin/tavisk").split()
-    return [word[1:] for word in words if word.startswith("/")]
+    """What the programs are linked with, without the leading slash."""
+    words = trees.run("chroot", tree, "ldd", *("/" + program for program in PROGRAMS)).split()
+    return [word[1:] for word in words if word.startswith("/") and not word.endswith(":")]
+
+
+def _modules(tree):
+    """The cards' drivers, what they need, and the list that says so."""
+    (needs,) = tree.glob("lib/modules/*/modules.dep")
+    drivers = tuple(f"/{driver}.ko" for driver in CARDS.values())
+    lines = [line.split() for line in needs.read_text().splitlines() if line.split(":")[0].endswith(drivers)]
+    files = {needs.parent / word.rstrip(":") for line in lines for word in line}
+    return [str(file.relative_to(tree)) for file in (needs, *sorted(files))]
 
 
 def _pack(root, archive):

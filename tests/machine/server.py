@@ -1,14 +1,17 @@
 # SPDX-FileCopyrightText: 2026 The tavisk developers
 # SPDX-License-Identifier: MIT
-"""A Debian server with UEFI firmware, a disk and a clock of its own."""
+"""A Debian server with UEFI firmware, disks, a watchdog, a management controller and a clock of its own."""
 
 import shutil
 
+import check
+import controller
 import emulator
 import trees
 
 FIRMWARE = "/usr/share/OVMF/OVMF_CODE_4M.fd"
 FIRMWARE_VARIABLES = "/usr/share/OVMF/OVMF_VARS_4M.fd"
+CONTROLLER = trees.WORK / "controller"
 SECTOR = 512
 BOOT_START = 2048            # sectors
 BOOT_SIZE = 64 * 1024        # KiB
@@ -24,6 +27,7 @@ Description=Commands of the tests
 After=multi-user.target
 
 [Service]
+ExecStartPre=udevadm settle
 ExecStart=/bin/sh /usr/lib/agent.sh /dev/ttyS1
 
 [Install]
@@ -33,7 +37,7 @@ WantedBy=graphical.target
 
 class Server(emulator.Emulated):
     has = frozenset({"bus", "clock", "server", "systemd-timesyncd"})
-    cannot = "wake from sleep, lose its power"
+    cannot = "sleep and wake, lose its power"
     reboot = "systemctl reboot"
 
     def __init__(self):
@@ -42,10 +46,29 @@ class Server(emulator.Emulated):
         variables = trees.WORK / "server-variables.fd"
         super().__init__("server", [
             "-drive", f"if=pflash,format=raw,readonly=on,file={FIRMWARE}",
-            "-drive", f"if=pflash,format=raw,file={variables}", "-drive", f"if=virtio,format=raw,file={disk}"])
+            "-drive", f"if=pflash,format=raw,file={variables}", "-drive", f"if=virtio,format=raw,file={disk}",
+            *_power_devices()])
+        self._controller = controller.Controller(CONTROLLER)
         shutil.copy(FIRMWARE_VARIABLES, variables)
         _add_agent(tree)
         _make_disk(tree, disk)
+
+    def run(self, command):
+        if command.startswith("controller "):
+            return check.Answer(0, self._controller.obey(command), "")
+        return super().run(command)
+
+
+def _power_devices():
+    """A disk with a motor and one without, a watchdog, and the way to the controller."""
+    devices = ["-device", "i6300esb", "-chardev", f"socket,id=controller,path={CONTROLLER},reconnect=10",
+               "-device", "ipmi-bmc-extern,id=bmc,chardev=controller", "-device", "isa-ipmi-kcs,bmc=bmc"]
+    for place, turns in enumerate((7200, 1)):
+        disk = trees.WORK / f"turning-{turns}.img"
+        trees.run("truncate", "-s", "64M", disk)
+        devices += ["-drive", f"if=none,id=turning-{turns},format=raw,file={disk}",
+                    "-device", f"ide-hd,drive=turning-{turns},bus=ide.{place},rotation_rate={turns}"]
+    return devices
 
 
 def _add_agent(tree):

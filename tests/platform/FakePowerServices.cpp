@@ -23,7 +23,7 @@ void readKey(const std::vector<std::string>& lines, const std::string& key, std:
 }  // namespace
 
 FakePowerServices::FakePowerServices(const std::filesystem::path& tree)
-    : _configuration(tree / "etc/systemd/logind.conf.d/60-tavisk.conf"),
+    : _tree(tree),
       _peer(tree / "run/dbus/system_bus_socket", {},
             [this](sd_bus_message* call, const std::string& member) { return answer(call, member); }) {}
 
@@ -38,10 +38,22 @@ std::string FakePowerServices::sleepsAfter() {
 }
 
 void FakePowerServices::read() {
-  const auto lines = linesOf(_configuration);
+  const auto lines = linesOf(_tree / "etc/systemd/logind.conf.d/60-tavisk.conf");
   readKey(lines, "IdleAction", _idleAction);
   readKey(lines, "IdleActionSec", _idleMinutes);
   readKey(lines, "HandlePowerKey", _powerKey);
+}
+
+void FakePowerServices::readManager() {
+  std::string seconds = "0";
+  readKey(linesOf(_tree / "etc/systemd/system.conf.d/60-tavisk.conf"), "RuntimeWatchdogSec", seconds);
+  _watchdogRead = seconds == "off" ? 0 : std::stoull(seconds) * 1'000'000;
+}
+
+void FakePowerServices::startAgain() {
+  const std::lock_guard lock(_mutex);
+  _watchdogSet = 0;
+  readManager();
 }
 
 int FakePowerServices::answer(sd_bus_message* call, const std::string& member) {
@@ -49,6 +61,10 @@ int FakePowerServices::answer(sd_bus_message* call, const std::string& member) {
   if (member == "Get") return answerGet(call);
   if (member == "Set") return answerSet(call);
   if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", _canSuspend.c_str());
+  if (member == "Reload") {
+    readManager();
+    return sd_bus_reply_method_return(call, "");
+  }
   if (member == "Inhibit") return answerInhibit(call);
   if (member == "ListInhibitors")
     return sd_bus_reply_method_return(call, "a(ssssuu)", 2, "idle", "nightly-backup", "", "block", 0, 1, "sleep",
@@ -96,14 +112,14 @@ int FakePowerServices::answerGet(sd_bus_message* call) {
   if (name == "HandlePowerKey") return sd_bus_reply_method_return(call, "v", "s", _powerKey.c_str());
   if (name == "IdleActionUSec")
     return sd_bus_reply_method_return(call, "v", "t", std::stoull(_idleMinutes) * microseconds);
-  return sd_bus_reply_method_return(call, "v", "t", _watchdog);
+  return sd_bus_reply_method_return(call, "v", "t", _watchdogSet != 0 ? _watchdogSet : _watchdogRead);
 }
 
 int FakePowerServices::answerSet(sd_bus_message* call) {
   firstText(call);
   if (firstText(call) != "RuntimeWatchdogUSec") return 0;
   sd_bus_message_enter_container(call, 'v', "t");
-  sd_bus_message_read_basic(call, 't', &_watchdog);
+  sd_bus_message_read_basic(call, 't', &_watchdogSet);
   return sd_bus_reply_method_return(call, "");
 }
 

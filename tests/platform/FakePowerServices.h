@@ -21,6 +21,8 @@ class FakePowerServices {
   /// After what time the machine would really sleep. The timer is set when the service starts, not later; it is then
   /// "at once" as nobody has been logged in for long, unless somebody holds a lock against idleness.
   std::string sleepsAfter();
+  /// The service manager forgets what was set, and goes by its configuration.
+  void startAgain();
 
  private:
   int answer(sd_bus_message* call, const std::string& member);
@@ -30,15 +32,17 @@ class FakePowerServices {
   int answerRestart(sd_bus_message* call);
   bool isHeldBusy() const;
   void read();
+  void readManager();
 
-  std::filesystem::path _configuration;
+  std::filesystem::path _tree;
   std::mutex _mutex;
   std::string _canSuspend = "yes";
   std::string _idleAction = "ignore";
   std::string _idleMinutes = "30";
   std::string _powerKey = "poweroff";
   std::string _sleepsAfter = "never";
-  std::uint64_t _watchdog = 0;
+  std::uint64_t _watchdogSet = 0;  ///< 0: goes by what was read
+  std::uint64_t _watchdogRead = 0;
   FileDescriptor _lock;
   BusPeer _peer;  ///< the last: its thread works with the others
 };

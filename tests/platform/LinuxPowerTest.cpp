@@ -124,6 +124,16 @@ TEST(LinuxPower, ThePlaceOfAPortWakesNotItsTerminal) {
               HasSubstr(R"(SUBSYSTEM=="pnp", DRIVER=="serial", TEST=="power/wakeup", ATTR{power/wakeup}="enabled")"));
 }
 
+TEST(LinuxPower, ARecordedMachineChangesOnlyWhatCan) {
+  PowerTree guest("guest.devices");
+  guest.power().setOn(PowerSwitch::wakeOnLAN, mains, true);
+  guest.power().setOn(PowerSwitch::wakeOnRing, mains, true);
+  for (const auto* card : {"eth0", "eth1", "eth2", "eth3", "eth4"})
+    EXPECT_EQ(guest.cards.cards[card].modes.enabled, card == std::string("eth0") ? magicPacket : 0) << card;
+  EXPECT_EQ(guest.file("/sys/devices/pnp0/00:03/power/wakeup"), "enabled");
+  EXPECT_FALSE(guest.delays().serviceOfClass("VelmarKCS"));
+}
+
 TEST(LinuxPower, RestartComesFromTheControllerElseTheFirmware) {
   PowerTree tree;
   tree.controllerLink.policies = 0x03;
@@ -151,6 +161,9 @@ TEST(LinuxPower, FreezeNeedsWatchdogAndKernel) {
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"applied")"), HasSubstr(R"("live":"on")")));
   EXPECT_THAT(tree.file("/etc/systemd/system.conf.d/60-tavisk.conf"), HasSubstr("[Manager]\nRuntimeWatchdogSec=60\n"));
   EXPECT_THAT(tree.file("/etc/sysctl.d/60-tavisk.conf"), HasSubstr("kernel.panic = 10\n"));
+  tree.bus.startAgain();
+  tree.power().setRestartsOnHang(false);
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"applied")"), HasSubstr(R"("live":"off")")));
   tree.write("/etc/sysctl.d/99-sysctl.conf", "kernel.panic=0\n");
   tree.power().setRestartsOnHang(true);
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("on by the watchdog only")));

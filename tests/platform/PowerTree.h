@@ -87,6 +87,19 @@ class TreeController final : public ControllerLink {
 class PowerTree : public LinuxTree {
  public:
   PowerTree() {
+    addServices();
+    addDisk("sda");
+    addPort("ttyS0", "00:04");
+    addCard("eth0", {{0x2E, 0}});
+    write("/sys/class/ipmi/ipmi0/device/type", "kcs\n");
+  }
+  /// With the devices of a machine that tests/machine/record.sh has looked at.
+  explicit PowerTree(const std::string& recording) {
+    addServices();
+    for (const auto& line : linesOf(std::filesystem::path(TAVISK_RECORDINGS) / recording)) replay(split(line, " "));
+  }
+
+  void addServices() {
     write("/run/systemd/system/mark", "");
     write("/run/udev/control", "");
     write("/dev/tty1", "");
@@ -94,10 +107,6 @@ class PowerTree : public LinuxTree {
     write("/sys/module/kernel/parameters/consoleblank", "0\n");
     write("/proc/sys/kernel/panic", "0\n");
     write("/sys/bus/acpi/devices/LNXPWRBN:00/path", "");
-    addDisk("sda");
-    addPort("ttyS0", "00:04");
-    addCard("eth0", {{0x2E, 0}});
-    write("/sys/class/ipmi/ipmi0/device/type", "kcs\n");
   }
 
   void addDisk(const std::string& name) {
@@ -142,6 +151,24 @@ class PowerTree : public LinuxTree {
   FakePowerServices bus{at("/")};
 
  private:
+  void replay(const std::vector<std::string>& words) {
+    if (words.at(0) == "wake") {
+      if (words.size() > 3) cards.cards[words[1]].modes = {bitsOf(words[2]), bitsOf(words[3])};
+    } else if (words.at(1) == "->") {
+      link(words[0], words[2]);
+    } else {
+      write(words[0], words.at(2) + "\n");
+    }
+  }
+  /// Of the letters of ethtool; "d" is none.
+  static std::uint32_t bitsOf(const std::string& letters) {
+    constexpr std::string_view all = "pumbagsf";
+    std::uint32_t bits = 0;
+    for (std::size_t i = 0; i < all.size(); ++i)
+      if (letters.find(all[i]) != std::string::npos) bits |= 1U << i;
+    return bits;
+  }
+
   SystemRoot _root{at("/").string()};
   ServiceAccess _services{_root, runLoop};
   LinuxMachine _machine{_root, effects, runLoop, _services};

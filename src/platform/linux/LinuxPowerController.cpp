@@ -48,12 +48,6 @@ std::optional<PowerController::Service> LinuxPowerController::serviceOfClass(con
   return std::nullopt;
 }
 
-Result<StartupDelayRequests> LinuxPowerController::requests() {
-  const auto maker = _controller.manufacturer();
-  if (!maker) return *_controller.ask("Get Device ID", {0x06, 0x01, {}}, 9).failure;
-  return startupDelayRequests(_machine.root, *maker);
-}
-
 Result<std::optional<std::string>> LinuxPowerController::askDelay(const StartupDelayRequests& requests) {
   constexpr const char* tried = "get the start-up delay";
   const auto answer = _controller.ask(tried, {requests.function, *requests.get, {}}, requests.width);
@@ -90,7 +84,9 @@ Setting LinuxPowerController::delaySetting(const StartupDelayRequests& requests)
 std::optional<std::int64_t> LinuxPowerController::numberProperty(const Service& /*service*/,
                                                                  const std::string& property) {
   if (property != delayProperty) return std::nullopt;
-  const auto known = requests();
+  const auto identity = _controller.identity();
+  const auto known = identity.failure ? Result<StartupDelayRequests>(*identity.failure)
+                                      : startupDelayRequests(_machine.root, manufacturerIn(identity));
   if (!known) {
     recorded(ENOSYS, known.failure());
     return std::nullopt;
@@ -111,11 +107,12 @@ ControllerStatus LinuxPowerController::setProperties(const Connection& /*connect
   const auto units = byteIn(properties);
   if (!units || properties.size() != 1)
     return recorded(EINVAL, {"set properties", "the management controller", "its one property is ServerID, one byte"});
-  return setDelay(*units);
+  const auto identity = _controller.identity();
+  return identity.failure ? recorded(identity.status, *identity.failure) : setDelay(identity, *units);
 }
 
-ControllerStatus LinuxPowerController::setDelay(std::uint8_t units) {
-  const auto known = requests();
+ControllerStatus LinuxPowerController::setDelay(const ControllerAnswer& identity, std::uint8_t units) {
+  const auto known = startupDelayRequests(_machine.root, manufacturerIn(identity));
   ControllerStatus status = 0;
   Setting delay = known ? delaySetting(*known) : Setting();
   delay.name = setting::startupDelay;

@@ -27,11 +27,10 @@ class LinuxPowerController : public PowerController {
   ControllerStatus close(const Connection& connection) override;
 
  private:
-  Result<StartupDelayRequests> requests();
   Setting delaySetting(const StartupDelayRequests& requests);
   Result<std::optional<std::string>> askDelay(const StartupDelayRequests& requests);
   ControllerAnswer sendDelay(const StartupDelayRequests& requests, std::uint32_t units);
-  ControllerStatus setDelay(std::uint8_t units);
+  ControllerStatus setDelay(const ControllerAnswer& identity, std::uint8_t units);
   ControllerStatus recorded(ControllerStatus status, const Failure& failure);
 
   LinuxMachine _machine;

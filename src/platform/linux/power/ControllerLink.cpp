@@ -67,8 +67,9 @@ void IpmiDevice::loadDriver() {
 }
 
 int IpmiDevice::openDevice() {
+  errno = 0;
   auto file = _machine.root.open(device, O_RDWR | O_NONBLOCK);
-  if (!file) return errno;
+  if (!file) return errno == 0 ? EIO : errno;
   _device = std::move(file).value();
   return 0;
 }

@@ -97,18 +97,34 @@ Result<void> FreezeRestart::store(const std::string& value) const {
   return _config.setOwn(section, {{key, isOn(value) ? std::to_string(watchdogTime.count()) : "off"}});
 }
 
-/// The manager does not take up the file over a value that was set, so it gets both.
+/// The manager does not take up the file over a value that was set, so it gets both. To set 0 is to go back to the file
+/// as it was when it was read.
 Result<void> FreezeRestart::setWatchdog(bool on) const {
+  if (auto set = setWatchdogTime(on ? watchdogTime : std::chrono::seconds(0)); !set || on) return set;
+  const auto used = isWatchdogUsed();
+  if (!used) return used.failure();
+  return *used ? reloadManager() : Result<void>();
+}
+
+Result<void> FreezeRestart::reloadManager() const {
+  constexpr std::chrono::seconds longestReload{10};
+  auto bus = _machine.services.serviceManager();
+  if (!bus) return bus.failure();
+  auto reloaded = (*bus)->call(serviceManager(), "Reload", "", Bus::Writer([](BusMessage&) {}), longestReload);
+  if (!reloaded) return reloaded.failure();
+  return {};
+}
+
+Result<void> FreezeRestart::setWatchdogTime(std::chrono::microseconds time) const {
   auto bus = _machine.services.serviceManager();
   if (!bus) return bus.failure();
   const BusObject properties{"org.freedesktop.systemd1", "/org/freedesktop/systemd1",
                              "org.freedesktop.DBus.Properties"};
-  const auto time = on ? std::chrono::microseconds(watchdogTime).count() : 0;
   const Bus::Writer arguments = [time](BusMessage& message) {
     message.write("org.freedesktop.systemd1.Manager");
     message.write("RuntimeWatchdogUSec");
     message.open('v', "t");
-    message.write(static_cast<std::uint64_t>(time));
+    message.write(static_cast<std::uint64_t>(time.count()));
     message.close();
   };
   auto set = (*bus)->call(properties, "Set", "", arguments);

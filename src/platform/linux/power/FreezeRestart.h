@@ -26,6 +26,8 @@ class FreezeRestart {
   Result<void> store(const std::string& value) const;
   Result<void> apply(const std::string& value) const;
   Result<void> setWatchdog(bool on) const;
+  Result<void> setWatchdogTime(std::chrono::microseconds time) const;
+  Result<void> reloadManager() const;
   std::string storedPanic() const;
 
   LinuxMachine _machine;

@@ -119,16 +119,17 @@ Result<void> LoginService::store(const std::map<std::string, std::string>& value
 /// The service looks at the time only when it starts: with its configuration read again it would tell the new value and
 /// go on by the old one. When it starts it takes a machine without users for idle since it was turned on, and would let
 /// it sleep at once, unless it is told that the machine is busy. Sessions live on.
-Result<void> LoginService::restartService() {
+Result<void> LoginService::restartService(const std::string& minutes) {
   auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
   // The reply holds the lock.
   const auto busy = (*bus)->call(loginManager(), "Inhibit", "h", "idle", "tavisk", "sets the time of sleep", "block");
   if (!busy) return busy.failure();
-  if (auto restarted = _machine.services.daemons().restart(loginDaemon); !restarted) return restarted;
-  // An answer proves that it has looked at the time.
+  auto restarted = _machine.services.daemons().restart(loginDaemon);
+  // An answer with the new value proves that it has started and looked at the time, however long its job takes.
   const auto sleep = liveSleep();
-  return sleep ? Result<void>() : sleep.failure();
+  if (!restarted && sleep && *sleep == minutes) return {};
+  return restarted && !sleep ? sleep.failure() : restarted;
 }
 
 Result<void> LoginService::rereadConfiguration() {
@@ -167,7 +168,7 @@ Setting LoginService::computerSleepChange(const std::string& minutes) {
     if (asked == never) return store({{"IdleAction", "ignore"}});
     return store({{"IdleAction", "suspend"}, {"IdleActionSec", asked + "min"}});
   };
-  setting.apply = [this](const std::string&) { return restartService(); };
+  setting.apply = [this](const std::string& asked) { return restartService(asked); };
   return setting;
 }
 

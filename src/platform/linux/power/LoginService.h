@@ -35,7 +35,7 @@ class LoginService {
   std::optional<Failure> whyNoButton();
   std::string whatBlocksSleep();
   Result<void> store(const std::map<std::string, std::string>& values);
-  Result<void> restartService();
+  Result<void> restartService(const std::string& minutes);
   Result<void> rereadConfiguration();
   std::function<bool(const std::string&)> onceItReads(Setting::Read live);
 

@@ -10,6 +10,8 @@ namespace tavisk {
 namespace {
 
 constexpr const char* name = "the management controller";
+/// In the answer to Get Device ID (IPMI 2.0, 20.1): three bytes, the low one first.
+constexpr std::size_t manufacturerAt = 6;
 
 struct Completion {
   std::uint8_t code;
@@ -58,11 +60,14 @@ ControllerAnswer ManagementController::ask(const char* what, const ControllerReq
   return {0, std::move(reply), std::nullopt};
 }
 
-std::optional<std::uint32_t> ManagementController::manufacturer() {
-  constexpr std::size_t first = 6;
-  const auto answer = ask("Get Device ID", {0x06, 0x01, {}}, first + 3);
-  if (answer.status != 0) return std::nullopt;
-  const auto byte = [&](std::size_t place) { return std::uint32_t{answer.data[first + place]} << (8 * place); };
+ControllerAnswer ManagementController::identity() {
+  return ask("Get Device ID", {0x06, 0x01, {}}, manufacturerAt + 3);
+}
+
+std::uint32_t manufacturerIn(const ControllerAnswer& identity) {
+  const auto byte = [&](std::size_t place) {
+    return std::uint32_t{identity.data[manufacturerAt + place]} << (8 * place);
+  };
   return (byte(0) | byte(1) | byte(2)) & 0xFFFFFU;
 }
 

@@ -27,11 +27,14 @@ class ManagementController {
   /// `what` is the request's name, for failures: "Get Chassis Status". An answer of fewer than `leastData` bytes is a
   /// failure.
   ControllerAnswer ask(const char* what, const ControllerRequest& request, std::size_t leastData = 0);
-  /// Which company made it, by its number at the IANA; absent when it does not tell.
-  std::optional<std::uint32_t> manufacturer();
+  /// The answer for manufacturerIn().
+  ControllerAnswer identity();
 
  private:
   ControllerLink& _link;
 };
+
+/// Which company made the controller, by its number at the IANA, from a successful answer.
+std::uint32_t manufacturerIn(const ControllerAnswer& identity);
 
 }  // namespace tavisk

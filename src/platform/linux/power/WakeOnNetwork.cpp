@@ -14,6 +14,7 @@ namespace {
 
 constexpr const char* cardFolder = "/sys/class/net/";
 constexpr const char* usualLinkFile = "99-default.link";
+constexpr const char* hidingLink = "/etc/systemd/network/99-default.link";
 constexpr const char* section = "Link";
 constexpr const char* key = "WakeOnLan";
 constexpr std::size_t fileLimit = 65536;
@@ -125,7 +126,10 @@ Setting WakeOnNetwork::wakeOnNetworkAccess() const {
 Setting WakeOnNetwork::wakeOnNetworkAccessChange() const {
   auto setting = wakeOnNetworkAccess();
   setting.where = dropInFor(usualLinkFile);
-  if (!_machine.root.exists("/run/udev/control")) setting.note = "no device manager runs here: lasts until the restart";
+  if (!_machine.root.exists("/run/udev/control"))
+    setting.note = "no device manager runs here: lasts until the restart";
+  else if (_machine.root.readLink(hidingLink).valueOr("") == "/dev/null")
+    setting.note = std::string(hidingLink) + " hides the file: lasts until the restart";
   setting.undoneBy = ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::networkManager});
   setting.store = [this](const std::string& value) { return store(value); };
   setting.apply = [this](const std::string& value) { return apply(value); };

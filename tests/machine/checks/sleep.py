@@ -1,0 +1,68 @@
+# SPDX-FileCopyrightText: 2026 The tavisk developers
+# SPDX-License-Identifier: MIT
+import re
+
+from check import Check
+
+CONTAINER, GUEST, SERVER = frozenset({"container"}), frozenset({"guest"}), frozenset({"server"})
+LOGIN = "busctl get-property org.freedesktop.login1 /org/freedesktop/login1 org.freedesktop.login1.Manager "
+BLANKING = "cat /sys/module/kernel/parameters/consoleblank"
+# The disk with a motor, then the one without.
+DISKS = "grep . /sys/block/sd[ab]/device/power/control | cut -d: -f2; cat /sys/block/sda/device/power/autosuspend_delay_ms"
+
+
+def idle(action, minutes):
+    return {LOGIN + "IdleAction": f's "{action}"\n', LOGIN + "IdleActionUSec": f"t {minutes * 60_000_000}\n"}
+
+
+def timers(computer, display, disk):
+    return "".join(f"Sleep: {what} sleeps {when}\n"
+                   for what, when in (("Computer", computer), ("Display", display), ("Disk", disk)))
+
+
+CHECKS = [
+    Check("a container that cannot sleep says so", needs=CONTAINER,
+          do="TAVISK_LOG=stderr tavisk -setsleep 20 -getsleep",
+          prints="setsleep: 20 (computer, display, hard disk)\n" + timers("Never", "Never", "Never"),
+          errors=re.compile(r"tavisk: Display Sleep: [^\n]*\ntavisk: Hard Disk Sleep: [^\n]*\n"
+                            r"tavisk: Computer Sleep: [^\n]* cannot sleep\n"),
+          then={LOGIN + "IdleAction": 's "ignore"\n', "ls /etc/systemd/logind.conf.d /etc/udev/rules.d 2>&1 | grep tavisk": ""}),
+    Check("the console blanks without any service", needs=GUEST,
+          do="tavisk -setdisplaysleep 10 -getdisplaysleep -getcomputersleep -getharddisksleep",
+          prints="setdisplaysleep: 10\nDisplay Sleep: after 10 minutes\nComputer Sleep: Never\nHard Disk Sleep: Never\n",
+          then={BLANKING: "600\n"}),
+    Check("sleep timers are set at the login service, the console and the disk with a motor", needs=SERVER,
+          do="TAVISK_LOG=stderr tavisk -setsleep 150 -getsleep", errors="",
+          prints="setsleep: 150 (computer, display, hard disk)\n" +
+                 timers("after 150 minutes", "after 60 minutes", "after 150 minutes"),
+          then=idle("suspend", 150) | {BLANKING: "3600\n", DISKS: "auto\non\n9000000\n"}),
+    Check("they never sleep", needs=SERVER, do="tavisk -setsleep never -getsleep",
+          prints="setsleep: Never (computer, display, hard disk)\n" + timers("Never", "Never", "Never"),
+          then={LOGIN + "IdleAction": 's "ignore"\n', BLANKING: "0\n", DISKS: "on\non\n9000000\n"}),
+    Check("each timer is kept by itself", needs=SERVER, kept=True,
+          do="tavisk -setcomputersleep 170 -setdisplaysleep 20 -setharddisksleep 1",
+          prints="setcomputersleep: 170\nsetdisplaysleep: 20\nsetharddisksleep: 1\n",
+          then=idle("suspend", 170) | {
+              BLANKING: "1200\n", DISKS: "auto\non\n60000\n",
+              "tavisk -getsleep": timers("after 170 minutes", "after 20 minutes", "after 1 minutes")}),
+    Check("an idle disk stops", needs=SERVER,
+          do="timeout 100 sh -c 'until grep -q suspended /sys/block/sda/device/power/runtime_status; do sleep 1; done' && "
+             "dmesg | grep -c 'sd .*Stopping disk' | sed 's/[1-9].*/stopped/'", prints="stopped\n"),
+    Check("a disk that comes back gets its timer", needs=SERVER,
+          do="echo on >/sys/block/sda/device/power/control; udevadm trigger --settle --action=add /sys/block/sda",
+          then={DISKS: "auto\non\n60000\n"}),
+    Check("the power button sleeps", needs=SERVER, kept=True,
+          do="tavisk -setallowpowerbuttontosleepcomputer off -getallowpowerbuttontosleepcomputer "
+             "-setallowpowerbuttontosleepcomputer on",
+          prints="setallowpowerbuttontosleepcomputer: Off\ngetAllowPowerButtonToSleepComputer: Off\n"
+                 "setallowpowerbuttontosleepcomputer: On\n",
+          then={LOGIN + "HandlePowerKey": 's "suspend"\n',
+                "tavisk -getallowpowerbuttontosleepcomputer": "getAllowPowerButtonToSleepComputer: On\n"} |
+               idle("suspend", 170)),
+    Check("a drop-in that hides the timer is named", needs=SERVER,
+          do="printf '[Login]\\nIdleAction=ignore\\n' >/etc/systemd/logind.conf.d/90-test.conf; "
+             "TAVISK_REPORT=fd:3 tavisk -setcomputersleep 160 3>&1 >/dev/null | grep -o '\"undoneBy\":\"[^\"]*\"'; "
+             "rm /etc/systemd/logind.conf.d/90-test.conf; tavisk -setcomputersleep 170",
+          prints='"undoneBy":"/etc/systemd/logind.conf.d/90-test.conf"\nsetcomputersleep: 170\n',
+          then=idle("suspend", 170)),
+]
