@@ -1,8 +1,8 @@
 # SPDX-FileCopyrightText: 2026 The tavisk developers
 # SPDX-License-Identifier: MIT
-"""A management controller for an emulated machine. It keeps a power restore policy and a start-up delay, and knows no
-other request than those, its identity, and its state; the emulator's own protocol is between them (frames of the bytes
-sequence number, function, command, data, checksum)."""
+"""A management controller for an emulated machine. It keeps a power restore policy and a start-up delay, sees the lock of
+the front panel, and knows no other request than those, its identity, and its state; the emulator's own protocol is
+between them (frames of the bytes sequence number, function, command, data, checksum)."""
 
 import socket
 import threading
@@ -11,7 +11,8 @@ END_OF_MESSAGE, END_OF_CONTROL, ESCAPE = 0xA0, 0xA1, 0xAA
 SUCCESS, UNKNOWN_REQUEST = 0x00, 0xC1
 IDENTITY = bytes([0x20, 1, 1, 2, 2, 0x80, 0x57, 0x01, 0, 1, 0])  # of manufacturer 343
 POLICIES = 0x07
-GET_IDENTITY, GET_STATE, SET_POLICY = (0x06, 0x01), (0x00, 0x01), (0x00, 0x06)
+PANEL_LOCK = 0x02
+GET_IDENTITY, GET_ABILITIES, GET_STATE, SET_POLICY = (0x06, 0x01), (0x00, 0x00), (0x00, 0x01), (0x00, 0x06)
 SET_DELAY, GET_DELAY = (0x30, 0x54), (0x30, 0x55)
 
 
@@ -22,16 +23,21 @@ class Controller:
         self.policy = 0
         self.delay = bytes(2)
         self.knows_delay = True
+        self.locked = False
         self._listener = socket.socket(socket.AF_UNIX)
         self._listener.bind(str(path))
         self._listener.listen()
         threading.Thread(target=self._serve, daemon=True).start()
 
     def obey(self, command):
-        """"controller tells" what it keeps; "controller forgets delays" and "knows delays" from then on."""
+        """"controller tells" what it keeps; "controller forgets delays" and "knows delays" from then on, and so with the
+        panel that "is locked" or "is open"."""
         if command == "controller tells":
             return f"policy {self.policy}, delay {int.from_bytes(self.delay, 'big')}\n"
-        self.knows_delay = {"controller knows delays": True, "controller forgets delays": False}[command]
+        if command.startswith("controller is "):
+            self.locked = {"controller is locked": True, "controller is open": False}[command]
+        else:
+            self.knows_delay = {"controller knows delays": True, "controller forgets delays": False}[command]
         return ""
 
     def _serve(self):
@@ -49,8 +55,10 @@ class Controller:
     def _answer(self, request, data):
         if request == GET_IDENTITY:
             return SUCCESS, IDENTITY
+        if request == GET_ABILITIES:
+            return SUCCESS, bytes([PANEL_LOCK, 0x20, 0x20, 0x20, 0x20])
         if request == GET_STATE:
-            return SUCCESS, bytes([1 | self.policy << 5, 0, 0])
+            return SUCCESS, bytes([1 | self.policy << 5, 0, PANEL_LOCK * self.locked])
         if request == SET_POLICY:
             self.policy = data[0] if data[0] < 3 else self.policy
             return SUCCESS, bytes([POLICIES])
