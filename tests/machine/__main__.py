@@ -12,6 +12,7 @@ import container
 import guard
 import guest
 import machine
+import purge
 import server
 import trees
 
@@ -48,6 +49,8 @@ def prove(make, results, keep):
     try:
         tested.start()
         check.prove(tested, results)
+        if "bus" in tested.has:
+            purge.prove(tested, results)
         if keep:
             ask_for_commands(tested)
     finally:

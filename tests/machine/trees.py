@@ -63,8 +63,17 @@ def layered(name, packages):
         (layer / part).mkdir(parents=True)
     run("mount", "-t", "overlay", "-o", f"lowerdir={clean},upperdir={layer}/upper,workdir={layer}/work", "overlay",
         layer / "tree")
-    run("cmake", "--install", "build/release", "--prefix", "/usr", env={**os.environ, "DESTDIR": str(layer / "tree")})
+    install_package(layer / "tree")
     return layer / "tree"
+
+
+def install_package(tree):
+    """And beside it the test that comes with the package's sources."""
+    (package,) = pathlib.Path("dist").glob("tavisk_*.deb")
+    shutil.copy(package, tree / "root/tavisk.deb")
+    shutil.copy("debian/tests/smoke", tree / "root/smoke-test")
+    run("chroot", tree, "dpkg", "--install", "/root/tavisk.deb",
+        env={**os.environ, "PATH": "/usr/sbin:/usr/bin:/sbin:/bin"})
 
 
 def kernel(tree):

@@ -35,6 +35,7 @@ class Purge(unittest.TestCase):
         self.addCleanup(self._folder.cleanup)
         self.root = pathlib.Path(self._folder.name)
         self.variables = self.root / "sys/firmware/efi/efivars"
+        (self.root / "etc").mkdir()
 
     def file(self, path, contents=b"x"):
         file = self.root / path.lstrip("/")
@@ -57,6 +58,7 @@ class Purge(unittest.TestCase):
     def test_takes_every_file_of_its_own_and_no_other(self):
         for pattern in re.search(r"own_files='\n(.*?)\n'", SCRIPT.read_text(), re.DOTALL)[1].split():
             self.file(pattern.replace("*", "some") + ("" if "." in pattern else "/file"))
+        self.file("/etc/.tavisk-1234567")
         for path in LEFT:
             self.file(path)
         self.assertEqual(self.purge(), "")
