@@ -35,9 +35,9 @@ Result<std::unique_ptr<MachineFile>> MachineFile::open(const std::string& direct
   std::unique_ptr<MachineFile> file(new MachineFile(directory, effects));
   if (auto folder = file->_folder.open("/", O_RDONLY | O_DIRECTORY); !folder)
     return Failure{rehearsal, directory, folder.failure().why};
-  auto machine = file->read();
-  if (!machine) return Failure{rehearsal, machine.failure().on, machine.failure().why};
-  file->_contents = std::make_shared<const Dictionary>(std::move(machine).value());
+  auto version = file->read();
+  if (!version) return Failure{rehearsal, version.failure().on, version.failure().why};
+  file->_version = *version;
   return file;
 }
 
@@ -51,27 +51,31 @@ MachineFile::Contents MachineFile::contents() {
   auto stamp = _folder.stamp(fileName);
   {
     std::lock_guard held(_mutex);
-    if (stamp == _stamp) return _contents;
+    if (stamp == _stamp) return Contents(_version, &_version->machine);
   }
   // What counts is when reading begins.
   auto telling = tellsVersions(stamp) ? stamp : FileStamp{};
-  auto machine = read();
-  if (auto failure = keep(telling, machine)) recordFailure(*failure, "the contents last read stand");
-  std::lock_guard held(_mutex);
-  return _contents;
+  if (auto failure = keep(telling, read())) recordFailure(*failure, "the contents last read stand");
+  auto version = lastSeen();
+  return Contents(version, &version->machine);
 }
 
-std::optional<Failure> MachineFile::keep(const std::optional<FileStamp>& stamp, Result<Dictionary>& machine) {
+std::optional<Failure> MachineFile::keep(const std::optional<FileStamp>& stamp, const Result<VersionRef>& version) {
   std::lock_guard held(_mutex);
   _stamp = stamp;
-  if (machine) {
-    _contents = std::make_shared<const Dictionary>(std::move(machine).value());
+  if (version) {
+    _version = *version;
     _failure.reset();
     return std::nullopt;
   }
-  bool known = _failure == machine.failure();
-  _failure = machine.failure();
+  bool known = _failure == version.failure();
+  _failure = version.failure();
   return known ? std::nullopt : _failure;
+}
+
+MachineFile::VersionRef MachineFile::lastSeen() const {
+  std::lock_guard held(_mutex);
+  return _version;
 }
 
 MachineSection MachineFile::section(std::string_view name) {
@@ -83,15 +87,24 @@ MachineSection MachineFile::section(std::string_view name) {
 Result<void> MachineFile::change(const Edit& edit) {
   auto held = lock();
   if (!held) return held.failure();
-  auto machine = read();
-  if (!machine) return machine.failure();
-  auto edited = std::move(machine).value();
-  edit(edited);
-  auto text = writePropertyList(std::move(edited));
+  auto version = read();
+  if (!version) return version.failure();
+  PropertyList edited = Dictionary((*version)->machine);
+  edit(*edited.asDictionary());
+  auto text = writePropertyList(edited);
   if (!text) return Failure{"write", _path, text.failure().why};
   auto written = _folder.write(fileName, *text);
   if (!written) return inFolder(written.failure());
+  keepWritten(std::move(text).value(), std::move(*edited.asDictionary()));
   return {};
+}
+
+void MachineFile::keepWritten(std::string text, Dictionary machine) {
+  if (whyWrong(machine)) return;
+  auto version = std::make_shared<const Version>(Version{std::move(text), std::move(machine)});
+  std::lock_guard held(_mutex);
+  _version = version;
+  _stamp = FileStamp{};
 }
 
 RunLoop::Registration MachineFile::observeChanges(RunLoop& runLoop, Contents told, Observer observer) {
@@ -113,12 +126,25 @@ RunLoop::Registration MachineFile::observeChanges(RunLoop& runLoop, Contents tol
   return std::move(watch).value();
 }
 
-Result<MachineFile::Dictionary> MachineFile::read() const {
+Result<MachineFile::VersionRef> MachineFile::read() const {
+  auto text = readText();
+  if (!text) return text.failure();
+  if (auto last = lastSeen(); last->text == *text) return last;
+  auto machine = *text ? parse(**text) : Dictionary();
+  if (!machine) return machine.failure();
+  return std::make_shared<const Version>(Version{std::move(text).value(), std::move(machine).value()});
+}
+
+Result<std::optional<std::string>> MachineFile::readText() const {
   bool missing = !_folder.exists(fileName) && !_folder.readLink(fileName);
-  if (missing) return Dictionary();
+  if (missing) return std::optional<std::string>();
   auto text = _folder.read(fileName, ownFileLimits.bytes);
   if (!text) return inFolder(text.failure());
-  auto list = parsePropertyList(*text, ownFileLimits);
+  return std::optional(std::move(text).value());
+}
+
+Result<MachineFile::Dictionary> MachineFile::parse(const std::string& text) const {
+  auto list = parsePropertyList(text, ownFileLimits);
   if (!list) return Failure{"read", _path, list.failure().why};
   auto value = std::move(list).value();
   auto* machine = value.asDictionary();

@@ -49,10 +49,23 @@ class MachineFile {
   [[nodiscard]] RunLoop::Registration observeChanges(RunLoop& runLoop, Contents told, Observer observer);
 
  private:
+  /// The file at one time.
+  struct Version {
+    std::optional<std::string> text;  ///< absent: there was no file
+    Dictionary machine;
+  };
+  using VersionRef = std::shared_ptr<const Version>;
+
   MachineFile(const std::string& directory, EffectSink& effects);
-  Result<Dictionary> read() const;
+  /// Always reads the file, and takes it to pieces only when its text is not the one last seen.
+  Result<VersionRef> read() const;
+  Result<std::optional<std::string>> readText() const;
+  Result<Dictionary> parse(const std::string& text) const;
+  VersionRef lastSeen() const;
+  /// What this run has written need not be taken to pieces, as long as the file still has that text.
+  void keepWritten(std::string text, Dictionary machine);
   /// Takes over what was read; a failure that is to be told comes back.
-  std::optional<Failure> keep(const std::optional<FileStamp>& stamp, Result<Dictionary>& machine);
+  std::optional<Failure> keep(const std::optional<FileStamp>& stamp, const Result<VersionRef>& version);
   Result<FileDescriptor> lock() const;
   Failure inFolder(const Failure& failure) const;
   void recordFailure(const Failure& failure, const char* note);
@@ -62,8 +75,8 @@ class MachineFile {
   SystemRoot _folder;
   EffectSink& _effects;
   std::thread::id _owner = std::this_thread::get_id();
-  std::mutex _mutex;  ///< of what follows; never held while the file is read
-  Contents _contents;
+  mutable std::mutex _mutex;  ///< of what follows; never held while the file is read
+  VersionRef _version = std::make_shared<const Version>();
   std::optional<FileStamp> _stamp = FileStamp{};  ///< of the file as last read; no file has this one
   std::optional<Failure> _failure;                ///< told, and not over
 };
