@@ -42,12 +42,12 @@ class RealDisks {
     EXPECT_TRUE(runTool("mkfs.ext4 -q -L " + label + " " + image));
     waitUntilGone({LoopDevice::nextName()});
     LoopDevice device(image);
-    const DiskName disk{device.name()};
+    DiskName disk{device.name()};
     _disks.insert_or_assign(disk.text, Plugged{std::move(device), image});
     return disk;
   }
   std::string mount(const DiskName& disk) {
-    const auto point = pointOf(disk);
+    auto point = pointOf(disk);
     std::filesystem::create_directories(point);
     EXPECT_EQ(::mount(("/dev/" + disk.text).c_str(), point.c_str(), "ext4", 0, nullptr), 0);
     return point;
@@ -262,6 +262,7 @@ TEST(LinuxDisks, TellsKindsOfDisksApart) {
 }
 
 TEST(LinuxDisks, TellsPartitionsAndImagesOfThisMachine) {
+  if (!runTool("command -v sgdisk && command -v partx")) GTEST_SKIP() << "sgdisk is missing";
   std::string why = RealDisks::run([](RealDisks& machine) {
     TemporaryFolder folder;
     const auto image = folder.write("image", "");
