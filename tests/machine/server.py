@@ -27,7 +27,7 @@ Description=Commands of the tests
 After=multi-user.target
 
 [Service]
-ExecStartPre=udevadm settle
+ExecStartPre=-timeout 60 sh -c 'until [ -e /sys/block/sdb ]; do sleep 1; done; udevadm settle'
 ExecStart=/bin/sh /usr/lib/agent.sh /dev/ttyS1
 
 [Install]

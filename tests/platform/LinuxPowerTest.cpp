@@ -124,7 +124,7 @@ TEST(LinuxPower, ThePlaceOfAPortWakesNotItsTerminal) {
               HasSubstr(R"(SUBSYSTEM=="pnp", DRIVER=="serial", TEST=="power/wakeup", ATTR{power/wakeup}="enabled")"));
 }
 
-TEST(LinuxPower, ARecordedMachineChangesOnlyWhatCan) {
+TEST(LinuxPower, RecordedMachinesChangeOnlyWhatCan) {
   PowerTree guest("guest.devices");
   guest.power().setOn(PowerSwitch::wakeOnLAN, mains, true);
   guest.power().setOn(PowerSwitch::wakeOnRing, mains, true);
@@ -132,6 +132,14 @@ TEST(LinuxPower, ARecordedMachineChangesOnlyWhatCan) {
     EXPECT_EQ(guest.cards.cards[card].modes.enabled, card == std::string("eth0") ? magicPacket : 0) << card;
   EXPECT_EQ(guest.file("/sys/devices/pnp0/00:03/power/wakeup"), "enabled");
   EXPECT_FALSE(guest.delays().serviceOfClass("VelmarKCS"));
+
+  PowerTree server("server.devices");
+  server.power().setUntilSleep(SleepTimer::disk, mains, {5});
+  EXPECT_EQ(server.file("/sys/block/sda/device/power/control"), "auto");
+  EXPECT_EQ(server.file("/sys/block/sdb/device/power/control"), "on\n") << "it has no motor";
+  for (const auto which : {PowerSwitch::wakeOnLAN, PowerSwitch::wakeOnRing})
+    EXPECT_FALSE(server.power().supports(which, mains));
+  EXPECT_TRUE(server.delays().serviceOfClass("VelmarKCS"));
 }
 
 TEST(LinuxPower, RestartComesFromTheControllerElseTheFirmware) {
