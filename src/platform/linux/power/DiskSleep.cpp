@@ -49,7 +49,7 @@ std::string ruleFor(const std::string& minutes) {
 bool DiskSleep::canStop(const SysDevice& disk) const {
   const auto folder = disk.path() + "/scsi_disk";
   for (const auto& address : _machine.root.list(folder).valueOr({})) {
-    const auto scsi = SysDevice::at(_machine.root, folder + "/" + address);
+    const auto scsi = SysDevice::at(_machine.root, std::string(folder).append("/").append(address));
     if (!scsi) continue;
     const auto* attribute = scsi->has("manage_runtime_start_stop") ? "manage_runtime_start_stop" : "manage_start_stop";
     return scsi->read(attribute).valueOr("") == "1";
