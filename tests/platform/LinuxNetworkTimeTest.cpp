@@ -34,6 +34,7 @@ enable) touch "$root/etc/rc2.d/S01$1" ;;
 *) touch "$root/etc/rc2.d/K01$1" ;;
 esac
 )sh");
+    writeProgram("/usr/sbin/chronyd", "");
     write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\n");
     writeProgram("/usr/bin/chronyc", R"sh(#!/bin/sh
 root=${0%/usr/bin/chronyc}
@@ -154,9 +155,11 @@ TEST(TimeDaemons, ReadServersAsNtpdDoes) {
   for (const auto& each : cases) EXPECT_EQ(firstServer("ntpd", each), each.server) << each.files[0].second;
 }
 
-TEST(LinuxNetworkTime, LeavesTheFileOfOpenntpdAlone) {
+TEST(LinuxNetworkTime, KnowsTheClientThatIsReallyThereAndLeavesItsFileAlone) {
   LinuxTree tree;
+  tree.writeProgram("/etc/init.d/chrony", "#!/bin/sh\n");  // all that is left of a package
   tree.writeProgram("/etc/init.d/openntpd", "#!/bin/sh\n");
+  tree.writeProgram("/usr/sbin/ntpd", "");
   tree.write("/etc/openntpd/ntpd.conf", "listen on *\nservers pool.example weight 5\n");
   tree.host().networkTime().setServer({"time.example"});
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("/etc/openntpd/ntpd.conf")));

@@ -19,6 +19,7 @@ class ScriptedTree : public LinuxTree {
  public:
   ScriptedTree() {
     write("/etc/ssh/ssh_host_rsa_key", "");
+    writeProgram("/usr/sbin/sshd", "");
     write("/proc/78/stat", "78 (sshd) S 1");
     write("/proc/78/cmdline", "sshd: alice [priv]");
     writeProgram("/etc/init.d/ssh", R"sh(#!/bin/sh
@@ -45,6 +46,7 @@ class ManagedTree : public LinuxTree {
  public:
   ManagedTree() : manager((write("/run/systemd/system/x", ""), at("/run/systemd/private"))) {
     write("/etc/ssh/ssh_host_rsa_key", "");
+    writeProgram("/usr/sbin/sshd", "");
     write("/usr/sbin/sshd", "");
     write("/etc/tavisk/services.conf", "remote-events = events.socket events.service\n");
     for (const char* unit : {"ssh.service", "ssh.socket", "events.socket", "events.service"}) manager.set(unit, {});

@@ -36,8 +36,14 @@ bool isLinkTo(std::string_view script, std::string_view kinds, std::string_view 
 }  // namespace
 
 Result<Daemons::Presence> InitScriptDaemons::presence(const Daemon& daemon) {
-  bool installed = *daemon.script != '\0' && _root.exists(scriptOf(daemon));
-  return installed ? Presence::installed : Presence::absent;
+  bool hasScript = *daemon.script != '\0' && _root.exists(scriptOf(daemon));
+  return hasScript && hasProgram(daemon) ? Presence::installed : Presence::absent;
+}
+
+/// A package that was removed, but not purged, leaves its script behind.
+bool InitScriptDaemons::hasProgram(const Daemon& daemon) const {
+  return _root.exists(std::string("/usr/sbin/") + daemon.program) ||
+         _root.exists(std::string("/usr/bin/") + daemon.program);
 }
 
 std::vector<ProcessId> InitScriptDaemons::processes(const Daemon& daemon) const {

@@ -29,6 +29,7 @@ class InitScriptDaemons : public Daemons {
   Result<void> restartIfRunning(const Daemon& daemon) override;
 
  private:
+  bool hasProgram(const Daemon& daemon) const;
   std::vector<ProcessId> processes(const Daemon& daemon) const;
   bool hasLink(const Daemon& daemon, const char* kinds) const;
   bool awaitBeginning(const Daemon& daemon);
