@@ -40,6 +40,11 @@ Names namesOfTable(const std::string& text) {
   return names;
 }
 
+/// The source and the table also name zones that a package of their own brings.
+void removeUninstalled(const SystemRoot& root, Names& names) {
+  std::erase_if(names, [&](const std::string& name) { return !root.exists(zoneFolder + name); });
+}
+
 /// Other trees of the same zones, and files that are no zones.
 bool isNoZone(const std::string& name) {
   return name == "posix" || name == "right" || name == "posixrules" || name == "localtime";
@@ -62,8 +67,10 @@ void addCompiled(const SystemRoot& root, const std::string& below, int depth, Na
 Result<std::vector<std::string>> installedZones(const SystemRoot& root) {
   Names names;
   if (auto source = root.read(zoneFolder + std::string("tzdata.zi"), largestTable)) names = namesOfSource(*source);
+  removeUninstalled(root, names);
   if (names.empty()) {
     if (auto table = root.read(zoneFolder + std::string("zone1970.tab"), largestTable)) names = namesOfTable(*table);
+    removeUninstalled(root, names);
   }
   if (names.empty()) addCompiled(root, "", 1, names);
   if (names.empty()) return Failure{"list time zones", zoneFolder, "no time zones are installed"};
