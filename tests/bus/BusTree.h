@@ -36,7 +36,8 @@ class MessageBus {
   int _process = 0;
 };
 
-/// A tree of files with a message bus and the real daemons, which find the tree's files in /etc and among the zones.
+/// A tree of files with a message bus and the real daemons, which find the tree's files in /etc, in /run and among
+/// the zones.
 /// The kernel's host name is that of the tests. The service manager is a fake on the same bus.
 class BusTree : public LinuxTree {
   std::filesystem::path made(const char* file) {
@@ -50,6 +51,7 @@ class BusTree : public LinuxTree {
   static constexpr const char* _kernelName = "/proc/sys/kernel/hostname";
   Shown _name{_kernelName, made(_kernelName)};
   Shown _etc{madeFolder("/etc"), "/etc"};
+  Shown _run{madeFolder("/run/systemd").parent_path(), "/run"};
   Shown _zones{madeFolder("/usr/share/zoneinfo"), "/usr/share/zoneinfo"};
   MessageBus _bus{*this};
 

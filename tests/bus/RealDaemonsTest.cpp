@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "BusTree.h"
 #include "platform/LinuxContractMachines.h"
+#include "platform/ZoneList.h"
 #include "platform/contract/HostNamesContract.h"
 
 namespace tavisk {
@@ -43,12 +44,13 @@ class TimeDaemon {
 };
 
 TEST(TimeDaemon, KnowsTheZonesThatWeList) {
-  const auto names = contentsOf("/usr/share/zoneinfo/tzdata.zi");
+  const auto source = contentsOf("/usr/share/zoneinfo/tzdata.zi");
+  const auto installed = installedZones(SystemRoot("/")).value();
   BusTree tree;
-  tree.write("/usr/share/zoneinfo/tzdata.zi", names);
-  const auto zones = TimeDaemon(tree).zones();
-  EXPECT_GT(zones.size(), 400U);
-  EXPECT_THAT(tree.host().clock().knownTimeZones(), ElementsAreArray(zones));
+  tree.write("/usr/share/zoneinfo/tzdata.zi", source);
+  for (const auto& zone : installed) tree.write("/usr/share/zoneinfo/" + zone, "TZif2");
+  EXPECT_GT(installed.size(), 400U);
+  EXPECT_THAT(tree.host().clock().knownTimeZones(), ElementsAreArray(TimeDaemon(tree).zones()));
 }
 
 TEST(TimeDaemon, IsToldTheZoneAndTheNameFileFollows) {
@@ -100,6 +102,15 @@ TEST(TimeDaemon, TellsTheServerInUseWhereNoneIsConfigured) {
   EXPECT_THAT(tree.lastTold(), HasSubstr(R"("live":"fallback.example")"));
   tree.host().networkTime().setServer({"time.example"});
   EXPECT_EQ(tree.host().networkTime().server().address, "time.example");
+}
+
+TEST(ServiceManager, ThatEndedDuringACallIsNotTakenForSilent) {
+  ChronyBusTree tree;
+  tree.manager.breakNext("LoadUnit", FakeServiceManager::Fault::hangUp);
+  EXPECT_FALSE(tree.host().networkTime().isRunning());
+  EXPECT_THAT(tree.lastTold(), HasSubstr("DBus.Error.NoReply"));
+  EXPECT_FALSE(tree.host().networkTime().isRunning());
+  EXPECT_THAT(tree.lastTold(), HasSubstr("DBus.Error.ServiceUnknown"));
 }
 
 TEST(NameDaemon, GivesTheMachineTheNameEverywhere) {

@@ -9,12 +9,15 @@
 #include <cerrno>
 
 #include "platform/SystemFailure.h"
+#include "platform/linux/LinuxMachine.h"
 #include "platform/linux/LocalSocket.h"
 
 namespace tavisk {
 namespace {
 
 constexpr std::chrono::seconds timeForQuestions{300};
+constexpr const char* accessDenied = "org.freedesktop.DBus.Error.AccessDenied";
+constexpr const char* interactionRequired = "org.freedesktop.DBus.Error.InteractiveAuthorizationRequired";
 
 std::uint64_t microseconds(std::chrono::microseconds time) {
   return static_cast<std::uint64_t>(time.count());
@@ -31,7 +34,11 @@ class BusError {
 
   Failure failure(const char* member, const BusObject& object, int result) const {
     if (_error.name == nullptr) return systemFailure(member, object.path, -result);
-    return {member, object.path, _error.name + std::string(": ") + (_error.message == nullptr ? "" : _error.message)};
+    const std::string name = _error.name;
+    Failure failure{member, object.path, name + ": " + (_error.message == nullptr ? "" : _error.message)};
+    if (name == accessDenied || name == interactionRequired)
+      if (auto need = whyNeedsRoot(member, object.path)) failure.why += "; " + need->why;
+    return failure;
   }
 
  private:
@@ -128,8 +135,11 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
 
   BusError error(_library);
   sd_bus_message* answer = nullptr;
+  const auto began = std::chrono::steady_clock::now();
   result = _library.sd_bus_call(_bus, handle, microseconds(longest), error.handle(), &answer);
-  if (result == -ETIMEDOUT) _silentSince[object.service] = std::chrono::steady_clock::now();
+  // A service that ended during the call has the same error at once.
+  const auto now = std::chrono::steady_clock::now();
+  if (result == -ETIMEDOUT && now - began >= longest) _silentSince[object.service] = now;
   if (result < 0) return error.failure(member, object, result);
   BusMessage reply(_library, answer);
   if (_library.sd_bus_message_has_signature(answer, replySignature) <= 0)
