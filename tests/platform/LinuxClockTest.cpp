@@ -3,6 +3,7 @@
 #include <gmock/gmock.h>
 
 #include "LinuxTree.h"
+#include "platform/Calendar.h"
 #include "platform/linux/LocalTime.h"
 #include "platform/linux/SystemClock.h"
 
@@ -67,6 +68,39 @@ TEST(LinuxClock, LeavesTheClockOfThisMachineAlone) {
   LinuxTree tree;
   tree.host().clock().setTime(1'166'999'400);
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("a tree of files has no clock")));
+}
+
+TEST(LinuxClock, NamesTheProgramThatWillSetItBack) {
+  LinuxTree tree;
+  tree.write("/proc/10/stat", "10 (VBoxService) S 1");
+  tree.write("/proc/10/cmdline", "/usr/sbin/VBoxService");
+  tree.host().clock().setTime(1'166'999'400);
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("undoneBy":"VBoxService")"));
+}
+
+TEST(LinuxClock, ReadsTheHardwareClockInTheTimeThatItKeeps) {
+  LinuxTree tree;
+  const SystemRoot root(tree.at("/"));
+  EXPECT_EQ(hardwareTime(root), std::nullopt);
+  setDefaultTimeZone("/usr/share/zoneinfo/Asia/Tokyo");
+  tree.write("/sys/class/rtc/rtc0/since_epoch", "1166999400\n");
+  EXPECT_EQ(hardwareTime(root), 1'166'999'400);
+  tree.write("/etc/adjtime", "0.0 0 0.0\n0\nLOCAL\n");
+  EXPECT_EQ(hardwareTime(root), 1'166'999'400 - 9 * 3600);
+}
+
+TEST(AskedTime, IsWhatTheClocksSayWhenTheyAreNear) {
+  LinuxTree tree;
+  const SystemRoot root(tree.at("/"));
+  const auto now = systemTime();
+  tree.write("/sys/class/rtc/rtc0/since_epoch", std::to_string(now));
+  EXPECT_NE(AskedTime(now - 1).onSystemClock(), now - 1) << "nothing was set yet";
+  for (const auto& [ahead, system, hardware] : {std::tuple(0, true, true), {1, true, true}, {4, false, false}}) {
+    AskedTime asked(now + ahead);
+    asked.isNow();
+    EXPECT_EQ(asked.onSystemClock() == now + ahead, system) << ahead;
+    EXPECT_EQ(asked.onHardwareClock(root) == now + ahead, hardware) << ahead;
+  }
 }
 
 TEST(LinuxClock, KnowsWhichTimesLinuxRefuses) {

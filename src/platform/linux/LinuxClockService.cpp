@@ -10,6 +10,7 @@
 #include "platform/Text.h"
 #include "platform/ZoneList.h"
 #include "platform/linux/LocalTime.h"
+#include "platform/linux/ProcessScan.h"
 #include "platform/linux/SystemClock.h"
 
 namespace tavisk {
@@ -19,20 +20,6 @@ constexpr const char* withoutZone = "UTC";
 constexpr const char* inContainer = "no CAP_SYS_TIME here: set it on the machine that hosts this container";
 constexpr const char* timeUnit = "seconds since 1970";
 
-/// The clock as it was at one moment, also when it is read later.
-class ClockAtMoment {
- public:
-  void isNow() { _moment = RunLoop::Clock::now(); }
-  std::int64_t time() const {
-    if (!_moment) return systemTime();
-    auto since = std::chrono::system_clock::now() - (RunLoop::Clock::now() - *_moment);
-    return std::chrono::round<std::chrono::seconds>(since.time_since_epoch()).count();
-  }
-
- private:
-  std::optional<RunLoop::Clock::time_point> _moment;
-};
-
 BusObject timeDaemon() {
   return {"org.freedesktop.timedate1", "/org/freedesktop/timedate1", "org.freedesktop.timedate1"};
 }
@@ -41,6 +28,14 @@ BusObject timeDaemon() {
 bool leavesItToOthers(const Failure& failure) {
   return isBusError(failure, serviceUnknown) ||
          isBusError(failure, "org.freedesktop.timedate1.AutomaticTimeSyncEnabled");
+}
+
+/// By the difference: it stays right however long the daemon takes, to start or to ask the user.
+Result<void> setByDaemon(Bus& bus, const AskedTime& asked) {
+  constexpr bool relative = true;
+  auto set = bus.call(timeDaemon(), "SetTime", "", asked.microsecondsAhead(), relative, bus.isInteractive());
+  if (!set) return set.failure();
+  return {};
 }
 
 /// In a container the daemon has no more rights than this process.
@@ -66,7 +61,10 @@ std::optional<Failure> LinuxClockService::whyNoClock() const {
   return std::nullopt;
 }
 
+/// Also what the service manager knows nothing of, such as a virtual machine's tools.
 std::string LinuxClockService::whoCorrectsTheClock() {
+  for (const char* program : {"chronyd", "ntpd", "systemd-timesyncd", "phc2sys", "VBoxService"})
+    if (!processesNamed(_machine.root, program).empty()) return program;
   auto bus = _machine.services.systemBus();
   if (!bus) return {};
   auto corrected = (*bus)->property(timeDaemon(), "NTP", "b");
@@ -74,31 +72,36 @@ std::string LinuxClockService::whoCorrectsTheClock() {
 }
 
 void LinuxClockService::setTime(std::int64_t secondsSince1970) {
-  ClockAtMoment clock;
+  AskedTime asked(secondsSince1970);
   Setting time;
   time.name = setting::time;
   time.unit = timeUnit;
-  time.where = _machine.root.exists(hardwareClock) ? hardwareClock : "";
   time.undoneBy = whoCorrectsTheClock();
-  time.live = [&clock] { return std::optional(std::to_string(clock.time())); };
+  time.live = [&] { return std::optional(std::to_string(asked.onSystemClock())); };
+  if (asked.onHardwareClock(_machine.root)) {
+    time.where = hardwareClock;
+    time.stored = [&]() -> Result<std::optional<std::string>> {
+      const auto stored = asked.onHardwareClock(_machine.root);
+      return stored ? std::optional(std::to_string(*stored)) : std::nullopt;
+    };
+  } else {
+    time.note = "without a hardware clock the machine forgets the time when it is off";
+  }
   time.apply = [&](const std::string&) -> Result<void> {
-    clock.isNow();
-    return changeTime(secondsSince1970);
+    asked.isNow();
+    return changeTime(asked);
   };
   carryOut(time, std::to_string(secondsSince1970), _machine.effects, _machine.runLoop);
 }
 
-Result<void> LinuxClockService::changeTime(std::int64_t secondsSince1970) {
-  constexpr std::int64_t microseconds = 1'000'000;
-  constexpr bool relative = false;
-  if (auto failure = whyOutOfClockRange(secondsSince1970)) return *failure;
+Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
+  if (auto failure = whyOutOfClockRange(asked.seconds())) return *failure;
   if (auto bus = _machine.services.systemBus()) {
-    auto set =
-        (*bus)->call(timeDaemon(), "SetTime", "", secondsSince1970 * microseconds, relative, (*bus)->isInteractive());
+    auto set = setByDaemon(**bus, asked);
     if (set) return {};
     if (!leavesItToOthers(set.failure())) return withAdvice(set.failure());
   }
-  return changeTimeDirectly(secondsSince1970);
+  return changeTimeDirectly(asked.seconds());
 }
 
 Result<void> LinuxClockService::changeTimeDirectly(std::int64_t secondsSince1970) const {

@@ -5,6 +5,7 @@
 #include "platform/ClockService.h"
 #include "platform/SettingChange.h"
 #include "platform/linux/LinuxMachine.h"
+#include "platform/linux/SystemClock.h"
 
 namespace tavisk {
 
@@ -24,7 +25,7 @@ class LinuxClockService : public ClockService {
   Setting timeZoneSetting() const;
   std::optional<Failure> whyNoClock() const;
   std::string whoCorrectsTheClock();
-  Result<void> changeTime(std::int64_t secondsSince1970);
+  Result<void> changeTime(const AskedTime& asked);
   Result<void> changeTimeDirectly(std::int64_t secondsSince1970) const;
   Result<void> changeTimeZone(const std::string& zone);
   Result<void> changeTimeZoneDirectly(const std::string& zone) const;

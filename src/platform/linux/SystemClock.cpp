@@ -30,6 +30,10 @@ std::int64_t seconds(clockid_t clock) {
   return time.tv_sec;
 }
 
+std::chrono::microseconds systemMicroseconds() {
+  return std::chrono::duration_cast<std::chrono::microseconds>(std::chrono::system_clock::now().time_since_epoch());
+}
+
 /// The third line of /etc/adjtime is UTC or LOCAL; UTC without the file.
 bool keepsLocalTime(const SystemRoot& root) {
   constexpr std::size_t limit = 4096;
@@ -44,7 +48,7 @@ DateTime utcDateTime(std::int64_t secondsSince1970) {
   return {parts.tm_year + 1900, parts.tm_mon + 1, parts.tm_mday, parts.tm_hour, parts.tm_min, parts.tm_sec};
 }
 
-rtc_time hardwareTime(const DateTime& time) {
+rtc_time rtcTime(const DateTime& time) {
   rtc_time parts{};
   parts.tm_year = static_cast<int>(time.year) - 1900;
   parts.tm_mon = static_cast<int>(time.month) - 1;
@@ -84,11 +88,45 @@ Result<void> setSystemTime(std::int64_t secondsSince1970) {
   return {};
 }
 
+std::optional<std::int64_t> hardwareTime(const SystemRoot& root) {
+  constexpr std::size_t limit = 64;
+  const auto text = root.read("/sys/class/rtc/rtc0/since_epoch", limit);
+  if (!text) return std::nullopt;
+  const auto seconds = leadingInteger(*text);
+  // The kernel takes what the clock shows for UTC.
+  return keepsLocalTime(root) ? static_cast<std::int64_t>(secondsSince1970(utcDateTime(seconds))) : seconds;
+}
+
+std::chrono::microseconds AskedTime::sinceThen() const {
+  if (!_moment) return {};
+  return std::chrono::duration_cast<std::chrono::microseconds>(std::chrono::steady_clock::now() - *_moment);
+}
+
+std::int64_t AskedTime::microsecondsAhead() const {
+  return (std::chrono::seconds(_seconds) + sinceThen() - systemMicroseconds()).count();
+}
+
+std::int64_t AskedTime::onSystemClock() const {
+  return unlessNear(systemMicroseconds(), std::chrono::seconds(1));
+}
+
+std::optional<std::int64_t> AskedTime::onHardwareClock(const SystemRoot& root) const {
+  const auto shown = hardwareTime(root);
+  if (!shown) return std::nullopt;
+  return unlessNear(std::chrono::seconds(*shown), std::chrono::seconds(2));  // it tells no fractions
+}
+
+std::int64_t AskedTime::unlessNear(std::chrono::microseconds shown, std::chrono::seconds near) const {
+  const auto then = shown - sinceThen();
+  const bool isNear = _moment && std::chrono::abs(then - std::chrono::seconds(_seconds)) <= near;
+  return isNear ? _seconds : std::chrono::floor<std::chrono::seconds>(then).count();
+}
+
 Result<void> setHardwareClock(const SystemRoot& root, std::int64_t secondsSince1970) {
   if (!root.exists(hardwareClock)) return {};
   auto clock = root.open(hardwareClock, O_RDONLY | O_NONBLOCK);
   if (!clock) return clock.failure();
-  auto time = hardwareTime(keepsLocalTime(root) ? localDateTime(secondsSince1970) : utcDateTime(secondsSince1970));
+  auto time = rtcTime(keepsLocalTime(root) ? localDateTime(secondsSince1970) : utcDateTime(secondsSince1970));
   if (::ioctl(clock->number(), RTC_SET_TIME, &time) != 0) return systemFailure("RTC_SET_TIME", hardwareClock, errno);
   return {};
 }
