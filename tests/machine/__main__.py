@@ -14,6 +14,7 @@ import guest
 import machine
 import purge
 import server
+import startup
 import trees
 
 REMOTE = ["avahi-daemon", "iproute2", "openssh-server", "systemd-resolved"]
@@ -22,6 +23,7 @@ KINDS = {
                   lambda: container.Container("ntpsec")],
     "guest": [guest.Guest],
     "server": [server.Server],
+    "startup": [startup.Startup],
 }
 
 

@@ -79,7 +79,7 @@ class Results:
 
 def prove(machine, results):
     """All checks of this machine, what is kept over a restart, and all checks again."""
-    checks = [check for check in every() if check.needs <= machine.has]
+    checks = [check for check in every() if machine.own <= check.needs <= machine.has]
     for check in checks:
         results.add(f"{machine.name}: {check.name}", _do(machine, check) + _see(machine, check))
     machine.restart()
@@ -88,3 +88,4 @@ def prove(machine, results):
             results.add(f"{machine.name}, restarted: {check.name}", _see(machine, check))
     for check in checks:
         results.add(f"{machine.name}, again: {check.name}", _do(machine, check) + _see(machine, check))
+    machine.prove_more(results)

@@ -13,6 +13,7 @@ class Trouble(Exception):
 class Machine(abc.ABC):
     name = ""
     has = frozenset()  # what checks may need
+    own = frozenset()  # the words of which a check has to need all
     cannot = ""        # what cannot be proven on it, for people
 
     @abc.abstractmethod
@@ -30,6 +31,9 @@ class Machine(abc.ABC):
     @abc.abstractmethod
     def stop(self):
         """Also of a machine that did not start."""
+
+    def prove_more(self, results):
+        """What no Check can say."""
 
 
 def wait_until(condition, seconds, what):

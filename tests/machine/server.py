@@ -40,18 +40,23 @@ class Server(emulator.Emulated):
     cannot = "sleep and wake, lose its power"
     reboot = "systemctl reboot"
 
-    def __init__(self):
-        tree = trees.layered("server-tree", trees.SERVER)
-        disk = trees.WORK / "server.img"
-        variables = trees.WORK / "server-variables.fd"
-        super().__init__("server", [
+    def __init__(self, kind="server", packages=(), devices=()):
+        """With devices of its own it has none for power settings."""
+        tree = trees.layered(f"{kind}-tree", [*trees.SERVER, *packages])
+        disk = trees.WORK / f"{kind}.img"
+        variables = trees.WORK / f"{kind}-variables.fd"
+        super().__init__(kind, [
             "-drive", f"if=pflash,format=raw,readonly=on,file={FIRMWARE}",
             "-drive", f"if=pflash,format=raw,file={variables}", "-drive", f"if=virtio,format=raw,file={disk}",
-            *_power_devices()])
-        self._controller = controller.Controller(CONTROLLER)
+            *(devices or _power_devices())])
+        self._controller = None if devices else controller.Controller(CONTROLLER)
         shutil.copy(FIRMWARE_VARIABLES, variables)
         _add_agent(tree)
+        self.equip(tree)
         _make_disk(tree, disk)
+
+    def equip(self, tree):
+        """Puts into the tree what a machine of this kind has besides."""
 
     def run(self, command):
         if command.startswith("controller "):
