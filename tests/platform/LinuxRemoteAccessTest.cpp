@@ -73,6 +73,7 @@ TEST(RemoteLogin, SwitchesServiceAndSocketTogether) {
     std::vector<std::string> off, on;
   };
   const FakeUnit none, enabled{.file = "enabled"}, active{.active = running}, absent{.load = "not-found"};
+  const FakeUnit broken{.load = "bad-setting", .active = running};
   const FakeUnit runtime{.file = "enabled-runtime"}, both{.active = running, .file = "enabled"};
   const std::vector<std::string> enableAndStart = {"EnableUnitFiles ssh.service", "Reload", "StartUnit ssh.service"};
   const std::vector<std::string> disableSocket = {"DisableUnitFiles ssh.socket", "Reload"};
@@ -80,6 +81,7 @@ TEST(RemoteLogin, SwitchesServiceAndSocketTogether) {
       {none, none, false, {}, enableAndStart},
       {none, absent, false, {}, enableAndStart},
       {active, none, true, {"StopUnit ssh.service"}, {"EnableUnitFiles ssh.service", "Reload"}},
+      {broken, absent, true, {"StopUnit ssh.service"}, {"EnableUnitFiles ssh.service", "Reload"}},
       {none, enabled, true, disableSocket, {"StartUnit ssh.socket"}},
       {none, runtime, true, disableSocket, {"StartUnit ssh.socket"}},
       {active,

@@ -102,12 +102,13 @@ Result<BusMessage> UnitDaemons::unitProperty(const Daemon& daemon, const char* n
   return value;
 }
 
+/// A unit whose file can no longer be understood is there: it may run still, and be enabled.
 Result<Daemons::Presence> UnitDaemons::presence(const Daemon& daemon) {
   auto state = unitProperty(daemon, "LoadState", "s");
   if (!state) return state.failure();
   auto word = std::move(state).value().readText();
   if (word == "masked") return Presence::masked;
-  return word == "loaded" ? Presence::installed : Presence::absent;
+  return word == "not-found" ? Presence::absent : Presence::installed;
 }
 
 Result<bool> UnitDaemons::isRunning(const Daemon& daemon) {
