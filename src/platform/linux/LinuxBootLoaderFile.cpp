@@ -12,6 +12,10 @@ std::optional<PropertyList::Dictionary> LinuxBootLoaderFile::read() {
 bool LinuxBootLoaderFile::write(const PropertyList::Dictionary& contents) {
   auto setting = kernelArchitecture(_file, contents);
   setting.note = "stored; no boot loader here reads it";
+  setting.store = [write = setting.store](const std::string& architecture) {
+    const auto failure = whyNeedsRoot("write", path);
+    return failure ? Result<void>(*failure) : write(architecture);
+  };
   const auto effect = carryOut(setting, architectureIn(contents), _machine.effects, _machine.runLoop);
   return effect.outcome != Outcome::failed;
 }
