@@ -99,6 +99,17 @@ TEST(LinuxNames, RefusesWhatItCannotKeepWhole) {
   EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost\n127.0.1.1\tmachine\n");
 }
 
+TEST(LinuxNames, TellWhatCannotBeLookedAt) {
+  LinuxTree tree;
+  EXPECT_FALSE(tree.host().dynamicStore().open("test")->localHostName());
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("/proc/sys/kernel/hostname")));
+  tree.write("/proc/sys/kernel/hostname", "machine\n");
+  std::filesystem::create_directories(tree.at("/etc/hosts"));
+  tree.host().hostConfiguration().setLocalNetworkName("new");
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("/etc/hosts")));
+  EXPECT_FALSE(tree.has("/etc/hostname"));
+}
+
 TEST(LinuxNames, CompletesAChangeThatWasCutOff) {
   NamedTree tree;
   tree.write("/etc/hostname", "new\n");

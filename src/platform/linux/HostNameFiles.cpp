@@ -96,11 +96,12 @@ Result<void> setStaticHostName(const SystemRoot& root, const std::string& name) 
   return root.write(staticNameFile, name + "\n");
 }
 
-std::optional<std::string> kernelHostName(const SystemRoot& root) {
-  // The file's size is 0 to those who ask for it, as that of all files there.
-  const auto lines = split(root.read(kernelNameFile, fileLimit).valueOr(""), "\n");
-  if (lines.empty() || lines.front() == kernelWithoutName) return std::nullopt;
-  return lines.front();
+Result<std::optional<std::string>> kernelHostName(const SystemRoot& root) {
+  const auto text = root.read(kernelNameFile, fileLimit);
+  if (!text) return text.failure();
+  const auto lines = split(*text, "\n");
+  if (lines.empty() || lines.front() == kernelWithoutName) return std::optional<std::string>();
+  return std::optional(lines.front());
 }
 
 Result<void> setKernelHostName(const SystemRoot& root, const std::string& name) {

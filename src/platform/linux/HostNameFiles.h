@@ -23,7 +23,7 @@ Result<void> setPrettyHostName(const SystemRoot& root, const std::string& name);
 Result<void> setStaticHostName(const SystemRoot& root, const std::string& name);
 
 /// What the kernel calls the machine (gethostname(2)), at most 64 bytes; absent when it was never given a name.
-std::optional<std::string> kernelHostName(const SystemRoot& root);
+Result<std::optional<std::string>> kernelHostName(const SystemRoot& root);
 inline constexpr std::size_t longestKernelHostName = 64;
 Result<void> setKernelHostName(const SystemRoot& root, const std::string& name);
 

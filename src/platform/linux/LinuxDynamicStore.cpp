@@ -24,7 +24,8 @@ Result<Value> localNameOf(const LinuxMachine& machine) {
   auto announced = NameAnnouncer(machine.services, machine.runLoop).name();
   if (!announced || *announced) return announced;
   auto name = kernelHostName(machine.root);
-  return name ? Value(firstLabel(*name)) : Value();
+  if (!name || !*name) return name;
+  return Value(firstLabel(**name));
 }
 
 class LinuxSession final : public DynamicStore::Session {

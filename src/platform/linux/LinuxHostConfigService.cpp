@@ -33,6 +33,12 @@ std::optional<Failure> whyNoComputerName(const std::string& name) {
   return std::nullopt;
 }
 
+/// Empty where there is no such file.
+Result<std::string> hostsOf(const SystemRoot& root) {
+  if (!root.exists(hostsFile)) return std::string();
+  return root.read(hostsFile, hostsLimit);
+}
+
 }  // namespace
 
 Result<bool> LinuxHostConfigService::setByService(const char* member, const std::string& name) {
@@ -90,8 +96,9 @@ Result<LinuxHostConfigService::Value> LinuxHostConfigService::liveLocalName() {
   auto announced = _announcer.respondersName();
   if (!announced) return announced;
   auto name = kernelHostName(_machine.root);
-  const auto label = firstLabel(name.value_or(""));
-  return !*announced || compareIgnoringCase(**announced, label) == 0 ? name : *announced;
+  if (!name || !*announced) return name;
+  const auto label = firstLabel(name->value_or(""));
+  return compareIgnoringCase(**announced, label) == 0 ? name : announced;
 }
 
 /// The name is refused here before it reaches a service that would cut it off.
@@ -99,15 +106,16 @@ Result<void> LinuxHostConfigService::storeLocalName(const std::string& name) {
   if (name.empty() || name.size() > longestKernelHostName)
     return Failure{setLocal, staticNameFile, "the kernel holds names of 1 to 64 bytes"};
   const auto before = staticHostName(_machine.root).valueOr(std::nullopt).value_or("");
-  const auto hosts = _machine.root.read(hostsFile, hostsLimit).valueOr("");
-  const auto renamed = hostsWithName(hosts, before, name);
-  if (renamed == hosts) return storeStaticName(name);
+  const auto hosts = hostsOf(_machine.root);
+  if (!hosts) return hosts.failure();
+  const auto renamed = hostsWithName(*hosts, before, name);
+  if (renamed == *hosts) return storeStaticName(name);
   // Before the name itself: when a run ends in between, setting the name again completes the change.
   if (auto failure = whyNeedsRoot(setLocal, hostsFile)) return *failure;
   if (auto written = _machine.root.write(hostsFile, renamed); !written) return written;
   auto stored = storeStaticName(name);
   if (stored) return stored;
-  const auto restored = _machine.root.write(hostsFile, hosts);
+  const auto restored = _machine.root.write(hostsFile, *hosts);
   return restored ? stored : restored;
 }
 
@@ -120,7 +128,7 @@ Result<void> LinuxHostConfigService::storeStaticName(const std::string& name) {
 }
 
 Result<void> LinuxHostConfigService::applyLocalName(const std::string& name) {
-  if (kernelHostName(_machine.root) != name) {
+  if (kernelHostName(_machine.root).valueOr(std::nullopt) != name) {
     if (auto failure = whyNeedsRoot(setLocal, "the kernel")) return *failure;
     if (auto set = setKernelHostName(_machine.root, name); !set) return set;
   }
