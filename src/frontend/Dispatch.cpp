@@ -6,7 +6,6 @@
 
 #include "frontend/HandlerRegistry.h"
 #include "frontend/RemoteServerSettings.h"
-#include "platform/StandardError.h"
 #include "platform/Text.h"
 
 namespace tavisk {
@@ -101,14 +100,7 @@ void RemoteServerSettings::callHandler(const std::string& word, const CommandTab
     _context.output.takePrinted();
     _report->commandBegins(word, arguments, entry.selector);
   }
-  try {
-    const Handler* handler = findHandler(entry.selector);
-    if (!handler) throw NotBuiltYet();
-    std::visit(Call{*_serverCommands, arguments}, *handler);
-  } catch (const NotBuiltYet&) {
-    complain(word + ": not built yet");
-    _serverCommands->setError(true);
-  }
+  std::visit(Call{*_serverCommands, arguments}, handlerNamed(entry.selector));
   if (_report) _report->commandEnds(_serverCommands->error(), _context.output.takePrinted());
 }
 

@@ -3,6 +3,8 @@
 #include "frontend/HandlerRegistry.h"
 
 #include <array>
+#include <stdexcept>
+#include <string>
 
 namespace tavisk {
 
@@ -16,13 +18,13 @@ std::span<const HandlerRows> handlerFamilies() {
   return families;
 }
 
-const Handler* findHandler(std::string_view selector) {
+const Handler& handlerNamed(std::string_view selector) {
   for (const HandlerRows& family : handlerFamilies()) {
     for (const HandlerRow& row : family) {
-      if (row.selector == selector) return &row.handler;
+      if (row.selector == selector) return row.handler;
     }
   }
-  return nullptr;
+  throw std::logic_error("no handler is named " + std::string(selector));
 }
 
 }  // namespace tavisk

@@ -41,7 +41,7 @@ HandlerRows startupDiskHandlers();
 /// All families.
 std::span<const HandlerRows> handlerFamilies();
 
-/// Null when no family has the selector.
-const Handler* findHandler(std::string_view selector);
+/// Throws std::logic_error when no family has the selector: the table and the families are both the program's own.
+const Handler& handlerNamed(std::string_view selector);
 
 }  // namespace tavisk

@@ -2,8 +2,6 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <exception>
-
 #include "platform/AdminAuthenticator.h"
 #include "platform/BootLoaderFile.h"
 #include "platform/ClockService.h"
@@ -30,9 +28,6 @@
 #include "platform/UserDefaults.h"
 
 namespace tavisk {
-
-/// Thrown by the accessor of a service that the host does not have yet: the command says so and fails.
-struct NotBuiltYet : std::exception {};
 
 /// The machine that the tool reads and changes: one service each, made at first use and owned by the host.
 class Host {

@@ -27,8 +27,7 @@ TEST(HandlerRegistry, agreesWithTheCommandTable) {
   for (const auto& [word, entry] : table.entries()) {
     selectors.insert(entry.selector);
     EXPECT_EQ(entry.arguments, entry.selector.ends_with(':') ? 1 : 0) << word;
-    const Handler* handler = findHandler(entry.selector);
-    EXPECT_TRUE(!handler || static_cast<std::int64_t>(handler->index()) == entry.arguments) << word;
+    EXPECT_EQ(static_cast<std::int64_t>(handlerNamed(entry.selector).index()), entry.arguments) << word;
   }
   EXPECT_EQ(selectors.size(), 49U);
   EXPECT_EQ(selectors, expected);
