@@ -1,10 +1,10 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "settings/DnsName.h"
-
 #include <gtest/gtest.h>
 
 #include <string>
+
+#include "settings/DnsName.h"
 
 namespace tavisk {
 
