@@ -59,7 +59,7 @@ class Startup(server.Server):
         console = pathlib.Path(self._folder / "console.log").read_text(errors="replace")
         results.add("startup: firmware started the chosen volume's own file", _wrong_starts(console))
         results.add("startup: a disk plugged in and pulled at the prompt", self._plug_and_pull())
-        results.add("startup: killed at every call", sweep.faults(self))
+        results.add("startup: killed before each call that changes a file", sweep.faults(self))
 
     def _wait_for_volumes(self):
         """The emulated machine finds its disks so slowly that the service manager may have given them up."""

@@ -1,11 +1,11 @@
 # SPDX-FileCopyrightText: 2026 The tavisk developers
 # SPDX-License-Identifier: MIT
-"""Kills a change of the startup disk before each of its calls, from the first that opens a variable for writing."""
+"""Kills a change of the startup disk before each call that changes a file, from the first that opens a variable."""
 
 import re
 
 COMMAND = "tavisk -setstartupdisk Stick"
-CALLS = "openat2,write,fsync,ftruncate,mkdirat,renameat,renameat2,unlinkat,ioctl,close"
+CALLS = "openat2,write,fsync,ftruncate,mkdirat,renameat,renameat2,unlinkat,ioctl"
 WITHOUT_ORDER = "cd /sys/firmware/efi/efivars && sha256sum $(ls | grep -v -e '^BootOrder-' -e '^{entry}-' -e '^MTC-')"
 
 
@@ -14,8 +14,9 @@ def _kill_points(trace):
     counts, points, begun = {}, [], False
     for name, words in re.findall(r"^(?:\d+ +)?(\w+)\((.*)", trace, re.MULTILINE):
         counts[name] = counts.get(name, 0) + 1
-        begun = begun or (name == "openat2" and "efivars" in words and "O_WRONLY" in words)
-        if begun:
+        changes = name != "openat2" or re.search("O_WRONLY|O_RDWR|O_CREAT", words)
+        begun = begun or (name == "openat2" and "efivars" in words and changes)
+        if begun and changes:
             points.append((name, counts[name]))
     return points
 
