@@ -230,8 +230,9 @@ TEST_F(EfiVariablesTest, KnowWhichEntryIsTriedFirst) {
   tree.setEntry(1, {fileNode("a")}, 0);
   tree.setVariable("Boot0002", "no entry");
   tree.setEntry(3, {fileNode("b")});
-  tree.setOrder({9, 1, 2, 3});
-  EXPECT_EQ((**entries.first()).number, 3) << "absent, inactive and malformed ones are passed over";
+  tree.setEntry(4, {fileNode("set-up")}, 0x109);
+  tree.setOrder({9, 1, 2, 4, 3});
+  EXPECT_EQ((**entries.first()).number, 3) << "absent, inactive and malformed ones and set-up are passed over";
   EXPECT_EQ(*entries.onlyNext(), std::nullopt);
   tree.setVariable("BootNext", std::string("\1\0", 2));
   EXPECT_EQ((**entries.onlyNext()).number, 1);

@@ -67,7 +67,7 @@ class TreeController final : public ControllerLink {
       case 0x0601:
         return {0, 0x20, 1, 1, 2, 2, 0x80, maker, 0x01, 0, 0, 0};
       case 0x0001:
-        return {0, static_cast<std::uint8_t>(1U | policy << 5U), 0, 0};
+        return {0, static_cast<std::uint8_t>(1U | unsigned{policy} << 5U), 0, 0};
       case 0x0006:
         if (request.data.at(0) < 3) policy = request.data[0];
         return {0, policies};

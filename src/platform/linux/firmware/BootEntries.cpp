@@ -73,7 +73,7 @@ Result<std::optional<BootEntry>> BootEntries::first() const {
   if (!numbersInOrder) return numbersInOrder.failure();
   for (const auto number : *numbersInOrder) {
     auto entry = read(number);
-    if (!entry || (*entry && (*entry)->option.isActive())) return entry;
+    if (!entry || (*entry && (*entry)->option.isStartedUnasked())) return entry;
   }
   return std::optional<BootEntry>();
 }

@@ -34,7 +34,8 @@ class BootEntries {
   Result<std::vector<BootEntry>> all() const;
   /// The order of the numbers, also of those that have no entry; empty without one.
   Result<std::vector<std::uint16_t>> order() const;
-  /// The entry that firmware tries first at every start: the first of the order that is there and active.
+  /// The entry that firmware tries first at every start: the first of the order that is there, is active
+  /// and is no tool that waits to be chosen.
   Result<std::optional<BootEntry>> first() const;
   /// The entry for the next start alone.
   Result<std::optional<BootEntry>> onlyNext() const;

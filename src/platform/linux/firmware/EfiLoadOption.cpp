@@ -21,7 +21,7 @@ std::optional<std::string> takeText(std::string_view& bytes) {
 }  // namespace
 
 bool EfiLoadOption::startsAs(const EfiLoadOption& other) const {
-  return isActive() == other.isActive() && paths == other.paths && data == other.data;
+  return isStartedUnasked() == other.isStartedUnasked() && paths == other.paths && data == other.data;
 }
 
 std::optional<EfiLoadOption> parseLoadOption(std::string_view bytes) {

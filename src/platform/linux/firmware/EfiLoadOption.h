@@ -19,7 +19,9 @@ struct EfiLoadOption {
   std::string data;         ///< what the started program is handed
 
   static constexpr std::uint32_t active = 1;  ///< without it firmware passes the entry over
-  bool isActive() const { return (attributes & active) != 0; }
+  static constexpr std::uint32_t categories =
+      0x1F00;  ///< 0 is a system to start; others, such as set-up, wait for a key
+  bool isStartedUnasked() const { return (attributes & (active | categories)) == active; }
   /// Whether firmware does the same with both: the description is for people.
   bool startsAs(const EfiLoadOption& other) const;
 };
