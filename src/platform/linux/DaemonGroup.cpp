@@ -65,11 +65,12 @@ Result<void> DaemonGroup::startAll() const {
 }
 
 Result<void> DaemonGroup::stopAll() const {
-  for (auto last = _members.rbegin(); last != _members.rend(); ++last) {
-    auto runs = _daemons.isRunning(*last);
+  const std::vector<Daemon> backwards(_members.rbegin(), _members.rend());
+  for (const auto& member : backwards) {
+    auto runs = _daemons.isRunning(member);
     if (!runs) return runs.failure();
     if (!*runs) continue;
-    if (auto stopped = _daemons.stop(*last); !stopped) return stopped;
+    if (auto stopped = _daemons.stop(member); !stopped) return stopped;
   }
   return {};
 }
