@@ -61,6 +61,7 @@ std::vector<std::string> configurationFiles(const SystemRoot& root, const std::v
     for (const auto& name : root.list(folder).valueOr({}))
       if (name.ends_with(".conf")) byName.emplace(name, folder + name);
   std::vector<std::string> files;
+  files.reserve(byName.size());
   for (auto& [name, path] : byName) files.push_back(path);
   return files;
 }
