@@ -10,7 +10,7 @@ import shutil
 import subprocess
 
 SUITE = "bookworm"
-COMMON = ["dbus", "libblkid1", "libedit2", "libpam-systemd", "libudev1", "login", "polkitd", "procps", "systemd",
+COMMON = ["dbus", "libblkid1", "libedit2", "libpam-systemd", "login", "polkitd", "procps", "systemd",
           "systemd-sysv", "tzdata"]
 SERVER = ["busybox-static", "ethtool", "initramfs-tools", "kmod", "linux-image-amd64", "systemd-boot-efi", "systemd-timesyncd",
           "udev", "zstd"]
