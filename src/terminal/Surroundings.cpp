@@ -22,7 +22,7 @@ bool openMissingDescriptors() {
 }
 
 bool isKept(std::string_view variable) {
-  constexpr std::array kept = {"LANG=", "TERM=", "NO_COLOR=", "XDG_CONFIG_HOME=", "SUDO_UID=", "TAVISK_", "LC_"};
+  constexpr std::array kept = {"LANG=", "TERM=", "NO_COLOR=", "SUDO_UID=", "TAVISK_", "LC_"};
   return std::any_of(kept.begin(), kept.end(), [&](const char* start) { return variable.starts_with(start); });
 }
 

@@ -9,7 +9,7 @@ namespace tavisk {
 ///
 /// Standard descriptors that are closed are opened such that reads find the end and writes fail: no other file can take
 /// their place. Writing to a closed pipe or beyond the size limit becomes an error. Of the environment, only TAVISK_*,
-/// LANG, LC_*, TERM, NO_COLOR, XDG_CONFIG_HOME and SUDO_UID are kept.
+/// LANG, LC_*, TERM, NO_COLOR and SUDO_UID are kept.
 bool prepareProcess();
 
 }  // namespace tavisk
