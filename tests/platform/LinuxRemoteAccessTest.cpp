@@ -147,10 +147,9 @@ TEST(RemoteEvents, SwitchAllUnitsAndAskTheFirst) {
   events.setEnabled(true);
   EXPECT_THAT(tree.lastTold(), HasSubstr(R"("before":"partly on")"));
   events.setEnabled(false);
-  EXPECT_THAT(tree.manager.calls(),
-              ElementsAre("EnableUnitFiles events.socket", "Reload", "StartUnit events.socket",
-                          "DisableUnitFiles events.socket", "Reload", "DisableUnitFiles events.service", "Reload",
-                          "StopUnit events.service", "StopUnit events.socket"));
+  EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles events.socket", "Reload", "StartUnit events.socket",
+                                                "DisableUnitFiles events.socket", "DisableUnitFiles events.service",
+                                                "Reload", "StopUnit events.service", "StopUnit events.socket"));
   tree.manager.set("events.service", {.load = "not-found"});
   events.setEnabled(true);
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("not all of them")));

@@ -45,13 +45,13 @@ Result<std::vector<Daemon>> DaemonGroup::startingAtBoot() const {
 }
 
 Result<void> DaemonGroup::setAllStartAtBoot(bool start) const {
+  std::vector<Daemon> others;
   for (const auto& member : _members) {
     auto starts = _daemons.startsAtBoot(member);
     if (!starts) return starts.failure();
-    if (*starts == start) continue;
-    if (auto set = _daemons.setStartsAtBoot(member, start); !set) return set;
+    if (*starts != start) others.push_back(member);
   }
-  return {};
+  return others.empty() ? Result<void>() : _daemons.setStartAtBoot(others, start);
 }
 
 Result<void> DaemonGroup::startAll() const {

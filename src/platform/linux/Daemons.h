@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <vector>
+
 #include "platform/Result.h"
 
 namespace tavisk {
@@ -24,7 +26,8 @@ class Daemons {
   virtual Result<Presence> presence(const Daemon& daemon) = 0;
   virtual Result<bool> isRunning(const Daemon& daemon) = 0;
   virtual Result<bool> startsAtBoot(const Daemon& daemon) = 0;
-  virtual Result<void> setStartsAtBoot(const Daemon& daemon, bool starts) = 0;
+  /// One after the other; the first failure ends it.
+  virtual Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) = 0;
   /// Success means that the daemon runs: one that was started and ended at once, or never began, is a failure.
   virtual Result<void> start(const Daemon& daemon) = 0;
   virtual Result<void> stop(const Daemon& daemon) = 0;

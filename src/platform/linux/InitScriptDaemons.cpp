@@ -68,7 +68,13 @@ Result<bool> InitScriptDaemons::startsAtBoot(const Daemon& daemon) {
   return hasLink(daemon, "S");
 }
 
-Result<void> InitScriptDaemons::setStartsAtBoot(const Daemon& daemon, bool starts) {
+Result<void> InitScriptDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
+  for (const auto& daemon : daemons)
+    if (auto turned = turnLinks(daemon, start); !turned) return turned;
+  return {};
+}
+
+Result<void> InitScriptDaemons::turnLinks(const Daemon& daemon, bool starts) {
   // "enable" and "disable" turn links round; there must be some.
   if (!hasLink(daemon, "SK"))
     if (auto made = run({linkTool, daemon.script, "defaults"}); !made) return made;

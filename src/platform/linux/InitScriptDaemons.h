@@ -22,7 +22,7 @@ class InitScriptDaemons : public Daemons {
   Result<Presence> presence(const Daemon& daemon) override;
   Result<bool> isRunning(const Daemon& daemon) override;
   Result<bool> startsAtBoot(const Daemon& daemon) override;
-  Result<void> setStartsAtBoot(const Daemon& daemon, bool starts) override;
+  Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) override;
   Result<void> start(const Daemon& daemon) override;
   Result<void> stop(const Daemon& daemon) override;
   Result<void> restart(const Daemon& daemon) override;
@@ -32,6 +32,7 @@ class InitScriptDaemons : public Daemons {
   bool hasProgram(const Daemon& daemon) const;
   std::vector<ProcessId> processes(const Daemon& daemon) const;
   bool hasLink(const Daemon& daemon, const char* kinds) const;
+  Result<void> turnLinks(const Daemon& daemon, bool starts);
   bool awaitBeginning(const Daemon& daemon);
   Result<void> awaitEnd(const Daemon& daemon);
   Result<void> runScript(const Daemon& daemon, const char* action);

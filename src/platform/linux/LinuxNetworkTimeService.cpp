@@ -91,7 +91,7 @@ void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
   };
   setting.store = [this](const std::string& value) {
     return withClient<void>(
-        [&](const TimeDaemon& client) { return daemons().setStartsAtBoot(client.daemon, value == onOff(true)); });
+        [&](const TimeDaemon& client) { return daemons().setStartAtBoot({client.daemon}, value == onOff(true)); });
   };
   change(setting, onOff(launch));
 }

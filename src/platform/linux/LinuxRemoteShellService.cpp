@@ -109,7 +109,7 @@ Result<void> LinuxRemoteShellService::store(bool enabled) {
     const auto starting = server.startingAtBoot();
     if (!starting) return starting.failure();
     if (!starting->empty()) return {};
-    return _machine.services.daemons().setStartsAtBoot(server.members().front(), true);
+    return _machine.services.daemons().setStartAtBoot({server.members().front()}, true);
   });
 }
 

@@ -131,19 +131,37 @@ Result<bool> UnitDaemons::startsAtBoot(const Daemon& daemon) {
   return *state == "enabled" || *state == enabledUntilRestart;
 }
 
-Result<void> UnitDaemons::setStartsAtBoot(const Daemon& daemon, bool starts) {
+/// Reads the unit files once for all of them, also when one could not be changed.
+Result<void> UnitDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
+  Result<void> last;
+  bool isAnyChanged = false;
+  for (const auto& daemon : daemons) {
+    last = changeLinks(daemon, start);
+    if (!last) break;
+    isAnyChanged = true;
+  }
+  if (!isAnyChanged) return last;
+  auto reloaded = reload();
+  return last ? reloaded : last;
+}
+
+Result<void> UnitDaemons::changeLinks(const Daemon& daemon, bool start) {
   const std::vector<std::string> files{daemon.unit};
   constexpr bool replaceLinks = false;
   const auto state = fileState(daemon);
   if (!state) return state.failure();
-  const bool untilRestart = !starts && *state == enabledUntilRestart;
-  auto changed = starts ? order(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
-                        : order(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
+  const bool untilRestart = !start && *state == enabledUntilRestart;
+  auto changed = start ? order(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
+                       : order(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
   if (!changed) return changed.failure();
+  return {};
+}
+
+Result<void> UnitDaemons::reload() {
   auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
   auto reloaded = (*bus)->call(manager(), "Reload", "", Bus::Writer([](BusMessage&) {}), longestReload);
-  if (!reloaded) return about(daemon, reloaded.failure());
+  if (!reloaded) return reloaded.failure();
   return {};
 }
 

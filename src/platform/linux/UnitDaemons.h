@@ -22,7 +22,7 @@ class UnitDaemons : public Daemons {
   Result<Presence> presence(const Daemon& daemon) override;
   Result<bool> isRunning(const Daemon& daemon) override;
   Result<bool> startsAtBoot(const Daemon& daemon) override;
-  Result<void> setStartsAtBoot(const Daemon& daemon, bool starts) override;
+  Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) override;
   Result<void> start(const Daemon& daemon) override;
   Result<void> stop(const Daemon& daemon) override;
   Result<void> restart(const Daemon& daemon) override;
@@ -38,6 +38,9 @@ class UnitDaemons : public Daemons {
   Result<BusMessage> unitProperty(const Daemon& daemon, const char* name, const char* signature);
   /// A word such as "enabled", as systemctl(1) lists them; empty when there is no such unit file.
   Result<std::string> fileState(const Daemon& daemon);
+  /// The manager does not take them up before it reads all of them again.
+  Result<void> changeLinks(const Daemon& daemon, bool start);
+  Result<void> reload();
   /// Runs a job to its end.
   Result<void> runJob(const Daemon& daemon, const char* method);
   Failure whyNotRunning(const Daemon& daemon);
