@@ -29,7 +29,7 @@ BusObject messageBus() {
 Result<Bus*> NameAnnouncer::busOf(const char* service) {
   auto bus = _services.systemBus();
   if (!bus) return nullptr;
-  auto runs = (*bus)->call(messageBus(), "NameHasOwner", "b", service);
+  auto runs = (*bus)->query(messageBus(), "NameHasOwner", "b", service);
   if (!runs) return runs.failure();
   return std::move(runs).value().readBoolean() ? *bus : nullptr;
 }
@@ -38,7 +38,7 @@ Result<std::optional<std::string>> NameAnnouncer::respondersName() {
   auto bus = busOf(responder().service);
   if (!bus) return bus.failure();
   if (*bus == nullptr) return std::optional<std::string>();
-  auto name = (*bus)->call(responder(), "GetHostName", "s");
+  auto name = (*bus)->query(responder(), "GetHostName", "s");
   if (!name) return name.failure();
   return std::optional(std::move(name).value().readText());
 }

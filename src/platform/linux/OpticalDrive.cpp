@@ -22,7 +22,7 @@ unsigned currentProfile(const FileDescriptor& drive) {
   command.buflen = header.size();
   command.data_direction = CGC_DATA_READ;
   command.quiet = 1;
-  command.timeout = 3000;  // hundredths of a second
+  command.timeout = 500;  // hundredths of a second
   if (::ioctl(drive.number(), CDROM_SEND_PACKET, &command) != 0) return 0;
   return static_cast<unsigned>(header[6]) << 8U | header[7];
 }

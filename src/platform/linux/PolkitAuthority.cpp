@@ -62,7 +62,7 @@ Result<Authorization> checkAuthorization(Bus& bus, const char* action) {
 }
 
 Result<void> revokeAuthorization(Bus& bus, const std::string& temporaryId) {
-  auto reply = bus.call(authority(), "RevokeTemporaryAuthorizationById", "", temporaryId);
+  auto reply = bus.query(authority(), "RevokeTemporaryAuthorizationById", "", temporaryId);
   if (!reply) return reply.failure();
   return {};
 }

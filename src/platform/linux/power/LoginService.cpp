@@ -77,7 +77,7 @@ std::optional<Failure> LoginService::whyCannotSleep() {
   if (!_machine.services.hasServiceManager()) return Failure{tried, service, "this machine has no login service"};
   auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
-  auto answer = (*bus)->call(loginManager(), tried, "s");
+  auto answer = (*bus)->query(loginManager(), tried, "s");
   if (!answer) return answer.failure();
   if (std::move(answer).value().readText() != "na") return std::nullopt;
   return Failure{tried, service, "this machine cannot sleep"};
@@ -93,7 +93,7 @@ std::string LoginService::whatBlocksSleep() {
   std::string names;
   auto bus = _machine.services.systemBus();
   if (!bus) return names;
-  auto reply = (*bus)->call(loginManager(), "ListInhibitors", "a(ssssuu)");
+  auto reply = (*bus)->query(loginManager(), "ListInhibitors", "a(ssssuu)");
   if (!reply) return names;
   auto inhibitors = std::move(reply).value();
   if (!inhibitors.enter('a', "(ssssuu)")) return names;
