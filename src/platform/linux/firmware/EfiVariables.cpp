@@ -137,7 +137,8 @@ Result<void> EfiVariables::write(const EfiVariableName& variable, std::string_vi
   return writeFile(path, contents.append(value), !*before);
 }
 
-/// A new file that could not be written is taken away: tools would take it for a variable.
+/// A new file that could not be written is taken away: tools would take it for a variable. The kernel may protect it
+/// from its making.
 Result<void> EfiVariables::writeFile(const std::string& path, std::string_view contents, bool isNew) const {
   const Unprotected meanwhile(_root, path);
   auto file = _root.open(path, O_WRONLY | O_NONBLOCK);
@@ -145,7 +146,10 @@ Result<void> EfiVariables::writeFile(const std::string& path, std::string_view c
   if (!file) return file.failure();
   auto written = writeOnce(*file, contents, path);
   if (written) return cutTo(*file, contents.size(), path);
-  if (isNew) static_cast<void>(_root.remove(path));
+  if (isNew) {
+    const Unprotected removable(_root, path);
+    static_cast<void>(_root.remove(path));
+  }
   return written;
 }
 
