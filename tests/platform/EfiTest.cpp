@@ -111,6 +111,8 @@ TEST(EfiDevicePath, KnowsTheWaysOverANetwork) {
     EXPECT_EQ(network->uri, uri);
   }
   EXPECT_FALSE(networkPathOf(*parseDevicePath(fromHex("030b060052547fff0400"))));
+  const auto remoteDisk = *partitionNode({"1badd00d-01", 1, 63, 0x1000});
+  EXPECT_FALSE(networkPathOf({{3, 11, fromHex("525400123456" + std::string(52, '0') + "01")}, remoteDisk}));
 }
 
 TEST(BootFile, IsAProgramForFirmwareSignedOrNot) {

@@ -175,7 +175,7 @@ std::optional<std::string> fileOf(const EfiDevicePath& path) {
 std::optional<EfiNetworkPath> networkPathOf(const EfiDevicePath& path) {
   constexpr std::size_t ethernetSize = 6;
   const auto* interface = find(path, hardwareAddress);
-  if (interface == nullptr || interface->data.size() < ethernetSize) return std::nullopt;
+  if (interface == nullptr || interface->data.size() < ethernetSize || find(path, hardDrive)) return std::nullopt;
   EfiNetworkPath network{joined(std::string_view(interface->data).substr(0, ethernetSize), ":", twoDigits),
                          serverOf(path), std::nullopt};
   const auto* uri = find(path, uriPath);

@@ -44,7 +44,8 @@ EfiPathNode fileNode(std::string_view path);
 std::optional<EfiPartition> partitionOf(const EfiDevicePath& path);
 std::optional<std::string> fileOf(const EfiDevicePath& path);
 
-/// The way to another machine: by a network interface, whatever the protocol.
+/// The way to another machine: by a network interface, whatever the protocol. A partition that is reached over it, as
+/// by iSCSI, is a disk's.
 struct EfiNetworkPath {
   std::string hardwareAddress;        ///< "52:54:00:12:34:56"
   std::optional<std::string> server;  ///< an address
