@@ -110,9 +110,15 @@ TEST_F(LinuxBootTest, StartsAVolumeThatFirmwareCannotReadFromItsFileBeside) {
   tree.write(std::string(system) + "/boot.efi", firmwareProgram());
   expectRefused("sda2", "", "there is no such file");
   tree.write(file, firmwareProgram());
+  const auto mounts = tree.file("/proc/thread-self/mountinfo");
+  tree.setMounts(std::string(mounts).replace(mounts.find("vfat"), 4, "ext4"));
+  expectRefused("sda2", "", "it holds ext4");
+  tree.setMounts(mounts);
   EXPECT_EQ(set("sda2", ""), 0) << tree.lastTold();
   EXPECT_THAT(tree.lastTold(), HasSubstr("HD(1,GPT,6c8f1b52-0e5a-4e0c-9b66-0123456789ab,0x800,0x800)/File("));
   EXPECT_EQ(preferredDisk(), "sda2") << "the volume it was made for, not the partition that has the file";
+  tree.link("/dev/disk/by-uuid/" + std::string(mainUuid), "../../sdb1");
+  EXPECT_EQ(preferredDisk(), "sda2") << "not a copy of it on another disk";
 }
 
 TEST_F(LinuxBootTest, RefusesWhatFirmwareWouldNotStart) {
@@ -121,6 +127,8 @@ TEST_F(LinuxBootTest, RefusesWhatFirmwareWouldNotStart) {
   tree.write(std::string(system) + "/boot.efi", firmwareProgram());
   expectRefused("sdb1", "", "it is not on sdb1");
   expectRefused("sda2", "", "does not read ext4");
+  tree.write(BootTree::pathOf("SecureBoot"), "odd");
+  expectRefused("sdb1", "/Volumes/Backup", "too short for a variable");
   tree.setVariable("SecureBoot", "\1");
   expectRefused("sdb1", "/Volumes/Backup", "Secure Boot is on");
   tree.write(backupFile, "#!/bin/sh\n");

@@ -12,6 +12,7 @@ namespace {
 constexpr std::size_t attributeLimit = 4096;
 constexpr unsigned usualBlockSize = 512;
 constexpr int deepestMapping = 16;
+constexpr unsigned floppyMajor = 2;
 
 std::string baseName(const std::string& path) {
   return path.substr(path.rfind('/') + 1);
@@ -116,6 +117,10 @@ DiskName BlockDevices::wholeDisk(const DiskName& name) const {
 unsigned BlockDevices::logicalBlockSize(const DiskName& disk) const {
   const auto size = leadingInteger(attribute(pathOf(disk).value_or(""), "queue/logical_block_size"));
   return size > 0 ? static_cast<unsigned>(size) : usualBlockSize;
+}
+
+bool BlockDevices::answersReads(const BlockDevice& device) const {
+  return device.number.major != floppyMajor && attribute(device.path, "dm/suspended") != "1";
 }
 
 bool BlockDevices::isRemovable(const DiskName& disk) const {

@@ -53,6 +53,8 @@ class BlockDevices {
 
   /// Of a whole disk, in bytes; 512 when it is not known.
   unsigned logicalBlockSize(const DiskName& disk) const;
+  /// Whether reading a device comes back soon: a suspended mapping does not, and an empty floppy drive takes seconds.
+  bool answersReads(const BlockDevice& device) const;
   /// Whether a whole disk gives its medium away.
   bool isRemovable(const DiskName& disk) const;
   /// Whether a whole disk is a drive for optical discs.

@@ -7,22 +7,13 @@
 namespace tavisk {
 namespace {
 
-constexpr unsigned floppyMajor = 2;
-
 VolumeFacts volumeFrom(const DeviceProperties& properties) {
   return {properties.find("ID_FS_TYPE"), properties.find("ID_FS_USAGE"), properties.findEncoded("ID_FS_LABEL_ENC"),
           properties.findEncoded("ID_FS_UUID_ENC"), properties.findEncoded("ID_FS_BOOT_SYSTEM_ID")};
 }
 
-/// Whether reading the device comes back soon: a suspended mapping does not, and an empty floppy drive takes seconds.
-bool answersReads(const SystemRoot& root, const BlockDevice& device) {
-  constexpr std::size_t limit = 16;
-  return device.number.major != floppyMajor &&
-         root.read("/sys" + device.path + "/dm/suspended", limit).valueOr("0") != "1\n";
-}
-
 void readDisk(const SystemRoot& root, DiskFacts& facts) {
-  if (!answersReads(root, facts.device)) {
+  if (!BlockDevices(root).answersReads(facts.device)) {
     facts.unread = Failure{"read", facts.device.node, "it would not answer"};
     return;
   }

@@ -140,7 +140,7 @@ Result<EfiLoadOption> LinuxBootSettings::optionFor(const BootChoice& choice) con
   if (!target) return target.failure();
   if (auto refusal = whyRefused(*target)) return *refusal;
   EfiLoadOption option;
-  option.description = "tavisk " + target->label;
+  option.description = "tavisk " + escaped(target->label);
   option.paths = bytesOf({*partitionNode(target->partition), fileNode(target->file)});
   return option;
 }
@@ -148,13 +148,11 @@ Result<EfiLoadOption> LinuxBootSettings::optionFor(const BootChoice& choice) con
 std::optional<Failure> LinuxBootSettings::whyRefused(const BootTarget& target) const {
   const auto file = readBootFile(_machine.root, target.path);
   if (!file) return file.failure();
-  if (file->isSigned || !wantsSignatures()) return std::nullopt;
+  if (file->isSigned) return std::nullopt;
+  const auto secureBoot = _variables.read({"SecureBoot"});
+  if (!secureBoot) return secureBoot.failure();
+  if (!*secureBoot || !(*secureBoot)->starts_with('\1')) return std::nullopt;
   return Failure{"start", target.path, "Secure Boot is on and the file has no signature"};
-}
-
-bool LinuxBootSettings::wantsSignatures() const {
-  const auto state = _variables.read({"SecureBoot"}).valueOr(std::nullopt);
-  return state && state->starts_with('\1');
 }
 
 std::string LinuxBootSettings::noteOnNextStart() const {

@@ -35,7 +35,6 @@ class LinuxBootSettings final : public BootSettings {
   Result<std::optional<DiskName>> preferredVolume() const;
   Result<EfiLoadOption> optionFor(const BootChoice& choice) const;
   std::optional<Failure> whyRefused(const BootTarget& target) const;
-  bool wantsSignatures() const;
   std::string interfaceWith(const std::string& hardwareAddress) const;
   std::string noteOnNextStart() const;
   Result<void> keepOrder(const std::vector<std::uint16_t>& order) const;

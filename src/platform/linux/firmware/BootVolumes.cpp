@@ -15,8 +15,8 @@ constexpr std::string_view ownFolder = R"(\EFI\tavisk\)";
 constexpr std::string_view ownFile = R"(\boot.efi)";
 constexpr std::uint64_t unit = 512;  // of sysfs and of libblkid
 
-bool isReadByFirmware(const VolumeFacts& facts) {
-  return facts.type == "vfat" || facts.type == "msdos";
+bool isReadByFirmware(const std::string& type) {
+  return type == "vfat" || type == "msdos";
 }
 
 std::string withSeparators(std::string path, char from, char to) {
@@ -52,7 +52,8 @@ Result<BootTarget> BootVolumes::targetOf(const DiskName& volume, const std::stri
   if (!device) return unknownDisk(volume);
   const auto facts = probeVolume(_root, device->node);
   if (!facts) return facts.failure();
-  auto target = isReadByFirmware(*facts) ? onVolume(*device, systemFolder) : besideVolume(*device, *facts);
+  auto target =
+      isReadByFirmware(facts->type.value_or("")) ? onVolume(*device, systemFolder) : besideVolume(*device, *facts);
   if (!target) return target;
   auto named = *target;
   named.label = facts->label.value_or(volume.text);
@@ -99,6 +100,8 @@ Result<BootTarget> BootVolumes::onSystemPartition(const DiskName& name, const st
   const auto* mount = mounts->mountOf(device->number);
   if (mount == nullptr || mount->root != "/")
     return Failure{"look for " + file, "the EFI system partition " + name.text, "it is not mounted"};
+  if (!isReadByFirmware(mount->type))
+    return Failure{"look for " + file, "the EFI system partition " + name.text, "it holds " + mount->type};
   const auto path = _root.standardized(mount->point + withSeparators(file, '\\', '/'));
   if (!path || !_root.exists(*path)) return Failure{"look for " + file, name.text, "there is no such file"};
   const auto partition = identityOf(*device);
@@ -136,6 +139,10 @@ Result<std::vector<DiskName>> BootVolumes::systemPartitionsOf(const DiskName& di
   return found;
 }
 
+bool BootVolumes::isDiskImage(const DiskName& disk) const {
+  return _devices.transportOf(disk) == transport::diskImage;
+}
+
 std::optional<DiskName> BootVolumes::partitionOf(const DiskName& disk, int number) const {
   for (const auto& name : _devices.list()) {
     const auto device = _devices.find(name);
@@ -150,7 +157,7 @@ std::vector<DiskName> BootVolumes::partitionsWith(const std::string& uuid) const
   for (const auto& name : _devices.list()) {
     const auto disk = _devices.find(name);
     const bool isSeen = disk && disk->size > 0 && _devices.wholeDisk(name) == name && disk->disk == name;
-    if (!isSeen || _devices.transportOf(name) == transport::diskImage) continue;
+    if (!isSeen || isDiskImage(name) || !_devices.answersReads(*disk)) continue;
     const auto table = probePartitionTable(_root, disk->node);
     if (!table) continue;
     for (const auto& facts : table->partitions) {
@@ -161,12 +168,13 @@ std::vector<DiskName> BootVolumes::partitionsWith(const std::string& uuid) const
   return found;
 }
 
-/// The links of the device database need no rights and no reading of disks.
-std::optional<DiskName> BootVolumes::fileSystemWith(const std::string& uuid) const {
-  if (const auto linked = _devices.withNode("/dev/disk/by-uuid/" + uuid)) return linked->name;
+/// The links of the device database need no rights and no reading of disks, but may lead to a copy on another disk.
+std::optional<DiskName> BootVolumes::fileSystemWith(const std::string& uuid, const DiskName& disk) const {
+  const auto linked = _devices.withNode("/dev/disk/by-uuid/" + uuid);
+  if (linked && _devices.wholeDisk(linked->name) == disk) return linked->name;
   for (const auto& name : _devices.list()) {
     const auto device = _devices.find(name);
-    if (!device || device->size == 0) continue;
+    if (!device || device->size == 0 || _devices.wholeDisk(name) != disk || !_devices.answersReads(*device)) continue;
     const auto facts = probeVolume(_root, device->node);
     if (facts && facts->usage == "filesystem" && compareIgnoringCase(facts->uuid.value_or(""), uuid) == 0) return name;
   }
@@ -174,11 +182,17 @@ std::optional<DiskName> BootVolumes::fileSystemWith(const std::string& uuid) con
 }
 
 Result<DiskName> BootVolumes::volumeOf(const EfiPartition& partition, const std::string& file) const {
-  if (const auto uuid = fileSystemOf(file)) {
-    if (auto volume = fileSystemWith(*uuid)) return *volume;
-    return Failure{"find", file, "its volume is not here"};
-  }
-  if (const auto linked = _devices.withNode("/dev/disk/by-partuuid/" + partition.uuid)) return linked->name;
+  auto started = partitionWith(partition);
+  const auto uuid = fileSystemOf(file);
+  if (!started || !uuid) return started;
+  const auto disk = _devices.wholeDisk(*started);
+  if (auto volume = fileSystemWith(*uuid, disk)) return *volume;
+  return Failure{"find", file, "its volume is not on " + disk.text};
+}
+
+Result<DiskName> BootVolumes::partitionWith(const EfiPartition& partition) const {
+  const auto linked = _devices.withNode("/dev/disk/by-partuuid/" + partition.uuid);
+  if (linked && !isDiskImage(_devices.wholeDisk(linked->name))) return linked->name;
   auto found = partitionsWith(partition.uuid);
   if (found.empty()) return Failure{"find", textOf({*partitionNode(partition)}), "no partition here has this identity"};
   return found.front();

@@ -43,9 +43,11 @@ class BootVolumes {
   Result<BootTarget> onSystemPartition(const DiskName& name, const std::string& file) const;
   Result<EfiPartition> identityOf(const BlockDevice& partition) const;
   Result<std::vector<DiskName>> systemPartitionsOf(const DiskName& disk) const;
+  bool isDiskImage(const DiskName& disk) const;
   std::optional<DiskName> partitionOf(const DiskName& disk, int number) const;
   std::vector<DiskName> partitionsWith(const std::string& uuid) const;
-  std::optional<DiskName> fileSystemWith(const std::string& uuid) const;
+  Result<DiskName> partitionWith(const EfiPartition& partition) const;
+  std::optional<DiskName> fileSystemWith(const std::string& uuid, const DiskName& disk) const;
 
   const SystemRoot& _root;
   BlockDevices _devices;
