@@ -5,6 +5,16 @@
 #include "platform/SettingNames.h"
 
 namespace tavisk {
+namespace {
+
+using Contents = Result<std::optional<PropertyList::Dictionary>>;
+
+Result<std::optional<std::string>> architectureOf(const Contents& read) {
+  if (!read) return read.failure();
+  return std::optional(architectureIn(read->value_or(PropertyList::Dictionary())));
+}
+
+}  // namespace
 
 std::string architectureIn(const PropertyList::Dictionary& contents) {
   const PropertyList* value = contents.find(BootLoaderFile::architectureKey);
@@ -12,15 +22,19 @@ std::string architectureIn(const PropertyList::Dictionary& contents) {
   return architecture ? *architecture : "default";
 }
 
+Setting kernelArchitecture(const Contents& read) {
+  Setting setting;
+  setting.name = setting::kernelArchitecture;
+  setting.where = BootLoaderFile::path;
+  setting.stored = [&read] { return architectureOf(read); };
+  return setting;
+}
+
 Setting kernelArchitecture(const PropertyListFile& file, const PropertyList::Dictionary& contents) {
   Setting setting;
   setting.name = setting::kernelArchitecture;
   setting.where = file.path();
-  setting.stored = [&file]() -> Result<std::optional<std::string>> {
-    const Result<std::optional<PropertyList::Dictionary>> found = file.read();
-    if (!found) return found.failure();
-    return std::optional(architectureIn(found->value_or(PropertyList::Dictionary())));
-  };
+  setting.stored = [&file] { return architectureOf(file.read()); };
   setting.store = [&file, &contents](const std::string&) { return file.write(contents); };
   // Also when nothing changes: whether the file can be written is what is asked for.
   setting.always = true;

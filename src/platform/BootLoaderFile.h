@@ -27,7 +27,9 @@ class BootLoaderFile {
 };
 
 /// The architecture in the file, as the setting by which a host tells the effects; "default" when the key is absent.
-/// A change writes `contents`. Both must outlive the setting.
+/// What is given must outlive the setting. The first is of a file that was `read`; a change of the second writes
+/// `contents`.
+Setting kernelArchitecture(const Result<std::optional<PropertyList::Dictionary>>& read);
 Setting kernelArchitecture(const PropertyListFile& file, const PropertyList::Dictionary& contents);
 /// The value that a change of kernelArchitecture to these contents asks for.
 std::string architectureIn(const PropertyList::Dictionary& contents);

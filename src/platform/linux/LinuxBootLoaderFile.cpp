@@ -5,8 +5,9 @@
 namespace tavisk {
 
 std::optional<PropertyList::Dictionary> LinuxBootLoaderFile::read() {
-  if (!observe(kernelArchitecture(_file, {}), _machine.effects)) return std::nullopt;
-  return _file.read().valueOr(std::nullopt);
+  const auto contents = _file.read();
+  static_cast<void>(observe(kernelArchitecture(contents), _machine.effects));
+  return contents.valueOr(std::nullopt);
 }
 
 bool LinuxBootLoaderFile::write(const PropertyList::Dictionary& contents) {

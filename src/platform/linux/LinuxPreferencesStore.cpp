@@ -19,11 +19,12 @@ constexpr std::chrono::seconds longestLock{3};
 using Value = std::optional<std::string>;
 
 /// A value that is no boolean reads as what it is: "string".
-Value textIn(const std::optional<PropertyList::Dictionary>& preferences, const std::string& key) {
-  const auto* value = preferences ? preferences->find(key) : nullptr;
-  if (value == nullptr) return std::nullopt;
+Result<Value> textIn(const Result<std::optional<PropertyList::Dictionary>>& preferences, const std::string& key) {
+  if (!preferences) return preferences.failure();
+  const auto* value = *preferences ? (*preferences)->find(key) : nullptr;
+  if (value == nullptr) return Value();
   const auto* boolean = value->asBoolean();
-  return boolean == nullptr ? nameOf(value->type()) : onOff(*boolean);
+  return Value(boolean == nullptr ? nameOf(value->type()) : onOff(*boolean));
 }
 
 }  // namespace
@@ -35,18 +36,15 @@ Setting LinuxPreferencesStore::preference(const std::string& key) {
   Setting setting;
   setting.name = setting::keyboardLockPreference;
   setting.where = _file.path();
-  setting.stored = [this, key]() -> Result<Value> {
-    const auto preferences = _file.read();
-    return preferences ? Result<Value>(textIn(*preferences, key)) : preferences.failure();
-  };
+  setting.stored = [this, key] { return textIn(_file.read(), key); };
   return setting;
 }
 
 std::optional<PropertyList> LinuxPreferencesStore::value(const std::string& key) {
-  if (!observe(preference(key), _machine.effects)) return std::nullopt;
-  const auto preferences = _file.read().valueOr(std::nullopt);
-  const auto* value = preferences ? preferences->find(key) : nullptr;
-  return value == nullptr ? std::nullopt : std::optional(*value);
+  const auto preferences = _file.read();
+  auto setting = preference(key);
+  setting.stored = [&] { return textIn(preferences, key); };
+  return observe(setting, _machine.effects) ? std::optional(*(*preferences)->find(key)) : std::nullopt;
 }
 
 void LinuxPreferencesStore::writeOut() {

@@ -5,8 +5,9 @@
 namespace tavisk {
 
 std::optional<PropertyList::Dictionary> ScratchBootLoaderFile::read() {
-  if (!_settings.observe(kernelArchitecture(_file, {}))) return std::nullopt;
-  return _file.read().valueOr(std::nullopt);
+  const auto contents = _file.read();
+  if (!_settings.observe(kernelArchitecture(contents))) return std::nullopt;
+  return contents.valueOr(std::nullopt);
 }
 
 bool ScratchBootLoaderFile::write(const PropertyList::Dictionary& contents) {
