@@ -86,6 +86,19 @@ class DiskEventsContract : public testing::Test {
     const auto why = Machine::run(work);
     if (!why.empty()) GTEST_SKIP() << why;
   }
+  /// A volume that was plugged in and then mounted, both heard by the listener; and where it is mounted.
+  static std::pair<DiskName, std::string> addVolume(Machine& machine, DiskListener& listener) {
+    machine.service().schedule(machine.runLoop());
+    listener.listen();
+    machine.runLoop().runPass();
+    const auto disk = machine.plug("Backup");
+    listener.forget();
+    EXPECT_TRUE(listener.hears("appeared " + disk.text + " Backup"));
+    EXPECT_EQ(machine.service().description(disk)->volumePath, std::nullopt);
+    const auto path = machine.mount(disk);
+    EXPECT_TRUE(listener.hears("changed " + disk.text + " path"));
+    return {disk, path};
+  }
 };
 
 TYPED_TEST_SUITE_P(DiskEventsContract);
@@ -111,16 +124,7 @@ TYPED_TEST_P(DiskEventsContract, tellsWhatHappensToAVolume) {
   this->run([](TypeParam& machine) {
     auto& session = machine.service();
     DiskListener listener(session, machine.runLoop());
-    session.schedule(machine.runLoop());
-    listener.listen();
-    machine.runLoop().runPass();
-
-    const auto disk = machine.plug("Backup");
-    listener.forget();
-    EXPECT_TRUE(listener.hears("appeared " + disk.text + " Backup"));
-    EXPECT_EQ(session.description(disk)->volumePath, std::nullopt);
-    const auto path = machine.mount(disk);
-    EXPECT_TRUE(listener.hears("changed " + disk.text + " path"));
+    const auto [disk, path] = TestFixture::addVolume(machine, listener);
     EXPECT_EQ(session.description(disk)->volumePath, path);
     machine.rename(disk, "Archive");
     EXPECT_TRUE(listener.hears("changed " + disk.text + " name"));
@@ -169,14 +173,7 @@ TYPED_TEST_P(DiskEventsContract, findsTheDiskOfAPath) {
   this->run([](TypeParam& machine) {
     auto& session = machine.service();
     DiskListener listener(session, machine.runLoop());
-    session.schedule(machine.runLoop());
-    listener.listen();
-    machine.runLoop().runPass();
-    const auto disk = machine.plug("Backup");
-    listener.forget();
-    EXPECT_TRUE(listener.hears("appeared " + disk.text + " Backup"));
-    const auto path = machine.mount(disk);
-    EXPECT_TRUE(listener.hears("changed " + disk.text + " path"));
+    const auto [disk, path] = TestFixture::addVolume(machine, listener);
     EXPECT_EQ(session.diskOfPath(path), disk);
     EXPECT_EQ(session.diskOfPath(path + "/./../" + path.substr(path.rfind('/') + 1) + "/"), disk);
     EXPECT_EQ(session.diskOfPath(path + "/none"), std::nullopt);
