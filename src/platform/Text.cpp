@@ -144,6 +144,11 @@ std::int64_t leadingInteger(std::string_view text) {
   return isNegative ? std::numeric_limits<std::int64_t>::min() : std::numeric_limits<std::int64_t>::max();
 }
 
+std::string_view trimmed(std::string_view text) {
+  text.remove_prefix(std::min(text.find_first_not_of(whiteSpace), text.size()));
+  return text.substr(0, text.find_last_not_of(whiteSpace) + 1);
+}
+
 std::vector<std::string> split(std::string_view text, std::string_view separators) {
   std::vector<std::string> pieces;
   while (true) {

@@ -37,6 +37,9 @@ int compareIgnoringCase(std::string_view left, std::string_view right);
 /// limits of 64 bits.
 std::int64_t leadingInteger(std::string_view text);
 
+/// Without the white space at both ends; part of the text that was given.
+std::string_view trimmed(std::string_view text);
+
 /// The pieces between runs of any of the separator characters; no empty pieces.
 std::vector<std::string> split(std::string_view text, std::string_view separators);
 

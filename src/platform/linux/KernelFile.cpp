@@ -12,7 +12,7 @@ Result<std::string> readKernelFile(const SystemRoot& root, const std::string& pa
   constexpr std::size_t limit = 4096;
   auto text = root.read(path, limit);
   if (!text) return text;
-  auto end = text->find_last_not_of(" \t\n");
+  auto end = text->find_last_not_of(std::string_view(" \t\n\0", 4));
   return text->substr(0, end == std::string::npos ? 0 : end + 1);
 }
 

@@ -9,7 +9,7 @@
 
 namespace tavisk {
 
-/// The text of a file of /proc or /sys, without the white space at its end.
+/// The text of a file of /proc or /sys, without the white space and the NUL bytes at its end.
 Result<std::string> readKernelFile(const SystemRoot& root, const std::string& path);
 
 /// Writes into a file of /proc or /sys, or into a device. It has to be there, and is never replaced.

@@ -6,6 +6,7 @@
 
 #include "platform/SettingNames.h"
 #include "platform/Text.h"
+#include "platform/linux/KernelFile.h"
 #include "platform/linux/firmware/BootFile.h"
 
 namespace tavisk {
@@ -13,7 +14,6 @@ namespace {
 
 constexpr const char* deviceTree = "/sys/firmware/devicetree/base";
 constexpr const char* interfaces = "/sys/class/net";
-constexpr std::size_t addressLimit = 4096;
 constexpr int noneKnown = 0;
 constexpr int openFirmware = 1;
 constexpr int bootsEfiFiles = 2;
@@ -108,9 +108,8 @@ BootSettings::NetworkBootPreference LinuxBootSettings::networkBootPreference() {
 
 std::string LinuxBootSettings::interfaceWith(const std::string& hardwareAddress) const {
   for (const auto& name : _machine.root.list(interfaces).valueOr({})) {
-    const auto address =
-        _machine.root.read(std::string(interfaces) + "/" + name + "/address", addressLimit).valueOr("");
-    if (lowerCased(address.substr(0, address.find('\n'))) == hardwareAddress) return name;
+    const auto address = readKernelFile(_machine.root, std::string(interfaces).append("/").append(name) + "/address");
+    if (address && lowerCased(*address) == hardwareAddress) return name;
   }
   return "";
 }

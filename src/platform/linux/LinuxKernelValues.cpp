@@ -3,10 +3,10 @@
 #include "platform/linux/LinuxKernelValues.h"
 
 #include <algorithm>
-#include <array>
 
 #include "platform/Text.h"
 #include "platform/linux/BlockDevices.h"
+#include "platform/linux/KernelFile.h"
 #include "platform/linux/MountTable.h"
 
 namespace tavisk {
@@ -17,16 +17,11 @@ constexpr std::size_t fileLimit = 65536;
 /// What a firmware that started from an iSCSI disk leaves (iBFT).
 constexpr const char* iscsiStart = "/sys/firmware/ibft";
 
-std::string lineOf(std::string text) {
-  text.resize(std::min(text.find_first_of(std::string_view("\0\n", 2)), text.size()));
-  return text;
-}
-
 }  // namespace
 
 std::string LinuxKernelValues::model() {
   for (const char* file : {"/sys/class/dmi/id/product_name", "/sys/firmware/devicetree/base/model"}) {
-    const auto name = lineOf(_root.read(file, fileLimit).valueOr(""));
+    const auto name = readKernelFile(_root, file).valueOr("");
     if (!name.empty()) return name.substr(0, longestModel);
   }
   return "";

@@ -13,13 +13,6 @@ namespace {
 constexpr const char* folders[] = {"/etc/systemd/", "/run/systemd/", "/usr/local/lib/systemd/", "/usr/lib/systemd/"};
 constexpr std::size_t fileLimit = std::size_t{1} << 20U;
 
-std::string_view trimmed(std::string_view text) {
-  constexpr std::string_view space = " \t\r";
-  auto start = text.find_first_not_of(space);
-  if (start == std::string_view::npos) return {};
-  return text.substr(start, text.find_last_not_of(space) + 1 - start);
-}
-
 /// A line that ends in a backslash goes on in the next one, with a space between.
 std::vector<std::string> logicalLines(std::string_view text) {
   std::vector<std::string> lines;

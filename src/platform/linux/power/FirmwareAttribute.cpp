@@ -19,18 +19,13 @@ struct Row {
   std::string off;
 };
 
-std::string trimmed(const std::string& text) {
-  const auto start = text.find_first_not_of(" \t\r");
-  return start == std::string::npos ? "" : text.substr(start, text.find_last_not_of(" \t\r") + 1 - start);
-}
-
 std::vector<Row> knownRows(const SystemRoot& root) {
   constexpr std::size_t limit = 65536;
   std::vector<Row> rows;
   for (const auto& line : split(root.read(firmwareAttributesFile, limit).valueOr(""), "\n")) {
     const auto parts = split(line, "=;");
     if (parts.size() == 3 && !trimmed(line).starts_with('#'))
-      rows.push_back({trimmed(parts[0]), trimmed(parts[1]), trimmed(parts[2])});
+      rows.push_back({std::string(trimmed(parts[0])), std::string(trimmed(parts[1])), std::string(trimmed(parts[2]))});
   }
   rows.insert(rows.end(), {{"AcPwrRcvry", "On", "Off"},
                            {"AfterPowerLoss", "Power On", "Power Off"},
@@ -42,7 +37,7 @@ std::vector<Row> knownRows(const SystemRoot& root) {
 bool takes(const SystemRoot& root, const FirmwareAttribute& attribute) {
   std::vector<std::string> words;
   for (const auto& word : split(readKernelFile(root, attribute.folder + "possible_values").valueOr(""), ";,\n"))
-    words.push_back(trimmed(word));
+    words.emplace_back(trimmed(word));
   const auto has = [&](const std::string& word) { return std::ranges::find(words, word) != words.end(); };
   return has(attribute.on) && has(attribute.off);
 }
