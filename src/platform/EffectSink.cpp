@@ -55,6 +55,14 @@ void EffectSink::recordFailure(const std::string& setting, const Failure& failur
   record(effect);
 }
 
+void EffectSink::recordUnsupported(const std::string& setting, const Failure& reason) {
+  Effect effect;
+  effect.setting = setting;
+  effect.outcome = Outcome::notSupported;
+  effect.failure = reason;
+  record(effect);
+}
+
 void EffectSink::observe(const SettingValue& value) {
   const std::lock_guard lock(_mutex);
   for (EffectChannel* channel : _channels) channel->observe(value);

@@ -34,6 +34,8 @@ class EffectSink {
   /// A failed effect: a read that failed, or a write that has nothing to be read back.
   void recordFailure(const std::string& setting, const Failure& failure,
                      const std::optional<std::string>& asked = std::nullopt);
+  /// That nothing was changed, as the machine cannot have the setting.
+  void recordUnsupported(const std::string& setting, const Failure& reason);
   /// A value that a getter read.
   void observe(const SettingValue& value);
 

@@ -36,6 +36,8 @@ class PowerSwitchesService {
   virtual ~PowerSwitchesService() = default;
 
   virtual bool supports(PowerSwitch which, const PowerSource& source) = 0;
+  /// As supports(), of what is to be changed: the reason against it goes to the effects.
+  virtual bool canSet(PowerSwitch which, const PowerSource& source) = 0;
   /// False when the machine does not support it.
   virtual bool isOn(PowerSwitch which, const PowerSource& source) = 0;
   virtual void setOn(PowerSwitch which, const PowerSource& source, bool on) = 0;

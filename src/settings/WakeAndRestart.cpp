@@ -69,7 +69,7 @@ void ServerCommands::setSourceSwitch(const SourceSwitch& row, const std::string&
   PowerSettingsService& power = _context.host.powerSettings();
   setError(false);
   if (checkForEmptyString(onOff, row.setter, onOrOff, row.usage)) return;
-  if (!power.supports(row.which, {getPMKey()})) {
+  if (!power.canSet(row.which, {getPMKey()})) {
     _context.output.print("%s: Not supported on this machine.\n", row.label);
     setError(true);
     return;
@@ -112,7 +112,7 @@ void ServerCommands::setAllowPowerButtonToSleepComputer(const std::string& onOff
 
 void ServerCommands::allowPowerButton(const std::string& onOff) {
   PowerSettingsService& power = _context.host.powerSettings();
-  if (!power.supports(PowerSwitch::powerButtonSleep, {getPMKey()})) {
+  if (!power.canSet(PowerSwitch::powerButtonSleep, {getPMKey()})) {
     _context.output.putLine(
         "setallowpowerbuttontosleepcomputer: Error, this feature is not supported on this machine.");
     return;

@@ -93,6 +93,13 @@ bool LinuxPowerSettingsService::supports(PowerSwitch which, const PowerSource& /
   return !setting.supported || !setting.supported();
 }
 
+bool LinuxPowerSettingsService::canSet(PowerSwitch which, const PowerSource& /*source*/) {
+  const auto setting = toRead(which);
+  const auto reason = setting.supported ? setting.supported() : std::nullopt;
+  if (reason) _machine.effects.recordUnsupported(setting.name, *reason);
+  return !reason;
+}
+
 bool LinuxPowerSettingsService::isOn(PowerSwitch which, const PowerSource& source) {
   return supports(which, source) && reads(toRead(which), _machine.effects);
 }

@@ -29,6 +29,7 @@ class LinuxPowerSettingsService : public PowerSettingsService {
   Minutes untilSleep(SleepTimer timer, const PowerSource& source) override;
   void setUntilSleep(SleepTimer timer, const PowerSource& source, Minutes minutes) override;
   bool supports(PowerSwitch which, const PowerSource& source) override;
+  bool canSet(PowerSwitch which, const PowerSource& source) override;
   bool isOn(PowerSwitch which, const PowerSource& source) override;
   void setOn(PowerSwitch which, const PowerSource& source, bool on) override;
   bool restartsOnHang() override;

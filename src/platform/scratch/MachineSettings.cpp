@@ -57,6 +57,10 @@ Effect MachineSettings::carryOut(Setting setting, const std::string& asked) {
   return tavisk::carryOut(heedingRefusals(std::move(setting)), asked, _effects, _runLoop);
 }
 
+void MachineSettings::recordUnsupported(const std::string& setting) {
+  _effects.recordUnsupported(setting, {"set", machineName, "it cannot have this setting"});
+}
+
 void MachineSettings::note(const MachineSetting& setting, const std::string& asked) {
   const auto refusal = refusalNamed(setting.name);
   const Result<void> written = refusal ? refusedChange(*refusal) : write(setting, asked);

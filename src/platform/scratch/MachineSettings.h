@@ -49,6 +49,8 @@ class MachineSettings {
   /// Writes also when the machine has the value already.
   Effect change(const MachineSetting& setting, const std::string& asked);
   void turn(const MachineSetting& setting, bool on) { change(setting, on ? "on" : "off"); }
+  /// That a setting was to be changed which the machine cannot have.
+  void recordUnsupported(const std::string& setting);
   /// Writes what is no setting of the machine but the run's own doing: only a failure is an effect, and "*" does not
   /// refuse it.
   void note(const MachineSetting& setting, const std::string& asked);

@@ -83,6 +83,12 @@ bool ScratchPowerSettingsService::supports(PowerSwitch which, const PowerSource&
   return _settings.section(sources).section(source.name).find(keyOf(which)) != nullptr;
 }
 
+bool ScratchPowerSettingsService::canSet(PowerSwitch which, const PowerSource& source) {
+  if (supports(which, source)) return true;
+  _settings.recordUnsupported(nameOf(which));
+  return false;
+}
+
 bool ScratchPowerSettingsService::isOn(PowerSwitch which, const PowerSource& source) {
   return _settings.isOn(settingOf(which, source));
 }

@@ -16,6 +16,7 @@ class ScratchPowerSettingsService final : public PowerSettingsService {
   void setUntilSleep(SleepTimer timer, const PowerSource& source, Minutes minutes) override;
 
   bool supports(PowerSwitch which, const PowerSource& source) override;
+  bool canSet(PowerSwitch which, const PowerSource& source) override;
   bool isOn(PowerSwitch which, const PowerSource& source) override;
   void setOn(PowerSwitch which, const PowerSource& source, bool on) override;
   bool restartsOnHang() override;
