@@ -32,6 +32,11 @@ void FakePowerServices::canSuspend(const std::string& answer) {
   _canSuspend = answer;
 }
 
+void FakePowerServices::maskSleep() {
+  const std::lock_guard lock(_mutex);
+  _sleepTarget = "masked";
+}
+
 std::string FakePowerServices::sleepsAfter() {
   const std::lock_guard lock(_mutex);
   return _sleepsAfter;
@@ -61,6 +66,8 @@ int FakePowerServices::answer(sd_bus_message* call, const std::string& member) {
   if (member == "Get") return answerGet(call);
   if (member == "Set") return answerSet(call);
   if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", _canSuspend.c_str());
+  if (member == "LoadUnit")
+    return sd_bus_reply_method_return(call, "o", "/org/freedesktop/systemd1/unit/suspend_2etarget");
   if (member == "Reload") {
     readManager();
     return sd_bus_reply_method_return(call, "");
@@ -110,6 +117,7 @@ int FakePowerServices::answerGet(sd_bus_message* call) {
   constexpr std::uint64_t microseconds = 60'000'000;
   if (name == "IdleAction") return sd_bus_reply_method_return(call, "v", "s", _idleAction.c_str());
   if (name == "HandlePowerKey") return sd_bus_reply_method_return(call, "v", "s", _powerKey.c_str());
+  if (name == "LoadState") return sd_bus_reply_method_return(call, "v", "s", _sleepTarget.c_str());
   if (name == "IdleActionUSec")
     return sd_bus_reply_method_return(call, "v", "t", std::stoull(_idleMinutes) * microseconds);
   return sd_bus_reply_method_return(call, "v", "t", _watchdogSet != 0 ? _watchdogSet : _watchdogRead);

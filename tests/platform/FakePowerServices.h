@@ -18,6 +18,7 @@ class FakePowerServices {
   explicit FakePowerServices(const std::filesystem::path& tree);
 
   void canSuspend(const std::string& answer);
+  void maskSleep();
   /// After what time the machine would really sleep. The timer is set when the service starts, not later; it is then
   /// "at once" as nobody has been logged in for long, unless somebody holds a lock against idleness.
   std::string sleepsAfter();
@@ -37,6 +38,7 @@ class FakePowerServices {
   std::filesystem::path _tree;
   std::mutex _mutex;
   std::string _canSuspend = "yes";
+  std::string _sleepTarget = "loaded";
   std::string _idleAction = "ignore";
   std::string _idleMinutes = "30";
   std::string _powerKey = "poweroff";

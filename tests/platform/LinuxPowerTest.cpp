@@ -45,9 +45,12 @@ TEST(LinuxPower, ComputerSleepIsInForceAndKept) {
   tree.power().setUntilSleep(SleepTimer::system, mains, {30});
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("70-other.conf")));
 
+  tree.bus.maskSleep();
+  tree.power().setUntilSleep(SleepTimer::system, mains, {40});
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("suspend.target")));
   tree.bus.canSuspend("na");
   tree.power().setUntilSleep(SleepTimer::system, mains, {40});
-  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"not supported")"));
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("cannot sleep")));
   EXPECT_FALSE(tree.power().supports(PowerSwitch::powerButtonSleep, mains));
 }
 

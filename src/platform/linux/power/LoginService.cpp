@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "platform/linux/power/LoginService.h"
 
+#include <algorithm>
 #include <csignal>
 
 #include "platform/SettingNames.h"
@@ -14,6 +15,8 @@ namespace {
 
 constexpr const char* service = "org.freedesktop.login1";
 constexpr Daemon loginDaemon{"systemd-logind.service", "", "systemd-logind"};
+/// What the service starts to let the machine sleep.
+constexpr Daemon sleepTarget{"suspend.target", "", ""};
 constexpr const char* section = "Login";
 constexpr const char* never = "0";
 constexpr std::chrono::milliseconds betweenQuestions{20};
@@ -23,7 +26,8 @@ BusObject loginManager() {
 }
 
 bool isSleep(const std::string& action) {
-  return action == "suspend" || action == "hibernate" || action == "hybrid-sleep" || action == "suspend-then-hibernate";
+  constexpr std::string_view words[] = {"sleep", "suspend", "hibernate", "hybrid-sleep", "suspend-then-hibernate"};
+  return std::ranges::find(words, action) != std::end(words);
 }
 
 bool hasPowerButton(const SystemRoot& root) {
@@ -78,9 +82,13 @@ std::optional<Failure> LoginService::whyCannotSleep() {
   auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
   auto answer = (*bus)->query(loginManager(), tried, "s");
-  if (!answer) return answer.failure();
-  if (std::move(answer).value().readText() != "na") return std::nullopt;
-  return Failure{tried, service, "this machine cannot sleep"};
+  // A service that does not answer is no reason: whatever is done with it then tells why.
+  if (!answer) return isBusError(answer.failure(), serviceUnknown) ? std::optional(answer.failure()) : std::nullopt;
+  if (std::move(answer).value().readText() == "na") return Failure{tried, service, "this machine cannot sleep"};
+  // The service would take the setting and refuse to act by it.
+  const auto presence = _machine.services.daemons().presence(sleepTarget);
+  if (!presence || *presence != Daemons::Presence::masked) return std::nullopt;
+  return Failure{tried, sleepTarget.unit, "it is masked: this machine is kept from sleeping"};
 }
 
 std::optional<Failure> LoginService::whyNoButton() {
