@@ -151,6 +151,8 @@ TEST(LinuxPower, RestartComesFromTheControllerElseTheFirmware) {
   tree.power().setOn(PowerSwitch::autoRestart, mains, true);
   EXPECT_EQ(tree.controllerLink.policy, 1) << "as before, where it cannot always turn on";
 
+  tree.controllerLink.error = EBUSY;
+  EXPECT_TRUE(tree.power().supports(PowerSwitch::autoRestart, mains)) << "it did not say";
   tree.controllerLink.error = ENODEV;
   const std::string attribute = "/sys/class/firmware-attributes/maker/attributes/PowerBack/";
   tree.write(attribute + "current_value", "Last\n");

@@ -17,6 +17,7 @@ namespace {
 
 constexpr const char* device = "/dev/ipmi0";
 constexpr std::chrono::seconds longestAnswer{6};
+constexpr std::chrono::seconds timeWithoutRetry{10};
 constexpr std::chrono::seconds longestLoading{3};
 constexpr std::chrono::milliseconds betweenLooks{50};
 /// Where the firmware or the kernel tells of a controller.
@@ -59,6 +60,7 @@ bool IpmiDevice::hasController() const {
 }
 
 void IpmiDevice::loadDriver() {
+  _hasTriedToLoad = true;
   const auto* program = _machine.root.exists("/usr/sbin/modprobe") ? "/usr/sbin/modprobe" : "/sbin/modprobe";
   if (!runProgram(_machine.root, {program, "-a", "-q", "ipmi_si", "ipmi_devintf"}, _machine.runLoop)) return;
   const auto looks = _machine.runLoop.every(betweenLooks, [] {});
@@ -76,12 +78,13 @@ int IpmiDevice::openDevice() {
 
 int IpmiDevice::open() {
   if (_device) return 0;
-  if (!_machine.root.exists(device) && ::geteuid() == 0 && hasController()) loadDriver();
+  if (!_hasTriedToLoad && !_machine.root.exists(device) && ::geteuid() == 0 && hasController()) loadDriver();
   const int error = openDevice();
   return error == ENOENT ? ENODEV : error;
 }
 
 int IpmiDevice::exchange(const ControllerRequest& request, std::vector<std::uint8_t>& reply) {
+  if (RunLoop::Clock::now() < _silentUntil) return ETIMEDOUT;
   if (const int error = open(); error != 0) return error;
   if (const int error = send(_device, request); error != 0) return error;
   int error = EAGAIN;
@@ -90,6 +93,7 @@ int IpmiDevice::exchange(const ControllerRequest& request, std::vector<std::uint
   if (_machine.runLoop.runUntil(RunLoop::Clock::now() + longestAnswer, hasAnswer)) return error;
   // An answer that still comes must not be taken for the next one.
   _device = FileDescriptor();
+  _silentUntil = RunLoop::Clock::now() + timeWithoutRetry;
   return ETIMEDOUT;
 }
 

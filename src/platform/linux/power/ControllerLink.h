@@ -28,7 +28,7 @@ class ControllerLink {
 };
 
 /// The kernel's driver of the controller (Documentation/driver-api/ipmi.rst). A machine that is known to have a
-/// controller gets its driver loaded.
+/// controller gets its driver loaded. A controller that has not answered in time is not asked again for a while.
 class IpmiDevice final : public ControllerLink {
  public:
   explicit IpmiDevice(const LinuxMachine& machine) : _machine(machine) {}
@@ -42,6 +42,8 @@ class IpmiDevice final : public ControllerLink {
 
   LinuxMachine _machine;
   FileDescriptor _device;
+  bool _hasTriedToLoad = false;
+  RunLoop::Clock::time_point _silentUntil;
 };
 
 }  // namespace tavisk

@@ -13,6 +13,7 @@ namespace {
 constexpr std::uint8_t chassis = 0x00;
 constexpr std::uint8_t getStatus = 0x01;
 constexpr std::uint8_t setPolicy = 0x06;
+constexpr const char* toSetPolicy = "Set Power Restore Policy";
 
 /// IPMI 2.0, table 28-8; as bits 0 to 2 those that a controller knows.
 enum Policy : std::uint8_t { stayOff = 0, asBefore = 1, turnOn = 2, askOnly = 3 };
@@ -21,14 +22,17 @@ constexpr bool knows(unsigned policies, Policy policy) {
   return ((policies >> policy) & 1U) != 0;
 }
 
+/// Whether the controller may still have such policies: whatever is done with it then tells why it did not say.
+bool isUndecided(ControllerStatus status) {
+  return status == EACCES || status == EBUSY || status == ETIMEDOUT;
+}
+
 }  // namespace
 
-Result<unsigned> RestartPolicy::policies() {
-  const auto answer = _controller.ask("Set Power Restore Policy", {chassis, setPolicy, {askOnly}}, 1);
-  if (answer.status != 0) return *answer.failure;
-  const unsigned known = answer.data[0];
-  if (knows(known, turnOn) || knows(known, asBefore)) return known;
-  return Failure{"Set Power Restore Policy", "the management controller", "it has no policy to restart"};
+ControllerAnswer RestartPolicy::policies() {
+  auto answer = _controller.ask(toSetPolicy, {chassis, setPolicy, {askOnly}}, 1);
+  if (answer.status != 0 || knows(answer.data[0], turnOn) || knows(answer.data[0], asBefore)) return answer;
+  return {ENOSYS, {}, Failure{toSetPolicy, "the management controller", "it has no policy to restart"}};
 }
 
 Result<bool> RestartPolicy::controllerRestarts() {
@@ -44,9 +48,9 @@ Result<bool> RestartPolicy::controllerRestarts() {
 
 Result<void> RestartPolicy::setController(bool restarts) {
   const auto known = policies();
-  if (!known) return known.failure();
-  const auto policy = !restarts ? stayOff : knows(*known, turnOn) ? turnOn : asBefore;
-  const auto answer = _controller.ask("Set Power Restore Policy", {chassis, setPolicy, {policy}});
+  if (known.status != 0) return *known.failure;
+  const auto policy = !restarts ? stayOff : knows(known.data[0], turnOn) ? turnOn : asBefore;
+  const auto answer = _controller.ask(toSetPolicy, {chassis, setPolicy, {policy}});
   if (answer.status != 0) return *answer.failure;
   return {};
 }
@@ -73,12 +77,11 @@ Setting RestartPolicy::ofFirmware(const FirmwareAttribute& attribute) {
 
 Setting RestartPolicy::restartAfterPowerFailure() {
   const auto known = policies();
-  const auto attribute = known ? std::nullopt : restartAttribute(_machine.root);
+  const bool mayHave = known.status == 0 || isUndecided(known.status);
+  const auto attribute = mayHave ? std::nullopt : restartAttribute(_machine.root);
   auto setting = attribute ? ofFirmware(*attribute) : ofController();
   setting.name = setting::restartAfterPowerFailure;
-  // A controller that may not be asked is no reason: whatever is done with it then tells why.
-  const bool isHere = known || attribute || _controller.open() == EACCES;
-  if (!isHere) setting.supported = [reason = known.failure()] { return reason; };
+  if (!mayHave && !attribute) setting.supported = [reason = known.failure] { return reason; };
   return setting;
 }
 

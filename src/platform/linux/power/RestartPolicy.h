@@ -20,8 +20,8 @@ class RestartPolicy {
   Setting restartAfterPowerFailure();
 
  private:
-  /// Which policies the controller knows, as bits; a failure when it has none to choose from.
-  Result<unsigned> policies();
+  /// Which policies the controller knows, as bits in one byte; a failure when it has none to choose from.
+  ControllerAnswer policies();
   Result<bool> controllerRestarts();
   Result<void> setController(bool restarts);
   Setting ofController();
