@@ -174,6 +174,15 @@ TEST(LinuxPower, FreezeNeedsWatchdogAndKernel) {
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"applied")"), HasSubstr(R"("live":"on")")));
   EXPECT_THAT(tree.file("/etc/systemd/system.conf.d/60-tavisk.conf"), HasSubstr("[Manager]\nRuntimeWatchdogSec=60\n"));
   EXPECT_THAT(tree.file("/etc/sysctl.d/60-tavisk.conf"), HasSubstr("kernel.panic = 10\n"));
+  tree.write("/sys/class/watchdog/watchdog0/state", "active\n");
+  tree.write("/sys/class/watchdog/watchdog0/nowayout", "1\n");
+  tree.power().setRestartsOnHang(false);
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("nowayout"),
+                                     HasSubstr(R"("live":"on by the watchdog only")"), HasSubstr(R"("stored":"off")")));
+  tree.write("/proc/sys/kernel/panic", "10\n");
+  tree.write("/sys/class/watchdog/watchdog0/state", "inactive\n");
+  tree.power().restartsOnHang();
+  EXPECT_THAT(tree.lastTold(), HasSubstr("on after a kernel panic only")) << "the service manager could not open it";
   tree.bus.startAgain();
   tree.power().setRestartsOnHang(false);
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"applied")"), HasSubstr(R"("live":"off")")));

@@ -13,6 +13,7 @@ namespace {
 
 constexpr const char* section = "Manager";
 constexpr const char* key = "RuntimeWatchdogSec";
+constexpr const char* watchdogFacts = "/sys/class/watchdog/watchdog0/";
 constexpr const char* panicFile = "/proc/sys/kernel/panic";
 constexpr const char* panicDropIn = "/etc/sysctl.d/60-tavisk.conf";
 constexpr std::chrono::seconds watchdogTime{60};
@@ -71,7 +72,12 @@ Result<std::optional<std::string>> FreezeRestart::live() const {
     return std::optional<std::string>(onOff(isOnPanic(*panic)));
   const auto watchdog = isWatchdogUsed();
   if (!watchdog) return watchdog.failure();
-  return std::optional(together(*watchdog, isOnPanic(*panic)));
+  return std::optional(together(*watchdog && watchdogFact("state") != "inactive", isOnPanic(*panic)));
+}
+
+/// Empty when the kernel does not tell.
+std::string FreezeRestart::watchdogFact(const char* name) const {
+  return readKernelFile(_machine.root, std::string(watchdogFacts) + name).valueOr("");
 }
 
 std::string FreezeRestart::storedPanic() const {
@@ -98,8 +104,11 @@ Result<void> FreezeRestart::store(const std::string& value) const {
 }
 
 /// The manager does not take up the file over a value that was set, so it gets both. To set 0 is to go back to the file
-/// as it was when it was read.
+/// as it was when it was read. A watchdog that cannot be stopped would soon reset the machine.
 Result<void> FreezeRestart::setWatchdog(bool on) const {
+  const bool isForGood = watchdogFact("nowayout") == "1" && watchdogFact("state") == "active";
+  if (!on && isForGood && isWatchdogUsed().valueOr(true))
+    return Failure{"turn off", "/dev/watchdog0", "it cannot be stopped before the restart (nowayout)"};
   if (auto set = setWatchdogTime(on ? watchdogTime : std::chrono::seconds(0)); !set || on) return set;
   const auto used = isWatchdogUsed();
   if (!used) return used.failure();

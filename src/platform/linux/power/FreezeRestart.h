@@ -21,7 +21,9 @@ class FreezeRestart {
  private:
   bool hasWatchdog() const;
   Result<std::optional<std::string>> live() const;
+  /// What the service manager means to do; whether the watchdog runs is a fact of its own.
   Result<bool> isWatchdogUsed() const;
+  std::string watchdogFact(const char* name) const;
   std::string stored() const;
   Result<void> store(const std::string& value) const;
   Result<void> apply(const std::string& value) const;
