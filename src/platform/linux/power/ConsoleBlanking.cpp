@@ -70,7 +70,9 @@ Setting ConsoleBlanking::displaySleepChange(const std::string& minutes) const {
   setting.where = startFile;
   if (leadingInteger(minutes) > kernelLimit)
     setting.note = "the kernel blanks its console after 60 minutes at the latest";
-  if (!_machine.services.hasServiceManager()) setting.note = "nothing here reads the file: lasts until the restart";
+  if (!_machine.services.hasServiceManager())
+    setting.note +=
+        std::string(setting.note.empty() ? "" : "; ") + "nothing here reads the file: lasts until the restart";
   setting.supported = [this] { return whyNoConsole(); };
   setting.store = [this](const std::string& asked) { return store(asked); };
   setting.liveFor = [](const std::string& asked) { return minutesAtMost(asked, kernelLimit); };
