@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <cstdio>
 #include <cstdlib>
 #include <memory>
@@ -37,9 +38,11 @@ inline std::string textOf(std::FILE* stream) {
 
 struct RunOptions {
   std::string_view typed = {};  ///< standard input
+  LineSource* input = nullptr;  ///< instead of it
   Report* report = nullptr;     ///< must be a channel of the machine's effects already
   std::string_view commandTable = CommandTable::text();
   std::FILE* output = nullptr;  ///< instead of ToolResult::output
+  std::chrono::milliseconds longestCommand{15000};
 };
 
 struct ToolResult {
@@ -48,14 +51,16 @@ struct ToolResult {
 };
 
 /// One run of the tool on the machine, in this process: all that the program does but for hosts and signals.
-inline ToolResult runTool(ScratchMachine& machine, std::vector<std::string> words, const RunOptions& options = {}) {
+template <typename Machine>
+ToolResult runTool(Machine& machine, std::vector<std::string> words, const RunOptions& options = {}) {
   const Stream printed(std::tmpfile());
   const Stream typed = streamOf(options.typed);
   Output output(options.output ? options.output : printed.get());
-  StreamLineSource input(typed.get(), output);
+  StreamLineSource stream(typed.get(), output);
+  LineSource& input = options.input ? *options.input : stream;
   NotificationCenter notifications;
-  RemoteServerSettings settings({machine.host(), machine.runLoop, notifications, output, input}, machine.effects,
-                                options.report, options.commandTable);
+  RemoteServerSettings settings({machine.host(), machine.runLoop, notifications, output, input, options.longestCommand},
+                                machine.effects, options.report, options.commandTable);
   words.insert(words.begin(), "tavisk");
   std::vector<char*> arguments;
   for (std::string& word : words) arguments.push_back(word.data());

@@ -100,6 +100,7 @@ void RemoteServerSettings::callHandler(const std::string& word, const CommandTab
     _context.output.takePrinted();
     _report->commandBegins(word, arguments, entry.selector);
   }
+  const auto limit = _context.runLoop.limitWaits(_context.longestCommand);
   std::visit(Call{*_serverCommands, arguments}, handlerNamed(entry.selector));
   if (_report) _report->commandEnds(_serverCommands->error(), _context.output.takePrinted());
 }

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <atomic>
+#include <chrono>
 #include <memory>
 #include <optional>
 #include <string>
@@ -31,6 +32,7 @@ struct CommandContext {
   NotificationCenter& notifications;
   Output& output;
   LineSource& input;
+  RunLoop::Clock::duration longestCommand = std::chrono::seconds(15);  ///< with all its waits, questions excepted
 };
 
 /// Every command is a member function of this one object, reached by the name that the command table gives.

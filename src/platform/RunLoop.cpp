@@ -85,6 +85,7 @@ struct RunLoop::State {
   std::map<int, std::vector<std::shared_ptr<Watch>>> watches;
   std::deque<std::shared_ptr<Watch>> ready;
   bool isStopped = false;
+  TimePoint limit = TimePoint::max();
 
   State() {
     for (const Descriptor* own : {&alarm, &wakeUp}) {
@@ -294,22 +295,40 @@ RunLoop::Registration RunLoop::watch(int descriptor, Readiness readiness, Work w
   return {};
 }
 
+RunLoop::Registration RunLoop::limitWaits(Clock::duration together) {
+  const TimePoint before = _state->limit;
+  _state->limit = std::min(before, afterNow(together));
+  return Registration([state = _state, before] { state->limit = before; });
+}
+
+RunLoop::Registration RunLoop::pauseLimit() {
+  if (_state->limit == TimePoint::max()) return {};
+  const Duration left = std::exchange(_state->limit, TimePoint::max()) - Clock::now();
+  return Registration([state = _state, left] { state->limit = Clock::now() + left; });
+}
+
+RunLoop::Clock::duration RunLoop::timeFor(Clock::duration longest) const {
+  return std::clamp(_state->limit - Clock::now(), Duration::zero(), longest);
+}
+
 void RunLoop::runPass() {
   _state->runPass();
 }
 
 void RunLoop::runUntil(Clock::time_point deadline) {
+  const TimePoint end = std::min(deadline, _state->limit);
   runPass();
-  while (Clock::now() < deadline) {
-    _state->wait(deadline);
+  while (Clock::now() < end) {
+    _state->wait(end);
     runPass();
   }
 }
 
 bool RunLoop::runUntil(Clock::time_point deadline, const std::function<bool()>& condition) {
+  const TimePoint end = std::min(deadline, _state->limit);
   while (!condition()) {
-    if (Clock::now() >= deadline) return false;
-    _state->wait(deadline);
+    if (Clock::now() >= end) return false;
+    _state->wait(end);
     runPass();
   }
   return true;

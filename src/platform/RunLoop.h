@@ -21,7 +21,7 @@ class RunLoop {
     priority
   };  ///< EPOLLIN; EPOLLPRI, with which the kernel tells of changed files in /proc and /sys
 
-  /// Keeps a timer or a watched descriptor registered; its end takes it out. An empty one does nothing.
+  /// Keeps a timer, a watched descriptor or a limit in force; its end takes it out. An empty one does nothing.
   class Registration {
    public:
     Registration() = default;
@@ -52,9 +52,17 @@ class RunLoop {
   /// as the registration. A regular file cannot be watched: the registration comes back empty.
   [[nodiscard]] Registration watch(int descriptor, Readiness readiness, Work work);
 
+  /// Until the registration ends, all waits with a deadline have this much time together. A limit within another one
+  /// does not widen it.
+  [[nodiscard]] Registration limitWaits(Clock::duration together);
+  /// Until the registration ends there is no limit, and the time does not count: the user is being asked something.
+  [[nodiscard]] Registration pauseLimit();
+  /// What the limit leaves of the time that a wait may take by itself; 0: it is to fail at once.
+  Clock::duration timeFor(Clock::duration longest) const;
+
   /// One pass; never waits.
   void runPass();
-  /// Passes until the deadline, waiting in between.
+  /// Passes until the deadline (or the end of a limit, here and below), waiting in between.
   void runUntil(Clock::time_point deadline);
   /// Passes until the condition holds (true) or the deadline has passed (false); the condition is asked before each
   /// wait.

@@ -46,7 +46,7 @@ class Change {
     if (!succeeds(_setting.store) || !succeeds(_setting.apply) || !_setting.settled) return;
     const auto isSettled = [this] { return _setting.settled(_asked); };
     if (runLoop.runUntil(RunLoop::Clock::now() + longestSettling, isSettled)) return;
-    fail({"change", _setting.name, "did not settle within 3 s"});
+    fail({"change", _setting.name, "did not settle in time"});
   }
 
   void readBack() {

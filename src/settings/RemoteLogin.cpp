@@ -65,6 +65,7 @@ void ServerCommands::setRemoteLogin(const std::string& onOff) {
 }
 
 bool ServerCommands::promptForRemoteLogin() {
+  const auto pause = _context.runLoop.pauseLimit();
   // The end of the input is no answer: the question goes on until a signal or a lost output ends the run.
   while (true) {
     const std::optional<std::string> line = _context.input.readLine(question, answerBufferSize);

@@ -5,6 +5,7 @@
 #include <systemd/sd-bus.h>
 
 #include <cstdlib>
+#include <thread>
 
 namespace tavisk {
 namespace {
@@ -81,7 +82,11 @@ int FakeServiceManager::answerFault(sd_bus_message* message, Fault fault) {
 int FakeServiceManager::answer(sd_bus_message* message, const std::string& member) {
   if (member == "Get") return answerProperty(message);
   if (member == "GetAll") return answerAllProperties(message);
-  if (member == "LoadUnit") return sd_bus_reply_method_return(message, "o", pathOf(firstText(message)).c_str());
+  if (member == "LoadUnit") {
+    const auto unit = firstText(message);
+    if (const auto known = _units.find(unit); known != _units.end()) std::this_thread::sleep_for(known->second.delay);
+    return sd_bus_reply_method_return(message, "o", pathOf(unit).c_str());
+  }
   if (member == "GetUnitFileState")
     return sd_bus_reply_method_return(message, "s", _units[firstText(message)].file.c_str());
   if (member == "Reload") {

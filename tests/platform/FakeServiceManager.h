@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <filesystem>
 #include <map>
 #include <mutex>
@@ -17,8 +18,9 @@ struct FakeUnit {
   std::string load = "loaded";
   std::string active = "inactive";
   std::string file = "disabled";
-  std::string jobResult = "done";  ///< empty: the job never ends
-  bool conditionHolds = true;      ///< else a job is done and the unit stays as it is
+  std::string jobResult = "done";        ///< empty: the job never ends
+  bool conditionHolds = true;            ///< else a job is done and the unit stays as it is
+  std::chrono::milliseconds delay = {};  ///< of the answer to LoadUnit
 };
 
 /// Serves the interface of the service manager from a thread of its own.

@@ -2,15 +2,19 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
+#include <thread>
+
 #include "FakeServiceManager.h"
 #include "LinuxTree.h"
+#include "ToolRun.h"
 #include "contract/RemoteAccessContract.h"
 #include "platform/linux/ServicesConfig.h"
 
 namespace tavisk {
 namespace {
 
-using testing::AllOf, testing::ElementsAre, testing::HasSubstr, testing::IsEmpty;
+using testing::AllOf, testing::Contains, testing::ElementsAre, testing::HasSubstr, testing::IsEmpty;
+using namespace std::chrono_literals;
 
 constexpr const char* running = "active";
 
@@ -153,6 +157,26 @@ TEST(RemoteEvents, SwitchAllUnitsAndAskTheFirst) {
   tree.manager.set("events.service", {.load = "not-found"});
   events.setEnabled(true);
   EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("not all of them")));
+}
+
+TEST(RemoteAccess, HasOneTimeForAllWaitsOfACommandButForQuestions) {
+  static constexpr auto longestCommand = 400ms;
+  struct SlowUser : LineSource {
+    std::optional<std::string> readLine(const std::string&, std::size_t) override {
+      std::this_thread::sleep_for(longestCommand);
+      return "yes\n";
+    }
+    void restoreTerminal() override {}
+  } user;
+  ManagedTree tree;
+  for (const char* unit : {"events.socket", "events.service"}) tree.manager.set(unit, {.delay = longestCommand / 4});
+  tree.manager.set("ssh.service", {.active = running});
+  const std::vector<std::string> words = {"setremotevelmarevents", "on", "setremotelogin", "off"};
+  const auto result = runTool(tree, words, {.input = &user, .longestCommand = longestCommand});
+  EXPECT_EQ(result.output, "setremotevelmarevents: On\n");
+  EXPECT_THAT(tree.log.lines,
+              Contains(AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("Remote Events"), HasSubstr("timed out"))));
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr("Login"), HasSubstr(R"("outcome":"applied")")));
 }
 
 TEST(RemoteEvents, AreNotSupportedWithoutUnits) {

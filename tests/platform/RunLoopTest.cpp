@@ -213,6 +213,24 @@ TEST_F(RunLoopTest, runsUntilAConditionHolds) {
   EXPECT_FALSE(loop.runUntil(begin - seconds(10), [] { return false; }));
 }
 
+TEST_F(RunLoopTest, givesWaitsWhatTheLimitLeaves) {
+  const std::chrono::hours hour(1);
+  const auto never = [] { return false; };
+  {
+    const auto limit = loop.limitWaits(seconds(60));
+    const auto wider = loop.limitWaits(hour);
+    EXPECT_LE(loop.timeFor(hour), seconds(60));
+    EXPECT_EQ(loop.timeFor(seconds(1)), seconds(1));
+    const auto none = loop.limitWaits(seconds(0));
+    EXPECT_EQ(loop.timeFor(hour), seconds(0));
+    EXPECT_FALSE(loop.runUntil(RunLoop::Clock::now() + hour, never));
+    loop.runUntil(RunLoop::Clock::now() + hour);
+    const auto pause = loop.pauseLimit();
+    EXPECT_EQ(loop.timeFor(hour), hour);
+  }
+  EXPECT_EQ(loop.timeFor(hour), hour);
+}
+
 TEST_F(RunLoopTest, wakesForAPostFromAnotherThread) {
   std::thread other([&] {
     std::this_thread::sleep_for(milliseconds(20));

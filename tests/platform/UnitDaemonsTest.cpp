@@ -57,7 +57,7 @@ TEST(UnitDaemons, RestartsOtherClientsWithoutWaiting) {
 TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
   const std::tuple<FakeUnit, std::optional<Fault>, const char*> cases[] = {
       {{.jobResult = "failed"}, std::nullopt, "its job ended with: failed"},
-      {{.jobResult = ""}, std::nullopt, "its job has not ended within 3 s"},
+      {{.jobResult = ""}, std::nullopt, "its job has not ended in time"},
       {{.conditionHolds = false}, std::nullopt, "the condition ConditionVirtualization=!container does not hold"},
       {{}, Fault::error, "org.freedesktop.DBus.Error.AccessDenied: not today"},
       {{}, Fault::wrongType, "the reply has other types than expected"},

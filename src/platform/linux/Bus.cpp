@@ -52,20 +52,24 @@ bool isBusError(const Failure& failure, std::string_view name) {
   return failure.why.starts_with(name) && std::string_view(failure.why).substr(name.size()).starts_with(':');
 }
 
-Bus::Bus(const SystemdLibrary& library, sd_bus* bus, Kind kind)
-    : _library(library), _bus(bus), _kind(kind), _interactive(::geteuid() != 0 && ::isatty(STDIN_FILENO) == 1) {}
+Bus::Bus(const SystemdLibrary& library, sd_bus* bus, Kind kind, RunLoop* runLoop)
+    : _library(library),
+      _bus(bus),
+      _kind(kind),
+      _runLoop(runLoop),
+      _interactive(::geteuid() != 0 && ::isatty(STDIN_FILENO) == 1) {}
 
 Bus::~Bus() {
   _library.sd_bus_close_unref(_bus);
 }
 
 Result<std::unique_ptr<Bus>> Bus::open(const SystemdLibrary& library, const SystemRoot& root, const std::string& socket,
-                                       Kind kind) {
+                                       Kind kind, RunLoop* runLoop) {
   auto connection = connectLocalSocket(root, socket, SOCK_STREAM | SOCK_NONBLOCK);
   if (!connection) return connection.failure();
   sd_bus* handle = nullptr;
   if (int result = library.sd_bus_new(&handle); result < 0) return systemFailure("sd_bus_new", socket, -result);
-  std::unique_ptr<Bus> bus(new Bus(library, handle, kind));
+  std::unique_ptr<Bus> bus(new Bus(library, handle, kind, runLoop));
   if (int result = bus->start(*connection); result < 0) return systemFailure("start the connection", socket, -result);
   return bus;
 }
@@ -79,9 +83,14 @@ int Bus::start(const FileDescriptor& connection) {
   return awaitReady();
 }
 
+std::chrono::microseconds Bus::timeFor(std::chrono::seconds longest) const {
+  if (_runLoop == nullptr) return longest;
+  return std::chrono::duration_cast<std::chrono::microseconds>(_runLoop->timeFor(longest));
+}
+
 /// The library itself would wait for its peer's greeting far longer than a command may last.
 int Bus::awaitReady() {
-  auto deadline = std::chrono::steady_clock::now() + usualTime;
+  auto deadline = std::chrono::steady_clock::now() + timeFor(usualTime);
   while (_library.sd_bus_is_ready(_bus) == 0) {
     int result = _library.sd_bus_process(_bus, nullptr);
     if (result < 0) return result;
@@ -131,12 +140,15 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
   BusMessage request(_library, handle);
   arguments(request);
   if (request.error() < 0) return systemFailure(member, object.path, -request.error());
+  const auto left = timeFor(longest);
+  if (left.count() == 0) return systemFailure(member, object.path, ETIMEDOUT);
+  const auto question = mayAsk && _runLoop != nullptr ? _runLoop->pauseLimit() : RunLoop::Registration();
   _library.sd_bus_message_set_allow_interactive_authorization(handle, mayAsk ? 1 : 0);
 
   BusError error(_library);
   sd_bus_message* answer = nullptr;
   const auto began = std::chrono::steady_clock::now();
-  result = _library.sd_bus_call(_bus, handle, microseconds(longest), error.handle(), &answer);
+  result = _library.sd_bus_call(_bus, handle, microseconds(mayAsk ? longest : left), error.handle(), &answer);
   // A service that ended during the call has the same error at once.
   const auto now = std::chrono::steady_clock::now();
   if (result == -ETIMEDOUT && now - began >= longest) _silentSince[object.service] = now;

@@ -11,6 +11,7 @@
 
 #include "platform/FileDescriptor.h"
 #include "platform/Result.h"
+#include "platform/RunLoop.h"
 #include "platform/SystemRoot.h"
 #include "platform/linux/BusMessage.h"
 #include "platform/linux/SystemdLibrary.h"
@@ -38,16 +39,18 @@ class Bus {
   static constexpr std::chrono::seconds usualTime{5};
   static constexpr std::chrono::seconds timeWithoutRetry{10};
 
-  /// Connects to a socket beneath the root; no variable of the environment says where. `library` must outlive it.
+  /// Connects to a socket beneath the root; no variable of the environment says where. Calls keep to the limit of the
+  /// loop, which is null for a connection that another thread than the loop's uses. `library` and the loop must outlive
+  /// the connection.
   static Result<std::unique_ptr<Bus>> open(const SystemdLibrary& library, const SystemRoot& root,
-                                           const std::string& socket, Kind kind);
+                                           const std::string& socket, Kind kind, RunLoop* runLoop);
   Bus(const Bus&) = delete;
   Bus& operator=(const Bus&) = delete;
   ~Bus();
 
   bool isOpen() const;
   /// Whether services may ask the user to authenticate while a call waits: the user is not root and sits at a terminal.
-  /// Calls then have all the time they need.
+  /// Calls then have all the time they need, and it does not count against the limit.
   bool isInteractive() const { return _interactive; }
 
   /// By which others on the message bus know this connection.
@@ -63,7 +66,7 @@ class Bus {
                           const Arguments&... arguments) {
     return call(object, member, replySignature, Writer([&](BusMessage& message) { (message.write(arguments), ...); }));
   }
-  /// As call(), of what only reads: the user is not asked, and it takes no longer than usual.
+  /// As call(), of what needs nobody's leave: the user is not asked, and it takes no longer than usual.
   Result<BusMessage> query(const BusObject& object, const char* member, const char* replySignature,
                            const Writer& arguments);
   template <typename... Arguments>
@@ -100,7 +103,8 @@ class Bus {
   void process();
 
  private:
-  Bus(const SystemdLibrary& library, sd_bus* bus, Kind kind);
+  Bus(const SystemdLibrary& library, sd_bus* bus, Kind kind, RunLoop* runLoop);
+  std::chrono::microseconds timeFor(std::chrono::seconds longest) const;
   int start(const FileDescriptor& connection);
   int awaitReady();
   Result<BusMessage> exchange(const BusObject& object, const char* member, const char* replySignature,
@@ -111,6 +115,7 @@ class Bus {
   const SystemdLibrary& _library;
   sd_bus* _bus;
   Kind _kind;
+  RunLoop* _runLoop;
   bool _interactive;
   std::map<std::string, std::chrono::steady_clock::time_point, std::less<>> _silentSince;  ///< by service
 };

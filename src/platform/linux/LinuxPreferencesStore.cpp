@@ -58,7 +58,8 @@ void LinuxPreferencesStore::writeOut() {
 Result<void> LinuxPreferencesStore::store(const std::string& key, bool value) {
   if (auto failure = whyNeedsRoot("write", _file.path())) return *failure;
   if (auto made = _machine.root.makeFolders(folder); !made) return made;
-  const auto held = lockFile(_machine.root, lock, longestLock);
+  const auto patience = std::chrono::duration_cast<std::chrono::milliseconds>(_machine.runLoop.timeFor(longestLock));
+  const auto held = lockFile(_machine.root, lock, patience);
   if (!held) return held.failure();
   auto preferences = _file.read().valueOr(std::nullopt).value_or(PropertyList::Dictionary());
   preferences.set(key, value);

@@ -74,7 +74,7 @@ Result<void> NameAnnouncer::awaitRegistered(Bus& bus, const std::int32_t& state)
     return state > registering || !bus.isOpen();
   };
   if (_runLoop.runUntil(RunLoop::Clock::now() + longestRegistering, isRegistered)) return {};
-  return Failure{"SetHostName", responder().service, "the name is not registered within 3 s"};
+  return Failure{"SetHostName", responder().service, "the name is not registered in time"};
 }
 
 }  // namespace tavisk

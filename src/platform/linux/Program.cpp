@@ -30,20 +30,24 @@ std::string howItEnded(int status) {
   return "it ended with status " + std::to_string(WEXITSTATUS(status));
 }
 
+Failure outOfTime(const std::vector<std::string>& words) {
+  return {"run", words.front(), "it has not ended in time"};
+}
+
 struct EndedProgram {
   int status;  ///< as wait(2) gives it
   std::string printed;
 };
 
 Result<EndedProgram> runToEnd(const SystemRoot& root, const std::vector<std::string>& words, RunLoop& runLoop) {
+  if (runLoop.timeFor(longestRun).count() == 0) return outOfTime(words);
   // A file in memory, not a pipe: a daemon that the program leaves behind may keep it open.
   const FileDescriptor output(::memfd_create("output", MFD_CLOEXEC));
   if (!output) return systemFailure("memfd_create", words.front(), errno);
   auto started = RunningProgram::start(root, words, {output.number()});
   if (!started) return started.failure();
   auto program = std::move(started).value();
-  if (!program.endsBefore(RunLoop::Clock::now() + longestRun, runLoop))
-    return Failure{"run", words.front(), "it has not ended in time"};
+  if (!program.endsBefore(RunLoop::Clock::now() + longestRun, runLoop)) return outOfTime(words);
   ::lseek(output.number(), 0, SEEK_SET);
   return EndedProgram{program.status(), readAll(output, outputLimit, words.front()).valueOr("")};
 }

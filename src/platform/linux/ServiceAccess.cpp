@@ -32,7 +32,7 @@ Result<std::unique_ptr<Bus>> ServiceAccess::open(const Connection& connection) {
   if (!hasServiceManager()) return Failure{"connect", connection.socket, "this machine has no service manager"};
   auto opened = library();
   if (!opened) return opened.failure();
-  return Bus::open(**opened, _root, connection.socket, connection.kind);
+  return Bus::open(**opened, _root, connection.socket, connection.kind, &_runLoop);
 }
 
 Result<Bus*> ServiceAccess::use(Connection& connection) {
@@ -63,7 +63,7 @@ Result<Bus*> ServiceAccess::serviceManager() {
 
 Result<std::unique_ptr<Bus>> ServiceAccess::openSystemBus() const {
   if (!_library) return Failure{"connect", _systemBus.socket, "the bus was not used before"};
-  return Bus::open(*_library, _root, _systemBus.socket, _systemBus.kind);
+  return Bus::open(*_library, _root, _systemBus.socket, _systemBus.kind, nullptr);
 }
 
 Daemons& ServiceAccess::daemons() {

@@ -180,7 +180,7 @@ Result<void> UnitDaemons::runJob(const Daemon& daemon, const char* method) {
     return ended.resultOf(job) != nullptr || !(*bus)->isOpen();
   };
   if (!_runLoop.runUntil(RunLoop::Clock::now() + longestJob, hasEnded))
-    return Failure{method, daemon.unit, "its job has not ended within 3 s"};
+    return Failure{method, daemon.unit, "its job has not ended in time"};
   const auto* result = ended.resultOf(job);
   if (result == nullptr) return Failure{method, daemon.unit, "the connection to the service manager ended"};
   if (*result == "done") return {};

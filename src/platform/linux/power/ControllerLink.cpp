@@ -86,6 +86,7 @@ int IpmiDevice::open() {
 int IpmiDevice::exchange(const ControllerRequest& request, std::vector<std::uint8_t>& reply) {
   if (RunLoop::Clock::now() < _silentUntil) return ETIMEDOUT;
   if (const int error = open(); error != 0) return error;
+  if (_machine.runLoop.timeFor(longestAnswer).count() == 0) return ETIMEDOUT;
   if (const int error = send(_device, request); error != 0) return error;
   int error = EAGAIN;
   const auto watching = _machine.runLoop.watch(_device.number(), RunLoop::Readiness::readable, [] {});
