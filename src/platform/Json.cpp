@@ -75,10 +75,6 @@ JsonObject& JsonObject::boolean(std::string_view name, bool value) {
   return json(name, value ? "true" : "false");
 }
 
-JsonObject& JsonObject::null(std::string_view name) {
-  return json(name, "null");
-}
-
 JsonObject& JsonObject::json(std::string_view name, std::string_view value) {
   this->name(name);
   _members += value;

@@ -14,7 +14,6 @@ class JsonObject {
   JsonObject& text(std::string_view name, std::string_view value);
   JsonObject& integer(std::string_view name, std::int64_t value);
   JsonObject& boolean(std::string_view name, bool value);
-  JsonObject& null(std::string_view name);
   /// A value that is JSON already: an object, an array.
   JsonObject& json(std::string_view name, std::string_view value);
   std::string str() const { return _members + "}"; }
