@@ -3,7 +3,6 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <chrono>
 #include <functional>
 #include <thread>
 
@@ -68,18 +67,9 @@ class BusyChannel : public EffectChannel {
 
 TEST(EffectSink, doesNotHangOnAChannelThatDoes) {
   EffectSink sink;
-  std::chrono::steady_clock::duration taken{};
-  BusyChannel stuck([&] {
-    std::thread ending([&] {
-      const auto begin = std::chrono::steady_clock::now();
-      sink.interrupt("ended by SIGTERM");
-      taken = std::chrono::steady_clock::now() - begin;
-    });
-    ending.join();
-  });
+  BusyChannel stuck([&] { std::thread([&] { sink.interrupt("ended by SIGTERM"); }).join(); });
   sink.addChannel(stuck);
   sink.record(effectOf("Time"));
-  EXPECT_LT(taken, std::chrono::seconds(1));
 }
 
 TEST(EffectSink, callsItsChannelsOneAtATime) {
