@@ -58,14 +58,19 @@ class ScratchMachine:
         replacement.write_bytes(plistlib.dumps(decoded(description), sort_keys=False))
         replacement.rename(self.plist)
 
-    def read(self):
-        return plistlib.loads(self.plist.read_bytes()) if self.plist.exists() else {}
+    def read(self, path=None):
+        """The machine, or a property list among its files; {} when there is none."""
+        place = self.place(path) if path else self.plist
+        return plistlib.loads(place.read_bytes()) if place.exists() else {}
 
     def change(self, changes):
         self.write(merged(self.read(), decoded(changes)))
 
+    def place(self, path):
+        return self.directory / "root" / path.lstrip("/")
+
     def file(self, path, content=b""):
-        place = self.directory / "root" / path.lstrip("/")
+        place = self.place(path)
         place.parent.mkdir(parents=True, exist_ok=True)
         place.write_bytes(content)
 

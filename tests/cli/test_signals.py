@@ -67,14 +67,6 @@ class Ending(unittest.TestCase):
                 self.assertEqual(self.end(process, number), 0)
                 self.assert_given_up_once()
 
-    def test_with_the_status_of_the_last_handler(self):
-        process = self.start([])
-        read_until(process.stdout, b"help.\n> ")
-        process.stdin.write(b"-settime 99\n")
-        process.stdin.flush()
-        read_until(process.stdout, b"hh:mm:ss\n> ")
-        self.assertEqual(self.end(process, signal.SIGTERM), 1)
-
     def test_while_the_output_is_stuck_in_a_full_pipe(self):
         process = self.start(["-listtimezones"] * 40)
         time.sleep(0.3)  # until the pipe is full: there is no event for it

@@ -56,27 +56,15 @@ class AtThePrompt(unittest.TestCase):
         self.assertEqual(self.listed(), ["Main"])
         self.assertEqual(self.listed(), ["Main", "Backup"])
 
-    def test_empty_lines_count(self):
-        self.machine.change({"Disks": {"disk1s1": self.volume("Backup")}})
-        self.type("")
-        self.type("")
-        self.assertEqual(self.listed(), ["Main", "Backup"])
-
-    def test_a_pulled_volume_is_gone(self):
-        self.machine.change({"Disks": {"disk0s1": None}})
-        self.type("")
-        self.type("")
-        self.assertEqual(self.listed(), [])
-
-    def test_a_change_of_size_drops_the_systems_and_a_new_mount_point_brings_them_back(self):
-        self.machine.change({"Disks": {"disk0s1": {"Size": 5}}})
-        self.type("")
-        self.type("")
-        self.assertEqual(self.listed(), [])
-        self.machine.change({"Disks": {"disk0s1": {"Mount Point": "/Volumes/Backup"}}})
-        self.type("")
-        self.type("")
-        self.assertEqual(self.listed(), ["Backup"])
+    def test_two_empty_lines_show_what_came_changed_and_went(self):
+        for changes, left in (({"disk1s1": self.volume("Backup")}, ["Main", "Backup"]),
+                              ({"disk0s1": {"Kind": "hfs"}}, ["Main", "Backup"]),
+                              ({"disk0s1": {"Size": 5}}, ["Backup"]),
+                              ({"disk0s1": {"Mount Point": "/Volumes/Backup"}, "disk1s1": None}, ["Backup"])):
+            self.machine.change({"Disks": changes})
+            self.type("")
+            self.type("")
+            self.assertEqual(self.listed(), left)
 
     def test_a_machine_that_cannot_be_read_changes_nothing_and_is_told(self):
         self.machine.plist.write_bytes(b"<plist><dict><key>Disks</key><dict>")

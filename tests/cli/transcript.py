@@ -16,6 +16,7 @@ usage: transcript.py PROGRAM TRANSCRIPT
     !status 1                          0 when not given
     !machine {"Clock": {"Time": 5}}    what has changed in the machine, and nothing else; null: what is gone. The
                                        authorization is looked at where it is named
+    !plist /etc/a.plist {"Key": 5}     a property list among the machine's files; {}: there is none
     !effects [["Time", "applied"]]     every effect, in order
     !log a line of system.log          every line, in order
 
@@ -49,6 +50,7 @@ class Case:
         self.errors = []
         self.status = 0
         self.changes = {}
+        self.plists = []
         self.effects = None
         self.log = []
 
@@ -86,6 +88,9 @@ class Case:
             self.log.append(value)
         elif what == "status":
             self.status = int(value)
+        elif what == "plist":
+            path, _, content = value.partition(" ")
+            self.plists.append((path, decoded(json.loads(content))))
         else:
             setattr(self, {"machine": "changes", "effects": "effects"}[what], json.loads(value))
 
@@ -102,7 +107,7 @@ class Case:
             for path, content in self.files:
                 machine.file(path, content)
             for path, target in self.links:
-                (machine.directory / "root" / path.lstrip("/")).symlink_to(target)
+                machine.place(path).symlink_to(target)
             output, errors, status = machine.run(self.words, self.typed, self.environment)
             errors = errors.decode(errors="replace").replace(str(machine.directory), "DIR").splitlines()
             yield from compared("output", self.output, output)
@@ -110,6 +115,8 @@ class Case:
             yield from compared("status", self.status, status)
             yield from compared("system.log", self.log, machine.lines("system.log"))
             yield from compared("machine", *self.machines(machine.read()))
+            for path, content in self.plists:
+                yield from compared(path, content, machine.read(path))
             if self.effects is not None:
                 found = [[effect["setting"], effect["outcome"]] for effect in machine.effects()]
                 yield from compared("effects", self.effects, found)
