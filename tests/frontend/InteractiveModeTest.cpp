@@ -26,19 +26,6 @@ TEST(InteractiveMode, takesLongLinesInPieces) {
   EXPECT_EQ(answersTo(line("      -getdateXgettime")), banner + "Date: 3/7/2007\n> Time: 21:05:03\n> " + endOfInput);
 }
 
-TEST(InteractiveMode, passesTheRunLoopOnceAfterEachLine) {
-  ScratchMachine machine;
-  int passes = 0;
-  std::function<void()> countPass = [&] {
-    ++passes;
-    machine.runLoop.post(countPass);
-  };
-  machine.runLoop.post(countPass);
-  runTool(machine, {}, {.typed = "\n-gettimezone\n \nquit\n"});
-  // The first one is the pass in which the run itself sits.
-  EXPECT_EQ(passes, 1 + 3);
-}
-
 }  // namespace
 
 }  // namespace tavisk

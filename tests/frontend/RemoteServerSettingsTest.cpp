@@ -3,8 +3,6 @@
 #include <gtest/gtest.h>
 
 #include "ToolRun.h"
-#include "frontend/RemotePrefsExtra.h"
-#include "frontend/RemoteServerSettings.h"
 
 namespace tavisk {
 
@@ -26,32 +24,6 @@ TEST(RemoteServerSettings, needsItsCommandTable) {
     EXPECT_EQ(result.output, output);
     EXPECT_EQ(result.status, 0);
   }
-}
-
-TEST(RemoteServerSettings, endsOnceWhenASignalComes) {
-  ScratchMachine machine;
-  const Stream printed(std::tmpfile());
-  const Stream nothing = streamOf("");
-  Output output(printed.get());
-  StreamLineSource input(nothing.get(), output);
-  NotificationCenter notifications;
-  RemoteServerSettings settings({machine.host(), machine.runLoop, notifications, output, input}, machine.effects,
-                                nullptr);
-  std::string words[] = {"tavisk", "-gettimezone"};
-  char* arguments[] = {words[0].data(), words[1].data()};
-  ASSERT_TRUE(settings.runTool(2, arguments));
-  settings.endedBySignal("SIGTERM");
-  EXPECT_EQ(machine.get("Authorization", "Authenticated"), PropertyList(false));
-  machine.runLoop.run();
-  EXPECT_EQ(textOf(printed.get()), "");
-  EXPECT_EQ(machine.get("Authorization", "Deauthentications"), PropertyList(1));
-}
-
-TEST(RemotePrefsExtra, comparesWordsWithoutRegardToCase) {
-  EXPECT_TRUE(caseInsensitiveEqualTo("ON", "On"));
-  EXPECT_FALSE(caseInsensitiveEqualTo("", ""));
-  EXPECT_FALSE(caseInsensitiveEqualTo("Once", "On"));
-  EXPECT_FALSE(caseInsensitiveEqualTo("O", "On"));
 }
 
 }  // namespace
