@@ -3,7 +3,6 @@
 #include "LinuxContractMachines.h"
 #include "contract/AdminAuthenticatorContract.h"
 #include "contract/BootLoaderFileContract.h"
-#include "contract/FileSystemContract.h"
 
 namespace tavisk {
 namespace {
@@ -24,13 +23,6 @@ struct LinuxAuthenticator {
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, AdminAuthenticatorContract, LinuxAuthenticator);
 
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, ClockContract, ClockOf<LinuxTree>);
-
-struct LinuxFiles {
-  FileSystem& service() { return tree.host().files(); }
-  std::filesystem::path root() { return tree.at("/"); }
-  LinuxTree tree;
-};
-INSTANTIATE_TYPED_TEST_SUITE_P(Linux, FileSystemContract, LinuxFiles);
 
 struct LinuxBootLoader {
   BootLoaderFile& service() { return tree.host().bootLoaderFile(); }

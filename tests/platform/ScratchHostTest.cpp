@@ -5,36 +5,16 @@
 #include "contract/BootLoaderFileContract.h"
 #include "contract/ClockContract.h"
 #include "contract/DiskEventsContract.h"
-#include "contract/FileSystemContract.h"
 #include "contract/HostNamesContract.h"
 #include "contract/NetworkTimeContract.h"
 #include "contract/PowerSettingsContract.h"
 #include "contract/PreferencesContract.h"
 #include "contract/RemoteAccessContract.h"
-#include "contract/UserDatabaseContract.h"
 
 namespace tavisk {
 namespace {
 
 using testing::ElementsAre;
-
-PropertyList::Array integers(const std::vector<GroupId>& numbers) {
-  PropertyList::Array list;
-  for (auto number : numbers) list.emplace_back(std::int64_t{number});
-  return list;
-}
-
-struct ScratchUsers {
-  static constexpr bool choosesUser = true;
-  UserDatabase& service() { return machine.host().users(); }
-  void haveUser(UserId id, const std::vector<GroupId>& groups) {
-    machine.set("User", "ID", std::int64_t{id});
-    machine.set("User", "Groups", integers(groups));
-  }
-  void haveGroup(const std::string& name, GroupId id) { machine.set("Group Database", name, std::int64_t{id}); }
-  ScratchMachine machine;
-};
-INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, UserDatabaseContract, ScratchUsers);
 
 struct ScratchAuthenticator {
   AdminAuthenticator& service() { return machine.host().authenticator(); }
@@ -104,17 +84,6 @@ struct ScratchNetworkTime {
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, NetworkTimeContract, ScratchNetworkTime);
 
-struct ScratchFiles {
-  FileSystem& service() { return machine.host().files(); }
-  std::filesystem::path root() {
-    auto folder = std::filesystem::path(machine.directory()) / "root";
-    std::filesystem::create_directory(folder);
-    return folder;
-  }
-  ScratchMachine machine;
-};
-INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, FileSystemContract, ScratchFiles);
-
 struct ScratchRemoteShell {
   RemoteShellService& service() { return machine.host().remoteShell(); }
   ScratchMachine machine;
@@ -164,49 +133,6 @@ struct ScratchBootLoader {
   ScratchMachine machine;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, BootLoaderFileContract, ScratchBootLoader);
-
-TEST(ScratchHost, hasEveryDefaultWithoutAMachineFile) {
-  ScratchMachine machine;
-  auto& host = machine.host();
-  EXPECT_EQ(host.users().realUserId(), 0U);
-  EXPECT_TRUE(host.users().supplementaryGroups(16)->empty());
-  EXPECT_EQ(host.users().groupNamed("admin"), 80U);
-  EXPECT_GT(host.clock().knownTimeZones().size(), 100U);
-  EXPECT_FALSE(host.files().exists("/"));
-  EXPECT_FALSE(std::filesystem::exists(machine.directory() + "/machine.plist"));
-}
-
-TEST(ScratchHost, takesNoNumberThatIsNoIdForTheSuperUser) {
-  ScratchMachine machine;
-  for (std::int64_t number : {std::int64_t{1} << 32, std::int64_t{-1} << 32, std::int64_t{-1}}) {
-    machine.set("User", "ID", number);
-    EXPECT_NE(machine.host().users().realUserId(), 0U) << number;
-  }
-}
-
-TEST(ScratchHost, standsStillAtTheTimeOfTheFile) {
-  ScratchMachine machine;
-  machine.set("Clock", "Time", -1);
-  auto& clock = machine.host().clock();
-  EXPECT_EQ(clock.now(), -1);
-  clock.setTime(253'402'300'799);
-  EXPECT_EQ(machine.get("Clock", "Time"), PropertyList(std::int64_t{253'402'300'799}));
-  EXPECT_EQ(machine.get("Clock", "Offset"), std::nullopt);
-}
-
-TEST(ScratchHost, countsEveryOperation) {
-  ScratchMachine machine;
-  auto& host = machine.host();
-  for (int times = 0; times < 2; ++times) {
-    host.authenticator().deauthenticate();
-    host.networkTime().restartAsynchronously();
-    host.networkTime().stop();
-  }
-  EXPECT_EQ(machine.get("Authorization", "Deauthentications"), PropertyList(2));
-  EXPECT_EQ(machine.get("Network Time", "Restarts"), PropertyList(2));
-  EXPECT_EQ(machine.get("Network Time", "Running"), PropertyList(false));
-  EXPECT_EQ(machine.effectsLog().size(), 4U);
-}
 
 TEST(ScratchHost, writesOneLineAMessage) {
   ScratchMachine machine;

@@ -2,17 +2,12 @@
 // SPDX-License-Identifier: MIT
 #include <fcntl.h>
 #include <gmock/gmock.h>
-#include <linux/filter.h>
-#include <linux/seccomp.h>
 #include <sys/file.h>
-#include <sys/prctl.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
-#include <sys/sysmacros.h>
 #include <unistd.h>
 
 #include <atomic>
-#include <cstddef>
 
 #include "OwnMounts.h"
 #include "ScratchMachine.h"
@@ -100,11 +95,6 @@ TEST_F(SystemRootTest, leavesAloneWhatIsNoFile) {
   EXPECT_EQ(root.list("/").valueOr({}), (std::vector<std::string>{"fifo", "file", "folder"}));
 }
 
-TEST_F(SystemRootTest, opensNoDevice) {
-  if (::mknod(at("/zero").c_str(), S_IFCHR | 0600, makedev(1, 5)) != 0) GTEST_SKIP() << "may not make devices";
-  EXPECT_EQ(root.read("/zero", 10).failure().why, "not a regular file");
-}
-
 TEST_F(SystemRootTest, putsALinkWhereALinkOrAFileWas) {
   for (const char* target : {"../usr/share/zoneinfo/UTC", "../usr/share/zoneinfo/Europe/Paris"}) {
     EXPECT_TRUE(root.writeLink("/etc/localtime", target));
@@ -184,24 +174,6 @@ TEST_F(SystemRootTest, isNotFooledByAFolderThatTurnsIntoALink) {
   exchanger.join();
   EXPECT_GT(inside, 0);
   EXPECT_GT(exchanges, 100);
-}
-
-TEST_F(SystemRootTest, saysSoWhenTheKernelIsTooOld) {
-  folder.write("/file", "x");
-  std::string why;
-  std::thread([&] {
-    sock_filter filter[] = {
-        BPF_STMT(BPF_LD | BPF_W | BPF_ABS, offsetof(seccomp_data, nr)),
-        BPF_JUMP(BPF_JMP | BPF_JEQ | BPF_K, SYS_openat2, 0, 1),
-        BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ERRNO | ENOSYS),
-        BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ALLOW),
-    };
-    sock_fprog program{4, filter};
-    ASSERT_EQ(::prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0), 0);
-    ASSERT_EQ(::prctl(PR_SET_SECCOMP, SECCOMP_MODE_FILTER, &program), 0);
-    why = root.read("/file", 10).failure().why;
-  }).join();
-  EXPECT_EQ(why, "this kernel has no such call (Linux 5.6 or later is needed)");
 }
 
 }  // namespace
