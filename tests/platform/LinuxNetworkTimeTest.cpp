@@ -25,15 +25,7 @@ start) mkdir -p "$root/proc/77"; echo "77 (chronyd) S 1" > "$root/proc/77/stat";
 stop) rm -rf "$root/proc/77" ;;
 esac
 )sh");
-    writeProgram("/usr/sbin/update-rc.d", R"sh(#!/bin/sh
-root=${0%/usr/sbin/update-rc.d}
-mkdir -p "$root/etc/rc2.d"
-rm -f "$root/etc/rc2.d/"*"$1"
-case $2 in
-enable) touch "$root/etc/rc2.d/S01$1" ;;
-*) touch "$root/etc/rc2.d/K01$1" ;;
-esac
-)sh");
+    haveRunLevels();
     writeProgram("/usr/sbin/chronyd", "");
     write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\n");
     writeProgram("/usr/bin/chronyc", R"sh(#!/bin/sh

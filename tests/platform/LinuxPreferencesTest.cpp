@@ -4,7 +4,6 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <cerrno>
 #include <csignal>
 
 #include "LinuxTree.h"
@@ -17,11 +16,6 @@ namespace {
 using testing::AllOf, testing::HasSubstr;
 
 constexpr const char* preferencesFile = "/etc/tavisk/preferences/AnyApplication.plist";
-
-struct NoController final : ControllerLink {
-  int open() override { return ENODEV; }
-  int exchange(const ControllerRequest&, std::vector<std::uint8_t>&) override { return ENODEV; }
-};
 
 struct LinuxPreferences {
   PreferencesStore& preferences() { return tree.host().preferences(); }
@@ -71,13 +65,7 @@ std::string told(ProcessId process, int signal) {
   EffectLog log;
   effects.addChannel(log);
   RunLoop runLoop;
-  const SystemRoot root("/");
-  ServiceAccess services(root, runLoop);
-  const LinuxMachine machine{root, effects, runLoop, services};
-  LinuxPreferencesStore preferences(machine);
-  NoController link;
-  ManagementController controller(link);
-  LinuxProcessUtilities(machine, preferences, controller).sendSignal(signal, process);
+  LinuxHost(effects, runLoop).processes().sendSignal(signal, process);
   return log.lines.back();
 }
 

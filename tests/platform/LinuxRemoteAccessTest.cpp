@@ -37,12 +37,7 @@ start)
 stop) rm -rf "$root/proc/77" "$root/run/sshd.pid" ;;
 esac
 )sh");
-    writeProgram("/usr/sbin/update-rc.d", R"sh(#!/bin/sh
-root=${0%/usr/sbin/update-rc.d}
-mkdir -p "$root/etc/rc2.d"
-rm -f "$root/etc/rc2.d/"*"$1"
-[ "$2" = enable ] && touch "$root/etc/rc2.d/S01$1" || touch "$root/etc/rc2.d/K01$1"
-)sh");
+    haveRunLevels();
   }
 };
 

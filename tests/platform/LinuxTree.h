@@ -27,6 +27,15 @@ class LinuxTree {
     std::filesystem::remove(at(path));
     std::filesystem::create_symlink(target, at(path));
   }
+  /// Has a program that switches init scripts as /etc/rc2.d then shows.
+  void haveRunLevels() {
+    writeProgram("/usr/sbin/update-rc.d", R"sh(#!/bin/sh
+root=${0%/usr/sbin/update-rc.d}
+mkdir -p "$root/etc/rc2.d"
+rm -f "$root/etc/rc2.d/"*"$1"
+[ "$2" = enable ] && touch "$root/etc/rc2.d/S01$1" || touch "$root/etc/rc2.d/K01$1"
+)sh");
+  }
   std::filesystem::path at(const std::string& path) const {
     return _folder.path() / std::filesystem::path(path).relative_path();
   }

@@ -33,16 +33,6 @@ TEST_F(NotificationCenterTest, tellsThoseWhoWantToKnowInOrder) {
   EXPECT_THAT(told, ElementsAre("bert appeared", "anna appeared", "bert left", "anna left", "bert appeared"));
 }
 
-TEST_F(NotificationCenterTest, handsTheObjectOver) {
-  std::vector<std::any> objects;
-  center.addObserver(&anna, "n", [&](const Notification& notification) { objects.push_back(notification.object); });
-  center.post("n", std::string("disk0"));
-  center.post("n");
-  ASSERT_EQ(objects.size(), 2U);
-  EXPECT_EQ(std::any_cast<std::string>(objects[0]), "disk0");
-  EXPECT_FALSE(objects[1].has_value());
-}
-
 TEST_F(NotificationCenterTest, letsHandlersChangeTheObserversAndPost) {
   center.addObserver(&anna, "first", [this](const Notification& notification) {
     note("anna")(notification);

@@ -3,7 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <limits>
-#include <random>
 
 #include "platform/Text.h"
 
@@ -44,43 +43,22 @@ TEST(Text, escapesWhatATerminalWouldObey) {
   for (const auto& [text, expected] : cases) EXPECT_EQ(escaped(text), expected);
 }
 
-TEST(Text, letsNoControlOutOfRandomBytes) {
-  std::mt19937 random(20);
-  for (int round = 0; round < 20'000; ++round) {
-    std::string bytes(random() % 12, '\0');
-    // Mostly bytes that make up controls: E2 80 AE, C2 9B, D8 9C, ESC.
-    for (char& byte : bytes)
-      byte = random() % 2 == 0 ? "\xE2\x80\xAE\xC2\x9B\xD8\x9C\x1B"[random() % 8] : static_cast<char>(random());
-    const std::string harmless = escaped(bytes);
-    for (std::string_view rest = harmless; !rest.empty();) {
-      const std::optional<char32_t> codePoint = takeCodePoint(rest);
-      ASSERT_TRUE(codePoint && !isControl(*codePoint)) << harmless;
-    }
-  }
-}
-
 TEST(Text, readsLeadingIntegers) {
   constexpr std::int64_t most = std::numeric_limits<std::int64_t>::max();
   constexpr std::int64_t least = std::numeric_limits<std::int64_t>::min();
   const std::pair<const char*, std::int64_t> cases[] = {
       {"", 0},
-      {"  \t\n", 0},
       {"42", 42},
       {" \v\f\r42", 42},
       {"+7x", 7},
       {"-7 8", -7},
       {"+-7", 0},
       {"-+7", 0},
-      {"- 7", 0},
-      {"x1", 0},
-      {"007", 7},
       {"0x10", 0},
-      {"1e3", 1},
       {"9223372036854775807", most},
       {"9223372036854775808", most},
       {"-9223372036854775808", least},
       {"-99999999999999999999999", least},
-      {"+99999999999999999999999z", most},
   };
   for (const auto& [text, expected] : cases) EXPECT_EQ(leadingInteger(text), expected) << text;
 }
@@ -92,14 +70,6 @@ TEST(Text, comparesAsciiLettersWithoutCase) {
   EXPECT_NE(compareIgnoringCase("\u00C9", "\u00E9"), 0);
   EXPECT_NE(compareIgnoringCase("@", "`"), 0);
   EXPECT_EQ(lowerCased("AZ[\u00C9]az"), "az[\u00C9]az");
-}
-
-TEST(Text, splitsAtRunsOfSeparators) {
-  using Pieces = std::vector<std::string>;
-  EXPECT_EQ(split("", ":"), Pieces{});
-  EXPECT_EQ(split("::", ":"), Pieces{});
-  EXPECT_EQ(split(":12::30/5/", ":/"), (Pieces{"12", "30", "5"}));
-  EXPECT_EQ(split("a b", ""), Pieces{"a b"});
 }
 
 }  // namespace
