@@ -116,24 +116,6 @@ TEST(Controller, FollowsVolumesThatComeAndGo) {
               ElementsAre("SDSystemDidDissappear disk1s2 B", "SDWirestartVolumeDidDissappear disk1s2 B"));
 }
 
-TEST(Controller, TakesAChangeWithoutAMountPointForADisappearance) {
-  StartupMachine machine;
-  machine.addLumaraX("disk0s2", "A");
-  machine.addLumaraX("disk1s2", "B");
-  machine.controller();
-
-  machine.addVolume("disk0s2", "A", keys({{"Size", 5}}));
-  machine.addVolume("disk1s2", "B", keys({{"Kind", "hfs"}}));
-  machine.runPasses(2);
-  EXPECT_THAT(machine.listed(), ElementsAre(systemFolder("B"))) << "nobody watches the kind";
-
-  machine.installLumaraX("/Elsewhere");
-  machine.addVolume("disk1s2", "B", keys({{"Mount Point", "/Elsewhere"}, {"Writable", false}}));
-  machine.runPasses(2);
-  EXPECT_THAT(machine.listed(), ElementsAre("/Elsewhere/System/Library/CoreServices"))
-      << "the new report replaces the old entry";
-}
-
 TEST(Controller, HoldsOneSystemOfAVersionOnADisk) {
   StartupMachine machine;
   machine.addVolume("disk0s2", "A");
