@@ -70,11 +70,11 @@ class Startup(server.Server):
         self.run("mkfifo /run/lines; sleep 1000000 >/run/lines & tavisk </run/lines >>/run/answers 2>&1 &")
         seen = [self._listed_at_prompt()]
         self._monitor("device_add usb-storage,id=plugged,drive=plugged,bus=usb.0")
-        machine.wait_until(lambda: self.run("test -e /dev/disk/by-label/PLUGGED").status == 0, 60, "the plugged disk")
+        machine.wait_until(lambda: self.run("test -e /dev/disk/by-label/PLUGGED").status == 0, 200, "the plugged disk")
         self.run("mkdir -p /Volumes/Plugged; mount /dev/disk/by-label/PLUGGED /Volumes/Plugged")
         seen += [self._listed_at_prompt() for _ in range(3)]
         self._monitor("device_del plugged")
-        machine.wait_until(lambda: self.run("test -e /dev/disk/by-label/PLUGGED").status != 0, 60, "the pull")
+        machine.wait_until(lambda: self.run("test -e /dev/disk/by-label/PLUGGED").status != 0, 200, "the pull")
         seen += [self._listed_at_prompt() for _ in range(3)]
         plugged = [folder_of("Plugged") in lines for lines in seen]
         others = {lines.replace(folder_of("Plugged") + "\n", "") for lines in seen}
@@ -83,7 +83,7 @@ class Startup(server.Server):
 
     def _listed_at_prompt(self):
         self.run(": >/run/answers; echo -liststartupdisks >/run/lines")
-        answer = machine.wait_until(lambda: self._prompted(), 60, "the prompt's answer")
+        answer = machine.wait_until(lambda: self._prompted(), 200, "the prompt's answer")
         return "".join(sorted(line + "\n" for line in answer.splitlines() if line.startswith("/")))
 
     def _prompted(self):
