@@ -4,6 +4,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <csignal>
 
 #include "LinuxTree.h"
@@ -16,6 +17,11 @@ namespace {
 using testing::AllOf, testing::HasSubstr;
 
 constexpr const char* preferencesFile = "/etc/tavisk/preferences/AnyApplication.plist";
+
+struct NoController final : ControllerLink {
+  int open() override { return ENODEV; }
+  int exchange(const ControllerRequest&, std::vector<std::uint8_t>&) override { return ENODEV; }
+};
 
 struct LinuxPreferences {
   PreferencesStore& preferences() { return tree.host().preferences(); }
@@ -59,13 +65,19 @@ TEST(LinuxPreferences, AreNotWrittenUnderAnothersLockNorOverDamage) {
   EXPECT_EQ(tree.file(std::string(preferencesFile) + ".damaged"), "<dict>");
 }
 
-/// What a signal to a process of this machine comes to.
+/// What a signal to a process of this machine comes to. A whole host would tell the journal of the machine too.
 std::string told(ProcessId process, int signal) {
   EffectSink effects;
   EffectLog log;
   effects.addChannel(log);
   RunLoop runLoop;
-  LinuxHost(effects, runLoop).processes().sendSignal(signal, process);
+  const SystemRoot root("/");
+  ServiceAccess services(root, runLoop);
+  const LinuxMachine machine{root, effects, runLoop, services};
+  LinuxPreferencesStore preferences(machine);
+  NoController link;
+  ManagementController controller(link);
+  LinuxProcessUtilities(machine, preferences, controller).sendSignal(signal, process);
   return log.lines.back();
 }
 
