@@ -93,10 +93,23 @@ class Startup(server.Server):
     def _monitor(self, command):
         with socket.socket(socket.AF_UNIX) as monitor:
             monitor.connect(str(self._monitor_path))
-            monitor.settimeout(20)
+            monitor.settimeout(60)
+            _read_to_prompt(monitor)
             monitor.sendall(command.encode() + b"\n")
-            while b"(qemu)" not in monitor.recv(4096).split(command.encode())[-1]:
-                pass
+            answer = _read_to_prompt(monitor)
+        if "Error" in answer:
+            raise machine.Trouble(answer[answer.index("Error"):])
+
+
+def _read_to_prompt(monitor):
+    """Whoever hangs up before the next prompt may not have been heard."""
+    said = b""
+    while not said.endswith(b"(qemu) "):
+        part = monitor.recv(4096)
+        if not part:
+            raise machine.Trouble("the emulator's monitor hung up")
+        said += part
+    return said.decode(errors="replace")
 
 
 def _wrong_starts(console):
