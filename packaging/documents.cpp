@@ -17,12 +17,11 @@
 #include <utility>
 #include <vector>
 
+#include "base/Text.h"
 #include "frontend/CommandList.h"
-#include "platform/Text.h"
-#include "platform/scratch/KeyTable.h"
+#include "hosts/scratch/KeyTable.h"
 
 namespace tavisk {
-
 namespace {
 
 using Row = std::vector<std::pair<std::string, std::string>>;

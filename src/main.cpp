@@ -9,19 +9,17 @@
 #include <optional>
 #include <string>
 
+#include "base/SignalWaiter.h"
+#include "base/Surroundings.h"
+#include "base/Text.h"
+#include "effects/Report.h"
 #include "frontend/RemoteServerSettings.h"
-#include "platform/Report.h"
-#include "platform/StandardError.h"
-#include "platform/Text.h"
-#include "platform/linux/LinuxHost.h"
-#include "platform/scratch/ScratchHost.h"
-#include "terminal/SignalWaiter.h"
-#include "terminal/Surroundings.h"
+#include "hosts/linux/LinuxHost.h"
+#include "hosts/scratch/ScratchHost.h"
 #include "terminal/TerminalLineSource.h"
 #include "terminal/TerminalLog.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr int refusedStatus = 1;

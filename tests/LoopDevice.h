@@ -10,7 +10,7 @@
 #include <string>
 #include <utility>
 
-#include "platform/FileDescriptor.h"
+#include "base/FileDescriptor.h"
 
 namespace tavisk {
 

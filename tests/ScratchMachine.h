@@ -10,9 +10,9 @@
 #include <vector>
 
 #include "TemporaryFolder.h"
-#include "platform/EffectSink.h"
-#include "platform/RunLoop.h"
-#include "platform/scratch/ScratchHost.h"
+#include "base/RunLoop.h"
+#include "effects/EffectSink.h"
+#include "hosts/scratch/ScratchHost.h"
 
 namespace tavisk {
 

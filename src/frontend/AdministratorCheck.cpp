@@ -8,7 +8,6 @@
 #include "frontend/RemoteServerSettings.h"
 
 namespace tavisk {
-
 namespace {
 constexpr std::size_t groupsAtMost = 16;
 }
@@ -23,7 +22,7 @@ bool RemoteServerSettings::myIsAuthenticatedAsAdministrator() {
     _context.output.putLine("myAuthenticatedAsAdministrator: Could not find admin group.");
     return false;
   }
-  return std::find(groups->begin(), groups->end(), *admin) != groups->end();
+  return std::ranges::find(*groups, *admin) != groups->end();
 }
 
 bool RemoteServerSettings::authenticate() {
@@ -47,14 +46,14 @@ bool RemoteServerSettings::isLumaronServer() {
 }
 
 void RemoteServerSettings::takeAuthorization() {
-  const std::lock_guard lock(_authorizationMutex);
+  const std::scoped_lock lock(_authorizationMutex);
   if (_ended) return;
   _authenticator = &_context.host.authenticator();
   _authenticator->authenticate();
 }
 
 void RemoteServerSettings::giveUpAuthorization() {
-  const std::lock_guard lock(_authorizationMutex);
+  const std::scoped_lock lock(_authorizationMutex);
   if (_authenticator && _authenticator->isAuthenticated()) _authenticator->deauthenticate();
   _authenticator = nullptr;
 }

@@ -6,7 +6,6 @@
 #include <iterator>
 
 namespace tavisk {
-
 namespace {
 
 struct Placeholder {
@@ -32,7 +31,7 @@ constexpr std::string_view neverWords[] = {"Never", "Off"};
 }  // namespace
 
 ArgumentKind argumentKind(const HelpEntry& command) {
-  const auto* const row = std::ranges::find(placeholders, std::string_view(command.placeholder), &Placeholder::text);
+  const auto* row = std::ranges::find(placeholders, std::string_view(command.placeholder), &Placeholder::text);
   return row == std::end(placeholders) ? ArgumentKind::text : row->kind;
 }
 

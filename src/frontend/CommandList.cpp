@@ -4,11 +4,10 @@
 
 #include <algorithm>
 
+#include "base/Text.h"
 #include "frontend/Help.h"
-#include "platform/Text.h"
 
 namespace tavisk {
-
 namespace {
 
 /// The commands of the table that help does not show.

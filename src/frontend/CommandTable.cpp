@@ -4,10 +4,9 @@
 
 #include <utility>
 
-#include "platform/PropertyList.h"
+#include "base/PropertyList.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr std::string_view tableText = R"(<dict>

@@ -7,7 +7,7 @@
 #include <string_view>
 #include <unordered_map>
 
-#include "platform/Result.h"
+#include "base/Result.h"
 
 namespace tavisk {
 

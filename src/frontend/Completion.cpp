@@ -7,10 +7,9 @@
 #include <span>
 #include <string_view>
 
-#include "platform/Text.h"
+#include "base/Text.h"
 
 namespace tavisk {
-
 namespace {
 
 using Words = std::vector<std::string>;

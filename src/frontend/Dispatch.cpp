@@ -4,12 +4,11 @@
 #include <utility>
 #include <variant>
 
+#include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/RemoteServerSettings.h"
-#include "platform/Text.h"
 
 namespace tavisk {
-
 namespace {
 
 /// A call of a handler of any kind; an argument that is not there is the empty string.
@@ -28,7 +27,7 @@ struct Call {
 }  // namespace
 
 bool RemoteServerSettings::loadCommands() {
-  if (_commandTable.data() == nullptr) {
+  if (!_commandTable.data()) {
     _context.output.putLine("Error: Command info could not be found.");
     return false;
   }
@@ -80,7 +79,7 @@ std::optional<std::size_t> RemoteServerSettings::runFirst(std::span<const std::s
   }
   const auto count = static_cast<std::size_t>(entry->arguments);
   const auto arguments = words.subspan(1, std::min(count, words.size() - 1));
-  const auto broken = std::find_if_not(arguments.begin(), arguments.end(), isUtf8);
+  const auto broken = std::ranges::find_if_not(arguments, isUtf8);
   if (broken != arguments.end()) {
     refuseWord(*broken);
     return std::nullopt;

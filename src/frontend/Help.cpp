@@ -8,7 +8,6 @@
 #include "frontend/ServerCommands.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr HelpEntry entries[] = {

@@ -3,12 +3,11 @@
 #include <cstddef>
 #include <optional>
 
+#include "base/Text.h"
 #include "frontend/Completion.h"
 #include "frontend/RemoteServerSettings.h"
-#include "platform/Text.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr std::size_t lineBufferSize = 2056;

@@ -8,7 +8,6 @@
 #include <utility>
 
 namespace tavisk {
-
 namespace {
 constexpr std::size_t keptAtMost = 1U << 20U;
 }
@@ -40,13 +39,13 @@ std::optional<int> Output::finish() {
 }
 
 std::string Output::takePrinted() {
-  const std::lock_guard lock(_mutex);
+  const std::scoped_lock lock(_mutex);
   return std::exchange(_printed, {});
 }
 
 void Output::write(const std::string& text) {
   if (_keeping) {
-    const std::lock_guard lock(_mutex);
+    const std::scoped_lock lock(_mutex);
     _printed.append(text, 0, keptAtMost - _printed.size());
   }
   if (_lostBy != 0 || std::fwrite(text.data(), 1, text.size(), _stream) < text.size()) lose();

@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "frontend/RemotePrefsExtra.h"
 
-#include "platform/Text.h"
+#include "base/Text.h"
 
 namespace tavisk {
 

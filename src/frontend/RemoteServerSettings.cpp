@@ -5,7 +5,7 @@
 #include <cerrno>
 #include <system_error>
 
-#include "platform/StandardError.h"
+#include "base/Surroundings.h"
 
 namespace tavisk {
 
@@ -31,7 +31,7 @@ bool RemoteServerSettings::setUp(int argc, char** withArguments) {
     return false;
   }
   {
-    const std::lock_guard lock(_serverCommandsMutex);
+    const std::scoped_lock lock(_serverCommandsMutex);
     _serverCommands = std::make_unique<ServerCommands>(_commandDict, _context);
   }
   _serverCommands->setParent(this);
@@ -82,7 +82,7 @@ void RemoteServerSettings::untilOutputIsLost(const std::function<void()>& work) 
 }
 
 int RemoteServerSettings::statusOfErrorFlag() const {
-  const std::lock_guard lock(_serverCommandsMutex);
+  const std::scoped_lock lock(_serverCommandsMutex);
   return _serverCommands && _serverCommands->error() ? 1 : 0;
 }
 

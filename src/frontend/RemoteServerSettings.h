@@ -13,10 +13,10 @@
 #include <string_view>
 #include <vector>
 
+#include "effects/EffectSink.h"
+#include "effects/Report.h"
 #include "frontend/CommandTable.h"
 #include "frontend/ServerCommands.h"
-#include "platform/EffectSink.h"
-#include "platform/Report.h"
 
 namespace tavisk {
 

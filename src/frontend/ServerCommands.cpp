@@ -5,8 +5,6 @@
 #include <utility>
 
 #include "frontend/RemotePrefsExtra.h"
-#include "settings/SpecialPMUSettings.h"
-#include "startupdisk/StartupDisk.h"
 
 namespace tavisk {
 

@@ -8,13 +8,13 @@
 #include <optional>
 #include <string>
 
+#include "base/Calendar.h"
+#include "base/NotificationCenter.h"
+#include "base/RunLoop.h"
 #include "frontend/CommandTable.h"
 #include "frontend/LineSource.h"
 #include "frontend/Output.h"
-#include "platform/Calendar.h"
 #include "platform/Host.h"
-#include "platform/NotificationCenter.h"
-#include "platform/RunLoop.h"
 
 namespace tavisk {
 
@@ -198,8 +198,8 @@ class ServerCommands {
   std::atomic<bool> _error = false;
   RemoteServerSettings* _parent = nullptr;
   std::optional<std::string> _timeZone;  ///< set by setTimeZone
-  std::unique_ptr<SpecialPMUSettings> _specialPMU;
-  std::unique_ptr<StartupDisk> _startupDisk;
+  std::shared_ptr<SpecialPMUSettings> _specialPMU;
+  std::shared_ptr<StartupDisk> _startupDisk;
 };
 
 }  // namespace tavisk

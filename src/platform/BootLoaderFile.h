@@ -4,9 +4,7 @@
 
 #include <optional>
 
-#include "platform/PropertyList.h"
-#include "platform/PropertyListFile.h"
-#include "platform/SettingChange.h"
+#include "base/PropertyList.h"
 
 namespace tavisk {
 
@@ -25,13 +23,5 @@ class BootLoaderFile {
   /// NAME.damaged first. Whether it was written; the reason why not goes to the effects.
   virtual bool write(const PropertyList::Dictionary& contents) = 0;
 };
-
-/// The architecture in the file, as the setting by which a host tells the effects; "default" when the key is absent.
-/// What is given must outlive the setting. The first is of a file that was `read`; a change of the second writes
-/// `contents`.
-Setting kernelArchitecture(const Result<std::optional<PropertyList::Dictionary>>& read);
-Setting kernelArchitecture(const PropertyListFile& file, const PropertyList::Dictionary& contents);
-/// The value that a change of kernelArchitecture to these contents asks for.
-std::string architectureIn(const PropertyList::Dictionary& contents);
 
 }  // namespace tavisk

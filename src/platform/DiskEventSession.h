@@ -7,8 +7,8 @@
 #include <string>
 #include <vector>
 
+#include "base/RunLoop.h"
 #include "platform/DiskDescription.h"
-#include "platform/RunLoop.h"
 
 namespace tavisk {
 

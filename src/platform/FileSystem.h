@@ -6,8 +6,8 @@
 #include <optional>
 #include <string>
 
-#include "platform/PropertyList.h"
-#include "platform/Result.h"
+#include "base/PropertyList.h"
+#include "base/Result.h"
 
 namespace tavisk {
 

@@ -2,30 +2,22 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include "platform/AdminAuthenticator.h"
+#include "platform/Authorization.h"
 #include "platform/BootLoaderFile.h"
 #include "platform/ClockService.h"
 #include "platform/DiskEventSession.h"
 #include "platform/DiskManagementService.h"
-#include "platform/DynamicStore.h"
 #include "platform/FileSystem.h"
-#include "platform/HostConfigService.h"
 #include "platform/IORegistry.h"
-#include "platform/KernelValues.h"
-#include "platform/KeyboardInputService.h"
-#include "platform/NetworkInterfaces.h"
+#include "platform/MachineFacts.h"
+#include "platform/NameServices.h"
 #include "platform/NetworkTimeService.h"
 #include "platform/PowerController.h"
 #include "platform/PowerSettingsService.h"
-#include "platform/PreferencesStore.h"
-#include "platform/ProcessTermination.h"
-#include "platform/ProcessUtilities.h"
-#include "platform/ProgramRunner.h"
-#include "platform/RemoteEventsService.h"
-#include "platform/RemoteShellService.h"
+#include "platform/Preferences.h"
+#include "platform/Processes.h"
+#include "platform/RemoteAccess.h"
 #include "platform/SystemLog.h"
-#include "platform/UserDatabase.h"
-#include "platform/UserDefaults.h"
 
 namespace tavisk {
 

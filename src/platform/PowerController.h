@@ -7,7 +7,7 @@
 #include <string>
 #include <utility>
 
-#include "platform/PropertyList.h"
+#include "base/PropertyList.h"
 
 namespace tavisk {
 

@@ -2,17 +2,17 @@
 // SPDX-License-Identifier: MIT
 #include "platform/PowerSettingsService.h"
 
-#include "platform/SettingNames.h"
+#include "effects/SettingNames.h"
 
 namespace tavisk {
 
 const char* nameOf(SleepTimer timer) {
   switch (timer) {
-    case SleepTimer::system:
+    case SleepTimer::computer:
       return setting::computerSleep;
     case SleepTimer::display:
       return setting::displaySleep;
-    case SleepTimer::disk:
+    case SleepTimer::hardDisk:
       break;
   }
   return setting::hardDiskSleep;
@@ -20,11 +20,11 @@ const char* nameOf(SleepTimer timer) {
 
 const char* nameOf(PowerSwitch which) {
   switch (which) {
-    case PowerSwitch::wakeOnRing:
+    case PowerSwitch::wakeOnModem:
       return setting::wakeOnModem;
-    case PowerSwitch::wakeOnLAN:
+    case PowerSwitch::wakeOnNetworkAccess:
       return setting::wakeOnNetworkAccess;
-    case PowerSwitch::autoRestart:
+    case PowerSwitch::restartAfterPowerFailure:
       return setting::restartAfterPowerFailure;
     case PowerSwitch::powerButtonSleep:
       break;

@@ -16,7 +16,7 @@ struct Minutes {
   bool operator==(const Minutes&) const = default;
 };
 
-enum class SleepTimer { system, display, disk };
+enum class SleepTimer { computer, display, hardDisk };
 
 /// How long the machine, its display or its disks are idle before they sleep.
 class SleepTimersService {
@@ -28,7 +28,7 @@ class SleepTimersService {
   virtual void setUntilSleep(SleepTimer timer, const PowerSource& source, Minutes minutes) = 0;
 };
 
-enum class PowerSwitch { wakeOnRing, wakeOnLAN, autoRestart, powerButtonSleep };
+enum class PowerSwitch { wakeOnModem, wakeOnNetworkAccess, restartAfterPowerFailure, powerButtonSleep };
 
 /// What wakes, restarts or puts to sleep the machine. Results of the setters go to the effects.
 class PowerSwitchesService {
@@ -43,8 +43,8 @@ class PowerSwitchesService {
   virtual void setOn(PowerSwitch which, const PowerSource& source, bool on) = 0;
 
   /// Whether the machine restarts after a freeze, whatever feeds it.
-  virtual bool restartsOnHang() = 0;
-  virtual void setRestartsOnHang(bool restarts) = 0;
+  virtual bool restartsAfterFreeze() = 0;
+  virtual void setRestartsAfterFreeze(bool restarts) = 0;
 };
 
 /// By which effects and reports call them.

@@ -7,7 +7,6 @@
 #include "frontend/ServerCommands.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr const char* architectureKey = "Kernel Architecture";

@@ -6,12 +6,11 @@
 #include <cstdint>
 #include <vector>
 
+#include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/ServerCommands.h"
-#include "platform/Text.h"
 
 namespace tavisk {
-
 namespace {
 
 /// The three numbers of "mm:dd:yy" or "hh:mm:ss"; what is missing or no number is 0.

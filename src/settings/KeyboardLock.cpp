@@ -7,7 +7,6 @@
 #include "frontend/ServerCommands.h"
 
 namespace tavisk {
-
 namespace {
 
 /// Absent when the word is none of the four.

@@ -6,13 +6,12 @@
 #include <optional>
 #include <string_view>
 
+#include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/RemoteServerSettings.h"
 #include "frontend/ServerCommands.h"
-#include "platform/Text.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr const char* question =

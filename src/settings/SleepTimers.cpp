@@ -2,10 +2,10 @@
 // SPDX-License-Identifier: MIT
 #include <cstdint>
 
+#include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/RemotePrefsExtra.h"
 #include "frontend/ServerCommands.h"
-#include "platform/Text.h"
 
 namespace tavisk {
 
@@ -36,13 +36,13 @@ std::string ServerCommands::getPMKey() {
 }
 
 void ServerCommands::getSleep() {
-  showSleepTimer("Sleep: Computer sleeps", SleepTimer::system);
+  showSleepTimer("Sleep: Computer sleeps", SleepTimer::computer);
   showSleepTimer("Sleep: Display sleeps", SleepTimer::display);
-  showSleepTimer("Sleep: Disk sleeps", SleepTimer::disk);
+  showSleepTimer("Sleep: Disk sleeps", SleepTimer::hardDisk);
 }
 
 void ServerCommands::getComputerSleep() {
-  showSleepTimer("Computer Sleep:", SleepTimer::system);
+  showSleepTimer("Computer Sleep:", SleepTimer::computer);
 }
 
 void ServerCommands::getDisplaySleep() {
@@ -50,7 +50,7 @@ void ServerCommands::getDisplaySleep() {
 }
 
 void ServerCommands::getHardDiskSleep() {
-  showSleepTimer("Hard Disk Sleep:", SleepTimer::disk);
+  showSleepTimer("Hard Disk Sleep:", SleepTimer::hardDisk);
 }
 
 void ServerCommands::showSleepTimer(const char* label, SleepTimer timer) {
@@ -64,12 +64,12 @@ void ServerCommands::showSleepTimer(const char* label, SleepTimer timer) {
 }
 
 void ServerCommands::setSleep(const std::string& minutes) {
-  static constexpr SleepTimer all[] = {SleepTimer::display, SleepTimer::disk, SleepTimer::system};
+  static constexpr SleepTimer all[] = {SleepTimer::display, SleepTimer::hardDisk, SleepTimer::computer};
   setSleepTimers({"setsleep", "setsleep <minutes>", " (computer, display, hard disk)", all}, minutes);
 }
 
 void ServerCommands::setComputerSleep(const std::string& minutes) {
-  static constexpr SleepTimer system[] = {SleepTimer::system};
+  static constexpr SleepTimer system[] = {SleepTimer::computer};
   setSleepTimers({"setcomputersleep", "setcomputersleep <minutes>", "", system}, minutes);
 }
 
@@ -79,7 +79,7 @@ void ServerCommands::setDisplaySleep(const std::string& minutes) {
 }
 
 void ServerCommands::setHardDiskSleep(const std::string& minutes) {
-  static constexpr SleepTimer disk[] = {SleepTimer::disk};
+  static constexpr SleepTimer disk[] = {SleepTimer::hardDisk};
   setSleepTimers({"setharddisksleep", "setharddisksleep <minutes>", "", disk}, minutes);
 }
 

@@ -6,7 +6,6 @@
 #include <string>
 
 namespace tavisk {
-
 namespace {
 
 constexpr const char* controllerClasses[] = {"VelmarPMU", "VelmarSMU", "VelmarKCS"};

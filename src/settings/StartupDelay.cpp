@@ -2,13 +2,12 @@
 // SPDX-License-Identifier: MIT
 #include <cstdint>
 
+#include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/ServerCommands.h"
-#include "platform/Text.h"
 #include "settings/SpecialPMUSettings.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr std::int64_t secondsInUnit = 30;
@@ -38,7 +37,7 @@ void ServerCommands::setWaitForStartupAfterPowerFailure(const std::string& secon
 
 SpecialPMUSettings& ServerCommands::sharedSpecialPMU() {
   if (!_specialPMU) {
-    _specialPMU = std::make_unique<SpecialPMUSettings>(_context.host.powerController(), _context.host.systemLog(),
+    _specialPMU = std::make_shared<SpecialPMUSettings>(_context.host.powerController(), _context.host.systemLog(),
                                                        _context.output);
   }
   return *_specialPMU;

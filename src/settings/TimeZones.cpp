@@ -3,12 +3,11 @@
 #include <algorithm>
 #include <vector>
 
+#include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/ServerCommands.h"
-#include "platform/Text.h"
 
 namespace tavisk {
-
 namespace {
 
 bool isListedBefore(const std::string& left, const std::string& right) {
@@ -30,7 +29,7 @@ void ServerCommands::getTimeZone() {
 
 void ServerCommands::listTimeZones() {
   std::vector<std::string> names = _context.host.clock().knownTimeZones();
-  std::sort(names.begin(), names.end(), isListedBefore);
+  std::ranges::sort(names, isListedBefore);
   _context.output.putLine("Time Zones:");
   for (const std::string& name : names) _context.output.print(" %s\n", name.c_str());
   setError(false);
@@ -41,7 +40,7 @@ void ServerCommands::setTimeZone(const std::string& timeZone) {
   const std::vector<std::string> names = clock.knownTimeZones();
   setError(false);
   if (checkForEmptyString(timeZone, "settimezone", "a valid time zone", "settimezone <timezone>")) return;
-  if (std::find(names.begin(), names.end(), timeZone) == names.end()) {
+  if (std::ranges::find(names, timeZone) == names.end()) {
     _context.output.print(
         "%s is not a valid timezone. The command 'listtimezones' will show a list of valid time zones.\n",
         timeZone.c_str());

@@ -20,11 +20,11 @@ namespace {
 
 constexpr const char* onOrOff = "either 'On' or 'Off'";
 
-constexpr SourceSwitch wakeOnModem = {PowerSwitch::wakeOnRing, "Wake On Modem", "setwakeonmodem",
+constexpr SourceSwitch wakeOnModem = {PowerSwitch::wakeOnModem, "Wake On Modem", "setwakeonmodem",
                                       "setwakeonmodem <on off>"};
-constexpr SourceSwitch wakeOnNetworkAccess = {PowerSwitch::wakeOnLAN, "Wake On Network Access",
+constexpr SourceSwitch wakeOnNetworkAccess = {PowerSwitch::wakeOnNetworkAccess, "Wake On Network Access",
                                               "setwakeonnetworkaccess", "setwakeonnetworkaccess <on off>"};
-constexpr SourceSwitch restartPowerFailure = {PowerSwitch::autoRestart, "Restart After Power Failure",
+constexpr SourceSwitch restartPowerFailure = {PowerSwitch::restartAfterPowerFailure, "Restart After Power Failure",
                                               "setrestartpowerfailure", "setrestartpowerfailure <on off>"};
 
 const char* wordFor(bool on) {
@@ -81,7 +81,7 @@ void ServerCommands::setSourceSwitch(const SourceSwitch& row, const std::string&
 }
 
 void ServerCommands::getRestartFreeze() {
-  _context.output.print("Restart After Freeze: %s\n", wordFor(_context.host.powerSettings().restartsOnHang()));
+  _context.output.print("Restart After Freeze: %s\n", wordFor(_context.host.powerSettings().restartsAfterFreeze()));
   setError(false);
 }
 
@@ -89,7 +89,7 @@ void ServerCommands::setRestartFreeze(const std::string& onOff) {
   PowerSettingsService& power = _context.host.powerSettings();
   setError(false);
   if (checkForEmptyString(onOff, "setrestartfreeze", onOrOff, "setrestartfreeze <on off>")) return;
-  if (const std::optional<bool> on = readOnOff(onOff, "setrestartfreeze")) power.setRestartsOnHang(*on);
+  if (const std::optional<bool> on = readOnOff(onOff, "setrestartfreeze")) power.setRestartsAfterFreeze(*on);
 }
 
 void ServerCommands::getAllowPowerButtonToSleepComputer() {

@@ -7,7 +7,6 @@
 #include <utility>
 
 namespace tavisk {
-
 namespace {
 
 constexpr const char* nvramTool = "/usr/sbin/nvram";
@@ -15,7 +14,7 @@ constexpr int openFirmware = 1;
 constexpr std::string_view deviceTreePrefix = "IODeviceTree:";
 
 bool isAscii(std::string_view text) {
-  return std::all_of(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x80; });
+  return std::ranges::all_of(text, [](char c) { return static_cast<unsigned char>(c) < 0x80; });
 }
 
 /// Whether a list of texts, each ended by a NUL byte, has this one.

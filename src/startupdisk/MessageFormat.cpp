@@ -7,7 +7,6 @@
 #include <limits>
 
 namespace tavisk {
-
 namespace {
 
 constexpr std::string_view conversions = "@sdxf";
@@ -37,10 +36,10 @@ std::string MessageValue::asText() const {
 
 std::string MessageValue::asHexadecimal() const {
   constexpr std::size_t width = 8;
-  const auto* const number = std::get_if<std::int64_t>(&_value);
+  const auto* number = std::get_if<std::int64_t>(&_value);
   std::array<char, width> digits{};
   const auto end = std::to_chars(digits.data(), digits.data() + digits.size(),
-                                 static_cast<std::uint32_t>(number == nullptr ? 0 : *number), 16);
+                                 static_cast<std::uint32_t>(!number ? 0 : *number), 16);
   const std::string text(digits.data(), end.ptr);
   return std::string(width - text.size(), '0') + text;
 }

@@ -8,9 +8,9 @@
 #include <utility>
 #include <vector>
 
+#include "base/RunLoop.h"
 #include "platform/DiskEventSession.h"
 #include "platform/DiskManagementService.h"
-#include "platform/RunLoop.h"
 #include "startupdisk/FoundSystems.h"
 #include "startupdisk/SDEnvironment.h"
 #include "startupdisk/SDSystemSearcher.h"

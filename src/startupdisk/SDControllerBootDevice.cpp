@@ -2,13 +2,12 @@
 // SPDX-License-Identifier: MIT
 #include <utility>
 
-#include "platform/Locale.h"
-#include "platform/ProcessTermination.h"
+#include "base/Locale.h"
+#include "platform/Processes.h"
 #include "startupdisk/SDController.h"
 #include "startupdisk/SDNotifications.h"
 
 namespace tavisk {
-
 namespace {
 
 /// A line for Open Firmware: it sets "boot-command" back and then runs the word target-mode.
@@ -100,7 +99,7 @@ SDRecordRef SDController::_selectedImageOn(const std::string& interface) const {
 
 bool SDController::doesCurrentBootDeviceMatchSystemFolder(const SDRecord& system, const SDRecord* withCurrentBootDisk) {
   const auto folder = system.textForKey(recordkey::systemFolderPath);
-  const auto device = withCurrentBootDisk == nullptr ? nullptr : currentBootDevice();
+  const auto device = !withCurrentBootDisk ? nullptr : currentBootDevice();
   if (!device) {
     _environment.log.debug("dCBDMSF doesn't know boot-dev yet to check %@", {folder});
     return false;
@@ -131,8 +130,8 @@ bool SDController::_writeBootChoice(const SDDisk& system) {
 
 void SDController::_logBootChoice(const SDDisk& system) const {
   const auto& log = _environment.log;
-  log.debug("Setting Startup Disk: %@", {system.description()});
-  log.debug("***************************** Setting Startup Disk *****************************");
+  log.debug("Setting<std::string> Startup Disk: %@", {system.description()});
+  log.debug("***************************** Setting<std::string> Startup Disk *****************************");
   log.debug("******         Volume: %@", {system.volumeName()});
   log.debug("******  System Folder: %@", {system.textForKey(recordkey::systemFolderPath)});
   log.debug("****** System Version: %@", {system.objectForKey(recordkey::systemVersionMajor)});

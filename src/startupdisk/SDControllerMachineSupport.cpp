@@ -4,7 +4,6 @@
 #include "startupdisk/SDController.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr const char* rackServerModel = "Corvane1,1";

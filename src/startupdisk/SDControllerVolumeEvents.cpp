@@ -19,7 +19,7 @@ void SDController::diskDisappeared(const DiskEvent& event, void* controller) {
 void SDController::diskDescriptionChanged(const DiskEvent& event, void* controller) {
   auto& self = *static_cast<SDController*>(controller);
   const auto& changed = event.changed;
-  const bool moved = std::find(changed.begin(), changed.end(), DiskKey::volumePath) != changed.end();
+  const bool moved = std::ranges::find(changed, DiskKey::volumePath) != changed.end();
   if (moved && !self._recordOf(event.disk)->mountPoint().empty()) {
     self._volumeAppeared(event.disk);
   } else {

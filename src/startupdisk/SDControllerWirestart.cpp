@@ -8,7 +8,6 @@
 #include "startupdisk/SDNotifications.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr const char* scanIntervalDefault = "SDWirestartScanInterval";
@@ -48,8 +47,8 @@ void SDController::removeWirestartImageWithIdentifier(const std::optional<std::s
 
 /// Null when there was no image with this identifier.
 SDRecordRef SDController::_removeImage(const std::string& identifier) {
-  const auto place = std::find_if(_wirestartSystems.begin(), _wirestartSystems.end(),
-                                  [&](const auto& entry) { return entry.first == identifier; });
+  const auto place =
+      std::ranges::find_if(_wirestartSystems, [&](const auto& entry) { return entry.first == identifier; });
   if (place == _wirestartSystems.end()) return nullptr;
   SDRecordRef image = place->second;
   _wirestartSystems.erase(place);
@@ -74,7 +73,8 @@ void SDController::setupWirestartUpdating() {
 double SDController::_allowedInterval(double wanted) const {
   if (wanted >= shortestInterval) return wanted;
   _environment.log.always(
-      "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting Wirestart scan time to 20 "
+      "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting<std::string> Wirestart scan "
+      "time to 20 "
       "seconds. User had requested %.0f seconds.",
       {wanted});
   return shortestInterval;

@@ -7,9 +7,9 @@
 #include <optional>
 #include <string>
 
+#include "base/NotificationCenter.h"
+#include "base/RunLoop.h"
 #include "platform/Host.h"
-#include "platform/NotificationCenter.h"
-#include "platform/RunLoop.h"
 #include "startupdisk/DiskContextTable.h"
 #include "startupdisk/SDDisk.h"
 #include "startupdisk/SDLog.h"

@@ -5,8 +5,8 @@
 #include <initializer_list>
 #include <string_view>
 
+#include "platform/Preferences.h"
 #include "platform/SystemLog.h"
-#include "platform/UserDefaults.h"
 #include "startupdisk/MessageFormat.h"
 
 namespace tavisk {

@@ -2,21 +2,21 @@
 // SPDX-License-Identifier: MIT
 #include "startupdisk/SDRecord.h"
 
-#include "platform/Text.h"
+#include "base/Text.h"
 
 namespace tavisk {
 
 std::optional<std::string> SDRecord::textForKey(const std::string& key) const {
   const auto value = objectForKey(key);
-  const auto* const text = value ? std::get_if<std::string>(&*value) : nullptr;
-  return text == nullptr ? std::nullopt : std::optional(*text);
+  const auto* text = value ? std::get_if<std::string>(&*value) : nullptr;
+  return !text ? std::nullopt : std::optional(*text);
 }
 
 std::optional<std::int64_t> SDRecord::integerForKey(const std::string& key) const {
   const auto value = objectForKey(key);
   if (!value) return std::nullopt;
-  const auto* const number = std::get_if<std::int64_t>(&*value);
-  return number == nullptr ? leadingInteger(std::get<std::string>(*value)) : *number;
+  const auto* number = std::get_if<std::int64_t>(&*value);
+  return !number ? leadingInteger(std::get<std::string>(*value)) : *number;
 }
 
 }  // namespace tavisk

@@ -5,7 +5,6 @@
 #include <utility>
 
 namespace tavisk {
-
 namespace {
 
 /// The values of _queueLock.
@@ -17,7 +16,7 @@ constexpr int volumeQueued = 1;
 std::unique_ptr<SDSystemSearcher> SDSystemSearcher::initWithDelegate(SystemSearcherProtocol* delegate, bool onOldWorld,
                                                                      bool canBootNative9, bool canBootLegacyOS,
                                                                      const SearcherServices& services) {
-  if (delegate == nullptr) {
+  if (!delegate) {
     services.log.always("%s Delegate should not be nil!",
                         {"-[SDSystemSearcher initWithDelegate:onOldWorld:canBootNative9:canBootLegacyOS:]"});
     return nullptr;

@@ -6,11 +6,11 @@
 #include <memory>
 #include <string>
 
+#include "base/Locks.h"
+#include "base/PropertyList.h"
+#include "base/RunLoop.h"
 #include "platform/DiskManagementService.h"
 #include "platform/FileSystem.h"
-#include "platform/Locks.h"
-#include "platform/PropertyList.h"
-#include "platform/RunLoop.h"
 #include "startupdisk/SDDisk.h"
 #include "startupdisk/SDLog.h"
 #include "startupdisk/SearchQueue.h"

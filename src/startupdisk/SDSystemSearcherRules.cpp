@@ -5,11 +5,10 @@
 #include <utility>
 #include <vector>
 
-#include "platform/TextEncoding.h"
+#include "base/TextEncoding.h"
 #include "startupdisk/SDSystemSearcher.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr int firmwareThatLoadsBootEfi = 2;
@@ -29,9 +28,9 @@ void describe(SDDisk& disk, const char* productName, std::int64_t systemVersionM
 }
 
 std::optional<std::string> textIn(const PropertyList::Dictionary& dictionary, const char* key) {
-  const auto* const value = dictionary.find(key);
-  const auto* const text = value == nullptr ? nullptr : value->asString();
-  return text == nullptr ? std::nullopt : std::optional(*text);
+  const auto* value = dictionary.find(key);
+  const auto* text = !value ? nullptr : value->asString();
+  return !text ? std::nullopt : std::optional(*text);
 }
 
 void copyText(const PropertyList::Dictionary& from, const char* key, SDDisk& disk) {
@@ -58,7 +57,7 @@ void SDSystemSearcher::_checkVolumeForObviousSystemFolders(SDDisk& volume) {
   volume.setObject(mountPoint + coreServicesFolder, recordkey::systemFolderPath);
   if (_checkForLumaronVariants(volume)) return;
   if (!volume.disk() || _services.management.partitionScheme(*volume.disk()) == 0) return;
-  for (const char* const folder : {"/WINDOWS", "/WINNT"}) {
+  for (const char* folder : {"/WINDOWS", "/WINNT"}) {
     volume.setObject(mountPoint + folder, recordkey::systemFolderPath);
     if (_checkForMSVariants(volume)) return;
   }
@@ -149,7 +148,7 @@ void SDSystemSearcher::_describeLumaraX(SDDisk& disk, const std::string& systemF
 /// A dictionary; a server system's own version file is preferred to the plain one.
 std::optional<PropertyList> SDSystemSearcher::_readVersionFile(const std::string& systemFolder,
                                                                const std::string& mountPoint) const {
-  for (const char* const name : {"/ServerVersion.plist", "/SystemVersion.plist"}) {
+  for (const char* name : {"/ServerVersion.plist", "/SystemVersion.plist"}) {
     for (const auto& folder : candidateFolders(systemFolder, mountPoint)) {
       auto versions = _readDictionary(folder + name);
       if (versions) return versions;
@@ -162,15 +161,15 @@ std::optional<PropertyList> SDSystemSearcher::_readDictionary(const std::string&
   const auto xml = _services.files.read(path, foreignFileLimits.bytes);
   if (!xml) return std::nullopt;
   auto list = parsePropertyList(*xml, foreignFileLimits);
-  if (!list || list->asDictionary() == nullptr) return std::nullopt;
+  if (!list || !list->asDictionary()) return std::nullopt;
   return std::move(list).value();
 }
 
 void SDSystemSearcher::_describeEarlyLumaraX(SDDisk& disk, const std::string& systemFolder) const {
   disk.setObject("Lumara X", recordkey::productName);
   const auto text = _readSoftwareVersion(systemFolder, disk.mountPoint());
-  const auto* const release = std::find_if(betaReleases.begin(), betaReleases.end(),
-                                           [&](const auto& candidate) { return candidate.first == text; });
+  const auto* release =
+      std::ranges::find_if(betaReleases, [&](const auto& candidate) { return candidate.first == text; });
   if (release != betaReleases.end()) disk.setObject(release->second, recordkey::productVersion);
 }
 

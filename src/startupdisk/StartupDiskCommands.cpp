@@ -5,7 +5,6 @@
 #include "startupdisk/StartupDisk.h"
 
 namespace tavisk {
-
 namespace {
 
 /// The name under which "/" is displayed; absent when its volume has none.
@@ -38,7 +37,7 @@ std::optional<std::string> nameMeaning(std::string_view folder, DiskEventSession
 
 SDController& ServerCommands::sharedController() {
   if (!_startupDisk)
-    _startupDisk = std::make_unique<StartupDisk>(_context.host, _context.runLoop, _context.notifications);
+    _startupDisk = std::make_shared<StartupDisk>(_context.host, _context.runLoop, _context.notifications);
   return _startupDisk->sharedController();
 }
 

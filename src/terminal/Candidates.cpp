@@ -6,10 +6,9 @@
 #include <numeric>
 #include <span>
 
-#include "platform/Text.h"
+#include "base/Text.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr std::size_t shownAtMost = 400;
@@ -28,7 +27,7 @@ bool isContinuation(char byte) {
 }
 
 std::size_t lengthOf(const std::string& name) {
-  return name.size() - static_cast<std::size_t>(std::count_if(name.begin(), name.end(), isContinuation));
+  return name.size() - static_cast<std::size_t>(std::ranges::count_if(name, isContinuation));
 }
 
 std::vector<std::size_t> widthsOfColumns(Names names, std::size_t rows) {

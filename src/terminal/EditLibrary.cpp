@@ -2,10 +2,9 @@
 // SPDX-License-Identifier: MIT
 #include "terminal/EditLibrary.h"
 
-#include "platform/LibraryFunctions.h"
+#include "base/LibraryFunctions.h"
 
 namespace tavisk {
-
 namespace {
 
 Result<EditLibrary> openLibrary() {

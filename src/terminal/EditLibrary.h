@@ -4,7 +4,7 @@
 
 #include <histedit.h>
 
-#include "platform/Result.h"
+#include "base/Result.h"
 
 namespace tavisk {
 

@@ -11,12 +11,11 @@
 #include <utility>
 #include <vector>
 
-#include "platform/Text.h"
+#include "base/Text.h"
 #include "terminal/Candidates.h"
 #include "terminal/WideText.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr int rememberedLines = 500;

@@ -8,10 +8,10 @@
 #include <optional>
 #include <string>
 
+#include "base/FileDescriptor.h"
+#include "base/Result.h"
+#include "base/RunLoop.h"
 #include "frontend/LineSource.h"
-#include "platform/FileDescriptor.h"
-#include "platform/Result.h"
-#include "platform/RunLoop.h"
 #include "terminal/EditLibrary.h"
 #include "terminal/TerminalKeys.h"
 #include "terminal/TerminalSignals.h"

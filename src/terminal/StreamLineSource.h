@@ -10,7 +10,7 @@
 namespace tavisk {
 
 /// Lines from a stream, as they come; the prompt goes to the output.
-class StreamLineSource : public LineSource {
+class StreamLineSource final : public LineSource {
  public:
   /// Neither is owned.
   StreamLineSource(std::FILE* stream, Output& output) : _stream(stream), _output(output) {}

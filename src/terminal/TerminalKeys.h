@@ -5,7 +5,7 @@
 #include <functional>
 #include <optional>
 
-#include "platform/RunLoop.h"
+#include "base/RunLoop.h"
 #include "terminal/TerminalSignals.h"
 #include "terminal/WideText.h"
 

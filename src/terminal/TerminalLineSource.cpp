@@ -11,7 +11,6 @@
 #include <utility>
 
 namespace tavisk {
-
 namespace {
 
 bool canMoveTheCursor() {

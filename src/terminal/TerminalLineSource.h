@@ -10,8 +10,8 @@
 #include <optional>
 #include <string>
 
+#include "base/RunLoop.h"
 #include "frontend/LineSource.h"
-#include "platform/RunLoop.h"
 #include "terminal/LineEditor.h"
 #include "terminal/StreamLineSource.h"
 
@@ -19,7 +19,7 @@ namespace tavisk {
 
 /// Lines from standard input. Lines of commands are edited, where standard input and output are a terminal that can do
 /// it; answers to questions and everything else come as they are.
-class TerminalLineSource : public LineSource {
+class TerminalLineSource final : public LineSource {
  public:
   /// Neither is owned. The output is standard output.
   TerminalLineSource(Output& output, RunLoop& runLoop)

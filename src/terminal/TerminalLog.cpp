@@ -7,8 +7,8 @@
 #include <cstdlib>
 #include <string_view>
 
-#include "platform/StandardError.h"
-#include "platform/Text.h"
+#include "base/Surroundings.h"
+#include "base/Text.h"
 
 namespace tavisk {
 

@@ -5,13 +5,13 @@
 #include <functional>
 #include <utility>
 
-#include "platform/EffectSink.h"
+#include "effects/EffectSink.h"
 
 namespace tavisk {
 
 /// Tells on standard error, in one line each, what failed and what this machine does not support: "tavisk: SETTING:
 /// what was tried on what: why".
-class TerminalLog : public EffectChannel {
+class TerminalLog final : public EffectChannel {
  public:
   /// When standard error is a terminal, or TAVISK_LOG is "stderr".
   static bool wanted();

@@ -7,7 +7,6 @@
 #include <unistd.h>
 
 namespace tavisk {
-
 namespace {
 
 sigset_t setOf(std::initializer_list<int> signals) {

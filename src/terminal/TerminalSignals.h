@@ -5,7 +5,7 @@
 #include <csignal>
 #include <optional>
 
-#include "platform/FileDescriptor.h"
+#include "base/FileDescriptor.h"
 
 namespace tavisk {
 

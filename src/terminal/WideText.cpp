@@ -4,10 +4,9 @@
 
 #include <cstddef>
 
-#include "platform/Text.h"
+#include "base/Text.h"
 
 namespace tavisk {
-
 namespace {
 
 constexpr char32_t firstByte = 0xDC00;

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "BusTree.h"
+#include "bus/BusTree.h"
 
 #include <signal.h>
 #include <sys/mount.h>
@@ -44,7 +44,7 @@ MessageBus::MessageBus(LinuxTree& tree) {
       "exec dbus-daemon --nofork --print-address=1 --print-pid=1 --config-file=" + tree.at("/bus.conf").string();
   _output = ::popen(command.c_str(), "re");
   // It prints these when it takes callers.
-  if (_output == nullptr || std::fscanf(_output, "%*s %d", &_process) != 1) throw std::runtime_error("no message bus");
+  if (!_output || std::fscanf(_output, "%*s %d", &_process) != 1) throw std::runtime_error("no message bus");
 }
 
 MessageBus::~MessageBus() {

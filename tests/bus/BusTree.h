@@ -4,8 +4,8 @@
 
 #include <cstdio>
 
-#include "platform/FakeServiceManager.h"
-#include "platform/LinuxTree.h"
+#include "hosts/linux/FakeServiceManager.h"
+#include "hosts/linux/LinuxTree.h"
 
 namespace tavisk {
 

@@ -1,9 +1,9 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "BusTree.h"
-#include "platform/LinuxContractMachines.h"
-#include "platform/ZoneList.h"
-#include "platform/contract/HostNamesContract.h"
+#include "bus/BusTree.h"
+#include "hosts/linux/LinuxContractMachines.h"
+#include "hosts/shared/ZoneList.h"
+#include "platform/HostNamesContract.h"
 
 namespace tavisk {
 namespace {

@@ -10,7 +10,7 @@
 #include <filesystem>
 #include <string>
 
-#include "platform/linux/SystemClock.h"
+#include "hosts/linux/clock/SystemClock.h"
 
 namespace tavisk {
 namespace {
@@ -25,7 +25,7 @@ bool couldSetTheClock() {
 /// The real daemons write to /etc and set the host name.
 bool sharesSpaces() {
   const char* outer = std::getenv("TAVISK_OUTER_SPACES");
-  if (outer == nullptr) return true;
+  if (!outer) return true;
   for (const char* space : {"/proc/self/ns/mnt", "/proc/self/ns/uts"})
     if (std::string(outer).find(std::filesystem::read_symlink(space)) != std::string::npos) return true;
   return false;

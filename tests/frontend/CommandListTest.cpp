@@ -20,7 +20,7 @@ TEST(CommandList, offersWordsThatTheCommandsAccept) {
       machine.describe(machineWithAllSwitches);
       const auto run = runTool(machine, {"-f", command.word, std::string(word)});
       EXPECT_EQ(run.status, 0) << run.output;
-      for (const char* const refusal : {"Error", "Invalid", "Not supported"})
+      for (const char* refusal : {"Error", "Invalid", "Not supported"})
         EXPECT_THAT(run.output, testing::Not(testing::HasSubstr(refusal))) << command.word;
     }
   }

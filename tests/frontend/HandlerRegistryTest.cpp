@@ -10,7 +10,6 @@
 #include "frontend/ServerCommands.h"
 
 namespace tavisk {
-
 namespace {
 
 CommandTable productTable() {

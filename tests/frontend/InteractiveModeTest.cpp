@@ -5,7 +5,6 @@
 #include "ToolRun.h"
 
 namespace tavisk {
-
 namespace {
 
 const std::string banner = "> tavisk\n> type -help for help.\n> ";

@@ -5,7 +5,6 @@
 #include "ToolRun.h"
 
 namespace tavisk {
-
 namespace {
 
 TEST(RemoteServerSettings, needsItsCommandTable) {

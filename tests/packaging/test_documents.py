@@ -58,7 +58,7 @@ class Manual(unittest.TestCase):
 
     def test_lists_the_files_that_the_program_writes(self):
         literals = re.compile(r'"(/[^"\s]*60-tavisk[^"\s]*)"')
-        written = {path for source in (SOURCES / "src/platform/linux").rglob("*.cpp")
+        written = {path for source in (SOURCES / "src/hosts/linux").rglob("*.h")
                    for path in literals.findall(source.read_text())}
         self.assertTrue(written)
         for path in written:

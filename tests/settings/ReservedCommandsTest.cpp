@@ -6,7 +6,6 @@
 #include "ToolRun.h"
 
 namespace tavisk {
-
 namespace {
 
 /// The handlers that no command reaches, called as a coming command would.

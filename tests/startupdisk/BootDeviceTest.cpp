@@ -4,8 +4,8 @@
 
 #include <thread>
 
-#include "StartupDiskTest.h"
 #include "startupdisk/SDImage.h"
+#include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
 namespace {
@@ -33,8 +33,8 @@ struct BootMachine : StartupMachine {
   }
   std::string variable(const char* name) {
     const auto variables = get("Firmware", "Variables");
-    const auto* const value = variables ? variables->asDictionary()->find(name) : nullptr;
-    return value == nullptr ? "none" : *value->asString();
+    const auto* value = variables ? variables->asDictionary()->find(name) : nullptr;
+    return !value ? "none" : *value->asString();
   }
 };
 
@@ -57,7 +57,7 @@ TEST(BootDevice, IsAskedOnceAndAnnounced) {
 }
 
 TEST(BootDevice, IsNoneWhereTheHostKnowsNone) {
-  for (const char* const disk : {"", "disk9s9"}) {
+  for (const char* disk : {"", "disk9s9"}) {
     BootMachine machine;
     machine.set("Firmware", "Boot Preference", *disk == '\0' ? Keys() : keys({{"Disk", disk}}));
     machine.controller();
@@ -131,12 +131,13 @@ TEST(BootDevice, IsChosenWithLanguageAndKeyboard) {
     EXPECT_EQ(machine.get("Firmware", "Boot Preference"),
               keys({{"Disk", "disk1s2"}, {"Folder", folder}, {"Lumara 9", false}}));
     EXPECT_EQ(machine.bootDevice(), "disk1s2 B");
-    EXPECT_THAT(machine.systemLog(),
-                ElementsAre("Setting Startup Disk: disk1s2 B",
-                            "***************************** Setting Startup Disk *****************************",
-                            "******         Volume: B", "******  System Folder: " + std::string(folder),
-                            "****** System Version: 10", "****** OF Device Path: IODeviceTree:/b",
-                            "currentBootDevice cached: disk1s2 B"));
+    EXPECT_THAT(
+        machine.systemLog(),
+        ElementsAre("Setting<std::string> Startup Disk: disk1s2 B",
+                    "***************************** Setting<std::string> Startup Disk *****************************",
+                    "******         Volume: B", "******  System Folder: " + std::string(folder),
+                    "****** System Version: 10", "****** OF Device Path: IODeviceTree:/b",
+                    "currentBootDevice cached: disk1s2 B"));
   }
 }
 

@@ -2,9 +2,9 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include "StartupDiskTest.h"
 #include "startupdisk/SDImage.h"
 #include "startupdisk/StartupDisk.h"
+#include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
 namespace {

@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include "StartupDiskTest.h"
+#include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
 namespace {
@@ -72,7 +72,7 @@ TEST(DiskRecord, IsMadeFromAnyPathOfItsVolume) {
 TEST(DiskRecord, FindsItsWholeDisk) {
   StartupMachine machine;
   machine.set("Disks", "disk7", keys({{"Whole Disk", "disk0"}}));
-  for (const char* const name : {"disk0s3", "sda2", "disk1", "disk2s"}) machine.set("Disks", name, Keys());
+  for (const char* name : {"disk0s3", "sda2", "disk1", "disk2s"}) machine.set("Disks", name, Keys());
   const std::pair<const char*, const char*> cases[] = {
       {"disk0s3", "disk0"}, {"disk1", "disk1"}, {"disk2s", "disk2s"}, {"sda2", "sda2"}, {"disk7", "disk0"}};
   for (const auto& [disk, whole] : cases) {

@@ -2,9 +2,9 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include "StartupDiskTest.h"
 #include "startupdisk/Firmware.h"
 #include "startupdisk/SDImage.h"
+#include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
 namespace {
@@ -61,7 +61,8 @@ TEST(NetworkImages, AreScannedForAtTheUsersInterval) {
     return "Wirestart rescan time interval set to " + std::string(seconds) + " seconds";
   };
   const auto tooOften = [](const char* seconds) {
-    return "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting Wirestart scan time to 20 "
+    return "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting<std::string> Wirestart "
+           "scan time to 20 "
            "seconds. User had requested " +
            std::string(seconds) + " seconds.";
   };
@@ -132,7 +133,7 @@ TEST(Firmware, ReadsAVariableFromWhatTheProgramPrints) {
     StartupMachine machine;
     machine.debug();
     machine.set("Firmware", "Pre-Boot Environment", test.firmware);
-    if (test.value != nullptr) machine.set("Firmware", "Variables", keys({{"boot-device", test.value}}));
+    if (test.value) machine.set("Firmware", "Variables", keys({{"boot-device", test.value}}));
     EXPECT_EQ(runNVRAMTool(machine.environment(), "boot-device"), test.read);
     EXPECT_EQ(machine.systemLog(), test.log);
   }

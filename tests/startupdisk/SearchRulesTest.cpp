@@ -5,7 +5,7 @@
 
 #include <functional>
 
-#include "StartupDiskTest.h"
+#include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
 namespace {

@@ -5,7 +5,7 @@
 #include <atomic>
 #include <thread>
 
-#include "StartupDiskTest.h"
+#include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
 namespace {
@@ -93,11 +93,10 @@ TEST(Searcher, AWorkerSearchesTheRootsOfVolumesOldestFirst) {
   machine.addVolume("disk0s1", "A", keys({{"Kind", "ntfs"}}));
   machine.addVolume("disk1", "B", disc);
   machine.addVolume("disk2s1", "C", keys({{"Kind", "msdos"}}));
-  for (const char* const volume : {"A", "C"}) machine.writeFile("/Volumes/" + std::string(volume) + "/SYSTEM.INI", "");
+  for (const char* volume : {"A", "C"}) machine.writeFile("/Volumes/" + std::string(volume) + "/SYSTEM.INI", "");
   RecordingDelegate delegate;
   const auto searcher = machine.searcher(delegate, true);
-  for (const char* const disk : {"disk0s1", "disk1", "disk2s1"})
-    searcher->searchForSystemOnVolume(machine.volume(disk));
+  for (const char* disk : {"disk0s1", "disk1", "disk2s1"}) searcher->searchForSystemOnVolume(machine.volume(disk));
 
   searcher->setSearchPaused(true);
   const Worker worker(*searcher, machine.volume("disk9"));
@@ -112,8 +111,7 @@ TEST(Searcher, AWorkerSearchesTheRootsOfVolumesOldestFirst) {
     windows.push_back(system->description() + *system->textForKey(recordkey::systemFolderPath));
   EXPECT_THAT(windows,
               testing::UnorderedElementsAre("disk0s1 A/Volumes/A", "disk1 B/Volumes/B", "disk2s1 C/Volumes/C"));
-  EXPECT_LT(std::find(windows.begin(), windows.end(), "disk0s1 A/Volumes/A"),
-            std::find(windows.begin(), windows.end(), "disk2s1 C/Volumes/C"));
+  EXPECT_LT(std::ranges::find(windows, "disk0s1 A/Volumes/A"), std::ranges::find(windows, "disk2s1 C/Volumes/C"));
 }
 
 TEST(Searcher, TheWorkersRoutineRunsForEver) {

@@ -5,7 +5,7 @@
 #include <cstdlib>
 #include <ctime>
 
-#include "StartupDiskTest.h"
+#include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
 namespace {

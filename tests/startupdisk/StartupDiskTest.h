@@ -6,7 +6,7 @@
 #include <vector>
 
 #include "ScratchMachine.h"
-#include "platform/NotificationCenter.h"
+#include "base/NotificationCenter.h"
 #include "startupdisk/SDController.h"
 #include "startupdisk/SDNotifications.h"
 
@@ -21,7 +21,7 @@ inline PropertyList::Dictionary keys(std::initializer_list<PropertyList::Diction
 }
 
 /// Hears from a searcher.
-class RecordingDelegate : public SystemSearcherProtocol {
+class RecordingDelegate final : public SystemSearcherProtocol {
  public:
   void searchCompleted() override { ++completions; }
   void searchActivity() override { ++activities; }
@@ -47,7 +47,7 @@ class StartupMachine : public ScratchMachine {
   void installLumaraX(const std::string& mountPoint) {
     const auto folder = directory() + "/root" + mountPoint + coreServicesFolder;
     std::filesystem::create_directories(folder);
-    for (const char* const name : {"/boot.efi", "/BootX", "/mach_kernel"}) std::ofstream(folder + name).flush();
+    for (const char* name : {"/boot.efi", "/BootX", "/mach_kernel"}) std::ofstream(folder + name).flush();
   }
   void addLumaraX(const std::string& disk, const std::string& name, const Keys& other = {}) {
     addVolume(disk, name, other);
@@ -98,8 +98,8 @@ class NotificationRecorder {
 
  private:
   void note(const Notification& notification) {
-    const auto* const record = std::any_cast<SDRecordRef>(&notification.object);
-    _lines.push_back(notification.name + (record == nullptr ? "" : " " + (*record)->description()));
+    const auto* record = std::any_cast<SDRecordRef>(&notification.object);
+    _lines.push_back(notification.name + (!record ? "" : " " + (*record)->description()));
   }
 
   NotificationCenter& _center;

@@ -1,0 +1,38 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+#include <utility>
+
+#include "base/Result.h"
+
+namespace tavisk {
+
+/// Owns an open file descriptor, or none.
+class FileDescriptor {
+ public:
+  FileDescriptor() = default;
+  explicit FileDescriptor(int number) : _number(number) {}
+  FileDescriptor(FileDescriptor&& other) noexcept : _number(std::exchange(other._number, -1)) {}
+  FileDescriptor& operator=(FileDescriptor&& other) noexcept;
+  FileDescriptor(const FileDescriptor&) = delete;
+  FileDescriptor& operator=(const FileDescriptor&) = delete;
+  ~FileDescriptor();
+
+  explicit operator bool() const { return _number >= 0; }
+  int number() const { return _number; }
+
+ private:
+  int _number = -1;
+};
+
+/// Everything from the descriptor's place to the end, at most `limit` bytes. `path` is what failures name.
+Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const std::string& path);
+
+/// Every byte, however many calls it takes.
+Result<void> writeAll(const FileDescriptor& file, std::string_view contents, const std::string& path);
+
+}  // namespace tavisk

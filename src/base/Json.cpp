@@ -1,0 +1,90 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "base/Json.h"
+
+#include <optional>
+
+#include "base/Text.h"
+
+namespace tavisk {
+namespace {
+
+constexpr char32_t replacementCharacter = 0xFFFD;
+
+/// The letter of the two-character escape (RFC 8259, 7); 0 when there is none.
+char shortEscape(char32_t codePoint) {
+  switch (codePoint) {
+    case '"':
+    case '\\':
+      return static_cast<char>(codePoint);
+    case '\b':
+      return 'b';
+    case '\f':
+      return 'f';
+    case '\n':
+      return 'n';
+    case '\r':
+      return 'r';
+    case '\t':
+      return 't';
+    default:
+      return 0;
+  }
+}
+
+void appendNumericEscape(std::string& json, char32_t codePoint) {
+  json += "\\u";
+  for (unsigned shift = 16; shift > 0; shift -= 4) json += "0123456789abcdef"[(codePoint >> (shift - 4)) & 0xFU];
+}
+
+void appendCharacter(std::string& json, char32_t codePoint) {
+  if (const char letter = shortEscape(codePoint); letter != 0) {
+    json += {'\\', letter};
+  } else if (isControl(codePoint)) {
+    appendNumericEscape(json, codePoint);
+  } else {
+    appendUtf8(json, codePoint);
+  }
+}
+
+char32_t takeCharacter(std::string_view& text) {
+  if (const std::optional<char32_t> codePoint = takeCodePoint(text)) return *codePoint;
+  text.remove_prefix(1);
+  return replacementCharacter;
+}
+
+void appendString(std::string& json, std::string_view text) {
+  json += '"';
+  while (!text.empty()) appendCharacter(json, takeCharacter(text));
+  json += '"';
+}
+
+}  // namespace
+
+JsonObject& JsonObject::text(std::string_view name, std::string_view value) {
+  this->name(name);
+  appendString(_members, value);
+  return *this;
+}
+
+JsonObject& JsonObject::integer(std::string_view name, std::int64_t value) {
+  return json(name, std::to_string(value));
+}
+
+JsonObject& JsonObject::boolean(std::string_view name, bool value) {
+  return json(name, value ? "true" : "false");
+}
+
+JsonObject& JsonObject::json(std::string_view name, std::string_view value) {
+  this->name(name);
+  _members += value;
+  return *this;
+}
+
+void JsonObject::name(std::string_view name) {
+  if (_members.size() > 1) _members += ',';
+  appendString(_members, name);
+  _members += ':';
+}
+
+}  // namespace tavisk

@@ -1,0 +1,77 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <concepts>
+#include <optional>
+#include <string>
+#include <system_error>
+#include <utility>
+#include <variant>
+
+namespace tavisk {
+
+/// Why something did not work: built where it happens, shown once.
+/// "No permission" is a reason, not a kind of its own.
+struct Failure {
+  std::string tried;  ///< what was tried: "rename", "SetTimezone"
+  std::string on;     ///< on what: a path, a unit, a bus object
+  std::string why;    ///< the system's reason: "Read-only file system"
+  /// What a program may ask, where the texts are for people: of a system call its errno value, in the generic category;
+  /// no error where none is told apart.
+  std::error_code code = {};
+
+  bool operator==(const Failure&) const = default;
+};
+
+/// The failure of a system call, with the system's own words for `error` (an errno value).
+Failure systemFailure(std::string tried, std::string on, int error);
+
+/// Whether the failure says that there is no such file: the file or a folder of its path is not there.
+bool isAbsent(const Failure& failure);
+
+/// "TRIED on ON: WHY", escaped() and on one line; an empty `on` is left out.
+std::string describe(const Failure& failure);
+
+/// A value, or the reason why there is none.
+template <typename Value>
+class [[nodiscard]] Result {
+ public:
+  // Both conversions are wanted: `return value;` and `return Failure{...};`.
+  Result(Value value) : _state(std::in_place_index<0>, std::move(value)) {}
+  Result(Failure failure) : _state(std::in_place_index<1>, std::move(failure)) {}
+  /// What is nearly the value: a text where there may be none, an answer of a narrower type.
+  template <typename Other>
+  requires std::convertible_to<Other, Value> &&(!std::convertible_to<Other, Failure>)Result(Other&& value)
+      : _state(std::in_place_index<0>, std::forward<Other>(value)) {}
+  template <typename Other>
+  requires std::convertible_to<Other, Value> &&(!std::same_as<Other, Value>)Result(Result<Other> other)
+      : Result(other ? Result(std::move(other).value()) : Result(other.failure())) {}
+
+  explicit operator bool() const { return _state.index() == 0; }
+  const Value& value() const& { return std::get<0>(_state); }
+  Value&& value() && { return std::get<0>(std::move(_state)); }
+  const Value* operator->() const { return &value(); }
+  const Value& operator*() const& { return value(); }
+  const Failure& failure() const { return std::get<1>(_state); }
+  Value valueOr(Value otherwise) const { return *this ? value() : std::move(otherwise); }
+
+ private:
+  std::variant<Value, Failure> _state;
+};
+
+/// Success, or the reason why not.
+template <>
+class [[nodiscard]] Result<void> {
+ public:
+  Result() = default;
+  Result(Failure failure) : _failure(std::move(failure)) {}
+
+  explicit operator bool() const { return !_failure; }
+  const Failure& failure() const { return *_failure; }
+
+ private:
+  std::optional<Failure> _failure;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,76 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "base/SignalWaiter.h"
+
+#include <unistd.h>
+
+#include <cstring>
+#include <ctime>
+#include <exception>
+#include <system_error>
+#include <utility>
+
+namespace tavisk {
+namespace {
+constexpr timespec endTakesAtMost{.tv_sec = 0, .tv_nsec = 80'000'000};
+}
+
+EndingSignals::EndingSignals() : _set() {
+  sigemptyset(&_set);
+  sigaddset(&_set, SIGINT);
+  sigaddset(&_set, SIGTERM);
+  struct sigaction hangUp {};
+  if (sigaction(SIGHUP, nullptr, &hangUp) != 0 || hangUp.sa_handler != SIG_IGN) sigaddset(&_set, SIGHUP);
+  pthread_sigmask(SIG_BLOCK, &_set, nullptr);
+}
+
+void EndingSignals::unblock() const {
+  pthread_sigmask(SIG_UNBLOCK, &_set, nullptr);
+}
+
+std::unique_ptr<SignalWaiter> SignalWaiter::start(const EndingSignals& signals, End end, Status status) {
+  try {
+    return std::unique_ptr<SignalWaiter>(new SignalWaiter(signals, std::move(end), std::move(status)));
+  } catch (const std::system_error&) {
+    return nullptr;
+  }
+}
+
+SignalWaiter::SignalWaiter(const EndingSignals& signals, End end, Status status)
+    : _signals(signals.set()), _end(std::move(end)), _status(std::move(status)), _thread([this] { wait(); }) {}
+
+SignalWaiter::~SignalWaiter() {
+  State expected = State::waiting;
+  if (_state.compare_exchange_strong(expected, State::stopped)) pthread_kill(_thread.native_handle(), SIGINT);
+  _thread.join();
+}
+
+void SignalWaiter::wait() {
+  sigset_t all;
+  sigfillset(&all);
+  pthread_sigmask(SIG_BLOCK, &all, nullptr);
+  int signal = 0;
+  sigwait(&_signals, &signal);
+  State expected = State::waiting;
+  if (_state.compare_exchange_strong(expected, State::ending)) endProcess(std::string("SIG") + sigabbrev_np(signal));
+}
+
+void SignalWaiter::endProcess(const std::string& signal) {
+  const auto end = [this, signal] {
+    try {
+      _end(signal);
+    } catch (const std::exception&) {
+      // What cannot be done any more is left undone.
+    }
+    _exit(_status());
+  };
+  try {
+    std::thread(end).detach();
+  } catch (const std::system_error&) {
+    end();
+  }
+  sigtimedwait(&_signals, nullptr, &endTakesAtMost);
+  _exit(_status());
+}
+
+}  // namespace tavisk

@@ -1,0 +1,171 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "base/Text.h"
+
+#include <algorithm>
+#include <array>
+#include <charconv>
+#include <limits>
+
+namespace tavisk {
+namespace {
+
+constexpr std::string_view whiteSpace = " \t\n\v\f\r";
+constexpr char32_t lastCodePoint = 0x10FFFF;
+
+bool isBetween(char32_t codePoint, char32_t first, char32_t last) {
+  return codePoint >= first && codePoint <= last;
+}
+
+bool isSurrogate(char32_t codePoint) {
+  return isBetween(codePoint, 0xD800, 0xDFFF);
+}
+
+/// The length of the sequence that a first byte announces; 0 when no sequence begins with it.
+std::size_t sequenceLength(unsigned char first) {
+  if (first < 0x80) return 1;
+  if (first < 0xC2) return 0;
+  if (first < 0xE0) return 2;
+  if (first < 0xF0) return 3;
+  return first < 0xF5 ? 4 : 0;
+}
+
+bool isShortestForm(char32_t codePoint, std::size_t length) {
+  constexpr std::array<char32_t, 5> smallest{0, 0, 0x80, 0x800, 0x10000};
+  return codePoint >= smallest[length];
+}
+
+void appendEscapedByte(std::string& text, char32_t byte) {
+  text += "\\x" + hexDigits(byte, 2);
+}
+
+void appendEscapedControl(std::string& text, char32_t control) {
+  if (control < 0x80) return appendEscapedByte(text, control);
+  text += "\\u{" + hexDigits(control, 4) + "}";
+}
+
+char lowerCased(char letter) {
+  return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter - 'A' + 'a') : letter;
+}
+
+}  // namespace
+
+std::optional<char32_t> takeCodePoint(std::string_view& bytes) {
+  if (bytes.empty()) return std::nullopt;
+  const auto first = static_cast<unsigned char>(bytes.front());
+  const std::size_t length = sequenceLength(first);
+  if (length == 0 || length > bytes.size()) return std::nullopt;
+  char32_t codePoint = length == 1 ? first : first & (0x7FU >> length);
+  for (std::size_t place = 1; place < length; ++place) {
+    const auto next = static_cast<unsigned char>(bytes[place]);
+    if ((next & 0xC0U) != 0x80U) return std::nullopt;
+    codePoint = (codePoint << 6U) | (next & 0x3FU);
+  }
+  if (!isShortestForm(codePoint, length) || isSurrogate(codePoint) || codePoint > lastCodePoint) return std::nullopt;
+  bytes.remove_prefix(length);
+  return codePoint;
+}
+
+void appendUtf8(std::string& text, char32_t codePoint) {
+  const auto append = [&text](char32_t byte) { text += static_cast<char>(static_cast<unsigned char>(byte)); };
+  const auto appendTail = [&append, codePoint](unsigned shift) { append(0x80U | ((codePoint >> shift) & 0x3FU)); };
+  if (codePoint < 0x80) return append(codePoint);
+  if (codePoint < 0x800) {
+    append(0xC0U | (codePoint >> 6U));
+  } else if (codePoint < 0x10000) {
+    append(0xE0U | (codePoint >> 12U));
+    appendTail(6);
+  } else {
+    append(0xF0U | (codePoint >> 18U));
+    appendTail(12);
+    appendTail(6);
+  }
+  appendTail(0);
+}
+
+bool isUtf8(std::string_view bytes) {
+  while (!bytes.empty()) {
+    if (!takeCodePoint(bytes)) return false;
+  }
+  return true;
+}
+
+bool isControl(char32_t codePoint) {
+  return codePoint < 0x20 || isBetween(codePoint, 0x7F, 0x9F) || codePoint == 0x061C ||
+         isBetween(codePoint, 0x200E, 0x200F) || isBetween(codePoint, 0x2028, 0x202E) ||
+         isBetween(codePoint, 0x2066, 0x2069);
+}
+
+std::string escaped(std::string_view text) {
+  std::string result;
+  result.reserve(text.size());
+  while (!text.empty()) {
+    const auto byte = static_cast<unsigned char>(text.front());
+    const std::optional<char32_t> codePoint = takeCodePoint(text);
+    if (!codePoint) {
+      appendEscapedByte(result, byte);
+      text.remove_prefix(1);
+    } else if (isControl(*codePoint)) {
+      appendEscapedControl(result, *codePoint);
+    } else {
+      if (*codePoint == '\\') result += '\\';
+      appendUtf8(result, *codePoint);
+    }
+  }
+  return result;
+}
+
+std::string hexDigits(std::uint64_t number, std::size_t leastDigits) {
+  std::string digits;
+  for (; number != 0 || digits.size() < leastDigits; number >>= 4U) digits += "0123456789abcdef"[number & 15U];
+  return {digits.rbegin(), digits.rend()};
+}
+
+std::string upperCased(std::string_view text) {
+  std::string result(text);
+  std::ranges::transform(result, result.begin(), [](char letter) {
+    return letter >= 'a' && letter <= 'z' ? static_cast<char>(letter - 'a' + 'A') : letter;
+  });
+  return result;
+}
+
+std::string lowerCased(std::string_view text) {
+  std::string result(text);
+  std::ranges::transform(result, result.begin(), [](char letter) { return lowerCased(letter); });
+  return result;
+}
+
+int compareIgnoringCase(std::string_view left, std::string_view right) {
+  return lowerCased(left).compare(lowerCased(right));
+}
+
+std::int64_t leadingInteger(std::string_view text) {
+  text.remove_prefix(std::min(text.find_first_not_of(whiteSpace), text.size()));
+  const bool isNegative = text.starts_with('-');
+  if (text.starts_with('+')) {
+    text.remove_prefix(1);
+    if (text.starts_with('-')) return 0;
+  }
+  std::int64_t value = 0;
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), value);
+  if (error != std::errc::result_out_of_range) return value;
+  return isNegative ? std::numeric_limits<std::int64_t>::min() : std::numeric_limits<std::int64_t>::max();
+}
+
+std::string_view trimmed(std::string_view text) {
+  text.remove_prefix(std::min(text.find_first_not_of(whiteSpace), text.size()));
+  return text.substr(0, text.find_last_not_of(whiteSpace) + 1);
+}
+
+std::vector<std::string> split(std::string_view text, std::string_view separators) {
+  std::vector<std::string> pieces;
+  while (true) {
+    text.remove_prefix(std::min(text.find_first_not_of(separators), text.size()));
+    if (text.empty()) return pieces;
+    const std::size_t length = std::min(text.find_first_of(separators), text.size());
+    pieces.emplace_back(text.substr(0, length));
+    text.remove_prefix(length);
+  }
+}
+
+}  // namespace tavisk

@@ -1,0 +1,63 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <charconv>
+#include <concepts>
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <system_error>
+#include <vector>
+
+namespace tavisk {
+
+/// Well-formed UTF-8 (RFC 3629: no overlong forms, no surrogates, at most U+10FFFF).
+bool isUtf8(std::string_view bytes);
+
+/// Takes one well-formed code point off the front; absent, and nothing taken, when none stands there.
+std::optional<char32_t> takeCodePoint(std::string_view& bytes);
+
+/// `codePoint` is at most U+10FFFF and no surrogate.
+void appendUtf8(std::string& text, char32_t codePoint);
+
+/// A code point that may change what a terminal shows of other text: C0 and C1 controls, DEL, line and paragraph
+/// separators, bidirectional controls. All are below U+10000.
+bool isControl(char32_t codePoint);
+
+/// A text that is not ours, made harmless for a terminal, a log or a report: what isControl() names and bytes that
+/// are not UTF-8 become \xNN or \u{NNNN}, a backslash is doubled. No control byte leaves it.
+std::string escaped(std::string_view text);
+
+/// ASCII letters in lower or capital letters; all other bytes stay.
+std::string lowerCased(std::string_view text);
+std::string upperCased(std::string_view text);
+
+/// Less than, equal to or greater than 0, by ASCII letters without regard to case.
+int compareIgnoringCase(std::string_view left, std::string_view right);
+
+/// The usual leading-integer conversion: white space, an optional sign, digits; 0 when there are none. Saturates at the
+/// limits of 64 bits.
+std::int64_t leadingInteger(std::string_view text);
+
+/// The whole text as a number in digits of the base, with "-" before it where the type has a sign; absent when it is
+/// anything else or does not fit.
+template <std::integral Number>
+std::optional<Number> parseNumber(std::string_view text, int base = 10) {
+  Number number{};
+  const auto* last = text.data() + text.size();
+  const auto [end, error] = std::from_chars(text.data(), last, number, base);
+  return error == std::errc() && end == last ? std::optional(number) : std::nullopt;
+}
+
+/// In hexadecimal digits, small letters, at least so many of them.
+std::string hexDigits(std::uint64_t number, std::size_t leastDigits = 1);
+
+/// Without the white space at both ends; part of the text that was given.
+std::string_view trimmed(std::string_view text);
+
+/// The pieces between runs of any of the separator characters; no empty pieces.
+std::vector<std::string> split(std::string_view text, std::string_view separators);
+
+}  // namespace tavisk

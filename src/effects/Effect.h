@@ -1,0 +1,44 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "base/Result.h"
+
+namespace tavisk {
+
+enum class Outcome { applied, unchanged, notSupported, failed };
+
+/// The word that effects, reports and logs use: "applied", "unchanged", "not supported", "failed".
+const char* nameOf(Outcome outcome);
+
+/// What a change of one setting really did, or why a read failed. A text that is absent was not known or does not
+/// apply.
+struct Effect {
+  std::string setting;  ///< one of platform/SettingNames.h
+  Outcome outcome = Outcome::applied;
+  std::optional<std::string> before;  ///< the live value before
+  std::optional<std::string> asked;   ///< the value asked for; absent for a read
+  std::optional<std::string> live;    ///< the live value, read back
+  std::optional<std::string> stored;  ///< the stored value, read back
+  std::string where;                  ///< where it is stored, so that it survives a restart
+  std::string undoneBy;               ///< what else on this machine may undo it; empty: nothing known
+  std::string note;                   ///< what an administrator should know besides
+  std::optional<Failure> failure;     ///< set when failed or not supported
+};
+
+/// A setting as a getter found it.
+struct SettingValue {
+  std::string setting;
+  std::optional<std::string> live;
+  std::optional<std::string> stored;
+  std::string unit;  ///< "minutes", "seconds since 1970"; empty for words and names
+};
+
+/// One line of JSON without a newline; absent and empty members are left out.
+std::string toJson(const Effect& effect);
+std::string toJson(const SettingValue& value);
+
+}  // namespace tavisk

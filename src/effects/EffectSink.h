@@ -1,0 +1,55 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <mutex>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "effects/Effect.h"
+
+namespace tavisk {
+
+/// Somewhere that effects go: the journal, effects.log, the terminal, the report.
+/// Calls come one at a time, from the main thread or from the thread that ends the run.
+class EffectChannel {
+ public:
+  virtual ~EffectChannel() = default;
+  virtual void changeBegins(const std::string& setting, const std::string& asked);
+  virtual void record(const Effect& effect) = 0;
+  virtual void observe(const SettingValue& value);
+};
+
+/// Where hosts tell what really happened. It hands everything on to its channels and remembers the changes that have
+/// begun and not ended, so that a run which is ended in the middle leaves its trace.
+class EffectSink {
+ public:
+  /// The channel is not owned and must outlive the sink's last use.
+  void addChannel(EffectChannel& channel);
+
+  void changeBegins(const std::string& setting, const std::string& asked);
+  /// The end of the change that began under this name, or a failed read.
+  void record(const Effect& effect);
+  /// A failed effect: a read that failed, or a write that has nothing to be read back.
+  void recordFailure(const std::string& setting, const Failure& failure,
+                     const std::optional<std::string>& asked = std::nullopt);
+  /// That nothing was changed, as the machine cannot have the setting.
+  void recordUnsupported(const std::string& setting, const Failure& reason);
+  /// A value that a getter read.
+  void observe(const SettingValue& value);
+
+  /// Records every change that has begun and not ended as failed for this reason. Safe from any thread.
+  void interrupt(const std::string& why);
+
+ private:
+  struct OpenChange {
+    std::string setting;
+    std::string asked;
+  };
+  std::mutex _mutex;
+  std::vector<EffectChannel*> _channels;
+  std::vector<OpenChange> _open;
+};
+
+}  // namespace tavisk

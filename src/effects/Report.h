@@ -1,0 +1,74 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <mutex>
+#include <optional>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "base/Result.h"
+#include "effects/EffectSink.h"
+
+namespace tavisk {
+
+/// What a run did, for other programs: one JSON object a command, each on its own line and appended by one write.
+///
+/// Members, in this order; those marked * only where they apply:
+///   report     1, the version of this format
+///   command *  the word as it was typed
+///   argument * the argument as it was typed, when the command takes one
+///   handler *  the selector
+///   error *    why the word or the whole run was refused
+///   signal *   the signal that ended the run ("SIGTERM"); command, argument and handler are those it interrupted
+///   failed     the error flag afterwards; true when the run was refused
+///   changed    whether an effect was applied
+///   values     array of what was read: setting, live, stored, unit
+///   effects    array of what was changed, or could not be changed or read; see Effect. A failure between two commands
+///              is told with the next one
+///   output     the printed text, at most its first MiB
+/// Texts that are not UTF-8 have U+FFFD for the bytes in question.
+class Report final : public EffectChannel {
+ public:
+  /// `destination` is the path of a regular file, which is made (mode 0600) or appended to and must not be a link, or
+  /// "fd:N" for a descriptor that is open for writing; that one is not closed.
+  static Result<std::unique_ptr<Report>> open(const std::string& destination);
+  ~Report() override;
+  Report(const Report&) = delete;
+  Report& operator=(const Report&) = delete;
+
+  /// From here to the end, effects and values belong to this command.
+  void commandBegins(const std::string& command, std::span<const std::string> arguments, const std::string& handler);
+  /// Does nothing when no command has begun.
+  void commandEnds(bool failed, const std::string& output);
+  void wordRefused(const std::string& word, bool failed, const std::string& output);
+  void runRefused(const std::string& error, const std::string& output);
+  /// From any thread.
+  void runEndedBySignal(const std::string& signal, bool failed, const std::string& output);
+
+  void record(const Effect& effect) override;
+  void observe(const SettingValue& value) override;
+
+ private:
+  /// What is gathered for the next object. A text that is absent is left out.
+  struct Entry {
+    std::optional<std::string> command, argument, handler, error, signal;
+    bool changed = false;
+    std::vector<std::string> values;   ///< JSON
+    std::vector<std::string> effects;  ///< JSON
+  };
+
+  Report(int descriptor, bool owned) : _descriptor(descriptor), _owned(owned) {}
+  static std::string toJson(const Entry& entry, bool failed, const std::string& output);
+  Entry takeEntry();
+  void append(const Entry& entry, bool failed, const std::string& output) const;
+
+  const int _descriptor;
+  const bool _owned;
+  std::mutex _mutex;  // guards _entry
+  Entry _entry;
+};
+
+}  // namespace tavisk

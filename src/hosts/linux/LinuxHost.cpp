@@ -1,0 +1,43 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/LinuxHost.h"
+
+namespace tavisk {
+
+LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& root)
+    : _root(root),
+      _journalLog(_root),
+      _services(_root, runLoop),
+      _machine{_root, effects, runLoop, _services},
+      _authenticator(_machine),
+      _files(_root),
+      _systemLog(_root),
+      _clock(_machine),
+      _networkTime(_machine),
+      _remoteShell(_machine),
+      _remoteEvents(_machine),
+      _hostConfiguration(_machine),
+      _dynamicStore(_machine),
+      _console(_root),
+      _networkCards(_root),
+      _controllerLink(_root, runLoop),
+      _controller(_controllerLink),
+      _powerSettings(_machine, {_console, _networkCards, _controller}),
+      _powerController(_machine, _controller),
+      _bootLoaderFile(_machine),
+      _disks(_machine),
+      _diskEvents(_machine, _disks),
+      _diskManagement(_machine, _disks),
+      _registry(_root),
+      _networkInterfaces(effects),
+      _kernel(_root),
+      _keyboardInput(_root),
+      _userDefaults(_root),
+      _programs(_machine),
+      _processTermination(_machine),
+      _preferences(_machine),
+      _processes(_machine, _preferences, _controller) {
+  effects.addChannel(_journalLog);
+}
+
+}  // namespace tavisk

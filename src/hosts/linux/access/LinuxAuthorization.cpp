@@ -1,0 +1,88 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+
+#include "hosts/linux/access/LinuxAuthorization.h"
+
+#include <grp.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <utility>
+
+#include "effects/SettingNames.h"
+#include "hosts/linux/access/Polkit.h"
+
+namespace tavisk {
+namespace {
+
+// Groups with many thousands of members exist; beyond this the answer is not believed.
+constexpr std::size_t largestGroupEntry = std::size_t{64} << 20U;
+
+constexpr const char* action = "org.tavisk.manage";
+
+}  // namespace
+
+UserId LinuxUserDatabase::realUserId() {
+  return ::getuid();
+}
+
+std::optional<std::vector<GroupId>> LinuxUserDatabase::supplementaryGroups(std::size_t room) {
+  std::vector<GroupId> groups(room);
+  int count = ::getgroups(static_cast<int>(room), groups.data());
+  if (count < 0 || static_cast<std::size_t>(count) > room) return std::nullopt;
+  groups.resize(static_cast<std::size_t>(count));
+  return groups;
+}
+
+std::optional<GroupId> LinuxUserDatabase::groupNamed(const std::string& name) {
+  group entry{};
+  group* found = nullptr;
+  std::vector<char> texts(4096);
+  while (::getgrnam_r(name.c_str(), &entry, texts.data(), texts.size(), &found) == ERANGE) {
+    if (texts.size() >= largestGroupEntry) return std::nullopt;
+    texts.resize(texts.size() * 2);
+  }
+  if (!found) return std::nullopt;
+  return found->gr_gid;
+}
+
+void LinuxAdminAuthenticator::authenticate() {
+  auto authorized = ::getuid() == 0 ? Result<void>() : authorize();
+  _authenticated = static_cast<bool>(authorized);
+  if (!authorized) recordRefusal(authorized.failure());
+}
+
+Result<void> LinuxAdminAuthenticator::authorize() {
+  auto bus = _machine.services.systemBus();
+  if (!bus) return {};  // without a bus there is no polkit
+  if ((*bus)->isInteractive()) _agent.emplace(_machine.root, _machine.runLoop);
+  auto answer = checkAuthorization(**bus, action);
+  if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return {};
+  if (!answer) return answer.failure();
+  const std::scoped_lock lock(_mutex);
+  _temporaryId = answer->temporaryId;
+  if (!answer->granted) return Failure{"authorize", action, "polkit does not grant it to this user"};
+  return {};
+}
+
+void LinuxAdminAuthenticator::recordRefusal(const Failure& failure) {
+  Effect effect;
+  effect.setting = setting::authorization;
+  effect.outcome = Outcome::failed;
+  effect.failure = failure;
+  _machine.effects.record(effect);
+}
+
+/// Over a connection of its own: the main thread may be in the middle of a call on the usual one. What cannot be given
+/// back ends with the process.
+void LinuxAdminAuthenticator::deauthenticate() {
+  _authenticated = false;
+  std::unique_lock lock(_mutex);
+  const auto id = std::exchange(_temporaryId, {});
+  lock.unlock();
+  if (id.empty()) return;
+  auto bus = _machine.services.openSystemBus();
+  if (bus) static_cast<void>(revokeAuthorization(**bus, id));
+}
+
+}  // namespace tavisk

@@ -1,0 +1,208 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+
+#include "hosts/linux/access/LinuxRemoteAccess.h"
+
+#include <algorithm>
+
+#include "base/Text.h"
+#include "effects/SettingNames.h"
+#include "hosts/linux/services/ServicesConfig.h"
+#include "hosts/linux/system/OnOff.h"
+#include "hosts/linux/system/Program.h"
+#include "hosts/linux/system/Rights.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* serverConfig = "/etc/ssh/sshd_config";
+constexpr std::size_t configLimit = std::size_t{1} << 20U;
+// The sessions of the server are processes of the same name: its own is in the file.
+constexpr const char* serverProcess = "/run/sshd.pid";
+
+std::vector<Daemon> openSshUnits() {
+  return {{"ssh.service", "ssh", "sshd", serverProcess},
+          {"ssh.socket", "", ""},
+          {"sshd.service", "sshd", "sshd", serverProcess},
+          {"sshd.socket", "", ""}};
+}
+
+bool hasHostKey(const SystemRoot& root) {
+  const auto isKey = [](const std::string& name) { return name.starts_with("ssh_host_") && name.ends_with("_key"); };
+  return std::ranges::any_of(root.list("/etc/ssh").valueOr({}), isKey);
+}
+
+/// Whether the administrator keeps the keys elsewhere (sshd_config(5)).
+bool namesHostKeys(const SystemRoot& root) {
+  const auto names = [](const std::string& line) {
+    const auto words = split(line, " \t\r=\"");
+    return !words.empty() && lowerCased(words.front()) == "hostkey";
+  };
+  return std::ranges::any_of(split(root.read(serverConfig, configLimit).valueOr(""), "\n"), names);
+}
+
+}  // namespace
+
+Result<DaemonGroup> LinuxRemoteShellService::knownServer() {
+  auto& daemons = _machine.services.daemons();
+  auto units = configuredUnits(_machine.root, "remote-shell");
+  if (!units) return units.failure();
+  return units->empty() ? DaemonGroup(daemons, openSshUnits()) : DaemonGroup(daemons, std::move(units).value());
+}
+
+Result<DaemonGroup> LinuxRemoteShellService::server() {
+  const auto known = knownServer();
+  return known ? known->present() : known;
+}
+
+template <typename Answer, typename Use>
+Result<Answer> LinuxRemoteShellService::withServer(Use use) {
+  const auto found = server();
+  if (!found) return found.failure();
+  return use(*found);
+}
+
+std::optional<Failure> LinuxRemoteShellService::whyNotSupported() {
+  const auto known = knownServer();
+  const auto found = server();
+  if (!known || !found || !found->members().empty()) return std::nullopt;
+  return Failure{"find an SSH server", known->names(), "none of them is installed"};
+}
+
+Result<bool> LinuxRemoteShellService::isOnInAnyWay() {
+  return withServer<bool>([](const DaemonGroup& server) -> Result<bool> {
+    const auto starting = server.startingAtBoot();
+    if (!starting) return starting.failure();
+    const auto running = server.running();
+    if (!running) return running.failure();
+    return !starting->empty() || !running->empty();
+  });
+}
+
+bool LinuxRemoteShellService::isEnabled() {
+  Setting<std::string> setting;
+  setting.name = setting::remoteLogin;
+  setting.live = [this] { return asOnOff(isOnInAnyWay()); };
+  return observe(setting, _machine.effects) == onOff(true);
+}
+
+void LinuxRemoteShellService::setEnabled(bool enabled) {
+  const auto anyOf = [this](Result<std::vector<Daemon>> (DaemonGroup::*those)() const) {
+    return asOnOff(withServer<bool>([those](const DaemonGroup& server) -> Result<bool> {
+      const auto found = (server.*those)();
+      return found ? Result<bool>(!found->empty()) : found.failure();
+    }));
+  };
+  Setting<std::string> setting;
+  setting.name = setting::remoteLogin;
+  setting.supported = [this] { return whyNotSupported(); };
+  setting.live = [&] { return anyOf(&DaemonGroup::running); };
+  setting.stored = [&] { return anyOf(&DaemonGroup::startingAtBoot); };
+  setting.store = [&](const std::string&) { return store(enabled); };
+  setting.apply = [&](const std::string&) { return apply(enabled); };
+  if (!enabled) setting.note = saying("open sessions stay open");
+  carryOut(setting, onOff(enabled), _machine.effects, _machine.runLoop);
+}
+
+Result<void> LinuxRemoteShellService::store(bool enabled) {
+  return withServer<void>([&](const DaemonGroup& server) -> Result<void> {
+    if (!enabled) return server.setAllStartAtBoot(false);
+    if (auto keys = ensureHostKeys(); !keys) return keys;
+    const auto starting = server.startingAtBoot();
+    if (!starting) return starting.failure();
+    if (!starting->empty()) return {};
+    return _machine.services.daemons().setStartAtBoot({server.members().front()}, true);
+  });
+}
+
+/// Starts what will start with the machine too.
+Result<void> LinuxRemoteShellService::apply(bool enabled) {
+  return withServer<void>([&](const DaemonGroup& server) -> Result<void> {
+    if (!enabled) return server.stopAll();
+    const auto running = server.running();
+    if (!running) return running.failure();
+    if (!running->empty()) return {};
+    const auto starting = server.startingAtBoot();
+    if (!starting) return starting.failure();
+    return _machine.services.daemons().start(starting->empty() ? server.members().front() : starting->front());
+  });
+}
+
+Result<void> LinuxRemoteShellService::ensureHostKeys() {
+  const bool isOtherServer = !_machine.root.exists("/usr/sbin/sshd");
+  if (isOtherServer || hasHostKey(_machine.root) || namesHostKeys(_machine.root)) return {};
+  constexpr const char* maker = "/usr/bin/ssh-keygen";
+  if (auto failure = whyNeedsRoot("make host keys", "/etc/ssh")) return *failure;
+  const auto made = runProgram(_machine.root, {maker, "-A"}, _machine.runLoop);
+  if (!made) return made.failure();
+  if (hasHostKey(_machine.root)) return {};
+  return Failure{"make host keys", maker, "it reported success, but there is no key in /etc/ssh"};
+}
+
+Result<DaemonGroup> LinuxRemoteEventsService::units() {
+  auto units = configuredUnits(_machine.root, "remote-events");
+  if (!units) return units.failure();
+  return DaemonGroup(_machine.services.daemons(), std::move(units).value());
+}
+
+std::optional<Failure> LinuxRemoteEventsService::whyNotSupported() {
+  const auto named = units();
+  if (!named) return std::nullopt;
+  if (named->members().empty()) return Failure{"find units", servicesConfig, "it names none for remote-events"};
+  const auto present = named->present();
+  if (!present || present->members().size() == named->members().size()) return std::nullopt;
+  return Failure{"find units", named->names(), "not all of them are installed"};
+}
+
+Result<std::optional<std::string>> LinuxRemoteEventsService::live() {
+  const auto named = units();
+  if (!named) return named.failure();
+  const auto running = named->running();
+  if (!running) return running.failure();
+  if (!running->empty() && running->size() < named->members().size()) return std::optional<std::string>("partly on");
+  return asOnOff(!running->empty());
+}
+
+/// That of the first unit: a service that its socket starts is never enabled itself.
+Result<bool> LinuxRemoteEventsService::startsAtBoot() {
+  const auto named = units();
+  if (!named) return named.failure();
+  if (named->members().empty()) return false;
+  return _machine.services.daemons().startsAtBoot(named->members().front());
+}
+
+Result<bool> LinuxRemoteEventsService::isOnInAnyWay() {
+  auto starts = startsAtBoot();
+  if (!starts || *starts) return starts;
+  const auto named = units();
+  if (!named) return named.failure();
+  if (named->members().empty()) return false;
+  return _machine.services.daemons().isRunning(named->members().front());
+}
+
+bool LinuxRemoteEventsService::isEnabled() {
+  Setting<std::string> setting;
+  setting.name = setting::remoteEvents;
+  setting.live = [this] { return asOnOff(isOnInAnyWay()); };
+  return observe(setting, _machine.effects) == onOff(true);
+}
+
+void LinuxRemoteEventsService::setEnabled(bool enabled) {
+  Setting<std::string> setting;
+  setting.name = setting::remoteEvents;
+  setting.supported = [this] { return whyNotSupported(); };
+  setting.live = [this] { return live(); };
+  setting.stored = [this] { return asOnOff(startsAtBoot()); };
+  setting.store = [&](const std::string&) {
+    const auto named = units();
+    return named ? named->setAllStartAtBoot(enabled) : named.failure();
+  };
+  setting.apply = [&](const std::string&) -> Result<void> {
+    const auto named = units();
+    if (!named) return named.failure();
+    return enabled ? named->startAll() : named->stopAll();
+  };
+  carryOut(setting, onOff(enabled), _machine.effects, _machine.runLoop);
+}
+
+}  // namespace tavisk

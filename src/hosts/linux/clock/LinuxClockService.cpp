@@ -1,0 +1,176 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/clock/LinuxClockService.h"
+
+#include <unistd.h>
+
+#include <chrono>
+
+#include "base/Text.h"
+#include "effects/SettingNames.h"
+#include "hosts/linux/clock/LocalTime.h"
+#include "hosts/linux/clock/SystemClock.h"
+#include "hosts/linux/system/ProcessScan.h"
+#include "hosts/linux/system/Rights.h"
+#include "hosts/shared/ZoneList.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* withoutZone = "UTC";
+constexpr const char* inContainer = "no CAP_SYS_TIME here: set it on the machine that hosts this container";
+constexpr const char* timeUnit = "seconds since 1970";
+
+BusObject timeDaemon() {
+  return {"org.freedesktop.timedate1", "/org/freedesktop/timedate1", "org.freedesktop.timedate1"};
+}
+
+/// Whether the daemon is not there, or does not set a clock that a network-time client holds.
+bool leavesItToOthers(const Failure& failure) {
+  return failure.code == BusErrorCode::serviceUnknown || failure.code == BusErrorCode::timeSyncEnabled;
+}
+
+/// By the difference: it stays right however long the daemon takes, to start or to ask the user.
+Result<void> setByDaemon(Bus& bus, const AskedTime& asked) {
+  constexpr bool relative = true;
+  auto set = bus.call(timeDaemon(), "SetTime", "", asked.microsecondsAhead(), relative, bus.isInteractive());
+  if (!set) return set.failure();
+  return {};
+}
+
+/// In a container the daemon has no more rights than this process.
+Failure withAdvice(Failure failure) {
+  if (::geteuid() == 0 && !maySetSystemTime()) failure.why += std::string("; ") + inContainer;
+  return failure;
+}
+
+}  // namespace
+
+std::int64_t LinuxClockService::now() {
+  auto time = systemTime();
+  _machine.effects.observe({setting::time, std::to_string(time), std::nullopt, timeUnit});
+  return time;
+}
+
+/// The clock of the machine that runs the tool is not that of any tree of files.
+std::optional<Failure> LinuxClockService::whyNoClock() const {
+  if (_machine.root.prefix() != "/")
+    return Failure{"set the clock", _machine.root.prefix(), "a tree of files has no clock"};
+  if (auto failure = whyNeedsRoot("set the clock", "CLOCK_REALTIME")) return failure;
+  if (!maySetSystemTime()) return Failure{"set the clock", "CLOCK_REALTIME", inContainer};
+  return std::nullopt;
+}
+
+/// Also what the service manager knows nothing of, such as a virtual machine's tools.
+std::string LinuxClockService::whoCorrectsTheClock() {
+  for (const char* program : {"chronyd", "ntpd", "systemd-timesyncd", "phc2sys", "VBoxService"})
+    if (!processesNamed(_machine.root, program).empty()) return program;
+  auto bus = _machine.services.systemBus();
+  if (!bus) return {};
+  auto corrected = (*bus)->property(timeDaemon(), "NTP", "b");
+  return corrected && std::move(corrected).value().readBoolean() ? "the network-time client" : "";
+}
+
+void LinuxClockService::setTime(std::int64_t secondsSince1970) {
+  AskedTime asked(secondsSince1970);
+  Setting<std::string> time;
+  time.name = setting::time;
+  time.unit = timeUnit;
+  time.undoneBy = [this](const auto&) { return whoCorrectsTheClock(); };
+  time.live = [&] { return std::optional(std::to_string(asked.onSystemClock())); };
+  if (asked.onHardwareClock(_machine.root)) {
+    time.where = hardwareClock;
+    time.stored = [&]() -> Result<std::optional<std::string>> {
+      const auto stored = asked.onHardwareClock(_machine.root);
+      return stored ? std::optional(std::to_string(*stored)) : std::nullopt;
+    };
+  } else {
+    time.note = saying("without a hardware clock the machine forgets the time when it is off");
+  }
+  time.apply = [&](const std::string&) -> Result<void> {
+    asked.isNow();
+    return changeTime(asked);
+  };
+  carryOut(time, std::to_string(secondsSince1970), _machine.effects, _machine.runLoop);
+}
+
+Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
+  if (auto failure = whyOutOfClockRange(asked.seconds())) return *failure;
+  if (auto bus = _machine.services.systemBus()) {
+    auto set = setByDaemon(**bus, asked);
+    if (set) return {};
+    if (!leavesItToOthers(set.failure())) return withAdvice(set.failure());
+  }
+  return changeTimeDirectly(asked.seconds());
+}
+
+Result<void> LinuxClockService::changeTimeDirectly(std::int64_t secondsSince1970) const {
+  if (auto failure = whyNoClock()) return *failure;
+  if (auto set = setSystemTime(secondsSince1970); !set) return set;
+  return setHardwareClock(_machine.root, secondsSince1970);
+}
+
+std::vector<std::string> LinuxClockService::knownTimeZones() {
+  auto zones = installedZones(_machine.root);
+  if (zones) return *zones;
+  Effect effect;
+  effect.setting = setting::knownTimeZones;
+  effect.outcome = Outcome::failed;
+  effect.failure = zones.failure();
+  _machine.effects.record(effect);
+  return {};
+}
+
+/// The link counts; a second copy of the name that says something else is told with it.
+Setting<std::string> LinuxClockService::timeZoneSetting() const {
+  Setting<std::string> zone;
+  zone.name = setting::timeZone;
+  zone.where = "/etc/localtime";
+  zone.live = [&root = _machine.root] { return std::optional(machineTimeZone(root).value_or(withoutZone)); };
+  zone.stored = [&root = _machine.root] {
+    auto second = timeZoneFileName(root);
+    return second ? second : machineTimeZone(root);
+  };
+  return zone;
+}
+
+std::string LinuxClockService::timeZone() {
+  return *observe(timeZoneSetting(), _machine.effects);
+}
+
+void LinuxClockService::setTimeZone(const std::string& zoneFile) {
+  auto zone = timeZoneSetting();
+  zone.store = [this](const std::string& name) { return changeTimeZone(name); };
+  carryOut(zone, zoneOfPath(zoneFile).value_or(zoneFile), _machine.effects, _machine.runLoop);
+}
+
+Result<void> LinuxClockService::changeTimeZone(const std::string& zone) {
+  if (auto bus = _machine.services.systemBus()) {
+    auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone, (*bus)->isInteractive());
+    if (!set && !leavesItToOthers(set.failure())) return set.failure();
+    // The daemon does nothing for the zone that it found when it started, whatever the link says since.
+    if (set && machineTimeZone(_machine.root) == zone) return updateNameFile(zone);
+  }
+  return changeTimeZoneDirectly(zone);
+}
+
+Result<void> LinuxClockService::changeTimeZoneDirectly(const std::string& zone) const {
+  if (auto failure = whyNeedsRoot("set the time zone", "/etc/localtime")) return *failure;
+  if (auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
+  return updateTimeZoneFile(_machine.root, zone);
+}
+
+/// The daemon leaves Debian's second copy of the name alone.
+Result<void> LinuxClockService::updateNameFile(const std::string& zone) const {
+  auto updated = updateTimeZoneFile(_machine.root, zone);
+  if (updated) return updated;
+  return whyNeedsRoot("write", "/etc/timezone").value_or(updated.failure());
+}
+
+std::string LinuxClockService::rulesOf(const std::string& timeZone) {
+  auto file = zoneFolder + timeZone;
+  const auto& prefix = _machine.root.prefix();
+  return (prefix == "/" ? "" : prefix) + zoneFolder + zoneOfPath(file).value_or(withoutZone);
+}
+
+}  // namespace tavisk

@@ -1,0 +1,37 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "hosts/linux/clock/SystemClock.h"
+#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/shared/SettingChange.h"
+#include "platform/ClockService.h"
+
+namespace tavisk {
+
+/// The kernel's clock, the hardware clock, and the link /etc/localtime.
+class LinuxClockService final : public ClockService {
+ public:
+  explicit LinuxClockService(const LinuxMachine& machine) : _machine(machine) {}
+
+  std::int64_t now() override;
+  void setTime(std::int64_t secondsSince1970) override;
+  std::vector<std::string> knownTimeZones() override;
+  std::string timeZone() override;
+  void setTimeZone(const std::string& zoneFile) override;
+  std::string rulesOf(const std::string& timeZone) override;
+
+ private:
+  Setting<std::string> timeZoneSetting() const;
+  std::optional<Failure> whyNoClock() const;
+  std::string whoCorrectsTheClock();
+  Result<void> changeTime(const AskedTime& asked);
+  Result<void> changeTimeDirectly(std::int64_t secondsSince1970) const;
+  Result<void> changeTimeZone(const std::string& zone);
+  Result<void> changeTimeZoneDirectly(const std::string& zone) const;
+  Result<void> updateNameFile(const std::string& zone) const;
+
+  LinuxMachine _machine;
+};
+
+}  // namespace tavisk

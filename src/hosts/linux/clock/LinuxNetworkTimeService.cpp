@@ -1,0 +1,173 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/clock/LinuxNetworkTimeService.h"
+
+#include "base/DnsName.h"
+#include "effects/SettingNames.h"
+#include "hosts/linux/system/OnOff.h"
+#include "hosts/linux/system/Program.h"
+#include "hosts/linux/system/Rights.h"
+
+namespace tavisk {
+namespace {
+
+using Value = std::optional<std::string>;
+
+Failure noClient() {
+  std::string names;
+  for (const auto& daemon : timeDaemons()) names += (names.empty() ? "" : ", ") + std::string(daemon.daemon.unit);
+  return {"find a network-time client", names, "none of them is installed"};
+}
+
+}  // namespace
+
+Daemons& LinuxNetworkTimeService::daemons() {
+  return _machine.services.daemons();
+}
+
+Result<const TimeDaemon*> LinuxNetworkTimeService::client() {
+  const TimeDaemon* masked = nullptr;
+  for (const auto& candidate : timeDaemons()) {
+    auto presence = daemons().presence(candidate.daemon);
+    if (!presence) return presence.failure();
+    if (*presence == Daemons::Presence::installed) return &candidate;
+    if (*presence == Daemons::Presence::masked && !masked) masked = &candidate;
+  }
+  return masked;
+}
+
+template <typename Answer, typename Use>
+Result<Answer> LinuxNetworkTimeService::withClient(Use use) {
+  auto found = client();
+  if (!found) return found.failure();
+  if (!*found) return noClient();
+  return use(**found);
+}
+
+/// A client that cannot be asked for is no reason: whatever is done with it then tells why.
+std::optional<Failure> LinuxNetworkTimeService::whyNotSupported() {
+  auto found = client();
+  if (!found || *found) return std::nullopt;
+  return noClient();
+}
+
+Setting<std::string> LinuxNetworkTimeService::named(const char* name) {
+  Setting<std::string> setting;
+  setting.name = name;
+  setting.supported = [this] { return whyNotSupported(); };
+  return setting;
+}
+
+Setting<std::string> LinuxNetworkTimeService::runningSetting() {
+  auto setting = named(setting::networkTime);
+  setting.live = [this]() -> Result<Value> {
+    auto found = client();
+    if (!found) return found.failure();
+    return asOnOff(!*found ? Result<bool>(false) : daemons().isRunning((*found)->daemon));
+  };
+  setting.apply = [this](const std::string& value) {
+    return withClient<void>([&](const TimeDaemon& client) {
+      return value == onOff(true) ? daemons().start(client.daemon) : daemons().stop(client.daemon);
+    });
+  };
+  return setting;
+}
+
+bool LinuxNetworkTimeService::isRunning() {
+  return observe(runningSetting(), _machine.effects) == onOff(true);
+}
+
+void LinuxNetworkTimeService::start() {
+  change(runningSetting(), onOff(true));
+}
+
+void LinuxNetworkTimeService::stop() {
+  change(runningSetting(), onOff(false));
+}
+
+void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
+  auto setting = named(setting::networkTimeAtStartup);
+  setting.stored = [this] {
+    return withClient<Value>([&](const TimeDaemon& client) { return asOnOff(daemons().startsAtBoot(client.daemon)); });
+  };
+  setting.store = [this](const std::string& value) {
+    return withClient<void>(
+        [&](const TimeDaemon& client) { return daemons().setStartAtBoot({client.daemon}, value == onOff(true)); });
+  };
+  change(setting, onOff(launch));
+}
+
+Setting<std::string> LinuxNetworkTimeService::serverSetting() {
+  auto setting = named(setting::networkTimeServer);
+  setting.stored = [this]() -> Result<Value> {
+    auto found = client();
+    if (!found) return found.failure();
+    return !*found ? Value() : Value((*found)->server(_machine.root));
+  };
+  return setting;
+}
+
+/// A server that the network offered, or the daemon's own last resort.
+std::string LinuxNetworkTimeService::serverInUseWithoutAny() {
+  auto found = client();
+  if (!found || !*found || !(*found)->busService || !(*found)->server(_machine.root).empty()) return {};
+  auto bus = _machine.services.systemBus();
+  if (!bus || !daemons().isRunning((*found)->daemon).valueOr(false)) return {};
+  const BusObject manager{(*found)->busService, "/org/freedesktop/timesync1", "org.freedesktop.timesync1.Manager"};
+  auto name = (*bus)->property(manager, "ServerName", "s");
+  return name ? std::move(name).value().readText() : std::string();
+}
+
+NetworkTimeServer LinuxNetworkTimeService::server() {
+  auto setting = serverSetting();
+  if (auto inUse = serverInUseWithoutAny(); !inUse.empty()) setting.live = [inUse] { return Value(inUse); };
+  return {observe(setting, _machine.effects).value_or("")};
+}
+
+std::string LinuxNetworkTimeService::whatStaysInUse(const TimeDaemon& client) const {
+  auto other = !client.otherServer ? std::string() : client.otherServer(_machine.root);
+  return other.empty() ? other : "configured elsewhere, " + other + " stays in use beside it";
+}
+
+void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
+  auto setting = serverSetting();
+  if (auto found = client(); found && *found) {
+    setting.where = (*found)->serverFile;
+    setting.note = [this, client = *found](const auto&) { return whatStaysInUse(*client); };
+    if ((*found)->whyNotRead) setting.supported = [this, client = *found] { return client->whyNotRead(_machine.root); };
+  }
+  setting.store = [this](const std::string& address) {
+    return withClient<void>([&](const TimeDaemon& client) { return storeServer(client, address); });
+  };
+  change(setting, server.address);
+}
+
+Result<void> LinuxNetworkTimeService::storeServer(const TimeDaemon& client, const std::string& address) {
+  constexpr const char* tried = "set the server";
+  if (!isHostNameOrAddress(address))
+    return Failure{tried, client.serverFile, "only a host name or an address is stored"};
+  if (auto failure = whyNeedsRoot(tried, client.serverFile)) return *failure;
+  return _machine.root.write(client.serverFile, client.serverLines(address));
+}
+
+void LinuxNetworkTimeService::restartAsynchronously() {
+  auto setting = named(setting::networkTimeRestart);
+  setting.apply = [this](const std::string&) {
+    return withClient<void>([&](const TimeDaemon& client) { return reload(client); });
+  };
+  change(setting, "restart");
+}
+
+Result<void> LinuxNetworkTimeService::reload(const TimeDaemon& client) {
+  if (client.reload.empty()) return daemons().restartIfRunning(client.daemon);
+  if (auto failure = whyNeedsRoot("run", client.reload.front())) return *failure;
+  auto printed = runProgram(_machine.root, {client.reload.begin(), client.reload.end()}, _machine.runLoop);
+  if (!printed) return printed.failure();
+  return {};
+}
+
+void LinuxNetworkTimeService::change(const Setting<std::string>& setting, const std::string& asked) {
+  carryOut(setting, asked, _machine.effects, _machine.runLoop);
+}
+
+}  // namespace tavisk

@@ -1,0 +1,45 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "hosts/linux/clock/TimeDaemons.h"
+#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/shared/SettingChange.h"
+#include "platform/NetworkTimeService.h"
+
+namespace tavisk {
+
+/// The network-time daemon that is installed, and the tool's own file among its servers.
+class LinuxNetworkTimeService final : public NetworkTimeService {
+ public:
+  explicit LinuxNetworkTimeService(const LinuxMachine& machine) : _machine(machine) {}
+
+  bool isRunning() override;
+  void setLaunchAtStartup(bool launch) override;
+  void start() override;
+  void stop() override;
+  NetworkTimeServer server() override;
+  void setServer(const NetworkTimeServer& server) override;
+  void restartAsynchronously() override;
+
+ private:
+  Daemons& daemons();
+  /// The first daemon that is installed, else the first that is masked, else none.
+  Result<const TimeDaemon*> client();
+  /// What `use` answers for the client; a failure when there is none.
+  template <typename Answer, typename Use>
+  Result<Answer> withClient(Use use);
+  std::optional<Failure> whyNotSupported();
+  Setting<std::string> named(const char* name);
+  Setting<std::string> runningSetting();
+  Setting<std::string> serverSetting();
+  std::string serverInUseWithoutAny();
+  std::string whatStaysInUse(const TimeDaemon& client) const;
+  void change(const Setting<std::string>& setting, const std::string& asked);
+  Result<void> storeServer(const TimeDaemon& client, const std::string& address);
+  Result<void> reload(const TimeDaemon& client);
+
+  LinuxMachine _machine;
+};
+
+}  // namespace tavisk

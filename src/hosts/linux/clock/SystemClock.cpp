@@ -1,0 +1,134 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/clock/SystemClock.h"
+
+#include <fcntl.h>
+#include <linux/capability.h>
+#include <linux/rtc.h>
+#include <sys/ioctl.h>
+#include <sys/syscall.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <ctime>
+
+#include "base/Calendar.h"
+#include "base/Result.h"
+#include "base/Text.h"
+
+namespace tavisk {
+namespace {
+
+// 30 years before the kernel's last second, which is 2^63 - 1 nanoseconds (include/linux/time64.h).
+constexpr std::int64_t lastSettableSecond = 9223372036 - std::int64_t{30} * 365 * 24 * 3600 - 1;
+constexpr const char* clockName = "CLOCK_REALTIME";
+
+std::int64_t seconds(clockid_t clock) {
+  timespec time{};
+  ::clock_gettime(clock, &time);
+  return time.tv_sec;
+}
+
+std::chrono::microseconds systemMicroseconds() {
+  return std::chrono::duration_cast<std::chrono::microseconds>(std::chrono::system_clock::now().time_since_epoch());
+}
+
+/// The third line of /etc/adjtime is UTC or LOCAL; UTC without the file.
+bool keepsLocalTime(const SystemRoot& root) {
+  constexpr std::size_t limit = 4096;
+  auto lines = split(root.read("/etc/adjtime", limit).valueOr(""), "\n");
+  return lines.size() > 2 && lines[2] == "LOCAL";
+}
+
+DateTime utcDateTime(std::int64_t secondsSince1970) {
+  std::time_t time = secondsSince1970;
+  std::tm parts{};
+  ::gmtime_r(&time, &parts);
+  return {parts.tm_year + 1900, parts.tm_mon + 1, parts.tm_mday, parts.tm_hour, parts.tm_min, parts.tm_sec};
+}
+
+rtc_time rtcTime(const DateTime& time) {
+  rtc_time parts{};
+  parts.tm_year = static_cast<int>(time.year) - 1900;
+  parts.tm_mon = static_cast<int>(time.month) - 1;
+  parts.tm_mday = static_cast<int>(time.day);
+  parts.tm_hour = static_cast<int>(time.hour);
+  parts.tm_min = static_cast<int>(time.minute);
+  parts.tm_sec = static_cast<int>(time.second);
+  return parts;
+}
+
+}  // namespace
+
+std::int64_t systemTime() {
+  return seconds(CLOCK_REALTIME);
+}
+
+std::optional<Failure> whyOutOfClockRange(std::int64_t secondsSince1970) {
+  auto refusal = [](const char* why) { return Failure{"set the clock", clockName, why}; };
+  if (secondsSince1970 < 0) return refusal("Linux has no time before 1970");
+  if (secondsSince1970 > lastSettableSecond) return refusal("Linux sets no time after April 2232");
+  if (secondsSince1970 < seconds(CLOCK_MONOTONIC))
+    return refusal("Linux sets no time so near to 1970 that the machine would have started before");
+  return std::nullopt;
+}
+
+bool maySetSystemTime() {
+  __user_cap_header_struct header{_LINUX_CAPABILITY_VERSION_3, 0};
+  std::array<__user_cap_data_struct, _LINUX_CAPABILITY_U32S_3> sets{};
+  if (::syscall(SYS_capget, &header, sets.data()) != 0) return false;
+  return (sets[CAP_TO_INDEX(CAP_SYS_TIME)].effective & CAP_TO_MASK(CAP_SYS_TIME)) != 0;
+}
+
+Result<void> setSystemTime(std::int64_t secondsSince1970) {
+  timespec time{};
+  time.tv_sec = secondsSince1970;
+  if (::clock_settime(CLOCK_REALTIME, &time) != 0) return systemFailure("clock_settime", clockName, errno);
+  return {};
+}
+
+std::optional<std::int64_t> hardwareTime(const SystemRoot& root) {
+  constexpr std::size_t limit = 64;
+  const auto text = root.read("/sys/class/rtc/rtc0/since_epoch", limit);
+  if (!text) return std::nullopt;
+  const auto seconds = leadingInteger(*text);
+  // The kernel takes what the clock shows for UTC.
+  return keepsLocalTime(root) ? static_cast<std::int64_t>(secondsSince1970(utcDateTime(seconds))) : seconds;
+}
+
+std::chrono::microseconds AskedTime::sinceThen() const {
+  if (!_moment) return {};
+  return std::chrono::duration_cast<std::chrono::microseconds>(std::chrono::steady_clock::now() - *_moment);
+}
+
+std::int64_t AskedTime::microsecondsAhead() const {
+  return (std::chrono::seconds(_seconds) + sinceThen() - systemMicroseconds()).count();
+}
+
+std::int64_t AskedTime::onSystemClock() const {
+  return unlessNear(systemMicroseconds(), std::chrono::seconds(1));
+}
+
+std::optional<std::int64_t> AskedTime::onHardwareClock(const SystemRoot& root) const {
+  const auto shown = hardwareTime(root);
+  if (!shown) return std::nullopt;
+  return unlessNear(std::chrono::seconds(*shown), std::chrono::seconds(2));  // it tells no fractions
+}
+
+std::int64_t AskedTime::unlessNear(std::chrono::microseconds shown, std::chrono::seconds near) const {
+  const auto then = shown - sinceThen();
+  const bool isNear = _moment && std::chrono::abs(then - std::chrono::seconds(_seconds)) <= near;
+  return isNear ? _seconds : std::chrono::floor<std::chrono::seconds>(then).count();
+}
+
+Result<void> setHardwareClock(const SystemRoot& root, std::int64_t secondsSince1970) {
+  if (!root.exists(hardwareClock)) return {};
+  auto clock = root.open(hardwareClock, O_RDONLY | O_NONBLOCK);
+  if (!clock) return clock.failure();
+  auto time = rtcTime(keepsLocalTime(root) ? localDateTime(secondsSince1970) : utcDateTime(secondsSince1970));
+  if (::ioctl(clock->number(), RTC_SET_TIME, &time) != 0) return systemFailure("RTC_SET_TIME", hardwareClock, errno);
+  return {};
+}
+
+}  // namespace tavisk

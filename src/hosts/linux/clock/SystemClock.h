@@ -1,0 +1,59 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+#include <optional>
+
+#include "base/Result.h"
+#include "hosts/shared/SystemRoot.h"
+
+namespace tavisk {
+
+/// Seconds since 1970-01-01 00:00:00 UTC.
+std::int64_t systemTime();
+
+/// Why Linux would refuse this time (clock_settime(2)): before 1970, after April 2232, or before the machine's own
+/// start as it counts it. Absent when it would not.
+std::optional<Failure> whyOutOfClockRange(std::int64_t secondsSince1970);
+
+/// Whether this process may set the clock (CAP_SYS_TIME, capabilities(7)).
+bool maySetSystemTime();
+
+/// Sets the kernel's clock, of the whole machine.
+Result<void> setSystemTime(std::int64_t secondsSince1970);
+
+/// Where the machine keeps the time while it is off.
+inline constexpr const char* hardwareClock = "/dev/rtc0";
+
+/// What the hardware clock says, in seconds since 1970 UTC whichever time it keeps; absent when the machine has none.
+std::optional<std::int64_t> hardwareTime(const SystemRoot& root);
+
+/// A time to which the clocks are set, and what they said at the moment from which it counts, however much later they
+/// are read. Once there is such a moment, what is as near as a clock is set and read is the time itself.
+class AskedTime {
+ public:
+  explicit AskedTime(std::int64_t secondsSince1970) : _seconds(secondsSince1970) {}
+  void isNow() { _moment = std::chrono::steady_clock::now(); }
+
+  std::int64_t seconds() const { return _seconds; }
+  /// By how much the system clock has to be put forward, or back.
+  std::int64_t microsecondsAhead() const;
+  std::int64_t onSystemClock() const;
+  /// Absent when the machine has none.
+  std::optional<std::int64_t> onHardwareClock(const SystemRoot& root) const;
+
+ private:
+  std::chrono::microseconds sinceThen() const;
+  std::int64_t unlessNear(std::chrono::microseconds shown, std::chrono::seconds near) const;
+
+  std::int64_t _seconds;
+  std::optional<std::chrono::steady_clock::time_point> _moment;
+};
+
+/// Sets the hardware clock (rtc(4)), to local time when /etc/adjtime says so (adjtime_config(5)). A machine that has
+/// none is a success.
+Result<void> setHardwareClock(const SystemRoot& root, std::int64_t secondsSince1970);
+
+}  // namespace tavisk

@@ -1,0 +1,215 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+
+#include "hosts/linux/disks/BlockDevices.h"
+
+#include <algorithm>
+#include <array>
+
+#include "base/Text.h"
+
+namespace tavisk {
+namespace {
+
+constexpr std::size_t attributeLimit = 4096;
+constexpr unsigned usualBlockSize = 512;
+constexpr int deepestMapping = 16;
+constexpr unsigned floppyMajor = 2;
+
+std::string baseName(const std::string& path) {
+  return path.substr(path.rfind('/') + 1);
+}
+
+bool isFileName(const std::string& text) {
+  return !text.empty() && text != "." && text != ".." &&
+         text.find_first_of(std::string_view("/\0", 2)) == std::string::npos;
+}
+
+/// The value of a line "KEY=value".
+std::string valueIn(const std::string& lines, std::string_view key) {
+  for (const auto& line : split(lines, "\n"))
+    if (line.starts_with(key) && line.substr(key.size(), 1) == "=") return line.substr(key.size() + 1);
+  return "";
+}
+
+std::uint64_t unsignedNumber(const std::string& text) {
+  return static_cast<std::uint64_t>(std::max(leadingInteger(text), std::int64_t{0}));
+}
+
+struct Sign {
+  const char* text;
+  const char* transport;
+};
+
+/// Devices by the beginnings of their names.
+constexpr std::array namesOfDevices = {Sign{"loop", transport::diskImage}, Sign{"nbd", transport::network},
+                                       Sign{"rbd", transport::network}, Sign{"drbd", transport::network}};
+/// Folders above a disk in the device tree, by the beginnings of their names: what is nearer to the hardware than the
+/// layer that SCSI makes of it.
+constexpr std::array namesOfCarriers = {Sign{"session", transport::iscsi}, Sign{"ata", "SATA"},
+                                        Sign{"end_device-", "SAS"}, Sign{"rport-", "Fibre Channel"}};
+constexpr std::array subsystems = {
+    Sign{"nvme", "NVMe"}, Sign{"nvme-subsystem", "NVMe"}, Sign{"mmc", "MMC"},      Sign{"firewire", "FireWire"},
+    Sign{"xen", "Xen"},   Sign{"scsi", "SCSI"},           Sign{"virtio", "Virtio"}};
+
+/// "ata1" begins with "ata" and goes on with a number.
+bool isNumbered(const std::string& name, std::string_view beginning) {
+  return name.starts_with(beginning) && name.find_first_of("0123456789") == beginning.size();
+}
+
+template <std::size_t Count>
+const char* byNumberedName(const std::array<Sign, Count>& signs, const std::string& name) {
+  for (const auto& sign : signs)
+    if (isNumbered(name, sign.text)) return sign.transport;
+  return nullptr;
+}
+
+const char* bySubsystem(const std::string& name) {
+  const auto* sign = std::ranges::find_if(subsystems, [&](auto& each) { return name == each.text; });
+  return sign == subsystems.end() ? nullptr : sign->transport;
+}
+
+bool isRemote(const std::string& transport) {
+  return transport == transport::iscsi || transport == transport::network || transport == transport::diskImage;
+}
+
+}  // namespace
+
+/// Without the newline; empty when there is none or it cannot be read.
+std::string BlockDevices::attribute(const std::string& path, const char* name) const {
+  auto text = _root.read("/sys" + path + "/" + name, attributeLimit).valueOr("");
+  while (text.ends_with('\n')) text.pop_back();
+  return text;
+}
+
+std::string BlockDevices::subsystemOf(const std::string& path) const {
+  return baseName(_root.readLink("/sys" + path + "/subsystem").valueOr(""));
+}
+
+std::vector<DiskName> BlockDevices::list() const {
+  std::vector<DiskName> names;
+  for (auto& name : _root.list("/sys/class/block").valueOr({})) names.push_back({std::move(name)});
+  return names;
+}
+
+std::optional<std::string> BlockDevices::pathOf(const DiskName& name) const {
+  constexpr std::string_view upToSys = "../..";
+  if (!isFileName(name.text)) return std::nullopt;
+  const auto target = _root.readLink("/sys/class/block/" + name.text);
+  if (!target || !target->starts_with("../../devices/")) return std::nullopt;
+  return target->substr(upToSys.size());
+}
+
+std::optional<BlockDevice> BlockDevices::find(const DiskName& name) const {
+  const auto path = pathOf(name);
+  if (!path) return std::nullopt;
+  const auto uevent = attribute(*path, "uevent");
+  BlockDevice device;
+  device.name = device.disk = name;
+  device.number = DeviceNumber::parse(valueIn(uevent, "MAJOR") + ":" + valueIn(uevent, "MINOR"));
+  device.path = *path;
+  device.node = "/dev/" + valueIn(uevent, "DEVNAME");
+  device.partition = static_cast<int>(leadingInteger(attribute(*path, "partition")));
+  if (device.partition != 0) {
+    device.disk = {baseName(path->substr(0, path->rfind('/')))};
+    device.start = unsignedNumber(attribute(*path, "start"));
+  }
+  device.size = unsignedNumber(attribute(*path, "size"));
+  device.writable = attribute(*path, "ro") != "1";
+  return device;
+}
+
+std::optional<BlockDevice> BlockDevices::withNumber(DeviceNumber number) const {
+  const auto link = "/sys/dev/block/" + std::to_string(number.major) + ":" + std::to_string(number.minor);
+  const auto target = _root.readLink(link);
+  return target ? find({baseName(*target)}) : std::nullopt;
+}
+
+std::optional<BlockDevice> BlockDevices::withNode(const std::string& node) const {
+  constexpr std::string_view folder = "/dev/";
+  const auto path = _root.standardized(node);
+  if (!path || !path->starts_with(folder)) return std::nullopt;
+  auto name = path->substr(folder.size());
+  std::ranges::replace(name, '/', '!');  // sysfs has "cciss!c0d0" for /dev/cciss/c0d0
+  return find({name});
+}
+
+/// The first of the devices that a mapped volume or an array is on.
+std::optional<DiskName> BlockDevices::firstBeneath(const std::string& path) const {
+  const auto names = _root.list("/sys" + path + "/slaves").valueOr({});
+  return names.empty() ? std::nullopt : std::optional(DiskName{names.front()});
+}
+
+DiskName BlockDevices::wholeDisk(const DiskName& name) const {
+  DiskName disk = name;
+  for (int depth = 0; depth < deepestMapping; ++depth) {
+    const auto path = pathOf(disk);
+    if (!path) return disk;
+    const bool isPartition = _root.exists("/sys" + *path + "/partition");
+    const auto beneath = isPartition ? DiskName{baseName(path->substr(0, path->rfind('/')))} : firstBeneath(*path);
+    if (!beneath) return disk;
+    disk = *beneath;
+  }
+  return disk;
+}
+
+unsigned BlockDevices::logicalBlockSize(const DiskName& disk) const {
+  const auto size = leadingInteger(attribute(pathOf(disk).value_or(""), "queue/logical_block_size"));
+  return size > 0 ? static_cast<unsigned>(size) : usualBlockSize;
+}
+
+bool BlockDevices::answersReads(const BlockDevice& device) const {
+  return device.number.major != floppyMajor && attribute(device.path, "dm/suspended") != "1";
+}
+
+bool BlockDevices::isRemovable(const DiskName& disk) const {
+  return attribute(pathOf(disk).value_or(""), "removable") == "1";
+}
+
+bool BlockDevices::isOptical(const DiskName& disk) const {
+  constexpr const char* scsiOptical = "5";  // a peripheral device type of SCSI
+  const auto path = pathOf(disk);
+  return path && (disk.text.starts_with("sr") || attribute(*path, "device/type") == scsiOptical);
+}
+
+/// The folders of the device tree above a disk, the nearest first.
+std::vector<std::string> BlockDevices::carriersOf(const DiskName& disk) const {
+  constexpr std::string_view top = "/devices";
+  std::vector<std::string> carriers;
+  auto path = pathOf(disk).value_or("");
+  while (path.size() > top.size()) {
+    path.resize(path.rfind('/'));
+    if (path.size() > top.size()) carriers.push_back(path);
+  }
+  return carriers;
+}
+
+std::string BlockDevices::transportOf(const DiskName& disk) const {
+  const auto path = pathOf(disk);
+  if (!path) return "";
+  if (const auto* found = byNumberedName(namesOfDevices, disk.text)) return found;
+  const char* carried = nullptr;
+  for (const auto& carrier : carriersOf(disk)) {
+    if (const auto* found = byNumberedName(namesOfCarriers, baseName(carrier))) return found;
+    const auto subsystem = subsystemOf(carrier);
+    if (subsystem == "usb") return transport::usb;
+    if (subsystem == "nvme-fabrics") return transport::network;
+    // The nearest one counts, unless something further up tells more.
+    if (!carried) carried = bySubsystem(subsystem);
+  }
+  return !carried ? "" : carried;
+}
+
+bool BlockDevices::isInternal(const DiskName& disk) const {
+  if (!pathOf(disk) || isRemovable(disk)) return false;
+  const auto transport = transportOf(disk);
+  if (isRemote(transport)) return false;
+  for (const auto& carrier : carriersOf(disk)) {
+    const auto removable = attribute(carrier, "removable");  // of USB and PCI devices
+    if (removable == "removable") return false;
+    if (transport == transport::usb && !removable.empty()) return removable == "fixed";
+  }
+  return transport != transport::usb;
+}
+
+}  // namespace tavisk

@@ -1,0 +1,77 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "hosts/linux/disks/MountTable.h"
+#include "hosts/shared/SystemRoot.h"
+#include "platform/DiskDescription.h"
+
+namespace tavisk {
+
+/// A disk, a partition or a mapped volume, as sysfs tells of it.
+struct BlockDevice {
+  DiskName name;  ///< the kernel's: "sda2", "nvme0n1p1", "dm-0"
+  DeviceNumber number;
+  std::string path;         ///< in the device tree; its files are in "/sys" + path
+  std::string node;         ///< "/dev/sda2"
+  DiskName disk;            ///< the one whose partition it is; of another device itself
+  int partition = 0;        ///< its number; 0: not a partition
+  std::uint64_t start = 0;  ///< of a partition, in units of 512 bytes
+  std::uint64_t size = 0;   ///< in units of 512 bytes; 0: no medium
+  bool writable = true;
+};
+
+/// What a connection to a disk is called: what protocolOf() of DiskQueries answers.
+namespace transport {
+inline constexpr const char* usb = "USB";
+inline constexpr const char* diskImage = "Disk Image";
+inline constexpr const char* iscsi = "iSCSI";
+inline constexpr const char* network = "Network";
+}  // namespace transport
+
+/// The block devices of the machine, read from sysfs at each question. From any thread.
+class BlockDevices {
+ public:
+  /// The root is not owned.
+  explicit BlockDevices(const SystemRoot& root) : _root(root) {}
+
+  /// The names of all, sorted by bytes.
+  std::vector<DiskName> list() const;
+  std::optional<BlockDevice> find(const DiskName& name) const;
+  std::optional<BlockDevice> withNumber(DeviceNumber number) const;
+  /// The device that a node is of: "/dev/sda2", or a link to one.
+  std::optional<BlockDevice> withNode(const std::string& node) const;
+
+  /// The hardware at the bottom: the disk of a partition; of a mapped volume or an array the first of the disks that
+  /// it is on. A name that is not known is its own.
+  DiskName wholeDisk(const DiskName& name) const;
+
+  /// Of a whole disk, in bytes; 512 when it is not known.
+  unsigned logicalBlockSize(const DiskName& disk) const;
+  /// Whether reading a device comes back soon: a suspended mapping does not, and an empty floppy drive takes seconds.
+  bool answersReads(const BlockDevice& device) const;
+  /// Whether a whole disk gives its medium away.
+  bool isRemovable(const DiskName& disk) const;
+  /// Whether a whole disk is a drive for optical discs.
+  bool isOptical(const DiskName& disk) const;
+  /// How a whole disk is connected: one of `transport`, or "SATA", "NVMe" ...; empty when that is not known.
+  std::string transportOf(const DiskName& disk) const;
+  /// Whether a whole disk stays in the machine, as far as the machine knows.
+  bool isInternal(const DiskName& disk) const;
+
+ private:
+  std::string attribute(const std::string& path, const char* name) const;
+  std::string subsystemOf(const std::string& path) const;
+  std::optional<std::string> pathOf(const DiskName& name) const;
+  std::optional<DiskName> firstBeneath(const std::string& path) const;
+  std::vector<std::string> carriersOf(const DiskName& disk) const;
+
+  const SystemRoot& _root;
+};
+
+}  // namespace tavisk

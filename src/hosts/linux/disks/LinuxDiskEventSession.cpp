@@ -1,0 +1,60 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/disks/LinuxDiskEventSession.h"
+
+#include <fcntl.h>
+
+#include <utility>
+
+#include "effects/SettingNames.h"
+
+namespace tavisk {
+
+void LinuxDiskEventSession::schedule(RunLoop& runLoop) {
+  _told = std::make_shared<DiskSnapshot>();
+  // What changes between this and the first report is told after it.
+  watchDevices(runLoop);
+  watchMounts(runLoop);
+  _firstReport = runLoop.after({}, [this] { tell({{}, true}); });
+}
+
+void LinuxDiskEventSession::watchDevices(RunLoop& runLoop) {
+  auto events = DeviceEvents::open(_machine.root);
+  if (!events) {
+    _machine.effects.recordFailure(setting::startupDisk, events.failure());
+    return;
+  }
+  _deviceEvents.emplace(std::move(events).value());
+  _deviceChanges = runLoop.watch(_deviceEvents->descriptor(), RunLoop::Readiness::readable, [this] {
+    if (const auto changed = _deviceEvents->take(); changed.all || !changed.names.empty()) tell(changed);
+  });
+}
+
+void LinuxDiskEventSession::watchMounts(RunLoop& runLoop) {
+  auto mounts = _machine.root.open(MountTable::file, O_RDONLY);
+  if (!mounts) return;  // reading them tells of it
+  _mounts = std::move(mounts).value();
+  _mountChanges = runLoop.watch(_mounts.number(), RunLoop::Readiness::priority, [this] { tell({}); });
+}
+
+void LinuxDiskEventSession::unschedule() {
+  _firstReport.cancel();
+  _deviceChanges.cancel();
+  _mountChanges.cancel();
+  _deviceEvents.reset();
+  _mounts = {};
+}
+
+void LinuxDiskEventSession::tell(const ChangedDevices& changed) {
+  const auto now = _disks.renew(changed);
+  _callbacks.tellDifferences(*std::exchange(_told, now), *now);
+  _disks.forgetOld();
+}
+
+std::optional<DiskName> LinuxDiskEventSession::diskOfPath(const std::string& path) {
+  const auto place = _machine.root.standardized(path);
+  if (!place || (*place != "/" && !_machine.root.exists(*place))) return std::nullopt;
+  return _disks.holding(*place);
+}
+
+}  // namespace tavisk

@@ -1,0 +1,60 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/disks/LinuxDiskQueries.h"
+
+namespace tavisk {
+namespace {
+
+constexpr ServiceStatus failed = 1;
+
+enum Scheme { none = 0, openFirmware = 1, guid = 2, masterBootRecord = 3, other = 4 };
+
+Scheme schemeOf(const std::string& table) {
+  if (table.empty()) return none;
+  if (table == "mac") return openFirmware;
+  if (table == "gpt") return guid;
+  return table == "dos" ? masterBootRecord : other;
+}
+
+}  // namespace
+
+bool LinuxDiskQueries::is(DiskTrait trait, const DiskName& disk) {
+  const auto whole = _disks.devices().wholeDisk(disk);
+  const auto medium = [&] {
+    const auto facts = _disks.facts(whole);
+    return facts ? facts->medium : OpticalMedium::none;
+  };
+  switch (trait) {
+    case DiskTrait::internal:
+      return _disks.devices().isInternal(whole);
+    case DiskTrait::cd:
+      return medium() == OpticalMedium::cd;
+    case DiskTrait::dvd:
+      return medium() == OpticalMedium::dvd;
+    case DiskTrait::optical:
+      return _disks.devices().isOptical(whole);
+  }
+  return false;
+}
+
+std::string LinuxDiskQueries::protocolOf(const DiskName& disk) {
+  return _disks.devices().transportOf(_disks.devices().wholeDisk(disk));
+}
+
+std::string LinuxDiskQueries::nameOf(DiskProtocol protocol) {
+  return protocol == DiskProtocol::usb ? transport::usb : transport::diskImage;
+}
+
+int LinuxDiskQueries::partitionScheme(const DiskName& disk) {
+  const auto facts = _disks.facts(_disks.devices().wholeDisk(disk));
+  return facts ? schemeOf(facts->table.type) : none;
+}
+
+DiskQueries::OpticalBootability LinuxDiskQueries::opticalBootability(const DiskName& disk) {
+  const auto whole = _disks.devices().wholeDisk(disk);
+  const auto facts = _disks.facts(whole);
+  if (!facts || facts->unread || !_disks.devices().isOptical(whole)) return {failed, false};
+  return {0, facts->volume.bootSystemId == "EL TORITO SPECIFICATION"};
+}
+
+}  // namespace tavisk

@@ -1,0 +1,213 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/disks/LinuxDisks.h"
+
+#include <algorithm>
+#include <array>
+#include <string_view>
+#include <utility>
+
+#include "base/Text.h"
+#include "effects/SettingNames.h"
+
+namespace tavisk {
+namespace {
+
+constexpr std::int64_t sector = 512;
+constexpr int deepestOverlay = 4;
+
+bool isOneOf(const std::string& type, std::initializer_list<const char*> types) {
+  return std::ranges::find(types, type) != types.end();
+}
+
+bool isNetworkType(const std::string& type) {
+  return isOneOf(type, {"nfs", "nfs4", "cifs", "smb3", "ceph", "9p", "afs", "lustre", "fuse.sshfs", "fuse.glusterfs"});
+}
+
+/// File systems that are on block devices and have a number of their own.
+bool isNumberedApart(const std::string& type) {
+  return isOneOf(type, {"btrfs", "bcachefs"});
+}
+
+/// The name of a file-system type that the callers know, of Linux's name for it.
+std::string kindOf(const std::string& type) {
+  if (type == "vfat") return "msdos";
+  if (type == "iso9660") return "cd9660";
+  return type == "ntfs3" ? "ntfs" : type;
+}
+
+std::shared_ptr<DiskDescription> networkVolume(const Mount& mount) {
+  auto disk = std::make_shared<DiskDescription>();
+  disk->mediaName = mount.source;
+  disk->volumePath = mount.point;
+  disk->volumeKind = mount.type;
+  disk->mediaWritable = !mount.readOnly;
+  disk->volumeNetwork = true;
+  return disk;
+}
+
+/// The folder of an overlay that its own files are in: the one that is written, else the lowest.
+std::string folderBeneath(const Mount& overlay) {
+  std::string lowest;
+  for (const auto& option : split(overlay.options, ",")) {
+    if (option.starts_with("upperdir=")) return option.substr(option.find('=') + 1);
+    if (option.starts_with("lowerdir=")) lowest = option.substr(std::max(option.find('='), option.rfind(':')) + 1);
+  }
+  return lowest;
+}
+
+}  // namespace
+
+std::shared_ptr<const DiskDescription> LinuxDisks::find(const DiskName& name) {
+  const std::scoped_lock lock(_mutex);
+  readOnce();
+  auto disk = _current->find(name);
+  return disk || !_old ? disk : _old->find(name);
+}
+
+std::optional<DiskFacts> LinuxDisks::facts(const DiskName& name) {
+  const std::scoped_lock lock(_mutex);
+  readOnce();
+  const auto found = _facts.find(name.text);
+  return found == _facts.end() ? std::nullopt : std::optional(found->second);
+}
+
+std::optional<DiskName> LinuxDisks::holding(const std::string& path) {
+  const std::scoped_lock lock(_mutex);
+  readOnce();
+  const auto* mount = _mounts.holding(path);
+  return !mount ? std::nullopt : diskOf(*mount, 0);
+}
+
+LinuxDisks::Snapshot LinuxDisks::renew(const ChangedDevices& changed) {
+  const std::scoped_lock lock(_mutex);
+  readMounts();
+  readDevices(changed);
+  _old = std::exchange(_current, describe());
+  return _current;
+}
+
+void LinuxDisks::forgetOld() {
+  const std::scoped_lock lock(_mutex);
+  _old = nullptr;
+}
+
+void LinuxDisks::readOnce() {
+  if (_current) return;
+  readMounts();
+  readDevices({{}, true});
+  _current = describe();
+}
+
+void LinuxDisks::readMounts() {
+  _bySource.clear();
+  auto mounts = MountTable::read(_machine.root);
+  if (!mounts) _machine.effects.recordFailure(setting::startupDisk, mounts.failure());
+  _mounts = std::move(mounts).valueOr(MountTable(""));
+  std::map<std::string, std::optional<BlockDevice>> known;
+  for (const auto& mount : _mounts.mounts()) {
+    if (!mount.visible || !isNumberedApart(mount.type)) continue;
+    auto [entry, isNew] = known.try_emplace(mount.source);
+    if (isNew) entry->second = _devices.withNode(mount.source);
+    if (!entry->second) continue;
+    const auto* previous = std::exchange(_bySource[entry->second->name.text], &mount);
+    if (previous && (previous->root == "/" || mount.root != "/")) _bySource[entry->second->name.text] = previous;
+  }
+}
+
+void LinuxDisks::readDevices(const ChangedDevices& changed) {
+  auto names = changed.names;
+  if (changed.all) {
+    for (const auto& [name, facts] : _facts) names.insert(name);
+    for (const auto& name : _devices.list()) names.insert(name.text);
+  }
+  names.merge(newlyMounted());
+  for (const auto& name : names) readDevice(name);
+}
+
+/// Devices that may have got their file system, or have come, without an event.
+std::set<std::string> LinuxDisks::newlyMounted() const {
+  std::set<std::string> names;
+  std::set<DeviceNumber> known;
+  for (const auto& [name, facts] : _facts) {
+    known.insert(facts.device.number);
+    const auto before = _current ? _current->find({name}) : nullptr;
+    const auto* mount = mountOf(facts.device);
+    if (before && mount && before->volumePath != mount->point) names.insert(name);
+  }
+  for (const auto& mount : _mounts.mounts()) {
+    if (!mount.visible || mount.device.major == 0 || !known.insert(mount.device).second) continue;
+    if (const auto device = _devices.withNumber(mount.device)) names.insert(device->name.text);
+  }
+  return names;
+}
+
+void LinuxDisks::readDevice(const std::string& name) {
+  _facts.erase(name);
+  auto facts = factsOf(_machine.root, {name});
+  if (!facts) return;
+  tellUnread(*facts);
+  _facts.emplace(name, std::move(*facts));
+}
+
+/// In a container the machine's disks cannot be read, and are none of its business.
+void LinuxDisks::tellUnread(const DiskFacts& facts) const {
+  const auto* mount = mountOf(facts.device);
+  if (facts.unread && mount && mount->root == "/") _machine.effects.recordFailure(setting::startupDisk, *facts.unread);
+}
+
+LinuxDisks::Snapshot LinuxDisks::describe() const {
+  auto snapshot = std::make_shared<DiskSnapshot>();
+  for (const auto& [name, facts] : _facts) snapshot->add(describe(facts));
+  for (const auto& mount : _mounts.mounts())
+    if (mount.visible && isNetworkType(mount.type)) snapshot->add(networkVolume(mount));
+  return snapshot;
+}
+
+const Mount* LinuxDisks::mountOf(const BlockDevice& device) const {
+  if (const auto* mount = _mounts.mountOf(device.number)) return mount;
+  const auto found = _bySource.find(device.name.text);
+  return found == _bySource.end() ? nullptr : found->second;
+}
+
+std::shared_ptr<DiskDescription> LinuxDisks::describe(const DiskFacts& facts) const {
+  auto disk = std::make_shared<DiskDescription>();
+  const auto* mount = mountOf(facts.device);
+  disk->mediaName = facts.device.name.text;
+  disk->volumeName = facts.volume.label;
+  disk->volumeUuid = facts.volume.uuid;
+  disk->mediaContent = contentOf(facts);
+  disk->devicePath = facts.device.path;
+  disk->busPath = facts.busPath;
+  disk->mediaSize = static_cast<std::int64_t>(facts.device.size) * sector;
+  disk->mediaWritable = facts.device.writable && (!mount || !mount->readOnly);
+  disk->volumeMountable = mount || facts.volume.usage == "filesystem";
+  if (facts.volume.type) disk->volumeKind = kindOf(*facts.volume.type);
+  if (mount) {
+    disk->volumePath = mount->point;
+    if (!disk->volumeKind) disk->volumeKind = kindOf(mount->type);
+  }
+  return disk;
+}
+
+/// What a partition is said to hold; of a whole disk its partition table.
+std::optional<std::string> LinuxDisks::contentOf(const DiskFacts& facts) const {
+  if (facts.partitionType) return facts.partitionType;
+  const auto disk = _facts.find(facts.device.disk.text);
+  const auto* partition =
+      facts.device.partition == 0 || disk == _facts.end() ? nullptr : disk->second.table.find(facts.device.partition);
+  if (partition) return partition->type;
+  return facts.table.type.empty() ? std::nullopt : std::optional(facts.table.type);
+}
+
+std::optional<DiskName> LinuxDisks::diskOf(const Mount& mount, int depth) const {
+  if (isNetworkType(mount.type)) return DiskName{mount.source};
+  if (mount.type == "overlay") {
+    const auto* beneath = depth < deepestOverlay ? _mounts.holding(folderBeneath(mount)) : nullptr;
+    return !beneath || beneath == &mount ? std::nullopt : diskOf(*beneath, depth + 1);
+  }
+  const auto device = isNumberedApart(mount.type) ? _devices.withNode(mount.source) : _devices.withNumber(mount.device);
+  return device ? std::optional(device->name) : std::nullopt;
+}
+
+}  // namespace tavisk

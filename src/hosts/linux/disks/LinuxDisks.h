@@ -1,0 +1,64 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <map>
+#include <memory>
+#include <mutex>
+#include <optional>
+#include <set>
+#include <string>
+
+#include "hosts/linux/disks/DeviceEvents.h"
+#include "hosts/linux/disks/DiskFacts.h"
+#include "hosts/linux/disks/MountTable.h"
+#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/shared/DiskSnapshot.h"
+#include "platform/DiskDescription.h"
+
+namespace tavisk {
+
+/// The disks of the machine as this run knows them: block devices with a medium, by name, then network volumes. They
+/// change only when the session says so, in a pass of the run loop. From any thread.
+class LinuxDisks {
+ public:
+  using Snapshot = std::shared_ptr<const DiskSnapshot>;
+
+  explicit LinuxDisks(const LinuxMachine& machine) : _machine(machine), _devices(machine.root) {}
+
+  const BlockDevices& devices() const { return _devices; }
+  /// Null when there is no such disk. Between renew and forgetOld the disks that have gone are still found.
+  std::shared_ptr<const DiskDescription> find(const DiskName& name);
+  /// Absent when there is no such device, or no medium in it.
+  std::optional<DiskFacts> facts(const DiskName& name);
+  /// The disk that a path is on; the path is absolute and standardized.
+  std::optional<DiskName> holding(const std::string& path);
+
+  /// Looks at the mounts anew, at the devices that have changed, and at those that are mounted elsewhere than before.
+  Snapshot renew(const ChangedDevices& changed);
+  void forgetOld();
+
+ private:
+  void readOnce();
+  void readMounts();
+  void readDevices(const ChangedDevices& changed);
+  std::set<std::string> newlyMounted() const;
+  void readDevice(const std::string& name);
+  void tellUnread(const DiskFacts& facts) const;
+  Snapshot describe() const;
+  const Mount* mountOf(const BlockDevice& device) const;
+  std::shared_ptr<DiskDescription> describe(const DiskFacts& facts) const;
+  std::optional<std::string> contentOf(const DiskFacts& facts) const;
+  std::optional<DiskName> diskOf(const Mount& mount, int depth) const;
+
+  LinuxMachine _machine;
+  BlockDevices _devices;
+  std::mutex _mutex;                        ///< of all that follows
+  std::map<std::string, DiskFacts> _facts;  ///< by name
+  MountTable _mounts{""};
+  std::map<std::string, const Mount*> _bySource;  ///< the mounts of file systems that have no device number, by disk
+  Snapshot _current;                              ///< null until it is first asked for
+  Snapshot _old;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,56 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "base/Result.h"
+#include "hosts/linux/disks/BlockDevices.h"
+#include "hosts/linux/disks/BlockProbe.h"
+#include "hosts/linux/firmware/EfiDevicePath.h"
+#include "hosts/shared/SystemRoot.h"
+#include "platform/DiskDescription.h"
+
+namespace tavisk {
+
+/// What firmware is to start for a volume.
+struct BootTarget {
+  std::string label;  ///< of the volume, for people
+  std::string path;   ///< the boot file, as this system names it
+  EfiPartition partition;
+  std::string file;  ///< the boot file on that partition, as firmware names it: "\EFI\BOOT\BOOTX64.EFI"
+};
+
+/// Between this system's volumes and the partitions and files by which firmware knows them.
+class BootVolumes {
+ public:
+  /// The root is not owned.
+  explicit BootVolumes(const SystemRoot& root) : _root(root), _devices(root) {}
+
+  /// The boot file of a system: on its own volume where firmware reads that, else the one that is kept for the volume
+  /// on the EFI system partition of its disk, in "\EFI\tavisk\<UUID of the file system>". Fails when firmware would
+  /// find nothing, or could find something else.
+  Result<BootTarget> targetOf(const DiskName& volume, const std::string& systemFolder) const;
+
+  /// The volume that is started by a file of a partition.
+  Result<DiskName> volumeOf(const EfiPartition& partition, const std::string& file) const;
+
+ private:
+  Result<BootTarget> onVolume(const BlockDevice& volume, const std::string& systemFolder) const;
+  Result<BootTarget> besideVolume(const BlockDevice& volume, const VolumeFacts& facts) const;
+  Result<BootTarget> onSystemPartition(const DiskName& name, const std::string& file) const;
+  Result<EfiPartition> identityOf(const BlockDevice& partition) const;
+  Result<std::vector<DiskName>> systemPartitionsOf(const DiskName& disk) const;
+  bool isDiskImage(const DiskName& disk) const;
+  std::optional<DiskName> partitionOf(const DiskName& disk, int number) const;
+  std::vector<DiskName> partitionsWith(const std::string& uuid) const;
+  Result<DiskName> partitionWith(const EfiPartition& partition) const;
+  std::optional<DiskName> fileSystemWith(const std::string& uuid, const DiskName& disk) const;
+
+  const SystemRoot& _root;
+  BlockDevices _devices;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,189 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/firmware/LinuxBootSettings.h"
+
+#include <algorithm>
+
+#include "base/Text.h"
+#include "effects/SettingNames.h"
+#include "hosts/linux/firmware/BootFile.h"
+#include "hosts/linux/system/KernelFile.h"
+#include "hosts/linux/system/Rights.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* deviceTree = "/sys/firmware/devicetree/base";
+constexpr const char* interfaces = "/sys/class/net";
+constexpr int noneKnown = 0;
+constexpr int openFirmware = 1;
+constexpr int bootsEfiFiles = 2;
+constexpr ServiceStatus failed = 1;
+
+using Value = std::optional<std::string>;
+
+std::optional<EfiDevicePath> pathOf(const BootEntry& entry) {
+  return parseDevicePath(entry.option.paths);
+}
+
+std::string nameOf(const BootEntry& entry) {
+  return bootEntryName(entry.number) + " (" + entry.option.description + ")";
+}
+
+bool isOpenFirmware(const SystemRoot& root) {
+  auto properties = root.list(deviceTree).valueOr({});
+  return std::ranges::any_of(properties,
+                             [](const auto& name) { return name == "openprom" || name.starts_with("ibm,"); });
+}
+
+}  // namespace
+
+LinuxBootSettings::LinuxBootSettings(const LinuxMachine& machine)
+    : _machine(machine), _variables(machine.root), _entries(_variables), _volumes(machine.root) {}
+
+int LinuxBootSettings::preBootEnvironment() {
+  if (_machine.root.exists("/sys/firmware/efi")) return bootsEfiFiles;
+  return isOpenFirmware(_machine.root) ? openFirmware : noneKnown;
+}
+
+BootSettings::LegacyBootSupport LinuxBootSettings::legacyBootSupport() {
+  if (preBootEnvironment() != bootsEfiFiles) return {0, true};
+  const auto entries = _entries.all();
+  if (!entries) {
+    _machine.effects.recordFailure(setting::startupDisk, entries.failure());
+    return {failed, false};
+  }
+  const bool supported = std::ranges::any_of(*entries, [](const auto& entry) {
+    const auto path = pathOf(entry);
+    return path && isLegacyBoot(*path);
+  });
+  return {0, supported};
+}
+
+/// What firmware starts at the next start.
+Result<std::optional<BootEntry>> LinuxBootSettings::preferred() const {
+  if (auto failure = _variables.whyNone()) return *failure;
+  auto once = _entries.onlyNext();
+  return !once || *once ? once : _entries.first();
+}
+
+Result<std::optional<DiskName>> LinuxBootSettings::preferredVolume() const {
+  const auto entry = preferred();
+  if (!entry) return entry.failure();
+  if (!*entry) return Failure{"read", EfiVariables::pathOf(BootEntries::orderVariable()), "no entry is in the order"};
+  const auto path = pathOf(**entry);
+  if (path && networkPathOf(*path)) return std::optional<DiskName>();
+  const auto partition = path ? partitionOf(*path) : std::nullopt;
+  if (!partition) return Failure{"find the volume of", nameOf(**entry), "the entry names no partition"};
+  const auto volume = _volumes.volumeOf(*partition, fileOf(*path).value_or(""));
+  if (!volume) return volume.failure();
+  return std::optional(*volume);
+}
+
+BootSettings::BootPreference LinuxBootSettings::bootPreference() {
+  auto volume = preferredVolume();
+  if (!volume) {
+    _machine.effects.recordFailure(setting::startupDisk, volume.failure());
+    return {failed, std::nullopt};
+  }
+  if (*volume) _machine.effects.observe({setting::startupDisk, (*volume)->text, std::nullopt, ""});
+  return {0, *volume};
+}
+
+/// Without firmware that keeps one there is no such preference, which is no failure.
+BootSettings::NetworkBootPreference LinuxBootSettings::networkBootPreference() {
+  const auto entry = preferred();
+  const auto path = entry && *entry ? pathOf(**entry) : std::nullopt;
+  const auto network = path ? networkPathOf(*path) : std::nullopt;
+  if (!network) return {};
+  const auto interface = interfaceWith(network->hardwareAddress);
+  if (interface.empty()) {
+    _machine.effects.recordFailure(
+        setting::networkStartupDisk,
+        {"find the interface of", nameOf(**entry), "none here has the address " + network->hardwareAddress});
+    return {failed, {}, {}, {}};
+  }
+  _machine.effects.observe({setting::networkStartupDisk, interface, std::nullopt, ""});
+  return {0, network->uri, network->server, interface};
+}
+
+std::string LinuxBootSettings::interfaceWith(const std::string& hardwareAddress) const {
+  for (const auto& name : _machine.root.list(interfaces).valueOr({})) {
+    const auto address = readKernelFile(_machine.root, std::string(interfaces).append("/").append(name) + "/address");
+    if (address && lowerCased(*address) == hardwareAddress) return name;
+  }
+  return "";
+}
+
+ServiceStatus LinuxBootSettings::setBootPreference(const BootChoice& choice) {
+  const auto option = optionFor(choice);
+  Setting<std::string> parts;
+  parts.name = setting::startupDisk;
+  parts.where = EfiVariables::pathOf(BootEntries::orderVariable());
+  parts.note = [this](const auto&) { return noteOnNextStart(); };
+  parts.supported = [this] { return _variables.whyNone(); };
+  parts.stored = [this]() -> Result<Value> {
+    const auto entry = _entries.first();
+    if (!entry) return entry.failure();
+    return *entry ? Value(targetText((*entry)->option)) : Value();
+  };
+  parts.store = [&](const std::string&) -> Result<void> {
+    if (!option) return option.failure();
+    return _entries.putFirst(*option, [this](const auto& order) { return keepOrder(order); });
+  };
+  return change(parts, option ? targetText(*option) : choice.disk.text + " " + choice.systemFolder);
+}
+
+/// An entry for the volume's own boot file, if firmware would start it.
+Result<EfiLoadOption> LinuxBootSettings::optionFor(const BootChoice& choice) const {
+  const auto target = _volumes.targetOf(choice.disk, choice.systemFolder);
+  if (!target) return target.failure();
+  if (auto refusal = whyRefused(*target)) return *refusal;
+  EfiLoadOption option;
+  option.description = "tavisk " + escaped(target->label);
+  option.paths = bytesOf({*partitionNode(target->partition), fileNode(target->file)});
+  return option;
+}
+
+std::optional<Failure> LinuxBootSettings::whyRefused(const BootTarget& target) const {
+  const auto file = readBootFile(_machine.root, target.path);
+  if (!file) return file.failure();
+  if (file->isSigned) return std::nullopt;
+  const auto secureBoot = _variables.read({"SecureBoot"});
+  if (!secureBoot) return secureBoot.failure();
+  if (!*secureBoot || !(*secureBoot)->starts_with('\1')) return std::nullopt;
+  return Failure{"start", target.path, "Secure Boot is on and the file has no signature"};
+}
+
+std::string LinuxBootSettings::noteOnNextStart() const {
+  const auto once = _entries.onlyNext().valueOr(std::nullopt);
+  return once ? "the next start alone is from " + nameOf(*once) + ", as BootNext says" : "";
+}
+
+Result<void> LinuxBootSettings::keepOrder(const std::vector<std::uint16_t>& order) const {
+  return _machine.root.write(previousOrder, textOf(order) + "\n");
+}
+
+ServiceStatus LinuxBootSettings::setFirmwareVariable(const std::string& name, const std::string& value) {
+  const EfiVariableName variable{name, efiOwnVendor};
+  Setting<std::string> parts;
+  parts.name = setting::firmwareVariable + name;
+  parts.where = EfiVariables::pathOf(variable);
+  parts.supported = [this] { return _variables.whyNone(); };
+  parts.stored = [this, variable] { return _variables.read(variable); };
+  parts.store = [this, variable](const std::string& text) { return _variables.write(variable, text); };
+  return change(parts, value);
+}
+
+ServiceStatus LinuxBootSettings::change(const Setting<std::string>& setting, const std::string& asked) const {
+  auto parts = setting;
+  parts.store = [&](const std::string& value) -> Result<void> {
+    if (auto failure = whyNeedsRoot("write", setting.where)) return *failure;
+    return setting.store(value);
+  };
+  const auto effect = carryOut(parts, asked, _machine.effects, _machine.runLoop);
+  const bool isDone = effect.outcome == Outcome::applied || effect.outcome == Outcome::unchanged;
+  return isDone ? 0 : failed;
+}
+
+}  // namespace tavisk

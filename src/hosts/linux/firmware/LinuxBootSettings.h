@@ -1,0 +1,49 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include "base/Result.h"
+#include "hosts/linux/firmware/BootEntries.h"
+#include "hosts/linux/firmware/BootVolumes.h"
+#include "hosts/linux/firmware/EfiVariables.h"
+#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/shared/SettingChange.h"
+#include "platform/DiskManagementService.h"
+
+namespace tavisk {
+
+/// What the machine starts from, kept by UEFI firmware. Other firmware has no choice of a disk that Linux could set: it
+/// has no preference, and to set one is not supported.
+class LinuxBootSettings final : public BootSettings {
+ public:
+  explicit LinuxBootSettings(const LinuxMachine& machine);
+
+  /// Where the order before the last change is kept, one line as firmware tools take it.
+  static constexpr const char* previousOrder = "/var/lib/tavisk/previous-boot-order";
+
+  int preBootEnvironment() override;
+  LegacyBootSupport legacyBootSupport() override;
+  BootPreference bootPreference() override;
+  NetworkBootPreference networkBootPreference() override;
+  ServiceStatus setBootPreference(const BootChoice& choice) override;
+  ServiceStatus setFirmwareVariable(const std::string& name, const std::string& value) override;
+
+ private:
+  Result<std::optional<BootEntry>> preferred() const;
+  Result<std::optional<DiskName>> preferredVolume() const;
+  Result<EfiLoadOption> optionFor(const BootChoice& choice) const;
+  std::optional<Failure> whyRefused(const BootTarget& target) const;
+  std::string interfaceWith(const std::string& hardwareAddress) const;
+  std::string noteOnNextStart() const;
+  Result<void> keepOrder(const std::vector<std::uint16_t>& order) const;
+  ServiceStatus change(const Setting<std::string>& setting, const std::string& asked) const;
+
+  LinuxMachine _machine;
+  EfiVariables _variables;
+  BootEntries _entries;
+  BootVolumes _volumes;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,27 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/machine/LinuxBootLoaderFile.h"
+
+#include "hosts/linux/system/Rights.h"
+#include "hosts/shared/KernelArchitecture.h"
+
+namespace tavisk {
+
+std::optional<PropertyList::Dictionary> LinuxBootLoaderFile::read() {
+  const auto contents = _file.read();
+  static_cast<void>(observe(kernelArchitecture(contents), _machine.effects));
+  return contents.valueOr(std::nullopt);
+}
+
+bool LinuxBootLoaderFile::write(const PropertyList::Dictionary& contents) {
+  auto setting = kernelArchitecture(_file, contents);
+  setting.note = saying("stored; no boot loader here reads it");
+  setting.store = [write = setting.store](const std::string& architecture) {
+    const auto failure = whyNeedsRoot("write", path);
+    return failure ? Result<void>(*failure) : write(architecture);
+  };
+  const auto effect = carryOut(setting, architectureIn(contents), _machine.effects, _machine.runLoop);
+  return effect.outcome != Outcome::failed;
+}
+
+}  // namespace tavisk

@@ -1,0 +1,59 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "base/PropertyList.h"
+#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/shared/PropertyListFile.h"
+#include "hosts/shared/SettingChange.h"
+#include "hosts/shared/SystemRoot.h"
+#include "platform/Preferences.h"
+
+namespace tavisk {
+
+/// A property list in /etc/tavisk/preferences, the administrator's as everything there. A file that cannot be
+/// understood reads as none, and is kept as NAME.damaged before it is written anew.
+class LinuxPreferencesStore final : public PreferencesStore {
+ public:
+  explicit LinuxPreferencesStore(const LinuxMachine& machine);
+
+  std::optional<PropertyList> value(const std::string& key) override;
+
+  /// What was set is stored by writeOut(), together with what other runs have stored meanwhile.
+  void setBoolean(const std::string& key, bool value) { _pending.emplace_back(key, value); }
+  void writeOut();
+
+ private:
+  Setting<std::string> preference(const std::string& key);
+  Result<void> store(const std::string& key, bool value);
+
+  LinuxMachine _machine;
+  PropertyListFile _file;
+  std::vector<std::pair<std::string, bool>> _pending;
+};
+
+/// A property list that the administrator may write. The languages, when it has none, are those of the machine
+/// (locale.conf(5), or /etc/default/locale).
+class LinuxUserDefaults final : public UserDefaults {
+ public:
+  /// The root is not owned.
+  explicit LinuxUserDefaults(const SystemRoot& root) : _root(root) {}
+
+  static constexpr const char* file = "/etc/tavisk/preferences/tavisk.plist";
+
+  bool boolean(const std::string& key) override;
+  std::optional<double> number(const std::string& key) override;
+  std::vector<std::string> strings(const std::string& key) override;
+
+ private:
+  std::optional<PropertyList> value(const std::string& key) const;
+  std::vector<std::string> machineLanguages() const;
+
+  const SystemRoot& _root;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,72 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+
+#include "hosts/linux/machine/LinuxProcesses.h"
+
+#include <sys/syscall.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+
+#include "base/Result.h"
+#include "effects/SettingNames.h"
+#include "hosts/linux/system/ProcessScan.h"
+#include "hosts/linux/system/Program.h"
+#include "hosts/linux/system/Rights.h"
+#include "hosts/shared/SettingChange.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* tried = "send signal";
+
+}  // namespace
+
+ProcessId LinuxProcessUtilities::processNamed(const std::string& name) {
+  const auto found = processesNamed(_machine.root, name);
+  return found.empty() ? 0 : *std::ranges::min_element(found);
+}
+
+void LinuxProcessUtilities::sendSignal(int signal, ProcessId process) {
+  Setting<std::string> setting;
+  setting.name = setting::signalToProcess;
+  setting.apply = [&](const std::string&) { return signalProcess(signal, process); };
+  carryOut(setting, std::to_string(signal) + " to process " + std::to_string(process), _machine.effects,
+           _machine.runLoop);
+}
+
+Result<void> LinuxProcessUtilities::signalProcess(int signal, ProcessId process) const {
+  const auto name = "process " + std::to_string(process);
+  if (process < 1) return Failure{tried, name, "this is no process id"};
+  // The ids in a tree may be those of strangers on the machine that runs the tool.
+  if (_machine.root.prefix() != "/") return Failure{tried, name, "a tree of files has no processes"};
+  const FileDescriptor handle(static_cast<int>(::syscall(SYS_pidfd_open, process, 0)));
+  if (!handle) return systemFailure(tried, name, errno);
+  if (::syscall(SYS_pidfd_send_signal, handle.number(), signal, nullptr, 0) == 0) return {};
+  const int error = errno;
+  const auto forRoot = error == EPERM ? whyNeedsRoot(tried, name) : std::nullopt;
+  return forRoot.value_or(systemFailure(tried, name, error));
+}
+
+void LinuxProcessTermination::disable() {
+  if (_holds++ > 0) return;
+  auto bus = _machine.services.systemBus();
+  if (!bus) return;
+  const BusObject logins{"org.freedesktop.login1", "/org/freedesktop/login1", "org.freedesktop.login1.Manager"};
+  auto hold = (*bus)->query(logins, "Inhibit", "h", "shutdown", "tavisk", "The startup disk is being set", "delay");
+  if (hold) _hold = std::move(hold).value().readDescriptor();
+}
+
+void LinuxProcessTermination::enable() {
+  if (_holds > 0 && --_holds == 0) _hold = FileDescriptor();
+}
+
+Result<ProgramOutput> LinuxProgramRunner::run(const std::string& program, const std::vector<std::string>& arguments) {
+  if (!_machine.root.exists(program)) return Failure{"run", program, "no such program"};
+  std::vector<std::string> words{program};
+  words.insert(words.end(), arguments.begin(), arguments.end());
+  return outputOfProgram(_machine.root, words, _machine.runLoop);
+}
+
+}  // namespace tavisk

@@ -1,0 +1,62 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "base/FileDescriptor.h"
+#include "hosts/linux/machine/KeyboardLock.h"
+#include "hosts/linux/machine/LinuxPreferences.h"
+#include "hosts/linux/services/LinuxMachine.h"
+#include "platform/Processes.h"
+
+namespace tavisk {
+
+/// The processes in /proc, the keyboards and the lock of the enclosure.
+class LinuxProcessUtilities final : public ProcessUtilities {
+ public:
+  /// The last two must outlive the object.
+  LinuxProcessUtilities(const LinuxMachine& machine, LinuxPreferencesStore& preferences,
+                        ManagementController& controller)
+      : _machine(machine), _preferences(preferences), _lock(machine, controller) {}
+
+  /// The one with the smallest id.
+  ProcessId processNamed(const std::string& name) override;
+  /// Only to a process that has an id of its own, never to a group or to all.
+  void sendSignal(int signal, ProcessId process) override;
+  void setLockEnclosureState(bool disablesKeyboard) override { _lock.setDisablesKeyboard(disablesKeyboard); }
+  void setMachineBoolean(const std::string& key, bool value) override { _preferences.setBoolean(key, value); }
+  void writeMachinePreferences() override { _preferences.writeOut(); }
+
+ private:
+  Result<void> signalProcess(int signal, ProcessId process) const;
+
+  LinuxMachine _machine;
+  LinuxPreferencesStore& _preferences;
+  EnclosureLock _lock;
+};
+
+/// Asks the service of logins to delay a shutdown (its Inhibit() call, org.freedesktop.login1(5)). Where there is no
+/// such service nothing waits.
+class LinuxProcessTermination final : public ProcessTermination {
+ public:
+  explicit LinuxProcessTermination(const LinuxMachine& machine) : _machine(machine) {}
+
+  void disable() override;
+  void enable() override;
+
+ private:
+  LinuxMachine _machine;
+  FileDescriptor _hold;  ///< the delay lasts as long as it is open
+  int _holds = 0;
+};
+
+class LinuxProgramRunner final : public ProgramRunner {
+ public:
+  explicit LinuxProgramRunner(const LinuxMachine& machine) : _machine(machine) {}
+
+  Result<ProgramOutput> run(const std::string& program, const std::vector<std::string>& arguments) override;
+
+ private:
+  LinuxMachine _machine;
+};
+
+}  // namespace tavisk

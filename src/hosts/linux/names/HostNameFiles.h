@@ -1,0 +1,38 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "base/DnsName.h"
+#include "base/Result.h"
+#include "hosts/shared/SystemRoot.h"
+
+namespace tavisk {
+
+inline constexpr const char* prettyNameFile = "/etc/machine-info";
+inline constexpr const char* staticNameFile = "/etc/hostname";
+
+/// The name for people in machine-info(5), and the host name in hostname(5). Absent when there is none; a file that
+/// cannot be read is a failure.
+Result<std::optional<std::string>> prettyHostName(const SystemRoot& root);
+Result<std::optional<std::string>> staticHostName(const SystemRoot& root);
+/// An empty pretty name takes it out of the file.
+Result<void> setPrettyHostName(const SystemRoot& root, const std::string& name);
+Result<void> setStaticHostName(const SystemRoot& root, const std::string& name);
+
+/// What the kernel calls the machine (gethostname(2)), at most 64 bytes; absent when it was never given a name.
+Result<std::optional<std::string>> kernelHostName(const SystemRoot& root);
+inline constexpr std::size_t longestKernelHostName = 64;
+Result<void> setKernelHostName(const SystemRoot& root, const std::string& name);
+
+/// The text of hosts(5) with the machine's own name, on the line of the address 127.0.1.1, changed from `before` to
+/// `now`; what follows its first label there stays, and so do all other names.
+std::string hostsWithName(std::string_view hosts, const std::string& before, const std::string& now);
+
+/// What on this machine sets another host name when it starts the next time, for people; empty when nothing is known.
+std::string whoUndoesHostName(const SystemRoot& root, const std::string& name);
+
+}  // namespace tavisk

@@ -1,0 +1,53 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "hosts/linux/names/NameAnnouncer.h"
+#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/shared/SettingChange.h"
+#include "platform/NameServices.h"
+
+namespace tavisk {
+
+/// The names in /etc/machine-info and /etc/hostname, through the service that keeps them (org.freedesktop.hostname1(5))
+/// where it is there; the kernel's name, the one that is announced, and the machine's own line in /etc/hosts.
+class LinuxHostConfigService final : public HostConfigService {
+ public:
+  explicit LinuxHostConfigService(const LinuxMachine& machine)
+      : _machine(machine), _announcer(machine.services, machine.runLoop) {}
+
+  void setComputerName(const std::string& name) override;
+  void setLocalNetworkName(const std::string& name) override;
+
+ private:
+  using Value = std::optional<std::string>;
+
+  /// The service's answer, or false where it is left to the files.
+  Result<bool> setByService(const char* member, const std::string& name);
+  Result<Value> serviceComputerName();
+  Result<void> storeComputerName(const std::string& name);
+  Result<Value> liveLocalName();
+  Result<void> storeLocalName(const std::string& name);
+  Result<void> storeStaticName(const std::string& name);
+  Result<void> applyLocalName(const std::string& name);
+
+  LinuxMachine _machine;
+  NameAnnouncer _announcer;
+};
+
+/// The names as the machine has them at the moment: the one for people, which is that of its file, and the one that is
+/// announced, else the first label of the kernel's. Opening a session never fails.
+class LinuxDynamicStore final : public DynamicStore {
+ public:
+  explicit LinuxDynamicStore(const LinuxMachine& machine) : _machine(machine) {}
+
+  std::unique_ptr<Session> open(const std::string& clientName) override;
+
+ private:
+  LinuxMachine _machine;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,39 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/linux/system/SystemdConfig.h"
+#include "hosts/shared/SettingChange.h"
+
+namespace tavisk {
+
+/// Whether a machine that hangs restarts: the service manager keeps the watchdog's clock from running out
+/// (RuntimeWatchdogSec of systemd-system.conf(5)), and a kernel that has panicked restarts (kernel.panic). The parts
+/// may differ; the value then says which one is on.
+class RestartAfterFreeze {
+ public:
+  explicit RestartAfterFreeze(const LinuxMachine& machine) : _machine(machine), _config(machine.root, "system.conf") {}
+
+  Setting<std::string> restartAfterFreeze() const;
+  Setting<std::string> restartAfterFreezeChange() const;
+
+ private:
+  bool hasWatchdog() const;
+  Result<std::optional<std::string>> live() const;
+  /// What the service manager means to do; whether the watchdog runs is a fact of its own.
+  Result<bool> isWatchdogUsed() const;
+  std::string watchdogFact(const char* name) const;
+  std::string stored() const;
+  Result<void> store(const std::string& value) const;
+  Result<void> apply(const std::string& value) const;
+  Result<void> setWatchdog(bool on) const;
+  Result<void> setWatchdogTime(std::chrono::microseconds time) const;
+  Result<void> reloadManager() const;
+  std::string storedPanic() const;
+
+  LinuxMachine _machine;
+  SystemdConfig _config;
+};
+
+}  // namespace tavisk

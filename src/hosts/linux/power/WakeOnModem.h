@@ -1,0 +1,37 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <vector>
+
+#include "hosts/linux/power/UdevRule.h"
+#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/linux/system/SysDevice.h"
+#include "hosts/shared/SettingChange.h"
+
+namespace tavisk {
+
+/// Whether a modem that rings at a serial port wakes the machine. It is the port's place on the board that can: the
+/// terminal of every port has a file power/wakeup, which proves nothing.
+class WakeOnModem {
+ public:
+  explicit WakeOnModem(const LinuxMachine& machine) : _machine(machine), _rule(machine.root, "wake-on-ring") {}
+
+  Setting<std::string> wakeOnModem() const;
+  Setting<std::string> wakeOnModemChange() const;
+
+ private:
+  struct Port {
+    std::string terminal;
+    SysDevice place;
+  };
+  std::vector<Port> ports() const;
+  std::optional<Failure> whyNoPort() const;
+  Result<std::optional<std::string>> live() const;
+  Result<void> apply(const std::string& value) const;
+
+  LinuxMachine _machine;
+  UdevRule _rule;
+};
+
+}  // namespace tavisk

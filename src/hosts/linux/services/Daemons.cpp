@@ -1,0 +1,78 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/services/Daemons.h"
+
+namespace tavisk {
+
+DaemonGroup::DaemonGroup(Daemons& daemons, std::vector<std::string> units)
+    : _daemons(daemons), _units(std::make_shared<const std::vector<std::string>>(std::move(units))) {
+  for (const auto& unit : *_units) _members.push_back({unit.c_str(), "", ""});
+}
+
+std::string DaemonGroup::names() const {
+  std::string names;
+  for (const auto& member : _members) names.append(names.empty() ? "" : ", ").append(member.unit);
+  return names;
+}
+
+Result<DaemonGroup> DaemonGroup::present() const {
+  auto found = *this;
+  found._members.clear();
+  for (const auto& member : _members) {
+    auto presence = _daemons.presence(member);
+    if (!presence) return presence.failure();
+    if (*presence != Daemons::Presence::absent) found._members.push_back(member);
+  }
+  return found;
+}
+
+Result<std::vector<Daemon>> DaemonGroup::those(Result<bool> (Daemons::*are)(const Daemon&)) const {
+  std::vector<Daemon> found;
+  for (const auto& member : _members) {
+    auto is = (_daemons.*are)(member);
+    if (!is) return is.failure();
+    if (*is) found.push_back(member);
+  }
+  return found;
+}
+
+Result<std::vector<Daemon>> DaemonGroup::running() const {
+  return those(&Daemons::isRunning);
+}
+
+Result<std::vector<Daemon>> DaemonGroup::startingAtBoot() const {
+  return those(&Daemons::startsAtBoot);
+}
+
+Result<void> DaemonGroup::setAllStartAtBoot(bool start) const {
+  std::vector<Daemon> others;
+  for (const auto& member : _members) {
+    auto starts = _daemons.startsAtBoot(member);
+    if (!starts) return starts.failure();
+    if (*starts != start) others.push_back(member);
+  }
+  return others.empty() ? Result<void>() : _daemons.setStartAtBoot(others, start);
+}
+
+Result<void> DaemonGroup::startAll() const {
+  for (const auto& member : _members) {
+    auto runs = _daemons.isRunning(member);
+    if (!runs) return runs.failure();
+    if (*runs) continue;
+    if (auto started = _daemons.start(member); !started) return started;
+  }
+  return {};
+}
+
+Result<void> DaemonGroup::stopAll() const {
+  const std::vector<Daemon> backwards(_members.rbegin(), _members.rend());
+  for (const auto& member : backwards) {
+    auto runs = _daemons.isRunning(member);
+    if (!runs) return runs.failure();
+    if (!*runs) continue;
+    if (auto stopped = _daemons.stop(member); !stopped) return stopped;
+  }
+  return {};
+}
+
+}  // namespace tavisk

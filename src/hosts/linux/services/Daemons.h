@@ -1,0 +1,73 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "base/Result.h"
+
+namespace tavisk {
+
+/// A daemon by its three names: the service manager's, the init script's (empty: it has none), the program's.
+struct Daemon {
+  const char* unit;
+  const char* script;
+  const char* program;
+  /// Where the program writes its process id, when others of its name are no daemons; else empty.
+  const char* processFile = "";
+};
+
+/// Starts and stops daemons, now and at every start of the machine.
+class Daemons {
+ public:
+  enum class Presence { absent, masked, installed };
+  virtual ~Daemons() = default;
+
+  virtual Result<Presence> presence(const Daemon& daemon) = 0;
+  virtual Result<bool> isRunning(const Daemon& daemon) = 0;
+  virtual Result<bool> startsAtBoot(const Daemon& daemon) = 0;
+  /// One after the other; the first failure ends it.
+  virtual Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) = 0;
+  /// Success means that the daemon runs: one that was started and ended at once, or never began, is a failure.
+  virtual Result<void> start(const Daemon& daemon) = 0;
+  virtual Result<void> stop(const Daemon& daemon) = 0;
+  /// Success means that it has ended and started again.
+  virtual Result<void> restart(const Daemon& daemon) = 0;
+  /// A daemon that does not run stays so. Returns without waiting for the restart to end.
+  virtual Result<void> restartIfRunning(const Daemon& daemon) = 0;
+};
+
+/// Daemons that belong together, such as a service and the socket that starts it, the most important one first.
+class DaemonGroup {
+ public:
+  /// `daemons` must outlive the object, and so must the texts of the members.
+  DaemonGroup(Daemons& daemons, std::vector<Daemon> members) : _daemons(daemons), _members(std::move(members)) {}
+  /// Daemons that have no name but that of their unit.
+  DaemonGroup(Daemons& daemons, std::vector<std::string> units);
+
+  const std::vector<Daemon>& members() const { return _members; }
+  /// "ssh.service, ssh.socket"
+  std::string names() const;
+
+  /// Those that this machine has, also if they are masked.
+  Result<DaemonGroup> present() const;
+  Result<std::vector<Daemon>> running() const;
+  Result<std::vector<Daemon>> startingAtBoot() const;
+
+  /// Each member that is not so already; the first failure ends it.
+  Result<void> setAllStartAtBoot(bool start) const;
+  Result<void> startAll() const;
+  /// The last one first: a socket does not start its service again.
+  Result<void> stopAll() const;
+
+ private:
+  Result<std::vector<Daemon>> those(Result<bool> (Daemons::*are)(const Daemon&)) const;
+
+  Daemons& _daemons;
+  std::shared_ptr<const std::vector<std::string>> _units;  ///< keeps the texts
+  std::vector<Daemon> _members;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,140 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/services/InitScriptDaemons.h"
+
+#include <sys/syscall.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <string_view>
+#include <vector>
+
+#include "base/FileDescriptor.h"
+#include "base/Text.h"
+#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/linux/system/Program.h"
+#include "hosts/linux/system/Rights.h"
+
+namespace tavisk {
+namespace {
+
+// Debian's run level of a started machine (init(8)).
+constexpr const char* levelFolder = "/etc/rc2.d";
+constexpr const char* linkTool = "/usr/sbin/update-rc.d";
+constexpr std::chrono::seconds longestStart{3};
+constexpr std::chrono::seconds longestStop{3};
+constexpr std::size_t processFileLimit = 64;
+
+std::string scriptOf(const Daemon& daemon) {
+  return std::string("/etc/init.d/") + daemon.script;
+}
+
+/// "S01chrony": the kind, two digits, the script.
+bool isLinkTo(std::string_view script, std::string_view kinds, std::string_view link) {
+  return link.size() == script.size() + 3 && kinds.find(link[0]) != std::string_view::npos && link.ends_with(script);
+}
+
+}  // namespace
+
+Result<Daemons::Presence> InitScriptDaemons::presence(const Daemon& daemon) {
+  bool hasScript = *daemon.script != '\0' && _root.exists(scriptOf(daemon));
+  return hasScript && hasProgram(daemon) ? Presence::installed : Presence::absent;
+}
+
+/// A package that was removed, but not purged, leaves its script behind.
+bool InitScriptDaemons::hasProgram(const Daemon& daemon) const {
+  return _root.exists(std::string("/usr/sbin/") + daemon.program) ||
+         _root.exists(std::string("/usr/bin/") + daemon.program);
+}
+
+std::vector<ProcessId> InitScriptDaemons::processes(const Daemon& daemon) const {
+  auto found = processesNamed(_root, daemon.program);
+  if (*daemon.processFile == '\0') return found;
+  const auto written = leadingInteger(_root.read(daemon.processFile, processFileLimit).valueOr(""));
+  std::erase_if(found, [written](ProcessId id) { return id != written; });
+  return found;
+}
+
+Result<bool> InitScriptDaemons::isRunning(const Daemon& daemon) {
+  return !processes(daemon).empty();
+}
+
+bool InitScriptDaemons::hasLink(const Daemon& daemon, const char* kinds) const {
+  for (const auto& link : _root.list(levelFolder).valueOr({}))
+    if (isLinkTo(daemon.script, kinds, link)) return true;
+  return false;
+}
+
+Result<bool> InitScriptDaemons::startsAtBoot(const Daemon& daemon) {
+  return hasLink(daemon, "S");
+}
+
+Result<void> InitScriptDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
+  for (const auto& daemon : daemons)
+    if (auto turned = turnLinks(daemon, start); !turned) return turned;
+  return {};
+}
+
+Result<void> InitScriptDaemons::turnLinks(const Daemon& daemon, bool starts) {
+  // "enable" and "disable" turn links round; there must be some.
+  if (!hasLink(daemon, "SK"))
+    if (auto made = run({linkTool, daemon.script, "defaults"}); !made) return made;
+  return run({linkTool, daemon.script, starts ? "enable" : "disable"});
+}
+
+Result<void> InitScriptDaemons::start(const Daemon& daemon) {
+  if (auto started = runScript(daemon, "start"); !started) return started;
+  if (awaitBeginning(daemon)) return {};
+  return Failure{"start", scriptOf(daemon),
+                 "it reported success, but " + std::string(daemon.program) + " does not run"};
+}
+
+Result<void> InitScriptDaemons::stop(const Daemon& daemon) {
+  if (auto stopped = runScript(daemon, "stop"); !stopped) return stopped;
+  return awaitEnd(daemon);
+}
+
+/// A daemon may write the file with its process id after its script has ended.
+bool InitScriptDaemons::awaitBeginning(const Daemon& daemon) {
+  auto runs = [&] { return !processes(daemon).empty(); };
+  if (*daemon.processFile == '\0') return runs();
+  auto looking = _runLoop.every(std::chrono::milliseconds(20), [] {});
+  return _runLoop.runUntil(RunLoop::Clock::now() + longestStart, runs);
+}
+
+/// The script may have sent a signal and not waited.
+Result<void> InitScriptDaemons::awaitEnd(const Daemon& daemon) {
+  std::vector<FileDescriptor> handles;
+  std::vector<RunLoop::Registration> watches;
+  for (auto process : processes(daemon)) {
+    handles.emplace_back(static_cast<int>(::syscall(SYS_pidfd_open, process, 0)));
+    auto ended = [&watches, index = watches.size()] { watches[index].cancel(); };
+    watches.push_back(_runLoop.watch(handles.back().number(), RunLoop::Readiness::readable, ended));
+  }
+  auto isGone = [&] { return processes(daemon).empty(); };
+  if (_runLoop.runUntil(RunLoop::Clock::now() + longestStop, isGone)) return {};
+  return Failure{"stop", scriptOf(daemon), "it reported success, but " + std::string(daemon.program) + " still runs"};
+}
+
+Result<void> InitScriptDaemons::restart(const Daemon& daemon) {
+  return runScript(daemon, "restart");
+}
+
+Result<void> InitScriptDaemons::restartIfRunning(const Daemon& daemon) {
+  auto running = isRunning(daemon);
+  if (!running || !*running) return {};
+  return runScript(daemon, "restart");
+}
+
+Result<void> InitScriptDaemons::runScript(const Daemon& daemon, const char* action) {
+  return run({scriptOf(daemon), action});
+}
+
+Result<void> InitScriptDaemons::run(const std::vector<std::string>& words) {
+  if (auto failure = whyNeedsRoot("run", words.front())) return *failure;
+  auto printed = runProgram(_root, words, _runLoop);
+  if (!printed) return printed.failure();
+  return {};
+}
+
+}  // namespace tavisk

@@ -1,0 +1,53 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <optional>
+
+#include "base/RunLoop.h"
+#include "hosts/linux/services/Bus.h"
+#include "hosts/linux/services/Daemons.h"
+#include "hosts/shared/SystemRoot.h"
+
+namespace tavisk {
+
+/// How the services of this machine are reached: over the system bus, straight from the service manager where the bus
+/// is down, or, where the machine has no service manager, by files and programs. Found out when it is first asked for.
+class ServiceAccess {
+ public:
+  /// Both must outlive the object.
+  ServiceAccess(const SystemRoot& root, RunLoop& runLoop) : _root(root), _runLoop(runLoop) {}
+
+  /// Whether the service manager runs the machine (sd_booted(3)).
+  bool hasServiceManager() const;
+  /// Fails too where the machine has no service manager. Opened again after the bus went away.
+  Result<Bus*> systemBus();
+  Result<Bus*> serviceManager();
+  /// A connection of the caller's own, for use by another thread than the main one. systemBus() was called before.
+  Result<std::unique_ptr<Bus>> openSystemBus() const;
+
+  Daemons& daemons();
+
+ private:
+  Result<const SystemdLibrary*> library();
+  /// A connection that is kept; one that could not be had in time is not tried again for a while.
+  struct Connection {
+    const char* socket;
+    Bus::Kind kind;
+    std::unique_ptr<Bus> bus = nullptr;
+    std::optional<Failure> failure = std::nullopt;
+    RunLoop::Clock::time_point failedAt = {};
+  };
+  Result<Bus*> use(Connection& connection);
+  Result<std::unique_ptr<Bus>> open(const Connection& connection);
+
+  const SystemRoot& _root;
+  RunLoop& _runLoop;
+  std::optional<SystemdLibrary> _library;
+  Connection _systemBus{"/run/dbus/system_bus_socket", Bus::Kind::messageBus};
+  Connection _manager{"/run/systemd/private", Bus::Kind::straightToService};
+  std::unique_ptr<Daemons> _daemons;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,74 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/services/ServicesConfig.h"
+
+#include <algorithm>
+
+#include "base/Text.h"
+
+namespace tavisk {
+namespace {
+
+constexpr std::size_t fileLimit = std::size_t{1} << 20U;
+constexpr std::size_t longestUnitName = 255;
+
+// systemd.special(7): starting or stopping these changes the state of the whole machine.
+constexpr std::string_view criticalTargets[] = {
+    "basic",     "boot-complete", "ctrl-alt-del", "cryptsetup", "default",   "emergency",  "exit",
+    "final",     "getty",         "graphical",    "halt",       "hibernate", "initrd",     "integritysetup",
+    "kbrequest", "kexec",         "local-fs",     "multi-user", "network",   "paths",      "poweroff",
+    "reboot",    "remote-fs",     "rescue",       "runlevel",   "shutdown",  "sigpwr",     "sleep",
+    "slices",    "sockets",       "soft-reboot",  "suspend",    "swap",      "sysinit",    "system-update",
+    "time-set",  "timers",        "umount",       "usb-gadget", "user",      "veritysetup"};
+constexpr std::string_view criticalPrefixes[] = {"systemd-", "dbus.", "dbus-", "user@", "init."};
+
+bool isUnitCharacter(char c) {
+  return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') ||
+         std::string_view("@:._-").find(c) != std::string_view::npos;
+}
+
+bool isUnitName(const std::string& unit) {
+  constexpr std::string_view endings[] = {".service", ".socket", ".target"};
+  const auto ends = [&](std::string_view ending) { return unit.size() > ending.size() && unit.ends_with(ending); };
+  return unit.size() <= longestUnitName && std::ranges::all_of(unit, isUnitCharacter) &&
+         std::ranges::any_of(endings, ends);
+}
+
+/// "remote-fs-pre.target" and "hybrid-sleep.target" belong to their kind too.
+bool isCritical(const std::string& unit) {
+  const auto isPrefix = [&](std::string_view prefix) { return unit.starts_with(prefix); };
+  if (std::ranges::any_of(criticalPrefixes, isPrefix)) return true;
+  if (!unit.ends_with(".target")) return false;
+  const auto isMeant = [&](std::string_view target) {
+    return unit.starts_with(target) || unit.ends_with("-" + std::string(target) + ".target");
+  };
+  return std::ranges::any_of(criticalTargets, isMeant);
+}
+
+/// The words behind the last "purpose =".
+std::vector<std::string> wordsOf(const std::string& text, std::string_view purpose) {
+  std::vector<std::string> words;
+  for (const auto& line : split(text, "\n")) {
+    const auto sign = line.find('=');
+    if (sign == std::string::npos || line.front() == '#') continue;
+    const auto names = split(line.substr(0, sign), " \t\r");
+    if (names.size() == 1 && names.front() == purpose) words = split(line.substr(sign + 1), " \t\r");
+  }
+  return words;
+}
+
+}  // namespace
+
+Result<std::vector<std::string>> configuredUnits(const SystemRoot& root, std::string_view purpose) {
+  if (!root.exists(servicesConfig)) return std::vector<std::string>();
+  const auto text = root.read(servicesConfig, fileLimit);
+  if (!text) return text.failure();
+  auto units = wordsOf(*text, purpose);
+  for (const auto& unit : units) {
+    if (!isUnitName(unit)) return Failure{"use " + unit, servicesConfig, "a service, socket or target is expected"};
+    if (isCritical(unit)) return Failure{"use " + unit, servicesConfig, "the machine depends on this unit"};
+  }
+  return units;
+}
+
+}  // namespace tavisk

@@ -1,0 +1,224 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/services/UnitDaemons.h"
+
+#include <chrono>
+#include <map>
+#include <vector>
+
+#include "hosts/linux/services/ServiceAccess.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* service = "org.freedesktop.systemd1";
+constexpr const char* enabledUntilRestart = "enabled-runtime";
+constexpr std::chrono::seconds longestJob{3};
+// The manager reads all unit files again.
+constexpr std::chrono::seconds longestReload{10};
+
+BusObject manager() {
+  return {service, "/org/freedesktop/systemd1", "org.freedesktop.systemd1.Manager"};
+}
+
+/// What failed was asked about this unit, not about the manager as a whole.
+Failure about(const Daemon& daemon, Failure failure) {
+  failure.on = daemon.unit;
+  return failure;
+}
+
+/// "ConditionVirtualization=!container", the first condition that does not hold; empty when all do.
+std::string unmetCondition(BusMessage& conditions) {
+  std::string unmet;
+  if (!conditions.enter('a', "(sbbsi)")) return unmet;
+  while (unmet.empty() && conditions.enter('r', "sbbsi")) {
+    auto name = conditions.readText();
+    bool triggers = conditions.readBoolean();
+    bool negated = conditions.readBoolean();
+    auto parameter = conditions.readText();
+    if (conditions.readInt32() < 0)
+      unmet = std::move(name).append("=").append(triggers ? "|" : "").append(negated ? "!" : "").append(parameter);
+    conditions.exit();
+  }
+  return unmet;
+}
+
+/// Notes the jobs that end (the manager's signal JobRemoved) from its beginning on.
+class EndedJobs {
+ public:
+  Result<void> listen(Bus& bus) {
+    auto subscription = bus.subscribe(manager(), "JobRemoved", [this](BusMessage& signal) { note(signal); });
+    if (!subscription) return subscription.failure();
+    _subscription = std::move(subscription).value();
+    return {};
+  }
+  /// "done", or what else became of the job; null while it has not ended.
+  const std::string* resultOf(const std::string& job) const {
+    auto ended = _results.find(job);
+    return ended == _results.end() ? nullptr : &ended->second;
+  }
+
+ private:
+  void note(BusMessage& signal) {
+    signal.readUint32();
+    auto job = signal.readText();
+    signal.readText();
+    auto result = signal.readText();
+    if (signal.error() == 0) _results[job] = result;
+  }
+
+  std::map<std::string, std::string> _results;
+  std::unique_ptr<Bus::Subscription> _subscription;
+};
+
+}  // namespace
+
+Result<BusMessage> UnitDaemons::ask(const Daemon& daemon, const char* member, const char* replySignature) {
+  auto bus = _services.serviceManager();
+  if (!bus) return bus.failure();
+  auto reply = (*bus)->query(manager(), member, replySignature, daemon.unit);
+  if (!reply) return about(daemon, reply.failure());
+  return reply;
+}
+
+template <typename... Arguments>
+Result<BusMessage> UnitDaemons::order(const Daemon& daemon, const char* member, const char* replySignature,
+                                      const Arguments&... arguments) {
+  auto bus = _services.serviceManager();
+  if (!bus) return bus.failure();
+  auto reply = (*bus)->call(manager(), member, replySignature, arguments...);
+  if (!reply) return about(daemon, reply.failure());
+  return reply;
+}
+
+Result<BusMessage> UnitDaemons::unitProperty(const Daemon& daemon, const char* name, const char* signature) {
+  auto unit = ask(daemon, "LoadUnit", "o");
+  if (!unit) return unit.failure();
+  auto path = std::move(unit).value().readText();
+  auto bus = _services.serviceManager();
+  if (!bus) return bus.failure();
+  auto value = (*bus)->property({service, path, "org.freedesktop.systemd1.Unit"}, name, signature);
+  if (!value) return about(daemon, value.failure());
+  return value;
+}
+
+/// A unit whose file can no longer be understood is there: it may run still, and be enabled.
+Result<Daemons::Presence> UnitDaemons::presence(const Daemon& daemon) {
+  auto state = unitProperty(daemon, "LoadState", "s");
+  if (!state) return state.failure();
+  auto word = std::move(state).value().readText();
+  if (word == "masked") return Presence::masked;
+  return word == "not-found" ? Presence::absent : Presence::installed;
+}
+
+Result<bool> UnitDaemons::isRunning(const Daemon& daemon) {
+  auto state = unitProperty(daemon, "ActiveState", "s");
+  if (!state) return state.failure();
+  auto word = std::move(state).value().readText();
+  return word == "active" || word == "activating" || word == "reloading";
+}
+
+Result<std::string> UnitDaemons::fileState(const Daemon& daemon) {
+  auto state = ask(daemon, "GetUnitFileState", "s");
+  if (state) return std::move(state).value().readText();
+  if (state.failure().code == BusErrorCode::fileNotFound) return std::string();
+  return state.failure();
+}
+
+Result<bool> UnitDaemons::startsAtBoot(const Daemon& daemon) {
+  auto state = fileState(daemon);
+  if (!state) return state.failure();
+  return *state == "enabled" || *state == enabledUntilRestart;
+}
+
+/// Reads the unit files once for all of them, also when one could not be changed.
+Result<void> UnitDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
+  Result<void> last;
+  bool isAnyChanged = false;
+  for (const auto& daemon : daemons) {
+    last = changeLinks(daemon, start);
+    if (!last) break;
+    isAnyChanged = true;
+  }
+  if (!isAnyChanged) return last;
+  auto reloaded = reload();
+  return last ? reloaded : last;
+}
+
+Result<void> UnitDaemons::changeLinks(const Daemon& daemon, bool start) {
+  const std::vector<std::string> files{daemon.unit};
+  constexpr bool replaceLinks = false;
+  const auto state = fileState(daemon);
+  if (!state) return state.failure();
+  const bool untilRestart = !start && *state == enabledUntilRestart;
+  auto changed = start ? order(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
+                       : order(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
+  if (!changed) return changed.failure();
+  return {};
+}
+
+Result<void> UnitDaemons::reload() {
+  auto bus = _services.serviceManager();
+  if (!bus) return bus.failure();
+  auto reloaded = (*bus)->call(manager(), "Reload", "", Bus::Writer([](BusMessage&) {}), longestReload);
+  if (!reloaded) return reloaded.failure();
+  return {};
+}
+
+Result<void> UnitDaemons::runJob(const Daemon& daemon, const char* method) {
+  auto bus = _services.serviceManager();
+  if (!bus) return bus.failure();
+  EndedJobs ended;
+  if (auto listens = ended.listen(**bus); !listens) return listens;
+  auto reply = (*bus)->call(manager(), method, "o", daemon.unit, "replace");
+  if (!reply) return about(daemon, reply.failure());
+  auto job = std::move(reply).value().readText();
+
+  auto watching = _runLoop.watch((*bus)->descriptor(), RunLoop::Readiness::readable, [] {});
+  auto hasEnded = [&] {
+    (*bus)->process();
+    return ended.resultOf(job) || !(*bus)->isOpen();
+  };
+  if (!_runLoop.runUntil(RunLoop::Clock::now() + longestJob, hasEnded))
+    return Failure{method, daemon.unit, "its job has not ended in time"};
+  const auto* result = ended.resultOf(job);
+  if (!result) return Failure{method, daemon.unit, "the connection to the service manager ended"};
+  if (*result == "done") return {};
+  return Failure{method, daemon.unit, "its job ended with: " + *result};
+}
+
+/// A job can be "done" and the unit not run: a condition of it may not hold, as in a container.
+Failure UnitDaemons::whyNotRunning(const Daemon& daemon) {
+  Failure failure{"StartUnit", daemon.unit, "its job is done, but the unit does not run"};
+  auto holds = unitProperty(daemon, "ConditionResult", "b");
+  if (!holds || std::move(holds).value().readBoolean()) return failure;
+  auto conditions = unitProperty(daemon, "Conditions", "a(sbbsi)");
+  if (!conditions) return failure;
+  auto list = std::move(conditions).value();
+  failure.why += ": the condition " + unmetCondition(list) + " does not hold";
+  return failure;
+}
+
+Result<void> UnitDaemons::start(const Daemon& daemon) {
+  if (auto started = runJob(daemon, "StartUnit"); !started) return started;
+  auto running = isRunning(daemon);
+  if (!running) return running.failure();
+  if (!*running) return whyNotRunning(daemon);
+  return {};
+}
+
+Result<void> UnitDaemons::stop(const Daemon& daemon) {
+  return runJob(daemon, "StopUnit");
+}
+
+Result<void> UnitDaemons::restart(const Daemon& daemon) {
+  return runJob(daemon, "RestartUnit");
+}
+
+Result<void> UnitDaemons::restartIfRunning(const Daemon& daemon) {
+  auto job = order(daemon, "TryRestartUnit", "o", daemon.unit, "replace");
+  if (!job) return job.failure();
+  return {};
+}
+
+}  // namespace tavisk

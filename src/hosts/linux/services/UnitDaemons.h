@@ -1,0 +1,52 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include "base/RunLoop.h"
+#include "hosts/linux/services/Bus.h"
+#include "hosts/linux/services/Daemons.h"
+
+namespace tavisk {
+
+class ServiceAccess;
+
+/// Daemons of a machine with the service manager: its units, and the links by which they start
+/// (org.freedesktop.systemd1, see org.freedesktop.systemd1(5)).
+class UnitDaemons final : public Daemons {
+ public:
+  /// Both must outlive the object.
+  UnitDaemons(ServiceAccess& services, RunLoop& runLoop) : _services(services), _runLoop(runLoop) {}
+
+  Result<Presence> presence(const Daemon& daemon) override;
+  Result<bool> isRunning(const Daemon& daemon) override;
+  Result<bool> startsAtBoot(const Daemon& daemon) override;
+  Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) override;
+  Result<void> start(const Daemon& daemon) override;
+  Result<void> stop(const Daemon& daemon) override;
+  Result<void> restart(const Daemon& daemon) override;
+  Result<void> restartIfRunning(const Daemon& daemon) override;
+
+ private:
+  /// Asks the manager about a unit.
+  Result<BusMessage> ask(const Daemon& daemon, const char* member, const char* replySignature);
+  /// Has the manager change something about a unit.
+  template <typename... Arguments>
+  Result<BusMessage> order(const Daemon& daemon, const char* member, const char* replySignature,
+                           const Arguments&... arguments);
+  Result<BusMessage> unitProperty(const Daemon& daemon, const char* name, const char* signature);
+  /// A word such as "enabled", as systemctl(1) lists them; empty when there is no such unit file.
+  Result<std::string> fileState(const Daemon& daemon);
+  /// The manager does not take them up before it reads all of them again.
+  Result<void> changeLinks(const Daemon& daemon, bool start);
+  Result<void> reload();
+  /// Runs a job to its end.
+  Result<void> runJob(const Daemon& daemon, const char* method);
+  Failure whyNotRunning(const Daemon& daemon);
+
+  ServiceAccess& _services;
+  RunLoop& _runLoop;
+};
+
+}  // namespace tavisk

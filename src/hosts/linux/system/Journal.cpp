@@ -1,0 +1,168 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+
+#include "hosts/linux/system/Journal.h"
+
+#include <sys/socket.h>
+#include <syslog.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+#include <ctime>
+
+#include "base/Text.h"
+#include "hosts/linux/system/LocalSocket.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* identifier = "tavisk";
+// The journal takes larger entries by another way only; nothing of ours needs it.
+constexpr std::size_t longestField = 16384;
+
+/// One line: what escaped() makes of the text, but a newline is the usual \n.
+std::string harmless(const std::string& text) {
+  auto rest = std::string_view(text).substr(0, longestField);
+  std::string line;
+  for (auto end = rest.find('\n'); end != std::string_view::npos; end = rest.find('\n')) {
+    line += escaped(rest.substr(0, end)) + "\\n";
+    rest.remove_prefix(end + 1);
+  }
+  return line + escaped(rest);
+}
+
+std::string journalDatagram(const JournalEntry& entry) {
+  std::string datagram;
+  auto add = [&datagram](const std::string& name, const std::string& value) {
+    datagram.append(name).append("=").append(value).append("\n");
+  };
+  add("SYSLOG_IDENTIFIER", identifier);
+  add("SYSLOG_PID", std::to_string(::getpid()));
+  add("SYSLOG_FACILITY", std::to_string(LOG_FAC(entry.facility)));
+  add("PRIORITY", std::to_string(entry.priority));
+  add("MESSAGE", harmless(entry.message));
+  for (const auto& [name, value] : entry.fields) add(name, harmless(value));
+  return datagram;
+}
+
+/// "Jan  5 09:00:00", whatever the locale.
+std::string syslogTime(std::time_t time) {
+  constexpr std::array months{"Jan", "Feb", "Mar", "Apr", "May", "Jun", "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
+  std::tm local{};
+  ::localtime_r(&time, &local);
+  std::array<char, 32> rest{};
+  auto length = std::strftime(rest.data(), rest.size(), " %e %H:%M:%S", &local);
+  return months.at(static_cast<std::size_t>(local.tm_mon)) + std::string(rest.data(), length);
+}
+
+/// As syslog(3) writes it.
+std::string syslogDatagram(const JournalEntry& entry) {
+  return "<" + std::to_string(entry.facility | entry.priority) + ">" + syslogTime(std::time(nullptr)) + " " +
+         identifier + "[" + std::to_string(::getpid()) + "]: " + harmless(entry.message);
+}
+
+bool sendTo(const SystemRoot& root, const char* path, const std::string& datagram) {
+  auto socket = connectLocalSocket(root, path, SOCK_DGRAM);
+  if (!socket) return false;
+  return ::send(socket->number(), datagram.data(), datagram.size(), MSG_NOSIGNAL | MSG_DONTWAIT) >= 0;
+}
+
+using Fields = std::vector<std::pair<std::string, std::string>>;
+
+int priorityOf(Outcome outcome) {
+  switch (outcome) {
+    case Outcome::applied:
+      return LOG_NOTICE;
+    case Outcome::unchanged:
+      return LOG_INFO;
+    case Outcome::notSupported:
+      return LOG_WARNING;
+    case Outcome::failed:
+      break;
+  }
+  return LOG_ERR;
+}
+
+std::string messageOf(const Effect& effect) {
+  auto message = effect.setting + ": " + nameOf(effect.outcome);
+  if (effect.before && effect.outcome == Outcome::applied) message += ", was \"" + *effect.before + "\"";
+  if (effect.asked) message += ", asked \"" + *effect.asked + "\"";
+  if (effect.failure) message += ": " + effect.failure->tried + " " + effect.failure->on + ": " + effect.failure->why;
+  return message;
+}
+
+Fields fieldsOf(const Effect& effect) {
+  Fields fields;
+  auto add = [&fields](const char* name, const std::optional<std::string>& value) {
+    if (value && !value->empty()) fields.emplace_back(name, *value);
+  };
+  add("TAVISK_SETTING", effect.setting);
+  add("TAVISK_OUTCOME", nameOf(effect.outcome));
+  add("TAVISK_OLD", effect.before);
+  add("TAVISK_ASKED", effect.asked);
+  add("TAVISK_NEW", effect.live ? effect.live : effect.stored);
+  add("TAVISK_STORED", effect.stored);
+  add("TAVISK_WHERE", effect.where);
+  add("TAVISK_UNDONE_BY", effect.undoneBy);
+  add("TAVISK_NOTE", effect.note);
+  if (effect.failure) {
+    add("TAVISK_TRIED", effect.failure->tried);
+    add("TAVISK_ON", effect.failure->on);
+    add("TAVISK_WHY", effect.failure->why);
+  }
+  return fields;
+}
+
+std::string terminal() {
+  std::array<char, 256> name{};
+  for (int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
+    if (::ttyname_r(descriptor, name.data(), name.size()) == 0) return name.data();
+  return "none";
+}
+
+bool isUserId(const std::string& text) {
+  constexpr const char* unset = "4294967295";
+  return !text.empty() && text != unset && std::ranges::all_of(text, [](char c) { return c >= '0' && c <= '9'; });
+}
+
+Fields whoAsks(const SystemRoot& root) {
+  Fields who{{"TAVISK_UID", std::to_string(::getuid())}, {"TAVISK_TERMINAL", terminal()}};
+  constexpr std::size_t limit = 64;
+  auto login = root.read("/proc/self/loginuid", limit).valueOr("");
+  if (isUserId(login)) who.emplace_back("TAVISK_LOGIN_UID", login);
+  // Anyone can set the variable; of root it is believed.
+  const char* sudo = ::getuid() == 0 ? std::getenv("SUDO_UID") : nullptr;  // NOLINT(concurrency-mt-unsafe)
+  if (sudo && isUserId(sudo)) who.emplace_back("TAVISK_SUDO_UID", sudo);
+  return who;
+}
+
+}  // namespace
+
+void Journal::send(const JournalEntry& entry) const {
+  if (!sendTo(_root, "/run/systemd/journal/socket", journalDatagram(entry)))
+    sendTo(_root, "/dev/log", syslogDatagram(entry));
+}
+
+void JournalLog::changeBegins(const std::string& setting, const std::string& asked) {
+  send(LOG_DEBUG, setting + ": change begins, asked \"" + asked + "\"",
+       {{"TAVISK_SETTING", setting}, {"TAVISK_OUTCOME", "begins"}, {"TAVISK_ASKED", asked}});
+}
+
+void JournalLog::record(const Effect& effect) {
+  send(priorityOf(effect.outcome), messageOf(effect), fieldsOf(effect));
+}
+
+void JournalLog::send(int priority, const std::string& message, Fields fields) const {
+  auto who = whoAsks(_root);
+  fields.insert(fields.end(), who.begin(), who.end());
+  _journal.send({LOG_AUTHPRIV, priority, message, std::move(fields)});
+}
+
+void LinuxSystemLog::write(const std::string& message) {
+  bool ended = message.ends_with('\n');
+  _journal.send({LOG_DAEMON, LOG_INFO, message.substr(0, message.size() - (ended ? 1 : 0)), {}});
+}
+
+}  // namespace tavisk

@@ -1,0 +1,24 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "hosts/scratch/MachineSettings.h"
+#include "hosts/shared/PropertyListFile.h"
+#include "platform/BootLoaderFile.h"
+
+namespace tavisk {
+
+/// The file among the machine's files.
+class ScratchBootLoaderFile final : public BootLoaderFile {
+ public:
+  ScratchBootLoaderFile(const SystemRoot& root, MachineSettings& settings) : _file(root, path), _settings(settings) {}
+
+  std::optional<PropertyList::Dictionary> read() override;
+  bool write(const PropertyList::Dictionary& contents) override;
+
+ private:
+  PropertyListFile _file;
+  MachineSettings& _settings;
+};
+
+}  // namespace tavisk

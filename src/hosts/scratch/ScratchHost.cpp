@@ -1,0 +1,47 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/scratch/ScratchHost.h"
+
+namespace tavisk {
+
+Result<std::unique_ptr<ScratchHost>> ScratchHost::open(const std::string& directory, EffectSink& effects,
+                                                       RunLoop& runLoop) {
+  auto machine = MachineFile::open(directory, effects);
+  if (!machine) return machine.failure();
+  std::unique_ptr<ScratchHost> host(new ScratchHost(directory, std::move(machine).value(), effects, runLoop));
+  effects.addChannel(host->_effectsLog);
+  return host;
+}
+
+ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFile> machine, EffectSink& effects,
+                         RunLoop& runLoop)
+    : _machine(std::move(machine)),
+      _settings(*_machine, effects, runLoop),
+      _effectsLog(_machine->folder()),
+      _root(directory + "/root"),
+      _files(_root),
+      _users(*_machine),
+      _authenticator(_settings),
+      _systemLog(_machine->folder(), effects),
+      _clock(_settings),
+      _networkTime(_settings),
+      _powerSettings(_settings),
+      _powerController(_settings, effects),
+      _remoteShell(_settings),
+      _remoteEvents(_settings),
+      _hostConfiguration(_settings),
+      _dynamicStore(_settings),
+      _bootLoaderFile(_root, _settings),
+      _preferences(_settings),
+      _processes(_settings, _preferences),
+      _disks(*_machine),
+      _diskEvents(*_machine, _disks, _files),
+      _diskManagement(*_machine, _settings, _disks),
+      _registry(*_machine),
+      _networkInterfaces(*_machine),
+      _kernel(*_machine),
+      _keyboardInput(*_machine),
+      _userDefaults(*_machine),
+      _programs(*_machine) {}
+
+}  // namespace tavisk

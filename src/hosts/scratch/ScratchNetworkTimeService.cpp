@@ -1,0 +1,50 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/scratch/ScratchNetworkTimeService.h"
+
+#include "effects/SettingNames.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* section = "Network Time";
+
+MachineSetting running() {
+  return switchAt(setting::networkTime, section, "Running");
+}
+MachineSetting address() {
+  return textAt(setting::networkTimeServer, section, "Server");
+}
+
+}  // namespace
+
+bool ScratchNetworkTimeService::isRunning() {
+  return _settings.isOn(running());
+}
+
+void ScratchNetworkTimeService::setLaunchAtStartup(bool launch) {
+  _settings.turn(switchAt(setting::networkTimeAtStartup, section, "Launch At Startup"), launch);
+}
+
+void ScratchNetworkTimeService::start() {
+  _settings.turn(running(), true);
+}
+
+void ScratchNetworkTimeService::stop() {
+  _settings.turn(running(), false);
+}
+
+NetworkTimeServer ScratchNetworkTimeService::server() {
+  return {_settings.read(address()).value_or("")};
+}
+
+void ScratchNetworkTimeService::setServer(const NetworkTimeServer& server) {
+  _settings.change(address(), server.address);
+}
+
+void ScratchNetworkTimeService::restartAsynchronously() {
+  auto count = [](MachineFile::Dictionary& machine, const std::string&) { countUp(machine, section, "Restarts"); };
+  _settings.change({setting::networkTimeRestart, "", nullptr, count}, "restart");
+}
+
+}  // namespace tavisk

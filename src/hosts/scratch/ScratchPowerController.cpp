@@ -1,0 +1,83 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/scratch/ScratchPowerController.h"
+
+#include "base/Text.h"
+#include "effects/SettingNames.h"
+
+namespace tavisk {
+namespace {
+
+constexpr const char* registry = "Registry";
+constexpr const char* services = "Services";
+constexpr ControllerStatus refused = 1;
+constexpr ControllerStatus noSuchDevice = 19;
+
+/// Of a number or of one byte of data; any other value reads as 0.
+std::int64_t numberIn(const PropertyList& value) {
+  if (const auto* integer = value.asInteger()) return *integer;
+  const auto* data = value.asData();
+  return data && data->size() == 1 ? data->front() : 0;
+}
+
+MachineSetting delayOf(const PowerController::Service& service, const std::string& property,
+                       const PropertyList& written = 0) {
+  return {setting::startupDelay, "units of 30 seconds",
+          [=](MachineFile& machine) -> MachineSetting::Value {
+            const auto ofService = machine.section(registry).section(services).section(service.name);
+            const auto* value = ofService.find(property);
+            return value ? std::optional(std::to_string(numberIn(*value))) : std::nullopt;
+          },
+          [=](MachineFile::Dictionary& machine, const std::string&) {
+            machine.dictionary(registry).dictionary(services).dictionary(service.name).set(property, written);
+          }};
+}
+
+}  // namespace
+
+ControllerStatus ScratchPowerController::masterPort() {
+  return checked(_settings.section(registry).integer("Master Port Status"), "open", "the device registry");
+}
+
+std::optional<PowerController::Service> ScratchPowerController::serviceOfClass(const std::string& className) {
+  const auto known = _settings.section(registry).section(services);
+  return known.find(className) ? std::optional(Service{className}) : std::nullopt;
+}
+
+std::optional<std::int64_t> ScratchPowerController::numberProperty(const Service& service,
+                                                                   const std::string& property) {
+  const auto number = _settings.read(delayOf(service, property));
+  return number ? std::optional(leadingInteger(*number)) : std::nullopt;
+}
+
+std::pair<ControllerStatus, PowerController::Connection> ScratchPowerController::open(
+    const std::optional<Service>& service, std::uint32_t /*connectionType*/) {
+  if (!service) return {checked(noSuchDevice, "open", "the power controller"), {}};
+  return {checked(section(*service).integer("Open Status"), "open", service->name), {*service}};
+}
+
+ControllerStatus ScratchPowerController::setProperties(const Connection& connection,
+                                                       const PropertyList::Dictionary& properties) {
+  const auto status = section(connection.service).integer("Set Status");
+  if (status != 0) return checked(status, "set properties", connection.service.name);
+  for (const auto& [property, value] : properties) {
+    const auto setting = delayOf(connection.service, property, value);
+    if (_settings.change(setting, std::to_string(numberIn(value))).outcome == Outcome::failed) return refused;
+  }
+  return 0;
+}
+
+ControllerStatus ScratchPowerController::close(const Connection& connection) {
+  return checked(section(connection.service).integer("Close Status"), "close", connection.service.name);
+}
+
+MachineSection ScratchPowerController::section(const Service& service) {
+  return _settings.section(registry).section(services).section(service.name);
+}
+
+ControllerStatus ScratchPowerController::checked(ControllerStatus status, const char* tried, const std::string& on) {
+  if (status != 0) _effects.recordFailure(setting::startupDelay, {tried, on, "status " + std::to_string(status)});
+  return status;
+}
+
+}  // namespace tavisk

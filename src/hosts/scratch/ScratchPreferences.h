@@ -1,0 +1,40 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include "hosts/scratch/MachineFile.h"
+#include "hosts/scratch/MachineSettings.h"
+#include "platform/Preferences.h"
+
+namespace tavisk {
+
+/// "Preferences".
+class ScratchPreferencesStore final : public PreferencesStore {
+ public:
+  explicit ScratchPreferencesStore(MachineSettings& settings) : _settings(settings) {}
+
+  std::optional<PropertyList> value(const std::string& key) override;
+  void setBoolean(const std::string& key, bool value);
+  /// Counts it.
+  void writeOut();
+
+ private:
+  MachineSettings& _settings;
+};
+
+/// "User Defaults".
+class ScratchUserDefaults final : public UserDefaults {
+ public:
+  explicit ScratchUserDefaults(MachineFile& machine) : _machine(machine) {}
+
+  bool boolean(const std::string& key) override;
+  std::optional<double> number(const std::string& key) override;
+  std::vector<std::string> strings(const std::string& key) override;
+
+ private:
+  MachineSection section() { return _machine.section("User Defaults"); }
+
+  MachineFile& _machine;
+};
+
+}  // namespace tavisk

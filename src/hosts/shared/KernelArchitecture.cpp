@@ -1,0 +1,44 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/shared/KernelArchitecture.h"
+
+#include "effects/SettingNames.h"
+
+namespace tavisk {
+namespace {
+
+using Contents = Result<std::optional<PropertyList::Dictionary>>;
+
+Result<std::optional<std::string>> architectureOf(const Contents& read) {
+  if (!read) return read.failure();
+  return std::optional(architectureIn(read->value_or(PropertyList::Dictionary())));
+}
+
+}  // namespace
+
+std::string architectureIn(const PropertyList::Dictionary& contents) {
+  const PropertyList* value = contents.find(BootLoaderFile::architectureKey);
+  const std::string* architecture = value ? value->asString() : nullptr;
+  return architecture ? *architecture : "default";
+}
+
+Setting<std::string> kernelArchitecture(const Contents& read) {
+  Setting<std::string> setting;
+  setting.name = setting::kernelArchitecture;
+  setting.where = BootLoaderFile::path;
+  setting.stored = [&read] { return architectureOf(read); };
+  return setting;
+}
+
+Setting<std::string> kernelArchitecture(const PropertyListFile& file, const PropertyList::Dictionary& contents) {
+  Setting<std::string> setting;
+  setting.name = setting::kernelArchitecture;
+  setting.where = file.path();
+  setting.stored = [&file] { return architectureOf(file.read()); };
+  setting.store = [&file, &contents](const std::string&) { return file.write(contents); };
+  // Also when nothing changes: whether the file can be written is what is asked for.
+  setting.always = true;
+  return setting;
+}
+
+}  // namespace tavisk

@@ -1,0 +1,34 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "base/PropertyList.h"
+#include "base/Result.h"
+#include "hosts/shared/SystemRoot.h"
+
+namespace tavisk {
+
+/// A file of the machine that holds a property-list dictionary.
+class PropertyListFile {
+ public:
+  /// The root is not owned.
+  PropertyListFile(const SystemRoot& root, std::string path) : _root(root), _path(std::move(path)) {}
+
+  const std::string& path() const { return _path; }
+  /// Absent when there is no file; a failure when it cannot be read or is something else.
+  Result<std::optional<PropertyList::Dictionary>> read() const;
+  /// Replaces the file whole, or makes it and its folders. What read() cannot understand is kept beside it first, as
+  /// NAME.damaged.
+  Result<void> write(const PropertyList::Dictionary& contents) const;
+
+ private:
+  Result<void> keepDamaged() const;
+
+  const SystemRoot& _root;
+  std::string _path;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,180 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <concepts>
+#include <cstdint>
+#include <functional>
+#include <optional>
+#include <string>
+#include <type_traits>
+#include <utility>
+
+#include "base/Result.h"
+#include "base/RunLoop.h"
+#include "effects/EffectSink.h"
+
+namespace tavisk {
+
+/// A value of a setting as a machine has it. Where the machine's parts differ it is that of the part which has most of
+/// it, and `detail` says for people which part has what: "10 on sda, 0 on sdb", "on after a kernel panic only".
+template <typename Value>
+struct Reading {
+  Reading(Value itsValue) : value(std::move(itsValue)) {}
+  Reading(Value itsValue, std::string itsDetail) : value(std::move(itsValue)), detail(std::move(itsDetail)) {}
+
+  Value value;
+  std::string detail;  ///< empty: the value is all there is to say
+};
+
+/// The texts by which effects, reports and logs tell a value; another type of value has its own overload beside it.
+inline std::string textOf(const std::string& value) {
+  return value;
+}
+inline std::string textOf(std::int64_t value) {
+  return std::to_string(value);
+}
+template <std::same_as<bool> Switch>
+std::string textOf(Switch isOn) {
+  return isOn ? "on" : "off";
+}
+
+/// A remark that is the same whatever is asked.
+inline auto saying(std::string text) {
+  return [text = std::move(text)](const auto&) { return text; };
+}
+
+/// One setting of a host, as the five small parts from which every change is made (supported, live, stored, store,
+/// apply). A part that is left empty does not apply: a setting that is stored only has no `live` and no `apply`.
+template <typename SettingValueType>
+struct Setting {
+  using Value = SettingValueType;
+  using Found = Result<std::optional<Reading<Value>>>;  ///< absent: the setting has no value
+  using Read = std::function<Found()>;
+  using Write = std::function<Result<void>(const Value& value)>;
+  /// Asked for once when a change begins.
+  using Remark = std::function<std::string(const Value& asked)>;
+
+  std::string name;                                   ///< one of effects/SettingNames.h
+  std::string unit;                                   ///< see SettingValue
+  std::string where;                                  ///< see Effect
+  Remark undoneBy;                                    ///< see Effect
+  Remark note;                                        ///< see Effect
+  std::function<std::optional<Failure>()> supported;  ///< the reason when this machine cannot have the setting
+  Read live;
+  Read stored;
+  Write store;
+  Write apply;
+  /// The live value that comes of a value asked for, where the machine cannot do quite that; empty: the same.
+  std::function<Value(const Value& asked)> liveFor;
+  /// Whether the live value has reached what was asked; asked again after each event, for at most 3 s.
+  std::function<bool(const Value& value)> settled;
+  /// Write although live and stored already have the value (a machine that counts its operations).
+  bool always = false;
+};
+
+/// The one order of a change: supported, read, return when live and stored both have the value, store, apply, wait
+/// until settled, read both back. Whatever happens is told to the sink, and returned.
+template <typename Value>
+Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, EffectSink& effects,
+                RunLoop& runLoop);
+
+/// Reads the live value (the stored one where there is no live one) and tells it to the sink; a read that fails is
+/// recorded as a failed effect and yields no value.
+template <typename Value>
+std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects);
+
+/// What is behind the two, with the values as texts.
+namespace change {
+
+/// What a read came to: its text, absent without a value, and whether it is what was asked for.
+struct Sight {
+  std::optional<std::string> text;
+  bool isAsked = false;
+};
+
+struct Steps {
+  std::string name;
+  std::string where;
+  std::string asked;
+  std::function<std::string()> undoneBy;
+  std::function<std::string()> note;
+  std::function<std::optional<Failure>()> supported;
+  std::function<Result<Sight>()> live;
+  std::function<Result<Sight>()> stored;
+  std::function<Result<void>()> store;
+  std::function<Result<void>()> apply;
+  std::function<bool()> settled;
+  bool always = false;
+};
+
+Effect carryOut(const Steps& steps, EffectSink& effects, RunLoop& runLoop);
+void tellFailedRead(const std::string& setting, const std::string& where, const Failure& failure, EffectSink& effects);
+
+template <typename Value>
+std::string textOfReading(const Reading<Value>& reading) {
+  return reading.detail.empty() ? textOf(reading.value) : reading.detail;
+}
+
+/// No text is the empty one.
+template <typename Value>
+bool isJust(const std::optional<Reading<Value>>& found, const Value& wanted) {
+  if constexpr (std::same_as<Value, std::string>) {
+    if (!found) return wanted.empty();
+  }
+  return found && found->detail.empty() && found->value == wanted;
+}
+
+template <typename Value>
+std::function<Result<Sight>()> looking(const typename Setting<Value>::Read& read, const Value& wanted) {
+  if (!read) return nullptr;
+  return [&read, wanted]() -> Result<Sight> {
+    const auto found = read();
+    if (!found) return found.failure();
+    return Sight{*found ? std::optional(textOfReading(**found)) : std::nullopt, isJust(*found, wanted)};
+  };
+}
+
+/// A step with the value that it is about; empty when the setting has no such step.
+template <typename Step, typename Value>
+auto about(const Step& step, const Value& value) {
+  using Bound = std::function<decltype(step(value))()>;
+  return step ? Bound([&step, &value] { return step(value); }) : Bound();
+}
+
+}  // namespace change
+
+template <typename Value>
+Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, EffectSink& effects,
+                RunLoop& runLoop) {
+  const change::Steps steps{
+      .name = setting.name,
+      .where = setting.where,
+      .asked = textOf(asked),
+      .undoneBy = change::about(setting.undoneBy, asked),
+      .note = change::about(setting.note, asked),
+      .supported = setting.supported,
+      .live = change::looking(setting.live, setting.liveFor ? setting.liveFor(asked) : asked),
+      .stored = change::looking(setting.stored, asked),
+      .store = change::about(setting.store, asked),
+      .apply = change::about(setting.apply, asked),
+      .settled = change::about(setting.settled, asked),
+      .always = setting.always,
+  };
+  return change::carryOut(steps, effects, runLoop);
+}
+
+template <typename Value>
+std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects) {
+  const auto found = setting.live ? setting.live() : setting.stored();
+  if (!found) {
+    change::tellFailedRead(setting.name, setting.where, found.failure(), effects);
+    return std::nullopt;
+  }
+  SettingValue value{setting.name, std::nullopt, std::nullopt, setting.unit};
+  if (*found) (setting.live ? value.live : value.stored) = change::textOfReading(**found);
+  effects.observe(value);
+  return *found ? std::optional((*found)->value) : std::nullopt;
+}
+
+}  // namespace tavisk

@@ -1,0 +1,199 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/shared/SystemRoot.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+
+#include "base/FileDescriptor.h"
+#include "base/Result.h"
+#include "base/Text.h"
+#include "hosts/shared/FolderWriter.h"
+#include "hosts/shared/OpenBeneath.h"
+#include "hosts/shared/PathResolver.h"
+
+namespace tavisk {
+namespace {
+
+constexpr unsigned folderMode = 0755;
+
+Failure openFailure(const std::string& path, int error) {
+  if (error == ENOSYS) return Failure{"openat2", path, "this kernel has no such call (Linux 5.6 or later is needed)"};
+  return systemFailure("open", path, error);
+}
+
+std::optional<Failure> whyUnusable(const std::string& path) {
+  if (!path.starts_with('/')) return Failure{"open", path, "not an absolute path"};
+  if (path.find('\0') != std::string::npos) return Failure{"open", path, "a NUL byte in the path"};
+  return std::nullopt;
+}
+
+std::int64_t nanoseconds(const timespec& time) {
+  return std::int64_t{time.tv_sec} * 1'000'000'000 + time.tv_nsec;
+}
+
+/// The path as names with "/" before them, where one look is enough for it: it exists, without a link in it.
+std::optional<std::string> plainPath(const FileDescriptor& prefix, const std::string& path) {
+  std::string plain;
+  for (const auto& name : split(path, "/")) {
+    if (name == "..") return std::nullopt;
+    if (name != ".") plain += "/" + name;
+  }
+  if (plain.empty()) plain.push_back('/');
+  return existsWithoutLinks(prefix, plain) ? std::optional(plain) : std::nullopt;
+}
+
+/// A path cut before its last name.
+struct Place {
+  std::string folder;
+  std::string name;
+};
+
+Result<Place> placeOf(const std::string& path) {
+  auto end = path.find_last_not_of('/');
+  if (end == std::string::npos) return systemFailure("write", path, EISDIR);
+  auto start = path.rfind('/', end) + 1;
+  Place place{path.substr(0, start), path.substr(start, end + 1 - start)};
+  if (place.name == "." || place.name == "..") return systemFailure("write", path, EISDIR);
+  return place;
+}
+
+/// The folder of that name, made when it is missing, and its entry on the disk.
+Result<FileDescriptor> makeNamedFolder(const FileDescriptor& parent, const std::string& name, const std::string& path) {
+  constexpr int flags = O_RDONLY | O_DIRECTORY | O_NOFOLLOW;
+  if (auto present = openNamed(parent, name, flags)) return present;
+  if (errno != ENOENT) return systemFailure("make folder", path, errno);
+  if (::mkdirat(parent.number(), name.c_str(), folderMode) != 0 && errno != EEXIST)
+    return systemFailure("make folder", path, errno);
+  auto made = openNamed(parent, name, flags);
+  if (!made || ::fchmod(made.number(), folderMode) != 0 || ::fsync(parent.number()) != 0)
+    return systemFailure("make folder", path, errno);
+  return made;
+}
+
+}  // namespace
+
+Result<FileDescriptor> SystemRoot::openPrefix(const std::string& path) const {
+  if (auto failure = whyUnusable(path)) return *failure;
+  FileDescriptor prefix(::open(_prefix.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC));
+  if (!prefix) return openFailure(path, errno);
+  return prefix;
+}
+
+Result<FileDescriptor> SystemRoot::open(const std::string& path, int flags, unsigned mode) const {
+  auto prefix = openPrefix(path);
+  if (!prefix) return prefix.failure();
+  auto file = openBeneath(*prefix, path, flags, mode);
+  if (!file) return openFailure(path, errno);
+  return file;
+}
+
+bool SystemRoot::exists(const std::string& path) const {
+  return static_cast<bool>(open(path, O_PATH));
+}
+
+std::optional<FileStamp> SystemRoot::stamp(const std::string& path) const {
+  struct stat status {};
+  if (::lstat((_prefix + path).c_str(), &status) != 0) return std::nullopt;
+  if (S_ISLNK(status.st_mode)) {
+    auto target = open(path, O_PATH);
+    if (!target || ::fstat(target->number(), &status) != 0) return std::nullopt;
+  }
+  return FileStamp{status.st_dev, status.st_ino, status.st_size, nanoseconds(status.st_mtim),
+                   nanoseconds(status.st_ctim)};
+}
+
+Result<std::string> SystemRoot::read(const std::string& path, std::size_t limit) const {
+  struct stat status {};
+  auto regular = [&](const FileDescriptor& file) {
+    return ::fstat(file.number(), &status) == 0 && S_ISREG(status.st_mode);
+  };
+  auto seen = open(path, O_PATH);
+  if (!seen) return seen.failure();
+  // Only looked at so far: to open a device may already do something.
+  if (!regular(*seen)) return Failure{"read", path, "not a regular file"};
+  auto file = open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
+  if (!file) return file.failure();
+  if (!regular(*file)) return Failure{"read", path, "not a regular file"};
+  return readAll(*file, limit, path);
+}
+
+Result<std::string> SystemRoot::readLink(const std::string& path) const {
+  auto link = open(path, O_PATH | O_NOFOLLOW);
+  if (!link) return link.failure();
+  return targetOf(*link, path);
+}
+
+Result<std::vector<std::string>> SystemRoot::list(const std::string& path) const {
+  auto folder = open(path, O_RDONLY | O_DIRECTORY);
+  if (!folder) return folder.failure();
+  return namesIn(*folder, path);
+}
+
+Result<std::string> SystemRoot::standardized(const std::string& path) const {
+  auto prefix = openPrefix(path);
+  if (!prefix) return prefix.failure();
+  if (auto plain = plainPath(*prefix, path)) return std::move(*plain);
+  return PathResolver(*prefix).resolve(path);
+}
+
+Result<FileDescriptor> SystemRoot::makeFolder(const std::string& path) const {
+  if (auto made = makePrefix(path); !made) return made.failure();
+  auto resolved = standardized(path);
+  if (!resolved) return resolved.failure();
+  auto folder = open("/", O_RDONLY | O_DIRECTORY);
+  for (const auto& name : split(*resolved, "/")) {
+    if (folder) folder = makeNamedFolder(*folder, name, path);
+  }
+  return folder;
+}
+
+Result<void> SystemRoot::makePrefix(const std::string& path) const {
+  if (::mkdir(_prefix.c_str(), folderMode) == 0) {
+    FileDescriptor parent(::open((_prefix + "/..").c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    if (parent && ::fsync(parent.number()) == 0) return {};
+  }
+  if (errno == EEXIST) return {};
+  return systemFailure("make folder", path, errno);
+}
+
+Result<void> SystemRoot::makeFolders(const std::string& path) const {
+  auto folder = makeFolder(path);
+  if (!folder) return folder.failure();
+  return {};
+}
+
+Result<void> SystemRoot::write(const std::string& path, std::string_view contents, unsigned modeWhenNew) const {
+  if (auto made = makePrefix(path); !made) return made;
+  auto resolved = standardized(path);
+  if (!resolved) return resolved.failure();
+  auto place = placeOf(*resolved);
+  if (!place) return place.failure();
+  auto folder = makeFolder(place->folder);
+  if (!folder) return folder.failure();
+  return FolderWriter(*folder, path).writeFile(place->name, contents, modeWhenNew);
+}
+
+Result<void> SystemRoot::writeLink(const std::string& path, const std::string& target) const {
+  auto place = placeOf(path);
+  if (!place) return place.failure();
+  auto folder = makeFolder(place->folder);
+  if (!folder) return folder.failure();
+  return FolderWriter(*folder, path).writeLink(place->name, target);
+}
+
+Result<void> SystemRoot::remove(const std::string& path) const {
+  auto place = placeOf(path);
+  if (!place) return place.failure();
+  auto prefix = openPrefix(path);
+  if (!prefix) return prefix.failure();
+  auto folder = openBeneath(*prefix, place->folder, O_RDONLY | O_DIRECTORY);
+  if (folder) return FolderWriter(folder, path).remove(place->name);
+  if (errno == ENOENT || errno == ENOTDIR) return {};
+  return openFailure(path, errno);
+}
+
+}  // namespace tavisk

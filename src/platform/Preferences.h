@@ -1,0 +1,37 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "base/PropertyList.h"
+
+namespace tavisk {
+
+/// Whether engaging the enclosure lock disables the keyboard, a boolean.
+inline constexpr const char* DunmereLockEnclosureStateKey = "DunmereLockEnclosureState";
+
+/// The preferences of any application, for any user, on this host.
+class PreferencesStore {
+ public:
+  virtual ~PreferencesStore() = default;
+
+  /// Absent when the preference was never set; a read that fails goes to the effects.
+  virtual std::optional<PropertyList> value(const std::string& key) = 0;
+};
+
+/// The user's defaults, read afresh at each question. A value of another type reads as absent. From any thread.
+class UserDefaults {
+ public:
+  virtual ~UserDefaults() = default;
+
+  /// False when absent.
+  virtual bool boolean(const std::string& key) = 0;
+  virtual std::optional<double> number(const std::string& key) = 0;
+  /// Empty when absent.
+  virtual std::vector<std::string> strings(const std::string& key) = 0;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,216 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gtest/gtest.h>
+
+#include <limits>
+
+#include "base/PropertyList.h"
+
+namespace tavisk {
+namespace {
+
+using Array = PropertyList::Array;
+using Data = PropertyList::Data;
+using Date = PropertyList::Date;
+using Dictionary = PropertyList::Dictionary;
+
+Dictionary dictionaryOf(std::initializer_list<Dictionary::Entry> entries) {
+  Dictionary dictionary;
+  for (const auto& [key, value] : entries) dictionary.set(key, value);
+  return dictionary;
+}
+
+std::string repeated(const std::string& text, int times) {
+  std::string result;
+  for (int time = 0; time < times; ++time) result += text;
+  return result;
+}
+
+std::string nestedArrays(int depth) {
+  return repeated("<array>", depth) + repeated("</array>", depth);
+}
+
+std::string whyRefused(std::string_view xml, const PropertyListLimits& limits = foreignFileLimits) {
+  const Result<PropertyList> read = parsePropertyList(xml, limits);
+  return read ? "accepted" : read.failure().why;
+}
+
+TEST(PropertyListDictionary, keepsItsOrderAndItsIndexThroughChanges) {
+  Dictionary dictionary = dictionaryOf({{"a", 1}, {"b", 2}, {"c", 3}, {"d", 4}});
+  dictionary.set("b", "two");
+  dictionary.remove("a");
+  dictionary.remove("nothing");
+  dictionary.remove("d");
+  dictionary.set("a", 5);
+  EXPECT_EQ(dictionary, dictionaryOf({{"b", "two"}, {"c", 3}, {"a", 5}}));
+  EXPECT_EQ(*dictionary.find("c"), PropertyList(3));
+  EXPECT_EQ(*dictionary.find("a"), PropertyList(5));
+  EXPECT_EQ(dictionary.find("d"), nullptr);
+  EXPECT_FALSE(dictionary == dictionaryOf({{"c", 3}, {"b", "two"}, {"a", 5}})) << "the order counts";
+}
+
+TEST(PropertyList, copiesDeeply) {
+  PropertyList original = dictionaryOf({{"inner", dictionaryOf({{"k", Array{1, "x"}}})}});
+  const PropertyList copy = original;
+  original.asDictionary()->dictionary("inner").set("k", 2);
+  EXPECT_EQ(copy, PropertyList(dictionaryOf({{"inner", dictionaryOf({{"k", Array{1, "x"}}})}})));
+  original = *original.asDictionary()->find("inner");
+  EXPECT_EQ(original, PropertyList(dictionaryOf({{"k", 2}}))) << "a value may take the place of the one that holds it";
+}
+
+TEST(PropertyListXml, readsEveryKindOfValueAlsoAsItWroteIt) {
+  const std::pair<const char*, PropertyList> cases[] = {
+      {"<dict/>", Dictionary()},
+      {"<array> </array>", Array()},
+      {"<string/>", ""},
+      {"<string> a&lt;&gt;&amp;&quot;&apos;&#65;&#x1F600;\n</string>", " a<>&\"'A\U0001F600\n"},
+      {"<string>a<!-- c -->b<?pi?><![CDATA[<&amp;]]> </string>", "ab<&amp; "},
+      {"<string>a\r\nb\rc&#13;&#10;</string>", "a\nb\nc\r\n"},
+      {"<string>]]>\t\uFEFF\u0085</string>", "]]>\t\uFEFF\u0085"},
+      {"<integer> -42 </integer>", -42},
+      {"<integer>+0x2a</integer>", 42},
+      {"<integer>9223372036854775807</integer>", std::numeric_limits<std::int64_t>::max()},
+      {"<integer>-9223372036854775808</integer>", std::numeric_limits<std::int64_t>::min()},
+      {"<real>+1.5e3</real>", 1500.0},
+      {"<real>0.30000000000000004</real>", 0.1 + 0.2},
+      {"<real>-5e-324</real>", -5e-324},
+      {"<real>-inf</real>", -std::numeric_limits<double>::infinity()},
+      {"<true/>", true},
+      {"<false></false>", false},
+      {"<date>2000-02-29T23:59:58Z</date>", Date{951868798}},
+      {"<date>0001-01-01T00:00:00Z</date>", Date{-62135596800}},
+      {"<data> AAEC\n\t/w== </data>", Data{0, 1, 2, 255}},
+      {"<data/>", Data()},
+  };
+  for (const auto& [xml, expected] : cases) {
+    const Result<PropertyList> read = parsePropertyList(xml, foreignFileLimits);
+    ASSERT_TRUE(read) << xml << ": " << read.failure().why;
+    EXPECT_EQ(*read, expected) << xml;
+    EXPECT_EQ(*parsePropertyList(writePropertyList(*read).value(), ownFileLimits), expected) << xml;
+  }
+}
+
+TEST(PropertyListXml, readsAFileWithAndWithoutItsFrame) {
+  const PropertyList expected = dictionaryOf({{"b", Array{1, "x"}}, {"a", dictionaryOf({{"", true}})}});
+  const std::string bare =
+      "<dict> <key>b</key><array><integer>1</integer>\t<string>x</string></array>\n"
+      "<key>a</key><!-- c --><dict><key/><true/></dict></dict>";
+  const std::string declaration = "\xEF\xBB\xBF<?xml version=\"1.0\" encoding=\"UTF-8\"?>\r\n";
+  const std::string type = "<!DOCTYPE plist PUBLIC \"-//X//DTD 1.0//EN\" \"http://nowhere.invalid/x.dtd\">\n";
+  for (const std::string& xml : {bare, "\n<!-- c -->" + bare + "\n", declaration + bare,
+                                 declaration + type + "<plist version=\"1.0\">" + bare + "</plist>\n<!-- c -->"}) {
+    const Result<PropertyList> read = parsePropertyList(xml, foreignFileLimits);
+    ASSERT_TRUE(read) << xml << ": " << read.failure().why;
+    EXPECT_EQ(*read, expected) << xml;
+  }
+}
+
+TEST(PropertyListXml, refusesWhatIsMalformedAndSaysWhere) {
+  const std::pair<std::string, const char*> cases[] = {
+      {"", "offset 0: expected a property list value"},
+      {"bplist00\xD1", "offset 0: expected XML, not a binary property list"},
+      {"hello", "offset 0: expected no text here"},
+      {"<dict/> <dict/>", "offset 8: expected the end after the first value"},
+      {"<plist><true/><true/></plist>", "offset 14: expected one value in the property list"},
+      {"<plist><plist><true/></plist></plist>", "offset 7: expected a property list value"},
+      {"<key>k</key>", "offset 0: expected a property list value"},
+      {"<dict><key>k</key></dict>", "offset 6: expected a value after the key"},
+      {"<dict><true/></dict>", "offset 6: expected a key"},
+      {"<dict><key>a</key><key>b</key></dict>", "offset 18: expected a property list value"},
+      {"<dict><key>a</key><true/><key>&#97;</key><true/></dict>",
+       "offset 25: expected a key that has not occurred yet"},
+      {"<dict><key>a</key>x<true/></dict>", "offset 18: expected no text here"},
+      {"<array><![CDATA[x]]></array>", "offset 16: expected no text here"},
+      {"<string>a<true/></string>", "offset 9: expected text"},
+      {"<true>x</true>", "offset 6: expected no text here"},
+      {"<true><false/></true>", "offset 6: expected an empty element"},
+      {"<integer>9223372036854775808</integer>", "offset 0: expected an integer of 64 bits"},
+      {"<integer>-9223372036854775809</integer>", "offset 0: expected an integer of 64 bits"},
+      {"<integer>1.0</integer>", "offset 0: expected an integer of 64 bits"},
+      {"<integer>0x</integer>", "offset 0: expected an integer of 64 bits"},
+      {"<real>1e999</real>", "offset 0: expected a real number"},
+      {"<real>+-1</real>", "offset 0: expected a real number"},
+      {"<date>2001-02-29T00:00:00Z</date>", "offset 0: expected a date like 2000-01-31T23:59:59Z"},
+      {"<date>2001-02-28T24:00:00Z</date>", "offset 0: expected a date like 2000-01-31T23:59:59Z"},
+      {"<date>2001-02-28T1/:00:00Z</date>", "offset 0: expected a date like 2000-01-31T23:59:59Z"},
+      {"<data>AAE</data>", "offset 0: expected data in base 64"},
+      {"<data>AA=A</data>", "offset 0: expected data in base 64"},
+      {"<data>AA*A</data>", "offset 0: expected data in base 64"},
+      {"<string>a&b</string>", "offset 9: expected a reference that XML itself names"},
+      {"<string>\r\na&bomb;</string>", "offset 11: expected a reference that XML itself names"},
+      {"<string>&#0;</string>", "offset 8: expected a reference that XML itself names"},
+      {"<string>&#xD800;</string>", "offset 8: expected a reference that XML itself names"},
+      {"<string>&#x110000;</string>", "offset 8: expected a reference that XML itself names"},
+      {"<string>&#99999999999;</string>", "offset 8: expected a reference that XML itself names"},
+      {"<string>\x01</string>", "offset 8: expected a character of XML in UTF-8"},
+      {"<string>\uFFFF</string>", "offset 8: expected a character of XML in UTF-8"},
+      {"<string>\xC3</string>", "offset 8: expected a character of XML in UTF-8"},
+      {std::string("<true/>\0", 8), "offset 7: expected a character of XML in UTF-8"},
+      {"<array><dict></array></dict>", "offset 15: expected the end tag of the innermost element"},
+      {"<array", "offset 5: expected a well-formed tag"},
+      {"<!DOCTYPE plist [<!ENTITY a \"b\">]><string>&a;</string>",
+       "offset 10: expected a document type without an internal subset"},
+  };
+  for (const auto& [xml, why] : cases) EXPECT_EQ(whyRefused(xml), why) << xml;
+}
+
+TEST(PropertyListXml, keepsItsLimits) {
+  const PropertyListLimits limits{100, 3, 4};
+  EXPECT_EQ(whyRefused(nestedArrays(3), limits), "accepted");
+  EXPECT_EQ(whyRefused(nestedArrays(4), limits), "offset 21: expected at most 3 levels");
+  EXPECT_EQ(whyRefused("<dict><key>a</key><dict/><key>b</key></dict>", limits),
+            "offset 25: expected a value after the key");
+  EXPECT_EQ(whyRefused("<array>" + repeated("<true/>", 4) + "</array>", limits),
+            "offset 28: expected at most 4 elements");
+  EXPECT_EQ(whyRefused("<true/>" + std::string(93, ' '), limits), "accepted");
+  EXPECT_EQ(whyRefused("<true/>" + std::string(94, ' '), limits), "offset 0: expected at most 100 bytes");
+  EXPECT_EQ(whyRefused(nestedArrays(500'000), ownFileLimits), "offset 448: expected at most 64 levels");
+  EXPECT_EQ(whyRefused(repeated("<array>", 500'000), ownFileLimits),
+            "offset 3499999: expected the end tag of the innermost element");
+}
+
+TEST(PropertyListXml, writesAFile) {
+  const PropertyList value = dictionaryOf({{"a<", Array{"&\r", -1, 1.5, true, Date{-1}, Data{255, 1}}},
+                                           {"b", dictionaryOf({{"e", Dictionary()}, {"f", Array()}, {"g", false}})}});
+  const Result<std::string> written = writePropertyList(value);
+  ASSERT_TRUE(written);
+  EXPECT_EQ(*written, R"(<?xml version="1.0" encoding="UTF-8"?>
+<plist version="1.0">
+<dict>
+	<key>a&lt;</key>
+	<array>
+		<string>&amp;&#13;</string>
+		<integer>-1</integer>
+		<real>1.5</real>
+		<true/>
+		<date>1969-12-31T23:59:59Z</date>
+		<data>/wE=</data>
+	</array>
+	<key>b</key>
+	<dict>
+		<key>e</key>
+		<dict/>
+		<key>f</key>
+		<array/>
+		<key>g</key>
+		<false/>
+	</dict>
+</dict>
+</plist>
+)");
+}
+
+TEST(PropertyListXml, writesNothingThatXmlCannotHold) {
+  const PropertyList cases[] = {"\x1B",
+                                "\xFF",
+                                std::string("\0", 1),
+                                dictionaryOf({{"\uFFFE", 1}}),
+                                Array{Date{253402300800}},
+                                Date{-62135596801},
+                                Date{std::numeric_limits<std::int64_t>::min()}};
+  for (const PropertyList& value : cases) EXPECT_FALSE(writePropertyList(value));
+  EXPECT_EQ(writePropertyList("a\x1B").failure().why, "XML cannot hold the text \"a\\x1B\"");
+}
+
+}  // namespace
+}  // namespace tavisk

@@ -1,0 +1,262 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include <array>
+#include <atomic>
+#include <cstdio>
+#include <thread>
+
+#include "base/RunLoop.h"
+
+namespace tavisk {
+namespace {
+
+using std::chrono::milliseconds;
+using std::chrono::seconds;
+using ::testing::ElementsAre;
+using Readiness = RunLoop::Readiness;
+using Registration = RunLoop::Registration;
+
+/// A deadline that no load can make a test miss: one that waits in vain is ended from outside.
+constexpr auto atLast = RunLoop::Clock::time_point::max();
+
+class RunLoopTest : public ::testing::Test {
+ protected:
+  /// Work that writes its name down.
+  RunLoop::Work note(std::string name) {
+    return [this, name = std::move(name)] { ran.push_back(name); };
+  }
+
+  RunLoop loop;
+  std::vector<std::string> ran;
+};
+
+/// Two connected sockets.
+class Sockets {
+ public:
+  Sockets() { EXPECT_EQ(socketpair(AF_UNIX, SOCK_STREAM | SOCK_NONBLOCK, 0, _ends.data()), 0); }
+  Sockets(const Sockets&) = delete;
+  Sockets& operator=(const Sockets&) = delete;
+  ~Sockets() {
+    close(_ends[0]);
+    close(_ends[1]);
+  }
+
+  int watched() const { return _ends[0]; }
+  void send() const { EXPECT_EQ(write(_ends[1], "x", 1), 1); }
+  void receive() const {
+    char byte = 0;
+    EXPECT_EQ(read(_ends[0], &byte, 1), 1);
+  }
+
+ private:
+  std::array<int, 2> _ends{};
+};
+
+TEST_F(RunLoopTest, runsWhatWasDueWhenThePassBegan) {
+  const Sockets sockets;
+  sockets.send();
+  const auto watch = loop.watch(sockets.watched(), Readiness::readable, note("ready"));
+  Registration later;
+  const auto timer = loop.after(milliseconds(0), [&] {
+    ran.push_back("timer");
+    later = loop.after(milliseconds(0), note("later timer"));
+  });
+  loop.post([&] {
+    ran.push_back("posted");
+    loop.post(note("later post"));
+  });
+  loop.post(note("posted too"));
+  loop.runPass();
+  EXPECT_THAT(ran, ElementsAre("posted", "posted too", "timer", "ready"));
+  ran.clear();
+  loop.runPass();
+  EXPECT_THAT(ran, ElementsAre("later post", "later timer", "ready"));
+}
+
+TEST_F(RunLoopTest, runsTimersInTheOrderOfTheirTimes) {
+  const auto c = loop.after(milliseconds(12), note("c"));
+  const auto b = loop.after(milliseconds(6), note("b"));
+  const auto a = loop.after(milliseconds(-5), note("a"));
+  const auto never = loop.after(RunLoop::Clock::duration::max(), note("never"));
+  EXPECT_TRUE(loop.runUntil(atLast, [&] { return ran.size() == 3; }));
+  EXPECT_THAT(ran, ElementsAre("a", "b", "c"));
+}
+
+TEST_F(RunLoopTest, repeatsUntilTheRegistrationEnds) {
+  Registration repeated;
+  repeated = loop.every(milliseconds(2), [&] {
+    ran.emplace_back("tick");
+    if (ran.size() == 3) repeated.cancel();
+  });
+  EXPECT_TRUE(loop.runUntil(atLast, [&] { return ran.size() == 3; }));
+  loop.runUntil(RunLoop::Clock::now() + milliseconds(10));
+  EXPECT_EQ(ran.size(), 3U);
+}
+
+TEST_F(RunLoopTest, runsNothingThatWasCancelledInThePass) {
+  const Sockets sockets;
+  sockets.send();
+  auto first = loop.watch(sockets.watched(), Readiness::readable, note("watch"));
+  auto second = loop.watch(sockets.watched(), Readiness::readable, note("watch"));
+  auto timer = loop.after(milliseconds(0), note("timer"));
+  loop.post([&] {
+    timer.cancel();
+    first = Registration();
+    const Registration ended = std::move(second);
+  });
+  loop.runPass();
+  loop.runPass();
+  EXPECT_TRUE(ran.empty());
+}
+
+TEST_F(RunLoopTest, freesWorkThatIsOver) {
+  const auto resource = std::make_shared<int>();
+  const Sockets sockets;
+  auto timer = loop.after(milliseconds(0), [resource] {});
+  auto watch = loop.watch(sockets.watched(), Readiness::readable, [resource] {});
+  loop.post([resource] {});
+  loop.runPass();
+  watch.cancel();
+  EXPECT_EQ(resource.use_count(), 1) << "a timer that has run keeps nothing";
+}
+
+TEST_F(RunLoopTest, letsARegistrationOutliveTheLoop) {
+  const Sockets sockets;
+  Registration timer;
+  Registration watch;
+  {
+    RunLoop shortLived;
+    timer = shortLived.every(seconds(1), note("timer"));
+    watch = shortLived.watch(sockets.watched(), Readiness::readable, note("watch"));
+  }
+  timer.cancel();
+  watch.cancel();
+}
+
+TEST_F(RunLoopTest, watchesADescriptorForSeveral) {
+  const Sockets sockets;
+  auto urgent = loop.watch(sockets.watched(), Readiness::priority, note("urgent"));
+  {
+    const auto readable = loop.watch(sockets.watched(), Readiness::readable, note("readable"));
+    sockets.send();
+    loop.runPass();
+    loop.runPass();
+    EXPECT_THAT(ran, ElementsAre("readable", "readable")) << "as long as there is something to read";
+  }
+  loop.runUntil(RunLoop::Clock::now() + milliseconds(5));
+  EXPECT_EQ(ran.size(), 2U);
+  const auto again = loop.watch(sockets.watched(), Readiness::readable, note("again"));
+  urgent.cancel();
+  loop.runPass();
+  EXPECT_THAT(ran, ElementsAre("readable", "readable", "again"));
+}
+
+TEST_F(RunLoopTest, watchesNoRegularFile) {
+  const std::unique_ptr<FILE, int (*)(FILE*)> file(std::tmpfile(), std::fclose);
+  const auto watch = loop.watch(fileno(file.get()), Readiness::readable, note("file"));
+  loop.runUntil(RunLoop::Clock::now() + milliseconds(5));
+  EXPECT_TRUE(ran.empty());
+}
+
+TEST_F(RunLoopTest, runsInItself) {
+  const Sockets sockets;
+  sockets.send();
+  const auto watch = loop.watch(sockets.watched(), Readiness::readable, [&] {
+    ran.emplace_back("ready");
+    sockets.receive();
+  });
+  loop.post([&] {
+    ran.emplace_back("outer");
+    loop.post(note("posted inside"));
+    loop.runPass();
+    ran.emplace_back("outer ends");
+  });
+  loop.post(note("rest of the outer pass"));
+  loop.runPass();
+  EXPECT_THAT(ran, ElementsAre("outer", "rest of the outer pass", "posted inside", "ready", "outer ends"))
+      << "what is left of the outer pass is due in the inner one, and runs once";
+}
+
+TEST_F(RunLoopTest, stopsTheInnermostRun) {
+  loop.post([&] {
+    loop.post([&] { loop.stop(); });
+    loop.run();
+    ran.emplace_back("inner ended");
+    loop.post([&] {
+      loop.stop();
+      loop.post(note("not in this run"));
+    });
+  });
+  loop.run();
+  EXPECT_THAT(ran, ElementsAre("inner ended"));
+}
+
+TEST_F(RunLoopTest, remembersAStopWhileAnotherRunIsMade) {
+  loop.post([&] {
+    loop.stop();
+    loop.post([&] { loop.stop(); });
+    loop.run();
+    ran.emplace_back("inner ended");
+  });
+  loop.run();
+  EXPECT_THAT(ran, ElementsAre("inner ended"));
+}
+
+TEST_F(RunLoopTest, runsUntilAConditionHolds) {
+  bool holds = false;
+  EXPECT_FALSE(loop.runUntil(RunLoop::Clock::now() + milliseconds(1), [&] { return holds; }));
+  const auto timer = loop.after(milliseconds(5), [&] { holds = true; });
+  EXPECT_TRUE(loop.runUntil(atLast, [&] { return holds; }));
+  EXPECT_FALSE(loop.runUntil(RunLoop::Clock::now() - seconds(10), [] { return false; }));
+}
+
+TEST_F(RunLoopTest, givesWaitsWhatTheLimitLeaves) {
+  const std::chrono::hours hour(1);
+  const auto never = [] { return false; };
+  {
+    const auto limit = loop.limitWaits(seconds(60));
+    const auto wider = loop.limitWaits(hour);
+    EXPECT_LE(loop.timeFor(hour), seconds(60));
+    EXPECT_EQ(loop.timeFor(seconds(1)), seconds(1));
+    const auto none = loop.limitWaits(seconds(0));
+    EXPECT_EQ(loop.timeFor(hour), seconds(0));
+    EXPECT_FALSE(loop.runUntil(RunLoop::Clock::now() + hour, never));
+    loop.runUntil(RunLoop::Clock::now() + hour);
+    const auto pause = loop.pauseLimit();
+    EXPECT_EQ(loop.timeFor(hour), hour);
+  }
+  EXPECT_EQ(loop.timeFor(hour), hour);
+}
+
+TEST_F(RunLoopTest, wakesForAPostFromAnotherThread) {
+  std::thread other([&] {
+    std::this_thread::sleep_for(milliseconds(20));
+    loop.post([&] { loop.stop(); });
+  });
+  loop.run();
+  other.join();
+}
+
+TEST_F(RunLoopTest, takesPostsFromManyThreads) {
+  constexpr int each = 25'000;
+  std::array<int, 4> count{};
+  std::vector<std::thread> threads;
+  for (int& mine : count) {
+    threads.emplace_back([this, &mine] {
+      for (int post = 0; post < each; ++post) {
+        loop.post([&mine, post] { mine = mine == post ? post + 1 : -1; });
+      }
+    });
+  }
+  EXPECT_TRUE(loop.runUntil(atLast, [&] { return std::ranges::all_of(count, [](int done) { return done == each; }); }))
+      << "each thread's posts run all, and in their order";
+  for (std::thread& thread : threads) thread.join();
+}
+
+}  // namespace
+}  // namespace tavisk

@@ -1,0 +1,61 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "TemporaryFolder.h"
+#include "base/RunLoop.h"
+#include "effects/EffectLog.h"
+#include "effects/EffectSink.h"
+#include "hosts/linux/LinuxHost.h"
+
+namespace tavisk {
+
+/// A Linux machine that is a temporary tree of files, and the host on it.
+class LinuxTree {
+ public:
+  LinuxTree() { effects.addChannel(log); }
+
+  void write(const std::string& path, std::string_view contents) { _folder.write(path, contents); }
+  void writeProgram(const std::string& path, std::string_view script) {
+    std::filesystem::permissions(_folder.write(path, script), std::filesystem::perms::owner_all);
+  }
+  void link(const std::string& path, const std::string& target) {
+    write(path, "");
+    std::filesystem::remove(at(path));
+    std::filesystem::create_symlink(target, at(path));
+  }
+  /// Has a program that switches init scripts as /etc/rc2.d then shows.
+  void haveRunLevels() {
+    writeProgram("/usr/sbin/update-rc.d", R"sh(#!/bin/sh
+root=${0%/usr/sbin/update-rc.d}
+mkdir -p "$root/etc/rc2.d"
+rm -f "$root/etc/rc2.d/"*"$1"
+[ "$2" = enable ] && touch "$root/etc/rc2.d/S01$1" || touch "$root/etc/rc2.d/K01$1"
+)sh");
+  }
+  std::filesystem::path at(const std::string& path) const {
+    return _folder.path() / std::filesystem::path(path).relative_path();
+  }
+  std::string file(const std::string& path) const { return contentsOf(at(path)); }
+  bool has(const std::string& path) const { return std::filesystem::exists(std::filesystem::symlink_status(at(path))); }
+
+  LinuxHost& host() {
+    if (!_host) _host = std::make_unique<LinuxHost>(effects, runLoop, _folder.path());
+    return *_host;
+  }
+  /// The last line that was told: the JSON of an effect or a value.
+  std::string lastTold() const { return log.lines.empty() ? "" : log.lines.back(); }
+
+  EffectSink effects;
+  RunLoop runLoop;
+  EffectLog log;
+
+ private:
+  TemporaryFolder _folder;
+  std::unique_ptr<LinuxHost> _host;
+};
+
+}  // namespace tavisk

@@ -1,0 +1,206 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <thread>
+
+#include "ToolRun.h"
+#include "hosts/linux/FakeServiceManager.h"
+#include "hosts/linux/LinuxTree.h"
+#include "hosts/linux/services/ServicesConfig.h"
+#include "platform/RemoteAccessContract.h"
+
+namespace tavisk {
+namespace {
+
+using testing::AllOf, testing::Contains, testing::ElementsAre, testing::HasSubstr, testing::IsEmpty;
+using namespace std::chrono_literals;
+
+constexpr const char* running = "active";
+
+/// A machine with init scripts; the server writes its process id a little later, and alice is logged in.
+class ScriptedTree : public LinuxTree {
+ public:
+  ScriptedTree() {
+    write("/etc/ssh/ssh_host_rsa_key", "");
+    writeProgram("/usr/sbin/sshd", "");
+    write("/proc/78/stat", "78 (sshd) S 1");
+    write("/proc/78/cmdline", "sshd: alice [priv]");
+    writeProgram("/etc/init.d/ssh", R"sh(#!/bin/sh
+root=${0%/etc/init.d/ssh}
+case $1 in
+start)
+  mkdir -p "$root/proc/77" "$root/run"
+  echo "77 (sshd) S 1" > "$root/proc/77/stat"; echo sshd > "$root/proc/77/cmdline"
+  (sleep 0.1; echo 77 > "$root/run/sshd.pid") >/dev/null 2>&1 &
+  ;;
+stop) rm -rf "$root/proc/77" "$root/run/sshd.pid" ;;
+esac
+)sh");
+    haveRunLevels();
+  }
+};
+
+class ManagedTree : public LinuxTree {
+ public:
+  ManagedTree() : manager((write("/run/systemd/system/x", ""), at("/run/systemd/private"))) {
+    write("/etc/ssh/ssh_host_rsa_key", "");
+    writeProgram("/usr/sbin/sshd", "");
+    write("/usr/sbin/sshd", "");
+    write("/etc/tavisk/services.conf", "remote-events = events.socket events.service\n");
+    for (const char* unit : {"ssh.service", "ssh.socket", "events.socket", "events.service"}) manager.set(unit, {});
+  }
+  FakeServiceManager manager;
+};
+
+template <typename Tree>
+struct RemoteShellOf {
+  RemoteShellService& service() { return tree.host().remoteShell(); }
+  Tree tree;
+};
+struct RemoteEvents {
+  RemoteEventsService& service() { return tree.host().remoteEvents(); }
+  ManagedTree tree;
+};
+using Machines = testing::Types<RemoteShellOf<ScriptedTree>, RemoteShellOf<ManagedTree>, RemoteEvents>;
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, RemoteAccessContract, Machines);
+
+TEST(RemoteLogin, SwitchesServiceAndSocketTogether) {
+  struct Case {
+    FakeUnit service, socket;
+    bool isOn;
+    std::vector<std::string> off, on;
+  };
+  const FakeUnit none, enabled{.file = "enabled"}, active{.active = running}, absent{.load = "not-found"};
+  const FakeUnit broken{.load = "bad-setting", .active = running};
+  const FakeUnit runtime{.file = "enabled-runtime"}, both{.active = running, .file = "enabled"};
+  const std::vector<std::string> enableAndStart = {"EnableUnitFiles ssh.service", "Reload", "StartUnit ssh.service"};
+  const std::vector<std::string> disableSocket = {"DisableUnitFiles ssh.socket", "Reload"};
+  const Case cases[] = {
+      {none, none, false, {}, enableAndStart},
+      {none, absent, false, {}, enableAndStart},
+      {active, none, true, {"StopUnit ssh.service"}, {"EnableUnitFiles ssh.service", "Reload"}},
+      {broken, absent, true, {"StopUnit ssh.service"}, {"EnableUnitFiles ssh.service", "Reload"}},
+      {none, enabled, true, disableSocket, {"StartUnit ssh.socket"}},
+      {none, runtime, true, disableSocket, {"StartUnit ssh.socket"}},
+      {active,
+       both,
+       true,
+       {"DisableUnitFiles ssh.socket", "Reload", "StopUnit ssh.socket", "StopUnit ssh.service"},
+       {}},
+  };
+  for (const auto& test : cases) {
+    for (bool on : {false, true}) {
+      ManagedTree tree;
+      tree.manager.set("ssh.service", test.service);
+      tree.manager.set("ssh.socket", test.socket);
+      auto& login = tree.host().remoteShell();
+      EXPECT_EQ(login.isEnabled(), test.isOn);
+      login.setEnabled(on);
+      EXPECT_EQ(tree.manager.calls(), on ? test.on : test.off);
+      EXPECT_EQ(login.isEnabled(), on);
+    }
+  }
+}
+
+TEST(RemoteLogin, SaysWhatStandsAgainstIt) {
+  const std::tuple<const char*, FakeUnit, const char*, const char*> cases[] = {
+      {"", {.load = "not-found"}, "not supported", "ssh.service, ssh.socket, sshd.service, sshd.socket"},
+      {"remote-shell = other.service", {}, "not supported", "other.service"},
+      {"remote-shell = systemd-logind.service", {}, "failed", "the machine depends on this unit"},
+      {"", {.jobResult = "failed"}, "failed", "its job ended with: failed"},
+  };
+  for (const auto& [config, unit, outcome, why] : cases) {
+    ManagedTree tree;
+    tree.write("/etc/tavisk/services.conf", config);
+    tree.manager.set("ssh.service", unit);
+    tree.manager.set("ssh.socket", {.load = "not-found"});
+    tree.host().remoteShell().setEnabled(true);
+    EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr("\"outcome\":\"" + std::string(outcome)), HasSubstr(why)));
+  }
+}
+
+TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
+  const std::tuple<const char*, const char*, const char*> cases[] = {
+      {"touch $root/etc/ssh/ssh_host_ed25519_key", "", "applied"},
+      {"true", "", "failed"},
+      {"false", "", "failed"},
+      {"false", "Port 22\n hostkey /srv/key\n", "applied"},
+  };
+  for (const auto& [maker, config, outcome] : cases) {
+    ManagedTree tree;
+    std::filesystem::remove(tree.at("/etc/ssh/ssh_host_rsa_key"));
+    tree.write("/etc/ssh/sshd_config", config);
+    tree.writeProgram("/usr/bin/ssh-keygen", std::string("#!/bin/sh\nroot=${0%/usr/bin/ssh-keygen}\n") + maker);
+    tree.host().remoteShell().setEnabled(true);
+    EXPECT_THAT(tree.lastTold(), HasSubstr("\"outcome\":\"" + std::string(outcome))) << maker << config;
+    EXPECT_EQ(tree.host().remoteShell().isEnabled(), std::string_view(outcome) == "applied");
+  }
+}
+
+TEST(RemoteEvents, SwitchAllUnitsAndAskTheFirst) {
+  ManagedTree tree;
+  auto& events = tree.host().remoteEvents();
+  tree.manager.set("events.service", {.active = running, .file = "enabled"});
+  EXPECT_FALSE(events.isEnabled());
+  events.setEnabled(true);
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("before":"partly on")"));
+  events.setEnabled(false);
+  EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles events.socket", "Reload", "StartUnit events.socket",
+                                                "DisableUnitFiles events.socket", "DisableUnitFiles events.service",
+                                                "Reload", "StopUnit events.service", "StopUnit events.socket"));
+  tree.manager.set("events.service", {.load = "not-found"});
+  events.setEnabled(true);
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("not all of them")));
+}
+
+TEST(RemoteAccess, HasOneTimeForAllWaitsOfACommandButForQuestions) {
+  static constexpr auto longestCommand = 400ms;
+  struct SlowUser : LineSource {
+    std::optional<std::string> readLine(const std::string&, std::size_t) override {
+      std::this_thread::sleep_for(longestCommand);
+      return "yes\n";
+    }
+    void restoreTerminal() override {}
+  } user;
+  ManagedTree tree;
+  for (const char* unit : {"events.socket", "events.service"}) tree.manager.set(unit, {.delay = longestCommand / 4});
+  tree.manager.set("ssh.service", {.active = running});
+  const std::vector<std::string> words = {"setremotevelmarevents", "on", "setremotelogin", "off"};
+  const auto result = runTool(tree, words, {.input = &user, .longestCommand = longestCommand});
+  EXPECT_EQ(result.output, "setremotevelmarevents: On\n");
+  EXPECT_THAT(tree.log.lines,
+              Contains(AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("Remote Events"), HasSubstr("timed out"))));
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr("Login"), HasSubstr(R"("outcome":"applied")")));
+}
+
+TEST(RemoteEvents, AreNotSupportedWithoutUnits) {
+  LinuxTree tree;
+  tree.host().remoteEvents().setEnabled(true);
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("services.conf")));
+  EXPECT_FALSE(tree.host().remoteEvents().isEnabled());
+}
+
+TEST(ServicesConfig, NamesUnitsThatMayBeSwitched) {
+  const std::pair<const char*, std::vector<std::string>> cases[] = {
+      {"", {}},
+      {"# remote-events = a.service\nother = b.service\n", {}},
+      {"remote-events = a.service\nremote-events=b@1.socket  my-group.target\r\n", {"b@1.socket", "my-group.target"}},
+      {"remote-events =\n", {}},
+  };
+  for (const auto& [text, units] : cases) {
+    LinuxTree tree;
+    tree.write(servicesConfig, text);
+    EXPECT_EQ(configuredUnits(SystemRoot(tree.at("/")), "remote-events").valueOr({"failed"}), units) << text;
+  }
+  for (const char* unit : {"a", ".service", "a.mount", "a/b.service", "../a.service", "dbus.service", "dbus.socket",
+                           "systemd-journald.service", "reboot.target", "remote-fs-pre.target", "hybrid-sleep.target",
+                           "multi-user.target", "runlevel0.target"}) {
+    LinuxTree tree;
+    tree.write(servicesConfig, std::string("remote-events = a.service ") + unit);
+    EXPECT_FALSE(configuredUnits(SystemRoot(tree.at("/")), "remote-events")) << unit;
+  }
+}
+
+}  // namespace
+}  // namespace tavisk

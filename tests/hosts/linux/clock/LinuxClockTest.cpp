@@ -1,0 +1,119 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include "base/Calendar.h"
+#include "hosts/linux/LinuxTree.h"
+#include "hosts/linux/clock/LocalTime.h"
+#include "hosts/linux/clock/SystemClock.h"
+
+namespace tavisk {
+namespace {
+
+using testing::AllOf, testing::HasSubstr;
+
+TEST(LocalTime, FindsTheZoneInEveryShapeOfLink) {
+  const std::pair<const char*, std::optional<std::string>> cases[] = {
+      {"/usr/share/zoneinfo/Europe/Paris", "Europe/Paris"},
+      {"../usr/share/zoneinfo/America/Argentina/Ushuaia", "America/Argentina/Ushuaia"},
+      {"/usr/share/zoneinfo/posix/Etc/GMT+5", "Etc/GMT+5"},
+      {"/usr/share/zoneinfo/right/UTC", "UTC"},
+      {"/etc/zoneinfo/Asia/Tokyo", "Asia/Tokyo"},
+      {"/usr/share/zoneinfo/", std::nullopt},
+      {"/usr/share/zoneinfo//Europe/Paris", std::nullopt},
+      {"/usr/share/zoneinfo/../../../etc/passwd", std::nullopt},
+      {"/usr/share/zoneinfo/Europe\n/Paris", std::nullopt},
+      {"/opt/clock", std::nullopt},
+      {"", std::nullopt},
+  };
+  for (const auto& [path, zone] : cases) EXPECT_EQ(zoneOfPath(path), zone) << path;
+}
+
+TEST(LocalTime, ReadsTheNameFileWhereTheLinkSaysNothing) {
+  const std::pair<const char*, const char*> cases[] = {
+      {"Europe/Paris\n", "Europe/Paris"},  {"  Asia/Tokyo \r\n", "Asia/Tokyo"},
+      {"# ours\n\nUTC\nEtc/GMT\n", "UTC"}, {"", "UTC"},
+      {"../../etc/passwd\n", "UTC"},
+  };
+  for (const auto& [contents, zone] : cases) {
+    LinuxTree tree;
+    tree.write("/etc/localtime", "TZif2");
+    tree.write("/etc/timezone", contents);
+    EXPECT_EQ(tree.host().clock().timeZone(), zone) << contents;
+  }
+}
+
+TEST(LocalTime, KeepsLinkAndNameFileInLine) {
+  LinuxTree tree;
+  tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif2");
+  tree.link("/etc/localtime", "/usr/share/zoneinfo/Europe/Paris");
+  tree.write("/etc/timezone", "Etc/UTC\n");
+  tree.host().clock().setTimeZone("/usr/share/zoneinfo/Europe/Paris");
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"applied")")) << "one of the two was stale";
+  EXPECT_EQ(tree.file("/etc/timezone"), "Europe/Paris\n");
+  EXPECT_EQ(std::filesystem::read_symlink(tree.at("/etc/localtime")), "../usr/share/zoneinfo/Europe/Paris");
+}
+
+TEST(LocalTime, KeepsTheZoneWhenTheNewOneHasNoFile) {
+  LinuxTree tree;
+  tree.link("/etc/localtime", "/usr/share/zoneinfo/Asia/Tokyo");
+  tree.write("/etc/timezone", "Asia/Tokyo\n");
+  tree.host().clock().setTimeZone("/usr/share/zoneinfo/Mars/Olympus");
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("there is no such zone")));
+  EXPECT_EQ(tree.host().clock().timeZone(), "Asia/Tokyo");
+  EXPECT_EQ(tree.file("/etc/timezone"), "Asia/Tokyo\n");
+}
+
+TEST(LinuxClock, LeavesTheClockOfThisMachineAlone) {
+  LinuxTree tree;
+  tree.host().clock().setTime(1'166'999'400);
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("a tree of files has no clock")));
+}
+
+TEST(LinuxClock, NamesTheProgramThatWillSetItBack) {
+  LinuxTree tree;
+  tree.write("/proc/10/stat", "10 (VBoxService) S 1");
+  tree.write("/proc/10/cmdline", "/usr/sbin/VBoxService");
+  tree.host().clock().setTime(1'166'999'400);
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("undoneBy":"VBoxService")"));
+}
+
+TEST(LinuxClock, ReadsTheHardwareClockInTheTimeThatItKeeps) {
+  LinuxTree tree;
+  const SystemRoot root(tree.at("/"));
+  EXPECT_EQ(hardwareTime(root), std::nullopt);
+  setDefaultTimeZone("/usr/share/zoneinfo/Asia/Tokyo");
+  tree.write("/sys/class/rtc/rtc0/since_epoch", "1166999400\n");
+  EXPECT_EQ(hardwareTime(root), 1'166'999'400);
+  tree.write("/etc/adjtime", "0.0 0 0.0\n0\nLOCAL\n");
+  EXPECT_EQ(hardwareTime(root), 1'166'999'400 - 9 * 3600);
+}
+
+TEST(AskedTime, IsWhatTheClocksSayWhenTheyAreNear) {
+  LinuxTree tree;
+  const SystemRoot root(tree.at("/"));
+  const auto now = systemTime();
+  tree.write("/sys/class/rtc/rtc0/since_epoch", std::to_string(now));
+  EXPECT_NE(AskedTime(now - 1).onSystemClock(), now - 1) << "nothing was set yet";
+  for (const auto& [ahead, system, hardware] : {std::tuple(0, true, true), {1, true, true}, {4, false, false}}) {
+    AskedTime asked(now + ahead);
+    asked.isNow();
+    EXPECT_EQ(asked.onSystemClock() == now + ahead, system) << ahead;
+    EXPECT_EQ(asked.onHardwareClock(root) == now + ahead, hardware) << ahead;
+  }
+}
+
+TEST(LinuxClock, KnowsWhichTimesLinuxRefuses) {
+  const std::pair<std::int64_t, bool> cases[] = {
+      {-1, false},
+      {0, false},
+      {946'684'800, true},
+      {8'277'292'035, true},
+      {8'277'292'036, false},
+      {std::numeric_limits<std::int64_t>::max(), false},
+  };
+  for (auto [time, settable] : cases) EXPECT_EQ(whyOutOfClockRange(time) == std::nullopt, settable) << time;
+}
+
+}  // namespace
+}  // namespace tavisk

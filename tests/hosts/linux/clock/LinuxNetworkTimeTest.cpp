@@ -1,0 +1,203 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include "base/DnsName.h"
+#include "hosts/linux/LinuxTree.h"
+#include "hosts/linux/clock/TimeDaemons.h"
+#include "hosts/linux/system/ProcessScan.h"
+#include "platform/NetworkTimeContract.h"
+
+namespace tavisk {
+namespace {
+
+using testing::AllOf, testing::HasSubstr, testing::IsEmpty, testing::UnorderedElementsAre;
+
+/// A machine with chrony and init scripts; both programs work on the tree that they stand in.
+class ChronyTree : public LinuxTree {
+ public:
+  ChronyTree() {
+    writeProgram("/etc/init.d/chrony", R"sh(#!/bin/sh
+root=${0%/etc/init.d/chrony}
+echo "$1" >> "$root/calls"
+case $1 in
+start) mkdir -p "$root/proc/77"; echo "77 (chronyd) S 1" > "$root/proc/77/stat"; echo chronyd > "$root/proc/77/cmdline" ;;
+stop) rm -rf "$root/proc/77" ;;
+esac
+)sh");
+    haveRunLevels();
+    writeProgram("/usr/sbin/chronyd", "");
+    write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\n");
+    writeProgram("/usr/bin/chronyc", R"sh(#!/bin/sh
+root=${0%/usr/bin/chronyc}
+echo "$@" "$(env | grep -v -e ^PWD= -e ^SHLVL= -e ^_= | sort)" > "$root/reloaded"
+)sh");
+  }
+};
+
+struct LinuxNetworkTime {
+  static constexpr bool takesAnyText = false;
+  NetworkTimeService& service() { return tree.host().networkTime(); }
+  bool launchesAtStartup() { return tree.has("/etc/rc2.d/S01chrony"); }
+  ChronyTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, NetworkTimeContract, LinuxNetworkTime);
+
+TEST(LinuxNetworkTime, SaysThatThereIsNoClient) {
+  LinuxTree tree;
+  auto& client = tree.host().networkTime();
+  EXPECT_FALSE(client.isRunning());
+  EXPECT_EQ(client.server().address, "");
+  client.start();
+  EXPECT_THAT(tree.lastTold(),
+              AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("none of them is installed")));
+  client.setServer({"time.example"});
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"not supported")"));
+}
+
+TEST(LinuxNetworkTime, WritesTheServerWhereTheClientReadsIt) {
+  ChronyTree tree;
+  auto& client = tree.host().networkTime();
+  client.setServer({"time.example"});
+  EXPECT_EQ(tree.file("/etc/chrony/sources.d/60-tavisk.sources"),
+            "# Written by tavisk. Changes made here are replaced.\nserver time.example iburst\n");
+  client.restartAsynchronously();
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"applied")"));
+  EXPECT_EQ(tree.file("/reloaded"), "reload sources LC_ALL=C\nPATH=/usr/sbin:/usr/bin:/sbin:/bin\n");
+
+  tree.write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\npool pool.example iburst\n");
+  client.setServer({"next.example"});
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("note":"configured elsewhere, pool.example stays in use beside it")"));
+
+  tree.write("/etc/chrony/chrony.conf", "pool pool.example iburst\n");
+  client.setServer({"other.example"});
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("sourcedir")));
+  EXPECT_EQ(client.server().address, "pool.example") << "chronyd does not read the tool's own file any more";
+}
+
+TEST(LinuxNetworkTime, TellsWhenSuccessChangedNothing) {
+  ChronyTree tree;
+  for (const auto& [script, why] : {std::pair("#!/bin/sh\nexit 0\n", "chronyd does not run"),
+                                    std::pair("#!/bin/sh\necho no such key >&2\nexit 3\n", "status 3: no such key")}) {
+    tree.writeProgram("/etc/init.d/chrony", script);
+    tree.host().networkTime().start();
+    EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr(why)));
+  }
+}
+
+struct ServerFiles {
+  std::vector<std::pair<const char*, const char*>> files;
+  const char* server;
+};
+
+/// What the daemon that starts with this program answers as its first server.
+std::string firstServer(const char* program, const ServerFiles& configured) {
+  LinuxTree tree;
+  for (const auto& [path, text] : configured.files) tree.write(path, text);
+  const SystemRoot root(tree.at("/"));
+  for (const auto& client : timeDaemons())
+    if (std::string_view(client.daemon.program) == program) return client.server(root);
+  return "no such program";
+}
+
+TEST(TimeDaemons, ReadServersAsChronydDoes) {
+  constexpr const char* main = "/etc/chrony/chrony.conf";
+  const ServerFiles cases[] = {
+      {{{main, "# server no.example\n! pool no.example\nPool  2.example iburst\nserver 3.example\n"}}, "2.example"},
+      {{{main, "confdir /etc/chrony/conf.d\npool last.example"},
+        {"/etc/chrony/conf.d/b.conf", "server b.example\n"},
+        {"/etc/chrony/conf.d/a.txt", "server a.example\n"}},
+       "b.example"},
+      {{{main, "sourcedir /run/chrony-dhcp /etc/chrony/sources.d\n"},
+        {"/etc/chrony/sources.d/20.sources", "server z.example\n"},
+        {"/etc/chrony/sources.d/60-tavisk.sources", "server own.example iburst\n"}},
+       "own.example"},
+      {{{main, "server\n\n"}}, ""},
+  };
+  for (const auto& each : cases) EXPECT_EQ(firstServer("chronyd", each), each.server) << each.files[0].second;
+}
+
+TEST(TimeDaemons, ReadServersAsTimesyncdDoes) {
+  constexpr const char* main = "/etc/systemd/timesyncd.conf";
+  constexpr const char* own = "/etc/systemd/timesyncd.conf.d/60-tavisk.conf";
+  const ServerFiles cases[] = {
+      {{{main, "[Time]\n#NTP=no.example\nFallbackNTP=no.example\n"}}, ""},
+      {{{main, "[Other]\nNTP=no.example\n[Time]\n NTP = a.example  b.example\nNTP=c.example\n"}}, "a.example"},
+      {{{main, "[Time]\nNTP=a.example\n"}, {own, "[Time]\nNTP=\nNTP=own.example\n"}}, "own.example"},
+      {{{main, "[Time]\nNTP=a.example\n"}, {"/run/systemd/timesyncd.conf.d/9.conf", "[Time]\nNTP=\n"}}, ""},
+      {{{own, "[Time]\nNTP=own.example\n"}, {"/usr/lib/systemd/timesyncd.conf.d/60-tavisk.conf", "[Time]\nNTP=x\n"}},
+       "own.example"},
+      {{{own, "[Time]\nNTP=own.example\n"}, {"/usr/lib/systemd/timesyncd.conf.d/70.conf", "[Time]\nNTP=\nNTP=x\n"}},
+       "x"},
+      {{{main, "[Time]\nNTP=\\\n; a comment between\na.example\n"}}, "a.example"},
+      {{{"/usr/lib/systemd/timesyncd.conf", "[Time]\nNTP=vendor.example"}}, "vendor.example"},
+  };
+  for (const auto& each : cases) EXPECT_EQ(firstServer("systemd-timesyncd", each), each.server) << each.files[0].second;
+}
+
+TEST(TimeDaemons, ReadServersAsNtpdDoes) {
+  constexpr const char* main = "/etc/ntpsec/ntp.conf";
+  const ServerFiles cases[] = {
+      {{{main, "driftfile /x\npool 0.example iburst\n"}, {"/etc/ntpsec/ntp.d/1.conf", "server 1.example\n"}},
+       "0.example"},
+      {{{main, "tos maxclock 11\n"}, {"/etc/ntpsec/ntp.d/1.conf", "server 1.example\n"}}, "1.example"},
+      {{{main, "pool 0.example\n"}, {"/etc/ntpsec/ntp.d/60-tavisk.conf", "server own.example iburst\n"}},
+       "own.example"},
+  };
+  for (const auto& each : cases) EXPECT_EQ(firstServer("ntpd", each), each.server) << each.files[0].second;
+}
+
+TEST(LinuxNetworkTime, KnowsTheClientThatIsReallyThereAndLeavesItsFileAlone) {
+  LinuxTree tree;
+  tree.writeProgram("/etc/init.d/chrony", "#!/bin/sh\n");  // all that is left of a package
+  tree.writeProgram("/etc/init.d/openntpd", "#!/bin/sh\n");
+  tree.writeProgram("/usr/sbin/ntpd", "");
+  tree.write("/etc/openntpd/ntpd.conf", "listen on *\nservers pool.example weight 5\n");
+  tree.host().networkTime().setServer({"time.example"});
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("/etc/openntpd/ntpd.conf")));
+  EXPECT_EQ(tree.host().networkTime().server().address, "pool.example");
+}
+
+TEST(HostName, IsOneWordThatNamesAHost) {
+  const std::string label(63, 'a');
+  for (const std::string& name : {std::string("time.example"), std::string("a"), std::string("x_1.example."), label,
+                                  label + "." + label + "." + label + "." + std::string(61, 'b'),
+                                  std::string("192.0.2.7"), std::string("::1"), std::string("2001:db8::7")})
+    EXPECT_TRUE(isHostNameOrAddress(name)) << name;
+  for (const std::string& text :
+       {std::string(), std::string("."), std::string("a..b"), std::string("-a"), std::string("a b"),
+        std::string("a\nserver b"), std::string("a#b"), label + "a", std::string("::1\n"), std::string("\0", 1),
+        std::string("::1\0x", 5), label + "." + label + "." + label + "." + std::string(62, 'b')})
+    EXPECT_FALSE(isHostNameOrAddress(text)) << text;
+}
+
+TEST(ProcessScan, FindsRunningProgramsOfThisMachine) {
+  LinuxTree tree;
+  auto process = [&](const std::string& id, const std::string& stat, const std::string& commandLine) {
+    tree.write("/proc/" + id + "/stat", stat);
+    tree.write("/proc/" + id + "/cmdline", commandLine);
+    tree.link("/proc/" + id + "/ns/pid", "pid:[1]");
+  };
+  tree.link("/proc/self", "5");
+  process("5", "5 (chronyd) R 1", "chronyd");
+  process("10", "10 (chronyd) S 1 10", std::string("/usr/sbin/chronyd\0-F", 20));
+  process("11", "11 (chronyd) Z 1", "chronyd");
+  process("12", "12 (chronyd) S 2", "");
+  process("13", "13 (x) S (chronyd) S 1", "chronyd");
+  process("14", "14 (chronyd) S 1", "chronyd");
+  tree.link("/proc/14/ns/pid", "pid:[2]");
+  process("15", "15 (systemd-timesyn) S 1", "/lib/systemd/systemd-timesyncd");
+  process("16", "16 (systemd-timesyn) S 1", "systemd-timesynth");
+  process("17", "17 (systemd-timesyn) S 1", "renamed");
+  tree.link("/proc/17/exe", "/lib/systemd/systemd-timesyncd (deleted)");
+  process("18", "garbage", "chronyd");
+  tree.write("/proc/uptime", "1");
+  const SystemRoot root(tree.at("/"));
+  EXPECT_THAT(processesNamed(root, "chronyd"), UnorderedElementsAre(10));
+  EXPECT_THAT(processesNamed(root, "systemd-timesyncd"), UnorderedElementsAre(15, 17));
+  EXPECT_THAT(processesNamed(root, "systemd-timesyn"), UnorderedElementsAre(15, 16, 17));
+  EXPECT_THAT(processesNamed(SystemRoot("/nowhere"), "chronyd"), IsEmpty());
+}
+
+}  // namespace
+}  // namespace tavisk

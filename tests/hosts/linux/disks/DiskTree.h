@@ -1,0 +1,77 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <string>
+
+#include "hosts/linux/LinuxTree.h"
+
+namespace tavisk {
+
+/// Runs a program of this machine; what it prints is dropped. False when it fails or is missing.
+inline bool runTool(const std::string& commandLine) {
+  return std::system(("PATH=/usr/sbin:/usr/bin:/sbin:/bin; (" + commandLine + ") >/dev/null 2>&1").c_str()) == 0;
+}
+
+/// A Linux machine made of files that has disks: what sysfs and the mount table say of them, and images for nodes.
+class DiskTree : public LinuxTree {
+ public:
+  static constexpr const char* sata = "/devices/pci0000:00/0000:00:1f.2/ata1/host0/target0:0:0/0:0:0:0";
+
+  /// A whole disk that hangs on a device, with its size in units of 512 bytes.
+  void addDisk(const std::string& name, const std::string& number, std::uint64_t size,
+               const std::string& carrier = sata) {
+    addDevice(carrier + "/block/" + name, number, size);
+  }
+  void addPartition(const std::string& disk, int partition, const std::string& number, std::uint64_t start,
+                    std::uint64_t size, const std::string& carrier = sata) {
+    const auto path = carrier + "/block/" + disk + "/" + disk + std::to_string(partition);
+    addDevice(path, number, size);
+    write("/sys" + path + "/partition", std::to_string(partition) + "\n");
+    write("/sys" + path + "/start", std::to_string(start) + "\n");
+  }
+  void removeDevice(const std::string& name, const std::string& number) {
+    std::filesystem::remove(at("/sys/class/block/" + name));
+    std::filesystem::remove(at("/sys/dev/block/" + number));
+  }
+  void setSubsystem(const std::string& path, const std::string& name) {
+    link("/sys" + path + "/subsystem", "/sys/bus/" + name);
+  }
+
+  /// An empty file of that many units of 512 bytes in the place of a disk's node.
+  std::string addImage(const std::string& name, std::uint64_t size) {
+    write("/dev/" + name, "");
+    std::filesystem::resize_file(at("/dev/" + name), size * 512);
+    return at("/dev/" + name);
+  }
+
+  /// One more mount, of a device by its number.
+  void mount(const std::string& number, const std::string& source, const std::string& point, const std::string& type,
+             const std::string& options = "rw") {
+    const auto id = std::to_string(++_lastMount);
+    setMounts(_mounts + id + " 1 " + number + " / " + point + " " + options + " - " + type + " " + source + " rw\n");
+    std::filesystem::create_directories(at(point));
+  }
+  void setMounts(const std::string& mountinfo) {
+    _mounts = mountinfo;
+    write("/proc/thread-self/mountinfo", _mounts);
+  }
+
+ private:
+  void addDevice(const std::string& path, const std::string& number, std::uint64_t size) {
+    const auto name = path.substr(path.rfind('/') + 1);
+    const auto colon = number.find(':');
+    write("/sys" + path + "/uevent",
+          "MAJOR=" + number.substr(0, colon) + "\nMINOR=" + number.substr(colon + 1) + "\nDEVNAME=" + name + "\n");
+    write("/sys" + path + "/size", std::to_string(size) + "\n");
+    write("/sys" + path + "/ro", "0\n");
+    link("/sys/class/block/" + name, "../.." + path);
+    link("/sys/dev/block/" + number, "../.." + path);
+  }
+
+  std::string _mounts;
+  int _lastMount = 20;
+};
+
+}  // namespace tavisk

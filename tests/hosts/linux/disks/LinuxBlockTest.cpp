@@ -1,0 +1,215 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <chrono>
+
+#include "hosts/linux/disks/BlockDevices.h"
+#include "hosts/linux/disks/BlockProbe.h"
+#include "hosts/linux/disks/DiskTree.h"
+#include "hosts/linux/disks/MountTable.h"
+
+namespace tavisk {
+namespace {
+
+using testing::ElementsAre, testing::IsEmpty;
+
+std::string pointOf(const Mount* mount) {
+  return !mount ? "none" : mount->point;
+}
+
+TEST(MountTable, ReadsWhatTheKernelWrites) {
+  const MountTable table(
+      "22 27 0:21 / /proc rw,relatime - proc proc rw\n"
+      "27 1 8:2 / / rw,relatime shared:1 master:2 - ext4 /dev/sda2 rw,discard\n"
+      "30 27 8:3 /sub /mnt/a\\040b\\134c\\011 rw - vfat /dev/sda3 ro,errors=remount-ro\n"
+      "31 27 8:4 / /ro ro,nosuid - ext4 /dev/sda4 rw\n"
+      "32 27 0:40 / /nothing rw - tmpfs  rw,size=4k\n"
+      "no mount\n"
+      "33 27 0:41 / relative rw - tmpfs none rw");
+  ASSERT_EQ(table.mounts().size(), 5U);
+  const auto& escaped = table.mounts()[2];
+  EXPECT_EQ(escaped.point, "/mnt/a b\\c\t");
+  EXPECT_EQ(escaped.root, "/sub");
+  EXPECT_EQ(escaped.device, (DeviceNumber{8, 3}));
+  EXPECT_EQ(escaped.type, "vfat");
+  EXPECT_EQ(escaped.source, "/dev/sda3");
+  EXPECT_TRUE(escaped.readOnly);
+  EXPECT_TRUE(table.mounts()[3].readOnly);
+  EXPECT_FALSE(table.mounts()[1].readOnly);
+  EXPECT_EQ(table.mounts()[4].source, "");
+  EXPECT_EQ(table.mounts()[4].options, "rw,size=4k");
+}
+
+TEST(MountTable, FollowsAPathIntoTheMountThatIsSeen) {
+  const MountTable table(
+      "27 1 8:1 / / rw - ext4 /dev/sda1 rw\n"
+      "28 27 8:2 / /a/b rw - ext4 /dev/sda2 rw\n"  // hidden by the next
+      "29 27 8:3 / /a rw - ext4 /dev/sda3 rw\n"    //
+      "30 29 8:4 / /a/c rw - ext4 /dev/sda4 rw\n"  // covered by the next
+      "31 30 8:5 / /a/c rw - ext4 /dev/sda5 rw\n"  //
+      "32 31 8:6 /x /a/c/d rw - ext4 /dev/sda6 rw\n"
+      "33 27 8:6 / /whole rw - ext4 /dev/sda6 rw\n");
+  for (const auto& [path, point, minor] :
+       {std::tuple("/", "/", 1U), std::tuple("/ab", "/", 1U), std::tuple("/a/b/file", "/a", 3U),
+        std::tuple("/a/c", "/a/c", 5U), std::tuple("/a/c/d/e", "/a/c/d", 6U)}) {
+    const auto* mount = table.holding(path);
+    ASSERT_NE(mount, nullptr) << path;
+    EXPECT_EQ(mount->point, point) << path;
+    EXPECT_EQ(mount->device.minor, minor) << path;
+  }
+  EXPECT_EQ(table.holding("relative"), nullptr);
+  EXPECT_EQ(pointOf(table.mountOf({8, 1})), "/");
+  EXPECT_EQ(pointOf(table.mountOf({8, 2})), "none");
+  EXPECT_EQ(pointOf(table.mountOf({8, 4})), "none");
+  EXPECT_EQ(pointOf(table.mountOf({8, 6})), "/whole");
+}
+
+TEST(MountTable, TakesTenThousandMountsInItsStride) {
+  std::string text = "27 1 8:1 / / rw - ext4 /dev/sda1 rw\n";
+  for (int id = 100; id < 10100; ++id)
+    text += std::to_string(id) + " 27 7:" + std::to_string(id) + " / /Volumes/some/folder/v" + std::to_string(id) +
+            " rw,relatime - ext4 /dev/loop rw\n";
+  const auto began = std::chrono::steady_clock::now();
+  const MountTable table(text);
+  EXPECT_EQ(pointOf(table.holding("/Volumes/some/folder/v9000/a")), "/Volumes/some/folder/v9000");
+  EXPECT_LT(std::chrono::steady_clock::now() - began, std::chrono::seconds(3));
+}
+
+TEST(BlockDevices, TellsDisksAndPartitions) {
+  DiskTree tree;
+  tree.addDisk("sda", "8:0", 4096);
+  tree.addPartition("sda", 2, "8:2", 2048, 1000);
+  tree.write("/sys" + std::string(DiskTree::sata) + "/block/sda/queue/logical_block_size", "4096\n");
+  const SystemRoot root(tree.at("/"));
+  const BlockDevices devices(root);
+  EXPECT_THAT(devices.list(), ElementsAre(DiskName{"sda"}, DiskName{"sda2"}));
+  const auto partition = devices.find({"sda2"});
+  ASSERT_TRUE(partition);
+  EXPECT_EQ(partition->number, (DeviceNumber{8, 2}));
+  EXPECT_EQ(partition->path, std::string(DiskTree::sata) + "/block/sda/sda2");
+  EXPECT_EQ(partition->node, "/dev/sda2");
+  EXPECT_EQ(partition->disk.text, "sda");
+  EXPECT_EQ(partition->partition, 2);
+  EXPECT_EQ(partition->start, 2048U);
+  EXPECT_EQ(partition->size, 1000U);
+  EXPECT_EQ(devices.withNumber({8, 2})->name.text, "sda2");
+  EXPECT_EQ(devices.logicalBlockSize({"sda"}), 4096U);
+  for (const char* name : {"", ".", "..", "sdb", "sda/sda2", "../block/sda"})
+    EXPECT_FALSE(devices.find({name})) << name;
+  EXPECT_FALSE(devices.withNumber({8, 9}));
+}
+
+TEST(BlockDevices, FindsTheDiskBeneathAMapping) {
+  DiskTree tree;
+  for (const char* disk : {"sda", "sdb"}) tree.addDisk(disk, disk == std::string("sda") ? "8:0" : "8:16", 4096);
+  tree.addPartition("sdb", 1, "8:17", 2048, 1000);
+  tree.addDisk("md0", "9:0", 900, "/devices/virtual");
+  tree.addPartition("md0", 1, "259:0", 8, 800, "/devices/virtual");
+  tree.addDisk("dm-0", "253:0", 700, "/devices/virtual");
+  tree.link("/sys/devices/virtual/block/md0/slaves/sdb1", "../../..");
+  tree.link("/sys/devices/virtual/block/dm-0/slaves/md01", "../../..");
+  tree.link("/dev/mapper/system-root", "../dm-0");
+  tree.write("/dev/dm-0", "");
+  const SystemRoot root(tree.at("/"));
+  const BlockDevices devices(root);
+  for (const auto& [name, disk] : {std::pair("sda", "sda"), std::pair("sdb1", "sdb"), std::pair("md0", "sdb"),
+                                   std::pair("md01", "sdb"), std::pair("dm-0", "sdb"), std::pair("none", "none")})
+    EXPECT_EQ(devices.wholeDisk({name}).text, disk) << name;
+  EXPECT_EQ(devices.withNode("/dev/mapper/system-root")->name.text, "dm-0");
+  EXPECT_FALSE(devices.withNode("/dev/mapper/other"));
+}
+
+struct Connection {
+  const char* carrier;
+  const char* subsystemAt;
+  const char* subsystem;
+  const char* removableAt;
+  const char* removable;
+  const char* transport;
+  bool internal;
+};
+
+TEST(BlockDevices, TellsHowADiskIsConnected) {
+  constexpr const char* usb = "/devices/pci0000:00/0000:00:14.0/usb1/1-2/1-2:1.0/host4/target4:0:0/4:0:0:0";
+  constexpr const char* usbDevice = "/devices/pci0000:00/0000:00:14.0/usb1/1-2";
+  constexpr const char* nvme = "/devices/pci0000:00/0000:00:06.0/0000:06:00.0/nvme/nvme0";
+  const Connection connections[] = {
+      {DiskTree::sata, DiskTree::sata, "scsi", "", "", "SATA", true},
+      {usb, usbDevice, "usb", "", "", "USB", false},
+      {usb, usbDevice, "usb", usbDevice, "fixed", "USB", true},
+      {usb, usbDevice, "usb", usbDevice, "unknown", "USB", false},
+      {nvme, nvme, "nvme", "", "", "NVMe", true},
+      {nvme, nvme, "nvme", "/devices/pci0000:00/0000:00:06.0", "removable", "NVMe", false},
+      {"/devices/pci0000:00/0000:00:02.0/virtio1", "/devices/pci0000:00/0000:00:02.0/virtio1", "virtio", "", "",
+       "Virtio", true},
+      {"/devices/platform/host8/session1/target8:0:0/8:0:0:1", "", "", "", "", "iSCSI", false},
+      {"/devices/pci0000:00/0000:01:00.0/host0/port-0:0/end_device-0:0/target0:0:0/0:0:0:0", "", "", "", "", "SAS",
+       true},
+      {"/devices/pci0000:00/0000:01:00.0/host0/rport-0:0-1/target0:0:0/0:0:0:0", "", "", "", "", "Fibre Channel", true},
+      {"/devices/virtual", "", "", "", "", "", true},
+  };
+  for (const auto& connection : connections) {
+    DiskTree tree;
+    tree.addDisk("sdx", "8:32", 64, connection.carrier);
+    if (*connection.subsystem != 0) tree.setSubsystem(connection.subsystemAt, connection.subsystem);
+    if (*connection.removable != 0)
+      tree.write(std::string("/sys") + connection.removableAt + "/removable", connection.removable + std::string("\n"));
+    const SystemRoot root(tree.at("/"));
+    const BlockDevices devices(root);
+    EXPECT_EQ(devices.transportOf({"sdx"}), connection.transport) << connection.carrier;
+    EXPECT_EQ(devices.isInternal({"sdx"}), connection.internal) << connection.carrier << connection.removable;
+  }
+}
+
+TEST(BlockProbe, ReadsVolumesAndPartitionTables) {
+  DiskTree tree;
+  const auto volume = tree.addImage("volume", 4096);
+  const auto gpt = tree.addImage("gpt", 8192);
+  const auto mbr = tree.addImage("mbr", 8192);
+  tree.addImage("empty", 8);
+  if (!runTool("mkfs.vfat -n BACKUP -i 1A2B3C4D " + volume) ||
+      !runTool("sgdisk -n 1:2048:4095 -t 1:ef00 -c 1:Start -u 1:6C8F1B52-0E5A-4E0C-9B66-0123456789AB " + gpt))
+    GTEST_SKIP() << "mkfs.vfat or sgdisk is missing";
+  {
+    std::fstream file(mbr, std::ios::binary | std::ios::in | std::ios::out);
+    file.seekp(440).write("\x44\x33\x22\x11", 4);
+    file.seekp(446).write("\x80\0\0\0\xef\0\0\0\0\x08\0\0\0\x08\0\0", 16);
+    file.seekp(510).write("\x55\xaa", 2);
+  }
+  const SystemRoot root(tree.at("/"));
+  const auto facts = probeVolume(root, "/dev/volume");
+  ASSERT_TRUE(facts);
+  EXPECT_EQ(facts->type, "vfat");
+  EXPECT_EQ(facts->usage, "filesystem");
+  EXPECT_EQ(facts->label, "BACKUP");
+  EXPECT_EQ(facts->uuid, "1A2B-3C4D");
+  EXPECT_EQ(probeVolume(root, "/dev/empty")->type, std::nullopt);
+
+  const auto table = probePartitionTable(root, "/dev/gpt");
+  ASSERT_TRUE(table);
+  EXPECT_EQ(table->type, "gpt");
+  const auto* start = table->find(1);
+  ASSERT_NE(start, nullptr);
+  EXPECT_EQ(start->uuid, "6c8f1b52-0e5a-4e0c-9b66-0123456789ab");
+  EXPECT_EQ(start->type, efiSystemPartitionGuid);
+  EXPECT_EQ(start->start, 2048U);
+  EXPECT_EQ(start->size, 2048U);
+  EXPECT_EQ(start->name, "Start");
+  EXPECT_EQ(table->find(2), nullptr);
+
+  const auto old = probePartitionTable(root, "/dev/mbr");
+  ASSERT_TRUE(old);
+  EXPECT_EQ(old->type, "dos");
+  EXPECT_EQ(old->uuid, "11223344");
+  EXPECT_EQ(old->find(1)->uuid, "11223344-01");
+  EXPECT_EQ(old->find(1)->type, efiSystemPartitionByte);
+
+  EXPECT_EQ(probePartitionTable(root, "/dev/empty")->type, "");
+  EXPECT_THAT(probePartitionTable(root, "/dev/volume")->partitions, IsEmpty());
+  tree.write("/dev/folder/file", "");
+  for (const char* node : {"/dev/none", "/dev/folder"}) EXPECT_FALSE(probeVolume(root, node)) << node;
+}
+
+}  // namespace
+}  // namespace tavisk

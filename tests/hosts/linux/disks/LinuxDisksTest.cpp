@@ -1,0 +1,306 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <map>
+
+#include "LoopDevice.h"
+#include "OwnMounts.h"
+#include "hosts/linux/disks/DiskTree.h"
+#include "hosts/linux/disks/LinuxDiskQueries.h"
+#include "platform/DiskEventsContract.h"
+
+namespace tavisk {
+namespace {
+
+using testing::AllOf, testing::Each, testing::HasSubstr, testing::IsEmpty, testing::Not;
+
+/// Disks of this machine that are images, with mounts that nobody else sees.
+class RealDisks {
+ public:
+  template <typename Work>
+  static std::string run(const Work& work) {
+    if (::geteuid() != 0) return "only root makes loop devices";
+    if (!runTool("command -v mkfs.ext4 && command -v e2label")) return "mkfs.ext4 is missing";
+    if (LoopDevice::nextName().empty()) return "no loop devices here";
+    const bool allowed = withOwnMounts([&] {
+      RealDisks machine;
+      work(machine);
+    });
+    return allowed ? "" : "no mounts of one's own here";
+  }
+
+  RealDisks() = default;
+  ~RealDisks() {
+    for (const auto& [name, plugged] : _disks) ::umount2(pointOf({name}).c_str(), MNT_DETACH);
+  }
+  RealDisks(const RealDisks&) = delete;
+  RealDisks& operator=(const RealDisks&) = delete;
+
+  DiskEventSession& service() { return _host.diskEvents(); }
+  RunLoop& runLoop() { return _runLoop; }
+  DiskName plug(const std::string& label) {
+    const auto image = newImage();
+    EXPECT_TRUE(runTool("mkfs.ext4 -q -L " + label + " " + image));
+    waitUntilGone({LoopDevice::nextName()});
+    LoopDevice device(image);
+    DiskName disk{device.name()};
+    _disks.insert_or_assign(disk.text, Plugged{std::move(device), image});
+    return disk;
+  }
+  std::string mount(const DiskName& disk) {
+    auto point = pointOf(disk);
+    std::filesystem::create_directories(point);
+    EXPECT_EQ(::mount(("/dev/" + disk.text).c_str(), point.c_str(), "ext4", 0, nullptr), 0);
+    return point;
+  }
+  void unmount(const DiskName& disk) { EXPECT_EQ(::umount((_folder.path() / ("mounted " + disk.text)).c_str()), 0); }
+  void rename(const DiskName& disk, const std::string& label) {
+    EXPECT_TRUE(runTool("e2label /dev/" + disk.text + " " + label));
+    // As the device manager does for one who has written to a device.
+    std::ofstream("/sys/class/block/" + disk.text + "/uevent") << "change";
+  }
+  void grow(const DiskName& disk) {
+    const auto& plugged = _disks.at(disk.text);
+    std::filesystem::resize_file(plugged.image, 2 * imageSize);
+    EXPECT_TRUE(plugged.device.resize());
+  }
+  void pull(const DiskName& disk) { _disks.erase(disk.text); }
+
+ private:
+  static constexpr std::uintmax_t imageSize = 1U << 20U;
+  struct Plugged {
+    LoopDevice device;
+    std::string image;
+  };
+  std::string pointOf(const DiskName& disk) const { return _folder.path() / ("mounted " + disk.text); }
+  /// A device that was another image's a moment ago would not appear, but change.
+  void waitUntilGone(const DiskName& disk) {
+    const auto deadline = RunLoop::Clock::now() + std::chrono::seconds(2);
+    static_cast<void>(_runLoop.runUntil(deadline, [&] { return service().description(disk) == nullptr; }));
+  }
+  std::string newImage() {
+    const auto image = _folder.write("image" + std::to_string(++_last), "");
+    std::filesystem::resize_file(image, imageSize);
+    return image;
+  }
+
+  TemporaryFolder _folder;
+  std::map<std::string, Plugged> _disks;
+  int _last = 0;
+  EffectSink _effects;
+  RunLoop _runLoop;
+  LinuxHost _host{_effects, _runLoop};
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, DiskEventsContract, RealDisks);
+
+/// A server's disks in files: a SATA disk with partitions, a stick, a disc.
+class ServerDisks : public DiskTree {
+ public:
+  static constexpr const char* usb = "/devices/pci0000:00/0000:00:14.0/usb1/1-2/1-2:1.0/host4/target4:0:0/4:0:0:0";
+  static constexpr const char* drive = "/devices/pci0000:00/0000:00:1f.2/ata2/host1/target1:0:0/1:0:0:0";
+
+  ServerDisks() {
+    addDisk("sda", "8:0", 8192);
+    addPartition("sda", 1, "8:1", 2048, 2048);
+    addPartition("sda", 2, "8:2", 4096, 2048);
+    addDisk("sdb", "8:16", 64, usb);
+    setSubsystem("/devices/pci0000:00/0000:00:14.0/usb1/1-2", "usb");
+    addDisk("sr0", "11:0", 2048, drive);
+    addDisk("loop0", "7:0", 0, "/devices/virtual");
+    mount("8:2", "/dev/sda2", "/", "ext4");
+  }
+  void know(const std::string& number, const std::string& properties) {
+    write("/run/udev/data/b" + number, "S:disk/by-id/x\nI:123\n" + properties + "G:systemd\n");
+  }
+  std::shared_ptr<const DiskDescription> describe(const std::string& disk) {
+    return host().diskEvents().description({disk});
+  }
+  /// As LinuxHost has them; they read the same tree.
+  LinuxDisks& disks() {
+    queries();
+    return *_disks;
+  }
+  LinuxDiskQueries& queries() {
+    if (!_queries)
+      _queries.emplace(_disks.emplace(_machine.emplace(LinuxMachine{*_root, effects, runLoop, *_services})));
+    return *_queries;
+  }
+
+ private:
+  std::optional<SystemRoot> _root{at("/")};
+  std::optional<ServiceAccess> _services{std::in_place, *_root, runLoop};
+  std::optional<LinuxMachine> _machine;
+  std::optional<LinuxDisks> _disks;
+  std::optional<LinuxDiskQueries> _queries;
+};
+
+TEST(LinuxDisks, DescribesWhatTheDeviceManagerKnows) {
+  ServerDisks tree;
+  tree.know("8:2",
+            "E:ID_FS_TYPE=ext4\nE:ID_FS_USAGE=filesystem\nE:ID_FS_LABEL=Server_Root\n"
+            "E:ID_FS_LABEL_ENC=Server\\x20Root\nE:ID_FS_UUID_ENC=0f1e\nE:ID_PART_ENTRY_TYPE=0fc63daf\n"
+            "E:ID_PATH=pci-0000:00:1f.2-ata-1\n");
+  const auto root = tree.describe("sda2");
+  ASSERT_TRUE(root);
+  EXPECT_EQ(root->mediaName, "sda2");
+  EXPECT_EQ(root->volumeName, "Server Root");
+  EXPECT_EQ(root->volumePath, "/");
+  EXPECT_EQ(root->volumeKind, "ext4");
+  EXPECT_EQ(root->volumeUuid, "0f1e");
+  EXPECT_EQ(root->mediaContent, "0fc63daf");
+  EXPECT_EQ(root->devicePath, std::string(DiskTree::sata) + "/block/sda/sda2");
+  EXPECT_EQ(root->busPath, "pci-0000:00:1f.2-ata-1");
+  EXPECT_EQ(root->mediaSize, 2048 * 512);
+  EXPECT_TRUE(root->mediaWritable);
+  EXPECT_TRUE(root->volumeMountable);
+  EXPECT_FALSE(root->volumeNetwork);
+  EXPECT_EQ(tree.describe("loop0"), nullptr);
+  EXPECT_EQ(tree.host().diskEvents().wholeDisk({"sda2"}).text, "sda");
+}
+
+TEST(LinuxDisks, ReadsTheDiskWhereNoDeviceManagerRuns) {
+  ServerDisks tree;
+  const auto disk = tree.addImage("sda", 8192);
+  const auto volume = tree.addImage("sda1", 2048);
+  if (!runTool("mkfs.vfat -n BACKUP -i 1A2B3C4D " + volume) || !runTool("sgdisk -n 1:2048:4095 -t 1:ef00 " + disk))
+    GTEST_SKIP() << "mkfs.vfat or sgdisk is missing";
+  const auto start = tree.describe("sda1");
+  ASSERT_TRUE(start);
+  EXPECT_EQ(start->volumeName, "BACKUP");
+  EXPECT_EQ(start->volumeKind, "msdos");
+  EXPECT_EQ(start->volumeUuid, "1A2B-3C4D");
+  EXPECT_EQ(start->mediaContent, efiSystemPartitionGuid);
+  EXPECT_EQ(start->volumePath, std::nullopt);
+  EXPECT_TRUE(start->volumeMountable);
+  EXPECT_EQ(tree.describe("sda")->mediaContent, "gpt");
+  EXPECT_FALSE(tree.describe("sda")->volumeMountable);
+  EXPECT_EQ(tree.queries().partitionScheme({"sda1"}), 2);
+
+  // Mounted and not to be read: what the mount table says is left, and the failure is told.
+  EXPECT_EQ(tree.describe("sda2")->volumeKind, "ext4");
+  EXPECT_THAT(tree.log.lines, AllOf(Not(IsEmpty()), Each(HasSubstr("/dev/sda2"))));
+}
+
+TEST(LinuxDisks, FindsTheDiskOfAnyPath) {
+  ServerDisks tree;
+  tree.mount("0:40", "/dev/sda1", "/data", "btrfs");
+  tree.mount("0:41", "server:/export", "/net", "nfs4");
+  tree.mount("0:42", "overlay", "/over", "overlay");
+  tree.mount("0:43", "tmpfs", "/tmp", "tmpfs");
+  tree.setMounts(tree.file("/proc/thread-self/mountinfo") +
+                 "40 1 0:44 / /upper rw - overlay overlay rw,lowerdir=/net:/,upperdir=/data/up,workdir=/data/w\n"
+                 "41 1 0:45 / /loop rw - overlay overlay ro,lowerdir=/loop\n");
+  for (const char* folder : {"/upper", "/loop", "/data/up"}) tree.write(folder + std::string("/file"), "");
+  auto& session = tree.host().diskEvents();
+  const std::pair<const char*, std::optional<DiskName>> expected[] = {{"/", DiskName{"sda2"}},
+                                                                      {"/data/up/file", DiskName{"sda1"}},
+                                                                      {"/net", DiskName{"server:/export"}},
+                                                                      {"/upper/file", DiskName{"sda1"}},
+                                                                      {"/loop/file", std::nullopt},
+                                                                      {"/over", std::nullopt},
+                                                                      {"/tmp", std::nullopt}};
+  for (const auto& [path, disk] : expected) EXPECT_EQ(session.diskOfPath(path), disk) << path;
+  EXPECT_EQ(tree.describe("sda1")->volumePath, "/data");
+  const auto network = tree.describe("server:/export");
+  ASSERT_TRUE(network);
+  EXPECT_TRUE(network->volumeNetwork);
+  EXPECT_EQ(network->volumePath, "/net");
+}
+
+TEST(LinuxDisks, NoticesAtAMountWhatCameWithoutAnEvent) {
+  ServerDisks tree;
+  auto& disks = tree.disks();
+  tree.know("8:1", "E:ID_FS_TYPE=vfat\n");
+  ASSERT_TRUE(disks.find({"sda1"}));
+  EXPECT_EQ(disks.find({"sda1"})->volumeKind, "msdos");
+  EXPECT_FALSE(disks.find({"sdc"}));
+  tree.know("8:1", "E:ID_FS_TYPE=ntfs\n");
+  tree.addDisk("sdc", "8:32", 64);
+  tree.mount("8:1", "/dev/sda1", "/first", "ntfs3");
+  tree.mount("8:32", "/dev/sdc", "/second", "ext4");
+  disks.renew({});
+  EXPECT_EQ(disks.find({"sda1"})->volumeKind, "ntfs");
+  EXPECT_EQ(disks.find({"sda1"})->volumePath, "/first");
+  ASSERT_TRUE(disks.find({"sdc"}));
+  EXPECT_EQ(disks.find({"sdc"})->volumePath, "/second");
+}
+
+TEST(LinuxDisks, TellsKindsOfDisksApart) {
+  ServerDisks tree;
+  tree.know("8:16", "E:ID_PART_TABLE_TYPE=mac\n");
+  tree.know("8:0", "E:ID_PART_TABLE_TYPE=dos\n");
+  tree.know("11:0",
+            "E:ID_CDROM=1\nE:ID_CDROM_DVD=1\nE:ID_CDROM_MEDIA=1\nE:ID_CDROM_MEDIA_DVD_PLUS_R=1\nE:ID_FS_TYPE=iso9660\n"
+            "E:ID_FS_USAGE=filesystem\nE:ID_FS_BOOT_SYSTEM_ID=EL\\x20TORITO\\x20SPECIFICATION\n");
+  auto& queries = tree.queries();
+  struct Expected {
+    const char* disk;
+    bool internal;
+    bool dvd;
+    bool optical;
+    const char* protocol;
+    int scheme;
+  };
+  for (const auto& [disk, internal, dvd, optical, protocol, scheme] :
+       {Expected{"sda2", true, false, false, "SATA", 3}, Expected{"sdb", false, false, false, "USB", 1},
+        Expected{"sr0", true, true, true, "SATA", 0}, Expected{"loop0", false, false, false, "Disk Image", 0},
+        Expected{"none", false, false, false, "", 0}}) {
+    EXPECT_EQ(queries.is(DiskTrait::internal, {disk}), internal) << disk;
+    EXPECT_EQ(queries.is(DiskTrait::dvd, {disk}), dvd) << disk;
+    EXPECT_EQ(queries.is(DiskTrait::optical, {disk}), optical) << disk;
+    EXPECT_FALSE(queries.is(DiskTrait::cd, {disk})) << disk;
+    EXPECT_EQ(queries.protocolOf({disk}), protocol) << disk;
+    EXPECT_EQ(queries.partitionScheme({disk}), scheme) << disk;
+    EXPECT_EQ(queries.opticalBootability({disk}).status == 0, optical) << disk;
+  }
+  EXPECT_TRUE(queries.opticalBootability({"sr0"}).bootable);
+  EXPECT_EQ(tree.describe("sr0")->volumeKind, "cd9660");
+
+  ServerDisks empty;
+  empty.know("11:0", "E:ID_CDROM=1\n");
+  EXPECT_EQ(empty.describe("sr0"), nullptr);
+  EXPECT_TRUE(empty.queries().is(DiskTrait::optical, {"sr0"}));
+}
+
+TEST(LinuxDisks, TellsPartitionsAndImagesOfThisMachine) {
+  if (!runTool("command -v sgdisk && command -v partx")) GTEST_SKIP() << "sgdisk is missing";
+  std::string why = RealDisks::run([](RealDisks& machine) {
+    TemporaryFolder folder;
+    const auto image = folder.write("image", "");
+    std::filesystem::resize_file(image, 8U << 20U);
+    ASSERT_TRUE(runTool("sgdisk -n 1:2048:8191 -t 1:ef00 " + image.string()));
+    const LoopDevice disk(image);
+    ASSERT_TRUE(disk);
+    DiskListener listener(machine.service(), machine.runLoop());
+    machine.service().schedule(machine.runLoop());
+    listener.listen();
+    machine.runLoop().runPass();
+    if (!std::filesystem::exists("/sys/class/block/" + disk.name() + "p1")) {
+      ASSERT_TRUE(runTool("partx -a " + disk.node()));
+      EXPECT_TRUE(listener.hears("appeared " + disk.name() + "p1 "));
+    }
+    const auto partition = machine.service().description({disk.name() + "p1"});
+    ASSERT_TRUE(partition);
+    EXPECT_EQ(partition->mediaContent, efiSystemPartitionGuid);
+    EXPECT_EQ(partition->mediaSize, 6144 * 512);
+    EXPECT_EQ(machine.service().wholeDisk({disk.name() + "p1"}).text, disk.name());
+    machine.service().unschedule();
+    ASSERT_TRUE(runTool("partx -d " + disk.node()));
+  });
+  if (!why.empty()) GTEST_SKIP() << why;
+}
+
+TEST(DeviceEvents, NameTheBlockDevice) {
+  using namespace std::string_view_literals;
+  const std::pair<std::string_view, std::optional<std::string>> events[] = {
+      {"add@/devices/x/block/sdb\0ACTION=add\0DEVPATH=/devices/x/block/sdb\0SUBSYSTEM=block\0MAJOR=8\0"sv, "sdb"},
+      {"libudev\0\xfe\xed\xca\xfe\x28\0\0\0(\0\0\0SUBSYSTEM=block\0DEVNAME=/dev/sda1\0DEVPATH=/devices/x/block/sda/sda1"sv,
+       "sda1"},
+      {"change@/devices/x/net/eth0\0SUBSYSTEM=net\0DEVPATH=/devices/x/net/eth0\0"sv, std::nullopt},
+      {"SUBSYSTEM=block\0DEVPATH=/"sv, std::nullopt},
+      {"\0\0\0"sv, std::nullopt},
+      {""sv, std::nullopt}};
+  for (const auto& [event, device] : events) EXPECT_EQ(blockDeviceIn(event), device) << event;
+}
+
+}  // namespace
+}  // namespace tavisk

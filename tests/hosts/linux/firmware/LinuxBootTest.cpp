@@ -1,0 +1,257 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <sys/ptrace.h>
+#include <sys/syscall.h>
+#include <sys/wait.h>
+
+#include <array>
+
+#include "hosts/linux/firmware/BootTree.h"
+#include "hosts/linux/firmware/LinuxBootSettings.h"
+
+namespace tavisk {
+namespace {
+
+using testing::AllOf, testing::HasSubstr;
+
+constexpr const char* system = "/System/Library/CoreServices";
+constexpr const char* mainUuid = "0f1e2d3c-4b5a-6978-8796-a5b4c3d2e1f0";
+constexpr const char* backupPath = R"(HD(1,MBR,11223344-01,0x800,0x800)/File(\System\Library\CoreServices\boot.efi))";
+
+void writeMbr(const std::filesystem::path& image) {
+  std::fstream file(image, std::ios::binary | std::ios::in | std::ios::out);
+  file.seekp(440).write("\x44\x33\x22\x11", 4);
+  file.seekp(446).write("\x80\0\0\0\x0c\0\0\0\0\x08\0\0\0\x08\0\0", 16);
+  file.seekp(510).write("\x55\xaa", 2);
+}
+
+/// Main (ext4, sda2) with its EFI system partition (sda1), and Backup (FAT, sdb1 of an MBR disk).
+class LinuxBootTest : public testing::Test {
+ protected:
+  void SetUp() override {
+    if (::geteuid() != 0) GTEST_SKIP() << "only root changes what starts";
+    addMain();
+    addBackup();
+    if (!_hasTools) GTEST_SKIP() << "sgdisk, mkfs.vfat or mkfs.ext4 is missing";
+    tree.setEntry(0, {fileNode(R"(\EFI\debian\shimx64.efi)")});
+    tree.setOrder({0});
+  }
+
+  LinuxBootSettings settings() { return LinuxBootSettings(_machine); }
+  ServiceStatus set(const std::string& disk, const std::string& volume) {
+    return settings().setBootPreference({{disk}, volume + system, false});
+  }
+  std::string preferredDisk() {
+    const auto preference = settings().bootPreference();
+    EXPECT_EQ(preference.status == 0, preference.disk.has_value());
+    return preference.disk ? preference.disk->text : "";
+  }
+  void expectRefused(const std::string& disk, const std::string& volume, const std::string& why) {
+    const auto before = tree.allVariables();
+    EXPECT_NE(set(disk, volume), 0) << why;
+    EXPECT_THAT(tree.lastTold(), HasSubstr(why));
+    EXPECT_EQ(tree.allVariables(), before) << why;
+    EXPECT_FALSE(tree.has(LinuxBootSettings::previousOrder)) << why;
+  }
+
+  BootTree tree;
+  const std::string backupFile = "/Volumes/Backup" + std::string(system) + "/boot.efi";
+
+ private:
+  void addMain() {
+    tree.addDisk("sda", "8:0", 65536);
+    tree.addPartition("sda", 1, "8:1", 2048, 2048);
+    tree.addPartition("sda", 2, "8:2", 4096, 8192);
+    _hasTools &= runTool("sgdisk -n 1:2048:4095 -t 1:ef00 -u 1:6C8F1B52-0E5A-4E0C-9B66-0123456789AB -n 2:4096:12287 " +
+                         tree.addImage("sda", 65536));
+    _hasTools &= runTool("mkfs.vfat " + tree.addImage("sda1", 2048));
+    _hasTools &= runTool("mkfs.ext4 -L Main -U " + std::string(mainUuid) + " " + tree.addImage("sda2", 8192));
+    tree.mount("8:2", "/dev/sda2", "/", "ext4");
+    tree.mount("8:1", "/dev/sda1", "/boot/efi", "vfat");
+  }
+  void addBackup() {
+    tree.addDisk("sdb", "8:16", 8192, usb);
+    tree.addPartition("sdb", 1, "8:17", 2048, 2048, usb);
+    writeMbr(tree.addImage("sdb", 8192));
+    _hasTools &= runTool("mkfs.vfat -n BACKUP " + tree.addImage("sdb1", 2048));
+    tree.mount("8:17", "/dev/sdb1", "/Volumes/Backup", "vfat");
+    tree.write(backupFile, firmwareProgram());
+  }
+
+  static constexpr const char* usb = "/devices/pci0000:00/0000:00:14.0/usb1/1-2/1-2:1.0/host4/target4:0:0/4:0:0:0";
+  bool _hasTools = true;
+  SystemRoot _root{tree.at("/")};
+  ServiceAccess _services{_root, tree.runLoop};
+  LinuxMachine _machine{_root, tree.effects, tree.runLoop, _services};
+};
+
+TEST_F(LinuxBootTest, StartsTheVolumesOwnFile) {
+  EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"applied")"), HasSubstr("HD(1,MBR,11223344-01")));
+  const SystemRoot root(tree.at("/"));
+  const EfiVariables variables(root);
+  const auto first = BootEntries(variables).first().valueOr(std::nullopt);
+  ASSERT_TRUE(first);
+  EXPECT_EQ(targetText(first->option), backupPath);
+  EXPECT_EQ(first->option.description, "tavisk BACKUP");
+  EXPECT_EQ(tree.file(LinuxBootSettings::previousOrder), "0000\n");
+  EXPECT_EQ(preferredDisk(), "sdb1");
+
+  const auto before = tree.allVariables();
+  EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"unchanged")"));
+  EXPECT_EQ(tree.allVariables(), before);
+}
+
+TEST_F(LinuxBootTest, StartsAVolumeThatFirmwareCannotReadFromItsFileBeside) {
+  const auto file = "/boot/efi/EFI/tavisk/" + std::string(mainUuid) + "/boot.efi";
+  tree.write(std::string(system) + "/boot.efi", firmwareProgram());
+  expectRefused("sda2", "", "there is no such file");
+  tree.write(file, firmwareProgram());
+  const auto mounts = tree.file("/proc/thread-self/mountinfo");
+  tree.setMounts(std::string(mounts).replace(mounts.find("vfat"), 4, "ext4"));
+  expectRefused("sda2", "", "it holds ext4");
+  tree.setMounts(mounts);
+  EXPECT_EQ(set("sda2", ""), 0) << tree.lastTold();
+  EXPECT_THAT(tree.lastTold(), HasSubstr("HD(1,GPT,6c8f1b52-0e5a-4e0c-9b66-0123456789ab,0x800,0x800)/File("));
+  EXPECT_EQ(preferredDisk(), "sda2") << "the volume it was made for, not the partition that has the file";
+  tree.link("/dev/disk/by-uuid/" + std::string(mainUuid), "../../sdb1");
+  EXPECT_EQ(preferredDisk(), "sda2") << "not a copy of it on another disk";
+}
+
+TEST_F(LinuxBootTest, RefusesWhatFirmwareWouldNotStart) {
+  expectRefused("sdz", "", "no such disk");
+  expectRefused("sdb1", "/Volumes/Other", "/Volumes/Other");
+  tree.write(std::string(system) + "/boot.efi", firmwareProgram());
+  expectRefused("sdb1", "", "it is not on sdb1");
+  expectRefused("sda2", "", "does not read ext4");
+  tree.write(BootTree::pathOf("SecureBoot"), "odd");
+  expectRefused("sdb1", "/Volumes/Backup", "too short for a variable");
+  tree.setVariable("SecureBoot", "\1");
+  expectRefused("sdb1", "/Volumes/Backup", "Secure Boot is on");
+  tree.write(backupFile, "#!/bin/sh\n");
+  expectRefused("sdb1", "/Volumes/Backup", "not a program");
+  std::filesystem::remove(tree.at(backupFile));
+  expectRefused("sdb1", "/Volumes/Backup", "No such file");
+  tree.write(backupFile, firmwareProgram(true, 10, 16, 0x400));
+  std::filesystem::copy_file(tree.at("/dev/sdb"), tree.at("/dev/sdc"));
+  tree.addDisk("sdc", "8:32", 8192);
+  tree.addPartition("sdc", 1, "8:33", 2048, 2048);
+  expectRefused("sdb1", "/Volumes/Backup", "the same identity 11223344-01");
+  tree.removeDevice("sdc", "8:32");
+  EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0) << "signed, and the only one";
+}
+
+TEST_F(LinuxBootTest, TellsWhatWillStart) {
+  EXPECT_EQ(preferredDisk(), "");
+  EXPECT_THAT(tree.lastTold(), HasSubstr("Boot0000 (other)"));
+  const EfiDevicePath main{*partitionNode({"6c8f1b52-0e5a-4e0c-9b66-0123456789ab", 9, 1, 1}), fileNode("a")};
+  tree.setEntry(4, main);
+  tree.setOrder({4, 0});
+  EXPECT_EQ(preferredDisk(), "sda1") << "a partition is known by its identity alone";
+  tree.setEntry(5, {*partitionNode({"ffffffff-0e5a-4e0c-9b66-0123456789ab", 1, 1, 1})});
+  tree.setVariable("BootNext", std::string("\5\0", 2));
+  EXPECT_EQ(preferredDisk(), "") << "gone with its disk";
+  EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
+  EXPECT_THAT(tree.lastTold(), HasSubstr("the next start alone is from Boot0005"));
+}
+
+TEST_F(LinuxBootTest, KnowsTheStartOverANetwork) {
+  EXPECT_FALSE(settings().networkBootPreference().interface);
+  const EfiPathNode hardwareAddress{3, 11, fromHex("525400123456" + std::string(52, '0') + "01")};
+  tree.setEntry(1, {hardwareAddress, {3, 12, fromHex("00000000c0a80001" + std::string(30, '0'))}});
+  tree.setOrder({1, 0});
+  EXPECT_NE(settings().networkBootPreference().status, 0) << "no such interface here";
+  tree.write("/sys/class/net/lo/address", "00:00:00:00:00:00\n");
+  tree.write("/sys/class/net/eth0/address", "52:54:00:12:34:56\n");
+  const auto network = settings().networkBootPreference();
+  EXPECT_EQ(network.status, 0);
+  EXPECT_EQ(network.interface, "eth0");
+  EXPECT_EQ(network.server, "192.168.0.1");
+  const auto disk = settings().bootPreference();
+  EXPECT_EQ(disk.status, 0);
+  EXPECT_FALSE(disk.disk);
+}
+
+TEST_F(LinuxBootTest, KnowsTheFirmware) {
+  EXPECT_EQ(settings().preBootEnvironment(), 2);
+  EXPECT_FALSE(settings().legacyBootSupport().supported);
+  tree.setEntry(8, {{5, 1,
+                     fromHex("02000000"
+                             "48440000")}});
+  EXPECT_TRUE(settings().legacyBootSupport().supported);
+  EXPECT_EQ(settings().setFirmwareVariable("prev-lang:kbd", "en_GB:2"), 0);
+  EXPECT_EQ(tree.file(EfiVariables::pathOf({"prev-lang:kbd", efiOwnVendor})), std::string("\7\0\0\0en_GB:2", 11));
+  EXPECT_NE(settings().setFirmwareVariable("SecureBoot", "0"), 0);
+
+  std::filesystem::remove_all(tree.at("/sys/firmware/efi"));
+  EXPECT_EQ(settings().preBootEnvironment(), 0);
+  EXPECT_TRUE(settings().legacyBootSupport().supported);
+  EXPECT_NE(set("sdb1", "/Volumes/Backup"), 0);
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr("not supported"), HasSubstr("not started by UEFI")));
+  EXPECT_EQ(settings().networkBootPreference().status, 0);
+  tree.write("/sys/firmware/devicetree/base/ibm,opal", "");
+  EXPECT_EQ(settings().preBootEnvironment(), 1);
+}
+
+/// Whether the call that the process is about to make may change a file.
+bool mayChangeFiles(pid_t process) {
+  __ptrace_syscall_info call{};
+  ::ptrace(PTRACE_GET_SYSCALL_INFO, process, sizeof call, &call);
+  if (call.op != PTRACE_SYSCALL_INFO_ENTRY) return false;
+  if (call.entry.nr == SYS_openat2) return (::ptrace(PTRACE_PEEKDATA, process, call.entry.args[2], 0) & O_ACCMODE) != 0;
+  constexpr std::array<std::uint64_t, 8> changing{SYS_write,     SYS_unlinkat, SYS_renameat, SYS_renameat2,
+                                                  SYS_ftruncate, SYS_mkdirat,  SYS_fsync,    SYS_ioctl};
+  return std::ranges::find(changing, call.entry.nr) != changing.end();
+}
+
+/// Runs the work in a process of its own and kills it before its call of that number that may change a file. False when
+/// it ended before.
+bool killedAt(int number, const std::function<void()>& work) {
+  const auto child = ::fork();
+  if (child == 0) {
+    ::ptrace(PTRACE_TRACEME, 0, nullptr, nullptr);
+    ::raise(SIGSTOP);
+    work();
+    ::_exit(0);
+  }
+  int status = 0;
+  ::waitpid(child, &status, 0);
+  ::ptrace(PTRACE_SETOPTIONS, child, nullptr, PTRACE_O_TRACESYSGOOD | PTRACE_O_EXITKILL);
+  while (WIFSTOPPED(status) && (!mayChangeFiles(child) || --number >= 0)) {
+    ::ptrace(PTRACE_SYSCALL, child, nullptr, nullptr);
+    ::waitpid(child, &status, 0);
+  }
+  if (!WIFSTOPPED(status)) return false;
+  ::kill(child, SIGKILL);
+  ::waitpid(child, &status, 0);
+  return true;
+}
+
+TEST_F(LinuxBootTest, HasTheOldOrderOrTheNewOneWheneverItIsKilled) {
+  const auto before = tree.allVariables();
+  const auto order = std::string("BootOrder-") + efiGlobalVendor;
+  const std::string newOrder("\7\0\0\0\1\0\0\0", 8);
+  const auto doSet = [&] { set("sdb1", "/Volumes/Backup"); };
+  int call = 0;
+  for (bool killed = true; killed; ++call) {
+    killed = killedAt(call, doSet);
+    auto after = tree.allVariables();
+    EXPECT_TRUE(after[order] == before.at(order) || after[order] == newOrder) << "call " << call;
+    EXPECT_LE(after.size(), before.size() + 1) << "call " << call;
+    for (const auto& [name, contents] : before) EXPECT_TRUE(name == order || after[name] == contents) << name;
+    doSet();
+    after = tree.allVariables();
+    EXPECT_EQ(after[order], newOrder) << "what was left is used again, after call " << call;
+    EXPECT_EQ(after.size(), before.size() + 1) << "call " << call;
+    std::filesystem::remove(tree.at(BootTree::pathOf("Boot0001")));
+    std::filesystem::remove_all(tree.at("/var"));
+    tree.setOrder({0});
+  }
+  EXPECT_GT(call, 8) << "the work was not traced";
+}
+
+}  // namespace
+}  // namespace tavisk

@@ -1,0 +1,119 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <cerrno>
+
+#include "hosts/linux/LinuxTree.h"
+#include "hosts/linux/machine/KeyboardLock.h"
+
+namespace tavisk {
+namespace {
+
+using testing::AllOf, testing::ElementsAre, testing::HasSubstr;
+
+constexpr std::uint8_t lock = 0x02;
+
+/// A controller that tells of the front panel: with these capabilities, in this state.
+struct Panel final : ControllerLink {
+  int open() override { return error; }
+  int exchange(const ControllerRequest& request, std::vector<std::uint8_t>& reply) override {
+    reply = {0};
+    if (request.command == 0)
+      reply.insert(reply.end(), {capabilities, 0x20, 0x20, 0x20, 0x20});
+    else
+      reply.insert(reply.end(), {0x61, 0, state});
+    return error;
+  }
+
+  int error = 0;
+  std::uint8_t capabilities = lock;
+  std::uint8_t state = 0;
+};
+
+constexpr const char* allKeys = "402000000 3803078f800d001 feffffdfffefffff fffffffffffffffe\n";
+
+/// A machine with two keyboards, one of a controller, and buttons.
+class PanelTree : public LinuxTree {
+ public:
+  PanelTree() {
+    device("input1", "AT Translated Set 2 keyboard", allKeys);
+    device("input2", "USB Keyboard", "fffffffe");
+    device("input3", "Virtual Keyboard and Mouse", allKeys);
+    device("input4", "Gadget USB", allKeys);
+    write("/sys/class/input/input4/id/vendor", "0557\n");
+    write("/sys/class/input/input4/id/product", "2419\n");
+    device("input5", "Power Button", "10000000000000 0\n");
+    device("event1", "AT Translated Set 2 keyboard", allKeys);
+  }
+  void device(const std::string& name, const char* title, const char* keys) {
+    write("/sys/class/input/" + name + "/name", std::string(title) + "\n");
+    write("/sys/class/input/" + name + "/capabilities/key", keys);
+    write("/sys/class/input/" + name + "/inhibited", "0\n");
+  }
+  std::string inhibited(const std::string& name) const {
+    return file("/sys/class/input/" + name + "/inhibited").substr(0, 1);
+  }
+  void setDisablesKeyboard(bool disables) {
+    const SystemRoot root(at("/"));
+    ServiceAccess services(root, runLoop);
+    ManagementController controller(panel);
+    EnclosureLock({root, effects, runLoop, services}, controller).setDisablesKeyboard(disables);
+  }
+
+  Panel panel;
+};
+
+TEST(Keyboards, AreThoseAtTheMachine) {
+  PanelTree tree;
+  EXPECT_THAT(keyboards(SystemRoot(tree.at("/"))), ElementsAre("/sys/class/input/input1", "/sys/class/input/input2"));
+}
+
+TEST(EnclosureLock, DisablesKeyboardsWhileItIsEngaged) {
+  struct Case {
+    std::uint8_t state;
+    bool disables;
+    const char* before;
+    const char* after;
+    const char* outcome;
+  };
+  constexpr std::uint8_t others = 0x0D;
+  const Case cases[] = {
+      {lock, true, "0", "1", "applied"},           {lock | others, true, "1", "1", "unchanged"},
+      {others, true, "0", "0", "unchanged"},       {others, true, "1", "0", "applied"},
+      {lock | others, false, "1", "0", "applied"}, {0, false, "0", "0", "unchanged"},
+  };
+  for (const auto& test : cases) {
+    PanelTree tree;
+    tree.panel.state = test.state;
+    for (const char* name : {"input1", "input2"})
+      tree.write(std::string("/sys/class/input/") + name + "/inhibited", test.before);
+    tree.setDisablesKeyboard(test.disables);
+    EXPECT_THAT(tree.lastTold(), HasSubstr("\"outcome\":\"" + std::string(test.outcome)));
+    for (const char* name : {"input1", "input2"}) EXPECT_EQ(tree.inhibited(name), test.after);
+    for (const char* name : {"input3", "input4", "input5"}) EXPECT_EQ(tree.inhibited(name), "0") << name;
+  }
+}
+
+TEST(EnclosureLock, SaysWhatIsMissing) {
+  PanelTree without;
+  without.panel.capabilities = 0xFF & ~lock;
+  without.panel.state = lock;
+  without.setDisablesKeyboard(true);
+  EXPECT_THAT(without.lastTold(), AllOf(HasSubstr("not supported"), HasSubstr("the preference is kept")));
+  EXPECT_EQ(without.inhibited("input1"), "0");
+
+  PanelTree none;
+  none.panel.error = ENODEV;
+  none.setDisablesKeyboard(true);
+  EXPECT_THAT(none.lastTold(), HasSubstr("not supported"));
+
+  PanelTree old;
+  old.panel.state = lock;
+  std::filesystem::remove(old.at("/sys/class/input/input2/inhibited"));
+  old.setDisablesKeyboard(true);
+  EXPECT_THAT(old.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("input2/inhibited")));
+}
+
+}  // namespace
+}  // namespace tavisk

@@ -1,0 +1,94 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include "hosts/linux/FakeServiceManager.h"
+#include "hosts/linux/LinuxContractMachines.h"
+
+namespace tavisk {
+namespace {
+
+using testing::AllOf, testing::ElementsAre, testing::HasSubstr;
+using Fault = FakeServiceManager::Fault;
+
+/// A machine whose message bus is down, with a service manager and chrony.
+class ManagedTree : public LinuxTree {
+ public:
+  ManagedTree() : manager((write("/run/systemd/system/x", ""), at("/run/systemd/private"))) { haveChrony(*this); }
+
+  FakeServiceManager manager;
+};
+
+INSTANTIATE_TYPED_TEST_SUITE_P(LinuxWithUnits, NetworkTimeContract, NetworkTimeOf<ManagedTree>);
+
+TEST(UnitDaemons, EnablesAndReloadsBeforeItStarts) {
+  ManagedTree tree;
+  auto& client = tree.host().networkTime();
+  client.setLaunchAtStartup(true);
+  client.start();
+  client.stop();
+  EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles chrony.service", "Reload", "StartUnit chrony.service",
+                                                "StopUnit chrony.service"));
+}
+
+TEST(UnitDaemons, PrefersTheFirstLoadedAndNeverUnmasks) {
+  ManagedTree tree;
+  auto& client = tree.host().networkTime();
+  tree.manager.set("ntpsec.service", {.active = "activating"});
+  EXPECT_FALSE(client.isRunning()) << "chrony comes first";
+  tree.manager.set(chrony, {.load = "masked"});
+  EXPECT_TRUE(client.isRunning());
+  tree.manager.set("ntpsec.service", {.load = "not-found"});
+  EXPECT_FALSE(client.isRunning());
+  tree.manager.breakNext("EnableUnitFiles", Fault::error);
+  client.setLaunchAtStartup(true);
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("chrony.service")));
+}
+
+TEST(UnitDaemons, RestartsOtherClientsWithoutWaiting) {
+  ManagedTree tree;
+  tree.manager.set(chrony, {.load = "not-found"});
+  tree.manager.set("systemd-timesyncd.service", {.active = "active", .jobResult = ""});
+  tree.host().networkTime().restartAsynchronously();
+  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"applied")"));
+  EXPECT_THAT(tree.manager.calls(), ElementsAre("TryRestartUnit systemd-timesyncd.service"));
+}
+
+TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
+  const std::tuple<FakeUnit, std::optional<Fault>, const char*> cases[] = {
+      {{.jobResult = "failed"}, std::nullopt, "its job ended with: failed"},
+      {{.jobResult = ""}, std::nullopt, "its job has not ended in time"},
+      {{.conditionHolds = false}, std::nullopt, "the condition ConditionVirtualization=!container does not hold"},
+      {{}, Fault::error, "org.freedesktop.DBus.Error.AccessDenied: not today"},
+      {{}, Fault::wrongType, "the reply has other types than expected"},
+      {{}, Fault::hangUp, "Connection"},
+  };
+  for (const auto& [unit, fault, why] : cases) {
+    ManagedTree tree;
+    tree.manager.set(chrony, unit);
+    if (fault) tree.manager.breakNext("StartUnit", *fault);
+    tree.host().networkTime().start();
+    EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("StartUnit"), HasSubstr(why)));
+    EXPECT_FALSE(tree.host().networkTime().isRunning()) << "asked again, after a hang-up too";
+  }
+}
+
+TEST(UnitDaemons, WaitOnceForAManagerThatIsSilent) {
+  ManagedTree tree;
+  const auto began = RunLoop::Clock::now();
+  tree.manager.breakNext("LoadUnit", Fault::silence);
+  tree.host().networkTime().start();
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("answer")));
+  EXPECT_LT(RunLoop::Clock::now() - began, Bus::usualTime + std::chrono::milliseconds(500));
+}
+
+TEST(UnitDaemons, DoNotLookElsewhereWhenTheManagerCannotBeReached) {
+  LinuxTree tree;
+  tree.write("/run/systemd/system/x", "");
+  tree.writeProgram("/etc/init.d/chrony", "#!/bin/sh\n");
+  EXPECT_FALSE(tree.host().networkTime().isRunning());
+  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("/run/dbus/system_bus_socket")));
+}
+
+}  // namespace
+}  // namespace tavisk

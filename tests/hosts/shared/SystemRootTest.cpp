@@ -1,0 +1,180 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <sys/syscall.h>
+#include <unistd.h>
+
+#include <atomic>
+
+#include "OwnMounts.h"
+#include "ScratchMachine.h"
+#include "hosts/shared/SystemRoot.h"
+
+namespace tavisk {
+namespace {
+
+namespace fs = std::filesystem;
+using testing::ElementsAre;
+
+class SystemRootTest : public testing::Test {
+ protected:
+  fs::path at(const std::string& path) const { return folder.path() / fs::path(path).relative_path(); }
+  struct stat status(const std::string& path) const {
+    struct stat found {};
+    ::lstat(at(path).c_str(), &found);
+    return found;
+  }
+  void expectWritten(const std::string& path, const std::string& contents) {
+    auto written = root.write(path, contents);
+    EXPECT_TRUE(written) << written.failure().tried << ": " << written.failure().why;
+    EXPECT_EQ(contentsOf(at(path)), contents) << path;
+  }
+  std::string whyNotWritten(const std::string& path) {
+    auto written = root.write(path, "new");
+    return written ? "written" : written.failure().why;
+  }
+
+  TemporaryFolder folder;
+  SystemRoot root{folder.path()};
+};
+
+TEST_F(SystemRootTest, makesFilesAndFoldersWithTheirModesWhateverTheUmask) {
+  auto before = ::umask(077);
+  expectWritten("/etc/systemd/new.d/60-tavisk.conf", "[Time]\n");
+  EXPECT_TRUE(root.write("/etc/secret", "x", 0600));
+  ::umask(before);
+  EXPECT_EQ(status("/etc/systemd/new.d").st_mode & 07777, 0755U);
+  EXPECT_EQ(status("/etc/systemd/new.d/60-tavisk.conf").st_mode & 07777, 0644U);
+  EXPECT_EQ(status("/etc/secret").st_mode & 07777, 0600U);
+  EXPECT_EQ(root.list("/etc").valueOr({}), (std::vector<std::string>{"secret", "systemd"}));
+}
+
+TEST_F(SystemRootTest, makesTheRootItselfWhenItIsWanted) {
+  SystemRoot missing(at("/root"));
+  EXPECT_FALSE(missing.exists("/"));
+  EXPECT_TRUE(missing.makeFolders("/Volumes/Backup"));
+  EXPECT_TRUE(missing.exists("/Volumes/Backup"));
+}
+
+TEST_F(SystemRootTest, keepsOwnerAndModeOfWhatItReplaces) {
+  folder.write("/etc/hostname", "old");
+  ::chmod(at("/etc/hostname").c_str(), 0640);
+  bool mayGiveAway = ::chown(at("/etc/hostname").c_str(), 7, 8) == 0;
+  expectWritten("/etc/hostname", std::string(100'000, 'x'));
+  expectWritten("/etc/hostname", "");
+  EXPECT_EQ(status("/etc/hostname").st_mode & 07777, 0640U);
+  EXPECT_EQ(status("/etc/hostname").st_uid, mayGiveAway ? 7U : ::getuid());
+}
+
+TEST_F(SystemRootTest, writesWhereLinksLeadButNotOut) {
+  folder.write("/usr/lib/hosts", "old");
+  fs::create_directory(at("/etc"));
+  fs::create_symlink("/usr/lib/hosts", at("/etc/hosts"));
+  fs::create_symlink("../../../../../../../../tmp", at("/out"));
+  expectWritten("/usr/lib/hosts", "new");
+  EXPECT_TRUE(root.write("/etc/hosts", "newer"));
+  EXPECT_TRUE(fs::is_symlink(at("/etc/hosts")));
+  EXPECT_EQ(contentsOf(at("/usr/lib/hosts")), "newer");
+  EXPECT_TRUE(root.write("/out/file", "inside"));
+  EXPECT_EQ(contentsOf(at("/tmp/file")), "inside");
+}
+
+TEST_F(SystemRootTest, leavesAloneWhatIsNoFile) {
+  fs::create_directory(at("/folder"));
+  folder.write("/file", "old");
+  ASSERT_EQ(::mkfifo(at("/fifo").c_str(), 0600), 0);
+  EXPECT_EQ(whyNotWritten("/folder"), "not a regular file");
+  EXPECT_EQ(whyNotWritten("/fifo"), "not a regular file");
+  EXPECT_EQ(whyNotWritten("/file/below"), "Not a directory");
+  EXPECT_EQ(whyNotWritten("/"), "Is a directory");
+  EXPECT_EQ(whyNotWritten("/folder/.."), "Is a directory");
+  EXPECT_EQ(whyNotWritten("file"), "not an absolute path");
+  EXPECT_EQ(root.list("/").valueOr({}), (std::vector<std::string>{"fifo", "file", "folder"}));
+}
+
+TEST_F(SystemRootTest, putsALinkWhereALinkOrAFileWas) {
+  for (const char* target : {"../usr/share/zoneinfo/UTC", "../usr/share/zoneinfo/Europe/Paris"}) {
+    EXPECT_TRUE(root.writeLink("/etc/localtime", target));
+    EXPECT_EQ(root.readLink("/etc/localtime").valueOr("none"), target);
+  }
+  EXPECT_EQ(root.list("/etc").valueOr({}), std::vector<std::string>{"localtime"});
+  EXPECT_EQ(root.readLink("/etc").failure().why, "not a symbolic link");
+  EXPECT_FALSE(root.writeLink("/etc", "elsewhere"));
+  EXPECT_EQ(root.list("/").valueOr({}), std::vector<std::string>{"etc"});
+}
+
+TEST_F(SystemRootTest, removesFilesAndLinksAndNothingElse) {
+  folder.write("/etc/file", "x");
+  fs::create_symlink("file", at("/etc/link"));
+  for (const char* path : {"/etc/link", "/etc/file", "/etc/file", "/no/such"}) EXPECT_TRUE(root.remove(path)) << path;
+  EXPECT_FALSE(root.remove("/etc"));
+  EXPECT_TRUE(root.list("/etc").valueOr({"?"}).empty());
+}
+
+TEST_F(SystemRootTest, removesOnlyTheLeftoversOfRunsThatAreOver) {
+  folder.write("/etc/.tavisk-1", "left");
+  folder.write("/etc/.tavisk-2", "being written");
+  fs::create_symlink("left", at("/etc/.tavisk-3"));
+  FileDescriptor other(::open(at("/etc/.tavisk-2").c_str(), O_RDONLY));
+  ASSERT_EQ(::flock(other.number(), LOCK_EX), 0);
+  expectWritten("/etc/hostname", "name");
+  EXPECT_THAT(root.list("/etc").valueOr({}), ElementsAre(".tavisk-2", "hostname"));
+}
+
+TEST_F(SystemRootTest, rewritesInPlaceWhereAFileIsMounted) {
+  bool ran = withOwnMounts([&] {
+    auto mounted = folder.write("/etc/hosts", "");
+    auto source = folder.write("/source", "a longer text than the new one");
+    ASSERT_EQ(::mount(source.c_str(), mounted.c_str(), nullptr, MS_BIND, nullptr), 0);
+    expectWritten("/etc/hosts", "new");
+    EXPECT_EQ(contentsOf(source), "new");
+    EXPECT_EQ(root.list("/etc").valueOr({}), std::vector<std::string>{"hosts"});
+  });
+  if (!ran) GTEST_SKIP() << "may not have mounts of its own";
+}
+
+TEST_F(SystemRootTest, keepsTheOldFileWhenTheNewOneFindsNoRoom) {
+  bool ran = withOwnMounts([&] {
+    ASSERT_TRUE(mountMemory(folder.path(), "64k"));
+    folder.write("/file", "old");
+    EXPECT_EQ(root.write("/file", std::string(100'000, 'x')).failure(),
+              (Failure{"write", "/file", "No space left on device"}));
+    EXPECT_EQ(contentsOf(at("/file")), "old");
+    EXPECT_EQ(root.list("/").valueOr({}), std::vector<std::string>{"file"});
+    ASSERT_EQ(::mount("", folder.path().c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
+    EXPECT_EQ(whyNotWritten("/file"), "Read-only file system");
+  });
+  if (!ran) GTEST_SKIP() << "may not have mounts of its own";
+}
+
+TEST_F(SystemRootTest, isNotFooledByAFolderThatTurnsIntoALink) {
+  TemporaryFolder outside;
+  outside.write("file", "outside");
+  folder.write("/volume/file", "inside");
+  fs::create_symlink(outside.path(), at("/link"));
+  std::atomic<bool> over = false;
+  std::atomic<int> exchanges = 0;
+  std::thread exchanger([&] {
+    constexpr unsigned exchange = 2;  // RENAME_EXCHANGE
+    while (!over) {
+      if (::syscall(SYS_renameat2, AT_FDCWD, at("/volume").c_str(), AT_FDCWD, at("/link").c_str(), exchange) == 0)
+        ++exchanges;
+    }
+  });
+  int inside = 0;
+  for (int times = 0; times < 20'000; ++times) {
+    auto text = root.read("/volume/file", 100).valueOr("none");
+    ASSERT_NE(text, "outside");
+    if (text == "inside") ++inside;
+  }
+  over = true;
+  exchanger.join();
+  EXPECT_GT(inside, 0);
+  EXPECT_GT(exchanges, 100);
+}
+
+}  // namespace
+}  // namespace tavisk
