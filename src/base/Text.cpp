@@ -36,12 +36,12 @@ bool isShortestForm(char32_t codePoint, std::size_t length) {
 }
 
 void appendEscapedByte(std::string& text, char32_t byte) {
-  text += "\\x" + hexDigits(byte, 2);
+  text += "\\x" + upperCased(hexDigits(byte, 2));
 }
 
 void appendEscapedControl(std::string& text, char32_t control) {
   if (control < 0x80) return appendEscapedByte(text, control);
-  text += "\\u{" + hexDigits(control, 4) + "}";
+  text += "\\u{" + upperCased(hexDigits(control, 4)) + "}";
 }
 
 char lowerCased(char letter) {
