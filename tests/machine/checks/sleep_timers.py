@@ -51,14 +51,6 @@ CHECKS = [
     Check("a disk that comes back gets its timer", needs=SERVER,
           do="echo on >/sys/block/sda/device/power/control; udevadm trigger --settle --action=add /sys/block/sda",
           then={DISKS: "auto\non\n60000\n"}),
-    Check("the power button sleeps", needs=SERVER, kept=True,
-          do="tavisk -setallowpowerbuttontosleepcomputer off -getallowpowerbuttontosleepcomputer "
-             "-setallowpowerbuttontosleepcomputer on",
-          prints="setallowpowerbuttontosleepcomputer: Off\ngetAllowPowerButtonToSleepComputer: Off\n"
-                 "setallowpowerbuttontosleepcomputer: On\n",
-          then={LOGIN + "HandlePowerKey": 's "suspend"\n',
-                "tavisk -getallowpowerbuttontosleepcomputer": "getAllowPowerButtonToSleepComputer: On\n"} |
-               idle("suspend", 170)),
     Check("a drop-in that hides the timer is named", needs=SERVER,
           do="printf '[Login]\\nIdleAction=ignore\\n' >/etc/systemd/logind.conf.d/90-test.conf; "
              "TAVISK_REPORT=fd:3 tavisk -setcomputersleep 160 3>&1 >/dev/null | grep -o '\"undoneBy\":\"[^\"]*\"'; "
