@@ -42,7 +42,7 @@ std::string FakePowerServices::sleepsAfter() {
   return _sleepsAfter;
 }
 
-void FakePowerServices::read() {
+void FakePowerServices::readLogin() {
   const auto lines = linesOf(_tree / "etc/systemd/logind.conf.d/60-tavisk.conf");
   readKey(lines, "IdleAction", _idleAction);
   readKey(lines, "IdleActionSec", _idleMinutes);
@@ -77,7 +77,7 @@ int FakePowerServices::answer(sd_bus_message* call, const std::string& member) {
     return sd_bus_reply_method_return(call, "a(ssssuu)", 2, "idle", "nightly-backup", "", "block", 0, 1, "sleep",
                                       "NetworkManager", "", "delay", 0, 2);
   if (firstText(call) != "systemd-logind.service") return 0;
-  read();
+  readLogin();
   return member == "KillUnit" ? sd_bus_reply_method_return(call, "") : answerRestart(call);
 }
 

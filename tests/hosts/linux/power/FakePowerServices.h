@@ -32,7 +32,7 @@ class FakePowerServices {
   int answerInhibit(sd_bus_message* call);
   int answerRestart(sd_bus_message* call);
   bool isHeldBusy() const;
-  void read();
+  void readLogin();
   void readManager();
 
   std::filesystem::path _tree;
