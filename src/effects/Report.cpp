@@ -13,7 +13,7 @@
 #include <utility>
 
 #include "base/Json.h"
-#include "base/Surroundings.h"
+#include "base/Process.h"
 
 namespace tavisk {
 namespace {

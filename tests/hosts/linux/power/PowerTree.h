@@ -47,11 +47,10 @@ class TreeCards final : public NetworkCards {
 /// A management controller that keeps a restore policy and a start-up delay.
 class TreeController final : public ControllerLink {
  public:
-  int open() override { return error; }
-  int exchange(const ControllerRequest& request, std::vector<std::uint8_t>& reply) override {
-    if (error != 0) return error;
-    reply = answerTo(request);
-    return 0;
+  Result<void> open() override { return error == 0 ? Result<void>() : systemFailure("open", "the tree", error); }
+  Result<std::vector<std::uint8_t>> exchange(const ControllerRequest& request) override {
+    if (const auto opened = open(); !opened) return opened.failure();
+    return answerTo(request);
   }
 
   int error = 0;
@@ -144,6 +143,25 @@ class PowerTree : public LinuxTree {
 
   LinuxPowerSettingsService& power() { return _power; }
   LinuxPowerController& delays() { return _delays; }
+
+  /// Changes a setting, whatever feeds the machine, and tells what came of it.
+  Effect set(SleepTimer timer, Minutes minutes) {
+    _power.setUntilSleep(timer, mains, minutes);
+    return lastEffect();
+  }
+  Effect turn(PowerSwitch which, bool on) {
+    _power.setOn(which, mains, on);
+    return lastEffect();
+  }
+  Effect setRestartsAfterFreeze(bool restarts) {
+    _power.setRestartsAfterFreeze(restarts);
+    return lastEffect();
+  }
+  Effect lastEffect() const { return log.effects.empty() ? Effect{} : log.effects.back(); }
+  /// How the last value that was read is told.
+  std::string lastRead() const { return log.values.empty() ? "" : log.values.back().live.value_or(""); }
+
+  const PowerSource mains{"AC Power"};
 
   TreeConsole console{*this};
   TreeCards cards;
