@@ -13,20 +13,20 @@ void ServerCommands::getUsingNetworkTime() {
 void ServerCommands::setUsingNetworkTime(const std::string& onOff) {
   setError(false);
   if (checkForEmptyString(onOff, "setusingnetworktime", "either 'On' or 'Off'", "setusingnetworktime <on off>")) return;
-  const std::optional<bool> on = readOnOff(onOff, "setusingnetworktime");
-  if (!on) return;
+  const auto isOn = readOnOff(onOff, "setusingnetworktime");
+  if (!isOn) return;
   NetworkTimeService& client = _context.host.networkTime();
-  if (client.isRunning() == *on) {
-    _context.output.putLine(*on ? "Network Time is already on." : "Network Time is already off.");
+  if (client.isRunning() == *isOn) {
+    _context.output.putLine(*isOn ? "Network Time is already on." : "Network Time is already off.");
     return;
   }
-  client.setLaunchAtStartup(*on);
-  *on ? client.start() : client.stop();
-  _context.output.print("setUsingNetworkTime: %s\n", *on ? "On" : "Off");
+  client.setLaunchAtStartup(*isOn);
+  *isOn ? client.start() : client.stop();
+  _context.output.print("setUsingNetworkTime: %s\n", *isOn ? "On" : "Off");
 }
 
 void ServerCommands::getNetworkTimeServer() {
-  const NetworkTimeServer server = _context.host.networkTime().server();
+  const auto server = _context.host.networkTime().server();
   _context.output.print("Network Time Server: %s\n", server.address.c_str());
   setError(false);
 }
