@@ -140,8 +140,7 @@ TEST_F(SystemRootTest, keepsTheOldFileWhenTheNewOneFindsNoRoom) {
   bool ran = withOwnMounts([&] {
     ASSERT_TRUE(mountMemory(folder.path(), "64k"));
     folder.write("/file", "old");
-    EXPECT_EQ(root.write("/file", std::string(100'000, 'x')).failure(),
-              systemFailure("write", "/file", ENOSPC));
+    EXPECT_EQ(root.write("/file", std::string(100'000, 'x')).failure(), systemFailure("write", "/file", ENOSPC));
     EXPECT_EQ(contentsOf(at("/file")), "old");
     EXPECT_EQ(root.list("/").valueOr({}), std::vector<std::string>{"file"});
     ASSERT_EQ(::mount("", folder.path().c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
