@@ -11,7 +11,7 @@ constexpr std::size_t groupsAtMost = 16;
 }
 
 bool RemoteServerSettings::myIsAuthenticatedAsAdministrator() {
-  UserDatabase& users = _context.host.users();
+  auto& users = _context.host.users();
   if (users.realUserId() == 0) return true;
   const auto groups = users.supplementaryGroups(groupsAtMost);
   if (!groups || groups->empty()) return false;

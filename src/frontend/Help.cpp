@@ -74,7 +74,7 @@ constexpr HelpEntry entries[] = {
 };
 
 std::string usageOf(const HelpEntry& entry) {
-  const std::string usage = std::string("tavisk ") + entry.word;
+  const auto usage = std::string("tavisk ") + entry.word;
   return *entry.placeholder ? usage + " " + entry.placeholder : usage;
 }
 

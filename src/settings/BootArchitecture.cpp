@@ -15,7 +15,7 @@ void tellWhetherSaved(Output& output, bool isSaved) {
 }
 
 void chooseArchitecture(const CommandContext& context, const std::string& architecture) {
-  BootLoaderFile& file = context.host.bootLoaderFile();
+  auto& file = context.host.bootLoaderFile();
   auto settings = file.read().value_or(Properties());
   settings.set(BootLoaderFile::architectureKey, architecture);
   context.output.print("setting kernel architecture to: %s\n", architecture.c_str());
@@ -23,7 +23,7 @@ void chooseArchitecture(const CommandContext& context, const std::string& archit
 }
 
 void chooseDefaultArchitecture(const CommandContext& context) {
-  BootLoaderFile& file = context.host.bootLoaderFile();
+  auto& file = context.host.bootLoaderFile();
   auto settings = file.read();
   if (settings) settings->remove(BootLoaderFile::architectureKey);
   context.output.putLine("setting kernel architecture to default");

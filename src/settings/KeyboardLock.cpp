@@ -35,7 +35,7 @@ void ServerCommands::setDisableKeyBoardWhenEnclosureLockIsEngaged(const std::str
   // Any other word is passed over without a message.
   const auto isDisabled = readYesNo(yesNo);
   if (!isDisabled) return;
-  ProcessUtilities& utilities = _context.host.processes();
+  auto& utilities = _context.host.processes();
   utilities.setLockEnclosureState(*isDisabled);
   utilities.setMachineBoolean(DunmereLockEnclosureStateKey, *isDisabled);
   utilities.writeMachinePreferences();

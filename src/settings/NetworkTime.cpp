@@ -15,7 +15,7 @@ void ServerCommands::setUsingNetworkTime(const std::string& onOff) {
   if (checkForEmptyString(onOff, "setusingnetworktime", "either 'On' or 'Off'", "setusingnetworktime <on off>")) return;
   const auto isOn = readOnOff(onOff, "setusingnetworktime");
   if (!isOn) return;
-  NetworkTimeService& client = _context.host.networkTime();
+  auto& client = _context.host.networkTime();
   if (client.isRunning() == *isOn) {
     _context.output.putLine(*isOn ? "Network Time is already on." : "Network Time is already off.");
     return;
@@ -35,7 +35,7 @@ void ServerCommands::setNetworkTimeServer(const std::string& address) {
   setError(false);
   if (checkForEmptyString(address, "setnetworktimeserver", "a valid time server", "setnetworktimeserver <timeserver>"))
     return;
-  NetworkTimeService& client = _context.host.networkTime();
+  auto& client = _context.host.networkTime();
   client.setServer({address});
   if (client.isRunning()) client.restartAsynchronously();
   _context.output.print("setNetworkTimeServer: %s\n", address.c_str());

@@ -11,7 +11,7 @@ void ServerCommands::getRemoteVelmarEvents() {
 }
 
 void ServerCommands::setRemoteVelmarEvents(const std::string& onOff) {
-  RemoteEventsService& remoteEvents = _context.host.remoteEvents();
+  auto& remoteEvents = _context.host.remoteEvents();
   const auto isEnabled = remoteEvents.isEnabled();
   setError(false);
   if (checkForEmptyString(onOff, "setremotevelmarevents", "either 'On' or 'Off'", "setremotevelmarevents <on off>")) {

@@ -44,7 +44,7 @@ void ServerCommands::getRemoteLogin() {
 }
 
 void ServerCommands::setRemoteLogin(const std::string& onOff) {
-  RemoteShellService& remoteShell = _context.host.remoteShell();
+  auto& remoteShell = _context.host.remoteShell();
   const auto isEnabled = remoteShell.isEnabled();
   setError(false);
   if (checkForEmptyString(onOff, "setremotelogin", "either 'On' or 'Off'", "setremotelogin <on off>")) return;

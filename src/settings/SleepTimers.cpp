@@ -42,7 +42,7 @@ std::int64_t readMinutes(const std::string& value) {
 
 void setSleepTimers(ServerCommands& commands, const SleepTimerSetter& setter, const std::string& value) {
   const auto& context = commands.context();
-  PowerSettingsService& power = context.host.powerSettings();
+  auto& power = context.host.powerSettings();
   commands.setError(false);
   if (commands.checkForEmptyString(value, setter.command, "a value in minutes", setter.usage)) return;
   // Also what is below 0 is above the limit.

@@ -43,7 +43,7 @@ void showSwitch(ServerCommands& commands, const SourceSwitch& row) {
 
 void setSwitch(ServerCommands& commands, const SourceSwitch& row, const std::string& onOff) {
   const auto& context = commands.context();
-  PowerSettingsService& power = context.host.powerSettings();
+  auto& power = context.host.powerSettings();
   commands.setError(false);
   if (commands.checkForEmptyString(onOff, row.setter, onOrOff, row.usage)) return;
   if (!power.canSet(row.which, {ServerCommands::getPMKey()})) {
@@ -59,7 +59,7 @@ void setSwitch(ServerCommands& commands, const SourceSwitch& row, const std::str
 
 void allowPowerButton(const CommandContext& context, const std::string& onOff) {
   const PowerSource source{ServerCommands::getPMKey()};
-  PowerSettingsService& power = context.host.powerSettings();
+  auto& power = context.host.powerSettings();
   if (!power.canSet(PowerSwitch::powerButtonSleep, source)) {
     context.output.putLine("setallowpowerbuttontosleepcomputer: Error, this feature is not supported on this machine.");
     return;
@@ -102,7 +102,7 @@ void ServerCommands::getRestartFreeze() {
 }
 
 void ServerCommands::setRestartFreeze(const std::string& onOff) {
-  PowerSettingsService& power = _context.host.powerSettings();
+  auto& power = _context.host.powerSettings();
   setError(false);
   if (checkForEmptyString(onOff, "setrestartfreeze", onOrOff, "setrestartfreeze <on off>")) return;
   if (const auto isOn = readOnOff(onOff, "setrestartfreeze")) power.setRestartsAfterFreeze(*isOn);

@@ -14,7 +14,7 @@ namespace tavisk {
 namespace {
 
 bool canMoveTheCursor() {
-  const char* terminal = std::getenv("TERM");
+  const auto* terminal = std::getenv("TERM");
   return terminal && *terminal != '\0' && std::string_view(terminal) != "dumb";
 }
 
