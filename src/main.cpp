@@ -8,6 +8,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <string_view>
 
 #include "base/Process.h"
 #include "base/Text.h"
@@ -22,6 +23,7 @@ namespace tavisk {
 namespace {
 
 constexpr int refusedStatus = 1;
+constexpr std::string_view scratchPrefix = "scratch:";
 
 /// A run that cannot start says why on standard error and in the report.
 int refuse(const std::string& why, Report* report) {
@@ -31,22 +33,21 @@ int refuse(const std::string& why, Report* report) {
 }
 
 std::optional<std::string> environmentVariable(const char* name) {
-  const char* value = std::getenv(name);
+  const auto* value = std::getenv(name);
   return value ? std::optional<std::string>(value) : std::nullopt;
 }
 
 Result<std::unique_ptr<Host>> openScratchHost(const std::string& directory, EffectSink& effects, RunLoop& runLoop) {
   if (isatty(STDERR_FILENO) != 0) complain("rehearsing on " + escaped(directory));
-  Result<std::unique_ptr<ScratchHost>> host = ScratchHost::open(directory, effects, runLoop);
+  auto host = ScratchHost::open(directory, effects, runLoop);
   if (!host) return host.failure();
   return std::unique_ptr<Host>(std::move(host).value());
 }
 
 Result<std::unique_ptr<Host>> chooseHost(EffectSink& effects, RunLoop& runLoop) {
-  const std::string scratch = "scratch:";
-  const std::optional<std::string> name = environmentVariable("TAVISK_HOST");
+  const auto name = environmentVariable("TAVISK_HOST");
   if (!name) return std::unique_ptr<Host>(std::make_unique<LinuxHost>(effects, runLoop));
-  if (name->starts_with(scratch)) return openScratchHost(name->substr(scratch.size()), effects, runLoop);
+  if (name->starts_with(scratchPrefix)) return openScratchHost(name->substr(scratchPrefix.size()), effects, runLoop);
   return Failure{"use TAVISK_HOST=" + *name, "", "unset or scratch:DIR is expected"};
 }
 
@@ -60,7 +61,7 @@ int run(Report* report, int argc, char** argv) {
   Output output(stdout);
   TerminalLineSource input(output, runLoop);
   log.printThrough([&input](const auto& print) { input.printAside(print); });
-  const Result<std::unique_ptr<Host>> host = chooseHost(effects, runLoop);
+  const auto host = chooseHost(effects, runLoop);
   if (!host) return refuse(describe(host.failure()), report);
 
   NotificationCenter notifications;
@@ -78,15 +79,14 @@ int run(Report* report, int argc, char** argv) {
 
 int start(int argc, char** argv) {
   if (argc < 1) return refuse("started without its name as the first argument", nullptr);
-  const std::optional<std::string> destination = environmentVariable("TAVISK_REPORT");
+  const auto destination = environmentVariable("TAVISK_REPORT");
   if (!destination) return run(nullptr, argc, argv);
-  const Result<std::unique_ptr<Report>> report = Report::open(*destination);
+  const auto report = Report::open(*destination);
   if (!report) return refuse(describe(report.failure()), nullptr);
   return run(report->get(), argc, argv);
 }
 
 }  // namespace
-
 }  // namespace tavisk
 
 int main(int argc, char** argv) {

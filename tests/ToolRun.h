@@ -11,8 +11,8 @@
 #include <vector>
 
 #include "ScratchMachine.h"
+#include "frontend/LineSource.h"
 #include "frontend/RemoteServerSettings.h"
-#include "terminal/StreamLineSource.h"
 
 namespace tavisk {
 

@@ -27,23 +27,23 @@ std::int64_t cut(std::int64_t value, std::int64_t most) {
 
 /// Days from 1970-01-01 to the first day of a month. Years are counted from March, so that the leap day comes last.
 std::int64_t dayOfMonthBegin(std::int64_t year, std::int64_t month) {
-  const std::int64_t months = year * 12 + (month - 3);
-  const std::int64_t marchYear = floorDivided(months, 12);
-  const std::int64_t era = floorDivided(marchYear, 400);
-  const std::int64_t yearOfEra = marchYear - era * 400;
-  const std::int64_t dayOfYear = (153 * floorRemainder(months, 12) + 2) / 5;
-  const std::int64_t dayOfEra = yearOfEra * 365 + yearOfEra / 4 - yearOfEra / 100 + dayOfYear;
+  const auto months = year * 12 + (month - 3);
+  const auto marchYear = floorDivided(months, 12);
+  const auto era = floorDivided(marchYear, 400);
+  const auto yearOfEra = marchYear - era * 400;
+  const auto dayOfYear = (153 * floorRemainder(months, 12) + 2) / 5;
+  const auto dayOfEra = yearOfEra * 365 + yearOfEra / 4 - yearOfEra / 100 + dayOfYear;
   return era * daysPerEra + dayOfEra - daysFromMarch0ToEpoch;
 }
 
 /// The date of a day, counted from 1970-01-01, at midnight.
 DateTime dateOf(std::int64_t day) {
-  const std::int64_t era = floorDivided(day + daysFromMarch0ToEpoch, daysPerEra);
-  const std::int64_t dayOfEra = day + daysFromMarch0ToEpoch - era * daysPerEra;
-  const std::int64_t yearOfEra = (dayOfEra - dayOfEra / 1460 + dayOfEra / 36'524 - dayOfEra / 146'096) / 365;
-  const std::int64_t dayOfYear = dayOfEra - (365 * yearOfEra + yearOfEra / 4 - yearOfEra / 100);
-  const std::int64_t monthFromMarch = (5 * dayOfYear + 2) / 153;
-  const std::int64_t month = monthFromMarch < 10 ? monthFromMarch + 3 : monthFromMarch - 9;
+  const auto era = floorDivided(day + daysFromMarch0ToEpoch, daysPerEra);
+  const auto dayOfEra = day + daysFromMarch0ToEpoch - era * daysPerEra;
+  const auto yearOfEra = (dayOfEra - dayOfEra / 1460 + dayOfEra / 36'524 - dayOfEra / 146'096) / 365;
+  const auto dayOfYear = dayOfEra - (365 * yearOfEra + yearOfEra / 4 - yearOfEra / 100);
+  const auto monthFromMarch = (5 * dayOfYear + 2) / 153;
+  const auto month = monthFromMarch < 10 ? monthFromMarch + 3 : monthFromMarch - 9;
   return {era * 400 + yearOfEra + (month <= 2 ? 1 : 0), month, dayOfYear - (153 * monthFromMarch + 2) / 5 + 1};
 }
 
@@ -51,7 +51,7 @@ DateTime dateOf(std::int64_t day) {
 std::int64_t secondsAsUtc(const DateTime& time) {
   constexpr std::int64_t mostYears = 10'000'000'000;
   constexpr std::int64_t most = 1'000'000'000'000;
-  const std::int64_t day = dayOfMonthBegin(cut(time.year, mostYears), cut(time.month, most)) + cut(time.day, most) - 1;
+  const auto day = dayOfMonthBegin(cut(time.year, mostYears), cut(time.month, most)) + cut(time.day, most) - 1;
   return day * secondsPerDay + cut(time.hour, most) * 3600 + cut(time.minute, most) * 60 + cut(time.second, most);
 }
 
@@ -71,10 +71,10 @@ void setDefaultTimeZone(const std::string& zoneFile) {
 
 DateTime localDateTime(std::int64_t secondsSince1970) {
   constexpr std::int64_t most = std::int64_t{1} << 61U;
-  const std::int64_t time = cut(secondsSince1970, most);
-  const std::int64_t local = time + offsetAt(time);
-  const std::int64_t secondOfDay = floorRemainder(local, secondsPerDay);
-  DateTime result = dateOf(floorDivided(local, secondsPerDay));
+  const auto time = cut(secondsSince1970, most);
+  const auto local = time + offsetAt(time);
+  const auto secondOfDay = floorRemainder(local, secondsPerDay);
+  auto result = dateOf(floorDivided(local, secondsPerDay));
   result.hour = secondOfDay / 3600;
   result.minute = secondOfDay / 60 % 60;
   result.second = secondOfDay % 60;
@@ -82,10 +82,10 @@ DateTime localDateTime(std::int64_t secondsSince1970) {
 }
 
 double secondsSince1970(const DateTime& local) {
-  const std::int64_t asUtc = secondsAsUtc(local);
-  const std::int64_t offsetBefore = offsetAt(asUtc - secondsPerDay);
-  const std::int64_t offsetAfter = offsetAt(asUtc + secondsPerDay);
-  for (const std::int64_t offset : {offsetBefore, offsetAfter}) {
+  const auto asUtc = secondsAsUtc(local);
+  const auto offsetBefore = offsetAt(asUtc - secondsPerDay);
+  const auto offsetAfter = offsetAt(asUtc + secondsPerDay);
+  for (const auto offset : {offsetBefore, offsetAfter}) {
     if (offsetAt(asUtc - offset) == offset) return static_cast<double>(asUtc - offset);
   }
   return static_cast<double>(asUtc - offsetBefore);

@@ -13,7 +13,7 @@ LibraryFunctions::LibraryFunctions(const char* library)
 
 void* LibraryFunctions::address(const char* name) {
   if (!_handle) return nullptr;
-  void* const found = ::dlsym(_handle, name);
+  auto* found = ::dlsym(_handle, name);
   if (!found) fail(std::string("it has no ") + name);
   return found;
 }

@@ -45,7 +45,7 @@ std::string canonicalLocaleIdentifier(std::string_view language) {
   if (name != languageNames.end()) return name->second;
   const auto subtags = split(language.substr(0, language.find_first_of(".@")), "-_");
   if (subtags.empty() || !isLetters(subtags.front(), 2, 3)) return std::string(language);
-  std::string identifier = lowerCased(subtags.front());
+  auto identifier = lowerCased(subtags.front());
   for (auto subtag = subtags.begin() + 1; subtag != subtags.end(); ++subtag) identifier += canonicalSubtag(*subtag);
   return identifier;
 }

@@ -11,7 +11,7 @@ void NotificationCenter::addObserver(const void* observer, std::string name, Han
 }
 
 void NotificationCenter::removeObserver(const void* observer) {
-  std::erase_if(_observations, [observer](const std::shared_ptr<Observation>& observation) {
+  std::erase_if(_observations, [observer](const auto& observation) {
     const bool isEnded = observation->observer == observer;
     if (isEnded) observation->hasEnded = true;
     return isEnded;

@@ -24,7 +24,7 @@ PropertyList& PropertyList::Dictionary::set(std::string_view key, PropertyList v
 void PropertyList::Dictionary::remove(std::string_view key) {
   const auto found = _places.find(std::string(key));
   if (found == _places.end()) return;
-  const std::size_t removed = found->second;
+  const auto removed = found->second;
   _places.erase(found);
   _entries.erase(_entries.begin() + static_cast<std::ptrdiff_t>(removed));
   if (removed == _entries.size()) return;
@@ -34,7 +34,7 @@ void PropertyList::Dictionary::remove(std::string_view key) {
 }
 
 PropertyList::Dictionary& PropertyList::Dictionary::dictionary(std::string_view key) {
-  PropertyList* value = find(key);
+  auto* value = find(key);
   if (!value || value->type() != Type::dictionary) value = &set(key, Dictionary());
   return *value->asDictionary();
 }
@@ -105,8 +105,8 @@ const PropertyList::Data* PropertyList::asData() const {
 }
 
 bool PropertyList::operator==(const PropertyList& other) const {
-  const Dictionary* left = asDictionary();
-  const Dictionary* right = other.asDictionary();
+  const auto* left = asDictionary();
+  const auto* right = other.asDictionary();
   if (left && right) return *left == *right;
   return _value == other._value;
 }

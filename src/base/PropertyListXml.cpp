@@ -13,8 +13,6 @@
 namespace tavisk {
 namespace {
 
-constexpr std::string_view whiteSpace = " \t\r\n";
-
 /// Ends the reading from any depth; caught by parsePropertyList().
 class Malformed final : public std::runtime_error {
  public:
@@ -29,11 +27,6 @@ Malformed malformed(pugi::xml_node node, const std::string& expected) {
 
 bool isText(pugi::xml_node node) {
   return node.type() == pugi::node_pcdata || node.type() == pugi::node_cdata;
-}
-
-std::string_view trimmed(std::string_view text) {
-  text.remove_prefix(std::min(text.find_first_not_of(whiteSpace), text.size()));
-  return text.substr(0, text.find_last_not_of(whiteSpace) + 1);
 }
 
 /// The first element at or after the node among its siblings. Only white space, and a document type line in the
@@ -52,10 +45,7 @@ pugi::xml_node elementFrom(pugi::xml_node node) {
 char32_t numericReference(std::string_view digits) {
   const bool isHexadecimal = digits.starts_with('x');
   if (isHexadecimal) digits.remove_prefix(1);
-  std::uint32_t codePoint = 0;
-  const char* last = digits.data() + digits.size();
-  const auto [end, error] = std::from_chars(digits.data(), last, codePoint, isHexadecimal ? 16 : 10);
-  return error == std::errc() && end == last ? codePoint : 0;
+  return parseNumber<std::uint32_t>(digits, isHexadecimal ? 16 : 10).value_or(0);
 }
 
 /// The character that the name between '&' and ';' stands for; 0 when it is none that XML can hold.
@@ -78,8 +68,8 @@ std::string characters(pugi::xml_node node) {
     if (raw[place] == '\r') {
       if (!raw.substr(place + 1).starts_with('\n')) text += '\n';
     } else if (raw[place] == '&' && hasReferences) {
-      const std::size_t length = raw.substr(place).find(';');
-      const char32_t character =
+      const auto length = raw.substr(place).find(';');
+      const auto character =
           length == std::string_view::npos ? 0 : referencedCharacter(raw.substr(place + 1, length - 1));
       if (!isXmlCharacter(character)) {
         throw Malformed(node.offset_debug() + static_cast<std::ptrdiff_t>(place), "a reference that XML itself names");
@@ -95,7 +85,7 @@ std::string characters(pugi::xml_node node) {
 
 std::string textOf(pugi::xml_node element) {
   std::string text;
-  for (const pugi::xml_node child : element.children()) {
+  for (const auto child : element.children()) {
     if (!isText(child)) throw malformed(child, "text");
     text += characters(child);
   }
@@ -103,60 +93,52 @@ std::string textOf(pugi::xml_node element) {
 }
 
 std::int64_t integerOf(pugi::xml_node element) {
-  const std::string text = textOf(element);
-  std::string_view digits = trimmed(text);
+  const auto text = textOf(element);
+  auto digits = trimmed(text);
   const bool isNegative = digits.starts_with('-');
   if (isNegative || digits.starts_with('+')) digits.remove_prefix(1);
   const bool isHexadecimal = digits.starts_with("0x") || digits.starts_with("0X");
   if (isHexadecimal) digits.remove_prefix(2);
-  std::uint64_t magnitude = 0;
-  const char* last = digits.data() + digits.size();
-  const auto [end, error] = std::from_chars(digits.data(), last, magnitude, isHexadecimal ? 16 : 10);
-  const std::uint64_t largest = (std::uint64_t{1} << 63U) - (isNegative ? 0U : 1U);
-  if (error != std::errc() || end != last || magnitude > largest) {
-    throw malformed(element, "an integer of 64 bits");
-  }
-  return static_cast<std::int64_t>(isNegative ? 0U - magnitude : magnitude);
+  const auto magnitude = parseNumber<std::uint64_t>(digits, isHexadecimal ? 16 : 10);
+  const auto largest = (std::uint64_t{1} << 63U) - (isNegative ? 0U : 1U);
+  if (!magnitude || *magnitude > largest) throw malformed(element, "an integer of 64 bits");
+  return static_cast<std::int64_t>(isNegative ? 0U - *magnitude : *magnitude);
 }
 
 double realOf(pugi::xml_node element) {
-  const std::string text = textOf(element);
-  std::string_view digits = trimmed(text);
+  const auto text = textOf(element);
+  auto digits = trimmed(text);
   if (digits.starts_with('+') && !digits.starts_with("+-")) digits.remove_prefix(1);
   double value = 0;
-  const char* last = digits.data() + digits.size();
+  const auto* last = digits.data() + digits.size();
   const auto [end, error] = std::from_chars(digits.data(), last, value);
   if (error != std::errc() || end != last) throw malformed(element, "a real number");
   return value;
 }
 
-/// The number in a field of decimal digits; -1 when another character is in it.
-int field(std::string_view text, std::size_t place, std::size_t length) {
-  int value = 0;
-  for (const char digit : text.substr(place, length)) {
-    if (digit < '0' || digit > '9') return -1;
-    value = value * 10 + (digit - '0');
-  }
-  return value;
+bool isDigit(char character) {
+  return character >= '0' && character <= '9';
 }
 
 PropertyList::Date dateOf(pugi::xml_node element) {
   constexpr std::string_view form = "0000-00-00T00:00:00Z";
-  const std::string content = textOf(element);
-  const std::string_view text = trimmed(content);
-  const auto fits = [](char given, char wanted) { return wanted == '0' || given == wanted; };
-  const Malformed notADate = malformed(element, "a date like 2000-01-31T23:59:59Z");
-  if (text.size() != form.size() || !std::equal(text.begin(), text.end(), form.begin(), fits)) throw notADate;
+  const auto content = textOf(element);
+  const auto text = trimmed(content);
+  const auto fits = [](char given, char wanted) { return wanted == '0' ? isDigit(given) : given == wanted; };
+  const auto notADate = malformed(element, "a date like 2000-01-31T23:59:59Z");
+  if (!std::ranges::equal(text, form, fits)) throw notADate;
 
-  const std::array<int, 6> fields{field(text, 0, 4),  field(text, 5, 2),  field(text, 8, 2),
-                                  field(text, 11, 2), field(text, 14, 2), field(text, 17, 2)};
-  const auto [year, month, day, hour, minute, second] = fields;
-  const std::chrono::year_month_day date{std::chrono::year(year), std::chrono::month(static_cast<unsigned>(month)),
-                                         std::chrono::day(static_cast<unsigned>(day))};
-  const bool hasStrayCharacter = std::ranges::any_of(fields, [](int value) { return value < 0; });
-  if (hasStrayCharacter || year == 0 || !date.ok() || hour > 23 || minute > 59 || second > 59) throw notADate;
-  const std::chrono::sys_seconds moment = std::chrono::sys_days(date) + std::chrono::hours(hour) +
-                                          std::chrono::minutes(minute) + std::chrono::seconds(second);
+  const auto field = [text](std::size_t place, std::size_t length) {
+    return parseNumber<unsigned>(text.substr(place, length)).value_or(0);
+  };
+  const std::chrono::year_month_day date{std::chrono::year(static_cast<int>(field(0, 4))),
+                                         std::chrono::month(field(5, 2)), std::chrono::day(field(8, 2))};
+  const std::chrono::hours hour(field(11, 2));
+  const std::chrono::minutes minute(field(14, 2));
+  const std::chrono::seconds second(field(17, 2));
+  const bool isTime = hour.count() < 24 && minute.count() < 60 && second.count() < 60;
+  if (date.year() == std::chrono::year(0) || !date.ok() || !isTime) throw notADate;
+  const std::chrono::sys_seconds moment = std::chrono::sys_days(date) + hour + minute + second;
   return {moment.time_since_epoch().count()};
 }
 
@@ -164,25 +146,25 @@ PropertyList::Date dateOf(pugi::xml_node element) {
 int base64Digit(char character) {
   if (character >= 'A' && character <= 'Z') return character - 'A';
   if (character >= 'a' && character <= 'z') return character - 'a' + 26;
-  if (character >= '0' && character <= '9') return character - '0' + 52;
+  if (isDigit(character)) return character - '0' + 52;
   if (character == '+') return 62;
   return character == '/' ? 63 : -1;
 }
 
 PropertyList::Data dataOf(pugi::xml_node element) {
-  std::string digits = textOf(element);
-  std::erase_if(digits, [](char character) { return whiteSpace.find(character) != std::string_view::npos; });
-  const Malformed notData = malformed(element, "data in base 64");
+  auto digits = textOf(element);
+  std::erase_if(digits, [](char character) { return trimmed({&character, 1}).empty(); });
+  const auto notData = malformed(element, "data in base 64");
   if (digits.size() % 4 != 0) throw notData;
   for (int padding = 0; padding < 2 && digits.ends_with('='); ++padding) digits.pop_back();
 
   PropertyList::Data data;
   std::uint32_t bits = 0;
   for (std::size_t place = 0; place < digits.size(); ++place) {
-    const int digit = base64Digit(digits[place]);
+    const auto digit = base64Digit(digits[place]);
     if (digit < 0) throw notData;
     bits = (bits << 6U) | static_cast<std::uint32_t>(digit);
-    const std::size_t unused = 6 - 2 * (place % 4);
+    const auto unused = 6 - 2 * (place % 4);
     if (place % 4 != 0) data.push_back(static_cast<std::uint8_t>(bits >> unused));
   }
   return data;
@@ -193,11 +175,11 @@ class Reader {
   explicit Reader(const PropertyListLimits& limits) : _limits(limits) {}
 
   PropertyList document(pugi::xml_node document) {
-    const pugi::xml_node root = elementFrom(document.first_child());
+    const auto root = elementFrom(document.first_child());
     if (!root) throw Malformed(0, "a property list value");
     refuseFurther(root, "the end after the first value");
     if (root.name() != std::string_view("plist")) return value(root, 1);
-    const pugi::xml_node content = elementFrom(root.first_child());
+    const auto content = elementFrom(root.first_child());
     if (!content) throw malformed(root, "a value in the property list");
     refuseFurther(content, "one value in the property list");
     return value(content, 1);
@@ -205,7 +187,7 @@ class Reader {
 
  private:
   static void refuseFurther(pugi::xml_node element, const char* expected) {
-    if (const pugi::xml_node further = elementFrom(element.next_sibling())) throw malformed(further, expected);
+    if (const auto further = elementFrom(element.next_sibling())) throw malformed(further, expected);
   }
 
   void count(pugi::xml_node element) {
@@ -229,12 +211,12 @@ class Reader {
 
   PropertyList dictionary(pugi::xml_node element, std::size_t depth) {
     PropertyList::Dictionary dictionary;
-    for (pugi::xml_node key = elementFrom(element.first_child()); key;) {
+    for (auto key = elementFrom(element.first_child()); key;) {
       if (key.name() != std::string_view("key")) throw malformed(key, "a key");
       count(key);
-      const std::string name = textOf(key);
+      const auto name = textOf(key);
       if (dictionary.find(name)) throw malformed(key, "a key that has not occurred yet");
-      const pugi::xml_node content = elementFrom(key.next_sibling());
+      const auto content = elementFrom(key.next_sibling());
       if (!content) throw malformed(key, "a value after the key");
       dictionary.set(name, value(content, depth + 1));
       key = elementFrom(content.next_sibling());
@@ -244,14 +226,14 @@ class Reader {
 
   PropertyList array(pugi::xml_node element, std::size_t depth) {
     PropertyList::Array array;
-    for (pugi::xml_node item = elementFrom(element.first_child()); item; item = elementFrom(item.next_sibling())) {
+    for (auto item = elementFrom(element.first_child()); item; item = elementFrom(item.next_sibling())) {
       array.push_back(value(item, depth + 1));
     }
     return array;
   }
 
   static bool boolean(pugi::xml_node element) {
-    if (const pugi::xml_node child = elementFrom(element.first_child())) throw malformed(child, "an empty element");
+    if (const auto child = elementFrom(element.first_child())) throw malformed(child, "an empty element");
     return element.name() == std::string_view("true");
   }
 
@@ -281,7 +263,7 @@ const char* expectationOf(pugi::xml_parse_status status) {
 void refuseWhatIsNoXml(std::string_view text, std::size_t limit) {
   if (text.size() > limit) throw Malformed(0, "at most " + std::to_string(limit) + " bytes");
   if (text.starts_with("bplist")) throw Malformed(0, "XML, not a binary property list");
-  if (const std::optional<std::size_t> offset = offsetOfNonXml(text)) {
+  if (const auto offset = offsetOfNonXml(text)) {
     throw Malformed(static_cast<std::ptrdiff_t>(*offset), "a character of XML in UTF-8");
   }
 }
@@ -295,7 +277,7 @@ Result<PropertyList> parsePropertyList(std::string_view xml, const PropertyListL
   try {
     refuseWhatIsNoXml(xml, limits.bytes);
     pugi::xml_document document;
-    const pugi::xml_parse_result parsed = document.load_buffer(xml.data(), xml.size(), options, pugi::encoding_utf8);
+    const auto parsed = document.load_buffer(xml.data(), xml.size(), options, pugi::encoding_utf8);
     if (!parsed) throw Malformed(parsed.offset, expectationOf(parsed.status));
     return Reader(limits).document(document);
   } catch (const Malformed& malformed) {

@@ -48,7 +48,7 @@ std::string realText(double value) {
 }
 
 std::string padded(std::int64_t value, std::size_t width) {
-  const std::string digits = std::to_string(value);
+  const auto digits = std::to_string(value);
   return digits.size() < width ? std::string(width - digits.size(), '0') + digits : digits;
 }
 
@@ -59,7 +59,7 @@ std::string dateText(PropertyList::Date date) {
     throw Unwritable("a date is outside the years 1 to 9999");
   }
   const std::chrono::sys_seconds time{std::chrono::seconds(date.secondsSince1970)};
-  const std::chrono::sys_days midnight = std::chrono::floor<std::chrono::days>(time);
+  const auto midnight = std::chrono::floor<std::chrono::days>(time);
   const std::chrono::year_month_day day(midnight);
   const std::chrono::hh_mm_ss clock(time - midnight);
   return padded(int{day.year()}, 4) + '-' + padded(unsigned{day.month()}, 2) + '-' + padded(unsigned{day.day()}, 2) +
@@ -72,10 +72,10 @@ std::string base64(const PropertyList::Data& data) {
   const auto byteAt = [&data](std::size_t place) { return place < data.size() ? std::uint32_t{data[place]} : 0U; };
   std::string text;
   for (std::size_t place = 0; place < data.size(); place += 3) {
-    const std::uint32_t bits = byteAt(place) << 16U | byteAt(place + 1) << 8U | byteAt(place + 2);
+    const auto bits = byteAt(place) << 16U | byteAt(place + 1) << 8U | byteAt(place + 2);
     for (unsigned shift = 24; shift > 0; shift -= 6) text += digits[(bits >> (shift - 6)) & 0x3FU];
   }
-  const std::size_t missing = (3 - data.size() % 3) % 3;
+  const auto missing = (3 - data.size() % 3) % 3;
   text.replace(text.size() - missing, missing, missing, '=');
   return text;
 }
@@ -132,7 +132,7 @@ class Writer {
     if (array.empty()) return line("<array/>");
     line("<array>");
     ++_depth;
-    for (const PropertyList& item : array) value(item);
+    for (const auto& item : array) value(item);
     --_depth;
     line("</array>");
   }

@@ -29,8 +29,8 @@ inline std::optional<std::size_t> offsetOfNonXml(std::string_view text) {
   while (true) {
     rest.remove_prefix(static_cast<std::size_t>(std::ranges::find_if_not(rest, isPlainText) - rest.begin()));
     if (rest.empty()) return std::nullopt;
-    const std::size_t offset = text.size() - rest.size();
-    const std::optional<char32_t> codePoint = takeCodePoint(rest);
+    const auto offset = text.size() - rest.size();
+    const auto codePoint = takeCodePoint(rest);
     if (!codePoint || !isXmlCharacter(*codePoint)) return offset;
   }
 }

@@ -2,8 +2,6 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 #include <chrono>
-#include <optional>
-#include <vector>
 
 #include "frontend/RemoteServerSettings.h"
 
@@ -13,11 +11,11 @@ constexpr std::size_t groupsAtMost = 16;
 }
 
 bool RemoteServerSettings::myIsAuthenticatedAsAdministrator() {
-  UserDatabase& users = _context.host.users();
+  auto& users = _context.host.users();
   if (users.realUserId() == 0) return true;
-  const std::optional<std::vector<GroupId>> groups = users.supplementaryGroups(groupsAtMost);
+  const auto groups = users.supplementaryGroups(groupsAtMost);
   if (!groups || groups->empty()) return false;
-  const std::optional<GroupId> admin = users.groupNamed("admin");
+  const auto admin = users.groupNamed("admin");
   if (!admin) {
     _context.output.putLine("myAuthenticatedAsAdministrator: Could not find admin group.");
     return false;

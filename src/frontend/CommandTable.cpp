@@ -63,9 +63,9 @@ constexpr std::string_view tableText = R"(<dict>
 )";
 
 Result<CommandTable::Entry> readEntry(const std::string& word, const PropertyList& value) {
-  const PropertyList::Dictionary* row = value.asDictionary();
-  const PropertyList* selector = row ? row->find("selector") : nullptr;
-  const PropertyList* arguments = row ? row->find("arguments") : nullptr;
+  const auto* row = value.asDictionary();
+  const auto* selector = row ? row->find("selector") : nullptr;
+  const auto* arguments = row ? row->find("arguments") : nullptr;
   if (!selector || !selector->asString() || !arguments || !arguments->asInteger())
     return Failure{"read the command table", word, "a selector and an argument count are expected"};
   return CommandTable::Entry{*selector->asString(), *arguments->asInteger()};
@@ -78,14 +78,14 @@ std::string_view CommandTable::text() {
 }
 
 Result<CommandTable> CommandTable::parse(std::string_view xml) {
-  const Result<PropertyList> list = parsePropertyList(xml, ownFileLimits);
+  const auto list = parsePropertyList(xml, ownFileLimits);
   if (!list) return list.failure();
-  const PropertyList::Dictionary* rows = list->asDictionary();
+  const auto* rows = list->asDictionary();
   if (!rows) return Failure{"read the command table", "its root", "a dictionary is expected"};
 
   CommandTable table;
   for (const auto& [word, value] : *rows) {
-    const Result<Entry> entry = readEntry(word, value);
+    const auto entry = readEntry(word, value);
     if (!entry) return entry.failure();
     table._entries.emplace(word, *entry);
   }

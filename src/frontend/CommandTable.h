@@ -12,7 +12,7 @@
 namespace tavisk {
 
 /// The commands: from the word ("-getdate", lower case, with its dash) to the handler's selector and argument count.
-class CommandTable {
+class CommandTable final {
  public:
   struct Entry {
     std::string selector;    ///< with a trailing ":" when the handler takes an argument

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "frontend/ArgumentKinds.h"
+#include "frontend/CommandList.h"
 
 namespace tavisk {
 

@@ -31,7 +31,7 @@ bool RemoteServerSettings::loadCommands() {
     _context.output.putLine("Error: Command info could not be found.");
     return false;
   }
-  Result<CommandTable> table = CommandTable::parse(_commandTable);
+  auto table = CommandTable::parse(_commandTable);
   if (!table) {
     _context.output.putLine("Error: Command info could not be translated.");
     return false;
@@ -60,15 +60,15 @@ void RemoteServerSettings::parseCommand(const std::vector<std::string>& words) {
     rest = rest.subspan(1);
   }
   while (!rest.empty() && !_ended) {
-    const std::optional<std::size_t> taken = runFirst(rest);
+    const auto taken = runFirst(rest);
     if (!taken) return;
     rest = rest.subspan(std::min(*taken, rest.size()));
   }
 }
 
 std::optional<std::size_t> RemoteServerSettings::runFirst(std::span<const std::string> words) {
-  const std::string& word = words.front();
-  const CommandTable::Entry* entry = findCommand(word);
+  const auto& word = words.front();
+  const auto* entry = findCommand(word);
   if (!entry) {
     refuseWord(word);
     return std::nullopt;
@@ -89,7 +89,7 @@ std::optional<std::size_t> RemoteServerSettings::runFirst(std::span<const std::s
 }
 
 const CommandTable::Entry* RemoteServerSettings::findCommand(const std::string& word) const {
-  const std::string key = lowerCased(word);
+  const auto key = lowerCased(word);
   return _commandDict->find(key.starts_with('-') ? key : "-" + key);
 }
 

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "frontend/HandlerRegistry.h"
 
+#include <algorithm>
 #include <array>
 #include <stdexcept>
 #include <string>
@@ -19,10 +20,9 @@ std::span<const HandlerRows> handlerFamilies() {
 }
 
 const Handler& handlerNamed(std::string_view selector) {
-  for (const HandlerRows& family : handlerFamilies()) {
-    for (const HandlerRow& row : family) {
-      if (row.selector == selector) return row.handler;
-    }
+  for (const auto& family : handlerFamilies()) {
+    const auto row = std::ranges::find(family, selector, &HandlerRow::selector);
+    if (row != family.end()) return row->handler;
   }
   throw std::logic_error("no handler is named " + std::string(selector));
 }

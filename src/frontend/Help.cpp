@@ -74,7 +74,7 @@ constexpr HelpEntry entries[] = {
 };
 
 std::string usageOf(const HelpEntry& entry) {
-  const std::string usage = std::string("tavisk ") + entry.word;
+  const auto usage = std::string("tavisk ") + entry.word;
   return *entry.placeholder ? usage + " " + entry.placeholder : usage;
 }
 
@@ -88,14 +88,14 @@ void ServerCommands::printHelp() {
   _context.output.putLine("\ntavisk Help Information");
   _context.output.putLine("-------------------------------------");
   const char* separator = "";
-  for (const HelpEntry& entry : entries) {
+  for (const auto& entry : entries) {
     _context.output.print("%sUsage: %s\n%s\n", separator, usageOf(entry).c_str(), entry.description);
     separator = "\n";
   }
 }
 
 void ServerCommands::printCommands() {
-  for (const HelpEntry& entry : entries) _context.output.putLine(usageOf(entry).c_str());
+  for (const auto& entry : entries) _context.output.putLine(usageOf(entry).c_str());
 }
 
 void ServerCommands::getVersion() {

@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <cstddef>
-#include <optional>
 
 #include "base/Text.h"
 #include "frontend/Completion.h"
@@ -9,13 +8,7 @@
 
 namespace tavisk {
 namespace {
-
 constexpr std::size_t lineBufferSize = 2056;
-
-bool beginsWith(const std::string& line, std::string_view word) {
-  return compareIgnoringCase(std::string_view(line).substr(0, word.size()), word) == 0;
-}
-
 }  // namespace
 
 bool RemoteServerSettings::doInteractiveTool() {
@@ -28,13 +21,13 @@ bool RemoteServerSettings::doInteractiveTool() {
 }
 
 bool RemoteServerSettings::readInput() {
-  std::optional<std::string> line = _context.input.readCommandLine(
-      "> ", lineBufferSize, [this](const std::string& text) { return completions(text); });
+  auto line = _context.input.readCommandLine("> ", lineBufferSize,
+                                             [this](const std::string& text) { return completions(text); });
   if (!line) {
     _context.output.putLine("Error: fgets returned NULL.");
     return false;
   }
-  if (beginsWith(*line, "quit") || beginsWith(*line, "exit")) return false;
+  if (beginsIgnoringCase(*line, "quit") || beginsIgnoringCase(*line, "exit")) return false;
   if (*line == "\n") return true;
   // The last character is dropped whatever it is: also that of a piece of a longer line, or of a last line without a
   // newline.

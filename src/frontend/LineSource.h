@@ -3,10 +3,13 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdio>
 #include <functional>
 #include <optional>
 #include <string>
 #include <vector>
+
+#include "frontend/Output.h"
 
 namespace tavisk {
 
@@ -32,6 +35,20 @@ class LineSource {
 
   /// Gives the terminal back as it was found. Called by the thread that ends the run, also while a line is being read.
   virtual void restoreTerminal() = 0;
+};
+
+/// Lines from a stream, as they come; the prompt goes to the output.
+class StreamLineSource final : public LineSource {
+ public:
+  /// Neither is owned.
+  StreamLineSource(std::FILE* stream, Output& output) : _stream(stream), _output(output) {}
+
+  std::optional<std::string> readLine(const std::string& prompt, std::size_t room) override;
+  void restoreTerminal() override {}
+
+ private:
+  std::FILE* _stream;
+  Output& _output;
 };
 
 }  // namespace tavisk

@@ -17,7 +17,7 @@ void Output::print(const char* format, ...) {
   va_start(arguments, format);
   std::va_list again;
   va_copy(again, arguments);
-  const int size = std::vsnprintf(nullptr, 0, format, arguments);
+  const auto size = std::vsnprintf(nullptr, 0, format, arguments);
   va_end(arguments);
   std::string text(static_cast<std::size_t>(std::max(size, 0)), '\0');
   (void)std::vsnprintf(text.data(), text.size() + 1, format, again);
@@ -44,7 +44,7 @@ std::string Output::takePrinted() {
 }
 
 void Output::write(const std::string& text) {
-  if (_keeping) {
+  if (_isKeeping) {
     const std::scoped_lock lock(_mutex);
     _printed.append(text, 0, keptAtMost - _printed.size());
   }

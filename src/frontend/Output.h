@@ -12,10 +12,10 @@
 namespace tavisk {
 
 /// Standard output as the handlers see it: the one place that prints.
-class Output {
+class Output final {
  public:
   /// Thrown when the stream cannot be written; it ends the run. finish() tells why.
-  struct Lost : std::exception {
+  struct Lost final : std::exception {
     const char* what() const noexcept override { return "standard output cannot be written"; }
   };
 
@@ -32,7 +32,7 @@ class Output {
   std::optional<int> finish();
 
   /// From now on, keeps what is printed for takePrinted.
-  void keepPrinted() { _keeping = true; }
+  void keepPrinted() { _isKeeping = true; }
   /// What has been printed since the last call; at most the first MiB of it. From any thread.
   std::string takePrinted();
 
@@ -42,7 +42,7 @@ class Output {
 
   std::FILE* _stream;
   std::atomic<int> _lostBy = 0;
-  bool _keeping = false;
+  bool _isKeeping = false;
   std::mutex _mutex;  // guards _printed, and is never held while the stream is written
   std::string _printed;
 };

@@ -20,9 +20,9 @@ RemoteServerSettings::~RemoteServerSettings() {
 }
 
 bool RemoteServerSettings::runTool(int argc, char** withArguments) {
-  bool started = false;
-  untilOutputIsLost([&] { started = setUp(argc, withArguments); });
-  return started;
+  bool isStarted = false;
+  untilOutputIsLost([&] { isStarted = setUp(argc, withArguments); });
+  return isStarted;
 }
 
 bool RemoteServerSettings::setUp(int argc, char** withArguments) {
@@ -65,7 +65,7 @@ void RemoteServerSettings::deauthenticate() {
 void RemoteServerSettings::exit() {
   _exitStatus = statusOfErrorFlag();
   if (_report) _report->commandEnds(_exitStatus != 0, _context.output.takePrinted());
-  const std::optional<int> lostBy = _context.output.finish();
+  const auto lostBy = _context.output.finish();
   if (lostBy && *lostBy != EPIPE) {
     complain("standard output: " + std::generic_category().message(*lostBy));
     _exitStatus = 1;

@@ -21,7 +21,7 @@
 namespace tavisk {
 
 /// One run of the tool, from the administrator check to the exit status.
-class RemoteServerSettings {
+class RemoteServerSettings final {
  public:
   /// Nothing is owned; `report` is null when none was asked for. The command table is given for tests.
   RemoteServerSettings(const CommandContext& context, EffectSink& effects, Report* report,

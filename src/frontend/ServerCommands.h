@@ -8,7 +8,6 @@
 #include <optional>
 #include <string>
 
-#include "base/Calendar.h"
 #include "base/NotificationCenter.h"
 #include "base/RunLoop.h"
 #include "frontend/CommandTable.h"
@@ -20,8 +19,6 @@ namespace tavisk {
 
 class RemoteServerSettings;
 class SpecialPMUSettings;
-struct SleepTimerSetter;
-struct SourceSwitch;
 class SDController;
 class StartupDisk;
 
@@ -37,7 +34,7 @@ struct CommandContext {
 
 /// Every command is a member function of this one object, reached by the name that the command table gives.
 /// A handler prints its answer on the context's output and reports failure by the error flag; nothing else comes back.
-class ServerCommands {
+class ServerCommands final {
  public:
   ServerCommands(std::shared_ptr<const CommandTable> commandDict, const CommandContext& context);
   ~ServerCommands();
@@ -50,6 +47,13 @@ class ServerCommands {
   void setError(bool error) { _error = error; }
   /// True when the last handler that touched the flag failed. Read from any thread.
   bool error() const { return _error; }
+
+  /// The frame of the handlers
+  const CommandContext& context() const { return _context; }
+  /// True when the value is empty: then the usage was printed and the error flag set.
+  bool checkForEmptyString(const std::string& value, const char* command, const char* withInfo, const char* andUseage);
+  /// Whether the value is "On" or "Off"; absent when it is neither: then the error was printed and the error flag set.
+  std::optional<bool> readOnOff(const std::string& value, const char* command);
 
   /// Help, command list, version
   void printHelp();
@@ -66,6 +70,8 @@ class ServerCommands {
   void getTimeZone();
   void listTimeZones();
   void setTimeZone(const std::string& timeZone);
+  /// The zone that this run has set, else the machine's.
+  std::string localTimeZone() const;
 
   /// Network time
   void getUsingNetworkTime();
@@ -158,6 +164,7 @@ class ServerCommands {
   void getScheduledWakeTime();
   void setScheduledSleepTime(const std::string& date, const std::string& andTime);
   void getScheduledSleepTime();
+
   /// Startup disk
   void listStartupDisk();
   void getStartupDisk();
@@ -166,29 +173,8 @@ class ServerCommands {
   std::vector<std::string> knownStartupDisks() const;
 
  private:
-  /// True when the value is empty: then the usage was printed and the error flag set.
-  bool checkForEmptyString(const std::string& value, const char* command, const char* withInfo, const char* andUseage);
-  /// Whether the value is "On" or "Off"; absent when it is neither: then the error was printed and the error flag set.
-  std::optional<bool> readOnOff(const std::string& value, const char* command);
-
-  /// The zone that this run has set, else the machine's.
-  std::string localTimeZone();
-  DateTime localNow();
-  void setClock(const DateTime& local);
-  /// True while the network time client runs: then the error was printed and the error flag set.
-  bool refuseWhileNetworkTimeRuns(const char* error);
-  void showSleepTimer(const char* label, SleepTimer timer);
-  void setSleepTimers(const SleepTimerSetter& setter, const std::string& value);
-  void showSourceSwitch(const SourceSwitch& row);
-  void setSourceSwitch(const SourceSwitch& row, const std::string& onOff);
-  void allowPowerButton(const std::string& onOff);
   /// Made at its first use.
   SpecialPMUSettings& sharedSpecialPMU();
-  void showName(const char* label, const char* command, std::optional<std::string> (DynamicStore::Session::*read)());
-  void chooseKernelArchitecture(const std::string& architecture);
-  void chooseDefaultKernelArchitecture();
-  void tellWhetherSaved(bool saved);
-
   /// The one controller of the run, made at the first call.
   SDController& sharedController();
 

@@ -1,7 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include <optional>
-
 #include "frontend/HandlerRegistry.h"
 #include "frontend/RemotePrefsExtra.h"
 #include "frontend/ServerCommands.h"
@@ -9,14 +7,35 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* architectureKey = "Kernel Architecture";
+using Properties = PropertyList::Dictionary;
+
+void tellWhetherSaved(Output& output, bool isSaved) {
+  output.putLine(isSaved ? "changes to kernel architecture have been saved."
+                         : "changes to kernel architecture failed to save!");
+}
+
+void chooseArchitecture(const CommandContext& context, const std::string& architecture) {
+  auto& file = context.host.bootLoaderFile();
+  auto settings = file.read().value_or(Properties());
+  settings.set(BootLoaderFile::architectureKey, architecture);
+  context.output.print("setting kernel architecture to: %s\n", architecture.c_str());
+  tellWhetherSaved(context.output, file.write(settings));
+}
+
+void chooseDefaultArchitecture(const CommandContext& context) {
+  auto& file = context.host.bootLoaderFile();
+  auto settings = file.read();
+  if (settings) settings->remove(BootLoaderFile::architectureKey);
+  context.output.putLine("setting kernel architecture to default");
+  tellWhetherSaved(context.output, settings && file.write(*settings));
+}
 
 }  // namespace
 
 void ServerCommands::getKernelBootArchitectureSetting() {
-  const std::optional<PropertyList::Dictionary> settings = _context.host.bootLoaderFile().read();
-  const PropertyList* value = settings ? settings->find(architectureKey) : nullptr;
-  if (const std::string* architecture = value ? value->asString() : nullptr) {
+  const auto settings = _context.host.bootLoaderFile().read();
+  const auto* value = settings ? settings->find(BootLoaderFile::architectureKey) : nullptr;
+  if (const auto* architecture = value ? value->asString() : nullptr) {
     _context.output.print("kernel architecture is set to: %s\n", architecture->c_str());
   } else {
     _context.output.putLine("kernel architecture is set to default");
@@ -25,33 +44,12 @@ void ServerCommands::getKernelBootArchitectureSetting() {
 
 void ServerCommands::setKernelBootArchitecture(const std::string& architecture) {
   if (architecture == "i386" || architecture == "x86_64") {
-    chooseKernelArchitecture(architecture);
+    chooseArchitecture(_context, architecture);
   } else if (caseInsensitiveEqualTo(architecture, "default")) {
-    chooseDefaultKernelArchitecture();
+    chooseDefaultArchitecture(_context);
   } else {
     _context.output.putLine("Invalid argument. Valid arguments are i386, x86_64, or default.");
   }
-}
-
-void ServerCommands::chooseKernelArchitecture(const std::string& architecture) {
-  BootLoaderFile& file = _context.host.bootLoaderFile();
-  PropertyList::Dictionary settings = file.read().value_or(PropertyList::Dictionary());
-  settings.set(architectureKey, architecture);
-  _context.output.print("setting kernel architecture to: %s\n", architecture.c_str());
-  tellWhetherSaved(file.write(settings));
-}
-
-void ServerCommands::chooseDefaultKernelArchitecture() {
-  BootLoaderFile& file = _context.host.bootLoaderFile();
-  std::optional<PropertyList::Dictionary> settings = file.read();
-  if (settings) settings->remove(architectureKey);
-  _context.output.putLine("setting kernel architecture to default");
-  tellWhetherSaved(settings && file.write(*settings));
-}
-
-void ServerCommands::tellWhetherSaved(bool saved) {
-  _context.output.putLine(saved ? "changes to kernel architecture have been saved."
-                                : "changes to kernel architecture failed to save!");
 }
 
 HandlerRows bootArchitectureHandlers() {

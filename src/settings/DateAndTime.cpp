@@ -4,8 +4,8 @@
 #include <cmath>
 #include <cstddef>
 #include <cstdint>
-#include <vector>
 
+#include "base/Calendar.h"
 #include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/ServerCommands.h"
@@ -15,7 +15,7 @@ namespace {
 
 /// The three numbers of "mm:dd:yy" or "hh:mm:ss"; what is missing or no number is 0.
 std::array<std::int64_t, 3> readFields(const std::string& text) {
-  const std::vector<std::string> fields = split(text, "/:");
+  const auto fields = split(text, "/:");
   std::array<std::int64_t, 3> numbers{};
   for (std::size_t i = 0; i < numbers.size() && i < fields.size(); ++i) numbers[i] = leadingInteger(fields[i]);
   return numbers;
@@ -35,34 +35,36 @@ bool isDate(std::int64_t month, std::int64_t day, std::int64_t year) {
   return month != 0 && isAtMost(month, 12) && day != 0 && isAtMost(day, 31) && isAtMost(year, 9999);
 }
 
-}  // namespace
-
-DateTime ServerCommands::localNow() {
-  ClockService& clock = _context.host.clock();
-  setDefaultTimeZone(clock.rulesOf(localTimeZone()));
+DateTime localNow(const ServerCommands& commands) {
+  auto& clock = commands.context().host.clock();
+  setDefaultTimeZone(clock.rulesOf(commands.localTimeZone()));
   return localDateTime(clock.now());
 }
 
-void ServerCommands::setClock(const DateTime& local) {
-  _context.host.clock().setTime(static_cast<std::int64_t>(std::trunc(secondsSince1970(local))));
+void setClock(const ServerCommands& commands, const DateTime& local) {
+  commands.context().host.clock().setTime(static_cast<std::int64_t>(std::trunc(secondsSince1970(local))));
 }
 
-bool ServerCommands::refuseWhileNetworkTimeRuns(const char* error) {
-  if (!_context.host.networkTime().isRunning()) return false;
-  _context.output.print("%s", error);
-  _context.output.putLine("Use '-setusingnetworktime' to turn network time off.");
-  setError(true);
+/// True while the network time client runs: then the error was printed and the error flag set.
+bool refuseWhileNetworkTimeRuns(ServerCommands& commands, const char* error) {
+  if (!commands.context().host.networkTime().isRunning()) return false;
+  commands.context().output.print("%s", error);
+  commands.context().output.putLine("Use '-setusingnetworktime' to turn network time off.");
+  commands.setError(true);
   return true;
 }
 
+}  // namespace
+
 void ServerCommands::getDate() {
-  const DateTime now = localNow();
+  const auto now = localNow(*this);
   _context.output.print("Date: %ld/%ld/%ld\n", now.month, now.day, now.year);
   setError(false);
 }
 
 void ServerCommands::setDate(const std::string& date) {
-  if (refuseWhileNetworkTimeRuns("setDate: Error, you cannot set the date while network time is running. ")) return;
+  if (refuseWhileNetworkTimeRuns(*this, "setDate: Error, you cannot set the date while network time is running. "))
+    return;
   if (checkForEmptyString(date, "setdate", "a valid date", "setdate <mm:dd:yy>")) return;
   setError(false);
   const auto [month, day, yearAsTyped] = readFields(date);
@@ -72,19 +74,19 @@ void ServerCommands::setDate(const std::string& date) {
     return;
   }
   const std::int64_t year = yearAsTyped <= 99 ? yearAsTyped + 2000 : yearAsTyped;
-  const DateTime now = localNow();
-  setClock({year, month, day, now.hour, now.minute, now.second});
+  const auto now = localNow(*this);
+  setClock(*this, {year, month, day, now.hour, now.minute, now.second});
   _context.output.print("setdate: %02ld/%02ld/%02ld\n", month, day, year);
 }
 
 void ServerCommands::getTime() {
-  const DateTime now = localNow();
+  const auto now = localNow(*this);
   _context.output.print("Time: %02ld:%02ld:%02ld\n", now.hour, now.minute, now.second);
   setError(false);
 }
 
 void ServerCommands::setTime(const std::string& time) {
-  if (refuseWhileNetworkTimeRuns("settime: Error, you cannot set time while network time is running. ")) return;
+  if (refuseWhileNetworkTimeRuns(*this, "settime: Error, you cannot set time while network time is running. ")) return;
   if (checkForEmptyString(time, "settime", "a valid time", "settime <hh:mm:ss>")) return;
   setError(false);
   const auto [hour, minute, second] = readFields(time);
@@ -93,8 +95,8 @@ void ServerCommands::setTime(const std::string& time) {
     setError(true);
     return;
   }
-  const DateTime now = localNow();
-  setClock({now.year, now.month, now.day, hour, minute, second});
+  const auto now = localNow(*this);
+  setClock(*this, {now.year, now.month, now.day, hour, minute, second});
   _context.output.print("Set Time: %02ld:%02ld:%02ld\n", hour, minute, second);
 }
 

@@ -19,9 +19,9 @@ std::optional<bool> readYesNo(const std::string& value) {
 }  // namespace
 
 void ServerCommands::getDisableKeyBoardWhenEnclosureLockIsEngaged() {
-  const PropertyList value = _context.host.preferences().value(DunmereLockEnclosureStateKey).value_or(false);
-  if (const bool* disabled = value.asBoolean()) {
-    _context.output.print("getdisablekeyboardwhenenclosurelockisengaged: %s\n", *disabled ? "Yes" : "No");
+  const auto value = _context.host.preferences().value(DunmereLockEnclosureStateKey).value_or(false);
+  if (const auto* isDisabled = value.asBoolean()) {
+    _context.output.print("getdisablekeyboardwhenenclosurelockisengaged: %s\n", *isDisabled ? "Yes" : "No");
   } else {
     _context.output.putLine("getdisablekeyboardwhenenclosurelockisengaged: error reading from preferences");
   }
@@ -33,13 +33,13 @@ void ServerCommands::setDisableKeyBoardWhenEnclosureLockIsEngaged(const std::str
     return;
   }
   // Any other word is passed over without a message.
-  const std::optional<bool> disabled = readYesNo(yesNo);
-  if (!disabled) return;
-  ProcessUtilities& utilities = _context.host.processes();
-  utilities.setLockEnclosureState(*disabled);
-  utilities.setMachineBoolean(DunmereLockEnclosureStateKey, *disabled);
+  const auto isDisabled = readYesNo(yesNo);
+  if (!isDisabled) return;
+  auto& utilities = _context.host.processes();
+  utilities.setLockEnclosureState(*isDisabled);
+  utilities.setMachineBoolean(DunmereLockEnclosureStateKey, *isDisabled);
   utilities.writeMachinePreferences();
-  _context.output.print("setdisablekeyboardwhenenclosurelockisengaged: %s\n", *disabled ? "Yes" : "No");
+  _context.output.print("setdisablekeyboardwhenenclosurelockisengaged: %s\n", *isDisabled ? "Yes" : "No");
 }
 
 HandlerRows keyboardLockHandlers() {

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include <memory>
 #include <optional>
 
 #include "base/DnsName.h"
@@ -12,26 +11,28 @@ namespace {
 
 constexpr const char* sessionName = "RemoteServerSettings";
 
+using NameOfSession = std::optional<std::string> (DynamicStore::Session::*)();
+
+void showName(ServerCommands& commands, const char* label, const char* command, NameOfSession read) {
+  const auto& context = commands.context();
+  commands.setError(false);
+  const auto session = context.host.dynamicStore().open(sessionName);
+  if (!session) return;
+  if (const auto name = (*session.*read)()) {
+    context.output.print("%s: %s\n", label, name->c_str());
+  } else {
+    context.output.print("%s: Error reading from dynamic store (name == NULL)!\n", command);
+  }
+}
+
 }  // namespace
 
 void ServerCommands::getComputerName() {
-  showName("Computer Name", "getcomputername", &DynamicStore::Session::computerName);
+  showName(*this, "Computer Name", "getcomputername", &DynamicStore::Session::computerName);
 }
 
 void ServerCommands::getLocalSubnetName() {
-  showName("Local Subnet Name", "getlocalsubnetname", &DynamicStore::Session::localHostName);
-}
-
-void ServerCommands::showName(const char* label, const char* command,
-                              std::optional<std::string> (DynamicStore::Session::*read)()) {
-  setError(false);
-  const std::unique_ptr<DynamicStore::Session> session = _context.host.dynamicStore().open(sessionName);
-  if (!session) return;
-  if (const std::optional<std::string> name = (*session.*read)()) {
-    _context.output.print("%s: %s\n", label, name->c_str());
-  } else {
-    _context.output.print("%s: Error reading from dynamic store (name == NULL)!\n", command);
-  }
+  showName(*this, "Local Subnet Name", "getlocalsubnetname", &DynamicStore::Session::localHostName);
 }
 
 void ServerCommands::setComputerName(const std::string& name) {

@@ -13,20 +13,20 @@ void ServerCommands::getUsingNetworkTime() {
 void ServerCommands::setUsingNetworkTime(const std::string& onOff) {
   setError(false);
   if (checkForEmptyString(onOff, "setusingnetworktime", "either 'On' or 'Off'", "setusingnetworktime <on off>")) return;
-  const std::optional<bool> on = readOnOff(onOff, "setusingnetworktime");
-  if (!on) return;
-  NetworkTimeService& client = _context.host.networkTime();
-  if (client.isRunning() == *on) {
-    _context.output.putLine(*on ? "Network Time is already on." : "Network Time is already off.");
+  const auto isOn = readOnOff(onOff, "setusingnetworktime");
+  if (!isOn) return;
+  auto& client = _context.host.networkTime();
+  if (client.isRunning() == *isOn) {
+    _context.output.putLine(*isOn ? "Network Time is already on." : "Network Time is already off.");
     return;
   }
-  client.setLaunchAtStartup(*on);
-  *on ? client.start() : client.stop();
-  _context.output.print("setUsingNetworkTime: %s\n", *on ? "On" : "Off");
+  client.setLaunchAtStartup(*isOn);
+  *isOn ? client.start() : client.stop();
+  _context.output.print("setUsingNetworkTime: %s\n", *isOn ? "On" : "Off");
 }
 
 void ServerCommands::getNetworkTimeServer() {
-  const NetworkTimeServer server = _context.host.networkTime().server();
+  const auto server = _context.host.networkTime().server();
   _context.output.print("Network Time Server: %s\n", server.address.c_str());
   setError(false);
 }
@@ -35,7 +35,7 @@ void ServerCommands::setNetworkTimeServer(const std::string& address) {
   setError(false);
   if (checkForEmptyString(address, "setnetworktimeserver", "a valid time server", "setnetworktimeserver <timeserver>"))
     return;
-  NetworkTimeService& client = _context.host.networkTime();
+  auto& client = _context.host.networkTime();
   client.setServer({address});
   if (client.isRunning()) client.restartAsynchronously();
   _context.output.print("setNetworkTimeServer: %s\n", address.c_str());

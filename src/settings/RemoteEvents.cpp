@@ -1,7 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include <optional>
-
 #include "frontend/HandlerRegistry.h"
 #include "frontend/ServerCommands.h"
 
@@ -13,20 +11,20 @@ void ServerCommands::getRemoteVelmarEvents() {
 }
 
 void ServerCommands::setRemoteVelmarEvents(const std::string& onOff) {
-  RemoteEventsService& remoteEvents = _context.host.remoteEvents();
-  const bool enabled = remoteEvents.isEnabled();
+  auto& remoteEvents = _context.host.remoteEvents();
+  const auto isEnabled = remoteEvents.isEnabled();
   setError(false);
   if (checkForEmptyString(onOff, "setremotevelmarevents", "either 'On' or 'Off'", "setremotevelmarevents <on off>")) {
     return;
   }
-  const std::optional<bool> on = readOnOff(onOff, "setremotevelmarevents");
-  if (!on) return;
-  if (*on == enabled) {
-    _context.output.print("setremotevelmarevents: remote velmar events are already %s.\n", enabled ? "on" : "off");
+  const auto isOn = readOnOff(onOff, "setremotevelmarevents");
+  if (!isOn) return;
+  if (*isOn == isEnabled) {
+    _context.output.print("setremotevelmarevents: remote velmar events are already %s.\n", isEnabled ? "on" : "off");
     return;
   }
-  remoteEvents.setEnabled(*on);
-  _context.output.print("setremotevelmarevents: %s\n", *on ? "On" : "Off");
+  remoteEvents.setEnabled(*isOn);
+  _context.output.print("setremotevelmarevents: %s\n", *isOn ? "On" : "Off");
 }
 
 HandlerRows remoteEventsHandlers() {

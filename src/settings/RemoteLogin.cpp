@@ -24,14 +24,10 @@ constexpr std::size_t longestWatchdogFile = 1 << 16;
 constexpr std::size_t longestWatchdogLine = 63;
 constexpr int hangUp = 1;
 
-bool beginsWith(std::string_view line, std::string_view word) {
-  return compareIgnoringCase(line.substr(0, word.size()), word) == 0;
-}
-
 /// Only how the line begins counts: "yesterday" is a yes. Absent when it is neither.
 std::optional<bool> readYesNo(std::string_view line) {
-  if (beginsWith(line, "YES")) return true;
-  if (beginsWith(line, "NO")) return false;
+  if (beginsIgnoringCase(line, "YES")) return true;
+  if (beginsIgnoringCase(line, "NO")) return false;
   return std::nullopt;
 }
 
@@ -48,18 +44,18 @@ void ServerCommands::getRemoteLogin() {
 }
 
 void ServerCommands::setRemoteLogin(const std::string& onOff) {
-  RemoteShellService& remoteShell = _context.host.remoteShell();
-  const bool enabled = remoteShell.isEnabled();
+  auto& remoteShell = _context.host.remoteShell();
+  const auto isEnabled = remoteShell.isEnabled();
   setError(false);
   if (checkForEmptyString(onOff, "setremotelogin", "either 'On' or 'Off'", "setremotelogin <on off>")) return;
-  const std::optional<bool> on = readOnOff(onOff, "setremotelogin");
-  if (!on) return;
+  const auto isOn = readOnOff(onOff, "setremotelogin");
+  if (!isOn) return;
   // Asked also when it is off already: the answer comes before the look at the state.
-  if (!*on && _parent->promptUser() && !promptForRemoteLogin()) return;
-  if (*on == enabled) {
-    _context.output.print("setremotelogin: remote login is already %s.\n", enabled ? "On" : "Off");
+  if (!*isOn && _parent->promptUser() && !promptForRemoteLogin()) return;
+  if (*isOn == isEnabled) {
+    _context.output.print("setremotelogin: remote login is already %s.\n", isEnabled ? "On" : "Off");
   } else {
-    remoteShell.setEnabled(*on);
+    remoteShell.setEnabled(*isOn);
   }
 }
 
@@ -67,8 +63,8 @@ bool ServerCommands::promptForRemoteLogin() {
   const auto pause = _context.runLoop.pauseLimit();
   // The end of the input is no answer: the question goes on until a signal or a lost output ends the run.
   while (true) {
-    const std::optional<std::string> line = _context.input.readLine(question, answerBufferSize);
-    const std::optional<bool> answer = line ? readYesNo(*line) : std::nullopt;
+    const auto line = _context.input.readLine(question, answerBufferSize);
+    const auto answer = line ? readYesNo(*line) : std::nullopt;
     if (answer) return *answer;
   }
 }
@@ -78,9 +74,9 @@ ProcessId ServerCommands::remoteLoginPID() {
 }
 
 void ServerCommands::setWatchdogSignal() {
-  const std::string contents = _context.host.files().read(watchdogFile, longestWatchdogFile).valueOr("");
-  const std::string_view firstLine = std::string_view(contents).substr(0, contents.find('\n'));
-  const ProcessId watchdog = processIdIn(firstLine.substr(0, longestWatchdogLine));
+  const auto contents = _context.host.files().read(watchdogFile, longestWatchdogFile).valueOr("");
+  const auto firstLine = std::string_view(contents).substr(0, contents.find('\n'));
+  const auto watchdog = processIdIn(firstLine.substr(0, longestWatchdogLine));
   if (watchdog != 0) _context.host.processes().sendSignal(hangUp, watchdog);
 }
 

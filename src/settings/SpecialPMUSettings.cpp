@@ -26,24 +26,24 @@ std::optional<PropertyList::Dictionary> dictionaryOf(std::uint8_t value) {
 }  // namespace
 
 std::optional<PowerController::Service> SpecialPMUSettings::getServerIDInterface() {
-  if (const ControllerStatus status = _controller.masterPort(); status != 0) {
+  if (const auto status = _controller.masterPort(); status != 0) {
     _output.print("waitForStartupAfterPowerFailure: Error, IOMasterPort() returned: %#lx; unable to process request\n",
                   status);
     return std::nullopt;
   }
   for (const char* name : controllerClasses) {
-    if (std::optional<PowerController::Service> service = _controller.serviceOfClass(name)) return service;
+    if (auto service = _controller.serviceOfClass(name)) return service;
   }
   return std::nullopt;
 }
 
 std::int64_t SpecialPMUSettings::getServerIDValue() {
-  const std::optional<PowerController::Service> service = getServerIDInterface();
+  const auto service = getServerIDInterface();
   return service ? _controller.numberProperty(*service, serverID).value_or(0) : 0;
 }
 
 bool SpecialPMUSettings::setServerIDValue(std::uint8_t value) {
-  const std::optional<PowerController::Service> service = getServerIDInterface();
+  const auto service = getServerIDInterface();
   _systemLog.write("Set time to " + std::to_string(value));
   const auto [status, connection] = _controller.open(service, connectionType);
   if (status != 0) {
@@ -56,12 +56,12 @@ bool SpecialPMUSettings::setServerIDValue(std::uint8_t value) {
 }
 
 bool SpecialPMUSettings::writeServerID(const Connection& connection, std::uint8_t value) {
-  const std::optional<PropertyList::Dictionary> properties = dictionaryOf(value);
+  const auto properties = dictionaryOf(value);
   if (!properties) {
     _output.putLine("setWaitForStartupAfterPowerFailure: Error,Internal CF Dictionary could not be created. ");
     return false;
   }
-  if (const ControllerStatus status = _controller.setProperties(connection, *properties); status != 0) {
+  if (const auto status = _controller.setProperties(connection, *properties); status != 0) {
     _output.print("setWaitForStartupAfterPowerFailure: Error, IOConnectSetCFProperties returned %#lx\n", status);
     return false;
   }
@@ -69,7 +69,7 @@ bool SpecialPMUSettings::writeServerID(const Connection& connection, std::uint8_
 }
 
 void SpecialPMUSettings::close(const Connection& connection) {
-  if (const ControllerStatus status = _controller.close(connection); status != 0) {
+  if (const auto status = _controller.close(connection); status != 0) {
     _output.print("setWaitForStartupAfterPowerFailure: Error, IOServiceClose returned %#lx\n\n", status);
   }
 }

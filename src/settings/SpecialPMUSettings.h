@@ -13,7 +13,7 @@ namespace tavisk {
 
 /// The start-up delay after a power failure, as the power controller keeps it: one byte, in units of 30 seconds, under
 /// its property "ServerID".
-class SpecialPMUSettings {
+class SpecialPMUSettings final {
  public:
   /// Failures are printed on the output. Nothing is owned.
   SpecialPMUSettings(PowerController& controller, SystemLog& systemLog, Output& output)

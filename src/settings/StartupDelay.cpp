@@ -1,6 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <cstdint>
+#include <memory>
 
 #include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
@@ -20,12 +21,12 @@ std::int64_t secondsOf(std::int64_t units) {
 }  // namespace
 
 void ServerCommands::getWaitForStartupAfterPowerFailure() {
-  const std::int64_t units = sharedSpecialPMU().getTime();
+  const auto units = sharedSpecialPMU().getTime();
   _context.output.print("getwaitforstartupafterpowerfailure: %ld seconds\n", secondsOf(units));
 }
 
 void ServerCommands::setWaitForStartupAfterPowerFailure(const std::string& seconds) {
-  const std::int64_t wait = leadingInteger(seconds);
+  const auto wait = leadingInteger(seconds);
   setError(false);
   if (wait % secondsInUnit != 0) {
     _context.output.putLine("setwaitforstartupafterpowerfailure: Error, value must be divisible by 30.");

@@ -9,7 +9,7 @@
 
 namespace tavisk {
 
-std::string ServerCommands::localTimeZone() {
+std::string ServerCommands::localTimeZone() const {
   std::string ofMachine = _context.host.clock().timeZone();
   return _timeZone.value_or(ofMachine);
 }

@@ -1,12 +1,11 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include <optional>
-
 #include "frontend/HandlerRegistry.h"
 #include "frontend/RemotePrefsExtra.h"
 #include "frontend/ServerCommands.h"
 
 namespace tavisk {
+namespace {
 
 /// A switch that is kept for each power source and that not every machine has.
 struct SourceSwitch {
@@ -15,8 +14,6 @@ struct SourceSwitch {
   const char* setter;
   const char* usage;
 };
-
-namespace {
 
 constexpr const char* onOrOff = "either 'On' or 'Off'";
 
@@ -27,57 +24,76 @@ constexpr SourceSwitch wakeOnNetworkAccess = {PowerSwitch::wakeOnNetworkAccess, 
 constexpr SourceSwitch restartPowerFailure = {PowerSwitch::restartAfterPowerFailure, "Restart After Power Failure",
                                               "setrestartpowerfailure", "setrestartpowerfailure <on off>"};
 
-const char* wordFor(bool on) {
-  return on ? "On" : "Off";
+const char* wordFor(bool isOn) {
+  return isOn ? "On" : "Off";
+}
+
+/// "On", "Off", or `otherwise` on a machine that does not have the switch.
+const char* stateOf(PowerSettingsService& power, PowerSwitch which, const char* otherwise) {
+  const PowerSource source{ServerCommands::getPMKey()};
+  return power.supports(which, source) ? wordFor(power.isOn(which, source)) : otherwise;
+}
+
+void showSwitch(ServerCommands& commands, const SourceSwitch& row) {
+  const auto& context = commands.context();
+  context.output.print("%s: %s\n", row.label,
+                       stateOf(context.host.powerSettings(), row.which, "Not supported on this machine."));
+  commands.setError(false);
+}
+
+void setSwitch(ServerCommands& commands, const SourceSwitch& row, const std::string& onOff) {
+  const auto& context = commands.context();
+  auto& power = context.host.powerSettings();
+  commands.setError(false);
+  if (commands.checkForEmptyString(onOff, row.setter, onOrOff, row.usage)) return;
+  if (!power.canSet(row.which, {ServerCommands::getPMKey()})) {
+    context.output.print("%s: Not supported on this machine.\n", row.label);
+    commands.setError(true);
+    return;
+  }
+  const auto isOn = commands.readOnOff(onOff, row.setter);
+  if (!isOn) return;
+  power.setOn(row.which, {ServerCommands::getPMKey()}, *isOn);
+  context.output.print("%s: %s\n", row.setter, wordFor(*isOn));
+}
+
+void allowPowerButton(const CommandContext& context, const std::string& onOff) {
+  const PowerSource source{ServerCommands::getPMKey()};
+  auto& power = context.host.powerSettings();
+  if (!power.canSet(PowerSwitch::powerButtonSleep, source)) {
+    context.output.putLine("setallowpowerbuttontosleepcomputer: Error, this feature is not supported on this machine.");
+    return;
+  }
+  const auto isOff = caseInsensitiveEqualTo(onOff, "Off");
+  // Any other word changes nothing, and is answered as "On" is.
+  if (isOff || caseInsensitiveEqualTo(onOff, "On")) power.setOn(PowerSwitch::powerButtonSleep, source, !isOff);
+  context.output.print("setallowpowerbuttontosleepcomputer: %s\n", wordFor(!isOff));
 }
 
 }  // namespace
 
 void ServerCommands::getWakeOnModem() {
-  showSourceSwitch(wakeOnModem);
+  showSwitch(*this, wakeOnModem);
 }
 
 void ServerCommands::setWakeOnModem(const std::string& onOff) {
-  setSourceSwitch(wakeOnModem, onOff);
+  setSwitch(*this, wakeOnModem, onOff);
 }
 
 void ServerCommands::getWakeOnNetworkAccess() {
-  showSourceSwitch(wakeOnNetworkAccess);
+  showSwitch(*this, wakeOnNetworkAccess);
 }
 
 void ServerCommands::setWakeOnNetworkAccess(const std::string& onOff) {
-  setSourceSwitch(wakeOnNetworkAccess, onOff);
+  setSwitch(*this, wakeOnNetworkAccess, onOff);
 }
 
 void ServerCommands::getRestartPowerFailure() {
-  showSourceSwitch(restartPowerFailure);
+  showSwitch(*this, restartPowerFailure);
 }
 
 void ServerCommands::setRestartPowerFailure(const std::string& onOff) {
-  setSourceSwitch(restartPowerFailure, onOff);
-}
-
-void ServerCommands::showSourceSwitch(const SourceSwitch& row) {
-  PowerSettingsService& power = _context.host.powerSettings();
-  const bool supported = power.supports(row.which, {getPMKey()});
-  _context.output.print("%s: %s\n", row.label,
-                        supported ? wordFor(power.isOn(row.which, {getPMKey()})) : "Not supported on this machine.");
-  setError(false);
-}
-
-void ServerCommands::setSourceSwitch(const SourceSwitch& row, const std::string& onOff) {
-  PowerSettingsService& power = _context.host.powerSettings();
-  setError(false);
-  if (checkForEmptyString(onOff, row.setter, onOrOff, row.usage)) return;
-  if (!power.canSet(row.which, {getPMKey()})) {
-    _context.output.print("%s: Not supported on this machine.\n", row.label);
-    setError(true);
-    return;
-  }
-  const std::optional<bool> on = readOnOff(onOff, row.setter);
-  if (!on) return;
-  power.setOn(row.which, {getPMKey()}, *on);
-  _context.output.print("%s: %s\n", row.setter, wordFor(*on));
+  setSwitch(*this, restartPowerFailure, onOff);
 }
 
 void ServerCommands::getRestartFreeze() {
@@ -86,41 +102,26 @@ void ServerCommands::getRestartFreeze() {
 }
 
 void ServerCommands::setRestartFreeze(const std::string& onOff) {
-  PowerSettingsService& power = _context.host.powerSettings();
+  auto& power = _context.host.powerSettings();
   setError(false);
   if (checkForEmptyString(onOff, "setrestartfreeze", onOrOff, "setrestartfreeze <on off>")) return;
-  if (const std::optional<bool> on = readOnOff(onOff, "setrestartfreeze")) power.setRestartsAfterFreeze(*on);
+  if (const auto isOn = readOnOff(onOff, "setrestartfreeze")) power.setRestartsAfterFreeze(*isOn);
 }
 
 void ServerCommands::getAllowPowerButtonToSleepComputer() {
-  PowerSettingsService& power = _context.host.powerSettings();
-  const bool supported = power.supports(PowerSwitch::powerButtonSleep, {getPMKey()});
   _context.output.print("getAllowPowerButtonToSleepComputer: %s\n",
-                        supported ? wordFor(power.isOn(PowerSwitch::powerButtonSleep, {getPMKey()}))
-                                  : "Error, this feature is not supported on this machine.");
+                        stateOf(_context.host.powerSettings(), PowerSwitch::powerButtonSleep,
+                                "Error, this feature is not supported on this machine."));
   setError(false);
 }
 
 void ServerCommands::setAllowPowerButtonToSleepComputer(const std::string& onOff) {
   if (!checkForEmptyString(onOff, "setallowpowerbuttontosleepcomputer", onOrOff,
                            "setallowpowerbuttontosleepcomputer <on off>")) {
-    allowPowerButton(onOff);
+    allowPowerButton(_context, onOff);
   }
   // Whatever happened, an empty word included.
   setError(false);
-}
-
-void ServerCommands::allowPowerButton(const std::string& onOff) {
-  PowerSettingsService& power = _context.host.powerSettings();
-  if (!power.canSet(PowerSwitch::powerButtonSleep, {getPMKey()})) {
-    _context.output.putLine(
-        "setallowpowerbuttontosleepcomputer: Error, this feature is not supported on this machine.");
-    return;
-  }
-  const bool off = caseInsensitiveEqualTo(onOff, "Off");
-  // Any other word changes nothing, and is answered as "On" is.
-  if (off || caseInsensitiveEqualTo(onOff, "On")) power.setOn(PowerSwitch::powerButtonSleep, {getPMKey()}, !off);
-  _context.output.print("setallowpowerbuttontosleepcomputer: %s\n", wordFor(!off));
 }
 
 HandlerRows wakeAndRestartHandlers() {

@@ -17,13 +17,9 @@ constexpr std::size_t gap = 2;
 using Names = std::span<const std::string>;
 
 std::string_view commonBeginning(std::string_view one, std::string_view other) {
-  std::size_t length = std::min(one.size(), other.size());
+  auto length = std::min(one.size(), other.size());
   while (compareIgnoringCase(one.substr(0, length), other.substr(0, length)) != 0) --length;
   return one.substr(0, length);
-}
-
-bool isContinuation(char byte) {
-  return (static_cast<unsigned char>(byte) & 0xC0U) == 0x80U;
 }
 
 std::size_t lengthOf(const std::string& name) {
@@ -42,7 +38,7 @@ std::vector<std::size_t> widthsOfColumns(Names names, std::size_t rows) {
 /// The fewest that fit.
 std::size_t rowsFor(Names names, std::size_t width) {
   for (std::size_t rows = 1; rows < names.size(); ++rows) {
-    const std::vector<std::size_t> widths = widthsOfColumns(names, rows);
+    const auto widths = widthsOfColumns(names, rows);
     if (std::accumulate(widths.begin(), widths.end(), std::size_t{0}) <= width + gap) return rows;
   }
   return names.size();
@@ -54,7 +50,7 @@ std::string completedWord(std::string_view typed, const std::vector<std::string>
   if (candidates.empty()) return {};
   if (candidates.size() == 1) return candidates.front() + (candidates.front().ends_with('/') ? "" : " ");
   std::string_view common = candidates.front();
-  for (const std::string& candidate : candidates) common = commonBeginning(common, candidate);
+  for (const auto& candidate : candidates) common = commonBeginning(common, candidate);
   while (!common.empty() && !isUtf8(common)) common.remove_suffix(1);
   return common.size() > typed.size() ? std::string(common) : std::string();
 }
@@ -62,8 +58,8 @@ std::string completedWord(std::string_view typed, const std::vector<std::string>
 std::string columnsOf(const std::vector<std::string>& candidates, std::size_t width) {
   const Names shown(candidates.data(), std::min(candidates.size(), shownAtMost));
   if (shown.empty()) return {};
-  const std::size_t rows = rowsFor(shown, width);
-  const std::vector<std::size_t> widths = widthsOfColumns(shown, rows);
+  const auto rows = rowsFor(shown, width);
+  const auto widths = widthsOfColumns(shown, rows);
   std::string text;
   for (std::size_t row = 0; row < rows; ++row) {
     for (std::size_t index = row; index < shown.size(); index += rows) {
@@ -72,7 +68,7 @@ std::string columnsOf(const std::vector<std::string>& candidates, std::size_t wi
     }
     text += '\n';
   }
-  const std::size_t missing = candidates.size() - shown.size();
+  const auto missing = candidates.size() - shown.size();
   return missing == 0 ? text : text + "... and " + std::to_string(missing) + " more\n";
 }
 

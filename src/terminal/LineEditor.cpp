@@ -9,11 +9,9 @@
 #include <cstddef>
 #include <cstdio>
 #include <utility>
-#include <vector>
 
 #include "base/Text.h"
 #include "terminal/Candidates.h"
-#include "terminal/WideText.h"
 
 namespace tavisk {
 namespace {
@@ -76,7 +74,7 @@ void LineEditor::bindKeys() {
   _library.el_wset(_edit, EL_HIST, _library.history_w, _history);
   _library.el_wset(_edit, EL_ADDFN, L"tavisk-complete", L"Complete", &run<&LineEditor::complete>);
   _library.el_wset(_edit, EL_ADDFN, L"tavisk-delete-or-end", L"Delete", &run<&LineEditor::deleteOrEnd>);
-  for (const KeyBinding& binding : keyBindings) _library.el_wset(_edit, EL_BIND, binding.key, binding.command, nullptr);
+  for (const auto& binding : keyBindings) _library.el_wset(_edit, EL_BIND, binding.key, binding.command, nullptr);
 }
 
 std::optional<std::string> LineEditor::readLine(const std::string& prompt, const LineSource::Completions& completions) {
@@ -88,10 +86,10 @@ std::optional<std::string> LineEditor::readLine(const std::string& prompt, const
   // By itself the library does it after the prompt is seen: too late for who types at once.
   _library.el_wset(_edit, EL_PREP_TERM, 1);
   int length = 0;
-  const wchar_t* text = _library.el_wgets(_edit, &length);
+  const auto* text = _library.el_wgets(_edit, &length);
   _signals = nullptr;
   _completions = nullptr;
-  if (const std::exception_ptr failure = std::exchange(_failure, nullptr)) std::rethrow_exception(failure);
+  if (const auto failure = std::exchange(_failure, nullptr)) std::rethrow_exception(failure);
   if (!text || length <= 0) return std::nullopt;
   const std::wstring line(text, static_cast<std::size_t>(length));
   remember(line);
@@ -99,7 +97,7 @@ std::optional<std::string> LineEditor::readLine(const std::string& prompt, const
 }
 
 void LineEditor::remember(const std::wstring& line) {
-  const std::wstring text = line.substr(0, line.find(L'\n'));
+  const auto text = line.substr(0, line.find(L'\n'));
   if (text.find_first_not_of(L' ') == std::wstring::npos) return;
   HistEventW event{};
   _library.history_w(_history, &event, H_ENTER, text.c_str());
@@ -137,9 +135,9 @@ wchar_t* LineEditor::promptOf(EditLine* edit) {
 }
 
 int LineEditor::takeKey(EditLine* edit, wchar_t* key) {
-  LineEditor& editor = of(edit);
+  auto& editor = of(edit);
   try {
-    const std::optional<wchar_t> typed = editor._keys.next(*editor._signals);
+    const auto typed = editor._keys.next(*editor._signals);
     if (!typed) return 0;
     *key = *typed;
     return 1;
@@ -151,7 +149,7 @@ int LineEditor::takeKey(EditLine* edit, wchar_t* key) {
 
 template <LineEditor::Command command>
 unsigned char LineEditor::run(EditLine* edit, wint_t /*key*/) {
-  LineEditor& editor = of(edit);
+  auto& editor = of(edit);
   try {
     return (editor.*command)();
   } catch (...) {
@@ -161,11 +159,11 @@ unsigned char LineEditor::run(EditLine* edit, wint_t /*key*/) {
 }
 
 unsigned char LineEditor::complete() {
-  const LineInfoW* line = _library.el_wline(_edit);
-  const std::string text = bytesOf({line->buffer, line->cursor});
-  const std::string typed = text.substr(text.rfind(' ') + 1);
-  const std::vector<std::string> candidates = (*_completions)(text);
-  const std::string word = completedWord(typed, candidates);
+  const auto* line = _library.el_wline(_edit);
+  const auto text = bytesOf({line->buffer, line->cursor});
+  const auto typed = text.substr(text.rfind(' ') + 1);
+  const auto candidates = (*_completions)(text);
+  const auto word = completedWord(typed, candidates);
   if (!word.empty()) return replace(typed, word);
   if (candidates.empty()) return CC_ERROR;
   printAside([&] { std::fputs(columnsOf(candidates, widthOfScreen()).c_str(), stdout); });
@@ -178,7 +176,7 @@ unsigned char LineEditor::replace(const std::string& typed, const std::string& w
 }
 
 unsigned char LineEditor::deleteOrEnd() {
-  const LineInfoW* line = _library.el_wline(_edit);
+  const auto* line = _library.el_wline(_edit);
   if (line->buffer == line->lastchar) return CC_EOF;
   if (line->cursor == line->lastchar) return CC_ERROR;
   _library.el_cursor(_edit, 1);

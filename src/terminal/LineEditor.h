@@ -14,14 +14,13 @@
 #include "frontend/LineSource.h"
 #include "terminal/EditLibrary.h"
 #include "terminal/TerminalKeys.h"
-#include "terminal/TerminalSignals.h"
-#include "terminal/Utf8Locale.h"
+#include "terminal/WideText.h"
 
 namespace tavisk {
 
 /// Edits lines at the terminal on standard input and output, with a history of them and completion. The run loop runs
 /// while it waits for keys. Text is UTF-8, whatever the locale.
-class LineEditor {
+class LineEditor final {
  public:
   /// Fails where there is no libedit.
   static Result<std::unique_ptr<LineEditor>> open(RunLoop& runLoop);

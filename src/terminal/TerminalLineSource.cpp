@@ -14,7 +14,7 @@ namespace tavisk {
 namespace {
 
 bool canMoveTheCursor() {
-  const char* terminal = std::getenv("TERM");
+  const auto* terminal = std::getenv("TERM");
   return terminal && *terminal != '\0' && std::string_view(terminal) != "dumb";
 }
 
@@ -30,7 +30,7 @@ std::optional<std::string> TerminalLineSource::readCommandLine(const std::string
                                                                const Completions& completions) {
   if (!_wasOpened) openEditor();
   if (!_editor || !_rest.empty()) return readLine(prompt, room);
-  std::optional<std::string> line = edit(prompt, completions);
+  auto line = edit(prompt, completions);
   if (!line) return std::nullopt;
   _rest = *std::move(line);
   return takePiece(room);
@@ -39,7 +39,7 @@ std::optional<std::string> TerminalLineSource::readCommandLine(const std::string
 void TerminalLineSource::openEditor() {
   _wasOpened = true;
   if (::isatty(STDOUT_FILENO) == 0 || ::tcgetattr(STDIN_FILENO, &_found) != 0 || !canMoveTheCursor()) return;
-  Result<std::unique_ptr<LineEditor>> editor = LineEditor::open(_runLoop);
+  auto editor = LineEditor::open(_runLoop);
   if (!editor) return;
   _editor = std::move(editor).value();
   // The editor and the plain reader take turns: neither may keep what is for the other.
@@ -49,14 +49,14 @@ void TerminalLineSource::openEditor() {
 std::optional<std::string> TerminalLineSource::edit(const std::string& prompt, const Completions& completions) {
   _output.flush();
   _isEditing = true;
-  std::optional<std::string> line = _editor->readLine(prompt, completions);
+  auto line = _editor->readLine(prompt, completions);
   _isEditing = false;
   return line;
 }
 
 std::string TerminalLineSource::takePiece(std::size_t room) {
-  const std::size_t newline = std::min(_rest.find('\n'), _rest.size() - 1);
-  std::string piece = _rest.substr(0, std::min(room - 1, newline + 1));
+  const auto newline = std::min(_rest.find('\n'), _rest.size() - 1);
+  auto piece = _rest.substr(0, std::min(room - 1, newline + 1));
   _rest.erase(0, piece.size());
   piece.resize(std::min(piece.size(), piece.find('\0')));
   return piece;

@@ -13,7 +13,6 @@
 #include "base/RunLoop.h"
 #include "frontend/LineSource.h"
 #include "terminal/LineEditor.h"
-#include "terminal/StreamLineSource.h"
 
 namespace tavisk {
 

@@ -13,7 +13,7 @@
 namespace tavisk {
 
 bool TerminalLog::wanted() {
-  const char* log = std::getenv("TAVISK_LOG");
+  const auto* log = std::getenv("TAVISK_LOG");
   return isatty(STDERR_FILENO) != 0 || (log && std::string_view(log) == "stderr");
 }
 

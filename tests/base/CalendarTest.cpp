@@ -45,7 +45,7 @@ TEST_F(CalendarTest, goesBothWays) {
       // Local mean time, before there were zones: 4 h 56 min 2 s behind.
       {"America/New_York", -62135579038, {1, 1, 1, 0, 0, 0}},
   };
-  for (const Case& now : cases) {
+  for (const auto& now : cases) {
     useZone(now.zone);
     EXPECT_EQ(localDateTime(now.seconds), now.local) << now.zone;
     EXPECT_EQ(secondsSince1970(now.local), static_cast<double>(now.seconds)) << now.zone;
@@ -82,7 +82,7 @@ TEST_F(CalendarTest, decidesAtChangesOfTheOffset) {
       {"24:00 of the day before", "Europe/Paris", {2024, 3, 30, 24, 0, 0}, 1711839600},
       {"a day left out", "Pacific/Apia", {2011, 12, 30, 12, 0, 0}, 1325282400},  // the 31st
   };
-  for (const Case& now : cases) {
+  for (const auto& now : cases) {
     useZone(now.zone);
     EXPECT_EQ(secondsSince1970(now.local), static_cast<double>(now.seconds)) << now.zone << ' ' << now.what;
   }
@@ -94,7 +94,7 @@ TEST_F(CalendarTest, returnsToEveryTimeThatHappensOnce) {
     useZone(zone);
     for (int round = 0; round < 5000; ++round) {
       const std::int64_t seconds = static_cast<std::int64_t>(random() % 315'537'897'600) - 62'135'596'800;
-      const DateTime local = localDateTime(seconds);
+      const auto local = localDateTime(seconds);
       const auto back = static_cast<std::int64_t>(secondsSince1970(local));
       ASSERT_EQ(localDateTime(back), local) << zone << ' ' << seconds;
       ASSERT_LE(back, seconds) << zone << ": the first of two";

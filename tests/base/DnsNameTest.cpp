@@ -22,5 +22,4 @@ TEST(DnsName, isMadeOfLabels) {
 }
 
 }  // namespace
-
 }  // namespace tavisk

@@ -31,12 +31,12 @@ std::string nestedArrays(int depth) {
 }
 
 std::string whyRefused(std::string_view xml, const PropertyListLimits& limits = foreignFileLimits) {
-  const Result<PropertyList> read = parsePropertyList(xml, limits);
+  const auto read = parsePropertyList(xml, limits);
   return read ? "accepted" : read.failure().why;
 }
 
 TEST(PropertyListDictionary, keepsItsOrderAndItsIndexThroughChanges) {
-  Dictionary dictionary = dictionaryOf({{"a", 1}, {"b", 2}, {"c", 3}, {"d", 4}});
+  auto dictionary = dictionaryOf({{"a", 1}, {"b", 2}, {"c", 3}, {"d", 4}});
   dictionary.set("b", "two");
   dictionary.remove("a");
   dictionary.remove("nothing");
@@ -83,7 +83,7 @@ TEST(PropertyListXml, readsEveryKindOfValueAlsoAsItWroteIt) {
       {"<data/>", Data()},
   };
   for (const auto& [xml, expected] : cases) {
-    const Result<PropertyList> read = parsePropertyList(xml, foreignFileLimits);
+    const auto read = parsePropertyList(xml, foreignFileLimits);
     ASSERT_TRUE(read) << xml << ": " << read.failure().why;
     EXPECT_EQ(*read, expected) << xml;
     EXPECT_EQ(*parsePropertyList(writePropertyList(*read).value(), ownFileLimits), expected) << xml;
@@ -99,7 +99,7 @@ TEST(PropertyListXml, readsAFileWithAndWithoutItsFrame) {
   const std::string type = "<!DOCTYPE plist PUBLIC \"-//X//DTD 1.0//EN\" \"http://nowhere.invalid/x.dtd\">\n";
   for (const std::string& xml : {bare, "\n<!-- c -->" + bare + "\n", declaration + bare,
                                  declaration + type + "<plist version=\"1.0\">" + bare + "</plist>\n<!-- c -->"}) {
-    const Result<PropertyList> read = parsePropertyList(xml, foreignFileLimits);
+    const auto read = parsePropertyList(xml, foreignFileLimits);
     ASSERT_TRUE(read) << xml << ": " << read.failure().why;
     EXPECT_EQ(*read, expected) << xml;
   }
@@ -172,7 +172,7 @@ TEST(PropertyListXml, keepsItsLimits) {
 TEST(PropertyListXml, writesAFile) {
   const PropertyList value = dictionaryOf({{"a<", Array{"&\r", -1, 1.5, true, Date{-1}, Data{255, 1}}},
                                            {"b", dictionaryOf({{"e", Dictionary()}, {"f", Array()}, {"g", false}})}});
-  const Result<std::string> written = writePropertyList(value);
+  const auto written = writePropertyList(value);
   ASSERT_TRUE(written);
   EXPECT_EQ(*written, R"(<?xml version="1.0" encoding="UTF-8"?>
 <plist version="1.0">

@@ -13,13 +13,6 @@ namespace tavisk {
 namespace {
 
 using ::testing::ElementsAre;
-using ::testing::IsEmpty;
-
-Effect effectOf(const std::string& setting) {
-  Effect effect;
-  effect.setting = setting;
-  return effect;
-}
 
 TEST(EffectSink, tellsEveryChannel) {
   EffectSink sink;
@@ -28,31 +21,34 @@ TEST(EffectSink, tellsEveryChannel) {
   sink.addChannel(first);
   sink.addChannel(second);
   sink.changeBegins("Time", "5");
-  sink.record(effectOf("Time"));
-  sink.observe({"Time", "5", std::nullopt, ""});
-  EXPECT_THAT(first.lines, ElementsAre("begins Time 5", R"({"setting":"Time","outcome":"applied"})",
-                                       R"({"setting":"Time","live":"5"})"));
-  EXPECT_EQ(first.lines, second.lines);
+  sink.record({.setting = "Time"});
+  sink.observe({.setting = "Time", .live = "5"});
+  for (const auto* log : {&first, &second}) {
+    EXPECT_EQ(log->lines.front(), "begins Time 5");
+    EXPECT_THAT(log->effects, ElementsAre(Effect{.setting = "Time"}));
+    EXPECT_THAT(log->values, ElementsAre(SettingValue{.setting = "Time", .live = "5"}));
+  }
 }
 
 TEST(EffectSink, closesOnlyOpenChangesWhenInterrupted) {
   EffectSink sink;
   EffectLog log;
   for (const char* setting : {"A", "B", "A", "C"}) sink.changeBegins(setting, "x");
-  sink.record(effectOf("A"));
-  sink.record(effectOf("C"));
-  sink.record(effectOf("never begun"));
+  sink.record({.setting = "A"});
+  sink.record({.setting = "C"});
+  sink.record({.setting = "never begun"});
   sink.addChannel(log);
   sink.interrupt("ended by SIGINT");
   const auto ended = [](const std::string& name) {
-    return R"({"setting":")" + name + R"(","outcome":"failed","asked":"x","tried":"change","on":")" + name +
-           R"(","why":"ended by SIGINT"})";
+    return Effect{.setting = name,
+                  .outcome = Outcome::failed,
+                  .asked = "x",
+                  .failure = Failure{"change", name, "ended by SIGINT"}};
   };
-  EXPECT_THAT(log.lines, ElementsAre(ended("B"), ended("A")));
+  EXPECT_THAT(log.effects, ElementsAre(ended("B"), ended("A")));
 
-  log.lines.clear();
   sink.interrupt("ended again");
-  EXPECT_THAT(log.lines, IsEmpty());
+  EXPECT_EQ(log.effects.size(), 2U);
 }
 
 /// A channel whose record() does what a test wants.
@@ -69,7 +65,7 @@ TEST(EffectSink, doesNotHangOnAChannelThatDoes) {
   EffectSink sink;
   BusyChannel stuck([&] { std::thread([&] { sink.interrupt("ended by SIGTERM"); }).join(); });
   sink.addChannel(stuck);
-  sink.record(effectOf("Time"));
+  sink.record({.setting = "Time"});
 }
 
 TEST(EffectSink, callsItsChannelsOneAtATime) {
@@ -80,10 +76,10 @@ TEST(EffectSink, callsItsChannelsOneAtATime) {
   std::vector<std::thread> threads;
   for (int thread = 0; thread < 4; ++thread) {
     threads.emplace_back([&sink] {
-      for (int call = 0; call < 1000; ++call) sink.record(effectOf("Time"));
+      for (int call = 0; call < 1000; ++call) sink.record({.setting = "Time"});
     });
   }
-  for (std::thread& thread : threads) thread.join();
+  for (auto& thread : threads) thread.join();
   EXPECT_EQ(calls, 4000);
 }
 

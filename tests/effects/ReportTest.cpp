@@ -96,33 +96,30 @@ TEST_F(ReportTest, appendsToAFileOfItsOwner) {
 
 TEST_F(ReportTest, writesToAnOpenDescriptor) {
   int ends[2];
-  ASSERT_EQ(pipe(ends), 0);
-  Report::open("fd:" + std::to_string(ends[1])).value()->runRefused("x", "");
-  EXPECT_EQ(write(ends[1], "open\n", 5), 5);
+  ASSERT_EQ(::pipe(ends), 0);
+  const FileDescriptor reader(ends[0]);
+  const FileDescriptor named(ends[1]);
+  Report::open("fd:" + std::to_string(named.number())).value()->runRefused("x", "");
+  EXPECT_EQ(::write(named.number(), "open\n", 5), 5);
   char text[256] = {};
-  EXPECT_GT(read(ends[0], text, sizeof text - 1), 0);
+  EXPECT_GT(::read(reader.number(), text, sizeof text - 1), 0);
   EXPECT_THAT(text, ::testing::EndsWith("\"output\":\"\"}\nopen\n"));
-  close(ends[0]);
-  close(ends[1]);
 }
 
 TEST_F(ReportTest, refusesWhatIsNoFileOfItsOwn) {
   folder.write("file", "");
   fs::create_symlink("file", folder.path() / "link");
   ASSERT_EQ(mkfifo((folder.path() / "fifo").c_str(), 0600), 0);
-  const int reader = open((folder.path() / "fifo").c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
+  const FileDescriptor reader(::open((folder.path() / "fifo").c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
   for (const char* name : {"link", "fifo", "no/such/folder", "."}) {
     EXPECT_FALSE(Report::open(folder.path() / name)) << name;
   }
-  const int readable = open((folder.path() / "file").c_str(), O_RDONLY | O_CLOEXEC);
+  const FileDescriptor readable(::open((folder.path() / "file").c_str(), O_RDONLY | O_CLOEXEC));
   for (const std::string name : {"", "fd:", "fd:-1", "fd:1x", "fd: 1", "fd:99999999999", "fd:987", "/dev/null"}) {
     EXPECT_FALSE(Report::open(name)) << name;
   }
-  EXPECT_FALSE(Report::open("fd:" + std::to_string(readable)));
-  close(readable);
-  close(reader);
+  EXPECT_FALSE(Report::open("fd:" + std::to_string(readable.number())));
 }
 
 }  // namespace
-
 }  // namespace tavisk

@@ -14,8 +14,8 @@ constexpr const char* machineWithAllSwitches =
     "<key>Power Button Sleep</key><true/></dict></dict></dict>";
 
 TEST(CommandList, offersWordsThatTheCommandsAccept) {
-  for (const ListedCommand& command : listCommands()) {
-    for (const std::string_view word : fixedValues(command.argument)) {
+  for (const auto& command : listCommands()) {
+    for (const auto word : fixedValues(command.argument)) {
       ScratchMachine machine;
       machine.describe(machineWithAllSwitches);
       const auto run = runTool(machine, {"-f", command.word, std::string(word)});

@@ -57,5 +57,4 @@ TEST(Dispatch, repeatsAnInvalidCountUntilNobodyListens) {
 }
 
 }  // namespace
-
 }  // namespace tavisk

@@ -17,10 +17,10 @@ CommandTable productTable() {
 }
 
 TEST(HandlerRegistry, agreesWithTheCommandTable) {
-  const CommandTable table = productTable();
+  const auto table = productTable();
   std::multiset<std::string> expected;
-  for (const HandlerRows& family : handlerFamilies()) {
-    for (const HandlerRow& row : family) expected.emplace(row.selector);
+  for (const auto& family : handlerFamilies()) {
+    for (const auto& row : family) expected.emplace(row.selector);
   }
   std::multiset<std::string> selectors;
   for (const auto& [word, entry] : table.entries()) {
@@ -33,13 +33,13 @@ TEST(HandlerRegistry, agreesWithTheCommandTable) {
 }
 
 TEST(HandlerRegistry, agreesWithTheHelp) {
-  const CommandTable table = productTable();
+  const auto table = productTable();
   std::set<std::string> untold;
   for (const auto& [word, entry] : table.entries()) untold.insert(word);
-  for (const HelpEntry& entry : helpEntries()) {
+  for (const auto& entry : helpEntries()) {
     std::string word = entry.word;
     if (word == "-printCommands") word = "-printcommands";
-    const CommandTable::Entry* row = table.find(word);
+    const auto* row = table.find(word);
     ASSERT_TRUE(row) << word;
     EXPECT_EQ(*entry.placeholder != '\0', row->arguments == 1) << word;
     EXPECT_EQ(untold.erase(word), 1U) << word;
@@ -48,5 +48,4 @@ TEST(HandlerRegistry, agreesWithTheHelp) {
 }
 
 }  // namespace
-
 }  // namespace tavisk

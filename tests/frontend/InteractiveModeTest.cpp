@@ -26,5 +26,4 @@ TEST(InteractiveMode, takesLongLinesInPieces) {
 }
 
 }  // namespace
-
 }  // namespace tavisk

@@ -26,5 +26,4 @@ TEST(RemoteServerSettings, needsItsCommandTable) {
 }
 
 }  // namespace
-
 }  // namespace tavisk

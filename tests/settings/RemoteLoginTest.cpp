@@ -30,5 +30,4 @@ TEST(RemoteLogin, keepsAskingAtTheEndOfTheInputUntilTheOutputIsLost) {
 }
 
 }  // namespace
-
 }  // namespace tavisk

@@ -69,5 +69,4 @@ TEST_F(ReservedCommands, findTheServerOfRemoteLogin) {
 }
 
 }  // namespace
-
 }  // namespace tavisk

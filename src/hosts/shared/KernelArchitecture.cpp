@@ -11,14 +11,14 @@ using Contents = Result<std::optional<PropertyList::Dictionary>>;
 
 Result<std::optional<std::string>> architectureOf(const Contents& read) {
   if (!read) return read.failure();
-  return std::optional(architectureIn(read->value_or(PropertyList::Dictionary())));
+  return architectureIn(read->value_or(PropertyList::Dictionary()));
 }
 
 }  // namespace
 
 std::string architectureIn(const PropertyList::Dictionary& contents) {
-  const PropertyList* value = contents.find(BootLoaderFile::architectureKey);
-  const std::string* architecture = value ? value->asString() : nullptr;
+  const auto* value = contents.find(BootLoaderFile::architectureKey);
+  const auto* architecture = value ? value->asString() : nullptr;
   return architecture ? *architecture : "default";
 }
 

@@ -5,7 +5,6 @@
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/un.h>
-#include <unistd.h>
 
 #include "TemporaryFolder.h"
 #include "hosts/shared/RootedFileSystem.h"
@@ -75,7 +74,7 @@ TEST_F(RootedFileSystemTest, tellsWhatWasTriedOnWhichPathAndWhy) {
       {"/large", "larger than 99 bytes"},
   };
   for (const auto& [path, why] : cases) {
-    auto read = files.read(path, 99);
+    const auto read = files.read(path, 99);
     ASSERT_FALSE(read) << path;
     EXPECT_EQ(read.failure().on, path);
     EXPECT_EQ(read.failure().why, why);
@@ -86,16 +85,15 @@ TEST_F(RootedFileSystemTest, tellsWhatWasTriedOnWhichPathAndWhy) {
 
 TEST_F(RootedFileSystemTest, opensNothingButRegularFiles) {
   ASSERT_EQ(::mkfifo(at("/fifo").c_str(), 0600), 0);
-  int socket = ::socket(AF_UNIX, SOCK_STREAM, 0);
+  const FileDescriptor socket(::socket(AF_UNIX, SOCK_STREAM, 0));
   sockaddr_un address{};
   address.sun_family = AF_UNIX;
   at("/socket").string().copy(address.sun_path, sizeof address.sun_path - 1);
-  ASSERT_EQ(::bind(socket, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+  ASSERT_EQ(::bind(socket.number(), reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
   for (const char* path : {"/fifo", "/socket"}) {
     EXPECT_TRUE(files.exists(path));
     EXPECT_EQ(files.read(path, 99).failure().why, "not a regular file") << path;
   }
-  ::close(socket);
 }
 
 TEST_F(RootedFileSystemTest, endsOnAnEndlessChainOfLinks) {

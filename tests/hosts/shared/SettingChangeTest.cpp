@@ -3,6 +3,8 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <cerrno>
+
 #include "effects/EffectLog.h"
 #include "hosts/shared/SettingChange.h"
 
@@ -39,14 +41,24 @@ class SettingChangeTest : public ::testing::Test {
     return {};
   }
 
-  /// The JSON of the effect without the members that are the same in every case.
-  std::string change(const std::string& asked) {
-    const Effect effect = carryOut(setting, asked, sink, loop);
-    std::string json = toJson(effect);
-    EXPECT_EQ(log.lines.back(), json) << "the sink is told what the caller is told";
-    const std::string same = R"(,"where":"/etc/sleep.conf","undoneBy":"a daemon")";
-    if (const std::size_t place = json.find(same); place != std::string::npos) json.erase(place, same.size());
-    return json;
+  Effect change(const std::string& asked) {
+    auto effect = carryOut(setting, asked, sink, loop);
+    EXPECT_EQ(log.effects.back(), effect) << "the sink is told what the caller is told";
+    return effect;
+  }
+
+  using Text = std::optional<std::string>;
+  /// The effect of a change to "9", with what is the same in every case.
+  static Effect effectOf(Outcome outcome, Text before, Text live, Text stored, std::optional<Failure> failure = {}) {
+    return {.setting = "Sleep",
+            .outcome = outcome,
+            .before = std::move(before),
+            .asked = "9",
+            .live = std::move(live),
+            .stored = std::move(stored),
+            .where = "/etc/sleep.conf",
+            .undoneBy = "a daemon",
+            .failure = std::move(failure)};
   }
 
   RunLoop loop;
@@ -61,26 +73,26 @@ class SettingChangeTest : public ::testing::Test {
 };
 
 TEST_F(SettingChangeTest, storesThenAppliesThenReadsBack) {
-  EXPECT_EQ(change("9"), R"({"setting":"Sleep","outcome":"applied","before":"5","asked":"9","live":"9","stored":"9"})");
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, "5", "9", "9"));
   EXPECT_THAT(steps, ElementsAre("store", "apply"));
   EXPECT_EQ(log.lines.size(), 2U);
   EXPECT_EQ(log.lines.front(), "begins Sleep 9");
 }
 
 TEST_F(SettingChangeTest, writesNothingThatIsThereAlready) {
-  const std::string unchanged =
-      R"({"setting":"Sleep","outcome":"unchanged","before":"5","asked":"5","live":"5","stored":"5"})";
-  EXPECT_EQ(change("5"), unchanged);
+  live = stored = "9";
+  const auto unchanged = effectOf(Outcome::unchanged, "9", "9", "9");
+  EXPECT_EQ(change("9"), unchanged);
   EXPECT_THAT(steps, IsEmpty());
   EXPECT_EQ(log.lines.size(), 1U) << "nothing has begun";
   setting.always = true;
-  EXPECT_EQ(change("5"), unchanged);
+  EXPECT_EQ(change("9"), unchanged);
   EXPECT_THAT(steps, ElementsAre("store", "apply"));
 }
 
 TEST_F(SettingChangeTest, appliesWhatCannotBeRead) {
   setting.live = setting.stored = nullptr;
-  EXPECT_EQ(change("now"), R"({"setting":"Sleep","outcome":"applied","asked":"now"})");
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, {}, {}, {}));
   EXPECT_THAT(steps, ElementsAre("store", "apply"));
 }
 
@@ -96,54 +108,47 @@ TEST_F(SettingChangeTest, writesWhenOnlyOneOfLiveAndStoredIsRight) {
 TEST_F(SettingChangeTest, takesAPartThatDoesNotApplyForRight) {
   setting.live = nullptr;
   setting.apply = nullptr;
-  EXPECT_EQ(change("9"), R"({"setting":"Sleep","outcome":"applied","before":"5","asked":"9","stored":"9"})");
-  EXPECT_EQ(change("9"), R"({"setting":"Sleep","outcome":"unchanged","before":"9","asked":"9","stored":"9"})");
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, "5", {}, "9"));
+  EXPECT_EQ(change("9"), effectOf(Outcome::unchanged, "9", {}, "9"));
 }
 
 TEST_F(SettingChangeTest, takesAbsentForEmpty) {
   setting.store = [this](const std::string& /*value*/) { return stored.reset(), Result<void>(); };
   setting.apply = [this](const std::string& /*value*/) { return live.reset(), Result<void>(); };
-  EXPECT_EQ(change(""), R"({"setting":"Sleep","outcome":"applied","before":"5","asked":""})");
-  EXPECT_EQ(change(""), R"({"setting":"Sleep","outcome":"unchanged","asked":""})");
+  EXPECT_EQ(change("").outcome, Outcome::applied);
+  EXPECT_EQ(change("").outcome, Outcome::unchanged);
 }
 
 TEST_F(SettingChangeTest, writesNothingThatTheMachineCannotHave) {
-  setting.supported = [] { return Failure{"find", "/sys/power", "No such file or directory"}; };
-  EXPECT_EQ(change("9"), R"({"setting":"Sleep","outcome":"not supported","asked":"9","tried":"find",)"
-                         R"("on":"/sys/power","why":"No such file or directory"})");
+  const auto reason = systemFailure("find", "/sys/power", ENOENT);
+  setting.supported = [&] { return reason; };
+  EXPECT_EQ(change("9"), effectOf(Outcome::notSupported, {}, {}, {}, reason));
   EXPECT_THAT(steps, IsEmpty());
 }
 
 TEST_F(SettingChangeTest, tellsTheFirstFailureAndWhatIsThereNow) {
+  const auto full = [](const char* step) { return Failure{step, "disk", "No space left on device"}; };
+  const auto wrong = [](const char* where) { return Failure{"read back", where, "reads 5"}; };
   struct Case {
     const char* broken;
     const char* ignored;
-    const char* expected;  ///< from the live value on
+    Text live, stored;
+    Failure failure;
     std::vector<std::string> steps;
   };
   const Case cases[] = {
-      {"store",
-       "",
-       R"("live":"5","stored":"5","tried":"store","on":"disk","why":"No space left on device"})",
-       {"store"}},
-      {"apply",
-       "",
-       R"("live":"5","stored":"9","tried":"apply","on":"disk","why":"No space left on device"})",
-       {"store", "apply"}},
-      {"", "apply", R"("live":"5","stored":"9","tried":"read back","on":"Sleep","why":"reads 5"})", {"store", "apply"}},
-      {"",
-       "store",
-       R"("live":"9","stored":"5","tried":"read back","on":"/etc/sleep.conf","why":"reads 5"})",
-       {"store", "apply"}},
-      {"stored", "", R"("live":"9","tried":"stored","on":"disk","why":"Input/output error"})", {"store", "apply"}},
+      {"store", "", "5", "5", full("store"), {"store"}},
+      {"apply", "", "5", "9", full("apply"), {"store", "apply"}},
+      {"", "apply", "5", "9", wrong("Sleep"), {"store", "apply"}},
+      {"", "store", "9", "5", wrong("/etc/sleep.conf"), {"store", "apply"}},
+      {"stored", "", "9", {}, {"stored", "disk", "Input/output error"}, {"store", "apply"}},
   };
-  for (const Case& now : cases) {
+  for (const auto& now : cases) {
     live = stored = "5";
     steps.clear();
     broken = now.broken;
     ignored = now.ignored;
-    const std::string begin = R"({"setting":"Sleep","outcome":"failed","before":"5","asked":"9",)";
-    EXPECT_EQ(change("9"), begin + now.expected);
+    EXPECT_EQ(change("9"), effectOf(Outcome::failed, "5", now.live, now.stored, now.failure));
     EXPECT_EQ(steps, now.steps);
   }
 }
@@ -163,8 +168,8 @@ TEST_F(SettingChangeTest, waitsByEventUntilItHasSettled) {
 TEST_F(SettingChangeTest, givesUpWaitingAfterThreeSeconds) {
   setting.settled = [](const std::string& /*value*/) { return false; };
   const auto begin = RunLoop::Clock::now();
-  EXPECT_EQ(change("9"), R"({"setting":"Sleep","outcome":"failed","before":"5","asked":"9","live":"9","stored":"9",)"
-                         R"("tried":"change","on":"Sleep","why":"did not settle in time"})");
+  const Failure unsettled{"change", "Sleep", "did not settle in time"};
+  EXPECT_EQ(change("9"), effectOf(Outcome::failed, "5", "9", "9", unsettled));
   EXPECT_GE(RunLoop::Clock::now() - begin, std::chrono::seconds(3));
 }
 
@@ -175,10 +180,12 @@ TEST_F(SettingChangeTest, observesTheLiveValueOrElseTheStoredOne) {
   EXPECT_EQ(observe(setting, sink), "5");
   broken = "stored";
   EXPECT_EQ(observe(setting, sink), std::nullopt);
-  EXPECT_THAT(log.lines, ElementsAre(R"({"setting":"Sleep","live":"7","unit":"minutes"})",
-                                     R"({"setting":"Sleep","stored":"5","unit":"minutes"})",
-                                     R"({"setting":"Sleep","outcome":"failed","where":"/etc/sleep.conf",)"
-                                     R"("tried":"stored","on":"disk","why":"Input/output error"})"));
+  EXPECT_THAT(log.values, ElementsAre(SettingValue{.setting = "Sleep", .live = "7", .unit = "minutes"},
+                                      SettingValue{.setting = "Sleep", .stored = "5", .unit = "minutes"}));
+  EXPECT_THAT(log.effects, ElementsAre(Effect{.setting = "Sleep",
+                                              .outcome = Outcome::failed,
+                                              .where = "/etc/sleep.conf",
+                                              .failure = Failure{"stored", "disk", "Input/output error"}}));
 }
 
 }  // namespace

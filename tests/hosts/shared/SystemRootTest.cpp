@@ -28,12 +28,12 @@ class SystemRootTest : public testing::Test {
     return found;
   }
   void expectWritten(const std::string& path, const std::string& contents) {
-    auto written = root.write(path, contents);
+    const auto written = root.write(path, contents);
     EXPECT_TRUE(written) << written.failure().tried << ": " << written.failure().why;
     EXPECT_EQ(contentsOf(at(path)), contents) << path;
   }
   std::string whyNotWritten(const std::string& path) {
-    auto written = root.write(path, "new");
+    const auto written = root.write(path, "new");
     return written ? "written" : written.failure().why;
   }
 
@@ -42,7 +42,7 @@ class SystemRootTest : public testing::Test {
 };
 
 TEST_F(SystemRootTest, makesFilesAndFoldersWithTheirModesWhateverTheUmask) {
-  auto before = ::umask(077);
+  const auto before = ::umask(077);
   expectWritten("/etc/systemd/new.d/60-tavisk.conf", "[Time]\n");
   EXPECT_TRUE(root.write("/etc/secret", "x", 0600));
   ::umask(before);
@@ -62,7 +62,7 @@ TEST_F(SystemRootTest, makesTheRootItselfWhenItIsWanted) {
 TEST_F(SystemRootTest, keepsOwnerAndModeOfWhatItReplaces) {
   folder.write("/etc/hostname", "old");
   ::chmod(at("/etc/hostname").c_str(), 0640);
-  bool mayGiveAway = ::chown(at("/etc/hostname").c_str(), 7, 8) == 0;
+  const bool mayGiveAway = ::chown(at("/etc/hostname").c_str(), 7, 8) == 0;
   expectWritten("/etc/hostname", std::string(100'000, 'x'));
   expectWritten("/etc/hostname", "");
   EXPECT_EQ(status("/etc/hostname").st_mode & 07777, 0640U);
@@ -125,29 +125,28 @@ TEST_F(SystemRootTest, removesOnlyTheLeftoversOfRunsThatAreOver) {
 }
 
 TEST_F(SystemRootTest, rewritesInPlaceWhereAFileIsMounted) {
-  bool ran = withOwnMounts([&] {
-    auto mounted = folder.write("/etc/hosts", "");
-    auto source = folder.write("/source", "a longer text than the new one");
+  const bool hasRun = withOwnMounts([&] {
+    const auto mounted = folder.write("/etc/hosts", "");
+    const auto source = folder.write("/source", "a longer text than the new one");
     ASSERT_EQ(::mount(source.c_str(), mounted.c_str(), nullptr, MS_BIND, nullptr), 0);
     expectWritten("/etc/hosts", "new");
     EXPECT_EQ(contentsOf(source), "new");
     EXPECT_EQ(root.list("/etc").valueOr({}), std::vector<std::string>{"hosts"});
   });
-  if (!ran) GTEST_SKIP() << "may not have mounts of its own";
+  if (!hasRun) GTEST_SKIP() << "may not have mounts of its own";
 }
 
 TEST_F(SystemRootTest, keepsTheOldFileWhenTheNewOneFindsNoRoom) {
-  bool ran = withOwnMounts([&] {
+  const bool hasRun = withOwnMounts([&] {
     ASSERT_TRUE(mountMemory(folder.path(), "64k"));
     folder.write("/file", "old");
-    EXPECT_EQ(root.write("/file", std::string(100'000, 'x')).failure(),
-              systemFailure("write", "/file", ENOSPC));
+    EXPECT_EQ(root.write("/file", std::string(100'000, 'x')).failure(), systemFailure("write", "/file", ENOSPC));
     EXPECT_EQ(contentsOf(at("/file")), "old");
     EXPECT_EQ(root.list("/").valueOr({}), std::vector<std::string>{"file"});
     ASSERT_EQ(::mount("", folder.path().c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
     EXPECT_EQ(whyNotWritten("/file"), "Read-only file system");
   });
-  if (!ran) GTEST_SKIP() << "may not have mounts of its own";
+  if (!hasRun) GTEST_SKIP() << "may not have mounts of its own";
 }
 
 TEST_F(SystemRootTest, isNotFooledByAFolderThatTurnsIntoALink) {
@@ -155,22 +154,22 @@ TEST_F(SystemRootTest, isNotFooledByAFolderThatTurnsIntoALink) {
   outside.write("file", "outside");
   folder.write("/volume/file", "inside");
   fs::create_symlink(outside.path(), at("/link"));
-  std::atomic<bool> over = false;
+  std::atomic<bool> isOver = false;
   std::atomic<int> exchanges = 0;
   std::thread exchanger([&] {
     constexpr unsigned exchange = 2;  // RENAME_EXCHANGE
-    while (!over) {
+    while (!isOver) {
       if (::syscall(SYS_renameat2, AT_FDCWD, at("/volume").c_str(), AT_FDCWD, at("/link").c_str(), exchange) == 0)
         ++exchanges;
     }
   });
   int inside = 0;
   for (int times = 0; times < 20'000; ++times) {
-    auto text = root.read("/volume/file", 100).valueOr("none");
+    const auto text = root.read("/volume/file", 100).valueOr("none");
     ASSERT_NE(text, "outside");
     if (text == "inside") ++inside;
   }
-  over = true;
+  isOver = true;
   exchanger.join();
   EXPECT_GT(inside, 0);
   EXPECT_GT(exchanges, 100);

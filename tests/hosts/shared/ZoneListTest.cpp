@@ -13,7 +13,7 @@ using testing::ElementsAre;
 TEST(ZoneList, comesFromTheBestSourceThereIs) {
   TemporaryFolder folder;
   SystemRoot root(folder.path());
-  auto zones = [&] { return installedZones(root).valueOr({}); };
+  const auto zones = [&] { return installedZones(root).valueOr({}); };
   EXPECT_EQ(installedZones(root).failure().why, "no time zones are installed");
 
   folder.write("/usr/share/zoneinfo/America/Argentina/Salta", "TZif2...");

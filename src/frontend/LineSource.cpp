@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "terminal/StreamLineSource.h"
+#include "frontend/LineSource.h"
 
 namespace tavisk {
 
