@@ -16,6 +16,12 @@ Failure systemFailure(std::string tried, std::string on, int error) {
   return Failure{std::move(tried), std::move(on), code.message(), code};
 }
 
+Failure renamed(Failure failure, std::string tried, std::string on) {
+  failure.tried = std::move(tried);
+  failure.on = std::move(on);
+  return failure;
+}
+
 bool isAbsent(const Failure& failure) {
   return failure.code == std::errc::no_such_file_or_directory || failure.code == std::errc::not_a_directory;
 }
