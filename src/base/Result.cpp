@@ -16,10 +16,8 @@ Failure systemFailure(std::string tried, std::string on, int error) {
   return Failure{std::move(tried), std::move(on), code.message(), code};
 }
 
-Failure renamed(Failure failure, std::string tried, std::string on) {
-  failure.tried = std::move(tried);
-  failure.on = std::move(on);
-  return failure;
+Failure retold(const Failure& failure, std::string tried, std::string on) {
+  return {std::move(tried), std::move(on), failure.why, failure.code};
 }
 
 bool isAbsent(const Failure& failure) {

@@ -27,8 +27,8 @@ struct Failure {
 /// The failure of a system call, with the system's own words for `error` (an errno value).
 Failure systemFailure(std::string tried, std::string on, int error);
 
-/// The failure told anew, of something that was tried on something else; its reason and its code stay.
-Failure renamed(Failure failure, std::string tried, std::string on);
+/// A failure told under another name, with its reason and its code.
+Failure retold(const Failure& failure, std::string tried, std::string on);
 
 /// Whether the failure says that there is no such file: the file or a folder of its path is not there.
 bool isAbsent(const Failure& failure);

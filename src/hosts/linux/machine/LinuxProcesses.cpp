@@ -40,12 +40,12 @@ Result<void> LinuxProcessUtilities::signalProcess(int signal, ProcessId process)
   // The ids in a tree may be those of strangers on the machine that runs the tool.
   if (_machine.root.prefix() != "/") return Failure{tried, name, "a tree of files has no processes"};
   const auto handle = ProcessHandle::of(process);
-  if (!handle) return renamed(handle.failure(), tried, name);
+  if (!handle) return retold(handle.failure(), tried, name);
   const auto sent = handle->send(signal);
   if (sent) return {};
   const bool isForbidden = sent.failure().code == std::errc::operation_not_permitted;
   const auto forRoot = isForbidden ? whyNeedsRoot(tried, name) : std::nullopt;
-  return forRoot.value_or(renamed(sent.failure(), tried, name));
+  return forRoot.value_or(retold(sent.failure(), tried, name));
 }
 
 void LinuxProcessTermination::disable() {

@@ -193,7 +193,7 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
 Result<BusMessage> Bus::property(const BusObject& object, const char* name, const char* signature) {
   const BusObject properties{object.service, object.path, propertiesInterface};
   auto reply = query(properties, "Get", "v", object.interface, name);
-  if (!reply) return renamed(reply.failure(), name, object.path);
+  if (!reply) return retold(reply.failure(), name, object.path);
   auto value = std::move(reply).value();
   if (!value.enter('v', signature)) return Failure{name, object.path, "the value has another type than expected"};
   return value;

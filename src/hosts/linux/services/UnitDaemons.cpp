@@ -16,7 +16,7 @@ constexpr std::chrono::seconds longestJob{3};
 
 /// What failed was asked about this unit, not about the manager as a whole.
 Failure about(const Daemon& daemon, const Failure& failure) {
-  return renamed(failure, failure.tried, daemon.unit);
+  return retold(failure, failure.tried, daemon.unit);
 }
 
 /// "ConditionVirtualization=!container", the first condition that does not hold; empty when all do.
