@@ -2,9 +2,11 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/power/StartupDelayRequests.h"
 
+#include <algorithm>
 #include <map>
 
 #include "base/Text.h"
+#include "hosts/linux/power/PowerLimits.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 
 namespace tavisk {
@@ -56,36 +58,33 @@ std::optional<StartupDelayRequests> requestsIn(const std::string& line) {
 
 }  // namespace
 
+std::size_t StartupDelayRequests::shiftOf(std::size_t place) const {
+  return 8 * (highByteFirst ? width - 1 - place : place);
+}
+
 std::optional<ControllerRequest> StartupDelayRequests::setting(std::uint32_t seconds) const {
   const std::uint64_t count = seconds / secondsEach;
   if (seconds % secondsEach != 0 || (count >> (8 * width)) != 0) return std::nullopt;
   ControllerRequest request{function, set, {}};
-  for (std::size_t i = 0; i < width; ++i) {
-    const auto place = highByteFirst ? width - 1 - i : i;
-    request.data.push_back(static_cast<std::uint8_t>(count >> (8 * place)));
-  }
+  for (std::size_t i = 0; i < width; ++i) request.data.push_back(static_cast<std::uint8_t>(count >> shiftOf(i)));
   return request;
 }
 
 std::optional<std::uint64_t> StartupDelayRequests::delayIn(const std::vector<std::uint8_t>& answer) const {
   if (answer.size() < width) return std::nullopt;
   std::uint64_t count = 0;
-  for (std::size_t i = 0; i < width; ++i) {
-    const auto place = highByteFirst ? width - 1 - i : i;
-    count |= std::uint64_t{answer[i]} << (8 * place);
-  }
+  for (std::size_t i = 0; i < width; ++i) count |= std::uint64_t{answer[i]} << shiftOf(i);
   return count * secondsEach;
 }
 
 Result<StartupDelayRequests> startupDelayRequests(const SystemRoot& root, std::uint32_t manufacturer) {
-  constexpr std::size_t limit = 65536;
-  for (const auto& line : configurationLines(root.read(startupDelayFile, limit).valueOr(""))) {
+  for (const auto& line : configurationLines(root.read(startupDelayFile, powerFileLimit).valueOr(""))) {
     const auto requests = requestsIn(line);
     if (!requests) return Failure{"read", startupDelayFile, "this line is not understood: " + line};
     if (requests->manufacturer == manufacturer) return *requests;
   }
-  for (const auto& requests : builtIn)
-    if (requests.manufacturer == manufacturer) return requests;
+  const auto* known = std::ranges::find(builtIn, manufacturer, &StartupDelayRequests::manufacturer);
+  if (known != std::end(builtIn)) return *known;
   return Failure{"find the requests for the start-up delay", startupDelayFile,
                  "none is known for controllers of manufacturer " + std::to_string(manufacturer)};
 }
