@@ -199,6 +199,19 @@ Result<BusMessage> Bus::property(const BusObject& object, const char* name, cons
   return value;
 }
 
+Result<BusMessage> Bus::setProperty(const BusObject& object, const char* name, const char* signature,
+                                    const Writer& value) {
+  const BusObject properties{object.service, object.path, propertiesInterface};
+  const Writer arguments = [&](BusMessage& message) {
+    message.write(object.interface);
+    message.write(name);
+    message.open('v', signature);
+    value(message);
+    message.close();
+  };
+  return call(properties, "Set", "", arguments);
+}
+
 Bus::Subscription::Subscription(const SystemdLibrary& library, SignalHandler handler)
     : _library(library), _handler(std::move(handler)) {}
 

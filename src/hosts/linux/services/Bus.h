@@ -77,6 +77,8 @@ class Bus {
   }
   /// The value of a property, ready to be read.
   Result<BusMessage> property(const BusObject& object, const char* name, const char* signature);
+  /// `value` writes one of this type.
+  Result<BusMessage> setProperty(const BusObject& object, const char* name, const char* signature, const Writer& value);
 
   using SignalHandler = std::function<void(BusMessage&)>;
   /// Keeps a handler; its end takes the handler out. It ends before the bus.
