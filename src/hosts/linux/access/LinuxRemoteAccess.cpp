@@ -14,24 +14,24 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* serverProgram = "/usr/sbin/sshd";
-constexpr const char* serverFolder = "/etc/ssh";
-constexpr const char* serverConfig = "/etc/ssh/sshd_config";
-constexpr std::size_t configLimit = std::size_t{1} << 20U;
+constexpr const char* sshProgram = "/usr/sbin/sshd";
+constexpr const char* sshFolder = "/etc/ssh";
+constexpr const char* sshConfig = "/etc/ssh/sshd_config";
+constexpr std::size_t sshConfigLimit = std::size_t{1} << 20U;
 // The sessions of the server are processes of the same name: its own is in the file.
-constexpr const char* serverProcess = "/run/sshd.pid";
+constexpr const char* sshProcessFile = "/run/sshd.pid";
 constexpr const char* keyMaker = "/usr/bin/ssh-keygen";
 
 std::vector<Daemon> openSshUnits() {
-  return {{"ssh.service", "ssh", "sshd", serverProcess},
+  return {{"ssh.service", "ssh", "sshd", sshProcessFile},
           {"ssh.socket", "", ""},
-          {"sshd.service", "sshd", "sshd", serverProcess},
+          {"sshd.service", "sshd", "sshd", sshProcessFile},
           {"sshd.socket", "", ""}};
 }
 
 bool hasHostKey(const SystemRoot& root) {
   const auto isKey = [](const std::string& name) { return name.starts_with("ssh_host_") && name.ends_with("_key"); };
-  return std::ranges::any_of(root.list(serverFolder).valueOr({}), isKey);
+  return std::ranges::any_of(root.list(sshFolder).valueOr({}), isKey);
 }
 
 /// Whether the administrator keeps the keys elsewhere (sshd_config(5)).
@@ -40,7 +40,7 @@ bool namesHostKeys(const SystemRoot& root) {
     const auto words = split(line, " \t\r=\"");
     return !words.empty() && lowerCased(words.front()) == "hostkey";
   };
-  return std::ranges::any_of(configurationLines(root.read(serverConfig, configLimit).valueOr("")), names);
+  return std::ranges::any_of(configurationLines(root.read(sshConfig, sshConfigLimit).valueOr("")), names);
 }
 
 }  // namespace
@@ -134,9 +134,9 @@ Result<void> LinuxRemoteShellService::apply(bool enabled) {
 
 Result<void> LinuxRemoteShellService::ensureHostKeys() {
   constexpr const char* tried = "make host keys";
-  const bool isOtherServer = !_machine.root.exists(serverProgram);
+  const bool isOtherServer = !_machine.root.exists(sshProgram);
   if (isOtherServer || hasHostKey(_machine.root) || namesHostKeys(_machine.root)) return {};
-  if (auto failure = whyNeedsRoot(tried, serverFolder)) return *failure;
+  if (auto failure = whyNeedsRoot(tried, sshFolder)) return *failure;
   const auto made = runProgram(_machine.root, {keyMaker, "-A"}, _machine.runLoop);
   if (!made) return made.failure();
   if (hasHostKey(_machine.root)) return {};

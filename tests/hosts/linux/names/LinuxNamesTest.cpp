@@ -1,9 +1,11 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
+#include <systemd/sd-bus.h>
 
 #include "effects/EffectMatchers.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/BusPeer.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/names/HostNameFiles.h"
 #include "platform/HostNamesContract.h"
@@ -58,6 +60,18 @@ TEST(LinuxNames, ChangesEveryPlaceOfTheHostName) {
   EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost\n127.0.1.1\tmail-2.example mail-2\n");
   EXPECT_EQ(tree.host().dynamicStore().open("test")->localHostName(), "mail-2");
   EXPECT_EQ(tree.host().dynamicStore().open("test")->computerName(), "mail-2.example") << "without one for people";
+}
+
+TEST(LinuxNames, AreLeftToTheFilesOnABusWithoutTheirService) {
+  NamedTree tree;
+  tree.write("/run/systemd/system/x", "");
+  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {},
+                    [](sd_bus_message* call, const std::string& /*member*/) {
+                      return sd_bus_reply_method_errorf(call, SD_BUS_ERROR_SERVICE_UNKNOWN, "no such name");
+                    });
+  tree.host().hostConfiguration().setComputerName("Mail Server 2");
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
+  EXPECT_EQ(tree.lastEffect().live, "Mail Server 2");
 }
 
 TEST(LinuxNames, RefusesComputerNamesThatItCannotKeepWhole) {
