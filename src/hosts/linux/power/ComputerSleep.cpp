@@ -7,6 +7,7 @@
 #include <memory>
 
 #include "effects/SettingNames.h"
+#include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/linux/system/TimeSpan.h"
@@ -14,17 +15,12 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* service = "org.freedesktop.login1";
 constexpr Daemon loginDaemon{"systemd-logind.service", "", "systemd-logind"};
 /// What the service starts to let the machine sleep.
 constexpr Daemon sleepTarget{"suspend.target", "", ""};
 constexpr const char* inputs = "/sys/class/input";
 constexpr const char* section = "Login";
 constexpr std::chrono::milliseconds betweenQuestions{20};
-
-BusObject loginManager() {
-  return {service, "/org/freedesktop/login1", "org.freedesktop.login1.Manager"};
-}
 
 bool isSleep(const std::string& action) {
   constexpr std::string_view words[] = {"sleep", "suspend", "hibernate", "hybrid-sleep", "suspend-then-hibernate"};
@@ -82,14 +78,16 @@ bool ComputerSleep::storedButton() const {
 
 std::optional<Failure> ComputerSleep::whyCannotSleep() {
   constexpr const char* tried = "CanSuspend";
-  if (!_machine.services.hasServiceManager()) return Failure{tried, service, "this machine has no login service"};
+  if (!_machine.services.hasServiceManager())
+    return Failure{tried, loginManager().service, "this machine has no login service"};
   const auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
   auto answer = (*bus)->query(loginManager(), tried, "s");
   // A service that does not answer is no reason: whatever is done with it then tells why.
   if (!answer)
     return answer.failure().code == BusErrorCode::serviceUnknown ? std::optional(answer.failure()) : std::nullopt;
-  if (std::move(answer).value().readText() == "na") return Failure{tried, service, "this machine cannot sleep"};
+  if (std::move(answer).value().readText() == "na")
+    return Failure{tried, loginManager().service, "this machine cannot sleep"};
   // The service would take the setting and refuse to act by it.
   const auto presence = _machine.services.daemons().presence(sleepTarget);
   if (!presence || *presence != Daemons::Presence::masked) return std::nullopt;
@@ -158,8 +156,7 @@ Result<void> ComputerSleep::restartService(Minutes asked) {
 Result<void> ComputerSleep::rereadConfiguration() {
   const auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
-  const BusObject manager{"org.freedesktop.systemd1", "/org/freedesktop/systemd1", "org.freedesktop.systemd1.Manager"};
-  const auto done = (*bus)->call(manager, "KillUnit", "", loginDaemon.unit, "main", std::int32_t{SIGHUP});
+  const auto done = (*bus)->call(serviceManager(), "KillUnit", "", loginDaemon.unit, "main", std::int32_t{SIGHUP});
   return done ? Result<void>() : retold(done.failure(), "KillUnit", loginDaemon.unit);
 }
 

@@ -5,6 +5,7 @@
 #include "base/Text.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/PowerLimits.h"
+#include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/OwnFiles.h"
@@ -22,10 +23,6 @@ constexpr std::chrono::seconds watchdogTime{60};
 
 const char* panicSecondsFor(bool restarts) {
   return restarts ? "10" : "0";
-}
-
-BusObject serviceManager() {
-  return {"org.freedesktop.systemd1", "/org/freedesktop/systemd1", "org.freedesktop.systemd1.Manager"};
 }
 
 Reading<bool> together(bool byWatchdog, bool onPanic) {
@@ -115,30 +112,15 @@ Result<void> RestartAfterFreeze::setWatchdog(bool restarts) const {
   if (auto set = setWatchdogTime(restarts ? watchdogTime : std::chrono::seconds(0)); !set || restarts) return set;
   const auto isUsed = isWatchdogUsed();
   if (!isUsed) return isUsed.failure();
-  return *isUsed ? reloadManager() : Result<void>();
-}
-
-Result<void> RestartAfterFreeze::reloadManager() const {
-  constexpr std::chrono::seconds longestReload{10};
-  const auto bus = _machine.services.serviceManager();
-  if (!bus) return bus.failure();
-  const auto reloaded = (*bus)->call(serviceManager(), "Reload", "", Bus::Writer([](BusMessage&) {}), longestReload);
-  return reloaded ? Result<void>() : reloaded.failure();
+  return *isUsed ? reloadServiceManager(_machine.services) : Result<void>();
 }
 
 Result<void> RestartAfterFreeze::setWatchdogTime(std::chrono::microseconds time) const {
   const auto bus = _machine.services.serviceManager();
   if (!bus) return bus.failure();
-  const BusObject properties{"org.freedesktop.systemd1", "/org/freedesktop/systemd1",
-                             "org.freedesktop.DBus.Properties"};
-  const Bus::Writer arguments = [time](BusMessage& message) {
-    message.write("org.freedesktop.systemd1.Manager");
-    message.write("RuntimeWatchdogUSec");
-    message.open('v', "t");
+  const auto set = (*bus)->setProperty(serviceManager(), "RuntimeWatchdogUSec", "t", [time](BusMessage& message) {
     message.write(static_cast<std::uint64_t>(time.count()));
-    message.close();
-  };
-  const auto set = (*bus)->call(properties, "Set", "", arguments);
+  });
   return set ? Result<void>() : retold(set.failure(), "set RuntimeWatchdogUSec", "the service manager");
 }
 

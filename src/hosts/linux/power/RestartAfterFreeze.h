@@ -29,7 +29,6 @@ class RestartAfterFreeze {
   Result<void> apply(bool restarts) const;
   Result<void> setWatchdog(bool restarts) const;
   Result<void> setWatchdogTime(std::chrono::microseconds time) const;
-  Result<void> reloadManager() const;
   bool isPanicStored() const;
 
   LinuxMachine _machine;

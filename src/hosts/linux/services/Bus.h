@@ -77,6 +77,8 @@ class Bus {
   }
   /// The value of a property, ready to be read.
   Result<BusMessage> property(const BusObject& object, const char* name, const char* signature);
+  /// `value` writes one of this type.
+  Result<BusMessage> setProperty(const BusObject& object, const char* name, const char* signature, const Writer& value);
 
   using SignalHandler = std::function<void(BusMessage&)>;
   /// Keeps a handler; its end takes the handler out. It ends before the bus.
@@ -106,6 +108,7 @@ class Bus {
  private:
   Bus(const SystemdLibrary& library, sd_bus* bus, Kind kind, RunLoop* runLoop);
   std::chrono::microseconds timeFor(std::chrono::seconds longest) const;
+  /// These two answer as the library does: negative is an errno value.
   int start(const FileDescriptor& connection);
   int awaitReady();
   Result<BusMessage> exchange(const BusObject& object, const char* member, const char* replySignature,
