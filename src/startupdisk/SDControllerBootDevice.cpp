@@ -130,8 +130,8 @@ bool SDController::_writeBootChoice(const SDDisk& system) {
 
 void SDController::_logBootChoice(const SDDisk& system) const {
   const auto& log = _environment.log;
-  log.debug("Setting<std::string> Startup Disk: %@", {system.description()});
-  log.debug("***************************** Setting<std::string> Startup Disk *****************************");
+  log.debug("Setting Startup Disk: %@", {system.description()});
+  log.debug("***************************** Setting Startup Disk *****************************");
   log.debug("******         Volume: %@", {system.volumeName()});
   log.debug("******  System Folder: %@", {system.textForKey(recordkey::systemFolderPath)});
   log.debug("****** System Version: %@", {system.objectForKey(recordkey::systemVersionMajor)});

@@ -73,8 +73,7 @@ void SDController::setupWirestartUpdating() {
 double SDController::_allowedInterval(double wanted) const {
   if (wanted >= shortestInterval) return wanted;
   _environment.log.always(
-      "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting<std::string> Wirestart scan "
-      "time to 20 "
+      "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting Wirestart scan time to 20 "
       "seconds. User had requested %.0f seconds.",
       {wanted});
   return shortestInterval;

@@ -131,13 +131,12 @@ TEST(BootDevice, IsChosenWithLanguageAndKeyboard) {
     EXPECT_EQ(machine.get("Firmware", "Boot Preference"),
               keys({{"Disk", "disk1s2"}, {"Folder", folder}, {"Lumara 9", false}}));
     EXPECT_EQ(machine.bootDevice(), "disk1s2 B");
-    EXPECT_THAT(
-        machine.systemLog(),
-        ElementsAre("Setting<std::string> Startup Disk: disk1s2 B",
-                    "***************************** Setting<std::string> Startup Disk *****************************",
-                    "******         Volume: B", "******  System Folder: " + std::string(folder),
-                    "****** System Version: 10", "****** OF Device Path: IODeviceTree:/b",
-                    "currentBootDevice cached: disk1s2 B"));
+    EXPECT_THAT(machine.systemLog(),
+                ElementsAre("Setting Startup Disk: disk1s2 B",
+                            "***************************** Setting Startup Disk *****************************",
+                            "******         Volume: B", "******  System Folder: " + std::string(folder),
+                            "****** System Version: 10", "****** OF Device Path: IODeviceTree:/b",
+                            "currentBootDevice cached: disk1s2 B"));
   }
 }
 

@@ -61,8 +61,7 @@ TEST(NetworkImages, AreScannedForAtTheUsersInterval) {
     return "Wirestart rescan time interval set to " + std::string(seconds) + " seconds";
   };
   const auto tooOften = [](const char* seconds) {
-    return "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting<std::string> Wirestart "
-           "scan time to 20 "
+    return "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting Wirestart scan time to 20 "
            "seconds. User had requested " +
            std::string(seconds) + " seconds.";
   };
