@@ -15,10 +15,18 @@ class EffectLog final : public EffectChannel {
   void changeBegins(const std::string& setting, const std::string& asked) override {
     lines.push_back("begins " + setting + " " + asked);
   }
-  void record(const Effect& effect) override { lines.push_back(toJson(effect)); }
-  void observe(const SettingValue& value) override { lines.push_back(toJson(value)); }
+  void record(const Effect& effect) override {
+    lines.push_back(toJson(effect));
+    effects.push_back(effect);
+  }
+  void observe(const SettingValue& value) override {
+    lines.push_back(toJson(value));
+    values.push_back(value);
+  }
 
   std::vector<std::string> lines;
+  std::vector<Effect> effects;       ///< those among the lines
+  std::vector<SettingValue> values;  ///< those among the lines
 };
 
 }  // namespace tavisk
