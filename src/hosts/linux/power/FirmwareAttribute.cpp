@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "base/Text.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
@@ -22,9 +23,9 @@ struct Row {
 std::vector<Row> knownRows(const SystemRoot& root) {
   constexpr std::size_t limit = 65536;
   std::vector<Row> rows;
-  for (const auto& line : split(root.read(firmwareAttributesFile, limit).valueOr(""), "\n")) {
+  for (const auto& line : configurationLines(root.read(firmwareAttributesFile, limit).valueOr(""))) {
     const auto parts = split(line, "=;");
-    if (parts.size() == 3 && !trimmed(line).starts_with('#'))
+    if (parts.size() == 3)
       rows.push_back({std::string(trimmed(parts[0])), std::string(trimmed(parts[1])), std::string(trimmed(parts[2]))});
   }
   rows.insert(rows.end(), {{"AcPwrRcvry", "On", "Off"},

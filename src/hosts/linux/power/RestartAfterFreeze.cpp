@@ -5,6 +5,7 @@
 #include "base/Text.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/PowerValues.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/OwnFiles.h"
 #include "hosts/linux/system/Rights.h"
@@ -37,7 +38,7 @@ bool isOnPanic(const std::string& seconds) {
 /// The value of kernel.panic in a file of sysctl.d(5).
 std::optional<std::string> panicIn(const std::string& text) {
   std::optional<std::string> value;
-  for (const auto& line : split(text, "\n")) {
+  for (const auto& line : configurationLines(text, "#;")) {
     const auto words = split(line, " \t=");
     if (words.size() == 2 && (words[0] == "kernel.panic" || words[0] == "kernel/panic" || words[0] == "-kernel.panic"))
       value = words[1];

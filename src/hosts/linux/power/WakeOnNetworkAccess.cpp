@@ -2,9 +2,11 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/power/WakeOnNetworkAccess.h"
 
+#include "base/Path.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/OtherOwners.h"
 #include "hosts/linux/power/PowerValues.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/OwnFiles.h"
 #include "hosts/linux/system/Rights.h"
@@ -77,13 +79,11 @@ Result<void> WakeOnNetworkAccess::apply(const std::string& value) const {
 
 /// The device manager notes by which file it has set up a card.
 std::string WakeOnNetworkAccess::linkFileOf(const std::string& card) const {
-  constexpr std::string_view property = "\nE:ID_NET_LINK_FILE=";
   const auto number = readKernelFile(_machine.root, cardFolder + card + "/ifindex").valueOr("");
-  const auto facts = "\n" + _machine.root.read("/run/udev/data/n" + number, fileLimit).valueOr("") + "\n";
-  const auto start = facts.find(property);
-  if (start == std::string::npos) return usualLinkFile;
-  const auto path = facts.substr(start + property.size(), facts.find('\n', start + 1) - start - property.size());
-  return path.substr(path.rfind('/') + 1);
+  const auto facts = _machine.root.read("/run/udev/data/n" + number, fileLimit).valueOr("");
+  for (const auto& line : configurationLines(facts))
+    if (const auto fact = namedValueIn(line); fact && fact->name == "E:ID_NET_LINK_FILE") return baseName(fact->value);
+  return usualLinkFile;
 }
 
 /// The usual one as well, for cards that are still to come.
