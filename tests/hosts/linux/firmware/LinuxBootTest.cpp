@@ -39,7 +39,7 @@ class LinuxBootTest : public testing::Test {
     tree.setOrder({0});
   }
 
-  LinuxBootSettings settings() { return LinuxBootSettings(_machine); }
+  LinuxBootSettings settings() { return LinuxBootSettings(_machine, _disks); }
   ServiceStatus set(const std::string& disk, const std::string& volume) {
     return settings().setBootPreference({{disk}, volume + system, false});
   }
@@ -85,6 +85,7 @@ class LinuxBootTest : public testing::Test {
   SystemRoot _root{tree.at("/")};
   ServiceAccess _services{_root, tree.runLoop};
   LinuxMachine _machine{_root, tree.effects, tree.runLoop, _services};
+  LinuxDisks _disks{_machine};
 };
 
 TEST_F(LinuxBootTest, StartsTheVolumesOwnFile) {
