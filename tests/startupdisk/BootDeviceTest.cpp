@@ -4,7 +4,7 @@
 
 #include <thread>
 
-#include "startupdisk/SDImage.h"
+#include "startupdisk/SDRecord.h"
 #include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {

@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include "startupdisk/SDImage.h"
+#include "startupdisk/SDRecord.h"
 #include "startupdisk/StartupDisk.h"
 #include "startupdisk/StartupDiskTest.h"
 

@@ -3,7 +3,7 @@
 #include <gmock/gmock.h>
 
 #include "startupdisk/Firmware.h"
-#include "startupdisk/SDImage.h"
+#include "startupdisk/SDRecord.h"
 #include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {

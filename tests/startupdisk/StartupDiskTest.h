@@ -8,7 +8,6 @@
 #include "ScratchMachine.h"
 #include "base/NotificationCenter.h"
 #include "startupdisk/SDController.h"
-#include "startupdisk/SDNotifications.h"
 
 namespace tavisk {
 

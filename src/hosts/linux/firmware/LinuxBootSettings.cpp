@@ -16,9 +16,6 @@ namespace {
 
 constexpr const char* deviceTree = "/sys/firmware/devicetree/base";
 constexpr const char* interfaces = "/sys/class/net";
-constexpr int noneKnown = 0;
-constexpr int openFirmware = 1;
-constexpr int bootsEfiFiles = 2;
 constexpr ServiceStatus failed = 1;
 
 std::optional<EfiDevicePath> pathOf(const BootEntry& entry) {
@@ -41,12 +38,12 @@ LinuxBootSettings::LinuxBootSettings(const LinuxMachine& machine, LinuxDisks& di
     : _machine(machine), _variables(machine.root), _entries(_variables), _volumes(machine.root, disks) {}
 
 int LinuxBootSettings::preBootEnvironment() {
-  if (_machine.root.exists("/sys/firmware/efi")) return bootsEfiFiles;
-  return isOpenFirmware(_machine.root) ? openFirmware : noneKnown;
+  if (_machine.root.exists("/sys/firmware/efi")) return preboot::loadsBootEfi;
+  return isOpenFirmware(_machine.root) ? preboot::openFirmware : preboot::noneKnown;
 }
 
 BootSettings::LegacyBootSupport LinuxBootSettings::legacyBootSupport() {
-  if (preBootEnvironment() != bootsEfiFiles) return {0, true};
+  if (preBootEnvironment() != preboot::loadsBootEfi) return {0, true};
   const auto entries = _entries.all();
   if (!entries) {
     _machine.effects.recordFailure(setting::startupDisk, entries.failure());
