@@ -9,8 +9,7 @@
 #include <optional>
 #include <string>
 
-#include "base/SignalWaiter.h"
-#include "base/Surroundings.h"
+#include "base/Process.h"
 #include "base/Text.h"
 #include "effects/Report.h"
 #include "frontend/RemoteServerSettings.h"

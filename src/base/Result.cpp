@@ -16,6 +16,10 @@ Failure systemFailure(std::string tried, std::string on, int error) {
   return Failure{std::move(tried), std::move(on), code.message(), code};
 }
 
+Failure retold(const Failure& failure, std::string tried, std::string on) {
+  return {std::move(tried), std::move(on), failure.why, failure.code};
+}
+
 bool isAbsent(const Failure& failure) {
   return failure.code == std::errc::no_such_file_or_directory || failure.code == std::errc::not_a_directory;
 }

@@ -27,6 +27,9 @@ struct Failure {
 /// The failure of a system call, with the system's own words for `error` (an errno value).
 Failure systemFailure(std::string tried, std::string on, int error);
 
+/// A failure told under another name, with its reason and its code.
+Failure retold(const Failure& failure, std::string tried, std::string on);
+
 /// Whether the failure says that there is no such file: the file or a folder of its path is not there.
 bool isAbsent(const Failure& failure);
 

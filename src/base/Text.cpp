@@ -17,22 +17,42 @@ bool isBetween(char32_t codePoint, char32_t first, char32_t last) {
   return codePoint >= first && codePoint <= last;
 }
 
-bool isSurrogate(char32_t codePoint) {
-  return isBetween(codePoint, 0xD800, 0xDFFF);
+bool isHighSurrogate(char32_t unit) {
+  return isBetween(unit, 0xD800, 0xDBFF);
 }
 
-/// The length of the sequence that a first byte announces; 0 when no sequence begins with it.
-std::size_t sequenceLength(unsigned char first) {
-  if (first < 0x80) return 1;
-  if (first < 0xC2) return 0;
-  if (first < 0xE0) return 2;
-  if (first < 0xF0) return 3;
-  return first < 0xF5 ? 4 : 0;
+bool isLowSurrogate(char32_t unit) {
+  return isBetween(unit, 0xDC00, 0xDFFF);
 }
 
 bool isShortestForm(char32_t codePoint, std::size_t length) {
   constexpr std::array<char32_t, 5> smallest{0, 0, 0x80, 0x800, 0x10000};
   return codePoint >= smallest[length];
+}
+
+std::vector<char32_t> utf16Units(std::string_view bytes, bool isBigEndian) {
+  std::vector<char32_t> units;
+  for (std::size_t place = 0; place + 1 < bytes.size(); place += 2) {
+    const auto first = static_cast<std::uint8_t>(bytes[place]);
+    const auto second = static_cast<std::uint8_t>(bytes[place + 1]);
+    units.push_back(isBigEndian ? first * 256U + second : second * 256U + first);
+  }
+  return units;
+}
+
+std::string fromUtf16(std::string_view bytes, bool isBigEndian) {
+  std::string text;
+  const auto units = utf16Units(bytes, isBigEndian);
+  for (std::size_t place = 0; place < units.size(); ++place) {
+    auto character = units[place];
+    if (isHighSurrogate(character) && place + 1 < units.size() && isLowSurrogate(units[place + 1])) {
+      character = 0x10000 + ((character - 0xD800) << 10U) + (units[++place] - 0xDC00);
+    } else if (isHighSurrogate(character) || isLowSurrogate(character)) {
+      character = replacementCharacter;
+    }
+    appendUtf8(text, character);
+  }
+  return text;
 }
 
 void appendEscapedByte(std::string& text, char32_t byte) {
@@ -50,18 +70,31 @@ char lowerCased(char letter) {
 
 }  // namespace
 
+std::size_t sequenceLength(char first) {
+  const auto byte = static_cast<unsigned char>(first);
+  if (byte < 0x80) return 1;
+  if (byte < 0xC2) return 0;
+  if (byte < 0xE0) return 2;
+  if (byte < 0xF0) return 3;
+  return byte < 0xF5 ? 4 : 0;
+}
+
+bool isContinuation(char byte) {
+  return (static_cast<unsigned char>(byte) & 0xC0U) == 0x80U;
+}
+
 std::optional<char32_t> takeCodePoint(std::string_view& bytes) {
   if (bytes.empty()) return std::nullopt;
-  const auto first = static_cast<unsigned char>(bytes.front());
-  const std::size_t length = sequenceLength(first);
+  const auto length = sequenceLength(bytes.front());
   if (length == 0 || length > bytes.size()) return std::nullopt;
+  const auto first = static_cast<unsigned char>(bytes.front());
   char32_t codePoint = length == 1 ? first : first & (0x7FU >> length);
-  for (std::size_t place = 1; place < length; ++place) {
-    const auto next = static_cast<unsigned char>(bytes[place]);
-    if ((next & 0xC0U) != 0x80U) return std::nullopt;
-    codePoint = (codePoint << 6U) | (next & 0x3FU);
+  for (const char next : bytes.substr(1, length - 1)) {
+    if (!isContinuation(next)) return std::nullopt;
+    codePoint = (codePoint << 6U) | (static_cast<unsigned char>(next) & 0x3FU);
   }
-  if (!isShortestForm(codePoint, length) || isSurrogate(codePoint) || codePoint > lastCodePoint) return std::nullopt;
+  const bool isSurrogate = isBetween(codePoint, 0xD800, 0xDFFF);
+  if (!isShortestForm(codePoint, length) || isSurrogate || codePoint > lastCodePoint) return std::nullopt;
   bytes.remove_prefix(length);
   return codePoint;
 }
@@ -83,6 +116,13 @@ void appendUtf8(std::string& text, char32_t codePoint) {
   appendTail(0);
 }
 
+std::string decodedText(std::string_view bytes) {
+  if (bytes.starts_with("\xEF\xBB\xBF")) return std::string(bytes.substr(3));
+  if (bytes.starts_with("\xFE\xFF")) return fromUtf16(bytes.substr(2), true);
+  if (bytes.starts_with("\xFF\xFE")) return fromUtf16(bytes.substr(2), false);
+  return std::string(bytes);
+}
+
 bool isUtf8(std::string_view bytes) {
   while (!bytes.empty()) {
     if (!takeCodePoint(bytes)) return false;
@@ -101,7 +141,7 @@ std::string escaped(std::string_view text) {
   result.reserve(text.size());
   while (!text.empty()) {
     const auto byte = static_cast<unsigned char>(text.front());
-    const std::optional<char32_t> codePoint = takeCodePoint(text);
+    const auto codePoint = takeCodePoint(text);
     if (!codePoint) {
       appendEscapedByte(result, byte);
       text.remove_prefix(1);
@@ -139,6 +179,15 @@ int compareIgnoringCase(std::string_view left, std::string_view right) {
   return lowerCased(left).compare(lowerCased(right));
 }
 
+bool beginsIgnoringCase(std::string_view text, std::string_view beginning) {
+  return compareIgnoringCase(text.substr(0, beginning.size()), beginning) == 0;
+}
+
+bool isListedBefore(std::string_view left, std::string_view right) {
+  const auto order = compareIgnoringCase(left, right);
+  return order < 0 || (order == 0 && left < right);
+}
+
 std::int64_t leadingInteger(std::string_view text) {
   text.remove_prefix(std::min(text.find_first_not_of(whiteSpace), text.size()));
   const bool isNegative = text.starts_with('-');
@@ -162,7 +211,7 @@ std::vector<std::string> split(std::string_view text, std::string_view separator
   while (true) {
     text.remove_prefix(std::min(text.find_first_not_of(separators), text.size()));
     if (text.empty()) return pieces;
-    const std::size_t length = std::min(text.find_first_of(separators), text.size());
+    const auto length = std::min(text.find_first_of(separators), text.size());
     pieces.emplace_back(text.substr(0, length));
     text.remove_prefix(length);
   }

@@ -13,6 +13,9 @@
 
 namespace tavisk {
 
+/// What stands for bytes that no text is known of.
+inline constexpr char32_t replacementCharacter = 0xFFFD;
+
 /// Well-formed UTF-8 (RFC 3629: no overlong forms, no surrogates, at most U+10FFFF).
 bool isUtf8(std::string_view bytes);
 
@@ -21,6 +24,16 @@ std::optional<char32_t> takeCodePoint(std::string_view& bytes);
 
 /// `codePoint` is at most U+10FFFF and no surrogate.
 void appendUtf8(std::string& text, char32_t codePoint);
+
+/// How many bytes the code point has that this byte begins; 0 when it begins none.
+std::size_t sequenceLength(char first);
+
+/// Whether the byte is one of those that follow the first one of a code point.
+bool isContinuation(char byte);
+
+/// The text of a file as UTF-8, in the encoding that its byte order mark declares (UTF-8, UTF-16 of either order);
+/// without a mark the bytes as they are. What cannot be decoded becomes U+FFFD.
+std::string decodedText(std::string_view bytes);
 
 /// A code point that may change what a terminal shows of other text: C0 and C1 controls, DEL, line and paragraph
 /// separators, bidirectional controls. All are below U+10000.
@@ -36,6 +49,12 @@ std::string upperCased(std::string_view text);
 
 /// Less than, equal to or greater than 0, by ASCII letters without regard to case.
 int compareIgnoringCase(std::string_view left, std::string_view right);
+
+/// Whether a text begins so, by ASCII letters without regard to case.
+bool beginsIgnoringCase(std::string_view text, std::string_view beginning);
+
+/// The order of lists that people read: without regard to case, and by bytes where that makes no difference.
+bool isListedBefore(std::string_view left, std::string_view right);
 
 /// The usual leading-integer conversion: white space, an optional sign, digits; 0 when there are none. Saturates at the
 /// limits of 64 bits.

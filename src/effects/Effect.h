@@ -17,24 +17,28 @@ const char* nameOf(Outcome outcome);
 /// What a change of one setting really did, or why a read failed. A text that is absent was not known or does not
 /// apply.
 struct Effect {
-  std::string setting;  ///< one of platform/SettingNames.h
+  std::string setting = {};  ///< one of effects/SettingNames.h
   Outcome outcome = Outcome::applied;
-  std::optional<std::string> before;  ///< the live value before
-  std::optional<std::string> asked;   ///< the value asked for; absent for a read
-  std::optional<std::string> live;    ///< the live value, read back
-  std::optional<std::string> stored;  ///< the stored value, read back
-  std::string where;                  ///< where it is stored, so that it survives a restart
-  std::string undoneBy;               ///< what else on this machine may undo it; empty: nothing known
-  std::string note;                   ///< what an administrator should know besides
-  std::optional<Failure> failure;     ///< set when failed or not supported
+  std::optional<std::string> before = {};  ///< the live value before
+  std::optional<std::string> asked = {};   ///< the value asked for; absent for a read
+  std::optional<std::string> live = {};    ///< the live value, read back
+  std::optional<std::string> stored = {};  ///< the stored value, read back
+  std::string where = {};                  ///< where it is stored, so that it survives a restart
+  std::string undoneBy = {};               ///< what else on this machine may undo it; empty: nothing known
+  std::string note = {};                   ///< what an administrator should know besides
+  std::optional<Failure> failure = {};     ///< set when failed or not supported
+
+  bool operator==(const Effect&) const = default;
 };
 
 /// A setting as a getter found it.
 struct SettingValue {
-  std::string setting;
-  std::optional<std::string> live;
-  std::optional<std::string> stored;
-  std::string unit;  ///< "minutes", "seconds since 1970"; empty for words and names
+  std::string setting = {};
+  std::optional<std::string> live = {};
+  std::optional<std::string> stored = {};
+  std::string unit = {};  ///< "minutes", "seconds since 1970"; empty for words and names
+
+  bool operator==(const SettingValue&) const = default;
 };
 
 /// One line of JSON without a newline; absent and empty members are left out.

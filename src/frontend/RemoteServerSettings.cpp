@@ -5,7 +5,7 @@
 #include <cerrno>
 #include <system_error>
 
-#include "base/Surroundings.h"
+#include "base/Process.h"
 
 namespace tavisk {
 

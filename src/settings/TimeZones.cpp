@@ -8,14 +8,6 @@
 #include "frontend/ServerCommands.h"
 
 namespace tavisk {
-namespace {
-
-bool isListedBefore(const std::string& left, const std::string& right) {
-  const int order = compareIgnoringCase(left, right);
-  return order < 0 || (order == 0 && left < right);
-}
-
-}  // namespace
 
 std::string ServerCommands::localTimeZone() {
   std::string ofMachine = _context.host.clock().timeZone();

@@ -5,7 +5,7 @@
 #include <utility>
 #include <vector>
 
-#include "base/TextEncoding.h"
+#include "base/Text.h"
 #include "startupdisk/SDSystemSearcher.h"
 
 namespace tavisk {

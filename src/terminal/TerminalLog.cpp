@@ -7,7 +7,7 @@
 #include <cstdlib>
 #include <string_view>
 
-#include "base/Surroundings.h"
+#include "base/Process.h"
 #include "base/Text.h"
 
 namespace tavisk {

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <ostream>
 #include <string>
 #include <vector>
 
@@ -9,24 +10,37 @@
 
 namespace tavisk {
 
-/// Remembers what it is told, a line each: "begins SETTING ASKED", or the JSON of the effect or value.
+/// How test reports show what is compared.
+inline void PrintTo(const Failure& failure, std::ostream* out) {
+  *out << describe(failure) << " (" << failure.code << ")";
+}
+inline void PrintTo(const Effect& effect, std::ostream* out) {
+  *out << toJson(effect);
+  if (effect.failure) *out << " (" << effect.failure->code << ")";
+}
+inline void PrintTo(const SettingValue& value, std::ostream* out) {
+  *out << toJson(value);
+}
+
+/// Remembers what it is told: as values, and in one order a line each: "begins SETTING ASKED", or the JSON of the
+/// effect or value.
 class EffectLog final : public EffectChannel {
  public:
   void changeBegins(const std::string& setting, const std::string& asked) override {
     lines.push_back("begins " + setting + " " + asked);
   }
   void record(const Effect& effect) override {
-    lines.push_back(toJson(effect));
     effects.push_back(effect);
+    lines.push_back(toJson(effect));
   }
   void observe(const SettingValue& value) override {
-    lines.push_back(toJson(value));
     values.push_back(value);
+    lines.push_back(toJson(value));
   }
 
+  std::vector<Effect> effects;
+  std::vector<SettingValue> values;
   std::vector<std::string> lines;
-  std::vector<Effect> effects;       ///< those among the lines
-  std::vector<SettingValue> values;  ///< those among the lines
 };
 
 }  // namespace tavisk

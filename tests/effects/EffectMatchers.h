@@ -7,13 +7,10 @@
 #include <ostream>
 #include <string>
 
-#include "effects/Effect.h"
+#include "effects/EffectLog.h"
 
 namespace tavisk {
 
-inline void PrintTo(const Effect& effect, std::ostream* stream) {
-  *stream << toJson(effect);
-}
 inline void PrintTo(Outcome outcome, std::ostream* stream) {
   *stream << nameOf(outcome);
 }

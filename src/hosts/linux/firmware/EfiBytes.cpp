@@ -5,13 +5,11 @@
 #include <array>
 
 #include "base/Text.h"
-#include "base/TextEncoding.h"
 
 namespace tavisk {
 namespace {
 
 constexpr std::string_view byteOrderMark = "\xFF\xFE";
-constexpr char32_t replacement = 0xFFFD;
 constexpr char32_t firstBeyondUnit = 0x10000;
 
 /// The fields of an identifier: how many bytes each has, the first three least byte first.
@@ -61,7 +59,7 @@ std::string toUtf16(std::string_view text) {
   while (!text.empty()) {
     const auto character = takeCodePoint(text);
     if (!character) text.remove_prefix(1);
-    char32_t left = character.value_or(replacement);
+    char32_t left = character.value_or(replacementCharacter);
     if (left >= firstBeyondUnit) {
       left -= firstBeyondUnit;
       appendNumber(bytes, 0xD800U + (left >> 10U), 2);

@@ -11,6 +11,17 @@
 
 namespace tavisk {
 
+/// What the tool needs of the process before anything else; call it first, from the only thread. False when the process
+/// cannot be used at all: no standard descriptors and no /dev/null.
+///
+/// Standard descriptors that are closed are opened such that reads find the end and writes fail: no other file can take
+/// their place. Writing to a closed pipe or beyond the size limit becomes an error. Of the environment, only TAVISK_*,
+/// LANG, LC_*, TERM, NO_COLOR and SUDO_UID are kept.
+bool prepareProcess();
+
+/// One line on standard error: "tavisk: TEXT".
+void complain(const std::string& text);
+
 /// The signals that end a run: INT, TERM, and HUP unless the run was started with it ignored, as nohup(1) does.
 /// Making one blocks them in this thread and in all threads that it starts from then on.
 class EndingSignals {
