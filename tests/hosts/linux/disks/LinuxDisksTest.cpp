@@ -4,6 +4,7 @@
 
 #include "LoopDevice.h"
 #include "OwnMounts.h"
+#include "effects/EffectMatchers.h"
 #include "hosts/linux/disks/DiskTree.h"
 #include "hosts/linux/disks/LinuxDiskQueries.h"
 #include "platform/DiskEventsContract.h"
@@ -11,7 +12,7 @@
 namespace tavisk {
 namespace {
 
-using testing::AllOf, testing::Each, testing::HasSubstr, testing::IsEmpty, testing::Not;
+using testing::AllOf, testing::Each, testing::IsEmpty, testing::Not;
 
 /// Disks of this machine that are images, with mounts that nobody else sees.
 class RealDisks {
@@ -173,7 +174,7 @@ TEST(LinuxDisks, ReadsTheDiskWhereNoDeviceManagerRuns) {
 
   // Mounted and not to be read: what the mount table says is left, and the failure is told.
   EXPECT_EQ(tree.describe("sda2")->volumeKind, "ext4");
-  EXPECT_THAT(tree.log.lines, AllOf(Not(IsEmpty()), Each(HasSubstr("/dev/sda2"))));
+  EXPECT_THAT(tree.log.effects, AllOf(Not(IsEmpty()), Each(FailedFor("/dev/sda2"))));
 }
 
 TEST(LinuxDisks, FindsTheDiskOfAnyPath) {
