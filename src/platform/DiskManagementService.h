@@ -13,6 +13,20 @@ enum class DiskTrait { internal, cd, dvd, optical };
 /// The connection protocols that have a meaning to the callers.
 enum class DiskProtocol { usb, diskImage };
 
+/// What preBootEnvironment() answers.
+namespace preboot {
+inline constexpr int noneKnown = 0;
+inline constexpr int openFirmware = 1;
+inline constexpr int loadsBootEfi = 2;  ///< a firmware that loads "boot.efi"
+}  // namespace preboot
+
+/// What partitionScheme() answers; other codes are the host's.
+namespace partitionmap {
+inline constexpr int noneKnown = 0;
+inline constexpr int openFirmware = 1;  ///< the map that Open Firmware starts from
+inline constexpr int gpt = 2;
+}  // namespace partitionmap
+
 /// A status as the contract of these services has it: 0 is success.
 using ServiceStatus = int;
 
@@ -31,8 +45,7 @@ class DiskQueries {
   virtual std::string protocolOf(const DiskName& disk) = 0;
   /// The host's name for a protocol, as protocolOf answers it.
   virtual std::string nameOf(DiskProtocol protocol) = 0;
-  /// The code of the partition map: 0 none known, 1 the map that Open Firmware starts from, 2 GPT; others are the
-  /// host's.
+  /// The code of the partition map, one of `partitionmap` or the host's.
   virtual int partitionScheme(const DiskName& disk) = 0;
   /// Whether the optical disc can start this machine.
   virtual OpticalBootability opticalBootability(const DiskName& disk) = 0;
@@ -64,7 +77,7 @@ class BootSettings {
     bool lumara9 = false;
   };
 
-  /// 0: no pre-boot environment known; 1: Open Firmware; 2: a firmware that loads "boot.efi". From any thread.
+  /// One of `preboot`. From any thread.
   virtual int preBootEnvironment() = 0;
   virtual LegacyBootSupport legacyBootSupport() = 0;
   virtual BootPreference bootPreference() = 0;

@@ -10,7 +10,7 @@ namespace tavisk {
 namespace {
 
 constexpr const char* nvramTool = "/usr/sbin/nvram";
-constexpr int openFirmware = 1;
+constexpr int generationsToCarrier = 2;
 constexpr std::string_view deviceTreePrefix = "IODeviceTree:";
 
 bool isAscii(std::string_view text) {
@@ -29,7 +29,7 @@ bool listHas(const IORegistry::Data& list, std::string_view wanted) {
 
 /// The device that carries the service: its parent's parent.
 std::optional<RegistryEntry> carrierOf(SDEnvironment& environment, RegistryEntry entry) {
-  for (int generation = 0; generation < 2; ++generation) {
+  for (int generation = 0; generation < generationsToCarrier; ++generation) {
     auto [status, parent] = environment.host.registry().parent(entry, RegistryPlane::service);
     if (status != 0) {
       environment.log.always("%s IORegistryEntryGetParentEntry %08x", {"getOFPathForBSDName", status});
@@ -54,13 +54,13 @@ std::optional<std::map<std::string, std::string>> interfacesByPath(SDEnvironment
 }  // namespace
 
 std::optional<std::string> runNVRAMTool(SDEnvironment& environment, const std::string& argument) {
-  if (environment.host.diskManagement().preBootEnvironment() == openFirmware) return std::nullopt;
+  if (environment.host.diskManagement().preBootEnvironment() == preboot::openFirmware) return std::nullopt;
   const auto output = environment.host.programs().run(nvramTool, {argument});
   if (!output) return std::nullopt;
   environment.log.debug("%@ %@ (exit status %d)", {nvramTool, argument, output->exitStatus});
   if (output->exitStatus != 0 || !isAscii(output->text)) return std::nullopt;
   if (output->text.size() <= argument.size() + 2) return std::nullopt;
-  std::string value = output->text.substr(argument.size() + 1);
+  auto value = output->text.substr(argument.size() + 1);
   if (value.ends_with('\n')) value.pop_back();
   return value;
 }

@@ -3,7 +3,6 @@
 #include "startupdisk/SDController.h"
 
 #include "startupdisk/Firmware.h"
-#include "startupdisk/SDNotifications.h"
 
 namespace tavisk {
 

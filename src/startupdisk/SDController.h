@@ -14,12 +14,27 @@
 #include "startupdisk/FoundSystems.h"
 #include "startupdisk/SDEnvironment.h"
 #include "startupdisk/SDSystemSearcher.h"
-#include "startupdisk/SystemSearcherProtocol.h"
 
 namespace tavisk {
 
+/// The notifications of the controller; the object, where there is one, is an SDRecordRef. The spelling "Dissappear"
+/// belongs to the names.
+namespace sdnotification {
+
+inline constexpr const char* systemDidAppear = "SDSystemDidAppear";
+inline constexpr const char* systemVolumeDidAppear = "SDSystemVolumeDidAppear";
+inline constexpr const char* wirestartVolumeDidAppear = "SDWirestartVolumeDidAppear";  ///< kept; never posted
+inline constexpr const char* systemDidDissappear = "SDSystemDidDissappear";
+inline constexpr const char* bootSystemDetermined = "SDBootSystemDetermined";
+inline constexpr const char* systemVolumeDidDissappear = "SDSystemVolumeDidDissappear";  ///< kept; never posted
+inline constexpr const char* wirestartVolumeDidDissappear = "SDWirestartVolumeDidDissappear";
+inline constexpr const char* busySearching = "SDBusySearching";
+inline constexpr const char* doneSearching = "SDDoneSearching";
+
+}  // namespace sdnotification
+
 /// Knows which systems on the machine's volumes can start it, and which one it starts from. It follows the volumes as
-/// they come, go and change, and announces what happens with the notifications of SDNotifications.h.
+/// they come, go and change, and announces what happens with its notifications.
 /// Main thread only, except for currentBootDevice, which several threads may ask.
 class SDController : public SystemSearcherProtocol {
  public:
@@ -108,12 +123,15 @@ class SDController : public SystemSearcherProtocol {
 
   void _post(const char* notification, std::any object = {}) const;
 
+  static constexpr double usualScanInterval = 180.0;            ///< seconds
+  using IdentifiedImage = std::pair<std::string, SDRecordRef>;  ///< with its "id"
+
   SDEnvironment& _environment;
   DiskManagementService& _dmm;
   DiskEventSession& _daSession;
   FoundSystems _validSystems;
-  std::vector<std::pair<std::string, SDRecordRef>> _wirestartSystems;  ///< by their "id"
-  SDRecordRef _curBootDevice;                                          ///< guarded by _bootLock
+  std::vector<IdentifiedImage> _wirestartSystems;
+  SDRecordRef _curBootDevice;  ///< guarded by _bootLock
   std::unique_ptr<SDSystemSearcher> _systemSearcher;
   std::mutex _bootSearchLock;  ///< held while the host is asked for the boot preference; only tried, never waited for
   std::mutex _bootLock;        ///< taken after _bootSearchLock; never held across a call to the host
@@ -121,7 +139,7 @@ class SDController : public SystemSearcherProtocol {
   [[maybe_unused]] bool _hasChanged = false;            ///< kept by the contract
   [[maybe_unused]] bool _curDeviceIsWirestart = false;  ///< kept by the contract
   RunLoop::Registration _wirestartScanTimer;
-  double _wirestartScanInterval = 180.0;  ///< seconds
+  double _wirestartScanInterval = usualScanInterval;
   std::int64_t _preBootEnvironmentFlag;
 };
 

@@ -5,7 +5,6 @@
 #include "base/Locale.h"
 #include "platform/Processes.h"
 #include "startupdisk/SDController.h"
-#include "startupdisk/SDNotifications.h"
 
 namespace tavisk {
 namespace {
@@ -29,13 +28,13 @@ std::optional<std::string> descriptionOf(const SDRecordRef& record) {
 }  // namespace
 
 SDRecordRef SDController::currentBootDevice() {
-  if (auto known = _knownBootDevice()) {
+  if (const auto known = _knownBootDevice()) {
     _environment.log.debug("currentBootDevice cached: %@", {known->description()});
     return known;
   }
   _askBootPreference();
   _askNetworkBootPreference();
-  auto device = _knownBootDevice();
+  const auto device = _knownBootDevice();
   _environment.log.debug("currentBootDevice: %@", {descriptionOf(device)});
   return device;
 }
@@ -61,7 +60,7 @@ SDDiskRef SDController::_takeBootPreference() {
   _environment.log.debug("currentBootDevice: being checked by DiskManagement");
   const auto preference = _dmm.bootPreference();
   if (preference.status != 0 || !preference.disk) return nullptr;
-  auto bootDisk = _recordOf(*preference.disk);
+  const auto bootDisk = _recordOf(*preference.disk);
   _rememberBootDevice(bootDisk);
   _environment.log.debug("currentBootDevice found _curBootDevice: %@", {bootDisk->description()});
   return bootDisk;
@@ -92,7 +91,7 @@ void SDController::_askNetworkBootPreference() {
 }
 
 SDRecordRef SDController::_selectedImageOn(const std::string& interface) const {
-  for (const auto& [identifier, image] : _wirestartSystems)
+  for (const auto& image : wirestartSystems())
     if (image->has(recordkey::isSelected) && image->textForKey(recordkey::interface) == interface) return image;
   return nullptr;
 }
@@ -124,14 +123,14 @@ bool SDController::_writeBootChoice(const SDDisk& system) {
   if (!system.disk()) return false;
   const auto version = system.integerForKey(recordkey::systemVersionMajor);
   const BootSettings::BootChoice choice{*system.disk(), system.textForKey(recordkey::systemFolderPath).value_or(""),
-                                        version && *version != 10};
+                                        version && *version != systemversion::lumaraX};
   return _dmm.setBootPreference(choice) == 0 && _dmm.setFirmwareVariable("prev-lang:kbd", _languageAndKeyboard()) == 0;
 }
 
 void SDController::_logBootChoice(const SDDisk& system) const {
   const auto& log = _environment.log;
-  log.debug("Setting<std::string> Startup Disk: %@", {system.description()});
-  log.debug("***************************** Setting<std::string> Startup Disk *****************************");
+  log.debug("Setting Startup Disk: %@", {system.description()});
+  log.debug("***************************** Setting Startup Disk *****************************");
   log.debug("******         Volume: %@", {system.volumeName()});
   log.debug("******  System Folder: %@", {system.textForKey(recordkey::systemFolderPath)});
   log.debug("****** System Version: %@", {system.objectForKey(recordkey::systemVersionMajor)});
@@ -141,13 +140,13 @@ void SDController::_logBootChoice(const SDDisk& system) const {
 std::string SDController::_languageAndKeyboard() const {
   const auto layout = _environment.host.keyboardInput().currentLayoutNumber().value_or(0);
   const auto languages = _environment.host.userDefaults().strings("VelmarLanguages");
-  const std::string language = languages.empty() ? "en" : languages.front();
-  return formatMessage("%@:%ld", {canonicalLocaleIdentifier(language), layout});
+  const auto language = canonicalLocaleIdentifier(languages.empty() ? "en" : languages.front());
+  return formatMessage("%@:%ld", {language, layout});
 }
 
 ServiceStatus SDController::setTargetDiskMode() {
-  if (_preBootEnvironmentFlag != 2) return _dmm.setFirmwareVariable("boot-command", targetModeCommand);
-  return _dmm.setFirmwareVariable("target-mode", "1");
+  return _preBootEnvironmentFlag == preboot::loadsBootEfi ? _dmm.setFirmwareVariable("target-mode", "1")
+                                                          : _dmm.setFirmwareVariable("boot-command", targetModeCommand);
 }
 
 }  // namespace tavisk

@@ -7,25 +7,24 @@ namespace tavisk {
 namespace {
 
 constexpr const char* rackServerModel = "Corvane1,1";
-constexpr std::int64_t lumara9 = 9;
 
 }  // namespace
 
 bool SDController::_canBootLegacyOS() const {
-  if (_preBootEnvironmentFlag != 2) return false;
+  if (_preBootEnvironmentFlag != preboot::loadsBootEfi) return false;
   const auto support = _dmm.legacyBootSupport();
   return support.status == 0 && support.supported;
 }
 
 bool SDController::_canBootThisSystem(const SDDisk& volume) const {
-  const int scheme = volume.disk() ? _dmm.partitionScheme(*volume.disk()) : 0;
+  const auto scheme = volume.disk() ? _dmm.partitionScheme(*volume.disk()) : partitionmap::noneKnown;
   switch (_preBootEnvironmentFlag) {
-    case 0:
-      return scheme != 1 && scheme != 2;
-    case 1:
-      return scheme == 1;
+    case preboot::noneKnown:
+      return scheme != partitionmap::openFirmware && scheme != partitionmap::gpt;
+    case preboot::openFirmware:
+      return scheme == partitionmap::openFirmware;
     default:
-      return scheme != 1;
+      return scheme != partitionmap::openFirmware;
   }
 }
 
@@ -39,12 +38,11 @@ bool SDController::_isDiskImage(const SDDisk& volume) const {
 }
 
 bool SDController::_isExcludedSystem(const SDRecord& system) const {
-  if (_excludesLumara9() && system.integerForKey(recordkey::systemVersionMajor) == lumara9) {
+  if (_excludesLumara9() && system.integerForKey(recordkey::systemVersionMajor) == systemversion::lumara9) {
     _environment.log.debug("Lumara 9 System Folder excluded: %@", {system.textForKey(recordkey::systemFolderPath)});
     return true;
   }
-  const auto mountPoint = system.mountPoint();
-  if (_startedFromNetwork() && mountPoint == "/") {
+  if (_startedFromNetwork() && system.mountPoint() == "/") {
     _environment.log.debug("Excluding systems on root volume when Wirestarted.");
     return true;
   }

@@ -3,7 +3,6 @@
 #include <algorithm>
 
 #include "startupdisk/SDController.h"
-#include "startupdisk/SDNotifications.h"
 
 namespace tavisk {
 
@@ -19,8 +18,8 @@ void SDController::diskDisappeared(const DiskEvent& event, void* controller) {
 void SDController::diskDescriptionChanged(const DiskEvent& event, void* controller) {
   auto& self = *static_cast<SDController*>(controller);
   const auto& changed = event.changed;
-  const bool moved = std::ranges::find(changed, DiskKey::volumePath) != changed.end();
-  if (moved && !self._recordOf(event.disk)->mountPoint().empty()) {
+  const bool isMoved = std::ranges::find(changed, DiskKey::volumePath) != changed.end();
+  if (isMoved && !self._recordOf(event.disk)->mountPoint().empty()) {
     self._volumeAppeared(event.disk);
   } else {
     self._volumeDisappeared(event.disk);

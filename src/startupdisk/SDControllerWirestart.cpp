@@ -5,13 +5,11 @@
 
 #include "startupdisk/Firmware.h"
 #include "startupdisk/SDController.h"
-#include "startupdisk/SDNotifications.h"
 
 namespace tavisk {
 namespace {
 
 constexpr const char* scanIntervalDefault = "SDWirestartScanInterval";
-constexpr double defaultInterval = 180.0;
 constexpr double shortestInterval = 20.0;
 
 /// Saturates where the clock's range ends, some hundred years from now.
@@ -39,7 +37,7 @@ void SDController::addWirestartImage(const SDRecordRef& image) {
 
 void SDController::removeWirestartImageWithIdentifier(const std::optional<std::string>& identifier) {
   if (!identifier) return;
-  const SDRecordRef image = _removeImage(*identifier);
+  const auto image = _removeImage(*identifier);
   const std::any object = image ? std::any(image) : std::any();
   _post(sdnotification::systemDidDissappear, object);
   _post(sdnotification::wirestartVolumeDidDissappear, object);
@@ -47,17 +45,16 @@ void SDController::removeWirestartImageWithIdentifier(const std::optional<std::s
 
 /// Null when there was no image with this identifier.
 SDRecordRef SDController::_removeImage(const std::string& identifier) {
-  const auto place =
-      std::ranges::find_if(_wirestartSystems, [&](const auto& entry) { return entry.first == identifier; });
+  const auto place = std::ranges::find(_wirestartSystems, identifier, &IdentifiedImage::first);
   if (place == _wirestartSystems.end()) return nullptr;
-  SDRecordRef image = place->second;
+  auto image = std::move(place->second);
   _wirestartSystems.erase(place);
   return image;
 }
 
 void SDController::setupWirestartUpdating() {
   if (!supportsWirestart()) return;
-  _wirestartScanInterval = defaultInterval;
+  _wirestartScanInterval = usualScanInterval;
   if (const auto wanted = _environment.host.userDefaults().number(scanIntervalDefault)) {
     if (!(*wanted > 0)) {
       _environment.log.debug("Wirestart rescan disabled.\n");
@@ -73,8 +70,7 @@ void SDController::setupWirestartUpdating() {
 double SDController::_allowedInterval(double wanted) const {
   if (wanted >= shortestInterval) return wanted;
   _environment.log.always(
-      "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting<std::string> Wirestart scan "
-      "time to 20 "
+      "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting Wirestart scan time to 20 "
       "seconds. User had requested %.0f seconds.",
       {wanted});
   return shortestInterval;

@@ -4,7 +4,7 @@
 
 #include <utility>
 
-#include "startupdisk/MessageFormat.h"
+#include "startupdisk/SDLog.h"
 
 namespace tavisk {
 
@@ -12,8 +12,8 @@ SDDisk::SDDisk(const SDDiskServices& services, std::optional<DiskName> disk)
     : _services(services), _disk(std::move(disk)) {}
 
 SDDiskRef SDDisk::initWithDADiskFromPath(const std::string& path, const SDDiskServices& andSession) {
-  auto disk = andSession.session.diskOfPath(path);
-  return disk ? std::make_shared<SDDisk>(andSession, std::move(disk)) : nullptr;
+  const auto disk = andSession.session.diskOfPath(path);
+  return disk ? std::make_shared<SDDisk>(andSession, disk) : nullptr;
 }
 
 SDDiskRef SDDisk::diskFromDisk(const SDDisk& disk) {
@@ -22,7 +22,7 @@ SDDiskRef SDDisk::diskFromDisk(const SDDisk& disk) {
 
 SDDiskRef SDDisk::wholeDiskFromSDDisk(const SDDisk& disk) {
   if (!disk._disk) return nullptr;
-  auto whole = diskFromDisk(disk);
+  const auto whole = diskFromDisk(disk);
   whole->setDisk(disk._services.session.wholeDisk(*disk._disk));
   return whole;
 }
@@ -44,7 +44,7 @@ std::optional<std::string> SDDisk::deviceTreePath() const {
 }
 
 std::optional<std::string> SDDisk::volumeName() const {
-  auto given = textForKey(recordkey::volumeName);
+  const auto given = textForKey(recordkey::volumeName);
   return given ? given : entry(&DiskDescription::volumeName);
 }
 

@@ -29,7 +29,11 @@ struct SDMachineFacts {
 /// What all startup-disk code of a run works with.
 struct SDEnvironment {
   /// Nothing that is given is owned.
-  SDEnvironment(Host& host, RunLoop& runLoop, NotificationCenter& notifications);
+  SDEnvironment(Host& theHost, RunLoop& theRunLoop, NotificationCenter& theNotifications)
+      : host(theHost),
+        runLoop(theRunLoop),
+        notifications(theNotifications),
+        log(theHost.systemLog(), theHost.userDefaults()) {}
 
   SDDiskServices diskServices() { return {host.diskEvents(), host.diskManagement(), contexts}; }
 

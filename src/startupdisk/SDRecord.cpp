@@ -3,6 +3,7 @@
 #include "startupdisk/SDRecord.h"
 
 #include "base/Text.h"
+#include "startupdisk/SDLog.h"
 
 namespace tavisk {
 
@@ -17,6 +18,19 @@ std::optional<std::int64_t> SDRecord::integerForKey(const std::string& key) cons
   if (!value) return std::nullopt;
   const auto* number = std::get_if<std::int64_t>(&*value);
   return !number ? leadingInteger(std::get<std::string>(*value)) : *number;
+}
+
+std::optional<ContextValue> SDImage::objectForKey(const std::string& key) const {
+  const auto value = _values.find(key);
+  return value == _values.end() ? std::nullopt : std::optional(value->second);
+}
+
+std::string SDImage::description() const {
+  std::string text;
+  for (const auto& [key, value] : _values) {
+    text += formatMessage(text.empty() ? "%@ = %@" : "; %@ = %@", {key, value});
+  }
+  return "{" + text + "}";
 }
 
 }  // namespace tavisk

@@ -3,9 +3,11 @@
 #pragma once
 
 #include <cstdint>
+#include <map>
 #include <memory>
 #include <optional>
 #include <string>
+#include <utility>
 #include <variant>
 
 namespace tavisk {
@@ -19,12 +21,20 @@ inline constexpr const char* systemFolderPath = "SystemFolderPath";
 inline constexpr const char* productName = "ProductName";
 inline constexpr const char* productVersion = "ProductVersion";
 inline constexpr const char* productBuildVersion = "ProductBuildVersion";
-inline constexpr const char* systemVersionMajor = "SystemVersionMajor";  ///< a number: 10, 95 (Windows), 100 (foreign)
+inline constexpr const char* systemVersionMajor = "SystemVersionMajor";  ///< one of systemversion
 inline constexpr const char* wirestart = "Wirestart";                    ///< marks a network boot image
 inline constexpr const char* imageIdentifier = "id";
 inline constexpr const char* isSelected = "IsSelected";
 inline constexpr const char* interface = "interface";  ///< BSD name
 }  // namespace recordkey
+
+/// The kinds of systems, by the number of their version.
+namespace systemversion {
+inline constexpr std::int64_t lumara9 = 9;
+inline constexpr std::int64_t lumaraX = 10;
+inline constexpr std::int64_t windows = 95;
+inline constexpr std::int64_t foreignOS = 100;
+}  // namespace systemversion
 
 /// Where a Lumara X system lies on its volume.
 inline constexpr const char* coreServicesFolder = "/System/Library/CoreServices";
@@ -49,5 +59,19 @@ class SDRecord {
 };
 
 using SDRecordRef = std::shared_ptr<SDRecord>;
+
+/// A network boot image: a record with keys of its own and no disk.
+class SDImage final : public SDRecord {
+ public:
+  using Values = std::map<std::string, ContextValue>;
+  explicit SDImage(Values values) : _values(std::move(values)) {}
+
+  std::optional<ContextValue> objectForKey(const std::string& key) const override;
+  /// "{id = NB1; interface = en0}"
+  std::string description() const override;
+
+ private:
+  Values _values;
+};
 
 }  // namespace tavisk

@@ -76,7 +76,7 @@ void SDSystemSearcher::_searchOldestVolume() {
     _waitForQueuedVolume();
     return;
   }
-  const SDDiskRef volume = _takeOldestVolume();
+  const auto volume = _takeOldestVolume();
   if (!volume) return;
   _reportActivity();
   _pauseLock.pass();

@@ -14,9 +14,21 @@
 #include "startupdisk/SDDisk.h"
 #include "startupdisk/SDLog.h"
 #include "startupdisk/SearchQueue.h"
-#include "startupdisk/SystemSearcherProtocol.h"
 
 namespace tavisk {
+
+/// Who hears from the searcher: always on the main thread, in a later pass of the run loop, never inside a call of the
+/// searcher.
+class SystemSearcherProtocol {
+ public:
+  virtual ~SystemSearcherProtocol() = default;
+
+  /// The delegate's own end-of-search notice; the searcher never sends it.
+  virtual void searchCompleted() = 0;
+  virtual void searchActivity() = 0;
+  /// The context of the record holds the system description.
+  virtual void foundSystemOnVolume(SDDiskRef system) = 0;
+};
 
 /// What a searcher works with; nothing is owned. All of it can be used from any thread.
 struct SearcherServices {

@@ -11,13 +11,9 @@
 namespace tavisk {
 namespace {
 
-constexpr int firmwareThatLoadsBootEfi = 2;
-constexpr std::int64_t lumaraX = 10;
-constexpr std::int64_t windows = 95;
-constexpr std::int64_t foreignOS = 100;
-
 /// What the text file of an early release holds, and how that release is called.
-constexpr std::array<std::pair<std::string_view, const char*>, 2> betaReleases{{
+using BetaRelease = std::pair<std::string_view, const char*>;
+constexpr std::array<BetaRelease, 2> betaReleases{{
     {"Lumara X\nPublic Beta (build 1H39)\n", "Public Beta"},
     {"Lumara X\nPublic Beta (build 2E14)\n", "World Beta"},
 }};
@@ -53,10 +49,10 @@ std::string volumeRoot(FileSystem& files, const SDDisk& disk) {
 }  // namespace
 
 void SDSystemSearcher::_checkVolumeForObviousSystemFolders(SDDisk& volume) {
-  const std::string mountPoint = volume.mountPoint();
+  const auto mountPoint = volume.mountPoint();
   volume.setObject(mountPoint + coreServicesFolder, recordkey::systemFolderPath);
   if (_checkForLumaronVariants(volume)) return;
-  if (!volume.disk() || _services.management.partitionScheme(*volume.disk()) == 0) return;
+  if (!volume.disk() || _services.management.partitionScheme(*volume.disk()) == partitionmap::noneKnown) return;
   for (const char* folder : {"/WINDOWS", "/WINNT"}) {
     volume.setObject(mountPoint + folder, recordkey::systemFolderPath);
     if (_checkForMSVariants(volume)) return;
@@ -72,14 +68,14 @@ bool SDSystemSearcher::_checkForLumaronVariants(const SDDisk& volume) {
       !_hasKernel(*folder, system->mountPoint())) {
     return false;
   }
-  system->setObject(lumaraX, recordkey::systemVersionMajor);
+  system->setObject(systemversion::lumaraX, recordkey::systemVersionMajor);
   _describeLumaraX(*system, *folder);
   return _reportFound(system);
 }
 
 bool SDSystemSearcher::_mayStartFromItsBus(const SDDisk& disk, int preBootEnvironment) const {
   const bool isUsb = disk.protocol() == _services.management.nameOf(DiskProtocol::usb);
-  if (!isUsb || preBootEnvironment == firmwareThatLoadsBootEfi) return true;
+  if (!isUsb || preBootEnvironment == preboot::loadsBootEfi) return true;
   _services.log.debug("Booting from USB volumes is not supported. (%@)", {disk.volumeName()});
   _services.log.debug("Bailing from _checkForLumaronVariants");
   return false;
@@ -92,7 +88,7 @@ std::optional<std::string> SDSystemSearcher::_resolveSystemFolder(SDDisk& disk, 
     _services.log.debug(bailing);
     return std::nullopt;
   }
-  auto folder = _services.files.standardized(*candidate);
+  const auto folder = _services.files.standardized(*candidate);
   if (!folder) {
     _services.log.debug("stringByStandardizingPath could not resolve %@", {*candidate});
     return std::nullopt;
@@ -102,10 +98,10 @@ std::optional<std::string> SDSystemSearcher::_resolveSystemFolder(SDDisk& disk, 
 }
 
 bool SDSystemSearcher::_hasBootFile(const std::string& systemFolder, int preBootEnvironment) const {
-  const auto file = systemFolder + (preBootEnvironment == firmwareThatLoadsBootEfi ? "/boot.efi" : "/BootX");
-  const bool found = _services.files.exists(file);
-  _services.log.debug(found ? "Found %@" : "Couldn't find %@", {file});
-  return found;
+  const auto file = systemFolder + (preBootEnvironment == preboot::loadsBootEfi ? "/boot.efi" : "/BootX");
+  const bool isThere = _services.files.exists(file);
+  _services.log.debug(isThere ? "Found %@" : "Couldn't find %@", {file});
+  return isThere;
 }
 
 /// A linked system folder could be another volume's: only the volume itself may be reached by links.
@@ -168,8 +164,7 @@ std::optional<PropertyList> SDSystemSearcher::_readDictionary(const std::string&
 void SDSystemSearcher::_describeEarlyLumaraX(SDDisk& disk, const std::string& systemFolder) const {
   disk.setObject("Lumara X", recordkey::productName);
   const auto text = _readSoftwareVersion(systemFolder, disk.mountPoint());
-  const auto* release =
-      std::ranges::find_if(betaReleases, [&](const auto& candidate) { return candidate.first == text; });
+  const auto* release = std::ranges::find(betaReleases, text, &BetaRelease::first);
   if (release != betaReleases.end()) disk.setObject(release->second, recordkey::productVersion);
 }
 
@@ -191,7 +186,7 @@ bool SDSystemSearcher::_checkForMSVariants(const SDDisk& volume) {
   const auto system = SDDisk::diskFromDisk(volume);
   const auto folder = _resolveSystemFolder(*system, "Bailing from _checkForMSVariants:");
   if (!folder || !_isOnVolume(*folder, *system) || !_services.files.exists(*folder + "/SYSTEM.INI")) return false;
-  describe(*system, "Windows", windows);
+  describe(*system, "Windows", systemversion::windows);
   return _reportFound(system);
 }
 
@@ -214,9 +209,9 @@ bool SDSystemSearcher::_checkForOpticalVariants(const SDDiskRef& volume) {
   const bool isWindows =
       _services.files.exists(mountPoint + "/autorun.inf") || _services.files.exists(mountPoint + "/AUTORUN.INF");
   if (isWindows) {
-    describe(*volume, "Windows", windows);
+    describe(*volume, "Windows", systemversion::windows);
   } else {
-    describe(*volume, "Foreign OS", foreignOS);
+    describe(*volume, "Foreign OS", systemversion::foreignOS);
   }
   volume->setObject(mountPoint, recordkey::systemFolderPath);
   return _reportFound(volume);

@@ -26,11 +26,11 @@ SDDiskRef SearchQueue::takeOldest() {
 void SearchQueue::withdraw(const std::string& diskIdentifier) {
   const auto places = _placesOfDisk.find(diskIdentifier);
   if (places == _placesOfDisk.end()) return;
-  const SDDiskRef volume = *places->second.front();
+  const auto volume = *places->second.front();
   places->second.remove_if([&](Places::iterator place) {
-    const bool same = *place == volume;
-    if (same) _volumes.erase(place);
-    return same;
+    const bool isSame = *place == volume;
+    if (isSame) _volumes.erase(place);
+    return isSame;
   });
   if (places->second.empty()) _placesOfDisk.erase(places);
   _count = _volumes.size();

@@ -17,7 +17,10 @@ class StartupDisk {
       : _environment(host, runLoop, notifications) {}
 
   /// The one controller, made at the first call.
-  SDController& sharedController();
+  SDController& sharedController() {
+    if (!_controller) _controller = std::make_unique<SDController>(_environment);
+    return *_controller;
+  }
   /// Null before that call.
   const SDController* madeController() const { return _controller.get(); }
 

@@ -4,21 +4,17 @@
 
 #include <thread>
 
-#include "startupdisk/SDImage.h"
+#include "effects/EffectMatchers.h"
+#include "effects/SettingNames.h"
 #include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
 namespace {
 
 using testing::ElementsAre;
-using testing::HasSubstr;
 using testing::IsEmpty;
 
 const std::string folderOfA = "/Volumes/A/System/Library/CoreServices";
-
-SDRecordRef image(const SDImage::Values& values) {
-  return std::make_shared<SDImage>(values);
-}
 
 /// A machine that starts from disk0s2.
 struct BootMachine : StartupMachine {
@@ -74,7 +70,8 @@ TEST(BootDevice, AFailedReadIsInTheEffects) {
   BootMachine machine;
   machine.set("Refusals", "Startup Disk (read)", "a broken chip");
   EXPECT_EQ(machine.bootDevice(), "none");
-  EXPECT_THAT(machine.effectsLog(), ElementsAre(AllOf(HasSubstr("Startup Disk"), HasSubstr("a broken chip"))));
+  EXPECT_THAT(machine.log.effects, ElementsAre(FailedFor("a broken chip")));
+  EXPECT_EQ(machine.log.effects.front().setting, setting::startupDisk);
 }
 
 TEST(BootDevice, MayBeANetworkImage) {
@@ -131,13 +128,12 @@ TEST(BootDevice, IsChosenWithLanguageAndKeyboard) {
     EXPECT_EQ(machine.get("Firmware", "Boot Preference"),
               keys({{"Disk", "disk1s2"}, {"Folder", folder}, {"Lumara 9", false}}));
     EXPECT_EQ(machine.bootDevice(), "disk1s2 B");
-    EXPECT_THAT(
-        machine.systemLog(),
-        ElementsAre("Setting<std::string> Startup Disk: disk1s2 B",
-                    "***************************** Setting<std::string> Startup Disk *****************************",
-                    "******         Volume: B", "******  System Folder: " + std::string(folder),
-                    "****** System Version: 10", "****** OF Device Path: IODeviceTree:/b",
-                    "currentBootDevice cached: disk1s2 B"));
+    EXPECT_THAT(machine.systemLog(),
+                ElementsAre("Setting Startup Disk: disk1s2 B",
+                            "***************************** Setting Startup Disk *****************************",
+                            "******         Volume: B", "******  System Folder: " + std::string(folder),
+                            "****** System Version: 10", "****** OF Device Path: IODeviceTree:/b",
+                            "currentBootDevice cached: disk1s2 B"));
   }
 }
 
@@ -176,7 +172,7 @@ TEST(BootDevice, StaysWhereAChoiceFails) {
     EXPECT_FALSE(controller.setDeviceForBoot(controller.systems().back()));
     EXPECT_EQ(*machine.get("Firmware", "Boot Preference")->asDictionary()->find("Disk"), PropertyList(test.storedDisk));
     EXPECT_EQ(machine.variable("prev-lang:kbd"), "none");
-    EXPECT_THAT(machine.effectsLog().back(), AllOf(HasSubstr("\"failed\""), HasSubstr(test.effect)));
+    EXPECT_THAT(machine.log.effects.back(), FailedFor(test.effect));
     EXPECT_EQ(machine.bootDevice(), std::string(test.storedDisk) == "disk0s2" ? "disk0s2 A" : "disk1s2 B");
   }
 }
@@ -186,7 +182,7 @@ TEST(BootDevice, ANetworkImageIsOnlyRemembered) {
   auto& controller = machine.controller();
   EXPECT_TRUE(controller.setDeviceForBoot(image({{"Wirestart", "any"}})));
   EXPECT_EQ(machine.bootDevice(), "{Wirestart = any}");
-  EXPECT_THAT(machine.effectsLog(), IsEmpty());
+  EXPECT_THAT(machine.log.effects, IsEmpty());
   EXPECT_FALSE(controller.setDeviceForBoot(image({{"id", "not marked"}})));
 }
 

@@ -2,7 +2,6 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include "startupdisk/SDImage.h"
 #include "startupdisk/StartupDisk.h"
 #include "startupdisk/StartupDiskTest.h"
 
@@ -89,12 +88,11 @@ TEST(Controller, PassesOverWhatCannotStartTheMachine) {
   }
 }
 
-TEST(Controller, FollowsVolumesThatComeAndGo) {
+TEST(Controller, SearchesAVolumeThatComes) {
   StartupMachine machine;
   machine.addLumaraX("disk0s2", "A");
   machine.controller();
   NotificationRecorder recorder(machine.notifications);
-
   machine.addLumaraX("disk1s2", "B");
   machine.runPasses(1);
   EXPECT_THAT(machine.listed(), ElementsAre(systemFolder("A"))) << "searched in this pass, delivered in the next";
@@ -102,13 +100,19 @@ TEST(Controller, FollowsVolumesThatComeAndGo) {
   EXPECT_THAT(machine.listed(), ElementsAre(systemFolder("A"), systemFolder("B")));
   EXPECT_THAT(recorder.take(), ElementsAre("SDBusySearching", "SDBusySearching", "SDSystemDidAppear disk1s2 B",
                                            "SDSystemVolumeDidAppear disk1s2 B"));
+}
 
+TEST(Controller, DropsTheSystemsOfAVolumeThatIsUnmountedOrGone) {
+  StartupMachine machine;
+  machine.addLumaraX("disk0s2", "A");
+  machine.addLumaraX("disk1s2", "B");
+  machine.controller();
+  NotificationRecorder recorder(machine.notifications);
   machine.set("Disks", "disk0s2", keys({{"Volume Name", "A"}}));
   machine.runPasses(1);
   EXPECT_THAT(machine.listed(), ElementsAre(systemFolder("B")));
   EXPECT_THAT(recorder.take(),
               ElementsAre("SDSystemDidDissappear disk0s2 A", "SDWirestartVolumeDidDissappear disk0s2 A"));
-
   machine.describe(*writePropertyList(Keys()));
   machine.runPasses(1);
   EXPECT_THAT(machine.listed(), IsEmpty());

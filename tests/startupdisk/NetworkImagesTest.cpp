@@ -3,7 +3,6 @@
 #include <gmock/gmock.h>
 
 #include "startupdisk/Firmware.h"
-#include "startupdisk/SDImage.h"
 #include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
@@ -11,10 +10,6 @@ namespace {
 
 using testing::ElementsAre;
 using testing::IsEmpty;
-
-SDRecordRef image(const SDImage::Values& values) {
-  return std::make_shared<SDImage>(values);
-}
 
 TEST(NetworkImages, AreHeldByTheirIdentifier) {
   StartupMachine machine;
@@ -36,12 +31,17 @@ TEST(NetworkImages, AreHeldByTheirIdentifier) {
   EXPECT_THAT(controller.wirestartSystems(), ElementsAre(replacement));
   EXPECT_THAT(recorder.take(), ElementsAre("SDSystemDidDissappear {id = 2}", "SDWirestartVolumeDidDissappear {id = 2}",
                                            "SDSystemDidDissappear", "SDWirestartVolumeDidDissappear"));
-  EXPECT_THAT(machine.systemLog(), IsEmpty());
+}
+
+TEST(NetworkImages, AreLoggedAndNeedAnIdentifier) {
+  StartupMachine machine;
+  auto& controller = machine.controller();
   controller.addWirestartImage(image({{"interface", "en0"}}));
+  EXPECT_THAT(controller.wirestartSystems(), IsEmpty());
   EXPECT_THAT(machine.systemLog(), ElementsAre("-[SDController addWirestartImage:] No identifier for wirestartImage: "
                                                "{interface = en0}"));
   machine.debug();
-  controller.addWirestartImage(second);
+  controller.addWirestartImage(image({{"id", "2"}}));
   EXPECT_EQ(machine.systemLog().back(), "addWirestartImage - {id = 2}");
 }
 
@@ -61,8 +61,7 @@ TEST(NetworkImages, AreScannedForAtTheUsersInterval) {
     return "Wirestart rescan time interval set to " + std::string(seconds) + " seconds";
   };
   const auto tooOften = [](const char* seconds) {
-    return "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting<std::string> Wirestart "
-           "scan time to 20 "
+    return "Startup Disk can not scan Wirestart volumes less than every 20 seconds. Setting Wirestart scan time to 20 "
            "seconds. User had requested " +
            std::string(seconds) + " seconds.";
   };

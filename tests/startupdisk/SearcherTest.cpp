@@ -87,31 +87,57 @@ class Worker {
   std::thread _thread;
 };
 
-TEST(Searcher, AWorkerSearchesTheRootsOfVolumesOldestFirst) {
-  StartupMachine machine;
-  const auto disc = keys({{"Kind", "cd9660"}, {"Optical", true}, {"Optical Bootable", true}});
-  machine.addVolume("disk0s1", "A", keys({{"Kind", "ntfs"}}));
-  machine.addVolume("disk1", "B", disc);
-  machine.addVolume("disk2s1", "C", keys({{"Kind", "msdos"}}));
-  for (const char* volume : {"A", "C"}) machine.writeFile("/Volumes/" + std::string(volume) + "/SYSTEM.INI", "");
-  RecordingDelegate delegate;
-  const auto searcher = machine.searcher(delegate, true);
-  for (const char* disk : {"disk0s1", "disk1", "disk2s1"}) searcher->searchForSystemOnVolume(machine.volume(disk));
+/// The volumes of two Windows systems and of a disc, which wait for the long search in this order: A, B, C.
+class WaitingVolumes {
+ public:
+  WaitingVolumes() {
+    const auto disc = keys({{"Kind", "cd9660"}, {"Optical", true}, {"Optical Bootable", true}});
+    machine.addVolume("disk0s1", "A", keys({{"Kind", "ntfs"}}));
+    machine.addVolume("disk1", "B", disc);
+    machine.addVolume("disk2s1", "C", keys({{"Kind", "msdos"}}));
+    for (const char* volume : {"A", "C"}) machine.writeFile("/Volumes/" + std::string(volume) + "/SYSTEM.INI", "");
+    for (const char* disk : {"disk0s1", "disk1", "disk2s1"}) searcher->searchForSystemOnVolume(machine.volume(disk));
+  }
+  bool findsAll() {
+    const auto deadline = RunLoop::Clock::now() + std::chrono::seconds(30);
+    return machine.runLoop.runUntil(deadline, [&] { return delegate.found.size() == 3; });
+  }
+  std::vector<std::string> found() const {
+    std::vector<std::string> found;
+    for (const auto& system : delegate.found)
+      found.push_back(system->description() + *system->textForKey(recordkey::systemFolderPath));
+    return found;
+  }
 
-  searcher->setSearchPaused(true);
-  const Worker worker(*searcher, machine.volume("disk9"));
-  machine.runLoop.runUntil(RunLoop::Clock::now() + std::chrono::milliseconds(50));
-  EXPECT_GE(searcher->waitingVolumes(), 2U) << "a pause stops the worker before its next volume";
-  EXPECT_TRUE(delegate.found.empty());
-  searcher->setSearchPaused(false);
-  EXPECT_TRUE(machine.runLoop.runUntil(RunLoop::Clock::now() + std::chrono::seconds(30),
-                                       [&] { return delegate.found.size() == 3; }));
-  std::vector<std::string> windows;
-  for (const auto& system : delegate.found)
-    windows.push_back(system->description() + *system->textForKey(recordkey::systemFolderPath));
-  EXPECT_THAT(windows,
-              testing::UnorderedElementsAre("disk0s1 A/Volumes/A", "disk1 B/Volumes/B", "disk2s1 C/Volumes/C"));
-  EXPECT_LT(std::ranges::find(windows, "disk0s1 A/Volumes/A"), std::ranges::find(windows, "disk2s1 C/Volumes/C"));
+  StartupMachine machine;
+  RecordingDelegate delegate;
+  const std::unique_ptr<SDSystemSearcher> searcher = machine.searcher(delegate, true);
+};
+
+TEST(Searcher, AWorkerSearchesTheRootsOfVolumesOldestFirst) {
+  WaitingVolumes volumes;
+  const Worker worker(*volumes.searcher, volumes.machine.volume("disk9"));
+  ASSERT_TRUE(volumes.findsAll());
+  const auto found = volumes.found();
+  EXPECT_THAT(found, testing::UnorderedElementsAre("disk0s1 A/Volumes/A", "disk1 B/Volumes/B", "disk2s1 C/Volumes/C"));
+  EXPECT_LT(std::ranges::find(found, "disk0s1 A/Volumes/A"), std::ranges::find(found, "disk2s1 C/Volumes/C"));
+}
+
+TEST(Searcher, APauseStopsAWorkerBeforeItsNextVolume) {
+  WaitingVolumes volumes;
+  volumes.machine.runPasses(1);
+  volumes.searcher->setSearchPaused(true);
+  const auto activities = volumes.delegate.activities;
+  const Worker worker(*volumes.searcher, volumes.machine.volume("disk9"));
+  const auto deadline = RunLoop::Clock::now() + std::chrono::seconds(30);
+  // It tells that it has taken the first volume, and then stands before the gate.
+  EXPECT_TRUE(volumes.machine.runLoop.runUntil(
+      deadline, [&] { return volumes.searcher->waitingVolumes() == 2 && volumes.delegate.activities > activities; }));
+  volumes.machine.runPasses(2);
+  EXPECT_EQ(volumes.searcher->waitingVolumes(), 2U);
+  EXPECT_THAT(volumes.found(), testing::IsEmpty());
+  volumes.searcher->setSearchPaused(false);
+  EXPECT_TRUE(volumes.findsAll());
 }
 
 TEST(Searcher, TheWorkersRoutineRunsForEver) {

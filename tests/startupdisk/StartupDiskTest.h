@@ -7,8 +7,8 @@
 
 #include "ScratchMachine.h"
 #include "base/NotificationCenter.h"
+#include "effects/EffectLog.h"
 #include "startupdisk/SDController.h"
-#include "startupdisk/SDNotifications.h"
 
 namespace tavisk {
 
@@ -35,6 +35,8 @@ class RecordingDelegate final : public SystemSearcherProtocol {
 /// A scratch machine with volumes, and the startup-disk code on it.
 class StartupMachine : public ScratchMachine {
  public:
+  StartupMachine() { effects.addChannel(log); }
+
   /// A disk that is mounted at /Volumes/NAME, or what the keys say.
   void addVolume(const std::string& disk, const std::string& name, const Keys& other = {}) {
     Keys values = keys({{"Volume Name", name}, {"Mount Point", "/Volumes/" + name}});
@@ -77,12 +79,17 @@ class StartupMachine : public ScratchMachine {
     for (int pass = 0; pass < count; ++pass) runLoop.runPass();
   }
 
+  EffectLog log;
   NotificationCenter notifications;
 
  private:
   std::unique_ptr<SDEnvironment> _environment;
   std::unique_ptr<SDController> _controller;
 };
+
+inline SDRecordRef image(const SDImage::Values& values) {
+  return std::make_shared<SDImage>(values);
+}
 
 /// What was announced, one line a notification: its name and the disk or image that it is about.
 class NotificationRecorder {

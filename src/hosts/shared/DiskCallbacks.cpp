@@ -26,7 +26,7 @@ void DiskCallbacks::tell(const DiskEvent& event, const DiskDescription& disk) co
   const auto requests = _requests;  // a callback may take registrations back
   for (const auto& request : requests) {
     if (request.kind != event.kind || !request.match.accepts(disk)) continue;
-    const DiskEvent watched = watchedPart(event, request.watch);
+    const auto watched = watchedPart(event, request.watch);
     if (event.kind != DiskEvent::Kind::descriptionChanged || !watched.changed.empty())
       request.callback(watched, request.context);
   }
@@ -34,8 +34,8 @@ void DiskCallbacks::tell(const DiskEvent& event, const DiskDescription& disk) co
 
 void DiskCallbacks::tellDifferences(const DiskSnapshot& before, const DiskSnapshot& after) const {
   for (const auto& event : differences(before, after)) {
-    const bool gone = event.kind == DiskEvent::Kind::disappeared;
-    tell(event, *(gone ? before : after).find(event.disk));
+    const bool isGone = event.kind == DiskEvent::Kind::disappeared;
+    tell(event, *(isGone ? before : after).find(event.disk));
   }
 }
 

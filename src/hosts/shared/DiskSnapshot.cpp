@@ -4,6 +4,8 @@
 
 #include <utility>
 
+#include "base/Path.h"
+
 namespace tavisk {
 namespace {
 
@@ -11,16 +13,8 @@ DiskName nameOf(const DiskSnapshot::Disk& disk) {
   return {disk->mediaName.value_or("")};
 }
 
-/// "/Volumes/A" is in "/Volumes", that is in "/"; nothing holds "/" but itself.
-std::string parentFolder(const std::string& path) {
-  const auto slash = path.find_last_of('/');
-  return slash == 0 ? "/" : path.substr(0, slash);
-}
-
 std::optional<DiskEvent> eventOf(const DiskSnapshot::Disk& before, const DiskSnapshot::Disk& after) {
-  if (!before) {
-    return DiskEvent{DiskEvent::Kind::appeared, nameOf(after), {}};
-  }
+  if (!before) return DiskEvent{DiskEvent::Kind::appeared, nameOf(after), {}};
   auto changed = changedKeys(*before, *after);
   if (changed.empty()) return std::nullopt;
   return DiskEvent{DiskEvent::Kind::descriptionChanged, nameOf(after), std::move(changed)};
@@ -42,7 +36,7 @@ DiskSnapshot::Disk DiskSnapshot::find(const DiskName& name) const {
 
 std::optional<DiskName> DiskSnapshot::holding(const std::string& path) const {
   if (!path.starts_with('/')) return std::nullopt;
-  for (std::string folder = path;; folder = parentFolder(folder)) {
+  for (auto folder = path;; folder = parentFolder(folder)) {
     if (const auto mounted = _mounted.find(folder); mounted != _mounted.end()) return nameOf(_disks[mounted->second]);
     if (folder == "/") return std::nullopt;
   }
@@ -50,11 +44,8 @@ std::optional<DiskName> DiskSnapshot::holding(const std::string& path) const {
 
 std::vector<DiskEvent> differences(const DiskSnapshot& before, const DiskSnapshot& after) {
   std::vector<DiskEvent> events;
-  for (const auto& disk : before.disks()) {
-    if (!after.find(nameOf(disk))) {
-      events.push_back({DiskEvent::Kind::disappeared, nameOf(disk), {}});
-    }
-  }
+  for (const auto& disk : before.disks())
+    if (!after.find(nameOf(disk))) events.push_back({DiskEvent::Kind::disappeared, nameOf(disk), {}});
   for (const auto& disk : after.disks())
     if (auto event = eventOf(before.find(nameOf(disk)), disk)) events.push_back(std::move(*event));
   return events;

@@ -1,12 +1,15 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/disks/BlockDevices.h"
 
 #include <algorithm>
 #include <array>
+#include <span>
+#include <string_view>
 
+#include "base/Path.h"
 #include "base/Text.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 
 namespace tavisk {
 namespace {
@@ -16,10 +19,6 @@ constexpr unsigned usualBlockSize = 512;
 constexpr int deepestMapping = 16;
 constexpr unsigned floppyMajor = 2;
 
-std::string baseName(const std::string& path) {
-  return path.substr(path.rfind('/') + 1);
-}
-
 bool isFileName(const std::string& text) {
   return !text.empty() && text != "." && text != ".." &&
          text.find_first_of(std::string_view("/\0", 2)) == std::string::npos;
@@ -27,17 +26,18 @@ bool isFileName(const std::string& text) {
 
 /// The value of a line "KEY=value".
 std::string valueIn(const std::string& lines, std::string_view key) {
-  for (const auto& line : split(lines, "\n"))
-    if (line.starts_with(key) && line.substr(key.size(), 1) == "=") return line.substr(key.size() + 1);
+  for (const auto& line : configurationLines(lines))
+    if (const auto named = namedValueIn(line); named && named->name == key) return named->value;
   return "";
 }
 
-std::uint64_t unsignedNumber(const std::string& text) {
-  return static_cast<std::uint64_t>(std::max(leadingInteger(text), std::int64_t{0}));
+/// The disk that a partition's folder lies in.
+DiskName diskAbove(const std::string& path) {
+  return {baseName(parentFolder(path))};
 }
 
 struct Sign {
-  const char* text;
+  std::string_view text;
   const char* transport;
 };
 
@@ -57,15 +57,16 @@ bool isNumbered(const std::string& name, std::string_view beginning) {
   return name.starts_with(beginning) && name.find_first_of("0123456789") == beginning.size();
 }
 
-template <std::size_t Count>
-const char* byNumberedName(const std::array<Sign, Count>& signs, const std::string& name) {
-  for (const auto& sign : signs)
-    if (isNumbered(name, sign.text)) return sign.transport;
-  return nullptr;
+/// Null when there is no such sign.
+const char* byNumberedName(std::span<const Sign> signs, const std::string& name) {
+  const auto sign = std::ranges::find_if(
+      signs, [&](auto text) { return isNumbered(name, text); }, &Sign::text);
+  return sign == signs.end() ? nullptr : sign->transport;
 }
 
+/// Null when there is no such sign.
 const char* bySubsystem(const std::string& name) {
-  const auto* sign = std::ranges::find_if(subsystems, [&](auto& each) { return name == each.text; });
+  const auto* sign = std::ranges::find(subsystems, name, &Sign::text);
   return sign == subsystems.end() ? nullptr : sign->transport;
 }
 
@@ -74,17 +75,6 @@ bool isRemote(const std::string& transport) {
 }
 
 }  // namespace
-
-/// Without the newline; empty when there is none or it cannot be read.
-std::string BlockDevices::attribute(const std::string& path, const char* name) const {
-  auto text = _root.read("/sys" + path + "/" + name, attributeLimit).valueOr("");
-  while (text.ends_with('\n')) text.pop_back();
-  return text;
-}
-
-std::string BlockDevices::subsystemOf(const std::string& path) const {
-  return baseName(_root.readLink("/sys" + path + "/subsystem").valueOr(""));
-}
 
 std::vector<DiskName> BlockDevices::list() const {
   std::vector<DiskName> names;
@@ -100,6 +90,17 @@ std::optional<std::string> BlockDevices::pathOf(const DiskName& name) const {
   return target->substr(upToSys.size());
 }
 
+/// Without the newline; empty when there is none or it cannot be read.
+std::string BlockDevices::attribute(const std::string& path, const char* name) const {
+  auto text = _root.read("/sys" + path + "/" + name, attributeLimit).valueOr("");
+  while (text.ends_with('\n')) text.pop_back();
+  return text;
+}
+
+std::uint64_t BlockDevices::count(const std::string& path, const char* name) const {
+  return parseNumber<std::uint64_t>(attribute(path, name)).value_or(0);
+}
+
 std::optional<BlockDevice> BlockDevices::find(const DiskName& name) const {
   const auto path = pathOf(name);
   if (!path) return std::nullopt;
@@ -109,12 +110,12 @@ std::optional<BlockDevice> BlockDevices::find(const DiskName& name) const {
   device.number = DeviceNumber::parse(valueIn(uevent, "MAJOR") + ":" + valueIn(uevent, "MINOR"));
   device.path = *path;
   device.node = "/dev/" + valueIn(uevent, "DEVNAME");
-  device.partition = static_cast<int>(leadingInteger(attribute(*path, "partition")));
+  device.partition = static_cast<int>(count(*path, "partition"));
   if (device.partition != 0) {
-    device.disk = {baseName(path->substr(0, path->rfind('/')))};
-    device.start = unsignedNumber(attribute(*path, "start"));
+    device.disk = diskAbove(*path);
+    device.start = count(*path, "start");
   }
-  device.size = unsignedNumber(attribute(*path, "size"));
+  device.size = count(*path, "size");
   device.writable = attribute(*path, "ro") != "1";
   return device;
 }
@@ -141,12 +142,12 @@ std::optional<DiskName> BlockDevices::firstBeneath(const std::string& path) cons
 }
 
 DiskName BlockDevices::wholeDisk(const DiskName& name) const {
-  DiskName disk = name;
+  auto disk = name;
   for (int depth = 0; depth < deepestMapping; ++depth) {
     const auto path = pathOf(disk);
     if (!path) return disk;
     const bool isPartition = _root.exists("/sys" + *path + "/partition");
-    const auto beneath = isPartition ? DiskName{baseName(path->substr(0, path->rfind('/')))} : firstBeneath(*path);
+    const auto beneath = isPartition ? diskAbove(*path) : firstBeneath(*path);
     if (!beneath) return disk;
     disk = *beneath;
   }
@@ -154,8 +155,8 @@ DiskName BlockDevices::wholeDisk(const DiskName& name) const {
 }
 
 unsigned BlockDevices::logicalBlockSize(const DiskName& disk) const {
-  const auto size = leadingInteger(attribute(pathOf(disk).value_or(""), "queue/logical_block_size"));
-  return size > 0 ? static_cast<unsigned>(size) : usualBlockSize;
+  const auto size = count(pathOf(disk).value_or(""), "queue/logical_block_size");
+  return size != 0 ? static_cast<unsigned>(size) : usualBlockSize;
 }
 
 bool BlockDevices::answersReads(const BlockDevice& device) const {
@@ -182,6 +183,10 @@ std::vector<std::string> BlockDevices::carriersOf(const DiskName& disk) const {
     if (path.size() > top.size()) carriers.push_back(path);
   }
   return carriers;
+}
+
+std::string BlockDevices::subsystemOf(const std::string& path) const {
+  return baseName(_root.readLink("/sys" + path + "/subsystem").valueOr(""));
 }
 
 std::string BlockDevices::transportOf(const DiskName& disk) const {

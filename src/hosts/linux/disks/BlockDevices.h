@@ -66,6 +66,7 @@ class BlockDevices {
 
  private:
   std::string attribute(const std::string& path, const char* name) const;
+  std::uint64_t count(const std::string& path, const char* name) const;
   std::string subsystemOf(const std::string& path) const;
   std::optional<std::string> pathOf(const DiskName& name) const;
   std::optional<DiskName> firstBeneath(const std::string& path) const;

@@ -7,15 +7,23 @@
 #include <sys/stat.h>
 
 #include <algorithm>
-#include <array>
 #include <cerrno>
-#include <cstdio>
 #include <memory>
+#include <utility>
 
-#include "base/Result.h"
+#include "base/Text.h"
 
 namespace tavisk {
 namespace {
+
+/// The error of a call of libblkid, which leaves why it failed in errno alone, and only where a system call did;
+/// `otherwise` stands for other reasons. 0 when the call was a success.
+template <typename Call>
+int errorOf(const Call& call, int otherwise) {
+  errno = 0;
+  if (call()) return 0;
+  return errno == 0 ? otherwise : errno;
+}
 
 /// A device that libblkid looks at.
 class Probe {
@@ -29,9 +37,8 @@ class Probe {
     if (::fstat(file->number(), &status) != 0 || !(S_ISBLK(status.st_mode) || S_ISREG(status.st_mode)))
       return Failure{"read", node, "not a block device"};
     Handle probe(::blkid_new_probe(), ::blkid_free_probe);
-    errno = 0;
-    if (!probe || ::blkid_probe_set_device(probe.get(), file->number(), 0, 0) != 0)
-      return systemFailure("read", node, errno == 0 ? ENOMEM : errno);
+    const auto isTaken = [&] { return probe && ::blkid_probe_set_device(probe.get(), file->number(), 0, 0) == 0; };
+    if (const int error = errorOf(isTaken, ENOMEM); error != 0) return systemFailure("read", node, error);
     return Probe(std::move(file).value(), std::move(probe));
   }
 
@@ -50,15 +57,14 @@ class Probe {
   Handle _probe;
 };
 
-std::string text(const char* value) {
+/// What libblkid has no text for is empty.
+std::string textOrNone(const char* value) {
   return !value ? "" : value;
 }
 
 std::string typeOf(blkid_partition partition) {
   if (const char* guid = ::blkid_partition_get_type_string(partition)) return guid;
-  std::array<char, 16> byte{};
-  std::snprintf(byte.data(), byte.size(), "0x%x", static_cast<unsigned>(::blkid_partition_get_type(partition)));
-  return byte.data();
+  return "0x" + hexDigits(static_cast<unsigned>(::blkid_partition_get_type(partition)));
 }
 
 PartitionFacts factsOf(blkid_partition partition) {
@@ -66,17 +72,16 @@ PartitionFacts factsOf(blkid_partition partition) {
   facts.number = ::blkid_partition_get_partno(partition);
   facts.start = static_cast<std::uint64_t>(::blkid_partition_get_start(partition));
   facts.size = static_cast<std::uint64_t>(::blkid_partition_get_size(partition));
-  facts.uuid = text(::blkid_partition_get_uuid(partition));
+  facts.uuid = textOrNone(::blkid_partition_get_uuid(partition));
   facts.type = typeOf(partition);
-  facts.name = text(::blkid_partition_get_name(partition));
+  facts.name = textOrNone(::blkid_partition_get_name(partition));
   return facts;
 }
 
 }  // namespace
 
 const PartitionFacts* PartitionTable::find(int number) const {
-  const auto found =
-      std::ranges::find_if(partitions, [&](const PartitionFacts& partition) { return partition.number == number; });
+  const auto found = std::ranges::find(partitions, number, &PartitionFacts::number);
   return found == partitions.end() ? nullptr : &*found;
 }
 
@@ -87,9 +92,9 @@ Result<VolumeFacts> probeVolume(const SystemRoot& root, const std::string& node)
   ::blkid_probe_enable_superblocks(handle, 1);
   ::blkid_probe_set_superblocks_flags(
       handle, BLKID_SUBLKS_LABEL | BLKID_SUBLKS_UUID | BLKID_SUBLKS_TYPE | BLKID_SUBLKS_USAGE | BLKID_SUBLKS_MAGIC);
-  errno = 0;
   constexpr int failed = -1;  // 1: nothing found; -2: more than one type
-  if (::blkid_do_safeprobe(handle) == failed) return systemFailure("read", node, errno == 0 ? EIO : errno);
+  const int error = errorOf([&] { return ::blkid_do_safeprobe(handle) != failed; }, EIO);
+  if (error != 0) return systemFailure("read", node, error);
   return VolumeFacts{probe->value("TYPE"), probe->value("USAGE"), probe->value("LABEL"), probe->value("UUID"),
                      probe->value("BOOT_SYSTEM_ID")};
 }
@@ -99,14 +104,18 @@ Result<PartitionTable> probePartitionTable(const SystemRoot& root, const std::st
   if (!probe) return probe.failure();
   ::blkid_probe_enable_superblocks(probe->handle(), 0);
   ::blkid_probe_enable_partitions(probe->handle(), 1);
-  errno = 0;
-  const auto list = ::blkid_probe_get_partitions(probe->handle());
-  if (!list && errno != 0) return systemFailure("read", node, errno);
+  blkid_partlist list = nullptr;
+  constexpr int noTable = 0;
+  const auto isListed = [&] {
+    list = ::blkid_probe_get_partitions(probe->handle());
+    return list != nullptr;
+  };
+  if (const int error = errorOf(isListed, noTable); error != 0) return systemFailure("read", node, error);
   PartitionTable result;
   const auto table = !list ? nullptr : ::blkid_partlist_get_table(list);
   if (!table) return result;
-  result.type = text(::blkid_parttable_get_type(table));
-  result.uuid = text(::blkid_parttable_get_id(table));
+  result.type = textOrNone(::blkid_parttable_get_type(table));
+  result.uuid = textOrNone(::blkid_parttable_get_id(table));
   for (int place = 0; place < ::blkid_partlist_numof_partitions(list); ++place)
     result.partitions.push_back(factsOf(::blkid_partlist_get_partition(list, place)));
   return result;

@@ -9,7 +9,7 @@
 #include <array>
 #include <cerrno>
 
-#include "base/Result.h"
+#include "base/Path.h"
 
 namespace tavisk {
 namespace {
@@ -35,8 +35,8 @@ std::optional<std::string> blockDeviceIn(std::string_view event) {
     if (!takeValue(field, "SUBSYSTEM=", subsystem)) takeValue(field, "DEVPATH=", path);
     event.remove_prefix(std::min(length + 1, event.size()));
   }
-  const auto name = path.substr(path.rfind('/') + 1);
-  return subsystem == "block" && !name.empty() ? std::optional(std::string(name)) : std::nullopt;
+  const auto name = baseName(std::string(path));
+  return subsystem == "block" && !name.empty() ? std::optional(name) : std::nullopt;
 }
 
 Result<DeviceEvents> DeviceEvents::open(const SystemRoot& root) {

@@ -1,37 +1,71 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/disks/DiskFacts.h"
 
 #include <fcntl.h>
 #include <linux/cdrom.h>
 #include <sys/ioctl.h>
 
-#include <algorithm>
 #include <array>
-#include <charconv>
 #include <climits>
+#include <map>
 #include <string_view>
 
 #include "base/Text.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 
 namespace tavisk {
 namespace {
 
 constexpr std::size_t recordLimit = std::size_t{1} << 20U;
 
-std::string decoded(std::string_view text) {
+/// Blanks and special characters are written as \x20.
+std::string unescaped(std::string_view text) {
+  constexpr std::string_view sign = "\\x";
+  constexpr std::size_t digitCount = 2;
   std::string plain;
   while (!text.empty()) {
-    unsigned char byte = 0;
-    const auto digits = text.substr(std::min<std::size_t>(2, text.size()), 2);
-    const bool isEscape = text.starts_with("\\x") && digits.size() == 2 &&
-                          std::from_chars(digits.data(), digits.data() + 2, byte, 16).ptr == digits.data() + 2;
-    plain += isEscape ? static_cast<char>(byte) : text.front();
-    text.remove_prefix(isEscape ? 4 : 1);
+    const auto digits = text.starts_with(sign) ? text.substr(sign.size(), digitCount) : std::string_view();
+    const auto byte = digits.size() == digitCount ? parseNumber<unsigned char>(digits, 16) : std::nullopt;
+    plain += byte ? static_cast<char>(*byte) : text.front();
+    text.remove_prefix(byte ? sign.size() + digitCount : 1);
   }
   return plain;
 }
+
+/// What the device manager has found out about one device and keeps in /run/udev: its properties, by the names that
+/// `udevadm info` shows. Nothing where no device manager runs.
+class DeviceProperties {
+ public:
+  DeviceProperties(const SystemRoot& root, DeviceNumber number) {
+    constexpr std::string_view mark = "E:";
+    const auto file = "/run/udev/data/b" + std::to_string(number.major) + ":" + std::to_string(number.minor);
+    for (const auto& line : configurationLines(root.read(file, recordLimit).valueOr("")))
+      if (auto property = namedValueIn(line); property && property->name.starts_with(mark))
+        _values[property->name.substr(mark.size())] = std::move(property->value);
+  }
+
+  std::optional<std::string> find(const std::string& name) const {
+    const auto found = _values.find(name);
+    return found == _values.end() ? std::nullopt : std::optional(found->second);
+  }
+  std::optional<std::string> findEscaped(const std::string& name) const {
+    const auto value = find(name);
+    return value ? std::optional(unescaped(*value)) : std::nullopt;
+  }
+  bool isSet(const std::string& name) const { return find(name) == "1"; }
+  /// Whether one of those whose names begin so is.
+  bool isAnySet(const std::string& beginning) const {
+    for (auto entry = _values.lower_bound(beginning); entry != _values.end(); ++entry) {
+      if (!entry->first.starts_with(beginning)) return false;
+      if (entry->second == "1") return true;
+    }
+    return false;
+  }
+
+ private:
+  std::map<std::string, std::string> _values;
+};
 
 /// The number of a kind of medium, as MMC's GET CONFIGURATION has it; 0 when the drive does not say.
 unsigned currentProfile(const FileDescriptor& drive) {
@@ -62,9 +96,17 @@ OpticalMedium askDrive(const SystemRoot& root, const std::string& node) {
   return mediumOfProfile(currentProfile(*drive));
 }
 
+/// From the device manager, else from the drive itself.
+OpticalMedium mediumIn(const SystemRoot& root, const std::string& node, const DeviceProperties& properties) {
+  if (properties.isAnySet("ID_CDROM_MEDIA_CD")) return OpticalMedium::cd;
+  if (properties.isAnySet("ID_CDROM_MEDIA_DVD")) return OpticalMedium::dvd;
+  if (properties.isSet("ID_CDROM_MEDIA")) return OpticalMedium::other;
+  return properties.isSet("ID_CDROM") ? OpticalMedium::none : askDrive(root, node);
+}
+
 VolumeFacts volumeFrom(const DeviceProperties& properties) {
-  return {properties.find("ID_FS_TYPE"), properties.find("ID_FS_USAGE"), properties.findEncoded("ID_FS_LABEL_ENC"),
-          properties.findEncoded("ID_FS_UUID_ENC"), properties.findEncoded("ID_FS_BOOT_SYSTEM_ID")};
+  return {properties.find("ID_FS_TYPE"), properties.find("ID_FS_USAGE"), properties.findEscaped("ID_FS_LABEL_ENC"),
+          properties.findEscaped("ID_FS_UUID_ENC"), properties.findEscaped("ID_FS_BOOT_SYSTEM_ID")};
 }
 
 void readDisk(const SystemRoot& root, DiskFacts& facts) {
@@ -81,47 +123,10 @@ void readDisk(const SystemRoot& root, DiskFacts& facts) {
 
 /// What is above the disk in the device tree.
 std::string carrierOf(const BlockDevice& device) {
-  const auto block = device.path.find("/block/");
-  return device.path.substr(0, block);
+  return device.path.substr(0, device.path.find("/block/"));
 }
 
 }  // namespace
-
-DeviceProperties DeviceProperties::ofBlockDevice(const SystemRoot& root, DeviceNumber number) {
-  DeviceProperties properties;
-  const auto file = "/run/udev/data/b" + std::to_string(number.major) + ":" + std::to_string(number.minor);
-  for (const auto& line : split(root.read(file, recordLimit).valueOr(""), "\n")) {
-    const auto equals = line.find('=');
-    if (line.starts_with("E:") && equals != std::string::npos)
-      properties._values[line.substr(2, equals - 2)] = line.substr(equals + 1);
-  }
-  return properties;
-}
-
-std::optional<std::string> DeviceProperties::find(const std::string& name) const {
-  const auto found = _values.find(name);
-  return found == _values.end() ? std::nullopt : std::optional(found->second);
-}
-
-bool DeviceProperties::isAnySet(const std::string& beginning) const {
-  for (auto entry = _values.lower_bound(beginning); entry != _values.end(); ++entry) {
-    if (!entry->first.starts_with(beginning)) return false;
-    if (entry->second == "1") return true;
-  }
-  return false;
-}
-
-std::optional<std::string> DeviceProperties::findEncoded(const std::string& name) const {
-  const auto value = find(name);
-  return value ? std::optional(decoded(*value)) : std::nullopt;
-}
-
-OpticalMedium mediumIn(const SystemRoot& root, const std::string& node, const DeviceProperties& properties) {
-  if (properties.isAnySet("ID_CDROM_MEDIA_CD")) return OpticalMedium::cd;
-  if (properties.isAnySet("ID_CDROM_MEDIA_DVD")) return OpticalMedium::dvd;
-  if (properties.isSet("ID_CDROM_MEDIA")) return OpticalMedium::other;
-  return properties.isSet("ID_CDROM") ? OpticalMedium::none : askDrive(root, node);
-}
 
 std::optional<DiskFacts> factsOf(const SystemRoot& root, const DiskName& name) {
   const BlockDevices devices(root);
@@ -130,7 +135,7 @@ std::optional<DiskFacts> factsOf(const SystemRoot& root, const DiskName& name) {
   if (!hasNode || device->size == 0) return std::nullopt;
   DiskFacts facts;
   facts.device = *device;
-  const auto properties = DeviceProperties::ofBlockDevice(root, device->number);
+  const DeviceProperties properties(root, device->number);
   if (devices.isOptical(device->disk)) {
     facts.medium = mediumIn(root, device->node, properties);
     if (facts.medium == OpticalMedium::none) return std::nullopt;

@@ -7,13 +7,14 @@ namespace {
 
 constexpr ServiceStatus failed = 1;
 
-enum Scheme { none = 0, openFirmware = 1, guid = 2, masterBootRecord = 3, other = 4 };
+constexpr int masterBootRecord = 3;
+constexpr int otherMap = 4;
 
-Scheme schemeOf(const std::string& table) {
-  if (table.empty()) return none;
-  if (table == "mac") return openFirmware;
-  if (table == "gpt") return guid;
-  return table == "dos" ? masterBootRecord : other;
+int schemeOf(const std::string& table) {
+  if (table.empty()) return partitionmap::noneKnown;
+  if (table == "mac") return partitionmap::openFirmware;
+  if (table == "gpt") return partitionmap::gpt;
+  return table == "dos" ? masterBootRecord : otherMap;
 }
 
 }  // namespace
@@ -47,7 +48,7 @@ std::string LinuxDiskQueries::nameOf(DiskProtocol protocol) {
 
 int LinuxDiskQueries::partitionScheme(const DiskName& disk) {
   const auto facts = _disks.facts(_disks.devices().wholeDisk(disk));
-  return facts ? schemeOf(facts->table.type) : none;
+  return facts ? schemeOf(facts->table.type) : partitionmap::noneKnown;
 }
 
 DiskQueries::OpticalBootability LinuxDiskQueries::opticalBootability(const DiskName& disk) {

@@ -110,8 +110,8 @@ void LinuxDisks::readMounts() {
     auto [entry, isNew] = known.try_emplace(mount.source);
     if (isNew) entry->second = _devices.withNode(mount.source);
     if (!entry->second) continue;
-    const auto* previous = std::exchange(_bySource[entry->second->name.text], &mount);
-    if (previous && (previous->root == "/" || mount.root != "/")) _bySource[entry->second->name.text] = previous;
+    auto& best = _bySource[entry->second->name.text];
+    if (!best || (best->root != "/" && mount.root == "/")) best = &mount;
   }
 }
 

@@ -34,6 +34,14 @@ class LinuxDisks {
   /// The disk that a path is on; the path is absolute and standardized.
   std::optional<DiskName> holding(const std::string& path);
 
+  /// What a change has to go by: the mounts, volumes and partition tables of this moment, whatever this run knows of
+  /// them. Nothing is remembered.
+  Result<MountTable> mountsNow() const { return MountTable::read(_machine.root); }
+  Result<VolumeFacts> volumeNow(const BlockDevice& device) const { return probeVolume(_machine.root, device.node); }
+  Result<PartitionTable> tableNow(const BlockDevice& disk) const {
+    return probePartitionTable(_machine.root, disk.node);
+  }
+
   /// Looks at the mounts anew, at the devices that have changed, and at those that are mounted elsewhere than before.
   Snapshot renew(const ChangedDevices& changed);
   void forgetOld();

@@ -3,11 +3,13 @@
 #include "hosts/linux/disks/MountTable.h"
 
 #include <algorithm>
-#include <charconv>
 #include <numeric>
 #include <optional>
 #include <unordered_set>
 #include <utility>
+
+#include "base/Path.h"
+#include "base/Text.h"
 
 namespace tavisk {
 namespace {
@@ -23,10 +25,8 @@ std::string_view takeField(std::string_view& text, char separator) {
 }
 
 template <typename Number>
-Number numberFrom(std::string_view text) {
-  Number number{};
-  std::from_chars(text.data(), text.data() + text.size(), number);
-  return number;
+Number takeNumber(std::string_view& text, char separator) {
+  return parseNumber<Number>(takeField(text, separator)).value_or(0);
 }
 
 bool isOctal(std::string_view digits) {
@@ -61,8 +61,8 @@ std::optional<Mount> mountFrom(std::string_view line) {
   auto first = line.substr(0, middle);
   auto last = line.substr(middle + 3);
   Mount mount;
-  mount.id = numberFrom<std::uint64_t>(takeField(first, ' '));
-  mount.parent = numberFrom<std::uint64_t>(takeField(first, ' '));
+  mount.id = takeNumber<std::uint64_t>(first, ' ');
+  mount.parent = takeNumber<std::uint64_t>(first, ' ');
   mount.device = DeviceNumber::parse(takeField(first, ' '));
   mount.root = unescaped(takeField(first, ' '));
   mount.point = unescaped(takeField(first, ' '));
@@ -74,17 +74,12 @@ std::optional<Mount> mountFrom(std::string_view line) {
   return mount;
 }
 
-std::string parentFolder(const std::string& path) {
-  const auto slash = path.rfind('/');
-  return slash == 0 || slash == std::string::npos ? "/" : path.substr(0, slash);
-}
-
 }  // namespace
 
 DeviceNumber DeviceNumber::parse(std::string_view text) {
   if (text.find(':') == std::string_view::npos) return {};
-  const auto major = numberFrom<unsigned>(takeField(text, ':'));
-  return {major, numberFrom<unsigned>(text)};
+  const auto major = takeNumber<unsigned>(text, ':');
+  return {major, parseNumber<unsigned>(text).value_or(0)};
 }
 
 Result<MountTable> MountTable::read(const SystemRoot& root) {
@@ -139,7 +134,7 @@ bool MountTable::isReached(const Mount& mount) const {
 }
 
 const Mount* MountTable::visibleAbove(const std::string& path) const {
-  for (std::string folder = path;; folder = parentFolder(folder)) {
+  for (auto folder = path;; folder = parentFolder(folder)) {
     if (const auto found = _visibleAt.find(folder); found != _visibleAt.end()) return &_mounts[found->second];
     if (folder == "/") return nullptr;
   }

@@ -11,21 +11,9 @@ namespace tavisk {
 namespace {
 
 constexpr std::size_t numberSize = 2;
-constexpr int numberDigits = 4;
 constexpr unsigned numbers = 0x10000;
-constexpr std::string_view prefix = "Boot";
-
-std::optional<std::uint16_t> numberOf(std::string_view name) {
-  if (name.size() != prefix.size() + numberDigits || !name.starts_with(prefix)) return std::nullopt;
-  if (name.find_first_not_of("0123456789ABCDEF", prefix.size()) != std::string_view::npos) return std::nullopt;
-  return static_cast<std::uint16_t>(std::stoul(std::string(name.substr(prefix.size())), nullptr, 16));
-}
 
 }  // namespace
-
-std::string bootEntryName(std::uint16_t number) {
-  return std::string(prefix) + upperCased(hexDigits(number, numberDigits));
-}
 
 std::vector<std::uint16_t> withFirst(std::uint16_t number, const std::vector<std::uint16_t>& order) {
   std::vector<std::uint16_t> changed{number};
@@ -35,24 +23,25 @@ std::vector<std::uint16_t> withFirst(std::uint16_t number, const std::vector<std
 
 std::string textOf(const std::vector<std::uint16_t>& order) {
   std::string text;
-  for (const auto number : order) text += (text.empty() ? "" : ",") + upperCased(hexDigits(number, numberDigits));
+  constexpr std::size_t digitCount = 4;
+  for (const auto number : order) text += (text.empty() ? "" : ",") + upperCased(hexDigits(number, digitCount));
   return text;
 }
 
 Result<std::optional<BootEntry>> BootEntries::read(std::uint16_t number) const {
-  auto bytes = _variables.read({bootEntryName(number)});
+  const auto bytes = _variables.read({bootEntryName(number)});
   if (!bytes) return bytes.failure();
-  auto option = *bytes ? parseLoadOption(**bytes) : std::nullopt;
+  const auto option = *bytes ? parseLoadOption(**bytes) : std::nullopt;
   return option ? std::optional(BootEntry{number, *option}) : std::nullopt;
 }
 
 Result<std::vector<BootEntry>> BootEntries::all() const {
-  auto names = _variables.names(efiGlobalVendor);
+  const auto names = _variables.names(efiGlobalVendor);
   if (!names) return names.failure();
   std::vector<BootEntry> entries;
   for (const auto& name : *names) {
-    const auto number = numberOf(name);
-    auto entry = number ? read(*number) : std::optional<BootEntry>();
+    const auto number = bootEntryNumber(name);
+    const auto entry = number ? read(*number) : std::optional<BootEntry>();
     if (!entry) return entry.failure();
     if (*entry) entries.push_back(**entry);
   }
@@ -60,7 +49,7 @@ Result<std::vector<BootEntry>> BootEntries::all() const {
 }
 
 Result<std::vector<std::uint16_t>> BootEntries::order() const {
-  auto bytes = _variables.read(orderVariable());
+  const auto bytes = _variables.read(orderVariable());
   if (!bytes) return bytes.failure();
   std::string_view rest = *bytes ? **bytes : std::string_view();
   std::vector<std::uint16_t> order;
@@ -73,18 +62,18 @@ Result<std::optional<BootEntry>> BootEntries::first() const {
   const auto numbersInOrder = order();
   if (!numbersInOrder) return numbersInOrder.failure();
   for (const auto number : *numbersInOrder) {
-    auto entry = read(number);
+    const auto entry = read(number);
     if (!entry || (*entry && (*entry)->option.isStartedUnasked())) return entry;
   }
-  return std::optional<BootEntry>();
+  return std::nullopt;
 }
 
 Result<std::optional<BootEntry>> BootEntries::onlyNext() const {
-  auto bytes = _variables.read({"BootNext"});
+  const auto bytes = _variables.read({"BootNext"});
   if (!bytes) return bytes.failure();
   std::string_view rest = *bytes ? **bytes : std::string_view();
   const auto number = takeNumber(rest, numberSize);
-  if (!number) return std::optional<BootEntry>();
+  if (!number) return std::nullopt;
   return read(static_cast<std::uint16_t>(*number));
 }
 
@@ -92,8 +81,8 @@ Result<std::optional<BootEntry>> BootEntries::startingAs(const EfiLoadOption& op
   const auto entries = all();
   if (!entries) return entries.failure();
   for (const auto& entry : *entries)
-    if (entry.option.startsAs(option)) return std::optional(entry);
-  return std::optional<BootEntry>();
+    if (entry.option.startsAs(option)) return entry;
+  return std::nullopt;
 }
 
 Result<void> BootEntries::putFirst(const EfiLoadOption& option, const KeepOrder& keep) const {
@@ -102,7 +91,7 @@ Result<void> BootEntries::putFirst(const EfiLoadOption& option, const KeepOrder&
   if (*known) return changeOrder((*known)->number, keep);
   const auto made = make(option);
   if (!made) return made.failure();
-  auto changed = changeOrder(*made, keep);
+  const auto changed = changeOrder(*made, keep);
   if (!changed) static_cast<void>(_variables.removeEntry({bootEntryName(*made)}, bytesOf(option)));
   return changed;
 }
@@ -110,7 +99,7 @@ Result<void> BootEntries::putFirst(const EfiLoadOption& option, const KeepOrder&
 Result<void> BootEntries::changeOrder(std::uint16_t first, const KeepOrder& keep) const {
   const auto before = order();
   if (!before) return before.failure();
-  if (auto kept = keep(*before); !kept) return kept;
+  if (const auto kept = keep(*before); !kept) return kept;
   std::string bytes;
   for (const auto number : withFirst(first, *before)) appendNumber(bytes, number, numberSize);
   return _variables.write(orderVariable(), bytes);
@@ -120,7 +109,7 @@ Result<std::uint16_t> BootEntries::make(const EfiLoadOption& option) const {
   const auto number = lowestFree();
   if (!number) return number.failure();
   const EfiVariableName variable{bootEntryName(*number)};
-  if (auto written = _variables.write(variable, bytesOf(option)); !written) return written.failure();
+  if (const auto written = _variables.write(variable, bytesOf(option)); !written) return written.failure();
   const auto made = _variables.read(variable);
   if (!made) return made.failure();
   if (*made != bytesOf(option)) return Failure{"read back", EfiVariables::pathOf(variable), "reads something else"};

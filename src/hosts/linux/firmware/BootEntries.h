@@ -20,9 +20,6 @@ struct BootEntry {
   EfiLoadOption option;
 };
 
-/// "Boot000A".
-std::string bootEntryName(std::uint16_t number);
-
 /// What the firmware can start, and in which order it tries (UEFI 2.10, section 3.1).
 class BootEntries {
  public:

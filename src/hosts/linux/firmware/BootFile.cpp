@@ -8,7 +8,6 @@
 
 #include <cerrno>
 
-#include "base/Result.h"
 #include "hosts/linux/firmware/EfiBytes.h"
 
 namespace tavisk {
@@ -36,11 +35,11 @@ std::optional<std::uint64_t> numberAt(std::string_view bytes, std::size_t place,
 /// The file's beginning; a device or a FIFO is only looked at.
 Result<std::string> headOf(const SystemRoot& root, const std::string& path) {
   struct stat status {};
-  auto seen = root.open(path, O_PATH);
+  const auto seen = root.open(path, O_PATH);
   if (!seen) return seen.failure();
   if (::fstat(seen->number(), &status) != 0 || !S_ISREG(status.st_mode))
     return Failure{"read", path, "not a regular file"};
-  auto file = root.open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
+  const auto file = root.open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
   if (!file) return file.failure();
   std::string head(headSize, '\0');
   const auto count = ::read(file->number(), head.data(), head.size());
@@ -67,9 +66,9 @@ std::optional<BootFile> parseBootFile(std::string_view head) {
 }
 
 Result<BootFile> readBootFile(const SystemRoot& root, const std::string& path) {
-  auto head = headOf(root, path);
+  const auto head = headOf(root, path);
   if (!head) return head.failure();
-  auto file = parseBootFile(*head);
+  const auto file = parseBootFile(*head);
   if (!file) return Failure{"start", path, "not a program for UEFI firmware"};
   return *file;
 }

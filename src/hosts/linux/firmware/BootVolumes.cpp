@@ -5,7 +5,6 @@
 #include <algorithm>
 
 #include "base/Text.h"
-#include "hosts/linux/disks/MountTable.h"
 
 namespace tavisk {
 namespace {
@@ -13,7 +12,7 @@ namespace {
 constexpr const char* bootFile = "boot.efi";
 constexpr std::string_view ownFolder = R"(\EFI\tavisk\)";
 constexpr std::string_view ownFile = R"(\boot.efi)";
-constexpr std::uint64_t unit = 512;  // of sysfs and of libblkid
+constexpr std::uint64_t unit = 512;  // of what the kernel and libblkid tell
 
 bool isReadByFirmware(const std::string& type) {
   return type == "vfat" || type == "msdos";
@@ -50,20 +49,20 @@ Failure unknownDisk(const DiskName& name) {
 Result<BootTarget> BootVolumes::targetOf(const DiskName& volume, const std::string& systemFolder) const {
   const auto device = _devices.find(volume);
   if (!device) return unknownDisk(volume);
-  const auto facts = probeVolume(_root, device->node);
+  const auto facts = _disks.volumeNow(*device);
   if (!facts) return facts.failure();
-  auto target =
+  const auto found =
       isReadByFirmware(facts->type.value_or("")) ? onVolume(*device, systemFolder) : besideVolume(*device, *facts);
-  if (!target) return target;
-  auto named = *target;
-  named.label = facts->label.value_or(volume.text);
-  return named;
+  if (!found) return found;
+  auto target = *found;
+  target.label = facts->label.value_or(volume.text);
+  return target;
 }
 
 Result<BootTarget> BootVolumes::onVolume(const BlockDevice& volume, const std::string& systemFolder) const {
   const auto path = _root.standardized(systemFolder + "/" + bootFile);
   if (!path) return path.failure();
-  const auto mounts = MountTable::read(_root);
+  const auto mounts = _disks.mountsNow();
   if (!mounts) return mounts.failure();
   const auto* mount = mounts->holding(*path);
   if (!mount || mount->device != volume.number) return Failure{"start", *path, "it is not on " + volume.name.text};
@@ -82,19 +81,21 @@ Result<BootTarget> BootVolumes::besideVolume(const BlockDevice& volume, const Vo
   if (!file) return Failure{"start", volume.name.text, "UEFI firmware does not read " + kind};
   const auto partitions = systemPartitionsOf(disk);
   if (!partitions) return partitions.failure();
-  std::string why = disk.text + " has no EFI system partition for " + *file;
+  auto why = disk.text + " has no EFI system partition for " + *file;
+  std::error_code code;
   for (const auto& partition : *partitions) {
-    auto target = onSystemPartition(partition, *file);
+    const auto target = onSystemPartition(partition, *file);
     if (target) return target;
     why = describe(target.failure());
+    code = target.failure().code;
   }
-  return Failure{"start", volume.name.text, "UEFI firmware does not read " + kind + ", and " + why};
+  return Failure{"start", volume.name.text, "UEFI firmware does not read " + kind + ", and " + why, code};
 }
 
 Result<BootTarget> BootVolumes::onSystemPartition(const DiskName& name, const std::string& file) const {
   const auto device = _devices.find(name);
   if (!device) return unknownDisk(name);
-  const auto mounts = MountTable::read(_root);
+  const auto mounts = _disks.mountsNow();
   if (!mounts) return mounts.failure();
   const auto* mount = mounts->mountOf(device->number);
   if (!mount || mount->root != "/")
@@ -102,7 +103,10 @@ Result<BootTarget> BootVolumes::onSystemPartition(const DiskName& name, const st
   if (!isReadByFirmware(mount->type))
     return Failure{"look for " + file, "the EFI system partition " + name.text, "it holds " + mount->type};
   const auto path = _root.standardized(mount->point + withSeparators(file, '\\', '/'));
-  if (!path || !_root.exists(*path)) return Failure{"look for " + file, name.text, "there is no such file"};
+  if (!path || !_root.exists(*path)) {
+    const auto code = path ? std::make_error_code(std::errc::no_such_file_or_directory) : path.failure().code;
+    return Failure{"look for " + file, name.text, "there is no such file", code};
+  }
   const auto partition = identityOf(*device);
   if (!partition) return partition.failure();
   return BootTarget{"", *path, *partition, file};
@@ -112,7 +116,7 @@ Result<EfiPartition> BootVolumes::identityOf(const BlockDevice& partition) const
   const auto disk = _devices.find(partition.disk);
   if (!disk || partition.partition == 0)
     return Failure{"start", partition.name.text, "firmware has no name for a volume that is no partition"};
-  const auto table = probePartitionTable(_root, disk->node);
+  const auto table = _disks.tableNow(*disk);
   if (!table) return table.failure();
   const auto* facts = table->find(partition.partition);
   if (!facts) return Failure{"find", partition.name.text, "the partition table does not have it"};
@@ -128,7 +132,7 @@ Result<EfiPartition> BootVolumes::identityOf(const BlockDevice& partition) const
 Result<std::vector<DiskName>> BootVolumes::systemPartitionsOf(const DiskName& disk) const {
   const auto device = _devices.find(disk);
   if (!device) return unknownDisk(disk);
-  const auto table = probePartitionTable(_root, device->node);
+  const auto table = _disks.tableNow(*device);
   if (!table) return table.failure();
   std::vector<DiskName> found;
   for (const auto& facts : table->partitions) {
@@ -157,7 +161,7 @@ std::vector<DiskName> BootVolumes::partitionsWith(const std::string& uuid) const
     const auto disk = _devices.find(name);
     const bool isSeen = disk && disk->size > 0 && _devices.wholeDisk(name) == name && disk->disk == name;
     if (!isSeen || isDiskImage(name) || !_devices.answersReads(*disk)) continue;
-    const auto table = probePartitionTable(_root, disk->node);
+    const auto table = _disks.tableNow(*disk);
     if (!table) continue;
     for (const auto& facts : table->partitions) {
       if (facts.uuid != uuid) continue;
@@ -172,16 +176,15 @@ std::optional<DiskName> BootVolumes::fileSystemWith(const std::string& uuid, con
   const auto linked = _devices.withNode("/dev/disk/by-uuid/" + uuid);
   if (linked && _devices.wholeDisk(linked->name) == disk) return linked->name;
   for (const auto& name : _devices.list()) {
-    const auto device = _devices.find(name);
-    if (!device || device->size == 0 || _devices.wholeDisk(name) != disk || !_devices.answersReads(*device)) continue;
-    const auto facts = probeVolume(_root, device->node);
-    if (facts && facts->usage == "filesystem" && compareIgnoringCase(facts->uuid.value_or(""), uuid) == 0) return name;
+    const auto facts = _devices.wholeDisk(name) == disk ? _disks.facts(name) : std::nullopt;
+    const bool isFileSystem = facts && facts->volume.usage == "filesystem";
+    if (isFileSystem && compareIgnoringCase(facts->volume.uuid.value_or(""), uuid) == 0) return name;
   }
   return std::nullopt;
 }
 
 Result<DiskName> BootVolumes::volumeOf(const EfiPartition& partition, const std::string& file) const {
-  auto started = partitionWith(partition);
+  const auto started = partitionWith(partition);
   const auto uuid = fileSystemOf(file);
   if (!started || !uuid) return started;
   const auto disk = _devices.wholeDisk(*started);
@@ -192,7 +195,7 @@ Result<DiskName> BootVolumes::volumeOf(const EfiPartition& partition, const std:
 Result<DiskName> BootVolumes::partitionWith(const EfiPartition& partition) const {
   const auto linked = _devices.withNode("/dev/disk/by-partuuid/" + partition.uuid);
   if (linked && !isDiskImage(_devices.wholeDisk(linked->name))) return linked->name;
-  auto found = partitionsWith(partition.uuid);
+  const auto found = partitionsWith(partition.uuid);
   if (found.empty()) return Failure{"find", textOf({*partitionNode(partition)}), "no partition here has this identity"};
   return found.front();
 }

@@ -7,8 +7,7 @@
 #include <vector>
 
 #include "base/Result.h"
-#include "hosts/linux/disks/BlockDevices.h"
-#include "hosts/linux/disks/BlockProbe.h"
+#include "hosts/linux/disks/LinuxDisks.h"
 #include "hosts/linux/firmware/EfiDevicePath.h"
 #include "hosts/shared/SystemRoot.h"
 #include "platform/DiskDescription.h"
@@ -26,12 +25,12 @@ struct BootTarget {
 /// Between this system's volumes and the partitions and files by which firmware knows them.
 class BootVolumes {
  public:
-  /// The root is not owned.
-  explicit BootVolumes(const SystemRoot& root) : _root(root), _devices(root) {}
+  /// Nothing that is given is owned.
+  BootVolumes(const SystemRoot& root, LinuxDisks& disks) : _root(root), _disks(disks), _devices(disks.devices()) {}
 
   /// The boot file of a system: on its own volume where firmware reads that, else the one that is kept for the volume
   /// on the EFI system partition of its disk, in "\EFI\tavisk\<UUID of the file system>". Fails when firmware would
-  /// find nothing, or could find something else.
+  /// find nothing, or could find something else. Mounts and disks are read as they are now.
   Result<BootTarget> targetOf(const DiskName& volume, const std::string& systemFolder) const;
 
   /// The volume that is started by a file of a partition.
@@ -50,7 +49,8 @@ class BootVolumes {
   std::optional<DiskName> fileSystemWith(const std::string& uuid, const DiskName& disk) const;
 
   const SystemRoot& _root;
-  BlockDevices _devices;
+  LinuxDisks& _disks;
+  const BlockDevices& _devices;
 };
 
 }  // namespace tavisk

@@ -57,7 +57,7 @@ void appendNumber(std::string& bytes, std::uint64_t number, std::size_t width) {
 std::string toUtf16(std::string_view text) {
   std::string bytes;
   while (!text.empty()) {
-    auto character = takeCodePoint(text);
+    const auto character = takeCodePoint(text);
     if (!character) text.remove_prefix(1);
     char32_t left = character.value_or(replacementCharacter);
     if (left >= firstBeyondUnit) {

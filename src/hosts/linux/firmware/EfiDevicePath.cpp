@@ -26,6 +26,7 @@ constexpr std::uint8_t endOfInstance = 0x01;
 
 constexpr std::size_t headerSize = 4;
 constexpr std::size_t signatureSize = 16;
+constexpr std::size_t signatureDigits = 8;  ///< of a disk with an MBR
 constexpr std::uint8_t mbrFormat = 1;
 constexpr std::uint8_t gptFormat = 2;
 
@@ -56,18 +57,16 @@ void appendNode(std::string& bytes, const EfiPathNode& node) {
 }
 
 std::string mbrUuid(std::string_view signature, std::uint32_t number) {
-  return hexDigits(*takeNumber(signature, 4), 8) + "-" + hexDigits(number, 2);
+  return hexDigits(*takeNumber(signature, 4), signatureDigits) + "-" + hexDigits(number, 2);
 }
 
 /// The disk's signature in "1badd00d-02". A disk whose signature is 0 has none.
 std::optional<std::string> mbrSignature(const EfiPartition& partition) {
-  constexpr std::size_t digitCount = 8;
   const auto digits = partition.uuid.substr(0, partition.uuid.find('-'));
-  if (digits.size() != digitCount || digits.size() == partition.uuid.size()) return std::nullopt;
-  if (digits.find_first_not_of("0123456789abcdef") != std::string::npos) return std::nullopt;
-  if (digits.find_first_not_of('0') == std::string::npos) return std::nullopt;
+  const auto number = parseNumber<std::uint32_t>(digits, 16).value_or(0);
+  if (number == 0 || digits == partition.uuid || digits != hexDigits(number, signatureDigits)) return std::nullopt;
   std::string signature;
-  appendNumber(signature, std::stoull(digits, nullptr, 16), signatureSize);
+  appendNumber(signature, number, signatureSize);
   return signature;
 }
 

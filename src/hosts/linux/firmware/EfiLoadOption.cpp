@@ -28,7 +28,7 @@ std::optional<EfiLoadOption> parseLoadOption(std::string_view bytes) {
   const auto attributes = takeNumber(bytes, 4);
   const auto pathsSize = takeNumber(bytes, 2);
   if (!pathsSize) return std::nullopt;
-  auto description = takeText(bytes);
+  const auto description = takeText(bytes);
   if (!description || *pathsSize > bytes.size()) return std::nullopt;
   return EfiLoadOption{static_cast<std::uint32_t>(*attributes), *description, std::string(bytes.substr(0, *pathsSize)),
                        std::string(bytes.substr(*pathsSize))};
@@ -45,7 +45,7 @@ std::string bytesOf(const EfiLoadOption& option) {
 
 std::string targetText(const EfiLoadOption& option) {
   const auto path = parseDevicePath(option.paths);
-  auto text = path ? textOf(*path) : "a malformed device path";
+  const auto text = path ? textOf(*path) : "a malformed device path";
   return option.data.empty() ? text : text + " with options of its own";
 }
 

@@ -13,7 +13,7 @@
 #include <cerrno>
 #include <utility>
 
-#include "base/Result.h"
+#include "base/Text.h"
 #include "hosts/linux/firmware/EfiBytes.h"
 
 namespace tavisk {
@@ -25,11 +25,11 @@ constexpr unsigned modeWhenNew = 0644;
 /// Kept without power, and readable before and after the start of the system.
 constexpr std::uint64_t usualAttributes = 7;
 
+constexpr std::string_view entryPrefix = "Boot";
 constexpr std::array<std::string_view, 3> ownNames{"prev-lang:kbd", "boot-command", "target-mode"};
 
 bool isBootEntry(const EfiVariableName& variable) {
-  return variable.vendor == efiGlobalVendor && variable.name.size() == 8 && variable.name.starts_with("Boot") &&
-         variable.name.find_first_not_of("0123456789ABCDEF", 4) == std::string::npos;
+  return variable.vendor == efiGlobalVendor && bootEntryNumber(variable.name);
 }
 
 bool mayBeWritten(const EfiVariableName& variable) {
@@ -44,7 +44,7 @@ class Unprotected {
     auto file = root.open(path, O_RDONLY | O_NONBLOCK);
     if (!file || ::ioctl(file->number(), FS_IOC_GETFLAGS, &_flags) != 0) return;
     if ((_flags & FS_IMMUTABLE_FL) == 0) return;
-    int lifted = _flags & ~FS_IMMUTABLE_FL;
+    const int lifted = _flags & ~FS_IMMUTABLE_FL;
     if (::ioctl(file->number(), FS_IOC_SETFLAGS, &lifted) == 0) _file = std::move(file).value();
   }
   ~Unprotected() {
@@ -79,6 +79,17 @@ Result<void> cutTo(const FileDescriptor& file, std::size_t size, const std::stri
 
 }  // namespace
 
+std::string bootEntryName(std::uint16_t number) {
+  constexpr std::size_t digitCount = 4;
+  return std::string(entryPrefix) + upperCased(hexDigits(number, digitCount));
+}
+
+std::optional<std::uint16_t> bootEntryNumber(std::string_view name) {
+  if (!name.starts_with(entryPrefix)) return std::nullopt;
+  const auto number = parseNumber<std::uint16_t>(name.substr(entryPrefix.size()), 16);
+  return number && bootEntryName(*number) == name ? number : std::nullopt;
+}
+
 struct EfiVariables::Stored {
   std::uint64_t attributes;
   std::string value;
@@ -91,14 +102,14 @@ std::string EfiVariables::pathOf(const EfiVariableName& variable) {
 std::optional<Failure> EfiVariables::whyNone() const {
   if (!_root.exists("/sys/firmware/efi"))
     return Failure{"read", "the firmware's variables", "this machine was not started by UEFI firmware"};
-  auto all = _root.list(folder);
+  const auto all = _root.list(folder);
   if (!all) return all.failure();
   if (all->empty()) return Failure{"read", folder, "no variables are shown here; is efivarfs mounted?"};
   return std::nullopt;
 }
 
 Result<std::vector<std::string>> EfiVariables::names(std::string_view vendor) const {
-  auto all = _root.list(folder);
+  const auto all = _root.list(folder);
   if (!all) return all.failure();
   const auto ending = "-" + std::string(vendor);
   std::vector<std::string> names;
@@ -109,18 +120,18 @@ Result<std::vector<std::string>> EfiVariables::names(std::string_view vendor) co
 
 /// The kernel shows a variable that was made and not yet written as an empty file.
 Result<std::optional<EfiVariables::Stored>> EfiVariables::find(const std::string& path) const {
-  if (!_root.exists(path)) return std::optional<Stored>();
-  auto contents = _root.read(path, longestVariable);
+  if (!_root.exists(path)) return std::nullopt;
+  const auto contents = _root.read(path, longestVariable);
   if (!contents) return contents.failure();
-  if (contents->empty()) return std::optional<Stored>();
+  if (contents->empty()) return std::nullopt;
   std::string_view rest = *contents;
   const auto attributes = takeNumber(rest, attributesSize);
   if (!attributes) return Failure{"read", path, "too short for a variable"};
-  return std::optional(Stored{*attributes, std::string(rest)});
+  return Stored{*attributes, std::string(rest)};
 }
 
 Result<std::optional<std::string>> EfiVariables::read(const EfiVariableName& variable) const {
-  auto found = find(pathOf(variable));
+  const auto found = find(pathOf(variable));
   if (!found) return found.failure();
   return *found ? std::optional((*found)->value) : std::nullopt;
 }
@@ -141,9 +152,9 @@ Result<void> EfiVariables::write(const EfiVariableName& variable, std::string_vi
 Result<void> EfiVariables::writeFile(const std::string& path, std::string_view contents, bool isNew) const {
   const Unprotected meanwhile(_root, path);
   auto file = _root.open(path, O_WRONLY | O_NONBLOCK);
-  if (!file && isNew && !_root.exists(path)) file = _root.open(path, O_WRONLY | O_CREAT | O_EXCL, modeWhenNew);
+  if (!file && isNew && isAbsent(file.failure())) file = _root.open(path, O_WRONLY | O_CREAT | O_EXCL, modeWhenNew);
   if (!file) return file.failure();
-  auto written = writeOnce(*file, contents, path);
+  const auto written = writeOnce(*file, contents, path);
   if (written) return cutTo(*file, contents.size(), path);
   if (isNew) {
     const Unprotected removable(_root, path);

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -20,6 +21,11 @@ struct EfiVariableName {
   std::string name;
   std::string vendor = efiGlobalVendor;
 };
+
+/// The variable of a boot entry: "Boot000A".
+std::string bootEntryName(std::uint16_t number);
+/// The number of the boot entry that a variable of this name holds; absent for other names.
+std::optional<std::uint16_t> bootEntryNumber(std::string_view name);
 
 /// The firmware's variables, as the kernel shows them in a file system (efivarfs in the kernel's documentation).
 ///

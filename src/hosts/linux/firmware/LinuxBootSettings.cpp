@@ -3,6 +3,7 @@
 #include "hosts/linux/firmware/LinuxBootSettings.h"
 
 #include <algorithm>
+#include <utility>
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
@@ -15,12 +16,7 @@ namespace {
 
 constexpr const char* deviceTree = "/sys/firmware/devicetree/base";
 constexpr const char* interfaces = "/sys/class/net";
-constexpr int noneKnown = 0;
-constexpr int openFirmware = 1;
-constexpr int bootsEfiFiles = 2;
 constexpr ServiceStatus failed = 1;
-
-using Value = std::optional<std::string>;
 
 std::optional<EfiDevicePath> pathOf(const BootEntry& entry) {
   return parseDevicePath(entry.option.paths);
@@ -31,23 +27,23 @@ std::string nameOf(const BootEntry& entry) {
 }
 
 bool isOpenFirmware(const SystemRoot& root) {
-  auto properties = root.list(deviceTree).valueOr({});
+  const auto properties = root.list(deviceTree).valueOr({});
   return std::ranges::any_of(properties,
                              [](const auto& name) { return name == "openprom" || name.starts_with("ibm,"); });
 }
 
 }  // namespace
 
-LinuxBootSettings::LinuxBootSettings(const LinuxMachine& machine)
-    : _machine(machine), _variables(machine.root), _entries(_variables), _volumes(machine.root) {}
+LinuxBootSettings::LinuxBootSettings(const LinuxMachine& machine, LinuxDisks& disks)
+    : _machine(machine), _variables(machine.root), _entries(_variables), _volumes(machine.root, disks) {}
 
 int LinuxBootSettings::preBootEnvironment() {
-  if (_machine.root.exists("/sys/firmware/efi")) return bootsEfiFiles;
-  return isOpenFirmware(_machine.root) ? openFirmware : noneKnown;
+  if (_machine.root.exists("/sys/firmware/efi")) return preboot::loadsBootEfi;
+  return isOpenFirmware(_machine.root) ? preboot::openFirmware : preboot::noneKnown;
 }
 
 BootSettings::LegacyBootSupport LinuxBootSettings::legacyBootSupport() {
-  if (preBootEnvironment() != bootsEfiFiles) return {0, true};
+  if (preBootEnvironment() != preboot::loadsBootEfi) return {0, true};
   const auto entries = _entries.all();
   if (!entries) {
     _machine.effects.recordFailure(setting::startupDisk, entries.failure());
@@ -62,7 +58,7 @@ BootSettings::LegacyBootSupport LinuxBootSettings::legacyBootSupport() {
 
 /// What firmware starts at the next start.
 Result<std::optional<BootEntry>> LinuxBootSettings::preferred() const {
-  if (auto failure = _variables.whyNone()) return *failure;
+  if (const auto failure = _variables.whyNone()) return *failure;
   auto once = _entries.onlyNext();
   return !once || *once ? once : _entries.first();
 }
@@ -81,7 +77,7 @@ Result<std::optional<DiskName>> LinuxBootSettings::preferredVolume() const {
 }
 
 BootSettings::BootPreference LinuxBootSettings::bootPreference() {
-  auto volume = preferredVolume();
+  const auto volume = preferredVolume();
   if (!volume) {
     _machine.effects.recordFailure(setting::startupDisk, volume.failure());
     return {failed, std::nullopt};
@@ -122,23 +118,24 @@ ServiceStatus LinuxBootSettings::setBootPreference(const BootChoice& choice) {
   parts.where = EfiVariables::pathOf(BootEntries::orderVariable());
   parts.note = [this](const auto&) { return noteOnNextStart(); };
   parts.supported = [this] { return _variables.whyNone(); };
-  parts.stored = [this]() -> Result<Value> {
+  parts.stored = [this]() -> Setting<std::string>::Found {
     const auto entry = _entries.first();
     if (!entry) return entry.failure();
-    return *entry ? Value(targetText((*entry)->option)) : Value();
+    if (!*entry) return std::nullopt;
+    return Reading(targetText((*entry)->option));
   };
   parts.store = [&](const std::string&) -> Result<void> {
     if (!option) return option.failure();
     return _entries.putFirst(*option, [this](const auto& order) { return keepOrder(order); });
   };
-  return change(parts, option ? targetText(*option) : choice.disk.text + " " + choice.systemFolder);
+  return change(std::move(parts), option ? targetText(*option) : choice.disk.text + " " + choice.systemFolder);
 }
 
 /// An entry for the volume's own boot file, if firmware would start it.
 Result<EfiLoadOption> LinuxBootSettings::optionFor(const BootChoice& choice) const {
   const auto target = _volumes.targetOf(choice.disk, choice.systemFolder);
   if (!target) return target.failure();
-  if (auto refusal = whyRefused(*target)) return *refusal;
+  if (const auto refusal = whyRefused(*target)) return *refusal;
   EfiLoadOption option;
   option.description = "tavisk " + escaped(target->label);
   option.paths = bytesOf({*partitionNode(target->partition), fileNode(target->file)});
@@ -172,14 +169,14 @@ ServiceStatus LinuxBootSettings::setFirmwareVariable(const std::string& name, co
   parts.supported = [this] { return _variables.whyNone(); };
   parts.stored = [this, variable] { return _variables.read(variable); };
   parts.store = [this, variable](const std::string& text) { return _variables.write(variable, text); };
-  return change(parts, value);
+  return change(std::move(parts), value);
 }
 
-ServiceStatus LinuxBootSettings::change(const Setting<std::string>& setting, const std::string& asked) const {
-  auto parts = setting;
-  parts.store = [&](const std::string& value) -> Result<void> {
-    if (auto failure = whyNeedsRoot("write", setting.where)) return *failure;
-    return setting.store(value);
+/// Only root writes variables.
+ServiceStatus LinuxBootSettings::change(Setting<std::string> parts, const std::string& asked) const {
+  parts.store = [where = parts.where, store = parts.store](const std::string& value) -> Result<void> {
+    if (const auto failure = whyNeedsRoot("write", where)) return *failure;
+    return store(value);
   };
   const auto effect = carryOut(parts, asked, _machine.effects, _machine.runLoop);
   const bool isDone = effect.outcome == Outcome::applied || effect.outcome == Outcome::unchanged;

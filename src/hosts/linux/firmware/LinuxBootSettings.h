@@ -18,7 +18,8 @@ namespace tavisk {
 /// has no preference, and to set one is not supported.
 class LinuxBootSettings final : public BootSettings {
  public:
-  explicit LinuxBootSettings(const LinuxMachine& machine);
+  /// The disks are not owned.
+  LinuxBootSettings(const LinuxMachine& machine, LinuxDisks& disks);
 
   /// Where the order before the last change is kept, one line as firmware tools take it.
   static constexpr const char* previousOrder = "/var/lib/tavisk/previous-boot-order";
@@ -38,7 +39,7 @@ class LinuxBootSettings final : public BootSettings {
   std::string interfaceWith(const std::string& hardwareAddress) const;
   std::string noteOnNextStart() const;
   Result<void> keepOrder(const std::vector<std::uint16_t>& order) const;
-  ServiceStatus change(const Setting<std::string>& setting, const std::string& asked) const;
+  ServiceStatus change(Setting<std::string> parts, const std::string& asked) const;
 
   LinuxMachine _machine;
   EfiVariables _variables;

@@ -11,7 +11,7 @@ namespace tavisk {
 /// The questions about disks and the settings of the firmware, under one name.
 class LinuxDiskManagementService final : public DiskManagementService {
  public:
-  LinuxDiskManagementService(const LinuxMachine& machine, LinuxDisks& disks) : _queries(disks), _boot(machine) {}
+  LinuxDiskManagementService(const LinuxMachine& machine, LinuxDisks& disks) : _queries(disks), _boot(machine, disks) {}
 
   bool is(DiskTrait trait, const DiskName& disk) override { return _queries.is(trait, disk); }
   std::string protocolOf(const DiskName& disk) override { return _queries.protocolOf(disk); }

@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <string>
 
+#include "base/Path.h"
 #include "hosts/linux/LinuxTree.h"
 
 namespace tavisk {
@@ -18,6 +19,12 @@ inline bool runTool(const std::string& commandLine) {
 class DiskTree : public LinuxTree {
  public:
   static constexpr const char* sata = "/devices/pci0000:00/0000:00:1f.2/ata1/host0/target0:0:0/0:0:0:0";
+
+  static constexpr const char* usb = "/devices/pci0000:00/0000:00:14.0/usb1/1-2/1-2:1.0/host4/target4:0:0/4:0:0:0";
+  /// What the device manager knows of a drive with such a disc in it.
+  static constexpr const char* bootableDvd =
+      "E:ID_CDROM=1\nE:ID_CDROM_DVD=1\nE:ID_CDROM_MEDIA=1\nE:ID_CDROM_MEDIA_DVD_PLUS_R=1\nE:ID_FS_TYPE=iso9660\n"
+      "E:ID_FS_USAGE=filesystem\nE:ID_FS_BOOT_SYSTEM_ID=EL\\x20TORITO\\x20SPECIFICATION\n";
 
   /// A whole disk that hangs on a device, with its size in units of 512 bytes.
   void addDisk(const std::string& name, const std::string& number, std::uint64_t size,
@@ -37,6 +44,11 @@ class DiskTree : public LinuxTree {
   }
   void setSubsystem(const std::string& path, const std::string& name) {
     link("/sys" + path + "/subsystem", "/sys/bus/" + name);
+  }
+
+  /// Properties that the device manager knows of a device.
+  void know(const std::string& number, const std::string& properties) {
+    write("/run/udev/data/b" + number, "S:disk/by-id/x\nI:123\n" + properties + "G:systemd\n");
   }
 
   /// An empty file of that many units of 512 bytes in the place of a disk's node.
@@ -60,7 +72,7 @@ class DiskTree : public LinuxTree {
 
  private:
   void addDevice(const std::string& path, const std::string& number, std::uint64_t size) {
-    const auto name = path.substr(path.rfind('/') + 1);
+    const auto name = baseName(path);
     const auto colon = number.find(':');
     write("/sys" + path + "/uevent",
           "MAJOR=" + number.substr(0, colon) + "\nMINOR=" + number.substr(colon + 1) + "\nDEVNAME=" + name + "\n");

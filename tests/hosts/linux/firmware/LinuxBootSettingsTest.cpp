@@ -8,17 +8,20 @@
 
 #include <array>
 
+#include "effects/EffectMatchers.h"
+#include "effects/SettingNames.h"
 #include "hosts/linux/firmware/BootTree.h"
 #include "hosts/linux/firmware/LinuxBootSettings.h"
 
 namespace tavisk {
 namespace {
 
-using testing::AllOf, testing::HasSubstr;
-
-constexpr const char* system = "/System/Library/CoreServices";
+constexpr const char* systemFolder = "/System/Library/CoreServices";
+const std::string mainFile = systemFolder + std::string("/boot.efi");
+const std::string backupFile = "/Volumes/Backup" + mainFile;
 constexpr const char* mainUuid = "0f1e2d3c-4b5a-6978-8796-a5b4c3d2e1f0";
 constexpr const char* backupPath = R"(HD(1,MBR,11223344-01,0x800,0x800)/File(\System\Library\CoreServices\boot.efi))";
+constexpr const char* otherPath = R"(File(\EFI\debian\shimx64.efi))";
 
 void writeMbr(const std::filesystem::path& image) {
   std::fstream file(image, std::ios::binary | std::ios::in | std::ios::out);
@@ -28,7 +31,7 @@ void writeMbr(const std::filesystem::path& image) {
 }
 
 /// Main (ext4, sda2) with its EFI system partition (sda1), and Backup (FAT, sdb1 of an MBR disk).
-class LinuxBootTest : public testing::Test {
+class LinuxBootSettingsTest : public testing::Test {
  protected:
   void SetUp() override {
     if (::geteuid() != 0) GTEST_SKIP() << "only root changes what starts";
@@ -39,9 +42,9 @@ class LinuxBootTest : public testing::Test {
     tree.setOrder({0});
   }
 
-  LinuxBootSettings settings() { return LinuxBootSettings(_machine); }
+  LinuxBootSettings settings() { return LinuxBootSettings(_machine, _disks); }
   ServiceStatus set(const std::string& disk, const std::string& volume) {
-    return settings().setBootPreference({{disk}, volume + system, false});
+    return settings().setBootPreference({{disk}, volume + systemFolder, false});
   }
   std::string preferredDisk() {
     const auto preference = settings().bootPreference();
@@ -51,13 +54,21 @@ class LinuxBootTest : public testing::Test {
   void expectRefused(const std::string& disk, const std::string& volume, const std::string& why) {
     const auto before = tree.allVariables();
     EXPECT_NE(set(disk, volume), 0) << why;
-    EXPECT_THAT(tree.lastTold(), HasSubstr(why));
+    EXPECT_THAT(tree.lastEffect(), FailedFor(why));
     EXPECT_EQ(tree.allVariables(), before) << why;
     EXPECT_FALSE(tree.has(LinuxBootSettings::previousOrder)) << why;
   }
+  /// Of a set from one start to another, both as device paths.
+  static Effect effectOf(Outcome outcome, const std::string& before, const std::string& after) {
+    return {.setting = setting::startupDisk,
+            .outcome = outcome,
+            .before = before,
+            .asked = after,
+            .stored = after,
+            .where = BootTree::pathOf("BootOrder")};
+  }
 
   BootTree tree;
-  const std::string backupFile = "/Volumes/Backup" + std::string(system) + "/boot.efi";
 
  private:
   void addMain() {
@@ -72,24 +83,24 @@ class LinuxBootTest : public testing::Test {
     tree.mount("8:1", "/dev/sda1", "/boot/efi", "vfat");
   }
   void addBackup() {
-    tree.addDisk("sdb", "8:16", 8192, usb);
-    tree.addPartition("sdb", 1, "8:17", 2048, 2048, usb);
+    tree.addDisk("sdb", "8:16", 8192, DiskTree::usb);
+    tree.addPartition("sdb", 1, "8:17", 2048, 2048, DiskTree::usb);
     writeMbr(tree.addImage("sdb", 8192));
     _hasTools &= runTool("mkfs.vfat -n BACKUP " + tree.addImage("sdb1", 2048));
     tree.mount("8:17", "/dev/sdb1", "/Volumes/Backup", "vfat");
     tree.write(backupFile, firmwareProgram());
   }
 
-  static constexpr const char* usb = "/devices/pci0000:00/0000:00:14.0/usb1/1-2/1-2:1.0/host4/target4:0:0/4:0:0:0";
   bool _hasTools = true;
   SystemRoot _root{tree.at("/")};
   ServiceAccess _services{_root, tree.runLoop};
   LinuxMachine _machine{_root, tree.effects, tree.runLoop, _services};
+  LinuxDisks _disks{_machine};
 };
 
-TEST_F(LinuxBootTest, StartsTheVolumesOwnFile) {
+TEST_F(LinuxBootSettingsTest, StartsTheVolumesOwnFile) {
   EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"applied")"), HasSubstr("HD(1,MBR,11223344-01")));
+  EXPECT_EQ(tree.lastEffect(), effectOf(Outcome::applied, otherPath, backupPath));
   const SystemRoot root(tree.at("/"));
   const EfiVariables variables(root);
   const auto first = BootEntries(variables).first().valueOr(std::nullopt);
@@ -98,68 +109,96 @@ TEST_F(LinuxBootTest, StartsTheVolumesOwnFile) {
   EXPECT_EQ(first->option.description, "tavisk BACKUP");
   EXPECT_EQ(tree.file(LinuxBootSettings::previousOrder), "0000\n");
   EXPECT_EQ(preferredDisk(), "sdb1");
+}
 
+TEST_F(LinuxBootSettingsTest, LeavesEverythingWhereItStartsThatAlready) {
+  set("sdb1", "/Volumes/Backup");
   const auto before = tree.allVariables();
   EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
-  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"unchanged")"));
+  EXPECT_EQ(tree.lastEffect(), effectOf(Outcome::unchanged, backupPath, backupPath));
   EXPECT_EQ(tree.allVariables(), before);
 }
 
-TEST_F(LinuxBootTest, StartsAVolumeThatFirmwareCannotReadFromItsFileBeside) {
-  const auto file = "/boot/efi/EFI/tavisk/" + std::string(mainUuid) + "/boot.efi";
-  tree.write(std::string(system) + "/boot.efi", firmwareProgram());
-  expectRefused("sda2", "", "there is no such file");
-  tree.write(file, firmwareProgram());
-  const auto mounts = tree.file("/proc/thread-self/mountinfo");
-  tree.setMounts(std::string(mounts).replace(mounts.find("vfat"), 4, "ext4"));
-  expectRefused("sda2", "", "it holds ext4");
-  tree.setMounts(mounts);
-  EXPECT_EQ(set("sda2", ""), 0) << tree.lastTold();
-  EXPECT_THAT(tree.lastTold(), HasSubstr("HD(1,GPT,6c8f1b52-0e5a-4e0c-9b66-0123456789ab,0x800,0x800)/File("));
+TEST_F(LinuxBootSettingsTest, StartsAVolumeThatFirmwareCannotReadFromItsFileBeside) {
+  tree.write("/boot/efi/EFI/tavisk/" + std::string(mainUuid) + "/boot.efi", firmwareProgram());
+  const auto path = R"(HD(1,GPT,6c8f1b52-0e5a-4e0c-9b66-0123456789ab,0x800,0x800)/File(\EFI\tavisk\)" +
+                    std::string(mainUuid) + R"(\boot.efi))";
+  EXPECT_EQ(set("sda2", ""), 0);
+  EXPECT_EQ(tree.lastEffect(), effectOf(Outcome::applied, otherPath, path));
   EXPECT_EQ(preferredDisk(), "sda2") << "the volume it was made for, not the partition that has the file";
   tree.link("/dev/disk/by-uuid/" + std::string(mainUuid), "../../sdb1");
   EXPECT_EQ(preferredDisk(), "sda2") << "not a copy of it on another disk";
 }
 
-TEST_F(LinuxBootTest, RefusesWhatFirmwareWouldNotStart) {
-  expectRefused("sdz", "", "no such disk");
-  expectRefused("sdb1", "/Volumes/Other", "/Volumes/Other");
-  tree.write(std::string(system) + "/boot.efi", firmwareProgram());
-  expectRefused("sdb1", "", "it is not on sdb1");
-  expectRefused("sda2", "", "does not read ext4");
-  tree.write(BootTree::pathOf("SecureBoot"), "odd");
-  expectRefused("sdb1", "/Volumes/Backup", "too short for a variable");
-  tree.setVariable("SecureBoot", "\1");
-  expectRefused("sdb1", "/Volumes/Backup", "Secure Boot is on");
-  tree.write(backupFile, "#!/bin/sh\n");
-  expectRefused("sdb1", "/Volumes/Backup", "not a program");
-  std::filesystem::remove(tree.at(backupFile));
-  expectRefused("sdb1", "/Volumes/Backup", "No such file");
-  tree.write(backupFile, firmwareProgram(true, 10, 16, 0x400));
-  std::filesystem::copy_file(tree.at("/dev/sdb"), tree.at("/dev/sdc"));
-  tree.addDisk("sdc", "8:32", 8192);
-  tree.addPartition("sdc", 1, "8:33", 2048, 2048);
-  expectRefused("sdb1", "/Volumes/Backup", "the same identity 11223344-01");
-  tree.removeDevice("sdc", "8:32");
-  EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0) << "signed, and the only one";
+struct Refusal {
+  const char* disk;
+  const char* volume;
+  const char* why;
+  std::function<void(BootTree&)> prepare = nullptr;
+};
+
+const Refusal refusals[] = {
+    {"sdz", "", "no such disk"},
+    {"sdb1", "/Volumes/Other", "/Volumes/Other"},
+    {"sdb1", "", "it is not on sdb1"},
+    {"sda2", "", "does not read ext4"},
+    {"sda2", "", "there is no such file"},
+    {"sda2", "", "it holds ext4",
+     [](auto& tree) {
+       auto mounts = tree.file("/proc/thread-self/mountinfo");
+       tree.setMounts(mounts.replace(mounts.find("vfat"), 4, "ext4"));
+     }},
+    {"sdb1", "/Volumes/Backup", "too short for a variable",
+     [](auto& tree) { tree.write(BootTree::pathOf("SecureBoot"), "odd"); }},
+    {"sdb1", "/Volumes/Backup", "Secure Boot is on", [](auto& tree) { tree.setVariable("SecureBoot", "\1"); }},
+    {"sdb1", "/Volumes/Backup", "not a program", [](auto& tree) { tree.write(backupFile, "#!/bin/sh\n"); }},
+    {"sdb1", "/Volumes/Backup", "No such file", [](auto& tree) { std::filesystem::remove(tree.at(backupFile)); }},
+    {"sdb1", "/Volumes/Backup", "the same identity 11223344-01",
+     [](auto& tree) {
+       std::filesystem::copy_file(tree.at("/dev/sdb"), tree.at("/dev/sdc"));
+       tree.addDisk("sdc", "8:32", 8192);
+       tree.addPartition("sdc", 1, "8:33", 2048, 2048);
+     }},
+};
+
+TEST_F(LinuxBootSettingsTest, RefusesWhatFirmwareWouldNotStart) {
+  tree.write(mainFile, firmwareProgram());
+  preferredDisk();  // what is known of the disks from now on does not count for a set
+  const auto mounts = tree.file("/proc/thread-self/mountinfo");
+  for (const auto& refusal : refusals) {
+    if (refusal.prepare) refusal.prepare(tree);
+    expectRefused(refusal.disk, refusal.volume, refusal.why);
+    tree.setMounts(mounts);
+    tree.write(backupFile, firmwareProgram());
+    std::filesystem::remove(tree.at(BootTree::pathOf("SecureBoot")));
+  }
 }
 
-TEST_F(LinuxBootTest, TellsWhatWillStart) {
+TEST_F(LinuxBootSettingsTest, StartsASignedFileUnderSecureBoot) {
+  tree.setVariable("SecureBoot", "\1");
+  tree.write(backupFile, firmwareProgram(true, 10, 16, 0x400));
+  EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
+}
+
+TEST_F(LinuxBootSettingsTest, KnowsAPartitionByItsIdentityAlone) {
   EXPECT_EQ(preferredDisk(), "");
-  EXPECT_THAT(tree.lastTold(), HasSubstr("Boot0000 (other)"));
-  const EfiDevicePath main{*partitionNode({"6c8f1b52-0e5a-4e0c-9b66-0123456789ab", 9, 1, 1}), fileNode("a")};
-  tree.setEntry(4, main);
+  EXPECT_THAT(tree.lastEffect(), FailedFor("Boot0000 (other)"));
+  tree.setEntry(4, {*partitionNode({"6c8f1b52-0e5a-4e0c-9b66-0123456789ab", 9, 1, 1}), fileNode("a")});
   tree.setOrder({4, 0});
-  EXPECT_EQ(preferredDisk(), "sda1") << "a partition is known by its identity alone";
+  EXPECT_EQ(preferredDisk(), "sda1");
+}
+
+TEST_F(LinuxBootSettingsTest, TellsOfTheNextStartAlone) {
   tree.setEntry(5, {*partitionNode({"ffffffff-0e5a-4e0c-9b66-0123456789ab", 1, 1, 1})});
   tree.setVariable("BootNext", std::string("\5\0", 2));
   EXPECT_EQ(preferredDisk(), "") << "gone with its disk";
   EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
-  EXPECT_THAT(tree.lastTold(), HasSubstr("the next start alone is from Boot0005"));
+  auto expected = effectOf(Outcome::applied, otherPath, backupPath);
+  expected.note = "the next start alone is from Boot0005 (other), as BootNext says";
+  EXPECT_EQ(tree.lastEffect(), expected);
 }
 
-TEST_F(LinuxBootTest, KnowsTheStartOverANetwork) {
-  EXPECT_FALSE(settings().networkBootPreference().interface);
+TEST_F(LinuxBootSettingsTest, KnowsTheStartOverANetwork) {
   const EfiPathNode hardwareAddress{3, 11, fromHex("525400123456" + std::string(52, '0') + "01")};
   tree.setEntry(1, {hardwareAddress, {3, 12, fromHex("00000000c0a80001" + std::string(30, '0'))}});
   tree.setOrder({1, 0});
@@ -175,25 +214,21 @@ TEST_F(LinuxBootTest, KnowsTheStartOverANetwork) {
   EXPECT_FALSE(disk.disk);
 }
 
-TEST_F(LinuxBootTest, KnowsTheFirmware) {
-  EXPECT_EQ(settings().preBootEnvironment(), 2);
+TEST_F(LinuxBootSettingsTest, KnowsWhetherFirmwareStartsByTheOldRules) {
   EXPECT_FALSE(settings().legacyBootSupport().supported);
-  tree.setEntry(8, {{5, 1,
-                     fromHex("02000000"
-                             "48440000")}});
+  tree.setEntry(8, {{5, 1, fromHex("0200000048440000")}});
   EXPECT_TRUE(settings().legacyBootSupport().supported);
-  EXPECT_EQ(settings().setFirmwareVariable("prev-lang:kbd", "en_GB:2"), 0);
-  EXPECT_EQ(tree.file(EfiVariables::pathOf({"prev-lang:kbd", efiOwnVendor})), std::string("\7\0\0\0en_GB:2", 11));
-  EXPECT_NE(settings().setFirmwareVariable("SecureBoot", "0"), 0);
+}
 
+TEST_F(LinuxBootSettingsTest, HasNoChoiceUnderOtherFirmware) {
   std::filesystem::remove_all(tree.at("/sys/firmware/efi"));
-  EXPECT_EQ(settings().preBootEnvironment(), 0);
+  EXPECT_EQ(settings().preBootEnvironment(), preboot::noneKnown);
   EXPECT_TRUE(settings().legacyBootSupport().supported);
   EXPECT_NE(set("sdb1", "/Volumes/Backup"), 0);
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr("not supported"), HasSubstr("not started by UEFI")));
+  EXPECT_THAT(tree.lastEffect(), UnsupportedFor("not started by UEFI"));
   EXPECT_EQ(settings().networkBootPreference().status, 0);
   tree.write("/sys/firmware/devicetree/base/ibm,opal", "");
-  EXPECT_EQ(settings().preBootEnvironment(), 1);
+  EXPECT_EQ(settings().preBootEnvironment(), preboot::openFirmware);
 }
 
 /// Whether the call that the process is about to make may change a file.
@@ -230,7 +265,7 @@ bool killedAt(int number, const std::function<void()>& work) {
   return true;
 }
 
-TEST_F(LinuxBootTest, HasTheOldOrderOrTheNewOneWheneverItIsKilled) {
+TEST_F(LinuxBootSettingsTest, HasTheOldOrderOrTheNewOneWheneverItIsKilled) {
   const auto before = tree.allVariables();
   const auto order = std::string("BootOrder-") + efiGlobalVendor;
   const std::string newOrder("\7\0\0\0\1\0\0\0", 8);

@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include <gtest/gtest.h>
 
-#include "startupdisk/MessageFormat.h"
+#include "startupdisk/SDLog.h"
 
 namespace tavisk {
 namespace {
