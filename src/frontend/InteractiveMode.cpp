@@ -1,6 +1,8 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
+#include <algorithm>
 #include <cstddef>
+#include <iterator>
 #include <optional>
 
 #include "base/Text.h"
@@ -14,6 +16,12 @@ constexpr std::size_t lineBufferSize = 2056;
 
 bool beginsWith(const std::string& line, std::string_view word) {
   return compareIgnoringCase(std::string_view(line).substr(0, word.size()), word) == 0;
+}
+
+std::vector<std::string> namesOf(const std::vector<ZoneName>& zones) {
+  std::vector<std::string> names;
+  std::ranges::transform(zones, std::back_inserter(names), &ZoneName::text);
+  return names;
 }
 
 }  // namespace
@@ -45,7 +53,7 @@ bool RemoteServerSettings::readInput() {
 
 std::vector<std::string> RemoteServerSettings::completions(const std::string& text) {
   return completionsOf(text, [this](ArgumentKind kind) -> std::vector<std::string> {
-    if (kind == ArgumentKind::timeZone) return _context.host.clock().knownTimeZones();
+    if (kind == ArgumentKind::timeZone) return namesOf(_context.host.clock().knownTimeZones());
     if (kind == ArgumentKind::startupDisk) return _serverCommands->knownStartupDisks();
     return {};
   });

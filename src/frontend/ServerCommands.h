@@ -172,7 +172,7 @@ class ServerCommands {
   std::optional<bool> readOnOff(const std::string& value, const char* command);
 
   /// The zone that this run has set, else the machine's.
-  std::string localTimeZone();
+  ZoneName localTimeZone();
   DateTime localNow();
   void setClock(const DateTime& local);
   /// True while the network time client runs: then the error was printed and the error flag set.
@@ -197,7 +197,7 @@ class ServerCommands {
   bool _interactive = false;                         ///< kept; no handler reads it
   std::atomic<bool> _error = false;
   RemoteServerSettings* _parent = nullptr;
-  std::optional<std::string> _timeZone;  ///< set by setTimeZone
+  std::optional<ZoneName> _timeZone;  ///< set by setTimeZone
   std::shared_ptr<SpecialPMUSettings> _specialPMU;
   std::shared_ptr<StartupDisk> _startupDisk;
 };

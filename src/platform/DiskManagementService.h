@@ -62,6 +62,8 @@ class BootSettings {
     DiskName disk;
     std::string systemFolder;  ///< absolute path
     bool lumara9 = false;
+
+    bool operator==(const BootChoice&) const = default;
   };
 
   /// 0: no pre-boot environment known; 1: Open Firmware; 2: a firmware that loads "boot.efi". From any thread.

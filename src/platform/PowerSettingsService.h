@@ -16,6 +16,11 @@ struct Minutes {
   bool operator==(const Minutes&) const = default;
 };
 
+/// How effects and reports tell them.
+inline std::string textOf(const Minutes& minutes) {
+  return std::to_string(minutes.count);
+}
+
 enum class SleepTimer { computer, display, hardDisk };
 
 /// How long the machine, its display or its disks are idle before they sleep.

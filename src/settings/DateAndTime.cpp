@@ -4,7 +4,6 @@
 #include <cmath>
 #include <cstddef>
 #include <cstdint>
-#include <vector>
 
 #include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
@@ -15,7 +14,7 @@ namespace {
 
 /// The three numbers of "mm:dd:yy" or "hh:mm:ss"; what is missing or no number is 0.
 std::array<std::int64_t, 3> readFields(const std::string& text) {
-  const std::vector<std::string> fields = split(text, "/:");
+  const auto fields = split(text, "/:");
   std::array<std::int64_t, 3> numbers{};
   for (std::size_t i = 0; i < numbers.size() && i < fields.size(); ++i) numbers[i] = leadingInteger(fields[i]);
   return numbers;
@@ -38,7 +37,7 @@ bool isDate(std::int64_t month, std::int64_t day, std::int64_t year) {
 }  // namespace
 
 DateTime ServerCommands::localNow() {
-  ClockService& clock = _context.host.clock();
+  auto& clock = _context.host.clock();
   setDefaultTimeZone(clock.rulesOf(localTimeZone()));
   return localDateTime(clock.now());
 }
@@ -56,7 +55,7 @@ bool ServerCommands::refuseWhileNetworkTimeRuns(const char* error) {
 }
 
 void ServerCommands::getDate() {
-  const DateTime now = localNow();
+  const auto now = localNow();
   _context.output.print("Date: %ld/%ld/%ld\n", now.month, now.day, now.year);
   setError(false);
 }
@@ -72,13 +71,13 @@ void ServerCommands::setDate(const std::string& date) {
     return;
   }
   const std::int64_t year = yearAsTyped <= 99 ? yearAsTyped + 2000 : yearAsTyped;
-  const DateTime now = localNow();
+  const auto now = localNow();
   setClock({year, month, day, now.hour, now.minute, now.second});
   _context.output.print("setdate: %02ld/%02ld/%02ld\n", month, day, year);
 }
 
 void ServerCommands::getTime() {
-  const DateTime now = localNow();
+  const auto now = localNow();
   _context.output.print("Time: %02ld:%02ld:%02ld\n", now.hour, now.minute, now.second);
   setError(false);
 }
@@ -93,7 +92,7 @@ void ServerCommands::setTime(const std::string& time) {
     setError(true);
     return;
   }
-  const DateTime now = localNow();
+  const auto now = localNow();
   setClock({now.year, now.month, now.day, hour, minute, second});
   _context.output.print("Set Time: %02ld:%02ld:%02ld\n", hour, minute, second);
 }

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/machine/LinuxProcesses.h"
 
 #include <sys/syscall.h>
@@ -9,7 +8,7 @@
 #include <algorithm>
 #include <cerrno>
 
-#include "base/Result.h"
+#include "base/FileDescriptor.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/system/ProcessScan.h"
 #include "hosts/linux/system/Program.h"
