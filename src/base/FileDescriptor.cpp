@@ -1,14 +1,11 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "base/FileDescriptor.h"
 
 #include <unistd.h>
 
 #include <array>
 #include <cerrno>
-
-#include "base/Result.h"
 
 namespace tavisk {
 
@@ -25,7 +22,7 @@ Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const
   std::string contents;
   std::array<char, 65536> buffer{};
   while (true) {
-    auto count = ::read(file.number(), buffer.data(), buffer.size());
+    const auto count = ::read(file.number(), buffer.data(), buffer.size());
     if (count == 0) return contents;
     if (count < 0 && errno == EINTR) continue;
     if (count < 0) return systemFailure("read", path, errno);
@@ -36,7 +33,7 @@ Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const
 
 Result<void> writeAll(const FileDescriptor& file, std::string_view contents, const std::string& path) {
   while (!contents.empty()) {
-    auto count = ::write(file.number(), contents.data(), contents.size());
+    const auto count = ::write(file.number(), contents.data(), contents.size());
     if (count < 0 && errno == EINTR) continue;
     if (count < 0) return systemFailure("write", path, errno);
     contents.remove_prefix(static_cast<std::size_t>(count));

@@ -12,11 +12,11 @@
 namespace tavisk {
 
 /// Owns an open file descriptor, or none.
-class FileDescriptor {
+class FileDescriptor final {
  public:
   FileDescriptor() = default;
   explicit FileDescriptor(int number) : _number(number) {}
-  FileDescriptor(FileDescriptor&& other) noexcept : _number(std::exchange(other._number, -1)) {}
+  FileDescriptor(FileDescriptor&& other) noexcept : _number(other.release()) {}
   FileDescriptor& operator=(FileDescriptor&& other) noexcept;
   FileDescriptor(const FileDescriptor&) = delete;
   FileDescriptor& operator=(const FileDescriptor&) = delete;
@@ -24,6 +24,8 @@ class FileDescriptor {
 
   explicit operator bool() const { return _number >= 0; }
   int number() const { return _number; }
+  /// Gives it away: whoever takes it closes it.
+  int release() { return std::exchange(_number, -1); }
 
  private:
   int _number = -1;

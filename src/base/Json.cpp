@@ -2,14 +2,10 @@
 // SPDX-License-Identifier: MIT
 #include "base/Json.h"
 
-#include <optional>
-
 #include "base/Text.h"
 
 namespace tavisk {
 namespace {
-
-constexpr char32_t replacementCharacter = 0xFFFD;
 
 /// The letter of the two-character escape (RFC 8259, 7); 0 when there is none.
 char shortEscape(char32_t codePoint) {
@@ -32,23 +28,18 @@ char shortEscape(char32_t codePoint) {
   }
 }
 
-void appendNumericEscape(std::string& json, char32_t codePoint) {
-  json += "\\u";
-  for (unsigned shift = 16; shift > 0; shift -= 4) json += "0123456789abcdef"[(codePoint >> (shift - 4)) & 0xFU];
-}
-
 void appendCharacter(std::string& json, char32_t codePoint) {
   if (const char letter = shortEscape(codePoint); letter != 0) {
     json += {'\\', letter};
   } else if (isControl(codePoint)) {
-    appendNumericEscape(json, codePoint);
+    json += "\\u" + hexDigits(codePoint, 4);
   } else {
     appendUtf8(json, codePoint);
   }
 }
 
 char32_t takeCharacter(std::string_view& text) {
-  if (const std::optional<char32_t> codePoint = takeCodePoint(text)) return *codePoint;
+  if (const auto codePoint = takeCodePoint(text)) return *codePoint;
   text.remove_prefix(1);
   return replacementCharacter;
 }

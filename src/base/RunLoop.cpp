@@ -18,6 +18,8 @@
 #include <utility>
 #include <vector>
 
+#include "base/FileDescriptor.h"
+
 namespace tavisk {
 namespace {
 
@@ -25,27 +27,17 @@ using TimePoint = RunLoop::Clock::time_point;
 using Duration = RunLoop::Clock::duration;
 using Work = RunLoop::Work;
 
-/// A descriptor of the loop's own.
-class Descriptor {
- public:
-  Descriptor(int descriptor, const char* call) : _descriptor(descriptor) {
-    if (descriptor < 0) throw std::system_error(errno, std::generic_category(), call);
-  }
-  Descriptor(const Descriptor&) = delete;
-  Descriptor& operator=(const Descriptor&) = delete;
-  ~Descriptor() { close(_descriptor); }
+/// A descriptor that the loop needs, as `call` gave it.
+FileDescriptor needed(int descriptor, const char* call) {
+  if (descriptor < 0) throw std::system_error(errno, std::generic_category(), call);
+  return FileDescriptor(descriptor);
+}
 
-  int get() const { return _descriptor; }
-
-  /// Takes the count out of an eventfd or timerfd, so that it is ready no more.
-  void drain() const {
-    std::uint64_t count = 0;
-    [[maybe_unused]] const ssize_t taken = read(_descriptor, &count, sizeof count);
-  }
-
- private:
-  int _descriptor;
-};
+/// Takes the count out of an eventfd or timerfd, so that it is ready no more.
+void drain(const FileDescriptor& counter) {
+  std::uint64_t count = 0;
+  (void)!::read(counter.number(), &count, sizeof count);
+}
 
 struct Timer {
   Duration interval;  ///< 0: runs once
@@ -64,16 +56,16 @@ struct Watch {
 };
 
 TimePoint afterNow(Duration delay) {
-  const TimePoint now = RunLoop::Clock::now();
+  const auto now = RunLoop::Clock::now();
   return delay > TimePoint::max() - now ? TimePoint::max() : now + std::max(delay, Duration::zero());
 }
 
 }  // namespace
 
 struct RunLoop::State {
-  Descriptor epoll{epoll_create1(EPOLL_CLOEXEC), "epoll_create1"};
-  Descriptor alarm{timerfd_create(CLOCK_MONOTONIC, TFD_CLOEXEC | TFD_NONBLOCK), "timerfd_create"};
-  Descriptor wakeUp{eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK), "eventfd"};
+  FileDescriptor epoll = needed(epoll_create1(EPOLL_CLOEXEC), "epoll_create1");
+  FileDescriptor alarm = needed(timerfd_create(CLOCK_MONOTONIC, TFD_CLOEXEC | TFD_NONBLOCK), "timerfd_create");
+  FileDescriptor wakeUp = needed(eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK), "eventfd");
 
   std::mutex mutex;  ///< of the next three
   std::deque<Work> posted;
@@ -88,8 +80,8 @@ struct RunLoop::State {
   TimePoint limit = TimePoint::max();
 
   State() {
-    for (const Descriptor* own : {&alarm, &wakeUp}) {
-      if (!setEvents(own->get(), EPOLLIN)) throw std::system_error(errno, std::generic_category(), "epoll_ctl");
+    for (const auto* own : {&alarm, &wakeUp}) {
+      if (!setEvents(own->number(), EPOLLIN)) throw std::system_error(errno, std::generic_category(), "epoll_ctl");
     }
   }
 
@@ -97,9 +89,9 @@ struct RunLoop::State {
     epoll_event event{};
     event.events = events;
     event.data.fd = descriptor;
-    if (events == 0) return epoll_ctl(epoll.get(), EPOLL_CTL_DEL, descriptor, &event) == 0;
-    if (epoll_ctl(epoll.get(), EPOLL_CTL_ADD, descriptor, &event) == 0) return true;
-    return errno == EEXIST && epoll_ctl(epoll.get(), EPOLL_CTL_MOD, descriptor, &event) == 0;
+    if (events == 0) return epoll_ctl(epoll.number(), EPOLL_CTL_DEL, descriptor, &event) == 0;
+    if (epoll_ctl(epoll.number(), EPOLL_CTL_ADD, descriptor, &event) == 0) return true;
+    return errno == EEXIST && epoll_ctl(epoll.number(), EPOLL_CTL_MOD, descriptor, &event) == 0;
   }
 
   /// One registration a descriptor is all that epoll allows: it gets what all watches of the descriptor want.
@@ -135,34 +127,34 @@ struct RunLoop::State {
     posted.push_back(std::move(work));
     ++postedSoFar;
     // The loop does not wait while there is posted work: only the first has to wake it.
-    if (posted.size() == 1) eventfd_write(wakeUp.get(), 1);
+    if (posted.size() == 1) eventfd_write(wakeUp.number(), 1);
   }
 
   Work takePosted(std::uint64_t last) {
     const std::scoped_lock lock(mutex);
     if (takenSoFar >= last) return nullptr;
-    Work work = std::move(posted.front());
+    auto work = std::move(posted.front());
     posted.pop_front();
     ++takenSoFar;
     return work;
   }
 
   void runPosted(std::uint64_t last) {
-    while (const Work work = takePosted(last)) work();
+    while (const auto work = takePosted(last)) work();
   }
 
   std::shared_ptr<Timer> takeTimer(TimePoint passBegin, std::uint64_t lastArmed) {
     if (timers.empty()) return nullptr;
     const auto [due, order] = timers.begin()->first;
     if (due > passBegin || order > lastArmed) return nullptr;
-    std::shared_ptr<Timer> timer = timers.begin()->second;
+    auto timer = timers.begin()->second;
     timers.erase(timers.begin());
     return timer;
   }
 
   void runTimers(TimePoint passBegin, std::uint64_t lastArmed) {
-    while (const std::shared_ptr<Timer> timer = takeTimer(passBegin, lastArmed)) {
-      Work work = std::move(timer->work);
+    while (const auto timer = takeTimer(passBegin, lastArmed)) {
+      auto work = std::move(timer->work);
       work();
       if (timer->interval == Duration::zero() || timer->isCancelled) continue;
       timer->work = std::move(work);
@@ -175,13 +167,13 @@ struct RunLoop::State {
   /// kept: some files (/proc/self/mountinfo) tell of a change only once.
   void collectReady(bool wait) {
     std::array<epoll_event, 32> events{};
-    const int count = epoll_wait(epoll.get(), events.data(), static_cast<int>(events.size()), wait ? -1 : 0);
+    const auto count = epoll_wait(epoll.number(), events.data(), static_cast<int>(events.size()), wait ? -1 : 0);
     for (int place = 0; place < count; ++place) noteReady(events[static_cast<std::size_t>(place)]);
   }
 
   void noteReady(const epoll_event& event) {
-    if (event.data.fd == alarm.get()) return alarm.drain();
-    if (event.data.fd == wakeUp.get()) return wakeUp.drain();
+    if (event.data.fd == alarm.number()) return drain(alarm);
+    if (event.data.fd == wakeUp.number()) return drain(wakeUp);
     const auto found = watches.find(event.data.fd);
     if (found == watches.end()) return;
     for (const auto& watch : found->second) {
@@ -193,8 +185,8 @@ struct RunLoop::State {
 
   /// Pass in pass: the inner one runs also what the outer one found ready and has not yet run.
   void runReady() {
-    for (std::size_t left = ready.size(); left > 0 && !ready.empty(); --left) {
-      const std::shared_ptr<Watch> watch = ready.front();
+    for (auto left = ready.size(); left > 0 && !ready.empty(); --left) {
+      const auto watch = ready.front();
       ready.pop_front();
       watch->isQueued = false;
       if (!watch->isCancelled) watch->work();
@@ -203,9 +195,9 @@ struct RunLoop::State {
 
   void runPass() {
     collectReady(false);
-    const TimePoint begin = Clock::now();
-    const std::uint64_t lastArmed = armedSoFar;
-    const std::uint64_t lastPosted = [this] {
+    const auto begin = Clock::now();
+    const auto lastArmed = armedSoFar;
+    const auto lastPosted = [this] {
       const std::scoped_lock lock(mutex);
       return postedSoFar;
     }();
@@ -229,12 +221,12 @@ struct RunLoop::State {
   void setAlarm(TimePoint due) const {
     itimerspec setting{};  // zero: never
     if (due != TimePoint::max()) {
-      const Duration sinceBoot = std::max<Duration>(due.time_since_epoch(), std::chrono::nanoseconds(1));
+      const auto sinceBoot = std::max<Duration>(due.time_since_epoch(), std::chrono::nanoseconds(1));
       const auto seconds = std::chrono::floor<std::chrono::seconds>(sinceBoot);
       setting.it_value.tv_sec = seconds.count();
       setting.it_value.tv_nsec = std::chrono::nanoseconds(sinceBoot - seconds).count();
     }
-    timerfd_settime(alarm.get(), TFD_TIMER_ABSTIME, &setting, nullptr);
+    timerfd_settime(alarm.number(), TFD_TIMER_ABSTIME, &setting, nullptr);
   }
 };
 
@@ -244,7 +236,7 @@ namespace {
 template <typename State, typename Entry>
 RunLoop::Registration registrationOf(const std::shared_ptr<State>& state, const std::shared_ptr<Entry>& entry) {
   return RunLoop::Registration([loop = std::weak_ptr(state), entry] {
-    if (const std::shared_ptr<State> living = loop.lock()) living->cancel(*entry);
+    if (const auto living = loop.lock()) living->cancel(*entry);
   });
 }
 
@@ -264,7 +256,7 @@ RunLoop::Registration::~Registration() {
 }
 
 void RunLoop::Registration::cancel() {
-  if (const std::function<void()> cancel = std::exchange(_cancel, nullptr)) cancel();
+  if (const auto cancel = std::exchange(_cancel, nullptr)) cancel();
 }
 
 RunLoop::RunLoop() : _state(std::make_shared<State>()) {}
@@ -296,14 +288,14 @@ RunLoop::Registration RunLoop::watch(int descriptor, Readiness readiness, Work w
 }
 
 RunLoop::Registration RunLoop::limitWaits(Clock::duration together) {
-  const TimePoint before = _state->limit;
+  const auto before = _state->limit;
   _state->limit = std::min(before, afterNow(together));
   return Registration([state = _state, before] { state->limit = before; });
 }
 
 RunLoop::Registration RunLoop::pauseLimit() {
   if (_state->limit == TimePoint::max()) return {};
-  const Duration left = std::exchange(_state->limit, TimePoint::max()) - Clock::now();
+  const auto left = std::exchange(_state->limit, TimePoint::max()) - Clock::now();
   return Registration([state = _state, left] { state->limit = Clock::now() + left; });
 }
 
@@ -316,7 +308,7 @@ void RunLoop::runPass() {
 }
 
 void RunLoop::runUntil(Clock::time_point deadline) {
-  const TimePoint end = std::min(deadline, _state->limit);
+  const auto end = std::min(deadline, _state->limit);
   runPass();
   while (Clock::now() < end) {
     _state->wait(end);
@@ -325,7 +317,7 @@ void RunLoop::runUntil(Clock::time_point deadline) {
 }
 
 bool RunLoop::runUntil(Clock::time_point deadline, const std::function<bool()>& condition) {
-  const TimePoint end = std::min(deadline, _state->limit);
+  const auto end = std::min(deadline, _state->limit);
   while (!condition()) {
     if (Clock::now() >= end) return false;
     _state->wait(end);
@@ -335,7 +327,7 @@ bool RunLoop::runUntil(Clock::time_point deadline, const std::function<bool()>& 
 }
 
 void RunLoop::run() {
-  const bool wasStopped = std::exchange(_state->isStopped, false);
+  const auto wasStopped = std::exchange(_state->isStopped, false);
   runPass();
   while (!_state->isStopped) {
     _state->wait(Clock::time_point::max());

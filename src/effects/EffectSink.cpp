@@ -16,7 +16,7 @@ std::unique_lock<std::mutex> lockSoon(std::mutex& mutex) {
   std::unique_lock lock(mutex, std::try_to_lock);
   for (int attempt = 0; !lock && attempt < attempts; ++attempt) {
     std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    static_cast<void>(lock.try_lock());
+    (void)lock.try_lock();
   }
   return lock;
 }
@@ -34,50 +34,39 @@ void EffectSink::addChannel(EffectChannel& channel) {
 void EffectSink::changeBegins(const std::string& setting, const std::string& asked) {
   const std::scoped_lock lock(_mutex);
   _open.push_back({setting, asked});
-  for (EffectChannel* channel : _channels) channel->changeBegins(setting, asked);
+  for (auto* channel : _channels) channel->changeBegins(setting, asked);
 }
 
 void EffectSink::record(const Effect& effect) {
   const std::scoped_lock lock(_mutex);
-  const auto ended = [&effect](const OpenChange& open) { return open.setting == effect.setting; };
-  const auto open = std::ranges::find_if(_open, ended);
+  const auto open = std::ranges::find(_open, effect.setting, &OpenChange::setting);
   if (open != _open.end()) _open.erase(open);
-  for (EffectChannel* channel : _channels) channel->record(effect);
+  for (auto* channel : _channels) channel->record(effect);
 }
 
 void EffectSink::recordFailure(const std::string& setting, const Failure& failure,
                                const std::optional<std::string>& asked) {
-  Effect effect;
-  effect.setting = setting;
-  effect.outcome = Outcome::failed;
-  effect.asked = asked;
-  effect.failure = failure;
-  record(effect);
+  record({.setting = setting, .outcome = Outcome::failed, .asked = asked, .failure = failure});
 }
 
 void EffectSink::recordUnsupported(const std::string& setting, const Failure& reason) {
-  Effect effect;
-  effect.setting = setting;
-  effect.outcome = Outcome::notSupported;
-  effect.failure = reason;
-  record(effect);
+  record({.setting = setting, .outcome = Outcome::notSupported, .failure = reason});
 }
 
 void EffectSink::observe(const SettingValue& value) {
   const std::scoped_lock lock(_mutex);
-  for (EffectChannel* channel : _channels) channel->observe(value);
+  for (auto* channel : _channels) channel->observe(value);
 }
 
 void EffectSink::interrupt(const std::string& why) {
-  const std::unique_lock lock = lockSoon(_mutex);
+  const auto lock = lockSoon(_mutex);
   if (!lock) return;
-  for (const OpenChange& open : _open) {
-    Effect effect;
-    effect.setting = open.setting;
-    effect.outcome = Outcome::failed;
-    effect.asked = open.asked;
-    effect.failure = Failure{"change", open.setting, why};
-    for (EffectChannel* channel : _channels) channel->record(effect);
+  for (const auto& open : _open) {
+    const Effect effect{.setting = open.setting,
+                        .outcome = Outcome::failed,
+                        .asked = open.asked,
+                        .failure = Failure{"change", open.setting, why}};
+    for (auto* channel : _channels) channel->record(effect);
   }
   _open.clear();
 }

@@ -7,76 +7,50 @@
 #include <unistd.h>
 
 #include <cerrno>
-#include <charconv>
 #include <string_view>
-#include <system_error>
-#include <utility>
 
 #include "base/Json.h"
 #include "base/Process.h"
+#include "base/Text.h"
 
 namespace tavisk {
 namespace {
 
+constexpr const char* task = "write the report";
 constexpr std::string_view descriptorPrefix = "fd:";
 
-Failure failure(const std::string& destination, const std::string& why) {
-  return {"write the report", destination, why};
+/// A descriptor of our own for what "fd:N" names; that one stays open.
+Result<FileDescriptor> copyDescriptor(const std::string& destination) {
+  const auto number = parseNumber<int>(std::string_view(destination).substr(descriptorPrefix.size()));
+  const auto flags = number && *number >= 0 ? ::fcntl(*number, F_GETFL) : -1;
+  if (flags < 0 || (flags & O_ACCMODE) == O_RDONLY) return systemFailure(task, destination, EBADF);
+  FileDescriptor copy(::fcntl(*number, F_DUPFD_CLOEXEC, 0));
+  if (!copy) return systemFailure(task, destination, errno);
+  return copy;
 }
 
-/// Absent when the text is not "fd:" and a number.
-std::optional<int> namedDescriptor(std::string_view destination) {
-  const char* end = destination.data() + destination.size();
-  int descriptor = -1;
-  const auto [rest, error] = std::from_chars(destination.data() + descriptorPrefix.size(), end, descriptor);
-  return error == std::errc() && rest == end && descriptor >= 0 ? std::optional(descriptor) : std::nullopt;
-}
-
-Result<int> checkDescriptor(const std::string& destination) {
-  const std::optional<int> descriptor = namedDescriptor(destination);
-  const int flags = descriptor ? fcntl(*descriptor, F_GETFL) : -1;
-  if (flags < 0 || (flags & O_ACCMODE) == O_RDONLY) return failure(destination, std::generic_category().message(EBADF));
-  return *descriptor;
-}
-
-Result<int> openFile(const std::string& path) {
+Result<FileDescriptor> openFile(const std::string& path) {
   // O_NONBLOCK: opening a FIFO must not wait for its reader.
-  const int descriptor = ::open(
-      path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_NOFOLLOW | O_CLOEXEC | O_NOCTTY | O_NONBLOCK, S_IRUSR | S_IWUSR);
-  if (descriptor < 0) return failure(path, std::generic_category().message(errno));
+  FileDescriptor file(::open(
+      path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_NOFOLLOW | O_CLOEXEC | O_NOCTTY | O_NONBLOCK, S_IRUSR | S_IWUSR));
+  if (!file) return systemFailure(task, path, errno);
   struct stat status {};
-  if (fstat(descriptor, &status) == 0 && S_ISREG(status.st_mode)) return descriptor;
-  close(descriptor);
-  return failure(path, "not a regular file");
-}
-
-/// The errno of the failure, or 0.
-int writeAll(int descriptor, std::string_view text) {
-  while (!text.empty()) {
-    const ssize_t written = write(descriptor, text.data(), text.size());
-    if (written < 0 && errno != EINTR) return errno;
-    if (written > 0) text.remove_prefix(static_cast<std::size_t>(written));
-  }
-  return 0;
+  if (::fstat(file.number(), &status) == 0 && S_ISREG(status.st_mode)) return file;
+  return Failure{task, path, "not a regular file"};
 }
 
 std::string toArray(const std::vector<std::string>& elements) {
   std::string array = "[";
-  for (const std::string& element : elements) array += (array.size() > 1 ? "," : "") + element;
+  for (const auto& element : elements) array += (array.size() > 1 ? "," : "") + element;
   return array + "]";
 }
 
 }  // namespace
 
 Result<std::unique_ptr<Report>> Report::open(const std::string& destination) {
-  const bool named = destination.starts_with(descriptorPrefix);
-  const Result<int> descriptor = named ? checkDescriptor(destination) : openFile(destination);
-  if (!descriptor) return descriptor.failure();
-  return std::unique_ptr<Report>(new Report(*descriptor, !named));
-}
-
-Report::~Report() {
-  if (_owned) close(_descriptor);
+  auto file = destination.starts_with(descriptorPrefix) ? copyDescriptor(destination) : openFile(destination);
+  if (!file) return file.failure();
+  return std::unique_ptr<Report>(new Report(std::move(file).value()));
 }
 
 void Report::commandBegins(const std::string& command, std::span<const std::string> arguments,
@@ -88,25 +62,25 @@ void Report::commandBegins(const std::string& command, std::span<const std::stri
 }
 
 void Report::commandEnds(bool failed, const std::string& output) {
-  const Entry entry = takeEntry();
+  const auto entry = takeEntry();
   if (entry.command) append(entry, failed, output);
 }
 
 void Report::wordRefused(const std::string& word, bool failed, const std::string& output) {
-  Entry entry = takeEntry();
+  auto entry = takeEntry();
   entry.command = word;
   entry.error = "not a valid command";
   append(entry, failed, output);
 }
 
 void Report::runRefused(const std::string& error, const std::string& output) {
-  Entry entry = takeEntry();
+  auto entry = takeEntry();
   entry.error = error;
   append(entry, true, output);
 }
 
 void Report::runEndedBySignal(const std::string& signal, bool failed, const std::string& output) {
-  Entry entry = takeEntry();
+  auto entry = takeEntry();
   entry.signal = signal;
   append(entry, failed, output);
 }
@@ -148,8 +122,8 @@ std::string Report::toJson(const Entry& entry, bool failed, const std::string& o
 }
 
 void Report::append(const Entry& entry, bool failed, const std::string& output) const {
-  const int error = writeAll(_descriptor, toJson(entry, failed, output) + "\n");
-  if (error != 0) complain("report: " + std::generic_category().message(error));
+  const auto written = writeAll(_file, toJson(entry, failed, output) + "\n", "report");
+  if (!written) complain("report: " + written.failure().why);
 }
 
 }  // namespace tavisk

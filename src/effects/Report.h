@@ -7,8 +7,10 @@
 #include <optional>
 #include <span>
 #include <string>
+#include <utility>
 #include <vector>
 
+#include "base/FileDescriptor.h"
 #include "base/Result.h"
 #include "effects/EffectSink.h"
 
@@ -35,9 +37,6 @@ class Report final : public EffectChannel {
   /// `destination` is the path of a regular file, which is made (mode 0600) or appended to and must not be a link, or
   /// "fd:N" for a descriptor that is open for writing; that one is not closed.
   static Result<std::unique_ptr<Report>> open(const std::string& destination);
-  ~Report() override;
-  Report(const Report&) = delete;
-  Report& operator=(const Report&) = delete;
 
   /// From here to the end, effects and values belong to this command.
   void commandBegins(const std::string& command, std::span<const std::string> arguments, const std::string& handler);
@@ -60,13 +59,12 @@ class Report final : public EffectChannel {
     std::vector<std::string> effects;  ///< JSON
   };
 
-  Report(int descriptor, bool owned) : _descriptor(descriptor), _owned(owned) {}
+  explicit Report(FileDescriptor file) : _file(std::move(file)) {}
   static std::string toJson(const Entry& entry, bool failed, const std::string& output);
   Entry takeEntry();
   void append(const Entry& entry, bool failed, const std::string& output) const;
 
-  const int _descriptor;
-  const bool _owned;
+  const FileDescriptor _file;
   std::mutex _mutex;  // guards _entry
   Entry _entry;
 };

@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
+#include <compare>
 #include <string>
 
 namespace tavisk {
@@ -12,14 +14,17 @@ struct PowerSource {
 };
 
 struct Minutes {
-  unsigned long count;  ///< 0 is never
-  bool operator==(const Minutes&) const = default;
+  unsigned long count = 0;  ///< 0 is never
+
+  /// What is begun counts as a whole one, so that only no time at all is never; so is one below 0.
+  static Minutes covering(std::chrono::microseconds time);
+
+  bool isNever() const { return count == 0; }
+  std::chrono::minutes duration() const { return std::chrono::minutes(count); }
+  auto operator<=>(const Minutes&) const = default;
 };
 
-/// How effects and reports tell them.
-inline std::string textOf(const Minutes& minutes) {
-  return std::to_string(minutes.count);
-}
+std::string textOf(Minutes minutes);
 
 enum class SleepTimer { computer, display, hardDisk };
 

@@ -8,11 +8,10 @@
 #include <cerrno>
 #include <thread>
 
-#include "base/Result.h"
-
 namespace tavisk {
-
-using namespace std::chrono_literals;
+namespace {
+constexpr std::chrono::milliseconds betweenTries{1};
+}
 
 Result<FileDescriptor> lockFile(const SystemRoot& root, const std::string& path, std::chrono::milliseconds patience) {
   auto file = root.open(path, O_RDONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK, 0644);
@@ -21,7 +20,7 @@ Result<FileDescriptor> lockFile(const SystemRoot& root, const std::string& path,
   while (::flock(file->number(), LOCK_EX | LOCK_NB) != 0) {
     if (errno != EWOULDBLOCK && errno != EINTR) return systemFailure("lock", path, errno);
     if (std::chrono::steady_clock::now() > deadline) return Failure{"lock", path, "another run keeps it locked"};
-    std::this_thread::sleep_for(1ms);
+    std::this_thread::sleep_for(betweenTries);
   }
   return file;
 }

@@ -12,8 +12,6 @@
 #include <cerrno>
 #include <random>
 
-#include "base/FileDescriptor.h"
-#include "base/Result.h"
 #include "hosts/shared/OpenBeneath.h"
 
 namespace tavisk {
@@ -53,10 +51,10 @@ Failure FolderWriter::failure(const char* tried) const {
 
 Result<void> FolderWriter::writeFile(const std::string& name, std::string_view contents, unsigned modeWhenNew) {
   removeLeftovers();
-  auto temporary = makeTemporary();
+  const auto temporary = makeTemporary();
   if (!temporary) return temporary.failure();
-  if (auto filled = fill(*temporary, name, contents, modeWhenNew); !filled) return filled;
-  if (auto placed = putInPlace(*temporary, name, contents); !placed) return placed;
+  if (const auto filled = fill(*temporary, name, contents, modeWhenNew); !filled) return filled;
+  if (const auto placed = putInPlace(*temporary, name, contents); !placed) return placed;
   return syncFolder();
 }
 
@@ -64,11 +62,11 @@ Result<void> FolderWriter::writeLink(const std::string& name, const std::string&
   removeLeftovers();
   // A link cannot be locked: another run may take ours for a leftover, and then it is made again.
   for (int tries = 0; tries < enoughTries; ++tries) {
-    auto temporary = temporaryName();
+    const auto temporary = temporaryName();
     if (::symlinkat(target.c_str(), _folder.number(), temporary.c_str()) != 0) return failure("make link");
     if (::renameat(_folder.number(), temporary.c_str(), _folder.number(), name.c_str()) == 0) return syncFolder();
     if (errno == ENOENT) continue;
-    auto refused = failure("rename");
+    const auto refused = failure("rename");
     ::unlinkat(_folder.number(), temporary.c_str(), 0);
     return refused;
   }
@@ -82,7 +80,7 @@ Result<void> FolderWriter::remove(const std::string& name) {
 }
 
 void FolderWriter::removeLeftovers() {
-  auto names = namesIn(_folder, _path);
+  const auto names = namesIn(_folder, _path);
   if (!names) return;  // the write itself will tell
   for (const auto& name : *names) {
     if (name.starts_with(temporaryPrefix)) removeIfLeft(name);
@@ -90,31 +88,32 @@ void FolderWriter::removeLeftovers() {
 }
 
 void FolderWriter::removeIfLeft(const std::string& name) {
-  auto file = openNamed(_folder, name, O_RDONLY | O_NOFOLLOW | O_NONBLOCK);
-  bool link = !file && errno == ELOOP;
-  bool free = file && ::flock(file.number(), LOCK_EX | LOCK_NB) == 0;
-  if (link || free) ::unlinkat(_folder.number(), name.c_str(), 0);
+  const auto file = openNamed(_folder, name, O_RDONLY | O_NOFOLLOW | O_NONBLOCK);
+  const bool isLink = !file && file.failure().code == std::errc::too_many_symbolic_link_levels;
+  const bool isFree = file && ::flock(file->number(), LOCK_EX | LOCK_NB) == 0;
+  if (isLink || isFree) ::unlinkat(_folder.number(), name.c_str(), 0);
 }
 
 Result<FolderWriter::Temporary> FolderWriter::makeTemporary() {
   for (int tries = 0; tries < enoughTries; ++tries) {
-    auto name = temporaryName();
-    Temporary made(_folder, name, openNamed(_folder, name, O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, 0600));
-    if (!made.file && errno == EEXIST) continue;
-    if (!made.file) return failure("make temporary file beside");
+    const auto name = temporaryName();
+    auto opened = openNamed(_folder, name, O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, 0600);
+    if (!opened && opened.failure().code == std::errc::file_exists) continue;
+    if (!opened) return retold(opened.failure(), "make temporary file beside", _path);
+    Temporary made(_folder, name, std::move(opened).value());
     struct stat status {};
-    bool held = ::flock(made.file.number(), LOCK_EX | LOCK_NB) == 0;
-    if (!held && errno != EWOULDBLOCK) return failure("lock temporary file beside");
+    const bool isHeld = ::flock(made.file.number(), LOCK_EX | LOCK_NB) == 0;
+    if (!isHeld && errno != EWOULDBLOCK) return failure("lock temporary file beside");
     // Between the two calls another run may have taken it for a leftover.
-    if (held && ::fstat(made.file.number(), &status) == 0 && status.st_nlink > 0) return made;
+    if (isHeld && ::fstat(made.file.number(), &status) == 0 && status.st_nlink > 0) return made;
   }
   return Failure{"make temporary file beside", _path, "other runs keep removing it"};
 }
 
 Result<void> FolderWriter::fill(const Temporary& temporary, const std::string& name, std::string_view contents,
                                 unsigned modeWhenNew) {
-  if (auto taken = takeOver(temporary.file, name, modeWhenNew); !taken) return taken;
-  if (auto written = writeAll(temporary.file, contents, _path); !written) return written;
+  if (const auto taken = takeOver(temporary.file, name, modeWhenNew); !taken) return taken;
+  if (const auto written = writeAll(temporary.file, contents, _path); !written) return written;
   if (::fsync(temporary.file.number()) != 0) return failure("flush");
   return {};
 }
@@ -129,17 +128,17 @@ Result<void> FolderWriter::takeOver(const FileDescriptor& fresh, const std::stri
   if (!S_ISREG(old.st_mode)) return Failure{"write", _path, "not a regular file"};
   struct stat made {};
   if (::fstat(fresh.number(), &made) != 0) return failure("look at");
-  bool sameOwner = old.st_uid == made.st_uid && old.st_gid == made.st_gid;
-  if (!sameOwner && ::fchown(fresh.number(), old.st_uid, old.st_gid) != 0) return failure("keep owner of");
+  const bool hasSameOwner = old.st_uid == made.st_uid && old.st_gid == made.st_gid;
+  if (!hasSameOwner && ::fchown(fresh.number(), old.st_uid, old.st_gid) != 0) return failure("keep owner of");
   if (::fchmod(fresh.number(), old.st_mode & 07777U) != 0) return failure("keep mode of");
   return keepLabel(fresh, name);
 }
 
 Result<void> FolderWriter::keepLabel(const FileDescriptor& fresh, const std::string& name) {
-  auto old = openNamed(_folder, name, O_RDONLY | O_NOFOLLOW | O_NONBLOCK);
-  if (!old) return failure("look at");
+  const auto old = openNamed(_folder, name, O_RDONLY | O_NOFOLLOW | O_NONBLOCK);
+  if (!old) return retold(old.failure(), "look at", _path);
   std::array<char, 4096> label{};
-  auto size = ::fgetxattr(old.number(), labelAttribute, label.data(), label.size());
+  const auto size = ::fgetxattr(old->number(), labelAttribute, label.data(), label.size());
   if (size <= 0) return {};  // not labelled
   if (::fsetxattr(fresh.number(), labelAttribute, label.data(), static_cast<std::size_t>(size), 0) != 0)
     return failure("keep label of");
@@ -153,11 +152,11 @@ Result<void> FolderWriter::putInPlace(const Temporary& temporary, const std::str
 }
 
 Result<void> FolderWriter::rewrite(const std::string& name, std::string_view contents) {
-  auto file = openNamed(_folder, name, O_WRONLY | O_NOFOLLOW | O_NONBLOCK);
-  if (!file) return failure("open");
-  if (auto written = writeAll(file, contents, _path); !written) return written;
-  if (::ftruncate(file.number(), static_cast<off_t>(contents.size())) != 0) return failure("cut");
-  if (::fsync(file.number()) != 0) return failure("flush");
+  const auto file = openNamed(_folder, name, O_WRONLY | O_NOFOLLOW | O_NONBLOCK);
+  if (!file) return retold(file.failure(), "open", _path);
+  if (const auto written = writeAll(*file, contents, _path); !written) return written;
+  if (::ftruncate(file->number(), static_cast<off_t>(contents.size())) != 0) return failure("cut");
+  if (::fsync(file->number()) != 0) return failure("flush");
   return {};
 }
 

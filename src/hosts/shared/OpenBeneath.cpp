@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/shared/OpenBeneath.h"
 
 #include <dirent.h>
@@ -13,26 +12,34 @@
 #include <cerrno>
 #include <memory>
 
-#include "base/Result.h"
-
 namespace tavisk {
 namespace {
 
-FileDescriptor openHow(const FileDescriptor& root, const std::string& path, open_how how) {
+// The kernel answers EAGAIN when something was renamed or mounted while it resolved a "..".
+constexpr int enoughTries = 256;
+
+Failure openFailure(const std::string& path, int error) {
+  auto failure = systemFailure("open", path, error);
+  if (error != ENOSYS) return failure;
+  failure.tried = "openat2";
+  failure.why = "this kernel has no such call (Linux 5.6 or later is needed)";
+  return failure;
+}
+
+Result<FileDescriptor> openHow(const FileDescriptor& root, const std::string& path, open_how how) {
   how.flags |= O_CLOEXEC;
   how.resolve |= RESOLVE_IN_ROOT | RESOLVE_NO_MAGICLINKS;
-  // The kernel answers EAGAIN when something was renamed or mounted while it resolved a "..".
-  constexpr int enoughTries = 256;
   for (int tries = 0;; ++tries) {
-    auto number = static_cast<int>(::syscall(SYS_openat2, root.number(), path.c_str(), &how, sizeof how));
-    bool again = number < 0 && (errno == EINTR || errno == EAGAIN);
-    if (!again || tries == enoughTries) return FileDescriptor(number);
+    const auto number = static_cast<int>(::syscall(SYS_openat2, root.number(), path.c_str(), &how, sizeof how));
+    if (number >= 0) return FileDescriptor(number);
+    const bool isTriedAgain = (errno == EINTR || errno == EAGAIN) && tries < enoughTries;
+    if (!isTriedAgain) return openFailure(path, errno);
   }
 }
 
 }  // namespace
 
-FileDescriptor openBeneath(const FileDescriptor& root, const std::string& path, int flags, unsigned mode) {
+Result<FileDescriptor> openBeneath(const FileDescriptor& root, const std::string& path, int flags, unsigned mode) {
   open_how how{};
   how.flags = static_cast<unsigned>(flags);
   how.mode = mode;
@@ -46,23 +53,22 @@ bool existsWithoutLinks(const FileDescriptor& root, const std::string& path) {
   return static_cast<bool>(openHow(root, path, how));
 }
 
-FileDescriptor openNamed(const FileDescriptor& folder, const std::string& name, int flags, unsigned mode) {
-  int number;
-  do number = ::openat(folder.number(), name.c_str(), flags | O_CLOEXEC, mode);
-  while (number < 0 && errno == EINTR);
-  return FileDescriptor(number);
+Result<FileDescriptor> openNamed(const FileDescriptor& folder, const std::string& name, int flags, unsigned mode) {
+  while (true) {
+    const auto number = ::openat(folder.number(), name.c_str(), flags | O_CLOEXEC, mode);
+    if (number >= 0) return FileDescriptor(number);
+    if (errno != EINTR) return systemFailure("open", name, errno);
+  }
 }
 
 Result<std::vector<std::string>> namesIn(const FileDescriptor& folder, const std::string& path) {
-  int number = ::openat(folder.number(), ".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-  if (number < 0) return systemFailure("list", path, errno);
-  auto close = [](DIR* opened) { ::closedir(opened); };
-  std::unique_ptr<DIR, decltype(close)> stream(::fdopendir(number), close);
-  if (!stream) {
-    int error = errno;
-    ::close(number);
-    return systemFailure("list", path, error);
-  }
+  auto again = openNamed(folder, ".", O_RDONLY | O_DIRECTORY);
+  if (!again) return retold(again.failure(), "list", path);
+  auto listed = std::move(again).value();
+  const auto close = [](DIR* opened) { ::closedir(opened); };
+  const std::unique_ptr<DIR, decltype(close)> stream(::fdopendir(listed.number()), close);
+  if (!stream) return systemFailure("list", path, errno);
+  (void)listed.release();  // the stream closes it
   std::vector<std::string> names;
   errno = 0;
   while (const dirent* entry = ::readdir(stream.get())) {

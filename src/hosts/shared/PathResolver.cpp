@@ -11,7 +11,6 @@
 #include <cerrno>
 #include <climits>
 
-#include "base/Result.h"
 #include "base/Text.h"
 #include "hosts/shared/OpenBeneath.h"
 
@@ -30,22 +29,22 @@ bool isLink(const FileDescriptor& file) {
 Result<std::string> targetOf(const FileDescriptor& link, const std::string& path) {
   if (!isLink(link)) return Failure{"read link", path, "not a symbolic link"};
   std::array<char, PATH_MAX> target{};
-  auto length = ::readlinkat(link.number(), "", target.data(), target.size());
+  const auto length = ::readlinkat(link.number(), "", target.data(), target.size());
   if (length < 0) return systemFailure("read link", path, errno);
   return std::string(target.data(), static_cast<std::size_t>(length));
 }
 
 Result<std::string> PathResolver::resolve(const std::string& path) {
   _path = path;
-  _folder = openBeneath(_root, ".", O_PATH | O_DIRECTORY);
+  reopenFolder();
   push(path);
   while (!_pending.empty()) {
-    auto name = std::move(_pending.back());
+    const auto name = std::move(_pending.back());
     _pending.pop_back();
     if (name == ".") continue;
     if (name == "..") {
       leave();
-    } else if (auto entered = enter(name); !entered) {
+    } else if (const auto entered = enter(name); !entered) {
       return entered.failure();
     }
   }
@@ -53,14 +52,18 @@ Result<std::string> PathResolver::resolve(const std::string& path) {
 }
 
 void PathResolver::push(const std::string& path) {
-  auto names = split(path, "/");
+  const auto names = split(path, "/");
   _pending.insert(_pending.end(), names.rbegin(), names.rend());
 }
 
 Result<void> PathResolver::enter(const std::string& name) {
-  FileDescriptor file = _folder ? openNamed(_folder, name, O_PATH | O_NOFOLLOW) : FileDescriptor();
-  if (_folder && !file && errno != ENOENT && errno != ENOTDIR) return systemFailure("resolve", _path, errno);
-  if (file && isLink(file)) return follow(file);
+  FileDescriptor file;
+  if (_folder) {
+    auto opened = openNamed(_folder, name, O_PATH | O_NOFOLLOW);
+    if (!opened && !isAbsent(opened.failure())) return retold(opened.failure(), "resolve", _path);
+    if (opened && isLink(*opened)) return follow(*opened);
+    if (opened) file = std::move(opened).value();
+  }
   _resolved.push_back(name);
   _folder = std::move(file);
   return {};
@@ -68,11 +71,11 @@ Result<void> PathResolver::enter(const std::string& name) {
 
 Result<void> PathResolver::follow(const FileDescriptor& link) {
   if (++_links > mostLinks) return systemFailure("resolve", _path, ELOOP);
-  auto target = targetOf(link, _path);
+  const auto target = targetOf(link, _path);
   if (!target) return target.failure();
   if (target->starts_with('/')) {
     _resolved.clear();
-    _folder = openBeneath(_root, ".", O_PATH | O_DIRECTORY);
+    reopenFolder();
   }
   push(*target);
   return {};
@@ -80,7 +83,12 @@ Result<void> PathResolver::follow(const FileDescriptor& link) {
 
 void PathResolver::leave() {
   if (!_resolved.empty()) _resolved.pop_back();
-  _folder = openBeneath(_root, resolved(), O_PATH);
+  reopenFolder();
+}
+
+void PathResolver::reopenFolder() {
+  auto opened = openBeneath(_root, resolved(), O_PATH);
+  _folder = opened ? std::move(opened).value() : FileDescriptor();
 }
 
 std::string PathResolver::resolved() const {

@@ -22,6 +22,7 @@ class PathResolver {
   Result<void> enter(const std::string& name);
   Result<void> follow(const FileDescriptor& link);
   void leave();
+  void reopenFolder();
   std::string resolved() const;
 
   const FileDescriptor& _root;

@@ -10,36 +10,39 @@ namespace {
 constexpr const char* damagedSuffix = ".damaged";
 
 Result<PropertyList::Dictionary> parseDictionary(const std::string& text, const std::string& path) {
-  Result<PropertyList> parsed = parsePropertyList(text, ownFileLimits);
-  if (!parsed) return Failure{parsed.failure().tried, path, parsed.failure().why};
-  PropertyList value = std::move(parsed).value();
-  if (PropertyList::Dictionary* dictionary = value.asDictionary()) return std::move(*dictionary);
+  auto parsed = parsePropertyList(text, ownFileLimits);
+  if (!parsed) return retold(parsed.failure(), parsed.failure().tried, path);
+  auto value = std::move(parsed).value();
+  if (auto* dictionary = value.asDictionary()) return std::move(*dictionary);
   return Failure{"read property list", path, "a dictionary is expected"};
 }
 
 }  // namespace
 
 Result<std::optional<PropertyList::Dictionary>> PropertyListFile::read() const {
-  if (!_root.exists(_path)) return std::optional<PropertyList::Dictionary>();
-  const Result<std::string> text = _root.read(_path, ownFileLimits.bytes);
-  if (!text) return text.failure();
-  Result<PropertyList::Dictionary> dictionary = parseDictionary(*text, _path);
-  if (!dictionary) return dictionary.failure();
-  return std::optional(std::move(dictionary).value());
+  const auto found = text();
+  if (!found) return found.failure();
+  if (!*found) return std::nullopt;
+  return parseDictionary(**found, _path);
 }
 
 Result<void> PropertyListFile::write(const PropertyList::Dictionary& contents) const {
-  const Result<std::string> text = writePropertyList(contents);
-  if (!text) return Failure{text.failure().tried, _path, text.failure().why};
-  if (Result<void> kept = keepDamaged(); !kept) return kept;
-  return _root.write(_path, *text);
+  const auto written = writePropertyList(contents);
+  if (!written) return retold(written.failure(), written.failure().tried, _path);
+  if (const auto kept = keepDamaged(); !kept) return kept;
+  return _root.write(_path, *written);
 }
 
 Result<void> PropertyListFile::keepDamaged() const {
-  if (!_root.exists(_path)) return {};
-  const Result<std::string> text = _root.read(_path, ownFileLimits.bytes);
-  if (!text) return text.failure();
-  return parseDictionary(*text, _path) ? Result<void>() : _root.write(_path + damagedSuffix, *text);
+  const auto old = text();
+  if (!old) return old.failure();
+  if (!*old || parseDictionary(**old, _path)) return {};
+  return _root.write(_path + damagedSuffix, **old);
+}
+
+Result<std::optional<std::string>> PropertyListFile::text() const {
+  if (!_root.exists(_path)) return std::nullopt;
+  return _root.read(_path, ownFileLimits.bytes);
 }
 
 }  // namespace tavisk

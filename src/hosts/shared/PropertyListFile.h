@@ -25,6 +25,8 @@ class PropertyListFile {
   Result<void> write(const PropertyList::Dictionary& contents) const;
 
  private:
+  /// Absent when there is no file.
+  Result<std::optional<std::string>> text() const;
   Result<void> keepDamaged() const;
 
   const SystemRoot& _root;

@@ -8,8 +8,6 @@
 
 #include <cerrno>
 
-#include "base/FileDescriptor.h"
-#include "base/Result.h"
 #include "base/Text.h"
 #include "hosts/shared/FolderWriter.h"
 #include "hosts/shared/OpenBeneath.h"
@@ -19,11 +17,6 @@ namespace tavisk {
 namespace {
 
 constexpr unsigned folderMode = 0755;
-
-Failure openFailure(const std::string& path, int error) {
-  if (error == ENOSYS) return Failure{"openat2", path, "this kernel has no such call (Linux 5.6 or later is needed)"};
-  return systemFailure("open", path, error);
-}
 
 std::optional<Failure> whyUnusable(const std::string& path) {
   if (!path.starts_with('/')) return Failure{"open", path, "not an absolute path"};
@@ -53,9 +46,9 @@ struct Place {
 };
 
 Result<Place> placeOf(const std::string& path) {
-  auto end = path.find_last_not_of('/');
+  const auto end = path.find_last_not_of('/');
   if (end == std::string::npos) return systemFailure("write", path, EISDIR);
-  auto start = path.rfind('/', end) + 1;
+  const auto start = path.rfind('/', end) + 1;
   Place place{path.substr(0, start), path.substr(start, end + 1 - start)};
   if (place.name == "." || place.name == "..") return systemFailure("write", path, EISDIR);
   return place;
@@ -64,12 +57,15 @@ Result<Place> placeOf(const std::string& path) {
 /// The folder of that name, made when it is missing, and its entry on the disk.
 Result<FileDescriptor> makeNamedFolder(const FileDescriptor& parent, const std::string& name, const std::string& path) {
   constexpr int flags = O_RDONLY | O_DIRECTORY | O_NOFOLLOW;
-  if (auto present = openNamed(parent, name, flags)) return present;
-  if (errno != ENOENT) return systemFailure("make folder", path, errno);
+  auto present = openNamed(parent, name, flags);
+  if (present) return present;
+  if (present.failure().code != std::errc::no_such_file_or_directory)
+    return retold(present.failure(), "make folder", path);
   if (::mkdirat(parent.number(), name.c_str(), folderMode) != 0 && errno != EEXIST)
     return systemFailure("make folder", path, errno);
   auto made = openNamed(parent, name, flags);
-  if (!made || ::fchmod(made.number(), folderMode) != 0 || ::fsync(parent.number()) != 0)
+  if (!made) return retold(made.failure(), "make folder", path);
+  if (::fchmod(made->number(), folderMode) != 0 || ::fsync(parent.number()) != 0)
     return systemFailure("make folder", path, errno);
   return made;
 }
@@ -77,18 +73,16 @@ Result<FileDescriptor> makeNamedFolder(const FileDescriptor& parent, const std::
 }  // namespace
 
 Result<FileDescriptor> SystemRoot::openPrefix(const std::string& path) const {
-  if (auto failure = whyUnusable(path)) return *failure;
-  FileDescriptor prefix(::open(_prefix.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC));
-  if (!prefix) return openFailure(path, errno);
-  return prefix;
+  if (const auto failure = whyUnusable(path)) return *failure;
+  const auto number = ::open(_prefix.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC);
+  if (number < 0) return systemFailure("open", path, errno);
+  return FileDescriptor(number);
 }
 
 Result<FileDescriptor> SystemRoot::open(const std::string& path, int flags, unsigned mode) const {
-  auto prefix = openPrefix(path);
+  const auto prefix = openPrefix(path);
   if (!prefix) return prefix.failure();
-  auto file = openBeneath(*prefix, path, flags, mode);
-  if (!file) return openFailure(path, errno);
-  return file;
+  return openBeneath(*prefix, path, flags, mode);
 }
 
 bool SystemRoot::exists(const std::string& path) const {
@@ -99,7 +93,7 @@ std::optional<FileStamp> SystemRoot::stamp(const std::string& path) const {
   struct stat status {};
   if (::lstat((_prefix + path).c_str(), &status) != 0) return std::nullopt;
   if (S_ISLNK(status.st_mode)) {
-    auto target = open(path, O_PATH);
+    const auto target = open(path, O_PATH);
     if (!target || ::fstat(target->number(), &status) != 0) return std::nullopt;
   }
   return FileStamp{status.st_dev, status.st_ino, status.st_size, nanoseconds(status.st_mtim),
@@ -108,41 +102,41 @@ std::optional<FileStamp> SystemRoot::stamp(const std::string& path) const {
 
 Result<std::string> SystemRoot::read(const std::string& path, std::size_t limit) const {
   struct stat status {};
-  auto regular = [&](const FileDescriptor& file) {
+  const auto isRegular = [&](const FileDescriptor& file) {
     return ::fstat(file.number(), &status) == 0 && S_ISREG(status.st_mode);
   };
-  auto seen = open(path, O_PATH);
+  const auto seen = open(path, O_PATH);
   if (!seen) return seen.failure();
   // Only looked at so far: to open a device may already do something.
-  if (!regular(*seen)) return Failure{"read", path, "not a regular file"};
-  auto file = open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
+  if (!isRegular(*seen)) return Failure{"read", path, "not a regular file"};
+  const auto file = open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
   if (!file) return file.failure();
-  if (!regular(*file)) return Failure{"read", path, "not a regular file"};
+  if (!isRegular(*file)) return Failure{"read", path, "not a regular file"};
   return readAll(*file, limit, path);
 }
 
 Result<std::string> SystemRoot::readLink(const std::string& path) const {
-  auto link = open(path, O_PATH | O_NOFOLLOW);
+  const auto link = open(path, O_PATH | O_NOFOLLOW);
   if (!link) return link.failure();
   return targetOf(*link, path);
 }
 
 Result<std::vector<std::string>> SystemRoot::list(const std::string& path) const {
-  auto folder = open(path, O_RDONLY | O_DIRECTORY);
+  const auto folder = open(path, O_RDONLY | O_DIRECTORY);
   if (!folder) return folder.failure();
   return namesIn(*folder, path);
 }
 
 Result<std::string> SystemRoot::standardized(const std::string& path) const {
-  auto prefix = openPrefix(path);
+  const auto prefix = openPrefix(path);
   if (!prefix) return prefix.failure();
   if (auto plain = plainPath(*prefix, path)) return std::move(*plain);
   return PathResolver(*prefix).resolve(path);
 }
 
 Result<FileDescriptor> SystemRoot::makeFolder(const std::string& path) const {
-  if (auto made = makePrefix(path); !made) return made.failure();
-  auto resolved = standardized(path);
+  if (const auto made = makePrefix(path); !made) return made.failure();
+  const auto resolved = standardized(path);
   if (!resolved) return resolved.failure();
   auto folder = open("/", O_RDONLY | O_DIRECTORY);
   for (const auto& name : split(*resolved, "/")) {
@@ -152,48 +146,48 @@ Result<FileDescriptor> SystemRoot::makeFolder(const std::string& path) const {
 }
 
 Result<void> SystemRoot::makePrefix(const std::string& path) const {
-  if (::mkdir(_prefix.c_str(), folderMode) == 0) {
-    FileDescriptor parent(::open((_prefix + "/..").c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
-    if (parent && ::fsync(parent.number()) == 0) return {};
-  }
-  if (errno == EEXIST) return {};
+  const bool isMade = ::mkdir(_prefix.c_str(), folderMode) == 0;
+  if (!isMade && errno == EEXIST) return {};
+  if (!isMade) return systemFailure("make folder", path, errno);
+  const FileDescriptor parent(::open((_prefix + "/..").c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+  if (parent && ::fsync(parent.number()) == 0) return {};
   return systemFailure("make folder", path, errno);
 }
 
 Result<void> SystemRoot::makeFolders(const std::string& path) const {
-  auto folder = makeFolder(path);
+  const auto folder = makeFolder(path);
   if (!folder) return folder.failure();
   return {};
 }
 
 Result<void> SystemRoot::write(const std::string& path, std::string_view contents, unsigned modeWhenNew) const {
-  if (auto made = makePrefix(path); !made) return made;
-  auto resolved = standardized(path);
+  if (const auto made = makePrefix(path); !made) return made;
+  const auto resolved = standardized(path);
   if (!resolved) return resolved.failure();
-  auto place = placeOf(*resolved);
+  const auto place = placeOf(*resolved);
   if (!place) return place.failure();
-  auto folder = makeFolder(place->folder);
+  const auto folder = makeFolder(place->folder);
   if (!folder) return folder.failure();
   return FolderWriter(*folder, path).writeFile(place->name, contents, modeWhenNew);
 }
 
 Result<void> SystemRoot::writeLink(const std::string& path, const std::string& target) const {
-  auto place = placeOf(path);
+  const auto place = placeOf(path);
   if (!place) return place.failure();
-  auto folder = makeFolder(place->folder);
+  const auto folder = makeFolder(place->folder);
   if (!folder) return folder.failure();
   return FolderWriter(*folder, path).writeLink(place->name, target);
 }
 
 Result<void> SystemRoot::remove(const std::string& path) const {
-  auto place = placeOf(path);
+  const auto place = placeOf(path);
   if (!place) return place.failure();
-  auto prefix = openPrefix(path);
+  const auto prefix = openPrefix(path);
   if (!prefix) return prefix.failure();
-  auto folder = openBeneath(*prefix, place->folder, O_RDONLY | O_DIRECTORY);
-  if (folder) return FolderWriter(folder, path).remove(place->name);
-  if (errno == ENOENT || errno == ENOTDIR) return {};
-  return openFailure(path, errno);
+  const auto folder = openBeneath(*prefix, place->folder, O_RDONLY | O_DIRECTORY);
+  if (folder) return FolderWriter(*folder, path).remove(place->name);
+  if (isAbsent(folder.failure())) return {};
+  return retold(folder.failure(), folder.failure().tried, path);
 }
 
 }  // namespace tavisk

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/access/LinuxAuthorization.h"
 
 #include <grp.h>
@@ -10,14 +9,12 @@
 #include <utility>
 
 #include "effects/SettingNames.h"
-#include "hosts/linux/access/Polkit.h"
 
 namespace tavisk {
 namespace {
 
 // Groups with many thousands of members exist; beyond this the answer is not believed.
 constexpr std::size_t largestGroupEntry = std::size_t{64} << 20U;
-
 constexpr const char* action = "org.tavisk.manage";
 
 }  // namespace
@@ -28,7 +25,7 @@ UserId LinuxUserDatabase::realUserId() {
 
 std::optional<std::vector<GroupId>> LinuxUserDatabase::supplementaryGroups(std::size_t room) {
   std::vector<GroupId> groups(room);
-  int count = ::getgroups(static_cast<int>(room), groups.data());
+  const int count = ::getgroups(static_cast<int>(room), groups.data());
   if (count < 0 || static_cast<std::size_t>(count) > room) return std::nullopt;
   groups.resize(static_cast<std::size_t>(count));
   return groups;
@@ -47,42 +44,37 @@ std::optional<GroupId> LinuxUserDatabase::groupNamed(const std::string& name) {
 }
 
 void LinuxAdminAuthenticator::authenticate() {
-  auto authorized = ::getuid() == 0 ? Result<void>() : authorize();
-  _authenticated = static_cast<bool>(authorized);
-  if (!authorized) recordRefusal(authorized.failure());
+  const auto authorized = ::getuid() == 0 ? Result<void>() : authorize();
+  _isAuthenticated = static_cast<bool>(authorized);
+  if (!authorized) _machine.effects.recordFailure(setting::authorization, authorized.failure());
 }
 
 Result<void> LinuxAdminAuthenticator::authorize() {
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return {};  // without a bus there is no polkit
   if ((*bus)->isInteractive()) _agent.emplace(_machine.root, _machine.runLoop);
-  auto answer = checkAuthorization(**bus, action);
+  const auto answer = checkAuthorization(**bus, action);
   if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return {};
   if (!answer) return answer.failure();
   const std::scoped_lock lock(_mutex);
   _temporaryId = answer->temporaryId;
-  if (!answer->granted) return Failure{"authorize", action, "polkit does not grant it to this user"};
+  if (!answer->isGranted) return Failure{"authorize", action, "polkit does not grant it to this user"};
   return {};
-}
-
-void LinuxAdminAuthenticator::recordRefusal(const Failure& failure) {
-  Effect effect;
-  effect.setting = setting::authorization;
-  effect.outcome = Outcome::failed;
-  effect.failure = failure;
-  _machine.effects.record(effect);
 }
 
 /// Over a connection of its own: the main thread may be in the middle of a call on the usual one. What cannot be given
 /// back ends with the process.
 void LinuxAdminAuthenticator::deauthenticate() {
-  _authenticated = false;
-  std::unique_lock lock(_mutex);
-  const auto id = std::exchange(_temporaryId, {});
-  lock.unlock();
+  _isAuthenticated = false;
+  const auto id = takeTemporaryId();
   if (id.empty()) return;
-  auto bus = _machine.services.openSystemBus();
+  const auto bus = _machine.services.openSystemBus();
   if (bus) static_cast<void>(revokeAuthorization(**bus, id));
+}
+
+std::string LinuxAdminAuthenticator::takeTemporaryId() {
+  const std::scoped_lock lock(_mutex);
+  return std::exchange(_temporaryId, {});
 }
 
 }  // namespace tavisk

@@ -27,15 +27,15 @@ class LinuxAdminAuthenticator final : public AdminAuthenticator {
   explicit LinuxAdminAuthenticator(const LinuxMachine& machine) : _machine(machine) {}
 
   void authenticate() override;
-  bool isAuthenticated() override { return _authenticated; }
+  bool isAuthenticated() override { return _isAuthenticated; }
   void deauthenticate() override;
 
  private:
   Result<void> authorize();
-  void recordRefusal(const Failure& failure);
+  std::string takeTemporaryId();
 
   LinuxMachine _machine;
-  std::atomic<bool> _authenticated = false;
+  std::atomic<bool> _isAuthenticated = false;
   std::optional<PolkitAgent> _agent;
   std::mutex _mutex;
   std::string _temporaryId;  ///< guarded by the mutex

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/access/LinuxRemoteAccess.h"
 
 #include <algorithm>
@@ -8,17 +7,20 @@
 #include "base/Text.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/services/ServicesConfig.h"
-#include "hosts/linux/system/OnOff.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
 namespace {
 
+constexpr const char* serverProgram = "/usr/sbin/sshd";
+constexpr const char* serverFolder = "/etc/ssh";
 constexpr const char* serverConfig = "/etc/ssh/sshd_config";
 constexpr std::size_t configLimit = std::size_t{1} << 20U;
 // The sessions of the server are processes of the same name: its own is in the file.
 constexpr const char* serverProcess = "/run/sshd.pid";
+constexpr const char* keyMaker = "/usr/bin/ssh-keygen";
 
 std::vector<Daemon> openSshUnits() {
   return {{"ssh.service", "ssh", "sshd", serverProcess},
@@ -29,7 +31,7 @@ std::vector<Daemon> openSshUnits() {
 
 bool hasHostKey(const SystemRoot& root) {
   const auto isKey = [](const std::string& name) { return name.starts_with("ssh_host_") && name.ends_with("_key"); };
-  return std::ranges::any_of(root.list("/etc/ssh").valueOr({}), isKey);
+  return std::ranges::any_of(root.list(serverFolder).valueOr({}), isKey);
 }
 
 /// Whether the administrator keeps the keys elsewhere (sshd_config(5)).
@@ -38,7 +40,7 @@ bool namesHostKeys(const SystemRoot& root) {
     const auto words = split(line, " \t\r=\"");
     return !words.empty() && lowerCased(words.front()) == "hostkey";
   };
-  return std::ranges::any_of(split(root.read(serverConfig, configLimit).valueOr(""), "\n"), names);
+  return std::ranges::any_of(configurationLines(root.read(serverConfig, configLimit).valueOr("")), names);
 }
 
 }  // namespace
@@ -80,28 +82,30 @@ Result<bool> LinuxRemoteShellService::isOnInAnyWay() {
 }
 
 bool LinuxRemoteShellService::isEnabled() {
-  Setting<std::string> setting;
+  Setting<bool> setting;
   setting.name = setting::remoteLogin;
-  setting.live = [this] { return asOnOff(isOnInAnyWay()); };
-  return observe(setting, _machine.effects) == onOff(true);
+  setting.live = [this] { return isOnInAnyWay(); };
+  return observe(setting, _machine.effects).value_or(false);
 }
 
 void LinuxRemoteShellService::setEnabled(bool enabled) {
-  const auto anyOf = [this](Result<std::vector<Daemon>> (DaemonGroup::*those)() const) {
-    return asOnOff(withServer<bool>([those](const DaemonGroup& server) -> Result<bool> {
-      const auto found = (server.*those)();
-      return found ? Result<bool>(!found->empty()) : found.failure();
-    }));
-  };
-  Setting<std::string> setting;
+  Setting<bool> setting;
   setting.name = setting::remoteLogin;
+  setting.note = [](bool on) { return on ? "" : "open sessions stay open"; };
   setting.supported = [this] { return whyNotSupported(); };
-  setting.live = [&] { return anyOf(&DaemonGroup::running); };
-  setting.stored = [&] { return anyOf(&DaemonGroup::startingAtBoot); };
-  setting.store = [&](const std::string&) { return store(enabled); };
-  setting.apply = [&](const std::string&) { return apply(enabled); };
-  if (!enabled) setting.note = saying("open sessions stay open");
-  carryOut(setting, onOff(enabled), _machine.effects, _machine.runLoop);
+  setting.live = [this] { return hasAny(&DaemonGroup::running); };
+  setting.stored = [this] { return hasAny(&DaemonGroup::startingAtBoot); };
+  setting.store = [this](bool on) { return store(on); };
+  setting.apply = [this](bool on) { return apply(on); };
+  carryOut(setting, enabled, _machine.effects, _machine.runLoop);
+}
+
+Result<bool> LinuxRemoteShellService::hasAny(Result<std::vector<Daemon>> (DaemonGroup::*those)() const) {
+  return withServer<bool>([those](const DaemonGroup& server) -> Result<bool> {
+    const auto found = (server.*those)();
+    if (!found) return found.failure();
+    return !found->empty();
+  });
 }
 
 Result<void> LinuxRemoteShellService::store(bool enabled) {
@@ -129,14 +133,14 @@ Result<void> LinuxRemoteShellService::apply(bool enabled) {
 }
 
 Result<void> LinuxRemoteShellService::ensureHostKeys() {
-  const bool isOtherServer = !_machine.root.exists("/usr/sbin/sshd");
+  constexpr const char* tried = "make host keys";
+  const bool isOtherServer = !_machine.root.exists(serverProgram);
   if (isOtherServer || hasHostKey(_machine.root) || namesHostKeys(_machine.root)) return {};
-  constexpr const char* maker = "/usr/bin/ssh-keygen";
-  if (auto failure = whyNeedsRoot("make host keys", "/etc/ssh")) return *failure;
-  const auto made = runProgram(_machine.root, {maker, "-A"}, _machine.runLoop);
+  if (auto failure = whyNeedsRoot(tried, serverFolder)) return *failure;
+  const auto made = runProgram(_machine.root, {keyMaker, "-A"}, _machine.runLoop);
   if (!made) return made.failure();
   if (hasHostKey(_machine.root)) return {};
-  return Failure{"make host keys", maker, "it reported success, but there is no key in /etc/ssh"};
+  return Failure{tried, keyMaker, "it reported success, but there is no key in /etc/ssh"};
 }
 
 Result<DaemonGroup> LinuxRemoteEventsService::units() {
@@ -154,13 +158,14 @@ std::optional<Failure> LinuxRemoteEventsService::whyNotSupported() {
   return Failure{"find units", named->names(), "not all of them are installed"};
 }
 
-Result<std::optional<std::string>> LinuxRemoteEventsService::live() {
+Setting<bool>::Found LinuxRemoteEventsService::live() {
   const auto named = units();
   if (!named) return named.failure();
   const auto running = named->running();
   if (!running) return running.failure();
-  if (!running->empty() && running->size() < named->members().size()) return std::optional<std::string>("partly on");
-  return asOnOff(!running->empty());
+  if (running->empty()) return false;
+  const bool isPart = running->size() < named->members().size();
+  return Reading<bool>(true, isPart ? "partly on" : "");
 }
 
 /// That of the first unit: a service that its socket starts is never enabled itself.
@@ -172,7 +177,7 @@ Result<bool> LinuxRemoteEventsService::startsAtBoot() {
 }
 
 Result<bool> LinuxRemoteEventsService::isOnInAnyWay() {
-  auto starts = startsAtBoot();
+  const auto starts = startsAtBoot();
   if (!starts || *starts) return starts;
   const auto named = units();
   if (!named) return named.failure();
@@ -181,28 +186,28 @@ Result<bool> LinuxRemoteEventsService::isOnInAnyWay() {
 }
 
 bool LinuxRemoteEventsService::isEnabled() {
-  Setting<std::string> setting;
+  Setting<bool> setting;
   setting.name = setting::remoteEvents;
-  setting.live = [this] { return asOnOff(isOnInAnyWay()); };
-  return observe(setting, _machine.effects) == onOff(true);
+  setting.live = [this] { return isOnInAnyWay(); };
+  return observe(setting, _machine.effects).value_or(false);
 }
 
 void LinuxRemoteEventsService::setEnabled(bool enabled) {
-  Setting<std::string> setting;
+  Setting<bool> setting;
   setting.name = setting::remoteEvents;
   setting.supported = [this] { return whyNotSupported(); };
   setting.live = [this] { return live(); };
-  setting.stored = [this] { return asOnOff(startsAtBoot()); };
-  setting.store = [&](const std::string&) {
+  setting.stored = [this] { return startsAtBoot(); };
+  setting.store = [this](bool on) {
     const auto named = units();
-    return named ? named->setAllStartAtBoot(enabled) : named.failure();
+    return named ? named->setAllStartAtBoot(on) : named.failure();
   };
-  setting.apply = [&](const std::string&) -> Result<void> {
+  setting.apply = [this](bool on) -> Result<void> {
     const auto named = units();
     if (!named) return named.failure();
-    return enabled ? named->startAll() : named->stopAll();
+    return on ? named->startAll() : named->stopAll();
   };
-  carryOut(setting, onOff(enabled), _machine.effects, _machine.runLoop);
+  carryOut(setting, enabled, _machine.effects, _machine.runLoop);
 }
 
 }  // namespace tavisk

@@ -2,7 +2,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <string>
+#include <optional>
+#include <vector>
 
 #include "hosts/linux/services/Daemons.h"
 #include "hosts/linux/services/LinuxMachine.h"
@@ -27,6 +28,7 @@ class LinuxRemoteShellService final : public RemoteShellService {
   template <typename Answer, typename Use>
   Result<Answer> withServer(Use use);
   std::optional<Failure> whyNotSupported();
+  Result<bool> hasAny(Result<std::vector<Daemon>> (DaemonGroup::*those)() const);
   Result<bool> isOnInAnyWay();
   Result<void> store(bool enabled);
   Result<void> apply(bool enabled);
@@ -49,7 +51,7 @@ class LinuxRemoteEventsService final : public RemoteEventsService {
   Result<DaemonGroup> units();
   std::optional<Failure> whyNotSupported();
   /// "partly on" when some run.
-  Result<std::optional<std::string>> live();
+  Setting<bool>::Found live();
   Result<bool> startsAtBoot();
   Result<bool> isOnInAnyWay();
 

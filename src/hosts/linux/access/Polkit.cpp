@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/access/Polkit.h"
 
 #include <fcntl.h>
@@ -8,10 +7,14 @@
 
 #include <array>
 #include <chrono>
+#include <utility>
+
+#include "base/FileDescriptor.h"
 
 namespace tavisk {
 namespace {
 
+constexpr std::chrono::seconds longestStart{3};
 constexpr std::uint32_t allowUserInteraction = 1;
 constexpr const char* temporaryIdKey = "polkit.temporary_authorization_id";
 
@@ -39,8 +42,8 @@ std::string detail(BusMessage& details, const std::string& key) {
   std::string found;
   if (!details.enter('a', "{ss}")) return found;
   while (details.enter('e', "ss")) {
-    auto name = details.readText();
-    auto value = details.readText();
+    const auto name = details.readText();
+    const auto value = details.readText();
     if (name == key) found = value;
     details.exit();
   }
@@ -48,12 +51,10 @@ std::string detail(BusMessage& details, const std::string& key) {
   return found;
 }
 
-constexpr std::chrono::seconds longestStart{3};
-
 }  // namespace
 
 Result<Authorization> checkAuthorization(Bus& bus, const char* action) {
-  auto arguments = [&](BusMessage& message) {
+  const Bus::Writer arguments = [&](BusMessage& message) {
     writeSubject(message, bus.uniqueName());
     message.write(action);
     message.open('a', "{ss}");
@@ -61,17 +62,17 @@ Result<Authorization> checkAuthorization(Bus& bus, const char* action) {
     message.write(bus.isInteractive() ? allowUserInteraction : 0U);
     message.write("");
   };
-  auto reply = bus.call(authority(), "CheckAuthorization", "(bba{ss})", Bus::Writer(arguments));
+  auto reply = bus.call(authority(), "CheckAuthorization", "(bba{ss})", arguments);
   if (!reply) return reply.failure();
   auto answer = std::move(reply).value();
   answer.enter('r', "bba{ss}");
-  const bool granted = answer.readBoolean();
+  const bool isGranted = answer.readBoolean();
   answer.readBoolean();
-  return Authorization{granted, detail(answer, temporaryIdKey)};
+  return Authorization{isGranted, detail(answer, temporaryIdKey)};
 }
 
 Result<void> revokeAuthorization(Bus& bus, const std::string& temporaryId) {
-  auto reply = bus.query(authority(), "RevokeTemporaryAuthorizationById", "", temporaryId);
+  const auto reply = bus.query(authority(), "RevokeTemporaryAuthorizationById", "", temporaryId);
   if (!reply) return reply.failure();
   return {};
 }
@@ -87,9 +88,9 @@ PolkitAgent::PolkitAgent(const SystemRoot& root, RunLoop& runLoop) {
   _agent = std::move(started).value();
   agentEnd = FileDescriptor();
   // It closes its end when it is ready.
-  bool ready = false;
-  auto watching = runLoop.watch(readyEnd.number(), RunLoop::Readiness::readable, [&ready] { ready = true; });
-  static_cast<void>(runLoop.runUntil(RunLoop::Clock::now() + longestStart, [&ready] { return ready; }));
+  bool isReady = false;
+  const auto watching = runLoop.watch(readyEnd.number(), RunLoop::Readiness::readable, [&] { isReady = true; });
+  static_cast<void>(runLoop.runUntil(RunLoop::Clock::now() + longestStart, [&] { return isReady; }));
 }
 
 }  // namespace tavisk

@@ -15,7 +15,7 @@ namespace tavisk {
 
 /// polkit's answer about an action.
 struct Authorization {
-  bool granted;
+  bool isGranted;
   std::string temporaryId;  ///< empty when nothing has to be given back
 };
 
@@ -26,7 +26,7 @@ Result<Authorization> checkAuthorization(Bus& bus, const char* action);
 /// Gives a temporary authorization back.
 Result<void> revokeAuthorization(Bus& bus, const std::string& temporaryId);
 
-/// Asks for passwords at the terminal on behalf of polkit (pkttyagent(1)), as long as this object exists.
+/// Asks the user for passwords at the terminal on behalf of polkit (pkttyagent(1)), as long as this object exists.
 class PolkitAgent {
  public:
   /// Returns when the agent is ready, after a few seconds at most; a machine that has none goes without.

@@ -4,7 +4,6 @@
 
 #include "base/DnsName.h"
 #include "effects/SettingNames.h"
-#include "hosts/linux/system/OnOff.h"
 #include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
 
@@ -28,7 +27,7 @@ Daemons& LinuxNetworkTimeService::daemons() {
 Result<const TimeDaemon*> LinuxNetworkTimeService::client() {
   const TimeDaemon* masked = nullptr;
   for (const auto& candidate : timeDaemons()) {
-    auto presence = daemons().presence(candidate.daemon);
+    const auto presence = daemons().presence(candidate.daemon);
     if (!presence) return presence.failure();
     if (*presence == Daemons::Presence::installed) return &candidate;
     if (*presence == Daemons::Presence::masked && !masked) masked = &candidate;
@@ -38,7 +37,7 @@ Result<const TimeDaemon*> LinuxNetworkTimeService::client() {
 
 template <typename Answer, typename Use>
 Result<Answer> LinuxNetworkTimeService::withClient(Use use) {
-  auto found = client();
+  const auto found = client();
   if (!found) return found.failure();
   if (!*found) return noClient();
   return use(**found);
@@ -46,61 +45,67 @@ Result<Answer> LinuxNetworkTimeService::withClient(Use use) {
 
 /// A client that cannot be asked for is no reason: whatever is done with it then tells why.
 std::optional<Failure> LinuxNetworkTimeService::whyNotSupported() {
-  auto found = client();
+  const auto found = client();
   if (!found || *found) return std::nullopt;
   return noClient();
 }
 
-Setting<std::string> LinuxNetworkTimeService::named(const char* name) {
-  Setting<std::string> setting;
+template <typename Value>
+Setting<Value> LinuxNetworkTimeService::named(const char* name) {
+  Setting<Value> setting;
   setting.name = name;
   setting.supported = [this] { return whyNotSupported(); };
   return setting;
 }
 
-Setting<std::string> LinuxNetworkTimeService::runningSetting() {
-  auto setting = named(setting::networkTime);
-  setting.live = [this]() -> Result<Value> {
-    auto found = client();
+template <typename Value>
+void LinuxNetworkTimeService::change(const Setting<Value>& setting, const std::type_identity_t<Value>& asked) {
+  carryOut(setting, asked, _machine.effects, _machine.runLoop);
+}
+
+Setting<bool> LinuxNetworkTimeService::runningSetting() {
+  auto setting = named<bool>(setting::networkTime);
+  setting.live = [this]() -> Result<bool> {
+    const auto found = client();
     if (!found) return found.failure();
-    return asOnOff(!*found ? Result<bool>(false) : daemons().isRunning((*found)->daemon));
+    return !*found ? false : daemons().isRunning((*found)->daemon);
   };
-  setting.apply = [this](const std::string& value) {
+  setting.apply = [this](bool isOn) {
     return withClient<void>([&](const TimeDaemon& client) {
-      return value == onOff(true) ? daemons().start(client.daemon) : daemons().stop(client.daemon);
+      return isOn ? daemons().start(client.daemon) : daemons().stop(client.daemon);
     });
   };
   return setting;
 }
 
 bool LinuxNetworkTimeService::isRunning() {
-  return observe(runningSetting(), _machine.effects) == onOff(true);
+  return observe(runningSetting(), _machine.effects).value_or(false);
 }
 
 void LinuxNetworkTimeService::start() {
-  change(runningSetting(), onOff(true));
+  change(runningSetting(), true);
 }
 
 void LinuxNetworkTimeService::stop() {
-  change(runningSetting(), onOff(false));
+  change(runningSetting(), false);
 }
 
 void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
-  auto setting = named(setting::networkTimeAtStartup);
+  auto setting = named<bool>(setting::networkTimeAtStartup);
   setting.stored = [this] {
-    return withClient<Value>([&](const TimeDaemon& client) { return asOnOff(daemons().startsAtBoot(client.daemon)); });
+    return withClient<bool>([this](const TimeDaemon& client) { return daemons().startsAtBoot(client.daemon); });
   };
-  setting.store = [this](const std::string& value) {
+  setting.store = [this](bool starts) {
     return withClient<void>(
-        [&](const TimeDaemon& client) { return daemons().setStartAtBoot({client.daemon}, value == onOff(true)); });
+        [&](const TimeDaemon& client) { return daemons().setStartAtBoot({client.daemon}, starts); });
   };
-  change(setting, onOff(launch));
+  change(setting, launch);
 }
 
 Setting<std::string> LinuxNetworkTimeService::serverSetting() {
-  auto setting = named(setting::networkTimeServer);
+  auto setting = named<std::string>(setting::networkTimeServer);
   setting.stored = [this]() -> Result<Value> {
-    auto found = client();
+    const auto found = client();
     if (!found) return found.failure();
     return !*found ? Value() : Value((*found)->server(_machine.root));
   };
@@ -109,9 +114,9 @@ Setting<std::string> LinuxNetworkTimeService::serverSetting() {
 
 /// A server that the network offered, or the daemon's own last resort.
 std::string LinuxNetworkTimeService::serverInUseWithoutAny() {
-  auto found = client();
+  const auto found = client();
   if (!found || !*found || !(*found)->busService || !(*found)->server(_machine.root).empty()) return {};
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus || !daemons().isRunning((*found)->daemon).valueOr(false)) return {};
   const BusObject manager{(*found)->busService, "/org/freedesktop/timesync1", "org.freedesktop.timesync1.Manager"};
   auto name = (*bus)->property(manager, "ServerName", "s");
@@ -120,18 +125,18 @@ std::string LinuxNetworkTimeService::serverInUseWithoutAny() {
 
 NetworkTimeServer LinuxNetworkTimeService::server() {
   auto setting = serverSetting();
-  if (auto inUse = serverInUseWithoutAny(); !inUse.empty()) setting.live = [inUse] { return Value(inUse); };
+  if (const auto inUse = serverInUseWithoutAny(); !inUse.empty()) setting.live = [inUse] { return Value(inUse); };
   return {observe(setting, _machine.effects).value_or("")};
 }
 
 std::string LinuxNetworkTimeService::whatStaysInUse(const TimeDaemon& client) const {
-  auto other = !client.otherServer ? std::string() : client.otherServer(_machine.root);
-  return other.empty() ? other : "configured elsewhere, " + other + " stays in use beside it";
+  const auto other = !client.otherServer ? std::string() : client.otherServer(_machine.root);
+  return other.empty() ? "" : "configured elsewhere, " + other + " stays in use beside it";
 }
 
 void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
   auto setting = serverSetting();
-  if (auto found = client(); found && *found) {
+  if (const auto found = client(); found && *found) {
     setting.where = (*found)->serverFile;
     setting.note = [this, client = *found](const auto&) { return whatStaysInUse(*client); };
     if ((*found)->whyNotRead) setting.supported = [this, client = *found] { return client->whyNotRead(_machine.root); };
@@ -151,7 +156,7 @@ Result<void> LinuxNetworkTimeService::storeServer(const TimeDaemon& client, cons
 }
 
 void LinuxNetworkTimeService::restartAsynchronously() {
-  auto setting = named(setting::networkTimeRestart);
+  auto setting = named<std::string>(setting::networkTimeRestart);
   setting.apply = [this](const std::string&) {
     return withClient<void>([&](const TimeDaemon& client) { return reload(client); });
   };
@@ -161,13 +166,9 @@ void LinuxNetworkTimeService::restartAsynchronously() {
 Result<void> LinuxNetworkTimeService::reload(const TimeDaemon& client) {
   if (client.reload.empty()) return daemons().restartIfRunning(client.daemon);
   if (auto failure = whyNeedsRoot("run", client.reload.front())) return *failure;
-  auto printed = runProgram(_machine.root, {client.reload.begin(), client.reload.end()}, _machine.runLoop);
+  const auto printed = runProgram(_machine.root, {client.reload.begin(), client.reload.end()}, _machine.runLoop);
   if (!printed) return printed.failure();
   return {};
-}
-
-void LinuxNetworkTimeService::change(const Setting<std::string>& setting, const std::string& asked) {
-  carryOut(setting, asked, _machine.effects, _machine.runLoop);
 }
 
 }  // namespace tavisk

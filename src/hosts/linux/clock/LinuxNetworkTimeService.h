@@ -2,6 +2,10 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <optional>
+#include <string>
+#include <type_traits>
+
 #include "hosts/linux/clock/TimeDaemons.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/SettingChange.h"
@@ -30,12 +34,14 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   template <typename Answer, typename Use>
   Result<Answer> withClient(Use use);
   std::optional<Failure> whyNotSupported();
-  Setting<std::string> named(const char* name);
-  Setting<std::string> runningSetting();
+  template <typename Value>
+  Setting<Value> named(const char* name);
+  template <typename Value>
+  void change(const Setting<Value>& setting, const std::type_identity_t<Value>& asked);
+  Setting<bool> runningSetting();
   Setting<std::string> serverSetting();
   std::string serverInUseWithoutAny();
   std::string whatStaysInUse(const TimeDaemon& client) const;
-  void change(const Setting<std::string>& setting, const std::string& asked);
   Result<void> storeServer(const TimeDaemon& client, const std::string& address);
   Result<void> reload(const TimeDaemon& client);
 

@@ -14,7 +14,6 @@
 #include <ctime>
 
 #include "base/Calendar.h"
-#include "base/Result.h"
 #include "base/Text.h"
 
 namespace tavisk {
@@ -37,7 +36,7 @@ std::chrono::microseconds systemMicroseconds() {
 /// The third line of /etc/adjtime is UTC or LOCAL; UTC without the file.
 bool keepsLocalTime(const SystemRoot& root) {
   constexpr std::size_t limit = 4096;
-  auto lines = split(root.read("/etc/adjtime", limit).valueOr(""), "\n");
+  const auto lines = split(root.read("/etc/adjtime", limit).valueOr(""), "\n");
   return lines.size() > 2 && lines[2] == "LOCAL";
 }
 
@@ -66,7 +65,7 @@ std::int64_t systemTime() {
 }
 
 std::optional<Failure> whyOutOfClockRange(std::int64_t secondsSince1970) {
-  auto refusal = [](const char* why) { return Failure{"set the clock", clockName, why}; };
+  const auto refusal = [](const char* why) { return Failure{"set the clock", clockName, why}; };
   if (secondsSince1970 < 0) return refusal("Linux has no time before 1970");
   if (secondsSince1970 > lastSettableSecond) return refusal("Linux sets no time after April 2232");
   if (secondsSince1970 < seconds(CLOCK_MONOTONIC))
@@ -124,7 +123,7 @@ std::int64_t AskedTime::unlessNear(std::chrono::microseconds shown, std::chrono:
 
 Result<void> setHardwareClock(const SystemRoot& root, std::int64_t secondsSince1970) {
   if (!root.exists(hardwareClock)) return {};
-  auto clock = root.open(hardwareClock, O_RDONLY | O_NONBLOCK);
+  const auto clock = root.open(hardwareClock, O_RDONLY | O_NONBLOCK);
   if (!clock) return clock.failure();
   auto time = rtcTime(keepsLocalTime(root) ? localDateTime(secondsSince1970) : utcDateTime(secondsSince1970));
   if (::ioctl(clock->number(), RTC_SET_TIME, &time) != 0) return systemFailure("RTC_SET_TIME", hardwareClock, errno);

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "base/Text.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/OwnFiles.h"
 #include "hosts/linux/system/SystemdConfig.h"
 
@@ -17,13 +18,14 @@ constexpr std::size_t fileLimit = std::size_t{1} << 20U;
 constexpr const char* chronyConfig = "/etc/chrony/chrony.conf";
 constexpr const char* ntpsecConfig = "/etc/ntpsec/ntp.conf";
 constexpr const char* openntpdConfig = "/etc/openntpd/ntpd.conf";
+constexpr const char* chronyReload[] = {"/usr/bin/chronyc", "reload", "sources"};
+constexpr std::string_view commentSigns = "#%;!";
 
 /// The lines of a file as words: chrony.conf(5) and ntp.conf(5) agree on comments and on one directive a line.
 std::vector<std::vector<std::string>> directives(const SystemRoot& root, const std::string& file) {
   std::vector<std::vector<std::string>> found;
-  for (const auto& line : split(root.read(file, fileLimit).valueOr(""), "\n")) {
+  for (const auto& line : configurationLines(root.read(file, fileLimit).valueOr(""), commentSigns)) {
     auto words = split(line, " \t\r");
-    if (words.empty() || std::string_view("#%;!").find(words[0][0]) != std::string_view::npos) continue;
     words[0] = lowerCased(words[0]);
     found.push_back(std::move(words));
   }
@@ -66,9 +68,10 @@ std::string chronyOtherServer(const SystemRoot& root) {
 }
 
 std::optional<Failure> chronyWhyNotRead(const SystemRoot& root) {
-  for (const auto& directive : directives(root, chronyConfig))
-    if (directive[0] == "sourcedir" && std::ranges::find(directive, "/etc/chrony/sources.d") != directive.end())
-      return std::nullopt;
+  const auto readsOwnFile = [](const std::vector<std::string>& directive) {
+    return directive[0] == "sourcedir" && std::ranges::find(directive, "/etc/chrony/sources.d") != directive.end();
+  };
+  if (std::ranges::any_of(directives(root, chronyConfig), readsOwnFile)) return std::nullopt;
   return Failure{
       "set the server", ownfile::chronyServer,
       "chronyd does not read it: " + std::string(chronyConfig) + " has no line \"sourcedir /etc/chrony/sources.d\""};
@@ -98,7 +101,7 @@ std::optional<Failure> openntpdWhyNotRead(const SystemRoot&) {
 }
 
 std::string timesyncdServer(const SystemRoot& root) {
-  auto servers = SystemdConfig(root, "timesyncd.conf").words("Time", "NTP");
+  const auto servers = SystemdConfig(root, "timesyncd.conf").words("Time", "NTP");
   return servers.empty() ? std::string() : servers.front();
 }
 
@@ -110,8 +113,6 @@ std::string serverDirective(const std::string& server) {
 std::string timesyncdLines(const std::string& server) {
   return ownfile::header + ("[Time]\nNTP=\nNTP=" + server) + "\n";
 }
-
-constexpr const char* chronyReload[] = {"/usr/bin/chronyc", "reload", "sources"};
 
 constexpr TimeDaemon daemons[] = {
     {.daemon = {"chrony.service", "chrony", "chronyd"},

@@ -101,12 +101,12 @@ Result<void> setInhibited(const SystemRoot& root, const std::string& keyboard, b
 
 Result<bool> EnclosureLock::isEngaged() {
   const auto capabilities = _controller.ask("Get Chassis Capabilities", {chassis, getCapabilities, {}}, 1);
-  if (capabilities.status != 0) return *capabilities.failure;
-  if ((capabilities.data[0] & frontPanelLockout) == 0)
-    return Failure{"Get Chassis Capabilities", "the management controller", "it tells of no lock of the front panel"};
+  if (!capabilities) return capabilities.failure();
+  if ((capabilities->front() & frontPanelLockout) == 0)
+    return Failure{"Get Chassis Capabilities", managementController, "it tells of no lock of the front panel"};
   const auto status = _controller.ask("Get Chassis Status", {chassis, getStatus, {}}, 3);
-  if (status.status != 0) return *status.failure;
-  return (status.data[2] & frontPanelLockout) != 0;
+  if (!status) return status.failure();
+  return ((*status)[2] & frontPanelLockout) != 0;
 }
 
 void EnclosureLock::setDisablesKeyboard(bool disables) {

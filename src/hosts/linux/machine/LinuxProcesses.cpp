@@ -2,14 +2,12 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/machine/LinuxProcesses.h"
 
-#include <sys/syscall.h>
-#include <unistd.h>
-
 #include <algorithm>
-#include <cerrno>
 
 #include "base/FileDescriptor.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/services/SystemServices.h"
+#include "hosts/linux/system/ProcessHandle.h"
 #include "hosts/linux/system/ProcessScan.h"
 #include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
@@ -40,20 +38,21 @@ Result<void> LinuxProcessUtilities::signalProcess(int signal, ProcessId process)
   if (process < 1) return Failure{tried, name, "this is no process id"};
   // The ids in a tree may be those of strangers on the machine that runs the tool.
   if (_machine.root.prefix() != "/") return Failure{tried, name, "a tree of files has no processes"};
-  const FileDescriptor handle(static_cast<int>(::syscall(SYS_pidfd_open, process, 0)));
-  if (!handle) return systemFailure(tried, name, errno);
-  if (::syscall(SYS_pidfd_send_signal, handle.number(), signal, nullptr, 0) == 0) return {};
-  const int error = errno;
-  const auto forRoot = error == EPERM ? whyNeedsRoot(tried, name) : std::nullopt;
-  return forRoot.value_or(systemFailure(tried, name, error));
+  const auto handle = ProcessHandle::of(process);
+  if (!handle) return retold(handle.failure(), tried, name);
+  const auto sent = handle->send(signal);
+  if (sent) return {};
+  const bool isForbidden = sent.failure().code == std::errc::operation_not_permitted;
+  const auto forRoot = isForbidden ? whyNeedsRoot(tried, name) : std::nullopt;
+  return forRoot.value_or(retold(sent.failure(), tried, name));
 }
 
 void LinuxProcessTermination::disable() {
   if (_holds++ > 0) return;
   auto bus = _machine.services.systemBus();
   if (!bus) return;
-  const BusObject logins{"org.freedesktop.login1", "/org/freedesktop/login1", "org.freedesktop.login1.Manager"};
-  auto hold = (*bus)->query(logins, "Inhibit", "h", "shutdown", "tavisk", "The startup disk is being set", "delay");
+  auto hold =
+      (*bus)->query(loginManager(), "Inhibit", "h", "shutdown", "tavisk", "The startup disk is being set", "delay");
   if (hold) _hold = std::move(hold).value().readDescriptor();
 }
 

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/names/HostNameFiles.h"
 
 #include <fcntl.h>
@@ -12,8 +11,8 @@
 #include <vector>
 
 #include "base/FileDescriptor.h"
-#include "base/Result.h"
 #include "base/Text.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/ShellAssignments.h"
 #include "hosts/linux/system/SystemdConfig.h"
 
@@ -21,19 +20,23 @@ namespace tavisk {
 namespace {
 
 constexpr std::size_t fileLimit = std::size_t{1} << 20U;
+constexpr std::size_t hostsLimit = std::size_t{4} << 20U;
 constexpr const char* prettyName = "PRETTY_HOSTNAME";
 constexpr const char* kernelNameFile = "/proc/sys/kernel/hostname";
 constexpr const char* kernelWithoutName = "(none)";
 constexpr std::string_view ownAddress = "127.0.1.1";
+constexpr const char* cloudConfig = "/etc/cloud/cloud.cfg";
+constexpr const char* cloudConfigFolder = "/etc/cloud/cloud.cfg.d";
+constexpr const char* responderConfig = "/etc/avahi/avahi-daemon.conf";
 
-Result<std::string> readIfThere(const SystemRoot& root, const char* file) {
+Result<std::string> readIfThere(const SystemRoot& root, const char* file, std::size_t limit = fileLimit) {
   if (!root.exists(file)) return std::string();
-  return root.read(file, fileLimit);
+  return root.read(file, limit);
 }
 
 /// The words of a line of hosts(5) that name this machine, renamed; each name stands once.
-std::vector<std::string> renamed(const std::vector<std::string>& names, const std::string& before,
-                                 const std::string& now) {
+std::vector<std::string> namesAfter(const std::vector<std::string>& names, const std::string& before,
+                                    const std::string& now) {
   const auto oldLabel = firstLabel(before);
   const auto newLabel = firstLabel(now);
   std::vector<std::string> result;
@@ -59,35 +62,38 @@ std::string lineWithName(const std::string& line, const std::string& before, con
   auto names = split(line.substr(0, comment), " \t\r");
   if (names.empty() || names.front() != ownAddress) return line;
   names.erase(names.begin());
-  const auto changed = renamed(names, before, now);
+  const auto changed = namesAfter(names, before, now);
   if (changed == names) return line;
   auto text = std::string(ownAddress);
   for (const auto& name : changed) text += (&name == &changed.front() ? "\t" : " ") + name;
   return text + (comment < line.size() ? " " + line.substr(comment) : "");
 }
 
-constexpr const char* cloudConfig = "/etc/cloud/cloud.cfg";
-constexpr const char* responderConfig = "/etc/avahi/avahi-daemon.conf";
-
 /// As cloud-init reads them: a later file goes before an earlier one.
 std::vector<std::string> cloudConfigFiles(const SystemRoot& root) {
   std::vector<std::string> files{cloudConfig};
-  for (const auto& name : root.list("/etc/cloud/cloud.cfg.d").valueOr({}))
-    if (name.ends_with(".cfg")) files.push_back("/etc/cloud/cloud.cfg.d/" + name);
+  for (const auto& name : root.list(cloudConfigFolder).valueOr({}))
+    if (name.ends_with(".cfg")) files.push_back(std::string(cloudConfigFolder) + "/" + name);
   return files;
 }
 
-bool preservesHostName(const SystemRoot& root) {
-  constexpr std::string_view words[] = {"true", "yes", "on"};
-  bool preserves = false;
-  for (const auto& file : cloudConfigFiles(root)) {
-    for (const auto& line : split(root.read(file, fileLimit).valueOr(""), "\n")) {
-      const auto setting = split(line, " \t\r");
-      if (setting.size() > 1 && line.starts_with("preserve_hostname:"))
-        preserves = std::ranges::find(words, lowerCased(setting[1])) != std::end(words);
-    }
+/// Only at the beginning of a line: an indented one belongs to another key.
+std::optional<bool> hostNamePreservedIn(const std::string& text) {
+  constexpr std::string_view yes[] = {"true", "yes", "on"};
+  std::optional<bool> isPreserved;
+  for (const auto& line : split(text, "\n")) {
+    const auto words = split(line, " \t\r");
+    if (words.size() > 1 && line.starts_with("preserve_hostname:"))
+      isPreserved = std::ranges::find(yes, lowerCased(words[1])) != std::end(yes);
   }
-  return preserves;
+  return isPreserved;
+}
+
+bool preservesHostName(const SystemRoot& root) {
+  bool isPreserved = false;
+  for (const auto& file : cloudConfigFiles(root))
+    isPreserved = hostNamePreservedIn(root.read(file, fileLimit).valueOr("")).value_or(isPreserved);
+  return isPreserved;
 }
 
 bool isOwnedByCloud(const SystemRoot& root) {
@@ -113,11 +119,8 @@ Result<void> setPrettyHostName(const SystemRoot& root, const std::string& name) 
 Result<std::optional<std::string>> staticHostName(const SystemRoot& root) {
   const auto text = readIfThere(root, staticNameFile);
   if (!text) return text.failure();
-  for (const auto& line : split(*text, "\n")) {
-    const auto words = split(line, " \t\r");
-    if (!words.empty() && !words.front().starts_with('#')) return std::optional(words.front());
-  }
-  return std::optional<std::string>();
+  const auto lines = configurationLines(*text);
+  return lines.empty() ? std::nullopt : std::optional(split(lines.front(), " \t\r").front());
 }
 
 Result<void> setStaticHostName(const SystemRoot& root, const std::string& name) {
@@ -134,10 +137,16 @@ Result<std::optional<std::string>> kernelHostName(const SystemRoot& root) {
 
 Result<void> setKernelHostName(const SystemRoot& root, const std::string& name) {
   // The file is read-only in containers that may set the name all the same.
-  if (root.prefix() == "/")
-    return ::sethostname(name.data(), name.size()) == 0 ? Result<void>() : systemFailure("sethostname", name, errno);
+  if (root.prefix() == "/") {
+    if (::sethostname(name.data(), name.size()) != 0) return systemFailure("sethostname", name, errno);
+    return {};
+  }
   const auto file = root.open(kernelNameFile, O_WRONLY | O_TRUNC);
   return file ? writeAll(*file, name + "\n", kernelNameFile) : file.failure();
+}
+
+Result<std::string> hostsOf(const SystemRoot& root) {
+  return readIfThere(root, hostsFile, hostsLimit);
 }
 
 std::string hostsWithName(std::string_view hosts, const std::string& before, const std::string& now) {

@@ -14,6 +14,7 @@ namespace tavisk {
 
 inline constexpr const char* prettyNameFile = "/etc/machine-info";
 inline constexpr const char* staticNameFile = "/etc/hostname";
+inline constexpr const char* hostsFile = "/etc/hosts";
 
 /// The name for people in machine-info(5), and the host name in hostname(5). Absent when there is none; a file that
 /// cannot be read is a failure.
@@ -28,6 +29,8 @@ Result<std::optional<std::string>> kernelHostName(const SystemRoot& root);
 inline constexpr std::size_t longestKernelHostName = 64;
 Result<void> setKernelHostName(const SystemRoot& root, const std::string& name);
 
+/// The text of hosts(5); empty where there is no such file.
+Result<std::string> hostsOf(const SystemRoot& root);
 /// The text of hosts(5) with the machine's own name, on the line of the address 127.0.1.1, changed from `before` to
 /// `now`; what follows its first label there stays, and so do all other names.
 std::string hostsWithName(std::string_view hosts, const std::string& before, const std::string& now);

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/names/LinuxNameServices.h"
 
 #include <algorithm>
@@ -17,8 +16,6 @@ namespace {
 
 constexpr const char* setComputer = "set the computer name";
 constexpr const char* setLocal = "set the host name";
-constexpr const char* hostsFile = "/etc/hosts";
-constexpr std::size_t hostsLimit = std::size_t{4} << 20U;
 
 BusObject nameService() {
   return {"org.freedesktop.hostname1", "/org/freedesktop/hostname1", "org.freedesktop.hostname1"};
@@ -29,17 +26,11 @@ bool isControlByte(char c) {
 }
 
 /// The reason against a name that the file for it cannot hold.
-std::optional<Failure> whyNoComputerName(const std::string& name) {
+std::optional<Failure> whyNotStorable(const std::string& name) {
   if (!isUtf8(name)) return Failure{setComputer, prettyNameFile, "the name is not UTF-8 text"};
   if (std::ranges::any_of(name, isControlByte))
     return Failure{setComputer, prettyNameFile, "the name holds control characters"};
   return std::nullopt;
-}
-
-/// Empty where there is no such file.
-Result<std::string> hostsOf(const SystemRoot& root) {
-  if (!root.exists(hostsFile)) return std::string();
-  return root.read(hostsFile, hostsLimit);
 }
 
 using Value = std::optional<std::string>;
@@ -85,9 +76,9 @@ class LinuxSession final : public DynamicStore::Session {
 }  // namespace
 
 Result<bool> LinuxHostConfigService::setByService(const char* member, const std::string& name) {
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return false;
-  auto set = (*bus)->call(nameService(), member, "", name, (*bus)->isInteractive());
+  const auto set = (*bus)->call(nameService(), member, "", name, (*bus)->isInteractive());
   if (set) return true;
   if (set.failure().code == BusErrorCode::serviceUnknown) return false;
   return set.failure();
@@ -105,7 +96,7 @@ void LinuxHostConfigService::setComputerName(const std::string& name) {
 
 /// Where the service does not run, who asks for the name reads the file.
 Result<LinuxHostConfigService::Value> LinuxHostConfigService::serviceComputerName() {
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return prettyHostName(_machine.root);
   auto name = (*bus)->property(nameService(), "PrettyHostname", "s");
   if (name) return Value(std::move(name).value().readText());
@@ -114,8 +105,8 @@ Result<LinuxHostConfigService::Value> LinuxHostConfigService::serviceComputerNam
 }
 
 Result<void> LinuxHostConfigService::storeComputerName(const std::string& name) {
-  if (auto failure = whyNoComputerName(name)) return *failure;
-  auto set = setByService("SetPrettyHostname", name);
+  if (auto failure = whyNotStorable(name)) return *failure;
+  const auto set = setByService("SetPrettyHostname", name);
   if (!set) return set.failure();
   if (*set) return {};
   if (auto failure = whyNeedsRoot(setComputer, prettyNameFile)) return *failure;
@@ -163,7 +154,7 @@ Result<void> LinuxHostConfigService::storeLocalName(const std::string& name) {
 }
 
 Result<void> LinuxHostConfigService::storeStaticName(const std::string& name) {
-  auto set = setByService("SetStaticHostname", name);
+  const auto set = setByService("SetStaticHostname", name);
   if (!set) return set.failure();
   if (*set) return {};
   if (auto failure = whyNeedsRoot(setLocal, staticNameFile)) return *failure;

@@ -27,7 +27,7 @@ BusObject messageBus() {
 }  // namespace
 
 Result<Bus*> NameAnnouncer::busOf(const char* service) {
-  auto bus = _services.systemBus();
+  const auto bus = _services.systemBus();
   if (!bus) return nullptr;
   auto runs = (*bus)->query(messageBus(), "NameHasOwner", "b", service);
   if (!runs) return runs.failure();
@@ -35,7 +35,7 @@ Result<Bus*> NameAnnouncer::busOf(const char* service) {
 }
 
 Result<std::optional<std::string>> NameAnnouncer::respondersName() {
-  auto bus = busOf(responder().service);
+  const auto bus = busOf(responder().service);
   if (!bus) return bus.failure();
   if (!*bus) return std::optional<std::string>();
   auto name = (*bus)->query(responder(), "GetHostName", "s");
@@ -46,7 +46,7 @@ Result<std::optional<std::string>> NameAnnouncer::respondersName() {
 Result<std::optional<std::string>> NameAnnouncer::name() {
   auto name = respondersName();
   if (!name || *name) return name;
-  auto bus = busOf(resolver().service);
+  const auto bus = busOf(resolver().service);
   if (!bus) return bus.failure();
   if (!*bus) return std::optional<std::string>();
   auto own = (*bus)->property(resolver(), "LLMNRHostname", "s");
@@ -55,21 +55,22 @@ Result<std::optional<std::string>> NameAnnouncer::name() {
 }
 
 Result<void> NameAnnouncer::announce(const std::string& label) {
-  auto bus = busOf(responder().service);
+  const auto bus = busOf(responder().service);
   if (!bus) return bus.failure();
   if (!*bus) return {};
   std::int32_t state = registering;
-  auto states = (*bus)->subscribe(responder(), "StateChanged", [&](BusMessage& signal) { state = signal.readInt32(); });
+  const auto states =
+      (*bus)->subscribe(responder(), "StateChanged", [&](BusMessage& signal) { state = signal.readInt32(); });
   if (!states) return states.failure();
-  auto set = (*bus)->call(responder(), "SetHostName", "", label);
+  const auto set = (*bus)->call(responder(), "SetHostName", "", label);
   if (!set) return set.failure();
   return awaitRegistered(**bus, state);
 }
 
 /// Signals that arrived with a reply do not make the connection readable once more: they are handled before each wait.
 Result<void> NameAnnouncer::awaitRegistered(Bus& bus, const std::int32_t& state) {
-  auto watching = _runLoop.watch(bus.descriptor(), RunLoop::Readiness::readable, [] {});
-  auto isRegistered = [&] {
+  const auto watching = _runLoop.watch(bus.descriptor(), RunLoop::Readiness::readable, [] {});
+  const auto isRegistered = [&] {
     bus.process();
     return state > registering || !bus.isOpen();
   };

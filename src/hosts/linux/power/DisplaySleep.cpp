@@ -6,22 +6,23 @@
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
-#include "hosts/linux/power/PowerValues.h"
+#include "hosts/linux/power/PowerLimits.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/OwnFiles.h"
 #include "hosts/linux/system/Rights.h"
-#include "hosts/linux/system/SystemdConfig.h"
 
 namespace tavisk {
 namespace {
 
 constexpr const char* terminal = "/dev/tty1";
 constexpr const char* secondsFile = "/sys/module/kernel/parameters/consoleblank";
-constexpr const char* lineStart = "w /dev/tty1 - - - - \\033[9;";
-constexpr std::int64_t kernelLimit = 60;
+constexpr std::string_view lineStart = "w /dev/tty1 - - - - \\033[9;";
+constexpr char lineEnd = ']';
+constexpr Minutes kernelLimit{60};
 
-std::string minutesAtMost(const std::string& minutes, std::int64_t limit) {
-  return std::to_string(std::min(leadingInteger(minutes), limit));
+/// What the kernel makes of it.
+Minutes limited(Minutes asked) {
+  return std::min(asked, kernelLimit);
 }
 
 }  // namespace
@@ -36,52 +37,47 @@ std::optional<Failure> DisplaySleep::whyNoConsole() const {
   return std::nullopt;
 }
 
-Result<std::optional<std::string>> DisplaySleep::live() const {
-  if (whyNoConsole()) return std::optional<std::string>("0");
+Setting<Minutes>::Found DisplaySleep::live() const {
+  if (whyNoConsole()) return Minutes{};
   const auto seconds = readKernelFile(_machine.root, secondsFile);
   if (!seconds) return seconds.failure();
-  return std::optional(wholeMinutes(std::chrono::seconds(leadingInteger(*seconds))));
+  return Minutes::covering(std::chrono::seconds(leadingInteger(*seconds)));
 }
 
-std::optional<std::string> DisplaySleep::stored() const {
-  constexpr std::size_t limit = 65536;
-  const auto text = _machine.root.read(ownfile::consoleBlanking, limit).valueOr("");
+std::optional<Minutes> DisplaySleep::stored() const {
+  const auto text = _machine.root.read(ownfile::consoleBlanking, powerFileLimit).valueOr("");
   const auto line = text.find(lineStart);
   if (line == std::string::npos) return std::nullopt;
-  return std::to_string(leadingInteger(std::string_view(text).substr(line + std::string_view(lineStart).size())));
+  const auto start = line + lineStart.size();
+  const auto minutes = parseNumber<unsigned long>(text.substr(start, text.find(lineEnd, start) - start));
+  return minutes ? std::optional(Minutes{*minutes}) : std::nullopt;
 }
 
-Result<void> DisplaySleep::store(const std::string& minutes) const {
+Result<void> DisplaySleep::store(Minutes asked) const {
   if (auto failure = whyNeedsRoot("write", ownfile::consoleBlanking)) return *failure;
-  return _machine.root.write(ownfile::consoleBlanking, std::string(ownfile::header) + lineStart + minutes + "]\n");
+  const auto line = std::string(lineStart) + textOf(asked) + lineEnd;
+  return _machine.root.write(ownfile::consoleBlanking, ownfile::header + line + "\n");
 }
 
-std::string DisplaySleep::noteOn(const std::string& minutes) const {
+std::string DisplaySleep::noteOn(Minutes asked) const {
   std::string note;
-  if (leadingInteger(minutes) > kernelLimit) note = "the kernel blanks its console after 60 minutes at the latest";
+  if (asked > kernelLimit) note = "the kernel blanks its console after 60 minutes at the latest";
   if (_machine.services.hasServiceManager()) return note;
   return note + (note.empty() ? "" : "; ") + "nothing here reads the file: lasts until the restart";
 }
 
-Setting<std::string> DisplaySleep::displaySleep() const {
-  Setting<std::string> setting;
+Setting<Minutes> DisplaySleep::displaySleep() const {
+  Setting<Minutes> setting;
   setting.name = setting::displaySleep;
   setting.unit = "minutes";
+  setting.where = ownfile::consoleBlanking;
+  setting.note = [this](Minutes asked) { return noteOn(asked); };
+  setting.supported = [this] { return whyNoConsole(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };
-  return setting;
-}
-
-Setting<std::string> DisplaySleep::displaySleepChange(const std::string& /*minutes*/) const {
-  auto setting = displaySleep();
-  setting.where = ownfile::consoleBlanking;
-  setting.note = [this](const std::string& asked) { return noteOn(asked); };
-  setting.supported = [this] { return whyNoConsole(); };
-  setting.store = [this](const std::string& asked) { return store(asked); };
-  setting.liveFor = [](const std::string& asked) { return minutesAtMost(asked, kernelLimit); };
-  setting.apply = [this](const std::string& asked) {
-    return _console.write("\033[9;" + minutesAtMost(asked, kernelLimit) + "]");
-  };
+  setting.store = [this](Minutes asked) { return store(asked); };
+  setting.apply = [this](Minutes asked) { return _console.write("\033[9;" + textOf(limited(asked)) + "]"); };
+  setting.liveFor = limited;
   return setting;
 }
 

@@ -4,6 +4,7 @@
 
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/SettingChange.h"
+#include "platform/PowerSettingsService.h"
 
 namespace tavisk {
 
@@ -27,17 +28,18 @@ class FirstConsole final : public Console {
 /// After how many minutes the kernel blanks the text console (console_codes(4), "ESC [ 9 ; n ]"): at most 60.
 class DisplaySleep {
  public:
+  /// The console must outlive the object.
   DisplaySleep(const LinuxMachine& machine, Console& console) : _machine(machine), _console(console) {}
 
-  Setting<std::string> displaySleep() const;
-  Setting<std::string> displaySleepChange(const std::string& minutes) const;
+  /// Refers to the object.
+  Setting<Minutes> displaySleep() const;
 
  private:
   std::optional<Failure> whyNoConsole() const;
-  Result<std::optional<std::string>> live() const;
-  std::optional<std::string> stored() const;
-  std::string noteOn(const std::string& minutes) const;
-  Result<void> store(const std::string& minutes) const;
+  Setting<Minutes>::Found live() const;
+  std::optional<Minutes> stored() const;
+  std::string noteOn(Minutes asked) const;
+  Result<void> store(Minutes asked) const;
 
   LinuxMachine _machine;
   Console& _console;

@@ -6,6 +6,8 @@
 #include <vector>
 
 #include "base/Text.h"
+#include "hosts/linux/power/PowerLimits.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
@@ -20,11 +22,10 @@ struct Row {
 };
 
 std::vector<Row> knownRows(const SystemRoot& root) {
-  constexpr std::size_t limit = 65536;
   std::vector<Row> rows;
-  for (const auto& line : split(root.read(firmwareAttributesFile, limit).valueOr(""), "\n")) {
+  for (const auto& line : configurationLines(root.read(firmwareAttributesFile, powerFileLimit).valueOr(""))) {
     const auto parts = split(line, "=;");
-    if (parts.size() == 3 && !trimmed(line).starts_with('#'))
+    if (parts.size() == 3)
       rows.push_back({std::string(trimmed(parts[0])), std::string(trimmed(parts[1])), std::string(trimmed(parts[2]))});
   }
   rows.insert(rows.end(), {{"AcPwrRcvry", "On", "Off"},
@@ -59,7 +60,7 @@ std::optional<FirmwareAttribute> restartAttribute(const SystemRoot& root) {
   if (drivers.empty()) return std::nullopt;
   for (const auto& row : knownRows(root)) {
     for (const auto& driver : drivers) {
-      FirmwareAttribute attribute{classFolder + driver + "/attributes/" + row.name + "/", row.on, row.off};
+      const FirmwareAttribute attribute{classFolder + driver + "/attributes/" + row.name + "/", row.on, row.off};
       if (takes(root, attribute)) return attribute;
     }
   }

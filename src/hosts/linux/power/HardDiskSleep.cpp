@@ -4,40 +4,38 @@
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/power/OtherOwners.h"
-#include "hosts/linux/power/PowerValues.h"
 
 namespace tavisk {
 namespace {
 
-constexpr const char* never = "0";
 constexpr const char* delay = "power/autosuspend_delay_ms";
 constexpr const char* control = "power/control";
 
-std::string milliseconds(const std::string& minutes) {
-  return std::to_string(std::chrono::milliseconds(std::chrono::minutes(leadingInteger(minutes))).count());
+std::string milliseconds(Minutes minutes) {
+  return std::to_string(std::chrono::milliseconds(minutes.duration()).count());
 }
 
-Result<std::string> minutesOf(const SysDevice& disk) {
+Result<Minutes> minutesOf(const SysDevice& disk) {
   const auto mode = disk.read(control);
   if (!mode) return mode.failure();
   const auto time = disk.read(delay);
   if (!time) return time.failure();
-  const auto idle = leadingInteger(*time);
-  return *mode == "auto" && idle >= 0 ? wholeMinutes(std::chrono::milliseconds(idle)) : never;
+  return *mode == "auto" ? Minutes::covering(std::chrono::milliseconds(leadingInteger(*time))) : Minutes{};
 }
 
-Result<void> setMinutes(const SysDevice& disk, const std::string& minutes) {
-  if (minutes == never) return disk.write(control, "on");
+Result<void> setMinutes(const SysDevice& disk, Minutes minutes) {
+  if (minutes.isNever()) return disk.write(control, "on");
   if (auto written = disk.write(delay, milliseconds(minutes)); !written) return written;
   return disk.write(control, "auto");
 }
 
-std::string ruleFor(const std::string& minutes) {
+std::string ruleFor(Minutes minutes) {
   const std::string disks =
       R"(ACTION=="add|change", SUBSYSTEM=="block", KERNEL=="sd*", ENV{DEVTYPE}=="disk", ATTR{removable}=="0", )"
       R"(ATTR{queue/rotational}=="1", )";
-  if (minutes == never) return disks + R"(ATTR{device/power/control}="on")";
+  if (minutes.isNever()) return disks + R"(ATTR{device/power/control}="on")";
   return disks + R"(ATTR{device/power/autosuspend_delay_ms}=")" + milliseconds(minutes) +
          R"(", ATTR{device/power/control}="auto")";
 }
@@ -75,43 +73,38 @@ std::optional<Failure> HardDiskSleep::whyNoDisk() const {
   return Failure{"find", "/sys/block/sd*", "no built-in disk here has a motor that the kernel can stop"};
 }
 
-Result<std::optional<std::string>> HardDiskSleep::live() const {
-  std::vector<DeviceValue> values;
+Setting<Minutes>::Found HardDiskSleep::live() const {
+  std::vector<DeviceValue<Minutes>> values;
   for (const auto& disk : disks()) {
-    auto minutes = minutesOf(disk.device);
+    const auto minutes = minutesOf(disk.device);
     if (!minutes) return minutes.failure();
     values.push_back({disk.name, *minutes});
   }
-  return std::optional(values.empty() ? never : valueOfAll(values));
+  return readingOfAll(std::move(values)).value_or(Minutes{});
 }
 
-Result<void> HardDiskSleep::apply(const std::string& minutes) const {
+Result<void> HardDiskSleep::apply(Minutes asked) const {
   Result<void> all;
   for (const auto& disk : disks())
-    if (auto set = setMinutes(disk.device, minutes); !set && all) all = set;
+    if (auto set = setMinutes(disk.device, asked); !set && all) all = set;
   return all;
 }
 
-Setting<std::string> HardDiskSleep::hardDiskSleep() const {
-  Setting<std::string> setting;
+Setting<Minutes> HardDiskSleep::hardDiskSleep() const {
+  Setting<Minutes> setting;
   setting.name = setting::hardDiskSleep;
   setting.unit = "minutes";
-  setting.live = [this] { return live(); };
-  setting.stored = [this] { return _rule.value(); };
-  return setting;
-}
-
-Setting<std::string> HardDiskSleep::hardDiskSleepChange() const {
-  auto setting = hardDiskSleep();
   setting.where = _rule.file();
-  setting.note = [this](const auto&) { return _rule.note(); };
-  setting.undoneBy = [this](const auto&) {
+  setting.note = [this](Minutes) { return whyNoRuleLasts(_machine.root); };
+  setting.undoneBy = [this](Minutes) {
     return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::laptopMode, OtherOwner::powertop,
                                         OtherOwner::smartd, OtherOwner::hdIdle});
   };
   setting.supported = [this] { return whyNoDisk(); };
-  setting.store = [this](const std::string& minutes) { return _rule.write(minutes, ruleFor(minutes)); };
-  setting.apply = [this](const std::string& minutes) { return apply(minutes); };
+  setting.live = [this] { return live(); };
+  setting.stored = [this] { return _rule.value(); };
+  setting.store = [this](Minutes asked) { return _rule.write(asked, ruleFor(asked)); };
+  setting.apply = [this](Minutes asked) { return apply(asked); };
   return setting;
 }
 

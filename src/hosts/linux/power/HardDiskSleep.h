@@ -17,8 +17,8 @@ class HardDiskSleep {
  public:
   explicit HardDiskSleep(const LinuxMachine& machine) : _machine(machine), _rule(machine.root, "disk-sleep") {}
 
-  Setting<std::string> hardDiskSleep() const;
-  Setting<std::string> hardDiskSleepChange() const;
+  /// Refers to the object.
+  Setting<Minutes> hardDiskSleep() const;
 
  private:
   struct Disk {
@@ -28,11 +28,11 @@ class HardDiskSleep {
   std::vector<Disk> disks() const;
   bool canStop(const SysDevice& disk) const;
   std::optional<Failure> whyNoDisk() const;
-  Result<std::optional<std::string>> live() const;
-  Result<void> apply(const std::string& minutes) const;
+  Setting<Minutes>::Found live() const;
+  Result<void> apply(Minutes asked) const;
 
   LinuxMachine _machine;
-  UdevRule _rule;
+  UdevRule<Minutes> _rule;
 };
 
 }  // namespace tavisk

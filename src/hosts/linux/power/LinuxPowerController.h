@@ -27,11 +27,13 @@ class LinuxPowerController final : public PowerController {
   ControllerStatus close(const Connection& connection) override;
 
  private:
-  Setting<std::string> delaySetting(const StartupDelayRequests& requests);
-  Result<std::optional<std::string>> askDelay(const StartupDelayRequests& requests);
-  ControllerAnswer sendDelay(const StartupDelayRequests& requests, std::uint32_t units);
-  ControllerStatus setDelay(const ControllerAnswer& identity, std::uint8_t units);
-  ControllerStatus recorded(ControllerStatus status, const Failure& failure);
+  Setting<std::int64_t> delaySetting(const StartupDelayRequests& requests);
+  Result<std::int64_t> askDelay(const StartupDelayRequests& requests);
+  std::optional<std::int64_t> keptWish() const;
+  Result<void> sendDelay(const StartupDelayRequests& requests, std::uint32_t units);
+  ControllerStatus setDelay(std::uint32_t manufacturer, std::uint8_t units);
+  /// The failure goes to the effects; its code is the status.
+  ControllerStatus recorded(const Failure& failure);
 
   LinuxMachine _machine;
   ManagementController& _controller;

@@ -2,9 +2,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "hosts/linux/power/ComputerSleep.h"
 #include "hosts/linux/power/DisplaySleep.h"
 #include "hosts/linux/power/HardDiskSleep.h"
-#include "hosts/linux/power/LoginService.h"
 #include "hosts/linux/power/RestartAfterFreeze.h"
 #include "hosts/linux/power/RestartAfterPowerFailure.h"
 #include "hosts/linux/power/WakeOnModem.h"
@@ -36,19 +36,17 @@ class LinuxPowerSettingsService final : public PowerSettingsService {
   void setRestartsAfterFreeze(bool restarts) override;
 
  private:
-  Setting<std::string> toRead(SleepTimer timer);
-  Setting<std::string> toChange(SleepTimer timer, const std::string& minutes);
-  Setting<std::string> toRead(PowerSwitch which);
-  Setting<std::string> toChange(PowerSwitch which);
+  Setting<Minutes> settingOf(SleepTimer timer);
+  Setting<bool> settingOf(PowerSwitch which);
 
   LinuxMachine _machine;
-  LoginService _login;
-  DisplaySleep _console;
-  HardDiskSleep _disks;
-  WakeOnNetworkAccess _network;
-  WakeOnModem _modem;
-  RestartAfterPowerFailure _restart;
-  RestartAfterFreeze _freeze;
+  ComputerSleep _computerSleep;
+  DisplaySleep _displaySleep;
+  HardDiskSleep _hardDiskSleep;
+  WakeOnNetworkAccess _wakeOnNetworkAccess;
+  WakeOnModem _wakeOnModem;
+  RestartAfterPowerFailure _restartAfterPowerFailure;
+  RestartAfterFreeze _restartAfterFreeze;
 };
 
 }  // namespace tavisk

@@ -10,27 +10,27 @@ namespace tavisk {
 
 /// Whether a machine that hangs restarts: the service manager keeps the watchdog's clock from running out
 /// (RuntimeWatchdogSec of systemd-system.conf(5)), and a kernel that has panicked restarts (kernel.panic). The parts
-/// may differ; the value then says which one is on.
+/// may differ; the detail then says which one is on.
 class RestartAfterFreeze {
  public:
   explicit RestartAfterFreeze(const LinuxMachine& machine) : _machine(machine), _config(machine.root, "system.conf") {}
 
-  Setting<std::string> restartAfterFreeze() const;
-  Setting<std::string> restartAfterFreezeChange() const;
+  /// Refers to the object.
+  Setting<bool> restartAfterFreeze() const;
 
  private:
   bool hasWatchdog() const;
-  Result<std::optional<std::string>> live() const;
+  Setting<bool>::Found live() const;
   /// What the service manager means to do; whether the watchdog runs is a fact of its own.
   Result<bool> isWatchdogUsed() const;
   std::string watchdogFact(const char* name) const;
-  std::string stored() const;
-  Result<void> store(const std::string& value) const;
-  Result<void> apply(const std::string& value) const;
-  Result<void> setWatchdog(bool on) const;
+  Reading<bool> stored() const;
+  Result<void> store(bool restarts) const;
+  Result<void> apply(bool restarts) const;
+  Result<void> setWatchdog(bool restarts) const;
   Result<void> setWatchdogTime(std::chrono::microseconds time) const;
   Result<void> reloadManager() const;
-  std::string storedPanic() const;
+  bool isPanicStored() const;
 
   LinuxMachine _machine;
   SystemdConfig _config;

@@ -13,19 +13,20 @@ namespace tavisk {
 /// a setting of its firmware. Both keep it themselves.
 class RestartAfterPowerFailure {
  public:
+  /// The controller must outlive the object.
   RestartAfterPowerFailure(const LinuxMachine& machine, ManagementController& controller)
       : _machine(machine), _controller(controller) {}
 
-  /// To be read, and to be changed.
-  Setting<std::string> restartAfterPowerFailure();
+  /// Asks the controller which of the two it is. Refers to the object.
+  Setting<bool> restartAfterPowerFailure();
 
  private:
-  /// Which policies the controller knows, as bits in one byte; a failure when it has none to choose from.
-  ControllerAnswer policies();
+  /// Which policies the controller knows, as bits; a failure when it has none to choose from.
+  Result<std::uint8_t> policies();
   Result<bool> controllerRestarts();
   Result<void> setController(bool restarts);
-  Setting<std::string> ofController();
-  Setting<std::string> ofFirmware(const FirmwareAttribute& attribute);
+  Setting<bool> ofController();
+  Setting<bool> ofFirmware(const FirmwareAttribute& attribute);
 
   LinuxMachine _machine;
   ManagementController& _controller;

@@ -2,10 +2,12 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/power/StartupDelayRequests.h"
 
-#include <charconv>
+#include <algorithm>
 #include <map>
 
 #include "base/Text.h"
+#include "hosts/linux/power/PowerLimits.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 
 namespace tavisk {
 namespace {
@@ -17,10 +19,8 @@ constexpr StartupDelayRequests builtIn[] = {{343, 0x30, 0x54, 0x55, 2, true, 1}}
 std::optional<std::uint32_t> numberIn(std::string_view text, std::uint32_t limit) {
   const int base = text.starts_with("0x") ? 16 : 10;
   if (base == 16) text.remove_prefix(2);
-  std::uint32_t number = 0;
-  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number, base);
-  if (error != std::errc() || end != text.data() + text.size() || number > limit) return std::nullopt;
-  return number;
+  const auto number = parseNumber<std::uint32_t>(text, base);
+  return number && *number <= limit ? number : std::nullopt;
 }
 
 using Words = std::map<std::string, std::string, std::less<>>;
@@ -36,11 +36,12 @@ std::uint32_t take(Words& words, const char* key, std::uint32_t limit, bool& isS
 std::optional<StartupDelayRequests> requestsIn(const std::string& line) {
   constexpr std::uint32_t byte = 0xFF;
   Words words;
-  for (const auto& word : split(line, " \t\r")) {
-    const auto sign = std::min(word.find('='), word.size());
-    words[word.substr(0, sign)] = word.substr(std::min(sign + 1, word.size()));
-  }
   bool isSound = true;
+  for (const auto& word : split(line, " \t\r")) {
+    const auto named = namedValueIn(word);
+    isSound = isSound && named;
+    if (named) words[named->name] = named->value;
+  }
   StartupDelayRequests found{};
   found.manufacturer = take(words, "manufacturer", 0xFFFFF, isSound);
   found.function = static_cast<std::uint8_t>(take(words, "netfn", 0x3F, isSound));
@@ -57,37 +58,33 @@ std::optional<StartupDelayRequests> requestsIn(const std::string& line) {
 
 }  // namespace
 
+std::size_t StartupDelayRequests::shiftOf(std::size_t place) const {
+  return 8 * (highByteFirst ? width - 1 - place : place);
+}
+
 std::optional<ControllerRequest> StartupDelayRequests::setting(std::uint32_t seconds) const {
   const std::uint64_t count = seconds / secondsEach;
   if (seconds % secondsEach != 0 || (count >> (8 * width)) != 0) return std::nullopt;
   ControllerRequest request{function, set, {}};
-  for (std::size_t i = 0; i < width; ++i) {
-    const auto place = highByteFirst ? width - 1 - i : i;
-    request.data.push_back(static_cast<std::uint8_t>(count >> (8 * place)));
-  }
+  for (std::size_t i = 0; i < width; ++i) request.data.push_back(static_cast<std::uint8_t>(count >> shiftOf(i)));
   return request;
 }
 
 std::optional<std::uint64_t> StartupDelayRequests::delayIn(const std::vector<std::uint8_t>& answer) const {
   if (answer.size() < width) return std::nullopt;
   std::uint64_t count = 0;
-  for (std::size_t i = 0; i < width; ++i) {
-    const auto place = highByteFirst ? width - 1 - i : i;
-    count |= std::uint64_t{answer[i]} << (8 * place);
-  }
+  for (std::size_t i = 0; i < width; ++i) count |= std::uint64_t{answer[i]} << shiftOf(i);
   return count * secondsEach;
 }
 
 Result<StartupDelayRequests> startupDelayRequests(const SystemRoot& root, std::uint32_t manufacturer) {
-  constexpr std::size_t limit = 65536;
-  for (const auto& line : split(root.read(startupDelayFile, limit).valueOr(""), "\n")) {
-    if (line.starts_with('#') || split(line, " \t\r").empty()) continue;
+  for (const auto& line : configurationLines(root.read(startupDelayFile, powerFileLimit).valueOr(""))) {
     const auto requests = requestsIn(line);
     if (!requests) return Failure{"read", startupDelayFile, "this line is not understood: " + line};
     if (requests->manufacturer == manufacturer) return *requests;
   }
-  for (const auto& requests : builtIn)
-    if (requests.manufacturer == manufacturer) return requests;
+  const auto* known = std::ranges::find(builtIn, manufacturer, &StartupDelayRequests::manufacturer);
+  if (known != std::end(builtIn)) return *known;
   return Failure{"find the requests for the start-up delay", startupDelayFile,
                  "none is known for controllers of manufacturer " + std::to_string(manufacturer)};
 }

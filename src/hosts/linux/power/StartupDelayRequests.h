@@ -26,6 +26,9 @@ struct StartupDelayRequests {
   std::optional<ControllerRequest> setting(std::uint32_t seconds) const;
   /// In seconds; absent when the answer is too short.
   std::optional<std::uint64_t> delayIn(const std::vector<std::uint8_t>& answer) const;
+
+  /// By how many bits the byte at this place is shifted in the number.
+  std::size_t shiftOf(std::size_t place) const;
 };
 
 /// The administrator's own rows, before the known ones:

@@ -2,38 +2,63 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/power/UdevRule.h"
 
-#include "hosts/linux/services/LinuxMachine.h"
+#include "base/Text.h"
+#include "hosts/linux/power/PowerLimits.h"
 #include "hosts/linux/system/OwnFiles.h"
 #include "hosts/linux/system/Rights.h"
-#include "hosts/linux/system/SystemdConfig.h"
+#include "hosts/shared/SettingChange.h"
 
 namespace tavisk {
 namespace {
 
-constexpr const char* valueLine = "# value: ";
-constexpr const char* managerSocket = "/run/udev/control";
+constexpr std::string_view valueLine = "# value: ";
+
+std::optional<std::string> textIn(const std::string& rule) {
+  const auto line = rule.find(valueLine);
+  if (line == std::string::npos) return std::nullopt;
+  const auto start = line + valueLine.size();
+  return rule.substr(start, rule.find('\n', start) - start);
+}
+
+template <typename Value>
+std::optional<Value> valueOf(const std::string& text);
+
+template <>
+std::optional<Minutes> valueOf(const std::string& text) {
+  const auto count = parseNumber<unsigned long>(text);
+  return count ? std::optional(Minutes{*count}) : std::nullopt;
+}
+
+template <>
+std::optional<bool> valueOf(const std::string& text) {
+  for (const bool isOn : {true, false})
+    if (text == textOf(isOn)) return isOn;
+  return std::nullopt;
+}
 
 }  // namespace
 
-UdevRule::UdevRule(const SystemRoot& root, const std::string& setting)
+template <typename Value>
+UdevRule<Value>::UdevRule(const SystemRoot& root, const std::string& setting)
     : _root(root), _file(ownfile::udevRule(setting)) {}
 
-std::optional<std::string> UdevRule::value() const {
-  constexpr std::size_t limit = 65536;
-  const auto text = _root.read(_file, limit).valueOr("");
-  const auto line = text.find(valueLine);
-  if (line == std::string::npos) return std::nullopt;
-  const auto start = line + std::string_view(valueLine).size();
-  return text.substr(start, text.find('\n', start) - start);
+template <typename Value>
+std::optional<Value> UdevRule<Value>::value() const {
+  const auto text = textIn(_root.read(_file, powerFileLimit).valueOr(""));
+  return text ? valueOf<Value>(*text) : std::nullopt;
 }
 
-Result<void> UdevRule::write(const std::string& value, const std::string& rule) const {
+template <typename Value>
+Result<void> UdevRule<Value>::write(Value value, const std::string& rule) const {
   if (auto failure = whyNeedsRoot("write", _file)) return *failure;
-  return _root.write(_file, std::string(ownfile::header) + valueLine + value + "\n" + rule + "\n");
+  return _root.write(_file, ownfile::header + std::string(valueLine) + textOf(value) + "\n" + rule + "\n");
 }
 
-std::string UdevRule::note() const {
-  return _root.exists(managerSocket) ? "" : "no device manager runs here: lasts until the restart";
+template class UdevRule<Minutes>;
+template class UdevRule<bool>;
+
+std::string whyNoRuleLasts(const SystemRoot& root) {
+  return root.exists("/run/udev/control") ? "" : "no device manager runs here: lasts until the restart";
 }
 
 }  // namespace tavisk

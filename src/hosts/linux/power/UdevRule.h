@@ -6,26 +6,33 @@
 #include <string>
 
 #include "hosts/shared/SystemRoot.h"
+#include "platform/PowerSettingsService.h"
 
 namespace tavisk {
 
 /// The tool's own rule for one setting (udev(7)): it sets the value again whenever the device appears. The first line
-/// of the file keeps the value itself.
+/// of the file keeps the value itself: Minutes, or bool for a switch.
+template <typename Value>
 class UdevRule {
  public:
   /// `setting` is part of the file's name: "disk-sleep". The root must outlive the object.
   UdevRule(const SystemRoot& root, const std::string& setting);
 
   const std::string& file() const { return _file; }
-  std::optional<std::string> value() const;
+  /// Absent when there is no such file.
+  std::optional<Value> value() const;
   /// `rule` is one line; it is to set what `value` means.
-  Result<void> write(const std::string& value, const std::string& rule) const;
-  /// What an administrator should know where nothing reads rules; else empty.
-  std::string note() const;
+  Result<void> write(Value value, const std::string& rule) const;
 
  private:
   const SystemRoot& _root;
   std::string _file;
 };
+
+extern template class UdevRule<Minutes>;
+extern template class UdevRule<bool>;
+
+/// What an administrator should know where no device manager reads rules and link files; else empty.
+std::string whyNoRuleLasts(const SystemRoot& root);
 
 }  // namespace tavisk

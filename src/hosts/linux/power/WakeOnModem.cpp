@@ -3,16 +3,16 @@
 #include "hosts/linux/power/WakeOnModem.h"
 
 #include "effects/SettingNames.h"
-#include "hosts/linux/power/PowerValues.h"
+#include "hosts/linux/power/DeviceValues.h"
 
 namespace tavisk {
 namespace {
 
 constexpr const char* terminals = "/sys/class/tty";
-constexpr const char* wakeup = "power/wakeup";
+constexpr const char* enabled = "enabled";
 
-const char* wordFor(const std::string& value) {
-  return isOn(value) ? "enabled" : "disabled";
+const char* wordFor(bool wakes) {
+  return wakes ? enabled : "disabled";
 }
 
 /// The place of a serial port on the board, if the port can wake the machine from there.
@@ -21,9 +21,9 @@ std::optional<SysDevice> wakingPlace(std::optional<SysDevice> device) {
   return device;
 }
 
-std::string ruleFor(const std::string& value) {
+std::string ruleFor(bool wakes) {
   return R"(ACTION!="remove", SUBSYSTEM=="pnp", DRIVER=="serial", TEST=="power/wakeup", ATTR{power/wakeup}=")" +
-         std::string(wordFor(value)) + "\"";
+         std::string(wordFor(wakes)) + "\"";
 }
 
 }  // namespace
@@ -40,41 +40,36 @@ std::vector<WakeOnModem::Port> WakeOnModem::ports() const {
 
 std::optional<Failure> WakeOnModem::whyNoPort() const {
   if (!ports().empty()) return std::nullopt;
-  return Failure{"find", "/sys/class/tty/ttyS*", "no serial port here can wake the machine"};
+  return Failure{"find", std::string(terminals) + "/ttyS*", "no serial port here can wake the machine"};
 }
 
-Result<std::optional<std::string>> WakeOnModem::live() const {
-  std::vector<DeviceValue> values;
+Setting<bool>::Found WakeOnModem::live() const {
+  std::vector<DeviceValue<bool>> values;
   for (const auto& port : ports()) {
-    auto word = port.place.read(wakeup);
+    const auto word = port.place.read(wakeSwitch);
     if (!word) return word.failure();
-    values.push_back({port.terminal, onOff(*word == "enabled")});
+    values.push_back({port.terminal, *word == enabled});
   }
-  return std::optional(valueOfAll(values));
+  return readingOfAll(std::move(values));
 }
 
-Result<void> WakeOnModem::apply(const std::string& value) const {
+Result<void> WakeOnModem::apply(bool wakes) const {
   Result<void> all;
   for (const auto& port : ports())
-    if (auto set = port.place.write(wakeup, wordFor(value)); !set && all) all = set;
+    if (auto set = port.place.write(wakeSwitch, wordFor(wakes)); !set && all) all = set;
   return all;
 }
 
-Setting<std::string> WakeOnModem::wakeOnModem() const {
-  Setting<std::string> setting;
+Setting<bool> WakeOnModem::wakeOnModem() const {
+  Setting<bool> setting;
   setting.name = setting::wakeOnModem;
+  setting.where = _rule.file();
+  setting.note = [this](bool) { return whyNoRuleLasts(_machine.root); };
   setting.supported = [this] { return whyNoPort(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return _rule.value(); };
-  return setting;
-}
-
-Setting<std::string> WakeOnModem::wakeOnModemChange() const {
-  auto setting = wakeOnModem();
-  setting.where = _rule.file();
-  setting.note = [this](const auto&) { return _rule.note(); };
-  setting.store = [this](const std::string& value) { return _rule.write(value, ruleFor(value)); };
-  setting.apply = [this](const std::string& value) { return apply(value); };
+  setting.store = [this](bool wakes) { return _rule.write(wakes, ruleFor(wakes)); };
+  setting.apply = [this](bool wakes) { return apply(wakes); };
   return setting;
 }
 

@@ -17,8 +17,8 @@ class WakeOnModem {
  public:
   explicit WakeOnModem(const LinuxMachine& machine) : _machine(machine), _rule(machine.root, "wake-on-ring") {}
 
-  Setting<std::string> wakeOnModem() const;
-  Setting<std::string> wakeOnModemChange() const;
+  /// Refers to the object.
+  Setting<bool> wakeOnModem() const;
 
  private:
   struct Port {
@@ -27,11 +27,11 @@ class WakeOnModem {
   };
   std::vector<Port> ports() const;
   std::optional<Failure> whyNoPort() const;
-  Result<std::optional<std::string>> live() const;
-  Result<void> apply(const std::string& value) const;
+  Setting<bool>::Found live() const;
+  Result<void> apply(bool wakes) const;
 
   LinuxMachine _machine;
-  UdevRule _rule;
+  UdevRule<bool> _rule;
 };
 
 }  // namespace tavisk

@@ -2,9 +2,22 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/power/WakeOnNetworkAccess.h"
 
+#include <linux/ethtool.h>
+#include <linux/sockios.h>
+#include <net/if.h>
+#include <sys/ioctl.h>
+#include <sys/socket.h>
+
+#include <cerrno>
+
+#include "base/FileDescriptor.h"
+#include "base/Path.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/power/OtherOwners.h"
-#include "hosts/linux/power/PowerValues.h"
+#include "hosts/linux/power/PowerLimits.h"
+#include "hosts/linux/power/UdevRule.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/OwnFiles.h"
 #include "hosts/linux/system/Rights.h"
@@ -14,12 +27,30 @@
 namespace tavisk {
 namespace {
 
+static_assert(magicPacket == WAKE_MAGIC);
+
 constexpr const char* cardFolder = "/sys/class/net/";
 constexpr const char* usualLinkFile = "99-default.link";
 constexpr const char* hidingLink = "/etc/systemd/network/99-default.link";
 constexpr const char* section = "Link";
 constexpr const char* key = "WakeOnLan";
-constexpr std::size_t fileLimit = 65536;
+constexpr const char* never = "off";
+
+Failure failureOf(const char* tried, const std::string& card, int error) {
+  const auto forRoot = error == EPERM ? whyNeedsRoot(tried, card) : std::nullopt;
+  return forRoot.value_or(systemFailure(tried, card, error));
+}
+
+/// Passes a request on to the driver of the card, which may fill it in.
+Result<void> ask(const char* tried, const std::string& card, ethtool_wolinfo& modes) {
+  const FileDescriptor socket(::socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0));
+  if (!socket) return failureOf(tried, card, errno);
+  ifreq request{};
+  card.copy(request.ifr_name, sizeof request.ifr_name - 1);
+  request.ifr_data = reinterpret_cast<char*>(&modes);
+  if (::ioctl(socket.number(), SIOCETHTOOL, &request) != 0) return failureOf(tried, card, errno);
+  return {};
+}
 
 /// Of a card on a USB or platform bus it is often the device above that wakes; of a PCI card it is the card.
 bool isKnownToWake(const std::optional<SysDevice>& device) {
@@ -29,6 +60,25 @@ bool isKnownToWake(const std::optional<SysDevice>& device) {
 }
 
 }  // namespace
+
+Result<WakeModes> KernelNetworkCards::wakeModes(const std::string& card) {
+  if (_root.prefix() != "/") return WakeModes{};
+  ethtool_wolinfo modes{};
+  modes.cmd = ETHTOOL_GWOL;
+  const auto answer = ask("ETHTOOL_GWOL", card, modes);
+  if (answer) return WakeModes{modes.supported, modes.wolopts};
+  if (answer.failure().code == std::errc::operation_not_supported) return WakeModes{};
+  return answer.failure();
+}
+
+Result<void> KernelNetworkCards::setWakeModes(const std::string& card, std::uint32_t modes) {
+  constexpr const char* tried = "ETHTOOL_SWOL";
+  if (_root.prefix() != "/") return Failure{tried, card, "a tree of files has no network cards"};
+  ethtool_wolinfo wanted{};
+  wanted.cmd = ETHTOOL_SWOL;
+  wanted.wolopts = modes;
+  return ask(tried, card, wanted);
+}
 
 Result<bool> WakeOnNetworkAccess::canWake(const std::string& card) const {
   if (!isKnownToWake(SysDevice::at(_machine.root, cardFolder + card + "/device"))) return false;
@@ -54,36 +104,34 @@ std::optional<Failure> WakeOnNetworkAccess::whyNoCard() const {
   return Failure{"find", "/sys/class/net", "no network card here can wake the machine"};
 }
 
-Result<std::optional<std::string>> WakeOnNetworkAccess::live() const {
+Setting<bool>::Found WakeOnNetworkAccess::live() const {
   const auto cards = wakingCards();
   if (!cards) return cards.failure();
-  std::vector<DeviceValue> values;
+  std::vector<DeviceValue<bool>> values;
   for (const auto& card : *cards) {
     const auto modes = _cards.wakeModes(card);
     if (!modes) return modes.failure();
-    values.push_back({card, onOff(modes->enabled != 0)});
+    values.push_back({card, modes->enabled != 0});
   }
-  return std::optional(valueOfAll(values));
+  return readingOfAll(std::move(values));
 }
 
-Result<void> WakeOnNetworkAccess::apply(const std::string& value) const {
+Result<void> WakeOnNetworkAccess::apply(bool wakes) const {
   const auto cards = wakingCards();
   if (!cards) return cards.failure();
   Result<void> all;
   for (const auto& card : *cards)
-    if (auto set = _cards.setWakeModes(card, isOn(value) ? magicPacket : 0); !set && all) all = set;
+    if (auto set = _cards.setWakeModes(card, wakes ? magicPacket : 0); !set && all) all = set;
   return all;
 }
 
 /// The device manager notes by which file it has set up a card.
 std::string WakeOnNetworkAccess::linkFileOf(const std::string& card) const {
-  constexpr std::string_view property = "\nE:ID_NET_LINK_FILE=";
   const auto number = readKernelFile(_machine.root, cardFolder + card + "/ifindex").valueOr("");
-  const auto facts = "\n" + _machine.root.read("/run/udev/data/n" + number, fileLimit).valueOr("") + "\n";
-  const auto start = facts.find(property);
-  if (start == std::string::npos) return usualLinkFile;
-  const auto path = facts.substr(start + property.size(), facts.find('\n', start + 1) - start - property.size());
-  return path.substr(path.rfind('/') + 1);
+  const auto facts = _machine.root.read("/run/udev/data/n" + number, powerFileLimit).valueOr("");
+  for (const auto& line : configurationLines(facts))
+    if (const auto fact = namedValueIn(line); fact && fact->name == "E:ID_NET_LINK_FILE") return baseName(fact->value);
+  return usualLinkFile;
 }
 
 /// The usual one as well, for cards that are still to come.
@@ -93,47 +141,43 @@ std::set<std::string> WakeOnNetworkAccess::dropIns() const {
   return files;
 }
 
-Result<std::optional<std::string>> WakeOnNetworkAccess::stored() const {
-  std::vector<DeviceValue> values;
+std::optional<Reading<bool>> WakeOnNetworkAccess::stored() const {
+  std::vector<DeviceValue<bool>> values;
   for (const auto& file : dropIns()) {
-    const auto words = assignments(_machine.root.read(file, fileLimit).valueOr(""), section, key);
-    values.push_back({file, words.empty() ? "" : onOff(words.back() != "off")});
+    const auto words = assignments(_machine.root.read(file, powerFileLimit).valueOr(""), section, key);
+    values.push_back({file, words.empty() ? std::nullopt : std::optional(words.back() != never)});
   }
-  auto value = valueOfAll(values);
-  return value.empty() ? std::nullopt : std::optional(std::move(value));
+  return readingOfAll(std::move(values));
 }
 
-Result<void> WakeOnNetworkAccess::store(const std::string& value) const {
+Result<void> WakeOnNetworkAccess::store(bool wakes) const {
   for (const auto& file : dropIns()) {
     if (auto failure = whyNeedsRoot("write", file)) return *failure;
-    const auto text = std::string(ownfile::header) + "[Link]\nWakeOnLan=" + (isOn(value) ? "magic" : "off") + "\n";
+    const auto text = std::string(ownfile::header) + "[Link]\nWakeOnLan=" + (wakes ? "magic" : never) + "\n";
     if (auto written = _machine.root.write(file, text); !written) return written;
   }
   return {};
 }
 
-Setting<std::string> WakeOnNetworkAccess::wakeOnNetworkAccess() const {
-  Setting<std::string> setting;
+std::string WakeOnNetworkAccess::whyItDoesNotLast() const {
+  const auto reason = whyNoRuleLasts(_machine.root);
+  if (!reason.empty() || _machine.root.readLink(hidingLink).valueOr("") != "/dev/null") return reason;
+  return std::string(hidingLink) + " hides the file: lasts until the restart";
+}
+
+Setting<bool> WakeOnNetworkAccess::wakeOnNetworkAccess() const {
+  Setting<bool> setting;
   setting.name = setting::wakeOnNetworkAccess;
+  setting.where = ownfile::linkDropIn(usualLinkFile);
+  setting.undoneBy = [this](bool) {
+    return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::networkManager});
+  };
+  setting.note = [this](bool) { return whyItDoesNotLast(); };
   setting.supported = [this] { return whyNoCard(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };
-  return setting;
-}
-
-Setting<std::string> WakeOnNetworkAccess::wakeOnNetworkAccessChange() const {
-  auto setting = wakeOnNetworkAccess();
-  setting.where = ownfile::linkDropIn(usualLinkFile);
-  if (!_machine.root.exists("/run/udev/control"))
-    setting.note = saying("no device manager runs here: lasts until the restart");
-  else if (_machine.root.readLink(hidingLink).valueOr("") == "/dev/null")
-    setting.note = [text = std::string(std::string(hidingLink) + " hides the file: lasts until the restart")](
-                       const auto&) { return text; };
-  setting.undoneBy = [this](const auto&) {
-    return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::networkManager});
-  };
-  setting.store = [this](const std::string& value) { return store(value); };
-  setting.apply = [this](const std::string& value) { return apply(value); };
+  setting.store = [this](bool wakes) { return store(wakes); };
+  setting.apply = [this](bool wakes) { return apply(wakes); };
   return setting;
 }
 

@@ -2,34 +2,66 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstdint>
 #include <set>
 #include <vector>
 
-#include "hosts/linux/power/NetworkCards.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/SettingChange.h"
 
 namespace tavisk {
 
+/// By which packets a network card wakes the machine: bits WAKE_... of linux/ethtool.h.
+struct WakeModes {
+  std::uint32_t supported = 0;
+  std::uint32_t enabled = 0;
+};
+
+inline constexpr std::uint32_t magicPacket = 1U << 5U;
+
+/// The network cards' settings that no file has.
+class NetworkCards {
+ public:
+  virtual ~NetworkCards() = default;
+  /// A card without such modes has none supported.
+  virtual Result<WakeModes> wakeModes(const std::string& card) = 0;
+  /// Success proves nothing: some drivers ignore it.
+  virtual Result<void> setWakeModes(const std::string& card, std::uint32_t modes) = 0;
+};
+
+/// The cards of this machine (ETHTOOL_GWOL, ETHTOOL_SWOL); a tree of files has none.
+class KernelNetworkCards final : public NetworkCards {
+ public:
+  /// The root must outlive the object.
+  explicit KernelNetworkCards(const SystemRoot& root) : _root(root) {}
+  Result<WakeModes> wakeModes(const std::string& card) override;
+  Result<void> setWakeModes(const std::string& card, std::uint32_t modes) override;
+
+ private:
+  const SystemRoot& _root;
+};
+
 /// Whether a magic packet wakes the machine, on every card that can: its driver says so, and the kernel knows the
 /// device as one that wakes. Some drivers only say so.
 class WakeOnNetworkAccess {
  public:
+  /// The cards must outlive the object.
   WakeOnNetworkAccess(const LinuxMachine& machine, NetworkCards& cards) : _machine(machine), _cards(cards) {}
 
-  Setting<std::string> wakeOnNetworkAccess() const;
-  Setting<std::string> wakeOnNetworkAccessChange() const;
+  /// Refers to the object.
+  Setting<bool> wakeOnNetworkAccess() const;
 
  private:
   Result<bool> canWake(const std::string& card) const;
   Result<std::vector<std::string>> wakingCards() const;
   std::optional<Failure> whyNoCard() const;
-  Result<std::optional<std::string>> live() const;
-  Result<std::optional<std::string>> stored() const;
-  Result<void> store(const std::string& value) const;
-  Result<void> apply(const std::string& value) const;
+  Setting<bool>::Found live() const;
+  std::optional<Reading<bool>> stored() const;
+  Result<void> store(bool wakes) const;
+  Result<void> apply(bool wakes) const;
   std::set<std::string> dropIns() const;
   std::string linkFileOf(const std::string& card) const;
+  std::string whyItDoesNotLast() const;
 
   LinuxMachine _machine;
   NetworkCards& _cards;

@@ -19,6 +19,7 @@ namespace tavisk {
 namespace {
 
 constexpr std::chrono::seconds timeForQuestions{300};
+constexpr const char* propertiesInterface = "org.freedesktop.DBus.Properties";
 
 struct KnownError {
   BusErrorCode code;
@@ -93,21 +94,22 @@ Bus::~Bus() {
 
 Result<std::unique_ptr<Bus>> Bus::open(const SystemdLibrary& library, const SystemRoot& root, const std::string& socket,
                                        Kind kind, RunLoop* runLoop) {
-  auto connection = connectLocalSocket(root, socket, SOCK_STREAM | SOCK_NONBLOCK);
+  const auto connection = connectLocalSocket(root, socket, SOCK_STREAM | SOCK_NONBLOCK);
   if (!connection) return connection.failure();
   sd_bus* handle = nullptr;
-  if (int result = library.sd_bus_new(&handle); result < 0) return systemFailure("sd_bus_new", socket, -result);
+  if (const int result = library.sd_bus_new(&handle); result < 0) return systemFailure("sd_bus_new", socket, -result);
   std::unique_ptr<Bus> bus(new Bus(library, handle, kind, runLoop));
-  if (int result = bus->start(*connection); result < 0) return systemFailure("start the connection", socket, -result);
+  if (const int result = bus->start(*connection); result < 0)
+    return systemFailure("start the connection", socket, -result);
   return bus;
 }
 
 int Bus::start(const FileDescriptor& connection) {
-  int own = ::fcntl(connection.number(), F_DUPFD_CLOEXEC, 0);
+  const int own = ::fcntl(connection.number(), F_DUPFD_CLOEXEC, 0);
   if (own < 0) return -errno;
-  if (int result = _library.sd_bus_set_fd(_bus, own, own); result < 0) return result;
+  if (const int result = _library.sd_bus_set_fd(_bus, own, own); result < 0) return result;
   if (_kind == Kind::messageBus) _library.sd_bus_set_bus_client(_bus, 1);
-  if (int result = _library.sd_bus_start(_bus); result < 0) return result;
+  if (const int result = _library.sd_bus_start(_bus); result < 0) return result;
   return awaitReady();
 }
 
@@ -118,14 +120,15 @@ std::chrono::microseconds Bus::timeFor(std::chrono::seconds longest) const {
 
 /// The library itself would wait for its peer's greeting far longer than a command may last.
 int Bus::awaitReady() {
-  auto deadline = std::chrono::steady_clock::now() + timeFor(usualTime);
+  const auto deadline = std::chrono::steady_clock::now() + timeFor(usualTime);
   while (_library.sd_bus_is_ready(_bus) == 0) {
-    int result = _library.sd_bus_process(_bus, nullptr);
+    const int result = _library.sd_bus_process(_bus, nullptr);
     if (result < 0) return result;
     if (result > 0) continue;
-    auto left = std::chrono::duration_cast<std::chrono::microseconds>(deadline - std::chrono::steady_clock::now());
+    const auto left =
+        std::chrono::duration_cast<std::chrono::microseconds>(deadline - std::chrono::steady_clock::now());
     if (left.count() <= 0) return -ETIMEDOUT;
-    if (result = _library.sd_bus_wait(_bus, microseconds(left)); result < 0) return result;
+    if (const int waited = _library.sd_bus_wait(_bus, microseconds(left)); waited < 0) return waited;
   }
   return 0;
 }
@@ -144,7 +147,7 @@ const char* Bus::destination(const BusObject& object) const {
 }
 
 bool Bus::wasSilent(const BusObject& object) const {
-  auto since = _silentSince.find(object.service);
+  const auto since = _silentSince.find(object.service);
   return since != _silentSince.end() && std::chrono::steady_clock::now() - since->second < timeWithoutRetry;
 }
 
@@ -167,7 +170,7 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
   if (result < 0) return systemFailure(member, object.path, -result);
   BusMessage request(_library, handle);
   arguments(request);
-  if (request.error() < 0) return systemFailure(member, object.path, -request.error());
+  if (const auto error = request.error()) return systemFailure(member, object.path, error.value());
   const auto left = timeFor(longest);
   if (left.count() == 0) return systemFailure(member, object.path, ETIMEDOUT);
   const auto question = mayAsk && _runLoop ? _runLoop->pauseLimit() : RunLoop::Registration();
@@ -188,9 +191,9 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
 }
 
 Result<BusMessage> Bus::property(const BusObject& object, const char* name, const char* signature) {
-  const BusObject properties{object.service, object.path, "org.freedesktop.DBus.Properties"};
+  const BusObject properties{object.service, object.path, propertiesInterface};
   auto reply = query(properties, "Get", "v", object.interface, name);
-  if (!reply) return Failure{name, object.path, reply.failure().why};
+  if (!reply) return retold(reply.failure(), name, object.path);
   auto value = std::move(reply).value();
   if (!value.enter('v', signature)) return Failure{name, object.path, "the value has another type than expected"};
   return value;
@@ -213,8 +216,8 @@ int Bus::Subscription::receive(sd_bus_message* message, void* subscription, sd_b
 Result<std::unique_ptr<Bus::Subscription>> Bus::subscribe(const BusObject& object, const char* signal,
                                                           SignalHandler handler) {
   auto subscription = std::make_unique<Subscription>(_library, std::move(handler));
-  int result = _library.sd_bus_match_signal(_bus, &subscription->_slot, destination(object), object.path.c_str(),
-                                            object.interface, signal, &Subscription::receive, subscription.get());
+  const int result = _library.sd_bus_match_signal(_bus, &subscription->_slot, destination(object), object.path.c_str(),
+                                                  object.interface, signal, &Subscription::receive, subscription.get());
   if (result < 0) return systemFailure(signal, object.path, -result);
   return subscription;
 }

@@ -106,6 +106,7 @@ class Bus {
  private:
   Bus(const SystemdLibrary& library, sd_bus* bus, Kind kind, RunLoop* runLoop);
   std::chrono::microseconds timeFor(std::chrono::seconds longest) const;
+  /// These two answer as the library does: negative is an errno value.
   int start(const FileDescriptor& connection);
   int awaitReady();
   Result<BusMessage> exchange(const BusObject& object, const char* member, const char* replySignature,

@@ -23,7 +23,7 @@ BusMessage::~BusMessage() {
 }
 
 void BusMessage::note(int result) {
-  if (result < 0 && _error == 0) _error = result;
+  if (result < 0 && !_error) _error = std::error_code(-result, std::generic_category());
 }
 
 void BusMessage::append(char type, const void* value) {
@@ -50,7 +50,7 @@ void BusMessage::write(std::uint64_t value) {
 }
 
 void BusMessage::write(bool value) {
-  int number = value ? 1 : 0;
+  const int number = value ? 1 : 0;
   append('b', &number);
 }
 

@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <string>
+#include <system_error>
 #include <vector>
 
 #include "base/FileDescriptor.h"
@@ -34,8 +35,8 @@ class BusMessage {
   void write(const std::vector<std::string>& texts);
   void open(char type, const char* contents);
   void close();
-  /// Negative (an errno value) when something could not be written or read.
-  int error() const { return _error; }
+  /// Why something could not be written or read, the first time.
+  std::error_code error() const { return _error; }
 
   /// A text or an object path.
   std::string readText();
@@ -52,13 +53,14 @@ class BusMessage {
 
  private:
   void append(char type, const void* value);
+  /// `result` is the library's answer: negative, it is an errno value.
   void note(int result);
   template <typename Number>
   Number readNumber(char type);
 
   const SystemdLibrary* _library;
   sd_bus_message* _message;
-  int _error = 0;
+  std::error_code _error;
 };
 
 }  // namespace tavisk

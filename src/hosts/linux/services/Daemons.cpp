@@ -19,7 +19,7 @@ Result<DaemonGroup> DaemonGroup::present() const {
   auto found = *this;
   found._members.clear();
   for (const auto& member : _members) {
-    auto presence = _daemons.presence(member);
+    const auto presence = _daemons.presence(member);
     if (!presence) return presence.failure();
     if (*presence != Daemons::Presence::absent) found._members.push_back(member);
   }
@@ -29,7 +29,7 @@ Result<DaemonGroup> DaemonGroup::present() const {
 Result<std::vector<Daemon>> DaemonGroup::those(Result<bool> (Daemons::*are)(const Daemon&)) const {
   std::vector<Daemon> found;
   for (const auto& member : _members) {
-    auto is = (_daemons.*are)(member);
+    const auto is = (_daemons.*are)(member);
     if (!is) return is.failure();
     if (*is) found.push_back(member);
   }
@@ -47,7 +47,7 @@ Result<std::vector<Daemon>> DaemonGroup::startingAtBoot() const {
 Result<void> DaemonGroup::setAllStartAtBoot(bool start) const {
   std::vector<Daemon> others;
   for (const auto& member : _members) {
-    auto starts = _daemons.startsAtBoot(member);
+    const auto starts = _daemons.startsAtBoot(member);
     if (!starts) return starts.failure();
     if (*starts != start) others.push_back(member);
   }
@@ -56,7 +56,7 @@ Result<void> DaemonGroup::setAllStartAtBoot(bool start) const {
 
 Result<void> DaemonGroup::startAll() const {
   for (const auto& member : _members) {
-    auto runs = _daemons.isRunning(member);
+    const auto runs = _daemons.isRunning(member);
     if (!runs) return runs.failure();
     if (*runs) continue;
     if (auto started = _daemons.start(member); !started) return started;
@@ -67,7 +67,7 @@ Result<void> DaemonGroup::startAll() const {
 Result<void> DaemonGroup::stopAll() const {
   const std::vector<Daemon> backwards(_members.rbegin(), _members.rend());
   for (const auto& member : backwards) {
-    auto runs = _daemons.isRunning(member);
+    const auto runs = _daemons.isRunning(member);
     if (!runs) return runs.failure();
     if (!*runs) continue;
     if (auto stopped = _daemons.stop(member); !stopped) return stopped;

@@ -2,16 +2,12 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/services/InitScriptDaemons.h"
 
-#include <sys/syscall.h>
-#include <unistd.h>
-
 #include <chrono>
 #include <string_view>
-#include <vector>
+#include <utility>
 
-#include "base/FileDescriptor.h"
 #include "base/Text.h"
-#include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/linux/system/ProcessHandle.h"
 #include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
 
@@ -23,6 +19,7 @@ constexpr const char* levelFolder = "/etc/rc2.d";
 constexpr const char* linkTool = "/usr/sbin/update-rc.d";
 constexpr std::chrono::seconds longestStart{3};
 constexpr std::chrono::seconds longestStop{3};
+constexpr std::chrono::milliseconds betweenLooks{20};
 constexpr std::size_t processFileLimit = 64;
 
 std::string scriptOf(const Daemon& daemon) {
@@ -37,7 +34,7 @@ bool isLinkTo(std::string_view script, std::string_view kinds, std::string_view 
 }  // namespace
 
 Result<Daemons::Presence> InitScriptDaemons::presence(const Daemon& daemon) {
-  bool hasScript = *daemon.script != '\0' && _root.exists(scriptOf(daemon));
+  const bool hasScript = *daemon.script != '\0' && _root.exists(scriptOf(daemon));
   return hasScript && hasProgram(daemon) ? Presence::installed : Presence::absent;
 }
 
@@ -96,22 +93,24 @@ Result<void> InitScriptDaemons::stop(const Daemon& daemon) {
 
 /// A daemon may write the file with its process id after its script has ended.
 bool InitScriptDaemons::awaitBeginning(const Daemon& daemon) {
-  auto runs = [&] { return !processes(daemon).empty(); };
+  const auto runs = [&] { return !processes(daemon).empty(); };
   if (*daemon.processFile == '\0') return runs();
-  auto looking = _runLoop.every(std::chrono::milliseconds(20), [] {});
+  const auto looking = _runLoop.every(betweenLooks, [] {});
   return _runLoop.runUntil(RunLoop::Clock::now() + longestStart, runs);
 }
 
 /// The script may have sent a signal and not waited.
 Result<void> InitScriptDaemons::awaitEnd(const Daemon& daemon) {
-  std::vector<FileDescriptor> handles;
+  std::vector<ProcessHandle> handles;
   std::vector<RunLoop::Registration> watches;
-  for (auto process : processes(daemon)) {
-    handles.emplace_back(static_cast<int>(::syscall(SYS_pidfd_open, process, 0)));
-    auto ended = [&watches, index = watches.size()] { watches[index].cancel(); };
-    watches.push_back(_runLoop.watch(handles.back().number(), RunLoop::Readiness::readable, ended));
+  for (const auto process : processes(daemon)) {
+    auto handle = ProcessHandle::of(process);
+    if (!handle) continue;  // it has ended since
+    handles.push_back(std::move(handle).value());
+    const auto stopLooking = [&watches, index = watches.size()] { watches[index].cancel(); };
+    watches.push_back(_runLoop.watch(handles.back().descriptor(), RunLoop::Readiness::readable, stopLooking));
   }
-  auto isGone = [&] { return processes(daemon).empty(); };
+  const auto isGone = [&] { return processes(daemon).empty(); };
   if (_runLoop.runUntil(RunLoop::Clock::now() + longestStop, isGone)) return {};
   return Failure{"stop", scriptOf(daemon), "it reported success, but " + std::string(daemon.program) + " still runs"};
 }
@@ -121,7 +120,7 @@ Result<void> InitScriptDaemons::restart(const Daemon& daemon) {
 }
 
 Result<void> InitScriptDaemons::restartIfRunning(const Daemon& daemon) {
-  auto running = isRunning(daemon);
+  const auto running = isRunning(daemon);
   if (!running || !*running) return {};
   return runScript(daemon, "restart");
 }
@@ -132,7 +131,7 @@ Result<void> InitScriptDaemons::runScript(const Daemon& daemon, const char* acti
 
 Result<void> InitScriptDaemons::run(const std::vector<std::string>& words) {
   if (auto failure = whyNeedsRoot("run", words.front())) return *failure;
-  auto printed = runProgram(_root, words, _runLoop);
+  const auto printed = runProgram(_root, words, _runLoop);
   if (!printed) return printed.failure();
   return {};
 }

@@ -21,7 +21,7 @@ bool ServiceAccess::hasServiceManager() const {
 
 Result<const SystemdLibrary*> ServiceAccess::library() {
   if (!_library) {
-    auto opened = openSystemdLibrary();
+    const auto opened = openSystemdLibrary();
     if (!opened) return opened.failure();
     _library = *opened;
   }
@@ -30,7 +30,7 @@ Result<const SystemdLibrary*> ServiceAccess::library() {
 
 Result<std::unique_ptr<Bus>> ServiceAccess::open(const Connection& connection) {
   if (!hasServiceManager()) return Failure{"connect", connection.socket, "this machine has no service manager"};
-  auto opened = library();
+  const auto opened = library();
   if (!opened) return opened.failure();
   return Bus::open(**opened, _root, connection.socket, connection.kind, &_runLoop);
 }

@@ -5,6 +5,7 @@
 #include <algorithm>
 
 #include "base/Text.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 
 namespace tavisk {
 namespace {
@@ -48,12 +49,8 @@ bool isCritical(const std::string& unit) {
 /// The words behind the last "purpose =".
 std::vector<std::string> wordsOf(const std::string& text, std::string_view purpose) {
   std::vector<std::string> words;
-  for (const auto& line : split(text, "\n")) {
-    const auto sign = line.find('=');
-    if (sign == std::string::npos || line.front() == '#') continue;
-    const auto names = split(line.substr(0, sign), " \t\r");
-    if (names.size() == 1 && names.front() == purpose) words = split(line.substr(sign + 1), " \t\r");
-  }
+  for (const auto& line : configurationLines(text))
+    if (const auto named = namedValueIn(line); named && named->name == purpose) words = split(named->value, " \t\r");
   return words;
 }
 

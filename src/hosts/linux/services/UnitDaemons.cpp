@@ -6,38 +6,30 @@
 #include <map>
 #include <vector>
 
-#include "hosts/linux/services/ServiceAccess.h"
+#include "hosts/linux/services/SystemServices.h"
 
 namespace tavisk {
 namespace {
 
-constexpr const char* service = "org.freedesktop.systemd1";
 constexpr const char* enabledUntilRestart = "enabled-runtime";
 constexpr std::chrono::seconds longestJob{3};
-// The manager reads all unit files again.
-constexpr std::chrono::seconds longestReload{10};
-
-BusObject manager() {
-  return {service, "/org/freedesktop/systemd1", "org.freedesktop.systemd1.Manager"};
-}
 
 /// What failed was asked about this unit, not about the manager as a whole.
-Failure about(const Daemon& daemon, Failure failure) {
-  failure.on = daemon.unit;
-  return failure;
+Failure about(const Daemon& daemon, const Failure& failure) {
+  return retold(failure, failure.tried, daemon.unit);
 }
 
 /// "ConditionVirtualization=!container", the first condition that does not hold; empty when all do.
-std::string unmetCondition(BusMessage& conditions) {
+std::string firstUnmet(BusMessage& conditions) {
   std::string unmet;
   if (!conditions.enter('a', "(sbbsi)")) return unmet;
   while (unmet.empty() && conditions.enter('r', "sbbsi")) {
     auto name = conditions.readText();
-    bool triggers = conditions.readBoolean();
-    bool negated = conditions.readBoolean();
-    auto parameter = conditions.readText();
+    const bool isTrigger = conditions.readBoolean();
+    const bool isNegated = conditions.readBoolean();
+    const auto parameter = conditions.readText();
     if (conditions.readInt32() < 0)
-      unmet = std::move(name).append("=").append(triggers ? "|" : "").append(negated ? "!" : "").append(parameter);
+      unmet = std::move(name).append("=").append(isTrigger ? "|" : "").append(isNegated ? "!" : "").append(parameter);
     conditions.exit();
   }
   return unmet;
@@ -47,24 +39,24 @@ std::string unmetCondition(BusMessage& conditions) {
 class EndedJobs {
  public:
   Result<void> listen(Bus& bus) {
-    auto subscription = bus.subscribe(manager(), "JobRemoved", [this](BusMessage& signal) { note(signal); });
+    auto subscription = bus.subscribe(serviceManager(), "JobRemoved", [this](BusMessage& signal) { note(signal); });
     if (!subscription) return subscription.failure();
     _subscription = std::move(subscription).value();
     return {};
   }
   /// "done", or what else became of the job; null while it has not ended.
   const std::string* resultOf(const std::string& job) const {
-    auto ended = _results.find(job);
+    const auto ended = _results.find(job);
     return ended == _results.end() ? nullptr : &ended->second;
   }
 
  private:
   void note(BusMessage& signal) {
     signal.readUint32();
-    auto job = signal.readText();
+    const auto job = signal.readText();
     signal.readText();
-    auto result = signal.readText();
-    if (signal.error() == 0) _results[job] = result;
+    const auto result = signal.readText();
+    if (!signal.error()) _results[job] = result;
   }
 
   std::map<std::string, std::string> _results;
@@ -74,9 +66,9 @@ class EndedJobs {
 }  // namespace
 
 Result<BusMessage> UnitDaemons::ask(const Daemon& daemon, const char* member, const char* replySignature) {
-  auto bus = _services.serviceManager();
+  const auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
-  auto reply = (*bus)->query(manager(), member, replySignature, daemon.unit);
+  auto reply = (*bus)->query(serviceManager(), member, replySignature, daemon.unit);
   if (!reply) return about(daemon, reply.failure());
   return reply;
 }
@@ -84,9 +76,9 @@ Result<BusMessage> UnitDaemons::ask(const Daemon& daemon, const char* member, co
 template <typename... Arguments>
 Result<BusMessage> UnitDaemons::order(const Daemon& daemon, const char* member, const char* replySignature,
                                       const Arguments&... arguments) {
-  auto bus = _services.serviceManager();
+  const auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
-  auto reply = (*bus)->call(manager(), member, replySignature, arguments...);
+  auto reply = (*bus)->call(serviceManager(), member, replySignature, arguments...);
   if (!reply) return about(daemon, reply.failure());
   return reply;
 }
@@ -94,10 +86,9 @@ Result<BusMessage> UnitDaemons::order(const Daemon& daemon, const char* member, 
 Result<BusMessage> UnitDaemons::unitProperty(const Daemon& daemon, const char* name, const char* signature) {
   auto unit = ask(daemon, "LoadUnit", "o");
   if (!unit) return unit.failure();
-  auto path = std::move(unit).value().readText();
-  auto bus = _services.serviceManager();
+  const auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
-  auto value = (*bus)->property({service, path, "org.freedesktop.systemd1.Unit"}, name, signature);
+  auto value = (*bus)->property(unitAt(std::move(unit).value().readText()), name, signature);
   if (!value) return about(daemon, value.failure());
   return value;
 }
@@ -106,7 +97,7 @@ Result<BusMessage> UnitDaemons::unitProperty(const Daemon& daemon, const char* n
 Result<Daemons::Presence> UnitDaemons::presence(const Daemon& daemon) {
   auto state = unitProperty(daemon, "LoadState", "s");
   if (!state) return state.failure();
-  auto word = std::move(state).value().readText();
+  const auto word = std::move(state).value().readText();
   if (word == "masked") return Presence::masked;
   return word == "not-found" ? Presence::absent : Presence::installed;
 }
@@ -114,7 +105,7 @@ Result<Daemons::Presence> UnitDaemons::presence(const Daemon& daemon) {
 Result<bool> UnitDaemons::isRunning(const Daemon& daemon) {
   auto state = unitProperty(daemon, "ActiveState", "s");
   if (!state) return state.failure();
-  auto word = std::move(state).value().readText();
+  const auto word = std::move(state).value().readText();
   return word == "active" || word == "activating" || word == "reloading";
 }
 
@@ -126,7 +117,7 @@ Result<std::string> UnitDaemons::fileState(const Daemon& daemon) {
 }
 
 Result<bool> UnitDaemons::startsAtBoot(const Daemon& daemon) {
-  auto state = fileState(daemon);
+  const auto state = fileState(daemon);
   if (!state) return state.failure();
   return *state == "enabled" || *state == enabledUntilRestart;
 }
@@ -141,7 +132,7 @@ Result<void> UnitDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, boo
     isAnyChanged = true;
   }
   if (!isAnyChanged) return last;
-  auto reloaded = reload();
+  auto reloaded = reloadServiceManager(_services);
   return last ? reloaded : last;
 }
 
@@ -151,31 +142,23 @@ Result<void> UnitDaemons::changeLinks(const Daemon& daemon, bool start) {
   const auto state = fileState(daemon);
   if (!state) return state.failure();
   const bool untilRestart = !start && *state == enabledUntilRestart;
-  auto changed = start ? order(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
-                       : order(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
+  const auto changed = start ? order(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
+                             : order(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
   if (!changed) return changed.failure();
   return {};
 }
 
-Result<void> UnitDaemons::reload() {
-  auto bus = _services.serviceManager();
-  if (!bus) return bus.failure();
-  auto reloaded = (*bus)->call(manager(), "Reload", "", Bus::Writer([](BusMessage&) {}), longestReload);
-  if (!reloaded) return reloaded.failure();
-  return {};
-}
-
 Result<void> UnitDaemons::runJob(const Daemon& daemon, const char* method) {
-  auto bus = _services.serviceManager();
+  const auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
   EndedJobs ended;
   if (auto listens = ended.listen(**bus); !listens) return listens;
-  auto reply = (*bus)->call(manager(), method, "o", daemon.unit, "replace");
+  auto reply = (*bus)->call(serviceManager(), method, "o", daemon.unit, "replace");
   if (!reply) return about(daemon, reply.failure());
-  auto job = std::move(reply).value().readText();
+  const auto job = std::move(reply).value().readText();
 
-  auto watching = _runLoop.watch((*bus)->descriptor(), RunLoop::Readiness::readable, [] {});
-  auto hasEnded = [&] {
+  const auto watching = _runLoop.watch((*bus)->descriptor(), RunLoop::Readiness::readable, [] {});
+  const auto hasEnded = [&] {
     (*bus)->process();
     return ended.resultOf(job) || !(*bus)->isOpen();
   };
@@ -189,19 +172,23 @@ Result<void> UnitDaemons::runJob(const Daemon& daemon, const char* method) {
 
 /// A job can be "done" and the unit not run: a condition of it may not hold, as in a container.
 Failure UnitDaemons::whyNotRunning(const Daemon& daemon) {
-  Failure failure{"StartUnit", daemon.unit, "its job is done, but the unit does not run"};
+  const auto unmet = unmetCondition(daemon);
+  const auto reason = unmet ? ": the condition " + *unmet + " does not hold" : "";
+  return {"StartUnit", daemon.unit, "its job is done, but the unit does not run" + reason};
+}
+
+std::optional<std::string> UnitDaemons::unmetCondition(const Daemon& daemon) {
   auto holds = unitProperty(daemon, "ConditionResult", "b");
-  if (!holds || std::move(holds).value().readBoolean()) return failure;
+  if (!holds || std::move(holds).value().readBoolean()) return std::nullopt;
   auto conditions = unitProperty(daemon, "Conditions", "a(sbbsi)");
-  if (!conditions) return failure;
+  if (!conditions) return std::nullopt;
   auto list = std::move(conditions).value();
-  failure.why += ": the condition " + unmetCondition(list) + " does not hold";
-  return failure;
+  return firstUnmet(list);
 }
 
 Result<void> UnitDaemons::start(const Daemon& daemon) {
   if (auto started = runJob(daemon, "StartUnit"); !started) return started;
-  auto running = isRunning(daemon);
+  const auto running = isRunning(daemon);
   if (!running) return running.failure();
   if (!*running) return whyNotRunning(daemon);
   return {};
@@ -216,7 +203,7 @@ Result<void> UnitDaemons::restart(const Daemon& daemon) {
 }
 
 Result<void> UnitDaemons::restartIfRunning(const Daemon& daemon) {
-  auto job = order(daemon, "TryRestartUnit", "o", daemon.unit, "replace");
+  const auto job = order(daemon, "TryRestartUnit", "o", daemon.unit, "replace");
   if (!job) return job.failure();
   return {};
 }

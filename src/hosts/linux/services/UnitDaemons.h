@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <optional>
 #include <string>
 
 #include "base/RunLoop.h"
@@ -38,12 +39,13 @@ class UnitDaemons final : public Daemons {
   Result<BusMessage> unitProperty(const Daemon& daemon, const char* name, const char* signature);
   /// A word such as "enabled", as systemctl(1) lists them; empty when there is no such unit file.
   Result<std::string> fileState(const Daemon& daemon);
-  /// The manager does not take them up before it reads all of them again.
+  /// The manager does not take them up before it is reloaded.
   Result<void> changeLinks(const Daemon& daemon, bool start);
-  Result<void> reload();
   /// Runs a job to its end.
   Result<void> runJob(const Daemon& daemon, const char* method);
   Failure whyNotRunning(const Daemon& daemon);
+  /// As it is written in a unit file; absent when all conditions hold, or that cannot be told.
+  std::optional<std::string> unmetCondition(const Daemon& daemon);
 
   ServiceAccess& _services;
   RunLoop& _runLoop;

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/system/Journal.h"
 
 #include <sys/socket.h>
@@ -18,7 +17,12 @@
 namespace tavisk {
 namespace {
 
+using Fields = std::vector<std::pair<std::string, std::string>>;
+
 constexpr const char* identifier = "tavisk";
+constexpr const char* journalSocket = "/run/systemd/journal/socket";
+constexpr const char* syslogSocket = "/dev/log";
+constexpr std::size_t loginIdLimit = 64;
 // The journal takes larger entries by another way only; nothing of ours needs it.
 constexpr std::size_t longestField = 16384;
 
@@ -35,7 +39,7 @@ std::string harmless(const std::string& text) {
 
 std::string journalDatagram(const JournalEntry& entry) {
   std::string datagram;
-  auto add = [&datagram](const std::string& name, const std::string& value) {
+  const auto add = [&datagram](const std::string& name, const std::string& value) {
     datagram.append(name).append("=").append(value).append("\n");
   };
   add("SYSLOG_IDENTIFIER", identifier);
@@ -53,7 +57,7 @@ std::string syslogTime(std::time_t time) {
   std::tm local{};
   ::localtime_r(&time, &local);
   std::array<char, 32> rest{};
-  auto length = std::strftime(rest.data(), rest.size(), " %e %H:%M:%S", &local);
+  const auto length = std::strftime(rest.data(), rest.size(), " %e %H:%M:%S", &local);
   return months.at(static_cast<std::size_t>(local.tm_mon)) + std::string(rest.data(), length);
 }
 
@@ -64,12 +68,10 @@ std::string syslogDatagram(const JournalEntry& entry) {
 }
 
 bool sendTo(const SystemRoot& root, const char* path, const std::string& datagram) {
-  auto socket = connectLocalSocket(root, path, SOCK_DGRAM);
+  const auto socket = connectLocalSocket(root, path, SOCK_DGRAM);
   if (!socket) return false;
   return ::send(socket->number(), datagram.data(), datagram.size(), MSG_NOSIGNAL | MSG_DONTWAIT) >= 0;
 }
-
-using Fields = std::vector<std::pair<std::string, std::string>>;
 
 int priorityOf(Outcome outcome) {
   switch (outcome) {
@@ -95,7 +97,7 @@ std::string messageOf(const Effect& effect) {
 
 Fields fieldsOf(const Effect& effect) {
   Fields fields;
-  auto add = [&fields](const char* name, const std::optional<std::string>& value) {
+  const auto add = [&fields](const char* name, const std::optional<std::string>& value) {
     if (value && !value->empty()) fields.emplace_back(name, *value);
   };
   add("TAVISK_SETTING", effect.setting);
@@ -117,7 +119,7 @@ Fields fieldsOf(const Effect& effect) {
 
 std::string terminal() {
   std::array<char, 256> name{};
-  for (int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
+  for (const int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
     if (::ttyname_r(descriptor, name.data(), name.size()) == 0) return name.data();
   return "none";
 }
@@ -129,11 +131,10 @@ bool isUserId(const std::string& text) {
 
 Fields whoAsks(const SystemRoot& root) {
   Fields who{{"TAVISK_UID", std::to_string(::getuid())}, {"TAVISK_TERMINAL", terminal()}};
-  constexpr std::size_t limit = 64;
-  auto login = root.read("/proc/self/loginuid", limit).valueOr("");
+  const auto login = root.read("/proc/self/loginuid", loginIdLimit).valueOr("");
   if (isUserId(login)) who.emplace_back("TAVISK_LOGIN_UID", login);
   // Anyone can set the variable; of root it is believed.
-  const char* sudo = ::getuid() == 0 ? std::getenv("SUDO_UID") : nullptr;  // NOLINT(concurrency-mt-unsafe)
+  const auto* sudo = ::getuid() == 0 ? std::getenv("SUDO_UID") : nullptr;  // NOLINT(concurrency-mt-unsafe)
   if (sudo && isUserId(sudo)) who.emplace_back("TAVISK_SUDO_UID", sudo);
   return who;
 }
@@ -141,8 +142,7 @@ Fields whoAsks(const SystemRoot& root) {
 }  // namespace
 
 void Journal::send(const JournalEntry& entry) const {
-  if (!sendTo(_root, "/run/systemd/journal/socket", journalDatagram(entry)))
-    sendTo(_root, "/dev/log", syslogDatagram(entry));
+  if (!sendTo(_root, journalSocket, journalDatagram(entry))) sendTo(_root, syslogSocket, syslogDatagram(entry));
 }
 
 void JournalLog::changeBegins(const std::string& setting, const std::string& asked) {
@@ -155,14 +155,14 @@ void JournalLog::record(const Effect& effect) {
 }
 
 void JournalLog::send(int priority, const std::string& message, Fields fields) const {
-  auto who = whoAsks(_root);
+  const auto who = whoAsks(_root);
   fields.insert(fields.end(), who.begin(), who.end());
   _journal.send({LOG_AUTHPRIV, priority, message, std::move(fields)});
 }
 
 void LinuxSystemLog::write(const std::string& message) {
-  bool ended = message.ends_with('\n');
-  _journal.send({LOG_DAEMON, LOG_INFO, message.substr(0, message.size() - (ended ? 1 : 0)), {}});
+  const bool hasNewline = message.ends_with('\n');
+  _journal.send({LOG_DAEMON, LOG_INFO, message.substr(0, message.size() - (hasNewline ? 1 : 0)), {}});
 }
 
 }  // namespace tavisk

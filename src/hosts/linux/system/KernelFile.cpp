@@ -10,14 +10,13 @@ namespace tavisk {
 
 Result<std::string> readKernelFile(const SystemRoot& root, const std::string& path) {
   constexpr std::size_t limit = 4096;
-  auto text = root.read(path, limit);
+  const auto text = root.read(path, limit);
   if (!text) return text;
-  auto end = text->find_last_not_of(std::string_view(" \t\n\0", 4));
-  return text->substr(0, end == std::string::npos ? 0 : end + 1);
+  return text->substr(0, text->find_last_not_of(std::string_view(" \t\n\0", 4)) + 1);
 }
 
 Result<void> writeKernelFile(const SystemRoot& root, const std::string& path, std::string_view text) {
-  auto file = root.open(path, O_WRONLY | O_TRUNC | O_NOCTTY | O_NONBLOCK);
+  const auto file = root.open(path, O_WRONLY | O_TRUNC | O_NOCTTY | O_NONBLOCK);
   if (!file) return file.failure();
   return writeAll(*file, text, path);
 }

@@ -8,12 +8,10 @@
 
 #include <cerrno>
 
-#include "base/Result.h"
-
 namespace tavisk {
 
 Result<FileDescriptor> connectLocalSocket(const SystemRoot& root, const std::string& path, int type) {
-  auto place = root.open(path, O_PATH);
+  const auto place = root.open(path, O_PATH);
   if (!place) return place.failure();
   FileDescriptor socket(::socket(AF_UNIX, type | SOCK_CLOEXEC, 0));
   if (!socket) return systemFailure("socket", path, errno);

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/system/ManagementController.h"
 
 #include <fcntl.h>
@@ -8,10 +7,11 @@
 #include <sys/ioctl.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 
-#include "base/Result.h"
+#include "base/Text.h"
 #include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
 
@@ -26,37 +26,10 @@ constexpr std::chrono::milliseconds betweenLooks{50};
 /// Where the firmware or the kernel tells of a controller.
 constexpr const char* tracesOfController[] = {"/sys/firmware/dmi/entries/38-0", "/sys/bus/acpi/devices/IPI0001:00",
                                               "/sys/module/ipmi_si"};
-
-int send(const FileDescriptor& file, const ControllerRequest& request) {
-  ipmi_system_interface_addr address{IPMI_SYSTEM_INTERFACE_ADDR_TYPE, IPMI_BMC_CHANNEL, 0};
-  auto data = request.data;
-  ipmi_req call{};
-  call.addr = reinterpret_cast<unsigned char*>(&address);
-  call.addr_len = sizeof address;
-  call.msg.netfn = request.function;
-  call.msg.cmd = request.command;
-  call.msg.data = data.data();
-  call.msg.data_len = static_cast<unsigned short>(data.size());
-  return ::ioctl(file.number(), IPMICTL_SEND_COMMAND, &call) == 0 ? 0 : errno;
-}
-
-int receive(const FileDescriptor& file, std::vector<std::uint8_t>& reply) {
-  std::array<std::uint8_t, IPMI_MAX_MSG_LENGTH> buffer{};
-  ipmi_addr address{};
-  ipmi_recv call{};
-  call.addr = reinterpret_cast<unsigned char*>(&address);
-  call.addr_len = sizeof address;
-  call.msg.data = buffer.data();
-  call.msg.data_len = buffer.size();
-  if (::ioctl(file.number(), IPMICTL_RECEIVE_MSG_TRUNC, &call) != 0 && errno != EMSGSIZE) return errno;
-  if (call.msg.data_len == 0) return EBADMSG;
-  reply.assign(buffer.begin(), buffer.begin() + call.msg.data_len);
-  return 0;
-}
-
-constexpr const char* name = "the management controller";
-/// In the answer to Get Device ID (IPMI 2.0, 20.1): three bytes, the low one first.
+/// In the answer to Get Device ID (IPMI 2.0, 20.1): three bytes, the low one first; of the last one four bits.
 constexpr std::size_t manufacturerAt = 6;
+constexpr std::size_t manufacturerSize = 3;
+constexpr std::uint32_t manufacturerMask = 0xFFFFF;
 
 struct Completion {
   std::uint8_t code;
@@ -75,30 +48,61 @@ constexpr Completion completions[] = {
     {0xD4, EACCES, "it does not allow this request"},
 };
 
-std::string codeText(std::uint8_t code) {
-  constexpr const char* digits = "0123456789ABCDEF";
-  return std::string("completion code 0x") + digits[code >> 4U] + digits[code & 0xFU];
+Failure failureOf(const char* what, int error, std::string why) {
+  return {what, managementController, std::move(why), std::error_code(error, std::generic_category())};
 }
 
-ControllerAnswer refusal(const char* what, std::uint8_t code) {
-  for (const auto& each : completions)
-    if (each.code == code)
-      return {each.error, {}, Failure{what, name, std::string(each.meaning) + " (" + codeText(code) + ")"}};
-  return {EIO, {}, Failure{what, name, codeText(code)}};
+/// What a request came to that did not get through.
+Failure failureOf(const char* what, const std::error_code& error) {
+  if (error == std::errc::no_such_device)
+    return failureOf(what, error.value(), "this machine has none, or no driver for it (ipmi_si, ipmi_devintf)");
+  const auto forRoot = error == std::errc::permission_denied ? whyNeedsRoot(what, managementController) : std::nullopt;
+  return failureOf(what, error.value(), forRoot ? forRoot->why : error.message());
 }
 
-Failure failureOf(const char* what, int error) {
-  if (error == ENODEV) return {what, name, "this machine has none, or no driver for it (ipmi_si, ipmi_devintf)"};
-  auto forRoot = error == EACCES ? whyNeedsRoot(what, name) : std::nullopt;
-  return forRoot.value_or(systemFailure(what, name, error));
+Failure refusal(const char* what, std::uint8_t code) {
+  const auto text = "completion code 0x" + upperCased(hexDigits(code, 2));
+  const auto* known = std::ranges::find(completions, code, &Completion::code);
+  if (known == std::end(completions)) return failureOf(what, EIO, text);
+  return failureOf(what, known->error, known->meaning + (" (" + text) + ")");
+}
+
+/// A failure of the way to the controller; which request it was is told by who asked.
+Failure linkFailure(int error) {
+  return systemFailure("open", managementController, error);
+}
+
+Result<void> send(const FileDescriptor& file, const ControllerRequest& request) {
+  ipmi_system_interface_addr address{IPMI_SYSTEM_INTERFACE_ADDR_TYPE, IPMI_BMC_CHANNEL, 0};
+  auto data = request.data;
+  ipmi_req call{};
+  call.addr = reinterpret_cast<unsigned char*>(&address);
+  call.addr_len = sizeof address;
+  call.msg.netfn = request.function;
+  call.msg.cmd = request.command;
+  call.msg.data = data.data();
+  call.msg.data_len = static_cast<unsigned short>(data.size());
+  if (::ioctl(file.number(), IPMICTL_SEND_COMMAND, &call) != 0) return linkFailure(errno);
+  return {};
+}
+
+Result<std::vector<std::uint8_t>> receive(const FileDescriptor& file) {
+  std::array<std::uint8_t, IPMI_MAX_MSG_LENGTH> buffer{};
+  ipmi_addr address{};
+  ipmi_recv call{};
+  call.addr = reinterpret_cast<unsigned char*>(&address);
+  call.addr_len = sizeof address;
+  call.msg.data = buffer.data();
+  call.msg.data_len = buffer.size();
+  if (::ioctl(file.number(), IPMICTL_RECEIVE_MSG_TRUNC, &call) != 0 && errno != EMSGSIZE) return linkFailure(errno);
+  if (call.msg.data_len == 0) return linkFailure(EBADMSG);
+  return std::vector(buffer.begin(), buffer.begin() + call.msg.data_len);
 }
 
 }  // namespace
 
 bool IpmiDevice::hasController() const {
-  for (const auto* path : tracesOfController)
-    if (_root.exists(path)) return true;
-  return false;
+  return std::ranges::any_of(tracesOfController, [this](const char* path) { return _root.exists(path); });
 }
 
 void IpmiDevice::loadDriver() {
@@ -110,55 +114,54 @@ void IpmiDevice::loadDriver() {
   static_cast<void>(_runLoop.runUntil(RunLoop::Clock::now() + longestLoading, isThere));
 }
 
-int IpmiDevice::openDevice() {
-  errno = 0;
-  auto file = _root.open(device, O_RDWR | O_NONBLOCK);
-  if (!file) return errno == 0 ? EIO : errno;
-  _device = std::move(file).value();
-  return 0;
-}
-
-int IpmiDevice::open() {
-  if (_device) return 0;
+Result<void> IpmiDevice::open() {
+  if (_device) return {};
   if (!_hasTriedToLoad && !_root.exists(device) && ::geteuid() == 0 && hasController()) loadDriver();
-  const int error = openDevice();
-  return error == ENOENT ? ENODEV : error;
+  auto file = _root.open(device, O_RDWR | O_NONBLOCK);
+  if (file) {
+    _device = std::move(file).value();
+    return {};
+  }
+  const auto& error = file.failure().code;
+  if (error == std::errc::no_such_file_or_directory) return linkFailure(ENODEV);
+  return linkFailure(error ? error.value() : EIO);
 }
 
-int IpmiDevice::exchange(const ControllerRequest& request, std::vector<std::uint8_t>& reply) {
-  if (RunLoop::Clock::now() < _silentUntil) return ETIMEDOUT;
-  if (const int error = open(); error != 0) return error;
-  if (_runLoop.timeFor(longestAnswer).count() == 0) return ETIMEDOUT;
-  if (const int error = send(_device, request); error != 0) return error;
-  int error = EAGAIN;
+Result<std::vector<std::uint8_t>> IpmiDevice::exchange(const ControllerRequest& request) {
+  if (RunLoop::Clock::now() < _silentUntil) return linkFailure(ETIMEDOUT);
+  if (const auto opened = open(); !opened) return opened.failure();
+  if (_runLoop.timeFor(longestAnswer).count() == 0) return linkFailure(ETIMEDOUT);
+  if (const auto sent = send(_device, request); !sent) return sent.failure();
+  Result<std::vector<std::uint8_t>> reply = linkFailure(EAGAIN);
   const auto watching = _runLoop.watch(_device.number(), RunLoop::Readiness::readable, [] {});
-  const auto hasAnswer = [&] { return (error = receive(_device, reply)) != EAGAIN; };
-  if (_runLoop.runUntil(RunLoop::Clock::now() + longestAnswer, hasAnswer)) return error;
+  const auto hasReply = [&] {
+    reply = receive(_device);
+    return reply || reply.failure().code != std::errc::resource_unavailable_try_again;
+  };
+  if (_runLoop.runUntil(RunLoop::Clock::now() + longestAnswer, hasReply)) return reply;
   // An answer that still comes must not be taken for the next one.
   _device = FileDescriptor();
   _silentUntil = RunLoop::Clock::now() + timeWithoutRetry;
-  return ETIMEDOUT;
+  return linkFailure(ETIMEDOUT);
 }
 
-ControllerAnswer ManagementController::ask(const char* what, const ControllerRequest& request, std::size_t leastData) {
-  std::vector<std::uint8_t> reply;
-  if (const int error = _link.exchange(request, reply); error != 0) return {error, {}, failureOf(what, error)};
-  if (reply.empty()) return {EBADMSG, {}, Failure{what, name, "an empty answer"}};
-  if (reply.front() != 0) return refusal(what, reply.front());
-  reply.erase(reply.begin());
-  if (reply.size() < leastData) return {EBADMSG, {}, Failure{what, name, "the answer is too short"}};
-  return {0, std::move(reply), std::nullopt};
+Result<std::vector<std::uint8_t>> ManagementController::ask(const char* what, const ControllerRequest& request,
+                                                            std::size_t leastData) {
+  const auto reply = _link.exchange(request);
+  if (!reply) return failureOf(what, reply.failure().code);
+  if (reply->empty()) return failureOf(what, EBADMSG, "an empty answer");
+  if (reply->front() != 0) return refusal(what, reply->front());
+  if (reply->size() - 1 < leastData) return failureOf(what, EBADMSG, "the answer is too short");
+  return std::vector(reply->begin() + 1, reply->end());
 }
 
-ControllerAnswer ManagementController::identity() {
-  return ask("Get Device ID", {0x06, 0x01, {}}, manufacturerAt + 3);
-}
-
-std::uint32_t manufacturerIn(const ControllerAnswer& identity) {
-  const auto byte = [&](std::size_t place) {
-    return std::uint32_t{identity.data[manufacturerAt + place]} << (8 * place);
-  };
-  return (byte(0) | byte(1) | byte(2)) & 0xFFFFFU;
+Result<std::uint32_t> ManagementController::manufacturer() {
+  const auto identity = ask("Get Device ID", {0x06, 0x01, {}}, manufacturerAt + manufacturerSize);
+  if (!identity) return identity.failure();
+  std::uint32_t number = 0;
+  for (std::size_t i = 0; i < manufacturerSize; ++i)
+    number |= std::uint32_t{(*identity)[manufacturerAt + i]} << (8 * i);
+  return number & manufacturerMask;
 }
 
 }  // namespace tavisk

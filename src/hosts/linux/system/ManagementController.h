@@ -3,14 +3,12 @@
 #pragma once
 
 #include <cstdint>
-#include <optional>
 #include <vector>
 
 #include "base/FileDescriptor.h"
 #include "base/Result.h"
 #include "base/RunLoop.h"
 #include "hosts/shared/SystemRoot.h"
-#include "platform/PowerController.h"
 
 namespace tavisk {
 
@@ -22,14 +20,17 @@ struct ControllerRequest {
   std::vector<std::uint8_t> data;
 };
 
-/// The way to the machine's management controller. Errors are errno values, 0 is success.
+/// The name that failures give it.
+inline constexpr const char* managementController = "the management controller";
+
+/// The way to the machine's management controller. Failures have a code.
 class ControllerLink {
  public:
   virtual ~ControllerLink() = default;
   /// Whether there is a way; ENODEV: this machine has no controller, or no driver for it.
-  virtual int open() = 0;
+  virtual Result<void> open() = 0;
   /// Sends a request and waits for the reply, whose first byte is the completion code. ETIMEDOUT: none in time.
-  virtual int exchange(const ControllerRequest& request, std::vector<std::uint8_t>& reply) = 0;
+  virtual Result<std::vector<std::uint8_t>> exchange(const ControllerRequest& request) = 0;
 };
 
 /// The kernel's driver of the controller (Documentation/driver-api/ipmi.rst). A machine that is known to have a
@@ -38,13 +39,12 @@ class IpmiDevice final : public ControllerLink {
  public:
   /// Both must outlive the object.
   IpmiDevice(const SystemRoot& root, RunLoop& runLoop) : _root(root), _runLoop(runLoop) {}
-  int open() override;
-  int exchange(const ControllerRequest& request, std::vector<std::uint8_t>& reply) override;
+  Result<void> open() override;
+  Result<std::vector<std::uint8_t>> exchange(const ControllerRequest& request) override;
 
  private:
   bool hasController() const;
   void loadDriver();
-  int openDevice();
 
   const SystemRoot& _root;
   RunLoop& _runLoop;
@@ -53,30 +53,20 @@ class IpmiDevice final : public ControllerLink {
   RunLoop::Clock::time_point _silentUntil;
 };
 
-/// What a request to the management controller came to.
-struct ControllerAnswer {
-  ControllerStatus status = 0;     ///< an errno value
-  std::vector<std::uint8_t> data;  ///< of a reply that was a success, without its completion code
-  std::optional<Failure> failure;  ///< set unless the status is 0
-};
-
-/// The computer on the board that watches over the machine's power (IPMI 2.0).
+/// The computer on the board that watches over the machine's power (IPMI 2.0). Failures have a code.
 class ManagementController {
  public:
   explicit ManagementController(ControllerLink& link) : _link(link) {}
 
-  ControllerStatus open() { return _link.open(); }
-  /// `what` is the request's name, for failures: "Get Chassis Status". An answer of fewer than `leastData` bytes is a
-  /// failure.
-  ControllerAnswer ask(const char* what, const ControllerRequest& request, std::size_t leastData = 0);
-  /// The answer for manufacturerIn().
-  ControllerAnswer identity();
+  Result<void> open() { return _link.open(); }
+  /// The data of a reply that tells of success. `what` is the request's name, for failures: "Get Chassis Status". A
+  /// reply of fewer than `leastData` bytes is a failure.
+  Result<std::vector<std::uint8_t>> ask(const char* what, const ControllerRequest& request, std::size_t leastData = 0);
+  /// Which company made the controller, by its number at the IANA.
+  Result<std::uint32_t> manufacturer();
 
  private:
   ControllerLink& _link;
 };
-
-/// Which company made the controller, by its number at the IANA, from a successful answer.
-std::uint32_t manufacturerIn(const ControllerAnswer& identity);
 
 }  // namespace tavisk

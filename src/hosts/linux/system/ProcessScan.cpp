@@ -2,9 +2,11 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/system/ProcessScan.h"
 
-#include <algorithm>
-#include <charconv>
-#include <optional>
+#include <string_view>
+#include <utility>
+
+#include "base/Path.h"
+#include "base/Text.h"
 
 namespace tavisk {
 namespace {
@@ -12,22 +14,18 @@ namespace {
 constexpr std::size_t procFileLimit = std::size_t{1} << 20U;
 constexpr std::size_t longestCommand = 15;  // the kernel cuts the name in /proc/PID/stat there
 
-std::string baseName(const std::string& path) {
-  return path.substr(path.rfind('/') + 1);
-}
-
 /// One process's folder in /proc.
 class Process {
  public:
   Process(const SystemRoot& root, std::string id) : _root(root), _folder("/proc/" + std::move(id)) {}
 
   bool isNamed(const std::string& name) const {
-    auto stat = _root.read(_folder + "/stat", procFileLimit);
+    const auto stat = _root.read(_folder + "/stat", procFileLimit);
     if (!stat) return false;
-    auto open = stat->find('(');
-    auto close = stat->rfind(')');
+    const auto open = stat->find('(');
+    const auto close = stat->rfind(')');
     if (open == std::string::npos || close == std::string::npos || close + 2 >= stat->size()) return false;
-    auto state = (*stat)[close + 2];
+    const char state = (*stat)[close + 2];
     if (state == 'Z' || state == 'X') return false;
     if (stat->substr(open + 1, close - open - 1) != name.substr(0, longestCommand)) return false;
     return runsProgram(name);
@@ -38,9 +36,9 @@ class Process {
  private:
   /// False for a kernel thread, which has no command line.
   bool runsProgram(const std::string& name) const {
-    auto commandLine = _root.read(_folder + "/cmdline", procFileLimit).valueOr("");
+    const auto commandLine = _root.read(_folder + "/cmdline", procFileLimit).valueOr("");
     if (commandLine.empty() || name.size() <= longestCommand) return !commandLine.empty();
-    if (auto program = _root.readLink(_folder + "/exe")) return baseName(withoutMark(*program)) == name;
+    if (const auto program = _root.readLink(_folder + "/exe")) return baseName(withoutMark(*program)) == name;
     return baseName(commandLine.substr(0, commandLine.find('\0'))) == name;
   }
 
@@ -53,25 +51,18 @@ class Process {
   std::string _folder;
 };
 
-std::optional<ProcessId> processId(const std::string& name) {
-  ProcessId id = 0;
-  auto [end, error] = std::from_chars(name.data(), name.data() + name.size(), id);
-  if (error != std::errc() || end != name.data() + name.size()) return std::nullopt;
-  return id;
-}
-
 }  // namespace
 
 std::vector<ProcessId> processesNamed(const SystemRoot& root, const std::string& name) {
-  auto self = root.readLink("/proc/self").valueOr("");
-  auto here = Process(root, "self").processNamespace();
+  const auto self = root.readLink("/proc/self").valueOr("");
+  const auto here = Process(root, "self").processNamespace();
   std::vector<ProcessId> found;
   for (const auto& entry : root.list("/proc").valueOr({})) {
-    auto id = processId(entry);
+    const auto id = parseNumber<ProcessId>(entry);
     if (!id || entry == self) continue;
-    Process process(root, entry);
+    const Process process(root, entry);
     // Another user's process hides its namespace from those who are not root.
-    auto there = process.processNamespace();
+    const auto there = process.processNamespace();
     if ((there.empty() || there == here) && process.isNamed(name)) found.push_back(*id);
   }
   return found;

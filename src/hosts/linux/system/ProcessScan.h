@@ -6,10 +6,9 @@
 #include <vector>
 
 #include "hosts/shared/SystemRoot.h"
+#include "platform/Processes.h"
 
 namespace tavisk {
-
-using ProcessId = int;
 
 /// The processes that run a program of this name, in no particular order: this machine's own, without those of
 /// containers, without kernel threads, processes that have ended, and the caller itself. Empty also when /proc is

@@ -1,12 +1,10 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/system/Program.h"
 
 #include <fcntl.h>
 #include <spawn.h>
 #include <sys/mman.h>
-#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -16,11 +14,13 @@
 #include <utility>
 
 #include "base/FileDescriptor.h"
-#include "base/Result.h"
 #include "base/Text.h"
 
 namespace tavisk {
 namespace {
+
+constexpr std::chrono::seconds longestRun{10};
+constexpr std::size_t outputLimit = 65536;
 
 /// The attributes and file actions of posix_spawn(3).
 class SpawnSetup {
@@ -67,11 +67,9 @@ std::vector<char*> pointersTo(std::vector<std::string>& words) {
   return pointers;
 }
 
-constexpr std::chrono::seconds longestRun{10};
-constexpr std::size_t outputLimit = 65536;
-
+/// ": LINE"; empty when there is none.
 std::string lastLine(const std::string& text) {
-  auto lines = split(text, "\r\n");
+  const auto lines = split(text, "\r\n");
   return lines.empty() ? std::string() : ": " + lines.back();
 }
 
@@ -106,31 +104,33 @@ Result<EndedProgram> runToEnd(const SystemRoot& root, const std::vector<std::str
 
 Result<RunningProgram> RunningProgram::start(const SystemRoot& root, std::vector<std::string> words,
                                              const ProgramFiles& files) {
-  auto program = root.standardized(words.front());
+  const auto program = root.standardized(words.front());
   if (!program) return program.failure();
-  auto path = root.prefix() == "/" ? *program : root.prefix() + *program;
+  const auto path = root.prefix() == "/" ? *program : root.prefix() + *program;
   std::vector<std::string> environment = {"PATH=/usr/sbin:/usr/bin:/sbin:/bin", "LC_ALL=C"};
   const SpawnSetup setup(files);
   pid_t id = 0;
   const int error = ::posix_spawn(&id, path.c_str(), setup.actions(), setup.attributes(), pointersTo(words).data(),
                                   pointersTo(environment).data());
   if (error != 0) return systemFailure("run", words.front(), error);
-  return RunningProgram(id);
+  RunningProgram running(id);
+  auto handle = ProcessHandle::of(id);
+  if (!handle) return handle.failure();
+  running._handle = std::move(handle).value();
+  return running;
 }
-
-RunningProgram::RunningProgram(int id) : _id(id), _handle(static_cast<int>(::syscall(SYS_pidfd_open, id, 0))) {}
 
 RunningProgram::RunningProgram(RunningProgram&& other) noexcept
     : _id(other._id),
       _handle(std::move(other._handle)),
       _status(other._status),
-      _ended(std::exchange(other._ended, true)) {}
+      _hasEnded(std::exchange(other._hasEnded, true)) {}
 
 RunningProgram& RunningProgram::operator=(RunningProgram&& other) noexcept {
   std::swap(_id, other._id);
   std::swap(_handle, other._handle);
   std::swap(_status, other._status);
-  std::swap(_ended, other._ended);
+  std::swap(_hasEnded, other._hasEnded);
   return *this;
 }
 
@@ -141,24 +141,24 @@ RunningProgram::~RunningProgram() {
 }
 
 bool RunningProgram::hasEnded() {
-  _ended = _ended || ::waitpid(_id, &_status, WNOHANG) == _id;
-  return _ended;
+  _hasEnded = _hasEnded || ::waitpid(_id, &_status, WNOHANG) == _id;
+  return _hasEnded;
 }
 
 bool RunningProgram::endsBefore(RunLoop::Clock::time_point deadline, RunLoop& runLoop) {
-  auto watching = runLoop.watch(_handle.number(), RunLoop::Readiness::readable, [] {});
+  const auto watching = runLoop.watch(_handle.descriptor(), RunLoop::Readiness::readable, [] {});
   return runLoop.runUntil(deadline, [this] { return hasEnded(); });
 }
 
 Result<std::string> runProgram(const SystemRoot& root, const std::vector<std::string>& words, RunLoop& runLoop) {
-  auto ended = runToEnd(root, words, runLoop);
+  const auto ended = runToEnd(root, words, runLoop);
   if (!ended) return ended.failure();
   if (ended->status != 0) return Failure{"run", words.front(), howItEnded(ended->status) + lastLine(ended->printed)};
   return ended->printed;
 }
 
 Result<ProgramOutput> outputOfProgram(const SystemRoot& root, const std::vector<std::string>& words, RunLoop& runLoop) {
-  auto ended = runToEnd(root, words, runLoop);
+  const auto ended = runToEnd(root, words, runLoop);
   if (!ended) return ended.failure();
   if (WIFSIGNALED(ended->status)) return Failure{"run", words.front(), howItEnded(ended->status)};
   return ProgramOutput{WEXITSTATUS(ended->status), ended->printed};

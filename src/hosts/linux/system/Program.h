@@ -5,9 +5,9 @@
 #include <string>
 #include <vector>
 
-#include "base/FileDescriptor.h"
 #include "base/Result.h"
 #include "base/RunLoop.h"
+#include "hosts/linux/system/ProcessHandle.h"
 #include "hosts/shared/SystemRoot.h"
 #include "platform/Processes.h"
 
@@ -37,13 +37,13 @@ class RunningProgram {
   int status() const { return _status; }
 
  private:
-  explicit RunningProgram(int id);
+  explicit RunningProgram(ProcessId id) : _id(id) {}
   bool hasEnded();
 
-  int _id;
-  FileDescriptor _handle;
+  ProcessId _id;
+  ProcessHandle _handle;
   int _status = 0;
-  bool _ended = false;
+  bool _hasEnded = false;
 };
 
 /// Runs one of the machine's programs to its end, without a shell: `words` is its absolute path and its arguments. It

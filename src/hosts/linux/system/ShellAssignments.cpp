@@ -2,11 +2,12 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/system/ShellAssignments.h"
 
+#include "base/Text.h"
+
 namespace tavisk {
 namespace {
 
 constexpr std::size_t fileLimit = 65536;
-constexpr std::string_view space = " \t\r\n";
 constexpr std::string_view escapedInQuotes = "\"\\`$";
 
 /// A line with its newline, taken off the front.
@@ -19,11 +20,9 @@ std::string_view takeLine(std::string_view& text) {
 
 /// What follows the sign of an assignment to the variable; absent when the line is something else.
 std::optional<std::string_view> assignedIn(std::string_view line, std::string_view variable) {
-  const auto start = line.find_first_not_of(space);
-  if (start == std::string_view::npos) return std::nullopt;
-  line.remove_prefix(start);
+  line = trimmed(line);
   if (!line.starts_with(variable) || !line.substr(variable.size()).starts_with('=')) return std::nullopt;
-  return line.substr(variable.size() + 1, line.find_last_not_of(space) - variable.size());
+  return line.substr(variable.size() + 1);
 }
 
 /// Takes quotes and backslashes away as the shell does.

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/system/SysDevice.h"
 
+#include "base/Path.h"
 #include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
@@ -14,22 +15,21 @@ constexpr std::string_view top = "/sys/devices";
 std::optional<SysDevice> SysDevice::at(const SystemRoot& root, const std::string& path) {
   auto resolved = root.standardized(path);
   if (!resolved || !root.exists(*resolved)) return std::nullopt;
-  return SysDevice(root, *resolved);
+  return SysDevice(root, std::move(resolved).value());
 }
 
 std::string SysDevice::subsystem() const {
-  auto link = _root->readLink(_path + "/subsystem").valueOr("");
-  return link.substr(link.rfind('/') + 1);
+  return baseName(_root->readLink(_path + "/subsystem").valueOr(""));
 }
 
 std::optional<SysDevice> SysDevice::parent() const {
-  auto above = _path.substr(0, _path.rfind('/'));
+  auto above = parentFolder(_path);
   if (!above.starts_with(top) || above.size() == top.size()) return std::nullopt;
-  return SysDevice(*_root, above);
+  return SysDevice(*_root, std::move(above));
 }
 
 bool SysDevice::canWake() const {
-  return has("power/wakeup");
+  return has(wakeSwitch);
 }
 
 bool SysDevice::has(const std::string& name) const {
@@ -40,7 +40,7 @@ Result<std::string> SysDevice::read(const std::string& name) const {
   return readKernelFile(*_root, _path + "/" + name);
 }
 
-Result<void> SysDevice::write(const std::string& name, const std::string& value) const {
+Result<void> SysDevice::write(const std::string& name, std::string_view value) const {
   return writeKernelFile(*_root, _path + "/" + name, value);
 }
 

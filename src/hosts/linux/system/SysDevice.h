@@ -4,11 +4,14 @@
 
 #include <optional>
 #include <string>
-#include <vector>
+#include <string_view>
 
 #include "hosts/shared/SystemRoot.h"
 
 namespace tavisk {
+
+/// The file of a device that says whether it may wake the machine: "enabled" or "disabled".
+inline constexpr const char* wakeSwitch = "power/wakeup";
 
 /// A device as the kernel shows it beneath /sys/devices.
 class SysDevice {
@@ -21,11 +24,11 @@ class SysDevice {
   std::string subsystem() const;
   /// What it hangs on; absent at the top of the tree.
   std::optional<SysDevice> parent() const;
-  /// Whether it can wake the machine: only such a device has the file power/wakeup.
+  /// Whether it has `wakeSwitch`, as only devices have that can wake the machine.
   bool canWake() const;
   bool has(const std::string& name) const;
   Result<std::string> read(const std::string& name) const;
-  Result<void> write(const std::string& name, const std::string& value) const;
+  Result<void> write(const std::string& name, std::string_view value) const;
 
  private:
   SysDevice(const SystemRoot& root, std::string path) : _root(&root), _path(std::move(path)) {}

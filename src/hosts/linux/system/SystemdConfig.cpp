@@ -2,10 +2,9 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/system/SystemdConfig.h"
 
-#include <map>
-#include <optional>
-
+#include "base/Path.h"
 #include "base/Text.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/OwnFiles.h"
 
 namespace tavisk {
@@ -17,32 +16,30 @@ constexpr std::size_t fileLimit = std::size_t{1} << 20U;
 /// A line that ends in a backslash goes on in the next one, with a space between.
 std::vector<std::string> logicalLines(std::string_view text) {
   std::vector<std::string> lines;
-  bool continues = false;
+  bool isContinued = false;
   for (const auto& line : split(text, "\n")) {
     auto piece = std::string(trimmed(line));
     if (piece.starts_with('#') || piece.starts_with(';')) continue;
-    bool more = piece.ends_with('\\');
-    if (more) piece.back() = ' ';
-    if (continues)
+    const bool goesOn = piece.ends_with('\\');
+    if (goesOn) piece.back() = ' ';
+    if (isContinued)
       lines.back() += piece;
     else
       lines.push_back(piece);
-    continues = more;
+    isContinued = goesOn;
   }
   return lines;
 }
 
 /// Key and value of each line of a section.
-std::vector<std::pair<std::string, std::string>> allAssignments(std::string_view text, std::string_view section) {
-  std::vector<std::pair<std::string, std::string>> found;
-  auto heading = "[" + std::string(section) + "]";
-  bool inside = false;
+std::vector<NamedValue> allAssignments(std::string_view text, std::string_view section) {
+  std::vector<NamedValue> found;
+  const auto heading = "[" + std::string(section) + "]";
+  bool isInside = false;
   for (const auto& line : logicalLines(text)) {
-    if (line.starts_with('[')) inside = line == heading;
-    auto sign = line.find('=');
-    if (inside && sign != std::string::npos)
-      found.emplace_back(trimmed(std::string_view(line).substr(0, sign)),
-                         trimmed(std::string_view(line).substr(sign + 1)));
+    if (line.starts_with('[')) isInside = line == heading;
+    auto assignment = namedValueIn(line);
+    if (isInside && assignment) found.push_back(*std::move(assignment));
   }
   return found;
 }
@@ -56,7 +53,7 @@ std::vector<std::string> configurationFiles(const SystemRoot& root, const std::v
       if (name.ends_with(".conf")) byName.emplace(name, folder + name);
   std::vector<std::string> files;
   files.reserve(byName.size());
-  for (auto& [name, path] : byName) files.push_back(path);
+  for (const auto& [name, path] : byName) files.push_back(path);
   return files;
 }
 
@@ -82,7 +79,7 @@ std::vector<std::string> SystemdConfig::words(std::string_view section, std::str
   std::vector<std::string> words;
   for (const auto& file : files()) {
     for (const auto& value : assignments(_root.read(file, fileLimit).valueOr(""), section, key)) {
-      auto added = split(value, " \t");
+      const auto added = split(value, " \t");
       if (added.empty()) words.clear();
       words.insert(words.end(), added.begin(), added.end());
     }
@@ -98,10 +95,9 @@ std::optional<SystemdConfig::Assignment> SystemdConfig::last(std::string_view se
 }
 
 std::string SystemdConfig::whatHides(std::string_view section, const std::vector<std::string>& keys) const {
-  const auto own = ownDropIn();
-  const auto ownName = own.substr(own.rfind('/'));
+  const auto ownName = baseName(ownDropIn());
   for (const auto& file : files()) {
-    const bool isLater = file.find(".conf.d/") != std::string::npos && file.substr(file.rfind('/')) > ownName;
+    const bool isLater = file.find(".conf.d/") != std::string::npos && baseName(file) > ownName;
     const auto text = isLater ? _root.read(file, fileLimit).valueOr("") : "";
     for (const auto& key : keys)
       if (!assignments(text, section, key).empty()) return file;

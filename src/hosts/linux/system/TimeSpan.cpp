@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/system/TimeSpan.h"
 
+#include <algorithm>
 #include <charconv>
 #include <limits>
 
@@ -13,6 +14,7 @@ struct Unit {
   std::int64_t microseconds;
 };
 
+constexpr std::int64_t longest = std::numeric_limits<std::int64_t>::max();
 constexpr std::int64_t second = 1'000'000;
 constexpr Unit units[] = {
     {"", second},
@@ -37,36 +39,32 @@ constexpr Unit units[] = {
     {"days", 86400 * second},
 };
 
-std::string_view takeSpaces(std::string_view text) {
-  auto start = text.find_first_not_of(" \t");
-  return start == std::string_view::npos ? std::string_view() : text.substr(start);
+std::string_view withoutSpacesBefore(std::string_view text) {
+  return text.substr(std::min(text.find_first_not_of(" \t"), text.size()));
 }
 
 /// The number and its unit at the front, which are taken off.
 std::optional<std::int64_t> takePart(std::string_view& text) {
   std::int64_t number = 0;
-  auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
   if (error != std::errc() || number < 0) return std::nullopt;
-  text = takeSpaces(text.substr(static_cast<std::size_t>(end - text.data())));
-  auto name = text.substr(0, text.find_first_of("0123456789 \t"));
-  for (const auto& unit : units) {
-    if (unit.name != name) continue;
-    if (number > std::numeric_limits<std::int64_t>::max() / unit.microseconds) return std::nullopt;
-    text = takeSpaces(text.substr(name.size()));
-    return number * unit.microseconds;
-  }
-  return std::nullopt;
+  text = withoutSpacesBefore(text.substr(static_cast<std::size_t>(end - text.data())));
+  const auto name = text.substr(0, text.find_first_of("0123456789 \t"));
+  const auto* unit = std::ranges::find(units, name, &Unit::name);
+  if (unit == std::end(units) || number > longest / unit->microseconds) return std::nullopt;
+  text = withoutSpacesBefore(text.substr(name.size()));
+  return number * unit->microseconds;
 }
 
 }  // namespace
 
 std::optional<std::chrono::microseconds> timeSpan(std::string_view text) {
   std::int64_t sum = 0;
-  text = takeSpaces(text);
+  text = withoutSpacesBefore(text);
   if (text.empty()) return std::nullopt;
   while (!text.empty()) {
-    auto part = takePart(text);
-    if (!part || *part > std::numeric_limits<std::int64_t>::max() - sum) return std::nullopt;
+    const auto part = takePart(text);
+    if (!part || *part > longest - sum) return std::nullopt;
     sum += *part;
   }
   return std::chrono::microseconds(sum);

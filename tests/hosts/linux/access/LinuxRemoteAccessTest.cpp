@@ -5,15 +5,16 @@
 #include <thread>
 
 #include "ToolRun.h"
+#include "effects/EffectMatchers.h"
+#include "effects/SettingNames.h"
 #include "hosts/linux/FakeServiceManager.h"
 #include "hosts/linux/LinuxTree.h"
-#include "hosts/linux/services/ServicesConfig.h"
 #include "platform/RemoteAccessContract.h"
 
 namespace tavisk {
 namespace {
 
-using testing::AllOf, testing::Contains, testing::ElementsAre, testing::HasSubstr, testing::IsEmpty;
+using testing::AllOf, testing::Contains, testing::ElementsAre, testing::Field;
 using namespace std::chrono_literals;
 
 constexpr const char* running = "active";
@@ -104,11 +105,11 @@ TEST(RemoteLogin, SwitchesServiceAndSocketTogether) {
 }
 
 TEST(RemoteLogin, SaysWhatStandsAgainstIt) {
-  const std::tuple<const char*, FakeUnit, const char*, const char*> cases[] = {
-      {"", {.load = "not-found"}, "not supported", "ssh.service, ssh.socket, sshd.service, sshd.socket"},
-      {"remote-shell = other.service", {}, "not supported", "other.service"},
-      {"remote-shell = systemd-logind.service", {}, "failed", "the machine depends on this unit"},
-      {"", {.jobResult = "failed"}, "failed", "its job ended with: failed"},
+  const std::tuple<const char*, FakeUnit, Outcome, const char*> cases[] = {
+      {"", {.load = "not-found"}, Outcome::notSupported, "ssh.service, ssh.socket, sshd.service, sshd.socket"},
+      {"remote-shell = other.service", {}, Outcome::notSupported, "other.service"},
+      {"remote-shell = systemd-logind.service", {}, Outcome::failed, "the machine depends on this unit"},
+      {"", {.jobResult = "failed"}, Outcome::failed, "its job ended with: failed"},
   };
   for (const auto& [config, unit, outcome, why] : cases) {
     ManagedTree tree;
@@ -116,16 +117,17 @@ TEST(RemoteLogin, SaysWhatStandsAgainstIt) {
     tree.manager.set("ssh.service", unit);
     tree.manager.set("ssh.socket", {.load = "not-found"});
     tree.host().remoteShell().setEnabled(true);
-    EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr("\"outcome\":\"" + std::string(outcome)), HasSubstr(why)));
+    EXPECT_TRUE(isBecauseOf(tree.lastEffect(), outcome, why)) << toJson(tree.lastEffect());
   }
 }
 
 TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
-  const std::tuple<const char*, const char*, const char*> cases[] = {
-      {"touch $root/etc/ssh/ssh_host_ed25519_key", "", "applied"},
-      {"true", "", "failed"},
-      {"false", "", "failed"},
-      {"false", "Port 22\n hostkey /srv/key\n", "applied"},
+  const std::tuple<const char*, const char*, Outcome> cases[] = {
+      {"touch $root/etc/ssh/ssh_host_ed25519_key", "", Outcome::applied},
+      {"true", "", Outcome::failed},
+      {"false", "", Outcome::failed},
+      {"false", "Port 22\n hostkey /srv/key\n", Outcome::applied},
+      {"false", "#HostKey /srv/key\n", Outcome::failed},
   };
   for (const auto& [maker, config, outcome] : cases) {
     ManagedTree tree;
@@ -133,8 +135,8 @@ TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
     tree.write("/etc/ssh/sshd_config", config);
     tree.writeProgram("/usr/bin/ssh-keygen", std::string("#!/bin/sh\nroot=${0%/usr/bin/ssh-keygen}\n") + maker);
     tree.host().remoteShell().setEnabled(true);
-    EXPECT_THAT(tree.lastTold(), HasSubstr("\"outcome\":\"" + std::string(outcome))) << maker << config;
-    EXPECT_EQ(tree.host().remoteShell().isEnabled(), std::string_view(outcome) == "applied");
+    EXPECT_EQ(tree.lastEffect().outcome, outcome) << maker << config;
+    EXPECT_EQ(tree.host().remoteShell().isEnabled(), outcome == Outcome::applied);
   }
 }
 
@@ -144,14 +146,25 @@ TEST(RemoteEvents, SwitchAllUnitsAndAskTheFirst) {
   tree.manager.set("events.service", {.active = running, .file = "enabled"});
   EXPECT_FALSE(events.isEnabled());
   events.setEnabled(true);
-  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("before":"partly on")"));
+  EXPECT_EQ(tree.lastEffect().before, "partly on");
   events.setEnabled(false);
   EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles events.socket", "Reload", "StartUnit events.socket",
                                                 "DisableUnitFiles events.socket", "DisableUnitFiles events.service",
                                                 "Reload", "StopUnit events.service", "StopUnit events.socket"));
+}
+
+TEST(RemoteEvents, AreNotSupportedWithoutAllOfTheirUnits) {
+  ManagedTree tree;
   tree.manager.set("events.service", {.load = "not-found"});
-  events.setEnabled(true);
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("not all of them")));
+  tree.host().remoteEvents().setEnabled(true);
+  EXPECT_THAT(tree.lastEffect(), UnsupportedFor("not all of them"));
+}
+
+TEST(RemoteEvents, AreNotSupportedWithoutUnits) {
+  LinuxTree tree;
+  tree.host().remoteEvents().setEnabled(true);
+  EXPECT_THAT(tree.lastEffect(), UnsupportedFor("services.conf"));
+  EXPECT_FALSE(tree.host().remoteEvents().isEnabled());
 }
 
 TEST(RemoteAccess, HasOneTimeForAllWaitsOfACommandButForQuestions) {
@@ -169,37 +182,10 @@ TEST(RemoteAccess, HasOneTimeForAllWaitsOfACommandButForQuestions) {
   const std::vector<std::string> words = {"setremotevelmarevents", "on", "setremotelogin", "off"};
   const auto result = runTool(tree, words, {.input = &user, .longestCommand = longestCommand});
   EXPECT_EQ(result.output, "setremotevelmarevents: On\n");
-  EXPECT_THAT(tree.log.lines,
-              Contains(AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("Remote Events"), HasSubstr("timed out"))));
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr("Login"), HasSubstr(R"("outcome":"applied")")));
-}
-
-TEST(RemoteEvents, AreNotSupportedWithoutUnits) {
-  LinuxTree tree;
-  tree.host().remoteEvents().setEnabled(true);
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"not supported")"), HasSubstr("services.conf")));
-  EXPECT_FALSE(tree.host().remoteEvents().isEnabled());
-}
-
-TEST(ServicesConfig, NamesUnitsThatMayBeSwitched) {
-  const std::pair<const char*, std::vector<std::string>> cases[] = {
-      {"", {}},
-      {"# remote-events = a.service\nother = b.service\n", {}},
-      {"remote-events = a.service\nremote-events=b@1.socket  my-group.target\r\n", {"b@1.socket", "my-group.target"}},
-      {"remote-events =\n", {}},
-  };
-  for (const auto& [text, units] : cases) {
-    LinuxTree tree;
-    tree.write(servicesConfig, text);
-    EXPECT_EQ(configuredUnits(SystemRoot(tree.at("/")), "remote-events").valueOr({"failed"}), units) << text;
-  }
-  for (const char* unit : {"a", ".service", "a.mount", "a/b.service", "../a.service", "dbus.service", "dbus.socket",
-                           "systemd-journald.service", "reboot.target", "remote-fs-pre.target", "hybrid-sleep.target",
-                           "multi-user.target", "runlevel0.target"}) {
-    LinuxTree tree;
-    tree.write(servicesConfig, std::string("remote-events = a.service ") + unit);
-    EXPECT_FALSE(configuredUnits(SystemRoot(tree.at("/")), "remote-events")) << unit;
-  }
+  EXPECT_THAT(tree.log.effects,
+              Contains(AllOf(Field(&Effect::setting, setting::remoteEvents), FailedFor("timed out"))));
+  EXPECT_EQ(tree.lastEffect().setting, setting::remoteLogin);
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
 }
 
 }  // namespace

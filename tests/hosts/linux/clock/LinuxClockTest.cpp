@@ -3,7 +3,8 @@
 #include <gmock/gmock.h>
 
 #include "base/Calendar.h"
-#include "hosts/linux/LinuxTree.h"
+#include "effects/EffectMatchers.h"
+#include "hosts/linux/LinuxContractMachines.h"
 #include "hosts/linux/clock/LocalTime.h"
 #include "hosts/linux/clock/SystemClock.h"
 
@@ -68,10 +69,12 @@ TEST(LocalTime, KeepsTheZoneWhenTheNewOneHasNoFile) {
   EXPECT_EQ(tree.file("/etc/timezone"), "Asia/Tokyo\n");
 }
 
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, ClockContract, ClockOf<LinuxTree>);
+
 TEST(LinuxClock, LeavesTheClockOfThisMachineAlone) {
   LinuxTree tree;
   tree.host().clock().setTime(1'166'999'400);
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("a tree of files has no clock")));
+  EXPECT_THAT(tree.lastEffect(), FailedFor("a tree of files has no clock"));
 }
 
 TEST(LinuxClock, NamesTheProgramThatWillSetItBack) {
@@ -79,7 +82,7 @@ TEST(LinuxClock, NamesTheProgramThatWillSetItBack) {
   tree.write("/proc/10/stat", "10 (VBoxService) S 1");
   tree.write("/proc/10/cmdline", "/usr/sbin/VBoxService");
   tree.host().clock().setTime(1'166'999'400);
-  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("undoneBy":"VBoxService")"));
+  EXPECT_EQ(tree.lastEffect().undoneBy, "VBoxService");
 }
 
 TEST(LinuxClock, ReadsTheHardwareClockInTheTimeThatItKeeps) {

@@ -16,14 +16,11 @@ constexpr std::uint8_t lock = 0x02;
 
 /// A controller that tells of the front panel: with these capabilities, in this state.
 struct Panel final : ControllerLink {
-  int open() override { return error; }
-  int exchange(const ControllerRequest& request, std::vector<std::uint8_t>& reply) override {
-    reply = {0};
-    if (request.command == 0)
-      reply.insert(reply.end(), {capabilities, 0x20, 0x20, 0x20, 0x20});
-    else
-      reply.insert(reply.end(), {0x61, 0, state});
-    return error;
+  Result<void> open() override { return error == 0 ? Result<void>() : systemFailure("open", "the panel", error); }
+  Result<std::vector<std::uint8_t>> exchange(const ControllerRequest& request) override {
+    if (const auto opened = open(); !opened) return opened.failure();
+    if (request.command == 0) return std::vector<std::uint8_t>{0, capabilities, 0x20, 0x20, 0x20, 0x20};
+    return std::vector<std::uint8_t>{0, 0x61, 0, state};
   }
 
   int error = 0;

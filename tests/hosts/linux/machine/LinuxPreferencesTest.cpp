@@ -19,8 +19,8 @@ using testing::AllOf, testing::HasSubstr;
 constexpr const char* preferencesFile = "/etc/tavisk/preferences/AnyApplication.plist";
 
 struct NoController final : ControllerLink {
-  int open() override { return ENODEV; }
-  int exchange(const ControllerRequest&, std::vector<std::uint8_t>&) override { return ENODEV; }
+  Result<void> open() override { return systemFailure("open", "no controller", ENODEV); }
+  Result<std::vector<std::uint8_t>> exchange(const ControllerRequest&) override { return open().failure(); }
 };
 
 struct LinuxPreferences {

@@ -47,11 +47,10 @@ class TreeCards final : public NetworkCards {
 /// A management controller that keeps a restore policy and a start-up delay.
 class TreeController final : public ControllerLink {
  public:
-  int open() override { return error; }
-  int exchange(const ControllerRequest& request, std::vector<std::uint8_t>& reply) override {
-    if (error != 0) return error;
-    reply = answerTo(request);
-    return 0;
+  Result<void> open() override { return error == 0 ? Result<void>() : systemFailure("open", "the tree", error); }
+  Result<std::vector<std::uint8_t>> exchange(const ControllerRequest& request) override {
+    if (const auto opened = open(); !opened) return opened.failure();
+    return answerTo(request);
   }
 
   int error = 0;

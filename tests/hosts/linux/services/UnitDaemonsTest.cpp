@@ -2,13 +2,14 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
+#include "effects/EffectMatchers.h"
 #include "hosts/linux/FakeServiceManager.h"
 #include "hosts/linux/LinuxContractMachines.h"
 
 namespace tavisk {
 namespace {
 
-using testing::AllOf, testing::ElementsAre, testing::HasSubstr;
+using testing::ElementsAre;
 using Fault = FakeServiceManager::Fault;
 
 /// A machine whose message bus is down, with a service manager and chrony.
@@ -31,7 +32,7 @@ TEST(UnitDaemons, EnablesAndReloadsBeforeItStarts) {
                                                 "StopUnit chrony.service"));
 }
 
-TEST(UnitDaemons, PrefersTheFirstLoadedAndNeverUnmasks) {
+TEST(UnitDaemons, PrefersTheFirstThatIsNotMasked) {
   ManagedTree tree;
   auto& client = tree.host().networkTime();
   tree.manager.set("ntpsec.service", {.active = "activating"});
@@ -40,9 +41,14 @@ TEST(UnitDaemons, PrefersTheFirstLoadedAndNeverUnmasks) {
   EXPECT_TRUE(client.isRunning());
   tree.manager.set("ntpsec.service", {.load = "not-found"});
   EXPECT_FALSE(client.isRunning());
+}
+
+TEST(UnitDaemons, TellWhichUnitFilesCannotBeEnabled) {
+  ManagedTree tree;
   tree.manager.breakNext("EnableUnitFiles", Fault::error);
-  client.setLaunchAtStartup(true);
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("chrony.service")));
+  tree.host().networkTime().setLaunchAtStartup(true);
+  EXPECT_THAT(tree.lastEffect(), FailedFor("EnableUnitFiles on chrony.service"));
+  EXPECT_EQ(tree.lastEffect().failure->code, BusErrorCode::accessDenied);
 }
 
 TEST(UnitDaemons, RestartsOtherClientsWithoutWaiting) {
@@ -50,7 +56,7 @@ TEST(UnitDaemons, RestartsOtherClientsWithoutWaiting) {
   tree.manager.set(chrony, {.load = "not-found"});
   tree.manager.set("systemd-timesyncd.service", {.active = "active", .jobResult = ""});
   tree.host().networkTime().restartAsynchronously();
-  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"applied")"));
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_THAT(tree.manager.calls(), ElementsAre("TryRestartUnit systemd-timesyncd.service"));
 }
 
@@ -68,7 +74,8 @@ TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
     tree.manager.set(chrony, unit);
     if (fault) tree.manager.breakNext("StartUnit", *fault);
     tree.host().networkTime().start();
-    EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("StartUnit"), HasSubstr(why)));
+    EXPECT_THAT(tree.lastEffect(), FailedFor(why));
+    EXPECT_EQ(tree.lastEffect().failure->tried, "StartUnit");
     EXPECT_FALSE(tree.host().networkTime().isRunning()) << "asked again, after a hang-up too";
   }
 }
@@ -78,7 +85,7 @@ TEST(UnitDaemons, WaitOnceForAManagerThatIsSilent) {
   const auto began = RunLoop::Clock::now();
   tree.manager.breakNext("LoadUnit", Fault::silence);
   tree.host().networkTime().start();
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("answer")));
+  EXPECT_THAT(tree.lastEffect(), FailedFor("answer"));
   EXPECT_LT(RunLoop::Clock::now() - began, Bus::usualTime + std::chrono::milliseconds(500));
 }
 
@@ -87,7 +94,7 @@ TEST(UnitDaemons, DoNotLookElsewhereWhenTheManagerCannotBeReached) {
   tree.write("/run/systemd/system/x", "");
   tree.writeProgram("/etc/init.d/chrony", "#!/bin/sh\n");
   EXPECT_FALSE(tree.host().networkTime().isRunning());
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("/run/dbus/system_bus_socket")));
+  EXPECT_THAT(tree.lastEffect(), FailedFor("/run/dbus/system_bus_socket"));
 }
 
 }  // namespace

@@ -3,11 +3,20 @@
 #include <gmock/gmock.h>
 
 #include "hosts/linux/disks/DiskTree.h"
+#include "platform/BootLoaderFileContract.h"
 
 namespace tavisk {
 namespace {
 
 using testing::ElementsAre, testing::IsEmpty;
+
+struct LinuxBootLoader {
+  BootLoaderFile& service() { return tree.host().bootLoaderFile(); }
+  void put(const std::string& path, const char* contents) { tree.write(path, contents); }
+  std::string file(const std::string& path) { return tree.file(path); }
+  LinuxTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, BootLoaderFileContract, LinuxBootLoader);
 
 TEST(LinuxKernelValues, NameTheModelAsItsMakerDoes) {
   const std::tuple<std::string, std::string, std::string> cases[] = {

@@ -1,8 +1,10 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "hosts/linux/LinuxContractMachines.h"
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+#include "hosts/linux/LinuxTree.h"
 #include "platform/AdminAuthenticatorContract.h"
-#include "platform/BootLoaderFileContract.h"
 
 namespace tavisk {
 namespace {
@@ -21,16 +23,6 @@ struct LinuxAuthenticator {
   LinuxTree tree;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, AdminAuthenticatorContract, LinuxAuthenticator);
-
-INSTANTIATE_TYPED_TEST_SUITE_P(Linux, ClockContract, ClockOf<LinuxTree>);
-
-struct LinuxBootLoader {
-  BootLoaderFile& service() { return tree.host().bootLoaderFile(); }
-  void put(const std::string& path, const char* contents) { tree.write(path, contents); }
-  std::string file(const std::string& path) { return tree.file(path); }
-  LinuxTree tree;
-};
-INSTANTIATE_TYPED_TEST_SUITE_P(Linux, BootLoaderFileContract, LinuxBootLoader);
 
 }  // namespace
 }  // namespace tavisk
