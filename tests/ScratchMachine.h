@@ -11,6 +11,7 @@
 
 #include "TemporaryFolder.h"
 #include "base/RunLoop.h"
+#include "effects/EffectLog.h"
 #include "effects/EffectSink.h"
 #include "hosts/scratch/ScratchHost.h"
 
@@ -20,6 +21,8 @@ namespace tavisk {
 /// read back. State set before host() is what the host opens with; later changes are another run's.
 class ScratchMachine {
  public:
+  ScratchMachine() { effects.addChannel(log); }
+
   std::string directory() const { return _folder.path(); }
 
   /// The whole machine.plist.
@@ -63,6 +66,7 @@ class ScratchMachine {
 
   EffectSink effects;
   RunLoop runLoop;
+  EffectLog log;
 
  private:
   TemporaryFolder _folder;

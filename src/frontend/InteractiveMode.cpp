@@ -1,6 +1,8 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
+#include <algorithm>
 #include <cstddef>
+#include <iterator>
 
 #include "base/Text.h"
 #include "frontend/Completion.h"
@@ -9,6 +11,13 @@
 namespace tavisk {
 namespace {
 constexpr std::size_t lineBufferSize = 2056;
+
+std::vector<std::string> namesOf(const std::vector<ZoneName>& zones) {
+  std::vector<std::string> names;
+  std::ranges::transform(zones, std::back_inserter(names), &ZoneName::text);
+  return names;
+}
+
 }  // namespace
 
 bool RemoteServerSettings::doInteractiveTool() {
@@ -38,7 +47,7 @@ bool RemoteServerSettings::readInput() {
 
 std::vector<std::string> RemoteServerSettings::completions(const std::string& text) {
   return completionsOf(text, [this](ArgumentKind kind) -> std::vector<std::string> {
-    if (kind == ArgumentKind::timeZone) return _context.host.clock().knownTimeZones();
+    if (kind == ArgumentKind::timeZone) return namesOf(_context.host.clock().knownTimeZones());
     if (kind == ArgumentKind::startupDisk) return _serverCommands->knownStartupDisks();
     return {};
   });

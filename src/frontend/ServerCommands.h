@@ -71,7 +71,7 @@ class ServerCommands final {
   void listTimeZones();
   void setTimeZone(const std::string& timeZone);
   /// The zone that this run has set, else the machine's.
-  std::string localTimeZone() const;
+  ZoneName localTimeZone() const;
 
   /// Network time
   void getUsingNetworkTime();
@@ -183,7 +183,7 @@ class ServerCommands final {
   bool _interactive = false;                         ///< kept; no handler reads it
   std::atomic<bool> _error = false;
   RemoteServerSettings* _parent = nullptr;
-  std::optional<std::string> _timeZone;  ///< set by setTimeZone
+  std::optional<ZoneName> _timeZone;  ///< set by setTimeZone
   std::shared_ptr<SpecialPMUSettings> _specialPMU;
   std::shared_ptr<StartupDisk> _startupDisk;
 };

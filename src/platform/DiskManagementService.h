@@ -75,6 +75,8 @@ class BootSettings {
     DiskName disk;
     std::string systemFolder;  ///< absolute path
     bool lumara9 = false;
+
+    bool operator==(const BootChoice&) const = default;
   };
 
   /// One of `preboot`. From any thread.

@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <algorithm>
-#include <vector>
 
 #include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
@@ -9,38 +8,39 @@
 
 namespace tavisk {
 
-std::string ServerCommands::localTimeZone() const {
-  std::string ofMachine = _context.host.clock().timeZone();
+ZoneName ServerCommands::localTimeZone() const {
+  const auto ofMachine = _context.host.clock().timeZone();
   return _timeZone.value_or(ofMachine);
 }
 
 void ServerCommands::getTimeZone() {
-  _context.output.print("Time Zone: %s\n", localTimeZone().c_str());
+  _context.output.print("Time Zone: %s\n", localTimeZone().text.c_str());
   setError(false);
 }
 
 void ServerCommands::listTimeZones() {
-  std::vector<std::string> names = _context.host.clock().knownTimeZones();
-  std::ranges::sort(names, isListedBefore);
+  auto zones = _context.host.clock().knownTimeZones();
+  std::ranges::sort(zones, isListedBefore, &ZoneName::text);
   _context.output.putLine("Time Zones:");
-  for (const std::string& name : names) _context.output.print(" %s\n", name.c_str());
+  for (const auto& zone : zones) _context.output.print(" %s\n", zone.text.c_str());
   setError(false);
 }
 
 void ServerCommands::setTimeZone(const std::string& timeZone) {
-  ClockService& clock = _context.host.clock();
-  const std::vector<std::string> names = clock.knownTimeZones();
+  auto& clock = _context.host.clock();
+  const auto zones = clock.knownTimeZones();
+  const ZoneName zone{timeZone};
   setError(false);
   if (checkForEmptyString(timeZone, "settimezone", "a valid time zone", "settimezone <timezone>")) return;
-  if (std::ranges::find(names, timeZone) == names.end()) {
+  if (std::ranges::find(zones, zone) == zones.end()) {
     _context.output.print(
         "%s is not a valid timezone. The command 'listtimezones' will show a list of valid time zones.\n",
         timeZone.c_str());
     setError(true);
     return;
   }
-  clock.setTimeZone("/usr/share/zoneinfo/" + timeZone);
-  _timeZone = timeZone;
+  clock.setTimeZone(zone);
+  _timeZone = zone;
   _context.output.print("Set TimeZone: %s\n", timeZone.c_str());
 }
 

@@ -34,7 +34,11 @@ class TimeDaemon {
  public:
   explicit TimeDaemon(const BusTree& tree) : _root(tree.at("/")), _services(_root, _runLoop) {}
   std::string zone() { return bus().property(object, "Timezone", "s").value().readText(); }
-  std::vector<std::string> zones() { return bus().call(object, "ListTimezones", "as").value().readTexts(); }
+  std::vector<ZoneName> zones() {
+    std::vector<ZoneName> zones;
+    for (const auto& name : bus().call(object, "ListTimezones", "as").value().readTexts()) zones.push_back({name});
+    return zones;
+  }
 
  private:
   Bus& bus() { return *_services.systemBus().value(); }
@@ -49,7 +53,7 @@ TEST(TimeDaemon, KnowsTheZonesThatWeList) {
   const auto installed = installedZones(SystemRoot("/")).value();
   BusTree tree;
   tree.write("/usr/share/zoneinfo/tzdata.zi", source);
-  for (const auto& zone : installed) tree.write("/usr/share/zoneinfo/" + zone, "TZif2");
+  for (const auto& zone : installed) tree.write(zone.file(), "TZif2");
   EXPECT_GT(installed.size(), 400U);
   EXPECT_THAT(tree.host().clock().knownTimeZones(), ElementsAreArray(TimeDaemon(tree).zones()));
 }
@@ -58,7 +62,7 @@ TEST(TimeDaemon, IsToldTheZoneAndTheNameFileFollows) {
   BusTree tree;
   tree.write("/usr/share/zoneinfo/Asia/Tokyo", "TZif2");
   tree.write("/etc/timezone", "Etc/UTC\n");
-  tree.host().clock().setTimeZone("/usr/share/zoneinfo/Asia/Tokyo");
+  tree.host().clock().setTimeZone({"Asia/Tokyo"});
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_EQ(tree.file("/etc/timezone"), "Asia/Tokyo\n");
   EXPECT_EQ(TimeDaemon(tree).zone(), "Asia/Tokyo");
@@ -67,7 +71,7 @@ TEST(TimeDaemon, IsToldTheZoneAndTheNameFileFollows) {
 TEST(TimeDaemon, RefusesAZoneThatThereIsNot) {
   BusTree tree;
   const auto before = TimeDaemon(tree).zone();
-  tree.host().clock().setTimeZone("/usr/share/zoneinfo/Mars/Olympus");
+  tree.host().clock().setTimeZone({"Mars/Olympus"});
   EXPECT_THAT(tree.lastEffect(), FailedFor("SetTimezone"));
   EXPECT_EQ(TimeDaemon(tree).zone(), before);
 }
@@ -77,7 +81,7 @@ TEST(TimeDaemon, IsPassedByWhereItTakesAChangeForNone) {
   for (const char* zone : {"UTC", "Asia/Tokyo"}) tree.write(std::string("/usr/share/zoneinfo/") + zone, "TZif2");
   EXPECT_EQ(TimeDaemon(tree).zone(), "UTC");
   for (const char* change : {"no link", "another link since"}) {
-    tree.host().clock().setTimeZone("/usr/share/zoneinfo/UTC");
+    tree.host().clock().setTimeZone(utc());
     EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied) << change;
     EXPECT_EQ(std::filesystem::read_symlink(tree.at("/etc/localtime")), "../usr/share/zoneinfo/UTC") << change;
     tree.link("/etc/localtime", "../usr/share/zoneinfo/Asia/Tokyo");

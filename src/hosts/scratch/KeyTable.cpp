@@ -9,6 +9,7 @@ namespace tavisk {
 namespace {
 
 using enum KeyType;
+using Type = PropertyList::Type;
 constexpr std::nullopt_t absent = std::nullopt;
 
 constexpr KeyRow rows[] = {
@@ -170,30 +171,11 @@ std::unordered_map<std::string_view, PlaceRows> indexed() {
   return places;
 }
 
-}  // namespace
-
-std::span<const KeyRow> keyTable() {
-  return rows;
-}
-
-const KeyRow* findKey(std::string_view place, std::string_view key) {
-  static const auto places = indexed();
-  auto found = places.find(place);
-  if (found == places.end()) return nullptr;
-  auto row = found->second.find(key);
-  if (row == found->second.end()) row = found->second.find("*");
-  return row == found->second.end() ? nullptr : row->second;
-}
-
-namespace {
-
-using Type = PropertyList::Type;
-
 /// What a key of a type holds: a value of that type, or an array of such.
 struct Shape {
   const char* words = "a dictionary";
   Type type = Type::dictionary;
-  bool array = false;
+  bool isArray = false;
 };
 
 Shape shapeOf(KeyType type) {
@@ -233,24 +215,23 @@ bool isArrayOf(const PropertyList& value, Type type) {
 bool fits(const PropertyList& value, KeyType type) {
   if (type == KeyType::anything) return true;
   if (type == KeyType::number && value.type() == Type::integer) return true;
-  auto shape = shapeOf(type);
-  return shape.array ? isArrayOf(value, shape.type) : value.type() == shape.type;
+  const auto shape = shapeOf(type);
+  return shape.isArray ? isArrayOf(value, shape.type) : value.type() == shape.type;
 }
 
 std::optional<std::string> whyWrongAt(std::string_view place, const PropertyList::Dictionary& values);
 
 std::optional<std::string> whyMemberWrong(const std::string& place, const PropertyList::Array& members) {
   for (std::size_t index = 0; index < members.size(); ++index) {
-    if (auto wrong = whyWrongAt(place + "/*", *members[index].asDictionary()))
+    if (const auto wrong = whyWrongAt(place + "/*", *members[index].asDictionary()))
       return std::to_string(index + 1) + " " + *wrong;
   }
   return std::nullopt;
 }
 
 std::optional<std::string> whyWrongInside(const KeyRow& row, const PropertyList& value) {
-  auto place = std::string(row.place) + (row.place.empty() ? "" : "/") + std::string(row.key);
-  if (row.type == KeyType::dictionary) return whyWrongAt(place, *value.asDictionary());
-  if (row.type == KeyType::dictionaries) return whyMemberWrong(place, *value.asArray());
+  if (row.type == KeyType::dictionary) return whyWrongAt(placeUnder(row), *value.asDictionary());
+  if (row.type == KeyType::dictionaries) return whyMemberWrong(placeUnder(row), *value.asArray());
   return std::nullopt;
 }
 
@@ -259,12 +240,29 @@ std::optional<std::string> whyWrongAt(std::string_view place, const PropertyList
     const auto* row = findKey(place, key);
     if (!row) continue;
     if (!fits(value, row->type)) return quoted(key) + ": expected " + shapeOf(row->type).words;
-    if (auto wrong = whyWrongInside(*row, value)) return quoted(key) + " " + *wrong;
+    if (const auto wrong = whyWrongInside(*row, value)) return quoted(key) + " " + *wrong;
   }
   return std::nullopt;
 }
 
 }  // namespace
+
+std::span<const KeyRow> keyTable() {
+  return rows;
+}
+
+const KeyRow* findKey(std::string_view place, std::string_view key) {
+  static const auto places = indexed();
+  const auto found = places.find(place);
+  if (found == places.end()) return nullptr;
+  auto row = found->second.find(key);
+  if (row == found->second.end()) row = found->second.find("*");
+  return row == found->second.end() ? nullptr : row->second;
+}
+
+std::string placeUnder(const KeyRow& row) {
+  return std::string(row.place) + (row.place.empty() ? "" : "/") + std::string(row.key);
+}
 
 std::optional<std::string> whyWrong(const PropertyList::Dictionary& machine) {
   return whyWrongAt("", machine);

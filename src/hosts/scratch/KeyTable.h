@@ -30,6 +30,9 @@ std::span<const KeyRow> keyTable();
 /// The row of a key; of any name when the place has no row of that very key. Null when it has neither.
 const KeyRow* findKey(std::string_view place, std::string_view key);
 
+/// The place of the keys in the dictionary, or in the dictionaries, under a key.
+std::string placeUnder(const KeyRow& row);
+
 /// The first value of a machine that is not of its key's type: the key, as `"Clock" "Time"`, and what was expected.
 /// Keys that the table does not have may hold anything.
 std::optional<std::string> whyWrong(const PropertyList::Dictionary& machine);

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstdint>
 #include <functional>
 #include <memory>
 #include <mutex>
@@ -9,15 +10,45 @@
 #include <string>
 #include <string_view>
 #include <thread>
+#include <vector>
 
 #include "base/PropertyList.h"
 #include "base/Result.h"
 #include "base/RunLoop.h"
 #include "effects/EffectSink.h"
-#include "hosts/scratch/MachineSection.h"
 #include "hosts/shared/SystemRoot.h"
 
 namespace tavisk {
+
+/// One dictionary of the machine, read by the types and defaults of the key table. Asking for a key that the table does
+/// not have at this place, or has with another type, is a mistake of the program: std::logic_error.
+class MachineSection {
+ public:
+  using Values = std::shared_ptr<const PropertyList::Dictionary>;
+
+  /// `place` as in KeyRow; `values` is null where the machine has no such dictionary.
+  MachineSection(std::string place, Values values) : _place(std::move(place)), _values(std::move(values)) {}
+
+  bool boolean(std::string_view key) const;
+  std::int64_t integer(std::string_view key) const;
+  std::string text(std::string_view key) const;
+  /// Absent when neither the machine nor the table has one.
+  std::optional<std::string> optionalText(std::string_view key) const;
+  /// The dictionary under a key, with nothing in it when the machine has none.
+  MachineSection section(std::string_view key) const;
+
+  /// In the order of the file.
+  std::vector<std::string> keys() const;
+  bool isAbsent() const { return !_values; }
+  /// The value itself; null when the machine has none.
+  const PropertyList* find(std::string_view key) const { return _values ? _values->find(key) : nullptr; }
+
+ private:
+  std::string_view defaultOf(std::string_view key) const;
+
+  std::string _place;
+  Values _values;
+};
 
 /// DIR/machine.plist: a property list that describes a machine. Only what was checked against the key table is ever
 /// handed out. Any thread may read and change it.
@@ -28,8 +59,7 @@ class MachineFile {
   using Edit = std::function<void(Dictionary& machine)>;
   using Observer = std::function<void(const Contents& before, const Contents& now)>;
 
-  /// The folder must exist; a missing machine.plist is an empty dictionary. The failure says what is wrong
-  /// where.
+  /// The folder must exist; a missing machine.plist is an empty dictionary. The failure says what is wrong where.
   static Result<std::unique_ptr<MachineFile>> open(const std::string& directory, EffectSink& effects);
 
   /// The folder itself, whose root is DIR: for the logs beside the file.
@@ -68,7 +98,7 @@ class MachineFile {
   std::optional<Failure> keep(const std::optional<FileStamp>& stamp, const Result<VersionRef>& version);
   Result<FileDescriptor> lock() const;
   Failure inFolder(const Failure& failure) const;
-  void recordFailure(const Failure& failure, const char* note);
+  void recordFailure(const Failure& failure, const std::string& note);
 
   std::string _directory;
   std::string _path;

@@ -6,6 +6,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <type_traits>
 
 #include "base/RunLoop.h"
 #include "effects/EffectSink.h"
@@ -15,24 +16,27 @@
 namespace tavisk {
 
 /// A setting as the machine file keeps it.
+template <typename SettingValueType>
 struct MachineSetting {
-  using Value = Result<std::optional<std::string>>;  ///< absent: the setting has no value
-  using Read = std::function<Value(MachineFile& machine)>;
-  using Write = std::function<void(MachineFile::Dictionary& machine, const std::string& value)>;
+  using Value = SettingValueType;
+  using Found = typename Setting<Value>::Found;  ///< absent: the setting has no value
+  using Read = std::function<Found(MachineFile& machine)>;
+  using Write = std::function<void(MachineFile::Dictionary& machine, const Value& value)>;
 
-  std::string name;  ///< one of platform/SettingNames.h
+  std::string name;  ///< one of effects/SettingNames.h
   std::string unit;  ///< see SettingValue
   Read read;         ///< empty: nothing can be read
-  Write write;
+  Write write;       ///< empty: it is only read
 };
 
-/// One key as a setting: a boolean reads as "on" or "off", and a text as absent where it has neither value nor default.
-MachineSetting switchAt(std::string name, const std::string& section, const std::string& key);
-MachineSetting textAt(std::string name, const std::string& section, const std::string& key);
+/// One key as a setting; a text is absent where it has neither value nor default.
+MachineSetting<bool> switchAt(std::string name, const std::string& section, const std::string& key);
+MachineSetting<std::string> textAt(std::string name, const std::string& section, const std::string& key);
+/// What is only done and counted, under a key which may be at the top; its effects call it by the word that is asked.
+MachineSetting<std::string> countAt(std::string name, const std::string& section, const std::string& key);
 
-/// Adds one to a count, which may be at the top.
+/// Adds one to a count.
 void countUp(MachineFile::Dictionary& dictionary, std::string_view key);
-void countUp(MachineFile::Dictionary& machine, std::string_view section, std::string_view key);
 
 /// Reads and changes the settings of the machine, and tells the effects. The one place that heeds "Refusals".
 class MachineSettings {
@@ -44,31 +48,70 @@ class MachineSettings {
   MachineSection section(std::string_view name) { return _file.section(name); }
 
   /// Absent when reading is refused, or there is no value.
-  std::optional<std::string> read(const MachineSetting& setting);
-  bool isOn(const MachineSetting& setting) { return read(setting) == "on"; }
+  template <typename Value>
+  std::optional<Value> read(const MachineSetting<Value>& setting) {
+    return observe(parts(setting));
+  }
+  bool isOn(const MachineSetting<bool>& setting) { return read(setting).value_or(false); }
   /// Writes also when the machine has the value already.
-  Effect change(const MachineSetting& setting, const std::string& asked);
-  void turn(const MachineSetting& setting, bool on) { change(setting, on ? "on" : "off"); }
+  template <typename Value>
+  Effect change(const MachineSetting<Value>& setting, const std::type_identity_t<Value>& asked) {
+    return carryOut(parts(setting), asked);
+  }
   /// That a setting was to be changed which the machine cannot have.
   void recordUnsupported(const std::string& setting);
   /// Writes what is no setting of the machine but the run's own doing: only a failure is an effect, and "*" does not
   /// refuse it.
-  void note(const MachineSetting& setting, const std::string& asked);
+  void note(const MachineSetting<bool>& setting, bool asked);
 
-  /// The same for a setting that the machine keeps outside its file.
-  std::optional<std::string> observe(Setting<std::string> setting);
-  Effect carryOut(Setting<std::string> setting, const std::string& asked);
+  /// As read() and change(), for a setting that the machine keeps outside its file, or changes in a way of its own.
+  template <typename Value>
+  std::optional<Value> observe(const Setting<Value>& setting) {
+    return tavisk::observe(heedingRefusals(setting), _effects);
+  }
+  template <typename Value>
+  Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked) {
+    return tavisk::carryOut(heedingRefusals(setting), asked, _effects, _runLoop);
+  }
+  /// What is given must outlive the parts.
+  template <typename Value>
+  Setting<Value> parts(const MachineSetting<Value>& setting);
 
  private:
-  Setting<std::string> parts(const MachineSetting& setting);
-  Result<void> write(const MachineSetting& setting, const std::string& value);
-  Setting<std::string> heedingRefusals(Setting<std::string> setting);
-  std::optional<std::string> refusal(const std::string& setting, const char* suffix);
+  template <typename Value>
+  Setting<Value> heedingRefusals(Setting<Value> setting);
+  /// Why the setting is not set, or not read.
+  std::optional<Failure> refusedChange(const std::string& setting);
+  std::optional<Failure> refusedRead(const std::string& setting);
   std::optional<std::string> refusalNamed(const std::string& name);
 
   MachineFile& _file;
   EffectSink& _effects;
   RunLoop& _runLoop;
 };
+
+template <typename Value>
+Setting<Value> MachineSettings::parts(const MachineSetting<Value>& setting) {
+  Setting<Value> parts;
+  parts.name = setting.name;
+  parts.unit = setting.unit;
+  parts.where = _file.path();
+  if (setting.read) parts.live = parts.stored = [this, &setting] { return setting.read(_file); };
+  parts.store = [this, &setting](const Value& value) {
+    return _file.change([&](MachineFile::Dictionary& machine) { setting.write(machine, value); });
+  };
+  parts.always = true;
+  return parts;
+}
+
+template <typename Value>
+Setting<Value> MachineSettings::heedingRefusals(Setting<Value> setting) {
+  if (const auto refused = refusedRead(setting.name)) {
+    for (auto* read : {&setting.live, &setting.stored})
+      if (*read) *read = [=] { return *refused; };
+  }
+  if (const auto refused = refusedChange(setting.name)) setting.store = [=](const Value&) { return *refused; };
+  return setting;
+}
 
 }  // namespace tavisk

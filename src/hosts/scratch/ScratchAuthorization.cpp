@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/scratch/ScratchAuthorization.h"
 
 #include <limits>
@@ -10,6 +9,7 @@
 namespace tavisk {
 namespace {
 
+constexpr const char* section = "Authorization";
 constexpr const char* adminGroup = "admin";
 constexpr GroupId adminId = 80;
 
@@ -19,9 +19,7 @@ unsigned idOf(std::int64_t number) {
   return number < 0 || number > largest ? largest : static_cast<unsigned>(number);
 }
 
-constexpr const char* section = "Authorization";
-
-MachineSetting authenticated() {
+MachineSetting<bool> authenticated() {
   return switchAt(setting::authorization, section, "Authenticated");
 }
 
@@ -33,7 +31,7 @@ UserId ScratchUserDatabase::realUserId() {
 
 std::optional<std::vector<GroupId>> ScratchUserDatabase::supplementaryGroups(std::size_t room) {
   std::vector<GroupId> groups;
-  auto user = _machine.section("User");
+  const auto user = _machine.section("User");
   if (const auto* ids = user.find("Groups")) {
     for (const auto& id : *ids->asArray()) groups.push_back(idOf(*id.asInteger()));
   }
@@ -42,7 +40,7 @@ std::optional<std::vector<GroupId>> ScratchUserDatabase::supplementaryGroups(std
 }
 
 std::optional<GroupId> ScratchUserDatabase::groupNamed(const std::string& name) {
-  auto groups = _machine.section("Group Database");
+  const auto groups = _machine.section("Group Database");
   if (groups.isAbsent()) return name == adminGroup ? std::optional(adminId) : std::nullopt;
   const auto* id = groups.find(name);
   if (!id) return std::nullopt;
@@ -50,7 +48,7 @@ std::optional<GroupId> ScratchUserDatabase::groupNamed(const std::string& name) 
 }
 
 void ScratchAdminAuthenticator::authenticate() {
-  _settings.note(authenticated(), "on");
+  _settings.note(authenticated(), true);
 }
 
 bool ScratchAdminAuthenticator::isAuthenticated() {
@@ -59,11 +57,11 @@ bool ScratchAdminAuthenticator::isAuthenticated() {
 
 void ScratchAdminAuthenticator::deauthenticate() {
   auto counted = authenticated();
-  counted.write = [store = counted.write](MachineFile::Dictionary& machine, const std::string& value) {
-    store(machine, value);
-    countUp(machine, section, "Deauthentications");
+  counted.write = [store = counted.write](MachineFile::Dictionary& machine, bool isAuthenticated) {
+    store(machine, isAuthenticated);
+    countUp(machine.dictionary(section), "Deauthentications");
   };
-  _settings.note(counted, "off");
+  _settings.note(counted, false);
 }
 
 }  // namespace tavisk

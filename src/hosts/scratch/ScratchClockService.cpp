@@ -5,7 +5,6 @@
 #include <chrono>
 #include <limits>
 
-#include "base/Text.h"
 #include "effects/SettingNames.h"
 #include "hosts/shared/ZoneList.h"
 
@@ -14,11 +13,11 @@ namespace {
 
 constexpr const char* section = "Clock";
 constexpr const char* timeKey = "Time";
-constexpr const char* zoneKey = "Time Zone";
+constexpr const char* offsetKey = "Offset";
 constexpr std::int64_t longestChange = 10;  // seconds: waiting for the lock and writing
 
 std::int64_t realTime() {
-  auto sinceEpoch = std::chrono::system_clock::now().time_since_epoch();
+  const auto sinceEpoch = std::chrono::system_clock::now().time_since_epoch();
   return std::chrono::floor<std::chrono::seconds>(sinceEpoch).count();
 }
 
@@ -29,91 +28,87 @@ std::int64_t saturatingSum(std::int64_t left, std::int64_t right) {
 }
 
 std::int64_t timeOf(MachineFile& machine) {
-  auto clock = machine.section(section);
+  const auto clock = machine.section(section);
   if (const auto* still = clock.find(timeKey)) return *still->asInteger();
-  return saturatingSum(realTime(), clock.integer("Offset"));
+  return saturatingSum(realTime(), clock.integer(offsetKey));
 }
 
-void storeTime(MachineFile::Dictionary& machine, const std::string& value) {
+void storeTime(MachineFile::Dictionary& machine, std::int64_t time) {
   auto& clock = machine.dictionary(section);
-  auto time = leadingInteger(value);
-  if (clock.find(timeKey)) {
+  if (clock.find(timeKey))
     clock.set(timeKey, time);
-  } else {
-    clock.set("Offset", saturatingSum(time, -realTime()));
-  }
+  else
+    clock.set(offsetKey, saturatingSum(time, -realTime()));
 }
 
-MachineSetting timeSetting() {
-  return {setting::time, "seconds since 1970",
-          [](MachineFile& machine) -> MachineSetting::Value { return std::optional(std::to_string(timeOf(machine))); },
-          storeTime};
+MachineSetting<std::int64_t> timeSetting() {
+  return {setting::time, "seconds since 1970", timeOf, storeTime};
 }
 
-std::string joined(const std::vector<std::string>& names) {
-  std::string lines;
-  for (const auto& name : names) lines += (lines.empty() ? "" : "\n") + name;
-  return lines;
+MachineSetting<ZoneName> zoneSetting() {
+  return {setting::timeZone, "",
+          [](MachineFile& machine) { return ZoneName{machine.section(section).text("Time Zone")}; },
+          [](MachineFile::Dictionary& machine, const ZoneName& zone) {
+            auto& clock = machine.dictionary(section);
+            clock.set("Time Zone", zone.text);
+            clock.set("Time Zone File", zone.file());
+          }};
 }
 
-std::vector<std::string> namesIn(const PropertyList::Array& strings) {
-  std::vector<std::string> names;
-  for (const auto& name : strings) names.push_back(*name.asString());
-  return names;
+/// An empty text names no zone.
+std::vector<ZoneName> zonesNamedIn(const PropertyList::Array& texts) {
+  std::vector<ZoneName> zones;
+  for (const auto& text : texts)
+    if (!text.asString()->empty()) zones.push_back({*text.asString()});
+  return zones;
 }
 
-MachineSetting::Value knownZones(MachineFile& machine) {
-  auto clock = machine.section(section);
-  if (const auto* known = clock.find("Known Time Zones")) return std::optional(joined(namesIn(*known->asArray())));
-  auto installed = installedZones(SystemRoot("/"));
+MachineSetting<std::vector<ZoneName>>::Found knownZones(MachineFile& machine) {
+  const auto clock = machine.section(section);
+  if (const auto* known = clock.find("Known Time Zones")) return zonesNamedIn(*known->asArray());
+  const auto installed = installedZones(SystemRoot("/"));
   if (!installed) return installed.failure();
-  return std::optional(joined(*installed));
+  return *installed;
 }
 
 }  // namespace
 
 std::int64_t ScratchClockService::now() {
-  auto time = _settings.read(timeSetting());
-  return time ? leadingInteger(*time) : realTime();
+  const auto time = _settings.read(timeSetting());
+  return time ? *time : realTime();
 }
 
 void ScratchClockService::setTime(std::int64_t secondsSince1970) {
   auto setting = timeSetting();
-  bool stored = false;
-  setting.write = [&](MachineFile::Dictionary& machine, const std::string& value) {
-    storeTime(machine, value);
-    stored = true;
+  bool isStored = false;
+  setting.write = [&](MachineFile::Dictionary& machine, std::int64_t time) {
+    storeTime(machine, time);
+    isStored = true;
   };
   // Until it is read back a clock that runs may have gone on to the next second.
-  setting.read = [&](MachineFile& machine) -> MachineSetting::Value {
-    auto time = timeOf(machine);
-    bool goneOn = stored && time >= secondsSince1970 && time - secondsSince1970 <= longestChange;
-    return std::optional(std::to_string(goneOn ? secondsSince1970 : time));
+  setting.read = [&](MachineFile& machine) {
+    const auto time = timeOf(machine);
+    const bool hasGoneOn = isStored && time >= secondsSince1970 && time - secondsSince1970 <= longestChange;
+    return hasGoneOn ? secondsSince1970 : time;
   };
-  _settings.change(setting, std::to_string(secondsSince1970));
+  _settings.change(setting, secondsSince1970);
 }
 
-std::vector<std::string> ScratchClockService::knownTimeZones() {
-  return split(_settings.read({setting::knownTimeZones, "", knownZones, nullptr}).value_or(""), "\n");
+std::vector<ZoneName> ScratchClockService::knownTimeZones() {
+  const MachineSetting<std::vector<ZoneName>> known{setting::knownTimeZones, "", knownZones, nullptr};
+  return _settings.read(known).value_or(std::vector<ZoneName>());
 }
 
-std::string ScratchClockService::timeZone() {
-  return _settings.read(textAt(setting::timeZone, section, zoneKey)).value_or("UTC");
+ZoneName ScratchClockService::timeZone() {
+  return _settings.read(zoneSetting()).value_or(utc());
 }
 
-void ScratchClockService::setTimeZone(const std::string& zoneFile) {
-  auto setting = textAt(setting::timeZone, section, zoneKey);
-  setting.write = [store = setting.write, &zoneFile](MachineFile::Dictionary& machine, const std::string& value) {
-    store(machine, value);
-    machine.dictionary(section).set("Time Zone File", zoneFile);
-  };
-  bool usual = zoneFile.starts_with(zoneFolder);
-  _settings.change(setting, usual ? zoneFile.substr(std::string_view(zoneFolder).size()) : zoneFile);
+void ScratchClockService::setTimeZone(const ZoneName& zone) {
+  _settings.change(zoneSetting(), zone);
 }
 
-std::string ScratchClockService::rulesOf(const std::string& timeZone) {
-  bool inside = !timeZone.empty() && !timeZone.starts_with('/') && timeZone.find("..") == std::string::npos;
-  return zoneFolder + (inside ? timeZone : "UTC");
+std::string ScratchClockService::rulesOf(const ZoneName& zone) {
+  return (zone.staysInFolder() ? zone : utc()).file();
 }
 
 }  // namespace tavisk

@@ -14,10 +14,10 @@ class ScratchClockService final : public ClockService {
 
   std::int64_t now() override;
   void setTime(std::int64_t secondsSince1970) override;
-  std::vector<std::string> knownTimeZones() override;
-  std::string timeZone() override;
-  void setTimeZone(const std::string& zoneFile) override;
-  std::string rulesOf(const std::string& timeZone) override;
+  std::vector<ZoneName> knownTimeZones() override;
+  ZoneName timeZone() override;
+  void setTimeZone(const ZoneName& zone) override;
+  std::string rulesOf(const ZoneName& zone) override;
 
  private:
   MachineSettings& _settings;

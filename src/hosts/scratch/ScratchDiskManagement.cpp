@@ -10,23 +10,15 @@ namespace {
 constexpr const char* section = "Firmware";
 constexpr const char* preferenceKey = "Boot Preference";
 constexpr const char* networkKey = "Network Preference";
+constexpr const char* variablesKey = "Variables";
 constexpr ServiceStatus failed = 1;
 
-using Value = Result<std::optional<std::string>>;
-
-std::string textOf(const BootSettings::BootChoice& choice) {
-  auto text = choice.disk.text;
-  if (!choice.systemFolder.empty()) text += " " + choice.systemFolder;
-  if (choice.lumara9) text += " (Lumara 9)";
-  return text;
-}
-
-Value bootPreferenceText(MachineFile& machine) {
+MachineSetting<BootSettings::BootChoice>::Found readBootPreference(MachineFile& machine) {
   const auto preference = machine.section(section).section(preferenceKey);
   const auto disk = preference.optionalText("Disk");
-  if (!disk) return std::optional<std::string>();
-  return std::optional(
-      textOf({{*disk}, preference.optionalText("Folder").value_or(""), preference.boolean("Lumara 9")}));
+  if (!disk) return std::nullopt;
+  return BootSettings::BootChoice{
+      {*disk}, preference.optionalText("Folder").value_or(""), preference.boolean("Lumara 9")};
 }
 
 void storeBootPreference(MachineFile::Dictionary& machine, const BootSettings::BootChoice& choice) {
@@ -36,7 +28,26 @@ void storeBootPreference(MachineFile::Dictionary& machine, const BootSettings::B
   preference.set("Lumara 9", choice.lumara9);
 }
 
+MachineSetting<BootSettings::BootChoice> bootPreferenceSetting() {
+  return {setting::startupDisk, "", readBootPreference, storeBootPreference};
+}
+
+MachineSetting<std::string> variableNamed(const std::string& name) {
+  return {setting::firmwareVariable + name, "",
+          [=](MachineFile& machine) { return machine.section(section).section(variablesKey).optionalText(name); },
+          [=](MachineFile::Dictionary& machine, const std::string& value) {
+            machine.dictionary(section).dictionary(variablesKey).set(name, value);
+          }};
+}
+
 }  // namespace
+
+std::string textOf(const BootSettings::BootChoice& choice) {
+  auto text = choice.disk.text;
+  if (!choice.systemFolder.empty()) text += " " + choice.systemFolder;
+  if (choice.lumara9) text += " (Lumara 9)";
+  return text;
+}
 
 bool ScratchDiskManagement::is(DiskTrait trait, const DiskName& disk) {
   const auto known = _disks.find(disk);
@@ -83,55 +94,45 @@ BootSettings::LegacyBootSupport ScratchDiskManagement::legacyBootSupport() {
 }
 
 BootSettings::BootPreference ScratchDiskManagement::bootPreference() {
-  const auto known = _settings.read({setting::startupDisk, "", bootPreferenceText, nullptr});
-  const auto disk = _machine.section(section).section(preferenceKey).optionalText("Disk");
-  if (!known || !disk || !_machine.section("Disks").find(*disk)) return {failed, std::nullopt};
-  return {0, DiskName{*disk}};
+  const auto choice = _settings.read(bootPreferenceSetting());
+  if (!choice || !_machine.section("Disks").find(choice->disk.text)) return {failed, std::nullopt};
+  return {0, choice->disk};
 }
 
 BootSettings::NetworkBootPreference ScratchDiskManagement::networkBootPreference() {
-  const auto interface = [](MachineFile& machine) -> Value {
+  const auto readInterface = [](MachineFile& machine) {
     return machine.section(section).section(networkKey).optionalText("Interface");
   };
-  const auto known = _settings.read({setting::networkStartupDisk, "", interface, nullptr});
+  const auto interface =
+      _settings.read(MachineSetting<std::string>{setting::networkStartupDisk, "", readInterface, nullptr});
+  if (!interface) return {failed, {}, {}, {}};
   const auto preference = _machine.section(section).section(networkKey);
-  if (!known || preference.isAbsent()) return {failed, {}, {}, {}};
-  return {0, preference.optionalText("Value"), preference.optionalText("Server"), known};
+  return {0, preference.optionalText("Value"), preference.optionalText("Server"), interface};
 }
 
 ServiceStatus ScratchDiskManagement::setBootPreference(const BootChoice& choice) {
-  const auto store = [&](MachineFile::Dictionary& machine) { storeBootPreference(machine, choice); };
-  return change(setting::startupDisk, textOf(choice), "Set Boot Preference Status", bootPreferenceText, store);
+  return change(bootPreferenceSetting(), choice, "Set Boot Preference Status");
 }
 
 ServiceStatus ScratchDiskManagement::setFirmwareVariable(const std::string& name, const std::string& value) {
-  const auto read = [&](MachineFile& machine) -> Value {
-    return machine.section(section).section("Variables").optionalText(name);
-  };
-  const auto store = [&](MachineFile::Dictionary& machine) {
-    machine.dictionary(section).dictionary("Variables").set(name, value);
-  };
-  return change(setting::firmwareVariable + name, value, "Set Variable Status", read, store);
+  return change(variableNamed(name), value, "Set Variable Status");
 }
 
-ServiceStatus ScratchDiskManagement::change(const std::string& setting, const std::string& asked, const char* statusKey,
-                                            const MachineSetting::Read& read, const MachineFile::Edit& store) {
+template <typename Value>
+ServiceStatus ScratchDiskManagement::change(const MachineSetting<Value>& setting, const Value& asked,
+                                            const char* statusKey) {
   ServiceStatus status = failed;  // what a refusal leaves
-  Setting<std::string> parts;
-  parts.name = setting;
-  parts.where = _machine.path();
-  parts.live = parts.stored = [&] { return read(_machine); };
-  parts.store = [&](const std::string&) -> Result<void> {
+  auto parts = _settings.parts(setting);
+  parts.store = [&, write = parts.store](const Value& value) -> Result<void> {
     const auto answer = static_cast<ServiceStatus>(_machine.section(section).integer(statusKey));
     if (answer != 0) {
       status = answer;
       return Failure{"set", "the rehearsed firmware", "status " + std::to_string(answer)};
     }
-    auto written = _machine.change(store);
+    const auto written = write(value);
     if (written) status = 0;
     return written;
   };
-  parts.always = true;
   _settings.carryOut(parts, asked);
   return status;
 }

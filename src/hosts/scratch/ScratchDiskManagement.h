@@ -8,6 +8,9 @@
 
 namespace tavisk {
 
+/// How the effects of a rehearsal tell it.
+std::string textOf(const BootSettings::BootChoice& choice);
+
 /// "Disks" and "Firmware".
 class ScratchDiskManagement final : public DiskManagementService {
  public:
@@ -28,9 +31,9 @@ class ScratchDiskManagement final : public DiskManagementService {
   ServiceStatus setFirmwareVariable(const std::string& name, const std::string& value) override;
 
  private:
-  /// Makes the change unless the machine answers its set with the status under the key.
-  ServiceStatus change(const std::string& setting, const std::string& asked, const char* statusKey,
-                       const MachineSetting::Read& read, const MachineFile::Edit& store);
+  /// Makes the change unless the firmware answers it with the status under the key.
+  template <typename Value>
+  ServiceStatus change(const MachineSetting<Value>& setting, const Value& asked, const char* statusKey);
 
   MachineFile& _machine;
   MachineSettings& _settings;

@@ -4,8 +4,6 @@
 
 #include <utility>
 
-#include "hosts/scratch/MachineSection.h"
-
 namespace tavisk {
 namespace {
 

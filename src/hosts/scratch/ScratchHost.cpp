@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/scratch/ScratchHost.h"
 
+#include "effects/SettingNames.h"
+
 namespace tavisk {
 
 Result<std::unique_ptr<ScratchHost>> ScratchHost::open(const std::string& directory, EffectSink& effects,
@@ -27,8 +29,8 @@ ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFi
       _networkTime(_settings),
       _powerSettings(_settings),
       _powerController(_settings, effects),
-      _remoteShell(_settings),
-      _remoteEvents(_settings),
+      _remoteShell(_settings, setting::remoteLogin, "Remote Shell"),
+      _remoteEvents(_settings, setting::remoteEvents, "Remote Events"),
       _hostConfiguration(_settings),
       _dynamicStore(_settings),
       _bootLoaderFile(_root, _settings),

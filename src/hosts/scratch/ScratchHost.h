@@ -78,8 +78,8 @@ class ScratchHost final : public Host {
   ScratchNetworkTimeService _networkTime;
   ScratchPowerSettingsService _powerSettings;
   ScratchPowerController _powerController;
-  ScratchRemoteShellService _remoteShell;
-  ScratchRemoteEventsService _remoteEvents;
+  ScratchRemoteAccess<RemoteShellService> _remoteShell;
+  ScratchRemoteAccess<RemoteEventsService> _remoteEvents;
   ScratchHostConfigService _hostConfiguration;
   ScratchDynamicStore _dynamicStore;
   ScratchBootLoaderFile _bootLoaderFile;

@@ -26,7 +26,7 @@ std::optional<IORegistry::Data> ScratchIORegistry::dataProperty(const RegistryEn
                                                                 const std::string& property) {
   const auto properties = _machine.section(section).section("Device Tree").section(entry.name);
   const auto* value = properties.find(property);
-  return !value ? std::nullopt : std::optional(*value->asData());
+  return value ? std::optional(*value->asData()) : std::nullopt;
 }
 
 std::optional<RegistryEntry> ScratchIORegistry::serviceNamed(const std::string& bsdName) {

@@ -4,21 +4,18 @@
 
 #include <string>
 
-#include "base/Result.h"
 #include "effects/EffectSink.h"
 #include "hosts/shared/SystemRoot.h"
 #include "platform/SystemLog.h"
 
 namespace tavisk {
 
-/// Appends a line and its newline in one piece; the file is made when it is missing. Several runs may append.
-Result<void> appendLine(const SystemRoot& root, const std::string& path, std::string line);
-
 /// DIR/effects.log: one JSON object a line. An effect that cannot be written there is lost to it; the other channels
 /// still have it.
 class EffectsLog final : public EffectChannel {
  public:
   explicit EffectsLog(const SystemRoot& folder) : _folder(folder) {}
+
   void record(const Effect& effect) override;
 
  private:
@@ -29,6 +26,7 @@ class EffectsLog final : public EffectChannel {
 class ScratchSystemLog final : public SystemLog {
  public:
   ScratchSystemLog(const SystemRoot& folder, EffectSink& effects) : _folder(folder), _effects(effects) {}
+
   void write(const std::string& message) override;
 
  private:

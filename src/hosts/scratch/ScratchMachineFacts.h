@@ -18,6 +18,7 @@ class ScratchKernelValues final : public KernelValues {
 
  private:
   static constexpr std::size_t longestModel = 127;
+
   MachineSection kernel() { return _machine.section("Kernel"); }
 
   MachineFile& _machine;
@@ -31,7 +32,7 @@ class ScratchKeyboardInputService final : public KeyboardInputService {
   std::optional<std::int64_t> currentLayoutNumber() override {
     const auto section = _machine.section("Keyboard Input");
     const auto* number = section.find("Layout Number");
-    return !number ? std::nullopt : std::optional(*number->asInteger());
+    return number ? std::optional(*number->asInteger()) : std::nullopt;
   }
 
  private:

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/scratch/ScratchNameServices.h"
 
 #include "effects/SettingNames.h"
@@ -10,6 +9,8 @@ namespace {
 
 constexpr const char* configuration = "Host Configuration";
 constexpr const char* live = "Dynamic Store";
+constexpr const char* computerNameKey = "Computer Name";
+constexpr const char* localHostNameKey = "Local Host Name";
 
 bool propagates(const MachineFile::Dictionary& machine) {
   const auto* section = machine.find(configuration);
@@ -18,26 +19,24 @@ bool propagates(const MachineFile::Dictionary& machine) {
 }
 
 /// A change of the configured name changes the live one too, unless the machine lags behind.
-MachineSetting nameAt(const char* name, const char* key) {
+MachineSetting<std::string> nameAt(const char* name, const char* key) {
   auto setting = textAt(name, configuration, key);
-  setting.write = [key, configure = setting.write](MachineFile::Dictionary& machine, const std::string& value) {
-    configure(machine, value);
-    if (propagates(machine)) machine.dictionary(live).set(key, value);
+  setting.write = [key, configure = setting.write](MachineFile::Dictionary& machine, const std::string& text) {
+    configure(machine, text);
+    if (propagates(machine)) machine.dictionary(live).set(key, text);
   };
   return setting;
 }
-
-constexpr const char* section = "Dynamic Store";
 
 class ScratchSession final : public DynamicStore::Session {
  public:
   explicit ScratchSession(MachineSettings& settings) : _settings(settings) {}
 
   std::optional<std::string> computerName() override {
-    return _settings.read(textAt(setting::computerName, section, "Computer Name"));
+    return _settings.read(textAt(setting::computerName, live, computerNameKey));
   }
   std::optional<std::string> localHostName() override {
-    return _settings.read(textAt(setting::localSubnetName, section, "Local Host Name"));
+    return _settings.read(textAt(setting::localSubnetName, live, localHostNameKey));
   }
 
  private:
@@ -47,19 +46,19 @@ class ScratchSession final : public DynamicStore::Session {
 }  // namespace
 
 void ScratchHostConfigService::setComputerName(const std::string& name) {
-  _settings.change(nameAt(setting::computerName, "Computer Name"), name);
+  _settings.change(nameAt(setting::computerName, computerNameKey), name);
 }
 
 void ScratchHostConfigService::setLocalNetworkName(const std::string& name) {
-  _settings.change(nameAt(setting::localSubnetName, "Local Host Name"), name);
+  _settings.change(nameAt(setting::localSubnetName, localHostNameKey), name);
 }
 
 std::unique_ptr<DynamicStore::Session> ScratchDynamicStore::open(const std::string& clientName) {
-  if (_settings.section(section).boolean("Available")) return std::make_unique<ScratchSession>(_settings);
-  const auto fail = [&](MachineFile&) -> MachineSetting::Value {
+  if (_settings.section(live).boolean("Available")) return std::make_unique<ScratchSession>(_settings);
+  const auto fail = [&](MachineFile&) {
     return Failure{"open a session for " + clientName, "the dynamic store", "it is not available"};
   };
-  _settings.read({setting::dynamicStore, "", fail, nullptr});
+  static_cast<void>(_settings.read(MachineSetting<std::string>{setting::dynamicStore, "", fail, nullptr}));
   return nullptr;
 }
 

@@ -9,10 +9,11 @@ namespace {
 
 constexpr const char* section = "Network Time";
 
-MachineSetting running() {
+MachineSetting<bool> running() {
   return switchAt(setting::networkTime, section, "Running");
 }
-MachineSetting address() {
+
+MachineSetting<std::string> address() {
   return textAt(setting::networkTimeServer, section, "Server");
 }
 
@@ -23,15 +24,15 @@ bool ScratchNetworkTimeService::isRunning() {
 }
 
 void ScratchNetworkTimeService::setLaunchAtStartup(bool launch) {
-  _settings.turn(switchAt(setting::networkTimeAtStartup, section, "Launch At Startup"), launch);
+  _settings.change(switchAt(setting::networkTimeAtStartup, section, "Launch At Startup"), launch);
 }
 
 void ScratchNetworkTimeService::start() {
-  _settings.turn(running(), true);
+  _settings.change(running(), true);
 }
 
 void ScratchNetworkTimeService::stop() {
-  _settings.turn(running(), false);
+  _settings.change(running(), false);
 }
 
 NetworkTimeServer ScratchNetworkTimeService::server() {
@@ -43,8 +44,7 @@ void ScratchNetworkTimeService::setServer(const NetworkTimeServer& server) {
 }
 
 void ScratchNetworkTimeService::restartAsynchronously() {
-  auto count = [](MachineFile::Dictionary& machine, const std::string&) { countUp(machine, section, "Restarts"); };
-  _settings.change({setting::networkTimeRestart, "", nullptr, count}, "restart");
+  _settings.change(countAt(setting::networkTimeRestart, section, "Restarts"), "restart");
 }
 
 }  // namespace tavisk

@@ -2,7 +2,6 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/scratch/ScratchPowerController.h"
 
-#include "base/Text.h"
 #include "effects/SettingNames.h"
 
 namespace tavisk {
@@ -20,15 +19,16 @@ std::int64_t numberIn(const PropertyList& value) {
   return data && data->size() == 1 ? data->front() : 0;
 }
 
-MachineSetting delayOf(const PowerController::Service& service, const std::string& property,
-                       const PropertyList& written = 0) {
+/// A change writes `written`, of whatever type it is.
+MachineSetting<std::int64_t> delayOf(const PowerController::Service& service, const std::string& property,
+                                     const PropertyList& written = 0) {
   return {setting::startupDelay, "units of 30 seconds",
-          [=](MachineFile& machine) -> MachineSetting::Value {
+          [=](MachineFile& machine) {
             const auto ofService = machine.section(registry).section(services).section(service.name);
             const auto* value = ofService.find(property);
-            return value ? std::optional(std::to_string(numberIn(*value))) : std::nullopt;
+            return value ? std::optional(numberIn(*value)) : std::nullopt;
           },
-          [=](MachineFile::Dictionary& machine, const std::string&) {
+          [=](MachineFile::Dictionary& machine, std::int64_t) {
             machine.dictionary(registry).dictionary(services).dictionary(service.name).set(property, written);
           }};
 }
@@ -46,8 +46,7 @@ std::optional<PowerController::Service> ScratchPowerController::serviceOfClass(c
 
 std::optional<std::int64_t> ScratchPowerController::numberProperty(const Service& service,
                                                                    const std::string& property) {
-  const auto number = _settings.read(delayOf(service, property));
-  return number ? std::optional(leadingInteger(*number)) : std::nullopt;
+  return _settings.read(delayOf(service, property));
 }
 
 std::pair<ControllerStatus, PowerController::Connection> ScratchPowerController::open(
@@ -62,7 +61,7 @@ ControllerStatus ScratchPowerController::setProperties(const Connection& connect
   if (status != 0) return checked(status, "set properties", connection.service.name);
   for (const auto& [property, value] : properties) {
     const auto setting = delayOf(connection.service, property, value);
-    if (_settings.change(setting, std::to_string(numberIn(value))).outcome == Outcome::failed) return refused;
+    if (_settings.change(setting, numberIn(value)).outcome == Outcome::failed) return refused;
   }
   return 0;
 }

@@ -2,10 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/scratch/ScratchPowerSettingsService.h"
 
-#include <algorithm>
 #include <cstdint>
 
-#include "base/Text.h"
 #include "effects/SettingNames.h"
 
 namespace tavisk {
@@ -39,44 +37,49 @@ const char* keyOf(PowerSwitch which) {
   return "Power Button Sleep";
 }
 
-MachineSetting settingOf(SleepTimer timer, const PowerSource& source) {
+/// Less than no minutes are told as they are, and count as never.
+Reading<Minutes> minutesOf(std::int64_t number) {
+  if (number < 0) return {Minutes{0}, std::to_string(number)};
+  return Minutes{static_cast<unsigned long>(number)};
+}
+
+MachineSetting<Minutes> settingOf(SleepTimer timer, const PowerSource& source) {
   const auto* key = keyOf(timer);
   return {nameOf(timer), "minutes",
-          [=](MachineFile& machine) -> MachineSetting::Value {
-            return std::optional(std::to_string(machine.section(sources).section(source.name).integer(key)));
+          [=](MachineFile& machine) {
+            return std::optional(minutesOf(machine.section(sources).section(source.name).integer(key)));
           },
-          [=](MachineFile::Dictionary& machine, const std::string& value) {
-            machine.dictionary(sources).dictionary(source.name).set(key, leadingInteger(value));
+          [=](MachineFile::Dictionary& machine, const Minutes& minutes) {
+            machine.dictionary(sources).dictionary(source.name).set(key, static_cast<std::int64_t>(minutes.count));
           }};
 }
 
 /// Absent when the machine does not support it.
-MachineSetting settingOf(PowerSwitch which, const PowerSource& source) {
+MachineSetting<bool> settingOf(PowerSwitch which, const PowerSource& source) {
   const auto* key = keyOf(which);
   return {nameOf(which), "",
-          [=](MachineFile& machine) -> MachineSetting::Value {
+          [=](MachineFile& machine) {
             const auto ofSource = machine.section(sources).section(source.name);
             const auto* value = ofSource.find(key);
-            return value ? std::optional<std::string>(*value->asBoolean() ? "on" : "off") : std::nullopt;
+            return value ? std::optional(*value->asBoolean()) : std::nullopt;
           },
-          [=](MachineFile::Dictionary& machine, const std::string& value) {
-            machine.dictionary(sources).dictionary(source.name).set(key, value == "on");
+          [=](MachineFile::Dictionary& machine, bool isOn) {
+            machine.dictionary(sources).dictionary(source.name).set(key, isOn);
           }};
 }
 
-MachineSetting restartAfterFreeze() {
+MachineSetting<bool> restartAfterFreeze() {
   return switchAt(setting::restartAfterFreeze, "Power", "Restart On Hang");
 }
 
 }  // namespace
 
 Minutes ScratchPowerSettingsService::untilSleep(SleepTimer timer, const PowerSource& source) {
-  const auto minutes = leadingInteger(_settings.read(settingOf(timer, source)).value_or("0"));
-  return {static_cast<unsigned long>(std::max<std::int64_t>(minutes, 0))};
+  return _settings.read(settingOf(timer, source)).value_or(Minutes{0});
 }
 
 void ScratchPowerSettingsService::setUntilSleep(SleepTimer timer, const PowerSource& source, Minutes minutes) {
-  _settings.change(settingOf(timer, source), std::to_string(minutes.count));
+  _settings.change(settingOf(timer, source), minutes);
 }
 
 bool ScratchPowerSettingsService::supports(PowerSwitch which, const PowerSource& source) {
@@ -94,7 +97,7 @@ bool ScratchPowerSettingsService::isOn(PowerSwitch which, const PowerSource& sou
 }
 
 void ScratchPowerSettingsService::setOn(PowerSwitch which, const PowerSource& source, bool on) {
-  _settings.turn(settingOf(which, source), on);
+  _settings.change(settingOf(which, source), on);
 }
 
 bool ScratchPowerSettingsService::restartsAfterFreeze() {
@@ -102,7 +105,7 @@ bool ScratchPowerSettingsService::restartsAfterFreeze() {
 }
 
 void ScratchPowerSettingsService::setRestartsAfterFreeze(bool restarts) {
-  _settings.turn(restartAfterFreeze(), restarts);
+  _settings.change(restartAfterFreeze(), restarts);
 }
 
 }  // namespace tavisk

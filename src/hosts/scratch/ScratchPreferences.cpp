@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/scratch/ScratchPreferences.h"
 
 #include "effects/SettingNames.h"
@@ -11,23 +10,14 @@ namespace {
 constexpr const char* section = "Preferences";
 constexpr const char* writes = "Preferences Writes";
 
-/// A boolean reads as "on" or "off", any other value as what it is: "string".
-std::string textOf(const PropertyList& value) {
-  const auto* boolean = value.asBoolean();
-  if (!boolean) return nameOf(value.type());
-  return *boolean ? "on" : "off";
-}
-
-MachineSetting preference(const std::string& key) {
+MachineSetting<bool> preference(const std::string& key) {
   return {setting::keyboardLockPreference, "",
-          [=](MachineFile& machine) -> MachineSetting::Value {
+          [=](MachineFile& machine) {
             const auto preferences = machine.section(section);
             const auto* value = preferences.find(key);
-            return value ? std::optional(textOf(*value)) : std::nullopt;
+            return value ? std::optional(switchIn(*value)) : std::nullopt;
           },
-          [=](MachineFile::Dictionary& machine, const std::string& value) {
-            machine.dictionary(section).set(key, value == "on");
-          }};
+          [=](MachineFile::Dictionary& machine, bool isOn) { machine.dictionary(section).set(key, isOn); }};
 }
 
 }  // namespace
@@ -40,36 +30,17 @@ std::optional<PropertyList> ScratchPreferencesStore::value(const std::string& ke
 }
 
 void ScratchPreferencesStore::setBoolean(const std::string& key, bool value) {
-  _settings.turn(preference(key), value);
+  _settings.change(preference(key), value);
 }
 
 void ScratchPreferencesStore::writeOut() {
-  const auto count = [](MachineFile::Dictionary& machine, const std::string&) { countUp(machine, writes); };
-  _settings.change({setting::preferencesWrite, "", nullptr, count}, "write");
+  _settings.change(countAt(setting::preferencesWrite, "", writes), "write");
 }
 
-bool ScratchUserDefaults::boolean(const std::string& key) {
-  const auto defaults = section();
+std::optional<PropertyList> ScratchUserDefaults::value(const std::string& key) const {
+  const auto defaults = _machine.section("User Defaults");
   const auto* value = defaults.find(key);
-  return value && value->asBoolean() && *value->asBoolean();
-}
-
-std::optional<double> ScratchUserDefaults::number(const std::string& key) {
-  const auto defaults = section();
-  const auto* value = defaults.find(key);
-  if (!value) return std::nullopt;
-  if (const auto* integer = value->asInteger()) return static_cast<double>(*integer);
-  return !value->asReal() ? std::nullopt : std::optional(*value->asReal());
-}
-
-std::vector<std::string> ScratchUserDefaults::strings(const std::string& key) {
-  const auto defaults = section();
-  const auto* value = defaults.find(key);
-  std::vector<std::string> strings;
-  if (!value || !value->asArray()) return strings;
-  for (const auto& member : *value->asArray())
-    if (const auto* text = member.asString()) strings.push_back(*text);
-  return strings;
+  return value ? std::optional(*value) : std::nullopt;
 }
 
 }  // namespace tavisk

@@ -4,7 +4,7 @@
 
 #include "hosts/scratch/MachineFile.h"
 #include "hosts/scratch/MachineSettings.h"
-#include "platform/Preferences.h"
+#include "hosts/shared/PropertyListPreferences.h"
 
 namespace tavisk {
 
@@ -23,17 +23,14 @@ class ScratchPreferencesStore final : public PreferencesStore {
 };
 
 /// "User Defaults".
-class ScratchUserDefaults final : public UserDefaults {
+class ScratchUserDefaults final : public PropertyListDefaults {
  public:
   explicit ScratchUserDefaults(MachineFile& machine) : _machine(machine) {}
 
-  bool boolean(const std::string& key) override;
-  std::optional<double> number(const std::string& key) override;
-  std::vector<std::string> strings(const std::string& key) override;
+ protected:
+  std::optional<PropertyList> value(const std::string& key) const override;
 
  private:
-  MachineSection section() { return _machine.section("User Defaults"); }
-
   MachineFile& _machine;
 };
 

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/scratch/ScratchProcesses.h"
 
 #include <utility>
@@ -12,14 +11,12 @@ namespace {
 
 constexpr const char* signals = "Signals";
 
-PropertyList entryOf(int signal, ProcessId process) {
+constexpr const char* nvram = "/usr/sbin/nvram";
+
+void append(MachineFile::Dictionary& machine, int signal, ProcessId process) {
   PropertyList::Dictionary entry;
   entry.set("Process", process);
   entry.set("Signal", signal);
-  return entry;
-}
-
-void append(MachineFile::Dictionary& machine, PropertyList entry) {
   const auto* sent = machine.find(signals);
   auto entries = sent ? *sent->asArray() : PropertyList::Array();
   entries.push_back(std::move(entry));
@@ -36,19 +33,18 @@ ProcessId ScratchProcessUtilities::processNamed(const std::string& name) {
 }
 
 void ScratchProcessUtilities::sendSignal(int signal, ProcessId process) {
-  const auto send = [=](MachineFile::Dictionary& machine, const std::string&) {
-    append(machine, entryOf(signal, process));
-  };
-  const auto asked = std::to_string(signal) + " to process " + std::to_string(process);
-  _settings.change({setting::signalToProcess, "", nullptr, send}, asked);
+  const MachineSetting<std::string> sent{
+      setting::signalToProcess, "", nullptr,
+      [=](MachineFile::Dictionary& machine, const std::string&) { append(machine, signal, process); }};
+  _settings.change(sent, std::to_string(signal) + " to process " + std::to_string(process));
 }
 
 void ScratchProcessUtilities::setLockEnclosureState(bool disablesKeyboard) {
-  _settings.turn(switchAt(setting::keyboardLock, "Enclosure Lock", "Keyboard Disabled"), disablesKeyboard);
+  _settings.change(switchAt(setting::keyboardLock, "Enclosure Lock", "Keyboard Disabled"), disablesKeyboard);
 }
 
 Result<ProgramOutput> ScratchProgramRunner::run(const std::string& program, const std::vector<std::string>& arguments) {
-  if (program != "/usr/sbin/nvram") return Failure{"run", program, "no such program on the rehearsed machine"};
+  if (program != nvram) return Failure{"run", program, "no such program on the rehearsed machine"};
   const auto variables = _machine.section("Firmware").section("Variables");
   ProgramOutput output;
   for (const auto& name : arguments) {

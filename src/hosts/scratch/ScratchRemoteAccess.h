@@ -2,33 +2,26 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <string>
+
 #include "hosts/scratch/MachineSettings.h"
 #include "platform/RemoteAccess.h"
 
 namespace tavisk {
 
-/// "Remote Shell".
-class ScratchRemoteShellService final : public RemoteShellService {
+/// "Remote Shell" or "Remote Events": a service that is on or off.
+template <typename Service>
+class ScratchRemoteAccess final : public Service {
  public:
-  explicit ScratchRemoteShellService(MachineSettings& settings) : _settings(settings) {}
+  ScratchRemoteAccess(MachineSettings& settings, const char* name, const std::string& section)
+      : _settings(settings), _enabled(switchAt(name, section, "Enabled")) {}
 
-  bool isEnabled() override;
-  void setEnabled(bool enabled) override;
+  bool isEnabled() override { return _settings.isOn(_enabled); }
+  void setEnabled(bool enabled) override { _settings.change(_enabled, enabled); }
 
  private:
   MachineSettings& _settings;
-};
-
-/// "Remote Events".
-class ScratchRemoteEventsService final : public RemoteEventsService {
- public:
-  explicit ScratchRemoteEventsService(MachineSettings& settings) : _settings(settings) {}
-
-  bool isEnabled() override;
-  void setEnabled(bool enabled) override;
-
- private:
-  MachineSettings& _settings;
+  MachineSetting<bool> _enabled;
 };
 
 }  // namespace tavisk

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/shared/ZoneList.h"
 
+#include <algorithm>
 #include <set>
 #include <sstream>
 
@@ -15,6 +16,10 @@ constexpr std::size_t largestZone = 1U << 20U;
 constexpr int deepestZone = 4;  // "America/Argentina/Buenos_Aires" needs 3
 
 using Names = std::set<std::string>;
+
+Result<std::string> readTable(const SystemRoot& root, const char* name) {
+  return root.read(ZoneName{name}.file(), largestTable);
+}
 
 /// The fields of each line, as white space separates them.
 template <typename Use>
@@ -42,21 +47,22 @@ Names namesOfTable(const std::string& text) {
 
 /// The source and the table also name zones that a package of their own brings.
 void removeUninstalled(const SystemRoot& root, Names& names) {
-  std::erase_if(names, [&](const std::string& name) { return !root.exists(zoneFolder + name); });
+  std::erase_if(names, [&](const std::string& name) { return !root.exists(ZoneName{name}.file()); });
 }
 
 /// Other trees of the same zones, and files that are no zones.
 bool isNoZone(const std::string& name) {
-  return name == "posix" || name == "right" || name == "posixrules" || name == "localtime";
+  return std::ranges::find(ZoneName::variants, name + "/") != std::end(ZoneName::variants) || name == "posixrules" ||
+         name == "localtime";
 }
 
 void addCompiled(const SystemRoot& root, const std::string& below, int depth, Names& names) {
-  auto entries = root.list(zoneFolder + below);
+  const auto entries = root.list(ZoneName{below}.file());
   if (!entries || depth > deepestZone) return;
   for (const auto& entry : *entries) {
     if (isNoZone(entry)) continue;
-    auto name = below + entry;
-    auto file = root.read(zoneFolder + name, largestZone);
+    const auto name = below + entry;
+    const auto file = root.read(ZoneName{name}.file(), largestZone);
     if (!file) addCompiled(root, name + "/", depth + 1, names);
     if (file && file->starts_with("TZif")) names.insert(name);
   }
@@ -64,17 +70,19 @@ void addCompiled(const SystemRoot& root, const std::string& below, int depth, Na
 
 }  // namespace
 
-Result<std::vector<std::string>> installedZones(const SystemRoot& root) {
+Result<std::vector<ZoneName>> installedZones(const SystemRoot& root) {
   Names names;
-  if (auto source = root.read(zoneFolder + std::string("tzdata.zi"), largestTable)) names = namesOfSource(*source);
+  if (const auto source = readTable(root, "tzdata.zi")) names = namesOfSource(*source);
   removeUninstalled(root, names);
   if (names.empty()) {
-    if (auto table = root.read(zoneFolder + std::string("zone1970.tab"), largestTable)) names = namesOfTable(*table);
+    if (const auto table = readTable(root, "zone1970.tab")) names = namesOfTable(*table);
     removeUninstalled(root, names);
   }
   if (names.empty()) addCompiled(root, "", 1, names);
-  if (names.empty()) return Failure{"list time zones", zoneFolder, "no time zones are installed"};
-  return std::vector<std::string>(names.begin(), names.end());
+  if (names.empty()) return Failure{"list time zones", std::string(ZoneName::folder), "no time zones are installed"};
+  std::vector<ZoneName> zones;
+  for (const auto& name : names) zones.push_back({name});
+  return zones;
 }
 
 }  // namespace tavisk

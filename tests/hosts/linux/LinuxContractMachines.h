@@ -14,15 +14,10 @@ template <typename Tree>
 struct ClockOf {
   static constexpr bool setsClock = false;
   ClockService& service() { return tree.host().clock(); }
-  void haveZones(const std::vector<std::string>& names) {
-    for (const auto& name : names) tree.write("/usr/share/zoneinfo/" + name, "TZif");
+  void haveZones(const std::vector<ZoneName>& zones) {
+    for (const auto& zone : zones) tree.write(zone.file(), "TZif");
   }
-  std::vector<std::string> effects() {
-    std::vector<std::string> effects;
-    for (const auto& line : tree.log.lines)
-      if (line.find("\"outcome\"") != std::string::npos) effects.push_back(line);
-    return effects;
-  }
+  const std::vector<Effect>& effects() { return tree.log.effects; }
   Tree tree;
 };
 

@@ -5,7 +5,7 @@
 #include <set>
 
 #include "hosts/scratch/KeyTable.h"
-#include "hosts/scratch/MachineSection.h"
+#include "hosts/scratch/MachineFile.h"
 
 namespace tavisk {
 namespace {

@@ -108,7 +108,7 @@ TEST_F(MachineFileTest, refusesWhatIsNoMachine) {
   EXPECT_EQ(MachineFile::open(machine.directory() + "//", machine.effects).failure().on,
             machine.directory() + "/machine.plist");
   EXPECT_EQ(MachineFile::open("/no/such", machine.effects).failure(),
-            (Failure{"rehearse", "/no/such", "No such file or directory"}));
+            systemFailure("rehearse", "/no/such", ENOENT));
   EXPECT_EQ(MachineFile::open("/etc/passwd", machine.effects).failure().why, "Not a directory");
 }
 

@@ -25,10 +25,12 @@ INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, AdminAuthenticatorContract, ScratchAuthe
 struct ScratchClock {
   static constexpr bool setsClock = true;
   ClockService& service() { return machine.host().clock(); }
-  void haveZones(const std::vector<std::string>& names) {
-    machine.set("Clock", "Known Time Zones", PropertyList::Array(names.begin(), names.end()));
+  void haveZones(const std::vector<ZoneName>& zones) {
+    PropertyList::Array known;
+    for (const auto& zone : zones) known.push_back(zone.text);
+    machine.set("Clock", "Known Time Zones", known);
   }
-  std::vector<std::string> effects() { return machine.effectsLog(); }
+  const std::vector<Effect>& effects() { return machine.log.effects; }
   ScratchMachine machine;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, ClockContract, ScratchClock);

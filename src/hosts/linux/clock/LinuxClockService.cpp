@@ -17,7 +17,6 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* withoutZone = "UTC";
 constexpr const char* inContainer = "no CAP_SYS_TIME here: set it on the machine that hosts this container";
 constexpr const char* timeUnit = "seconds since 1970";
 
@@ -33,7 +32,7 @@ bool leavesItToOthers(const Failure& failure) {
 /// By the difference: it stays right however long the daemon takes, to start or to ask the user.
 Result<void> setByDaemon(Bus& bus, const AskedTime& asked) {
   constexpr bool relative = true;
-  auto set = bus.call(timeDaemon(), "SetTime", "", asked.microsecondsAhead(), relative, bus.isInteractive());
+  const auto set = bus.call(timeDaemon(), "SetTime", "", asked.microsecondsAhead(), relative, bus.isInteractive());
   if (!set) return set.failure();
   return {};
 }
@@ -47,8 +46,8 @@ Failure withAdvice(Failure failure) {
 }  // namespace
 
 std::int64_t LinuxClockService::now() {
-  auto time = systemTime();
-  _machine.effects.observe({setting::time, std::to_string(time), std::nullopt, timeUnit});
+  const auto time = systemTime();
+  _machine.effects.observe({setting::time, textOf(time), std::nullopt, timeUnit});
   return time;
 }
 
@@ -73,31 +72,28 @@ std::string LinuxClockService::whoCorrectsTheClock() {
 
 void LinuxClockService::setTime(std::int64_t secondsSince1970) {
   AskedTime asked(secondsSince1970);
-  Setting<std::string> time;
+  Setting<std::int64_t> time;
   time.name = setting::time;
   time.unit = timeUnit;
   time.undoneBy = [this](const auto&) { return whoCorrectsTheClock(); };
-  time.live = [&] { return std::optional(std::to_string(asked.onSystemClock())); };
+  time.live = [&] { return asked.onSystemClock(); };
   if (asked.onHardwareClock(_machine.root)) {
     time.where = hardwareClock;
-    time.stored = [&]() -> Result<std::optional<std::string>> {
-      const auto stored = asked.onHardwareClock(_machine.root);
-      return stored ? std::optional(std::to_string(*stored)) : std::nullopt;
-    };
+    time.stored = [&] { return asked.onHardwareClock(_machine.root); };
   } else {
     time.note = saying("without a hardware clock the machine forgets the time when it is off");
   }
-  time.apply = [&](const std::string&) -> Result<void> {
+  time.apply = [&](std::int64_t) {
     asked.isNow();
     return changeTime(asked);
   };
-  carryOut(time, std::to_string(secondsSince1970), _machine.effects, _machine.runLoop);
+  carryOut(time, secondsSince1970, _machine.effects, _machine.runLoop);
 }
 
 Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
   if (auto failure = whyOutOfClockRange(asked.seconds())) return *failure;
   if (auto bus = _machine.services.systemBus()) {
-    auto set = setByDaemon(**bus, asked);
+    const auto set = setByDaemon(**bus, asked);
     if (set) return {};
     if (!leavesItToOthers(set.failure())) return withAdvice(set.failure());
   }
@@ -110,43 +106,39 @@ Result<void> LinuxClockService::changeTimeDirectly(std::int64_t secondsSince1970
   return setHardwareClock(_machine.root, secondsSince1970);
 }
 
-std::vector<std::string> LinuxClockService::knownTimeZones() {
-  auto zones = installedZones(_machine.root);
+std::vector<ZoneName> LinuxClockService::knownTimeZones() {
+  const auto zones = installedZones(_machine.root);
   if (zones) return *zones;
-  Effect effect;
-  effect.setting = setting::knownTimeZones;
-  effect.outcome = Outcome::failed;
-  effect.failure = zones.failure();
-  _machine.effects.record(effect);
+  _machine.effects.recordFailure(setting::knownTimeZones, zones.failure());
   return {};
 }
 
 /// The link counts; a second copy of the name that says something else is told with it.
-Setting<std::string> LinuxClockService::timeZoneSetting() const {
-  Setting<std::string> zone;
+Setting<ZoneName> LinuxClockService::timeZoneSetting() const {
+  Setting<ZoneName> zone;
   zone.name = setting::timeZone;
   zone.where = "/etc/localtime";
-  zone.live = [&root = _machine.root] { return std::optional(machineTimeZone(root).value_or(withoutZone)); };
+  zone.live = [&root = _machine.root] { return machineTimeZone(root).value_or(utc()); };
   zone.stored = [&root = _machine.root] {
-    auto second = timeZoneFileName(root);
+    const auto second = timeZoneFileName(root);
     return second ? second : machineTimeZone(root);
   };
   return zone;
 }
 
-std::string LinuxClockService::timeZone() {
+ZoneName LinuxClockService::timeZone() {
   return *observe(timeZoneSetting(), _machine.effects);
 }
 
-void LinuxClockService::setTimeZone(const std::string& zoneFile) {
-  auto zone = timeZoneSetting();
-  zone.store = [this](const std::string& name) { return changeTimeZone(name); };
-  carryOut(zone, zoneOfPath(zoneFile).value_or(zoneFile), _machine.effects, _machine.runLoop);
+void LinuxClockService::setTimeZone(const ZoneName& zone) {
+  auto setting = timeZoneSetting();
+  setting.store = [this](const ZoneName& asked) { return changeTimeZone(asked); };
+  carryOut(setting, zoneOfPath(zone.file()).value_or(zone), _machine.effects, _machine.runLoop);
 }
 
-Result<void> LinuxClockService::changeTimeZone(const std::string& zone) {
+Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone) {
   if (auto bus = _machine.services.systemBus()) {
-    auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone, (*bus)->isInteractive());
+    const auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone.text, (*bus)->isInteractive());
     if (!set && !leavesItToOthers(set.failure())) return set.failure();
     // The daemon does nothing for the zone that it found when it started, whatever the link says since.
     if (set && machineTimeZone(_machine.root) == zone) return updateNameFile(zone);
@@ -154,23 +146,22 @@ Result<void> LinuxClockService::changeTimeZone(const std::string& zone) {
   return changeTimeZoneDirectly(zone);
 }
 
-Result<void> LinuxClockService::changeTimeZoneDirectly(const std::string& zone) const {
+Result<void> LinuxClockService::changeTimeZoneDirectly(const ZoneName& zone) const {
   if (auto failure = whyNeedsRoot("set the time zone", "/etc/localtime")) return *failure;
   if (auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
   return updateTimeZoneFile(_machine.root, zone);
 }
 
 /// The daemon leaves Debian's second copy of the name alone.
-Result<void> LinuxClockService::updateNameFile(const std::string& zone) const {
-  auto updated = updateTimeZoneFile(_machine.root, zone);
+Result<void> LinuxClockService::updateNameFile(const ZoneName& zone) const {
+  const auto updated = updateTimeZoneFile(_machine.root, zone);
   if (updated) return updated;
   return whyNeedsRoot("write", "/etc/timezone").value_or(updated.failure());
 }
 
-std::string LinuxClockService::rulesOf(const std::string& timeZone) {
-  auto file = zoneFolder + timeZone;
+std::string LinuxClockService::rulesOf(const ZoneName& zone) {
   const auto& prefix = _machine.root.prefix();
-  return (prefix == "/" ? "" : prefix) + zoneFolder + zoneOfPath(file).value_or(withoutZone);
+  return (prefix == "/" ? "" : prefix) + zoneOfPath(zone.file()).value_or(utc()).file();
 }
 
 }  // namespace tavisk

@@ -16,20 +16,20 @@ class LinuxClockService final : public ClockService {
 
   std::int64_t now() override;
   void setTime(std::int64_t secondsSince1970) override;
-  std::vector<std::string> knownTimeZones() override;
-  std::string timeZone() override;
-  void setTimeZone(const std::string& zoneFile) override;
-  std::string rulesOf(const std::string& timeZone) override;
+  std::vector<ZoneName> knownTimeZones() override;
+  ZoneName timeZone() override;
+  void setTimeZone(const ZoneName& zone) override;
+  std::string rulesOf(const ZoneName& zone) override;
 
  private:
-  Setting<std::string> timeZoneSetting() const;
+  Setting<ZoneName> timeZoneSetting() const;
   std::optional<Failure> whyNoClock() const;
   std::string whoCorrectsTheClock();
   Result<void> changeTime(const AskedTime& asked);
   Result<void> changeTimeDirectly(std::int64_t secondsSince1970) const;
-  Result<void> changeTimeZone(const std::string& zone);
-  Result<void> changeTimeZoneDirectly(const std::string& zone) const;
-  Result<void> updateNameFile(const std::string& zone) const;
+  Result<void> changeTimeZone(const ZoneName& zone);
+  Result<void> changeTimeZoneDirectly(const ZoneName& zone) const;
+  Result<void> updateNameFile(const ZoneName& zone) const;
 
   LinuxMachine _machine;
 };

@@ -1,23 +1,34 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/machine/KeyboardLock.h"
 
 #include <algorithm>
-#include <charconv>
 #include <cstdint>
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/system/KernelFile.h"
-#include "hosts/linux/system/OnOff.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/shared/SettingChange.h"
 
 namespace tavisk {
 namespace {
 
+constexpr const char* inputClass = "/sys/class/input";
 constexpr const char* devices = "/sys/class/input/";
+/// Vendor and product of the USB keyboards that management controllers have, where their names do not say so.
+constexpr std::string_view controllersOwn[] = {"046b:ff10", "0557:2221", "0557:2419", "0624:0249", "03f0:7029"};
+
+constexpr std::uint8_t chassis = 0x00;
+constexpr std::uint8_t getCapabilities = 0x00;
+constexpr std::uint8_t getStatus = 0x01;
+constexpr unsigned frontPanelLockout = 0x02;  // in the capabilities and in the third byte of the status
+
+enum class KeyboardState { enabled, disabled };
+
+std::string textOf(KeyboardState state) {
+  return state == KeyboardState::disabled ? "keyboards disabled" : "keyboards enabled";
+}
 
 std::string valueOf(const SystemRoot& root, const std::string& file) {
   return readKernelFile(root, file).valueOr("");
@@ -28,14 +39,9 @@ bool hasLetters(const SystemRoot& root, const std::string& device) {
   constexpr std::uint64_t letters = 0xFFFF'FFFE;
   const auto words = split(valueOf(root, device + "/capabilities/key"), " ");
   if (words.empty()) return false;
-  std::uint64_t keys = 0;
-  const auto& last = words.back();
-  std::from_chars(last.data(), last.data() + last.size(), keys, 16);
+  const auto keys = parseNumber<std::uint64_t>(words.back(), 16).value_or(0);
   return (keys & letters) == letters;
 }
-
-/// Vendor and product of the USB keyboards that management controllers have, where their names do not say so.
-constexpr std::string_view controllersOwn[] = {"046b:ff10", "0557:2221", "0557:2419", "0624:0249", "03f0:7029"};
 
 bool isOfController(const SystemRoot& root, const std::string& device) {
   if (lowerCased(valueOf(root, device + "/name")).find("virtual") != std::string::npos) return true;
@@ -43,35 +49,32 @@ bool isOfController(const SystemRoot& root, const std::string& device) {
   return std::ranges::find(controllersOwn, id) != std::end(controllersOwn);
 }
 
-constexpr std::uint8_t chassis = 0x00;
-constexpr std::uint8_t getCapabilities = 0x00;
-constexpr std::uint8_t getStatus = 0x01;
-constexpr unsigned frontPanelLockout = 0x02;  // in the capabilities and in the third byte of the status
-
-const char* textOf(bool disabled) {
-  return disabled ? "keyboards disabled" : "keyboards enabled";
-}
-
-Result<std::optional<std::string>> stateOf(const SystemRoot& root, const std::vector<std::string>& keyboards) {
+Setting<KeyboardState>::Found stateOf(const SystemRoot& root, const std::vector<std::string>& keyboards) {
   std::size_t inhibited = 0;
   for (const auto& keyboard : keyboards) {
     const auto is = isInhibited(root, keyboard);
     if (!is) return is.failure();
     if (*is) ++inhibited;
   }
-  if (inhibited != 0 && inhibited != keyboards.size()) return std::optional<std::string>("some keyboards disabled");
-  return std::optional<std::string>(textOf(inhibited != 0));
+  if (inhibited == 0) return KeyboardState::enabled;
+  if (inhibited == keyboards.size()) return KeyboardState::disabled;
+  return Reading(KeyboardState::disabled, "some keyboards disabled");
 }
 
-Result<void> inhibitAll(const SystemRoot& root, const std::vector<std::string>& keyboards, bool inhibit) {
+Result<void> setAll(const SystemRoot& root, const std::vector<std::string>& keyboards, KeyboardState state) {
   for (const auto& keyboard : keyboards)
-    if (auto set = setInhibited(root, keyboard, inhibit); !set) return set;
+    if (const auto set = setInhibited(root, keyboard, state == KeyboardState::disabled); !set) return set;
   return {};
+}
+
+std::string remarkOn(const Result<bool>& engaged) {
+  if (!engaged) return "the preference is kept";
+  return *engaged ? "the lock is engaged" : "the lock is open";
 }
 
 std::optional<Failure> whyNotSupported(const Result<bool>& engaged, const std::vector<std::string>& keyboards) {
   if (!engaged) return engaged.failure();
-  if (keyboards.empty()) return Failure{"find a keyboard", "/sys/class/input", "there is none at this machine"};
+  if (keyboards.empty()) return Failure{"find a keyboard", inputClass, "there is none at this machine"};
   return std::nullopt;
 }
 
@@ -107,20 +110,18 @@ Result<bool> EnclosureLock::isEngaged() {
 }
 
 void EnclosureLock::setDisablesKeyboard(bool disables) {
-  if (const auto failure = whyNeedsRoot("disable keyboards", "/sys/class/input"))
-    return _machine.effects.recordFailure(setting::keyboardLock, *failure, onOff(disables));
+  if (const auto failure = whyNeedsRoot("disable keyboards", inputClass))
+    return _machine.effects.recordFailure(setting::keyboardLock, *failure, textOf(disables));
   const auto engaged = isEngaged();
   const auto found = keyboards(_machine.root);
-  const bool inhibit = disables && engaged.valueOr(false);
-  Setting<std::string> setting;
+  const auto asked = disables && engaged.valueOr(false) ? KeyboardState::disabled : KeyboardState::enabled;
+  Setting<KeyboardState> setting;
   setting.name = setting::keyboardLock;
-  setting.note = [text = std::string(!engaged   ? "the preference is kept"
-                                     : *engaged ? "the lock is engaged"
-                                                : "the lock is open")](const auto&) { return text; };
+  setting.note = saying(remarkOn(engaged));
   setting.supported = [&] { return whyNotSupported(engaged, found); };
   setting.live = [&] { return stateOf(_machine.root, found); };
-  setting.apply = [&](const std::string&) { return inhibitAll(_machine.root, found, inhibit); };
-  carryOut(setting, textOf(inhibit), _machine.effects, _machine.runLoop);
+  setting.apply = [&](KeyboardState state) { return setAll(_machine.root, found, state); };
+  carryOut(setting, asked, _machine.effects, _machine.runLoop);
 }
 
 }  // namespace tavisk

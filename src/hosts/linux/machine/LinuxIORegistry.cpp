@@ -29,7 +29,7 @@ std::optional<IORegistry::Data> LinuxIORegistry::dataProperty(const RegistryEntr
 
 std::optional<RegistryEntry> LinuxIORegistry::serviceNamed(const std::string& bsdName) {
   if (bsdName.empty() || bsdName.find('/') != std::string::npos) return std::nullopt;
-  for (const char* kind : {"/sys/class/net/", "/sys/class/block/"}) {
+  for (const auto* kind : {"/sys/class/net/", "/sys/class/block/"}) {
     const auto folder = _root.standardized(kind + bsdName);
     if (folder && _root.exists(*folder + "/subsystem")) return RegistryEntry{*folder};
   }

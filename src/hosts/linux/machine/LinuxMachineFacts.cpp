@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/machine/LinuxMachineFacts.h"
 
 #include <ifaddrs.h>
@@ -14,7 +13,6 @@
 #include <string_view>
 #include <utility>
 
-#include "base/Result.h"
 #include "base/Text.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/disks/BlockDevices.h"
@@ -26,9 +24,12 @@ namespace tavisk {
 namespace {
 
 constexpr std::size_t longestModel = 127;
-constexpr std::size_t fileLimit = 65536;
+constexpr std::size_t longestCommandLine = 65536;
 /// What a firmware that started from an iSCSI disk leaves (iBFT).
 constexpr const char* iscsiStart = "/sys/firmware/ibft";
+constexpr const char* commandLine = "/proc/cmdline";
+constexpr const char* keyboardFile = "/etc/default/keyboard";
+constexpr const char* consoleFile = "/etc/vconsole.conf";
 
 constexpr std::array<std::pair<std::string_view, std::int64_t>, 32> countryCodes{{
     {"ara", 1}, {"be", 2},  {"ca", 4},  {"cz", 5},  {"dk", 6},  {"fi", 7},  {"fr", 8},     {"de", 9},
@@ -45,7 +46,7 @@ std::string_view firstName(std::string_view layouts) {
 }  // namespace
 
 std::string LinuxKernelValues::model() {
-  for (const char* file : {"/sys/class/dmi/id/product_name", "/sys/firmware/devicetree/base/model"}) {
+  for (const auto* file : {"/sys/class/dmi/id/product_name", "/sys/firmware/devicetree/base/model"}) {
     const auto name = readKernelFile(_root, file).valueOr("");
     if (!name.empty()) return name.substr(0, longestModel);
   }
@@ -53,7 +54,7 @@ std::string LinuxKernelValues::model() {
 }
 
 std::int32_t LinuxKernelValues::networkStart() {
-  const auto words = split(_root.read("/proc/cmdline", fileLimit).valueOr(""), " \n");
+  const auto words = split(_root.read(commandLine, longestCommandLine).valueOr(""), " \n");
   const bool isTold = std::ranges::any_of(words, [](const auto& word) { return word.starts_with("BOOTIF="); });
   return isTold || _root.exists(iscsiStart) || isRootOnNetwork() ? 1 : 0;
 }
@@ -70,11 +71,9 @@ bool LinuxKernelValues::isRootOnNetwork() const {
 }
 
 std::string LinuxKeyboardInputService::layout() const {
-  const auto keyboard = _root.read("/etc/default/keyboard", fileLimit).valueOr("");
-  if (auto layout = assignedValue(keyboard, "XKBLAYOUT")) return *layout;
-  const auto console = _root.read("/etc/vconsole.conf", fileLimit).valueOr("");
-  if (auto layout = assignedValue(console, "XKBLAYOUT")) return *layout;
-  return assignedValue(console, "KEYMAP").value_or("");
+  for (const auto* file : {keyboardFile, consoleFile})
+    if (const auto layout = assignedValue(_root, file, "XKBLAYOUT")) return *layout;
+  return assignedValue(_root, consoleFile, "KEYMAP").value_or("");
 }
 
 std::optional<std::int64_t> LinuxKeyboardInputService::currentLayoutNumber() {

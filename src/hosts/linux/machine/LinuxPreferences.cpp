@@ -1,17 +1,13 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/machine/LinuxPreferences.h"
 
-#include <algorithm>
 #include <chrono>
 
 #include "effects/SettingNames.h"
-#include "hosts/linux/system/OnOff.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/linux/system/ShellAssignments.h"
 #include "hosts/shared/FileLock.h"
-#include "hosts/shared/PropertyListFile.h"
 
 namespace tavisk {
 namespace {
@@ -20,52 +16,47 @@ constexpr const char* folder = "/etc/tavisk/preferences";
 constexpr const char* lock = "/etc/tavisk/preferences/.lock";
 constexpr const char* file = "/etc/tavisk/preferences/AnyApplication.plist";
 constexpr std::chrono::seconds longestLock{3};
+constexpr const char* languages = "VelmarLanguages";
+constexpr const char* localeFiles[] = {"/etc/default/locale", "/etc/locale.conf"};
 
-using Value = std::optional<std::string>;
-
-/// A value that is no boolean reads as what it is: "string".
-Result<Value> textIn(const Result<std::optional<PropertyList::Dictionary>>& preferences, const std::string& key) {
+Setting<bool>::Found switchUnder(const std::string& key,
+                                 const Result<std::optional<PropertyList::Dictionary>>& preferences) {
   if (!preferences) return preferences.failure();
   const auto* value = *preferences ? (*preferences)->find(key) : nullptr;
-  if (!value) return Value();
-  const auto* boolean = value->asBoolean();
-  return Value(!boolean ? nameOf(value->type()) : onOff(*boolean));
+  return value ? std::optional(switchIn(*value)) : std::nullopt;
 }
-
-constexpr std::size_t fileLimit = 65536;
-constexpr const char* languages = "VelmarLanguages";
 
 }  // namespace
 
 LinuxPreferencesStore::LinuxPreferencesStore(const LinuxMachine& machine)
     : _machine(machine), _file(machine.root, file) {}
 
-Setting<std::string> LinuxPreferencesStore::preference(const std::string& key) {
-  Setting<std::string> setting;
+Setting<bool> LinuxPreferencesStore::preference(const std::string& key) {
+  Setting<bool> setting;
   setting.name = setting::keyboardLockPreference;
   setting.where = _file.path();
-  setting.stored = [this, key] { return textIn(_file.read(), key); };
+  setting.stored = [this, key] { return switchUnder(key, _file.read()); };
   return setting;
 }
 
 std::optional<PropertyList> LinuxPreferencesStore::value(const std::string& key) {
   const auto preferences = _file.read();
   auto setting = preference(key);
-  setting.stored = [&] { return textIn(preferences, key); };
+  setting.stored = [&] { return switchUnder(key, preferences); };
   return observe(setting, _machine.effects) ? std::optional(*(*preferences)->find(key)) : std::nullopt;
 }
 
 void LinuxPreferencesStore::writeOut() {
   for (const auto& [key, value] : std::exchange(_pending, {})) {
     auto setting = preference(key);
-    setting.store = [this, &key = key, value = value](const std::string&) { return store(key, value); };
-    carryOut(setting, onOff(value), _machine.effects, _machine.runLoop);
+    setting.store = [this, &key = key](bool isOn) { return store(key, isOn); };
+    carryOut(setting, value, _machine.effects, _machine.runLoop);
   }
 }
 
 Result<void> LinuxPreferencesStore::store(const std::string& key, bool value) {
-  if (auto failure = whyNeedsRoot("write", _file.path())) return *failure;
-  if (auto made = _machine.root.makeFolders(folder); !made) return made;
+  if (const auto failure = whyNeedsRoot("write", _file.path())) return *failure;
+  if (const auto made = _machine.root.makeFolders(folder); !made) return made;
   const auto patience = std::chrono::duration_cast<std::chrono::milliseconds>(_machine.runLoop.timeFor(longestLock));
   const auto held = lockFile(_machine.root, lock, patience);
   if (!held) return held.failure();
@@ -79,35 +70,18 @@ std::optional<PropertyList> LinuxUserDefaults::value(const std::string& key) con
   if (!_root.stamp(file)) return std::nullopt;
   const auto defaults = PropertyListFile(_root, file).read().valueOr(std::nullopt);
   const auto* value = defaults ? defaults->find(key) : nullptr;
-  return !value ? std::nullopt : std::optional(*value);
-}
-
-bool LinuxUserDefaults::boolean(const std::string& key) {
-  const auto found = value(key);
-  return found && found->asBoolean() && *found->asBoolean();
-}
-
-std::optional<double> LinuxUserDefaults::number(const std::string& key) {
-  const auto found = value(key);
-  if (!found) return std::nullopt;
-  if (const auto* integer = found->asInteger()) return static_cast<double>(*integer);
-  return !found->asReal() ? std::nullopt : std::optional(*found->asReal());
+  return value ? std::optional(*value) : std::nullopt;
 }
 
 std::vector<std::string> LinuxUserDefaults::strings(const std::string& key) {
-  const auto found = value(key);
-  std::vector<std::string> strings;
-  if (found && found->asArray()) {
-    for (const auto& member : *found->asArray())
-      if (const auto* text = member.asString()) strings.push_back(*text);
-  }
-  return strings.empty() && key == languages ? machineLanguages() : strings;
+  const auto found = PropertyListDefaults::strings(key);
+  return found.empty() && key == languages ? machineLanguages() : found;
 }
 
 /// "pt_BR" of "pt_BR.UTF-8@euro"; C and POSIX are no languages.
 std::vector<std::string> LinuxUserDefaults::machineLanguages() const {
-  for (const char* place : {"/etc/default/locale", "/etc/locale.conf"}) {
-    const auto locale = assignedValue(_root.read(place, fileLimit).valueOr(""), "LANG").value_or("");
+  for (const auto* place : localeFiles) {
+    const auto locale = assignedValue(_root, place, "LANG").value_or("");
     const auto language = locale.substr(0, locale.find_first_of(".@"));
     if (!language.empty() && language != "C" && language != "POSIX") return {language};
   }

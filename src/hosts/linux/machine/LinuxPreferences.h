@@ -9,9 +9,9 @@
 #include "base/PropertyList.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/PropertyListFile.h"
+#include "hosts/shared/PropertyListPreferences.h"
 #include "hosts/shared/SettingChange.h"
 #include "hosts/shared/SystemRoot.h"
-#include "platform/Preferences.h"
 
 namespace tavisk {
 
@@ -28,7 +28,7 @@ class LinuxPreferencesStore final : public PreferencesStore {
   void writeOut();
 
  private:
-  Setting<std::string> preference(const std::string& key);
+  Setting<bool> preference(const std::string& key);
   Result<void> store(const std::string& key, bool value);
 
   LinuxMachine _machine;
@@ -38,19 +38,19 @@ class LinuxPreferencesStore final : public PreferencesStore {
 
 /// A property list that the administrator may write. The languages, when it has none, are those of the machine
 /// (locale.conf(5), or /etc/default/locale).
-class LinuxUserDefaults final : public UserDefaults {
+class LinuxUserDefaults final : public PropertyListDefaults {
  public:
   /// The root is not owned.
   explicit LinuxUserDefaults(const SystemRoot& root) : _root(root) {}
 
   static constexpr const char* file = "/etc/tavisk/preferences/tavisk.plist";
 
-  bool boolean(const std::string& key) override;
-  std::optional<double> number(const std::string& key) override;
   std::vector<std::string> strings(const std::string& key) override;
 
+ protected:
+  std::optional<PropertyList> value(const std::string& key) const override;
+
  private:
-  std::optional<PropertyList> value(const std::string& key) const;
   std::vector<std::string> machineLanguages() const;
 
   const SystemRoot& _root;

@@ -1,11 +1,10 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-
 #include "hosts/linux/machine/LinuxProcesses.h"
 
 #include <algorithm>
 
-#include "base/Result.h"
+#include "base/FileDescriptor.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/ProcessHandle.h"

@@ -7,6 +7,7 @@
 namespace tavisk {
 namespace {
 
+constexpr std::size_t fileLimit = 65536;
 constexpr std::string_view escapedInQuotes = "\"\\`$";
 
 /// A line with its newline, taken off the front.
@@ -60,6 +61,10 @@ std::optional<std::string> assignedValue(std::string_view text, std::string_view
   while (!text.empty())
     if (const auto assigned = assignedIn(takeLine(text), variable)) value = unquoted(*assigned);
   return value;
+}
+
+std::optional<std::string> assignedValue(const SystemRoot& root, const std::string& file, std::string_view variable) {
+  return assignedValue(root.read(file, fileLimit).valueOr(""), variable);
 }
 
 std::string withAssignment(std::string_view text, std::string_view variable, std::string_view value) {

@@ -6,11 +6,16 @@
 #include <string>
 #include <string_view>
 
+#include "hosts/shared/SystemRoot.h"
+
 namespace tavisk {
 
 /// The value of a variable in a text of shell-like assignments, one a line (os-release(5) describes the format); of
 /// several assignments the last one counts. Absent when there is none.
 std::optional<std::string> assignedValue(std::string_view text, std::string_view variable);
+
+/// The same in a file; absent too when it cannot be read.
+std::optional<std::string> assignedValue(const SystemRoot& root, const std::string& file, std::string_view variable);
 
 /// The text with this value, quoted, in place of the variable's assignments or else at the end; an empty value takes
 /// them out. All other lines stay as they are. The value holds no newline.

@@ -43,7 +43,7 @@ TEST(JournalLog, TellsAChangeFieldByField) {
   LogSocket syslog(tree.at("/dev/log"));
   tree.write("/proc/self/loginuid", "1000");
   tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif2");
-  tree.host().clock().setTimeZone("/usr/share/zoneinfo/Europe/Paris");
+  tree.host().clock().setTimeZone({"Europe/Paris"});
   EXPECT_THAT(journal.next(), AllOf(HasSubstr("SYSLOG_IDENTIFIER=tavisk\n"), HasSubstr("PRIORITY=7\n"),
                                     HasSubstr("TAVISK_OUTCOME=begins\nTAVISK_ASKED=Europe/Paris\n")));
   EXPECT_THAT(journal.next(),
@@ -60,7 +60,7 @@ TEST(JournalLog, TellsAChangeFieldByField) {
 TEST(JournalLog, LetsNoForeignTextMakeFieldsOrControlATerminal) {
   LinuxTree tree;
   LogSocket journal(tree.at("/run/systemd/journal/socket"));
-  tree.host().clock().setTimeZone("x\nPRIORITY=0\n\x1b[2J\xff");
+  tree.host().clock().setTimeZone({"x\nPRIORITY=0\n\x1b[2J\xff"});
   journal.next();
   EXPECT_THAT(journal.next(),
               AllOf(HasSubstr(R"(TAVISK_ASKED=x\nPRIORITY=0\n\x1B[2J\xFF)"), Not(HasSubstr("\nPRIORITY=0"))));
