@@ -45,8 +45,8 @@ class [[nodiscard]] Result {
   Result(Failure failure) : _state(std::in_place_index<1>, std::move(failure)) {}
   /// What is nearly the value: a text where there may be none, an answer of a narrower type.
   template <typename Other>
-  requires std::convertible_to<Other, Value> &&(!std::convertible_to<Other, Failure>)Result(Other&& value)
-      : _state(std::in_place_index<0>, std::forward<Other>(value)) {}
+  requires std::convertible_to<Other, Value> &&(!std::convertible_to<Other, Failure>)Result(Other value)
+      : _state(std::in_place_index<0>, std::move(value)) {}
   template <typename Other>
   requires std::convertible_to<Other, Value> &&(!std::same_as<Other, Value>)Result(Result<Other> other)
       : Result(other ? Result(std::move(other).value()) : Result(other.failure())) {}
