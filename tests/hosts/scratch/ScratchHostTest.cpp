@@ -7,8 +7,10 @@
 #include "platform/DiskEventsContract.h"
 #include "platform/HostNamesContract.h"
 #include "platform/NetworkTimeContract.h"
+#include "platform/PowerControllerContract.h"
 #include "platform/PowerSettingsContract.h"
 #include "platform/PreferencesContract.h"
+#include "platform/RegistryContract.h"
 #include "platform/RemoteAccessContract.h"
 
 namespace tavisk {
@@ -127,6 +129,47 @@ struct ScratchPower {
   PropertyList::Dictionary source;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PowerSettingsContract, ScratchPower);
+
+struct ScratchController {
+  static constexpr const char* className = "VelmarKCS";
+  ScratchController() {
+    PropertyList::Dictionary service;
+    service.set("ServerID", 0);
+    describe(service);
+  }
+  PowerController& service() { return machine.host().powerController(); }
+  void refuseDelays() {
+    auto described = machine.description();
+    auto service = described.dictionary("Registry").dictionary("Services").dictionary(className);
+    service.set("Set Status", 5);
+    describe(service);
+  }
+  const std::vector<Effect>& effects() { return machine.log.effects; }
+  void describe(const PropertyList::Dictionary& service) {
+    PropertyList::Dictionary services;
+    services.set(className, service);
+    machine.set("Registry", "Services", services);
+  }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PowerControllerContract, ScratchController);
+
+struct ScratchRegistry {
+  IORegistry& service() { return machine.host().registry(); }
+  void haveRoot(const std::string& property, const IORegistry::Data& data) {
+    PropertyList::Dictionary tree;
+    tree.dictionary("/").set(property, data);
+    machine.set("Registry", "Device Tree", tree);
+  }
+  std::string haveInterface(const std::string& name) {
+    PropertyList::Dictionary interfaces;
+    interfaces.dictionary(name).set("Path", "/pci/eth");
+    machine.set("Registry", "Interfaces", interfaces);
+    return "/pci/eth";
+  }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, RegistryContract, ScratchRegistry);
 
 struct ScratchBootLoader {
   BootLoaderFile& service() { return machine.host().bootLoaderFile(); }

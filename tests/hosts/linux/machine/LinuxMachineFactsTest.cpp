@@ -4,6 +4,7 @@
 
 #include "hosts/linux/disks/DiskTree.h"
 #include "platform/BootLoaderFileContract.h"
+#include "platform/RegistryContract.h"
 
 namespace tavisk {
 namespace {
@@ -50,36 +51,23 @@ TEST(LinuxKernelValues, KnowAStartOverTheNetwork) {
   }
 }
 
-TEST(LinuxIORegistry, FindsTheDeviceThatCarriesAnInterface) {
-  LinuxTree machine;
-  const std::string device = "/devices/pci0000:00/0000:00:03.0";
-  machine.write("/sys/bus/some/uevent", "");
-  for (const char* name : {"", "/virtio0", "/virtio0/net/eth0"})
-    machine.link("/sys" + device + name + "/subsystem", "/sys/bus/some");
-  machine.link("/sys/class/net/eth0", "../.." + device + "/virtio0/net/eth0");
-  auto& registry = machine.host().registry();
-  const auto interface = registry.serviceNamed("eth0");
-  ASSERT_TRUE(interface);
-  auto above = registry.parent(*interface, RegistryPlane::service).second;
-  EXPECT_EQ(registry.path(above, RegistryPlane::deviceTree).second, "IODeviceTree:" + device + "/virtio0");
-  above = registry.parent(above, RegistryPlane::service).second;
-  EXPECT_EQ(registry.path(above, RegistryPlane::deviceTree).second, "IODeviceTree:" + device);
-  for (int i = 0; i < 3; ++i) above = registry.parent(above, RegistryPlane::service).second;
-  EXPECT_EQ(above.name, "/sys/devices") << "the top is its own parent";
-  for (const char* name : {"", ".", "eth1", "../net/eth0"}) EXPECT_FALSE(registry.serviceNamed(name)) << name;
-}
-
-TEST(LinuxIORegistry, HasTheFirmwaresTreeWhereThereIsOne) {
-  LinuxTree machine;
-  auto& registry = machine.host().registry();
-  EXPECT_FALSE(registry.entryAtPath("IODeviceTree:/"));
-  machine.write("/sys/firmware/devicetree/base/compatible", std::string("a,b\0c\0", 6));
-  const auto root = registry.entryAtPath("IODeviceTree:/");
-  ASSERT_TRUE(root);
-  EXPECT_THAT(*registry.dataProperty(*root, "compatible"), ElementsAre('a', ',', 'b', 0, 'c', 0));
-  for (const char* name : {"", "none", "../base/compatible"}) EXPECT_FALSE(registry.dataProperty(*root, name));
-  EXPECT_FALSE(registry.entryAtPath("IODeviceTree:/none"));
-}
+/// An interface below a device that is on no bus of its own, as the kernel has it.
+struct LinuxRegistry {
+  IORegistry& service() { return tree.host().registry(); }
+  void haveRoot(const std::string& property, const IORegistry::Data& data) {
+    tree.write("/sys/firmware/devicetree/base/" + property, std::string(data.begin(), data.end()));
+  }
+  std::string haveInterface(const std::string& name) {
+    const std::string device = "/devices/pci0000:00/0000:00:03.0/virtio0";
+    tree.write("/sys/bus/some/uevent", "");
+    tree.link("/sys" + device + "/subsystem", "/sys/bus/some");
+    tree.link("/sys" + device + "/net/" + name + "/subsystem", "/sys/bus/some");
+    tree.link("/sys/class/net/" + name, "../.." + device + "/net/" + name);
+    return device;
+  }
+  LinuxTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, RegistryContract, LinuxRegistry);
 
 TEST(LinuxKeyboard, HasTheNumberOfItsLayout) {
   const std::tuple<const char*, const char*, std::optional<std::int64_t>> cases[] = {
