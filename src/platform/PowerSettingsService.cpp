@@ -3,6 +3,7 @@
 #include "platform/PowerSettingsService.h"
 
 #include <algorithm>
+#include <cstdint>
 
 #include "effects/SettingNames.h"
 

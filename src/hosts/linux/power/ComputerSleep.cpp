@@ -45,7 +45,7 @@ bool hasPowerButton(const SystemRoot& root) {
 }  // namespace
 
 Result<BusMessage> ComputerSleep::property(const char* name, const char* signature) {
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
   return (*bus)->property(loginManager(), name, signature);
 }
@@ -83,7 +83,7 @@ bool ComputerSleep::storedButton() const {
 std::optional<Failure> ComputerSleep::whyCannotSleep() {
   constexpr const char* tried = "CanSuspend";
   if (!_machine.services.hasServiceManager()) return Failure{tried, service, "this machine has no login service"};
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
   auto answer = (*bus)->query(loginManager(), tried, "s");
   // A service that does not answer is no reason: whatever is done with it then tells why.
@@ -104,7 +104,7 @@ std::optional<Failure> ComputerSleep::whyNoButton() {
 /// Programs that keep the machine from sleeping as long as they run.
 std::string ComputerSleep::whatBlocksSleep() {
   std::string names;
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return names;
   auto reply = (*bus)->query(loginManager(), "ListInhibitors", "a(ssssuu)");
   if (!reply) return names;
@@ -143,7 +143,7 @@ std::string ComputerSleep::whoUndoesMinutes() {
 /// go on by the old one. When it starts it takes a machine without users for idle since it was turned on, and would let
 /// it sleep at once, unless it is told that the machine is busy. Sessions live on.
 Result<void> ComputerSleep::restartService(Minutes asked) {
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
   // The reply holds the lock.
   const auto busy = (*bus)->call(loginManager(), "Inhibit", "h", "idle", "tavisk", "sets the time of sleep", "block");
@@ -156,7 +156,7 @@ Result<void> ComputerSleep::restartService(Minutes asked) {
 }
 
 Result<void> ComputerSleep::rereadConfiguration() {
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
   const BusObject manager{"org.freedesktop.systemd1", "/org/freedesktop/systemd1", "org.freedesktop.systemd1.Manager"};
   const auto done = (*bus)->call(manager, "KillUnit", "", loginDaemon.unit, "main", std::int32_t{SIGHUP});

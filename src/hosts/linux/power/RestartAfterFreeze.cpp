@@ -61,7 +61,7 @@ bool RestartAfterFreeze::hasWatchdog() const {
 }
 
 Result<bool> RestartAfterFreeze::isWatchdogUsed() const {
-  auto bus = _machine.services.serviceManager();
+  const auto bus = _machine.services.serviceManager();
   if (!bus) return bus.failure();
   auto time = (*bus)->property(serviceManager(), "RuntimeWatchdogUSec", "t");
   if (!time) return time.failure();
@@ -120,14 +120,14 @@ Result<void> RestartAfterFreeze::setWatchdog(bool restarts) const {
 
 Result<void> RestartAfterFreeze::reloadManager() const {
   constexpr std::chrono::seconds longestReload{10};
-  auto bus = _machine.services.serviceManager();
+  const auto bus = _machine.services.serviceManager();
   if (!bus) return bus.failure();
   const auto reloaded = (*bus)->call(serviceManager(), "Reload", "", Bus::Writer([](BusMessage&) {}), longestReload);
   return reloaded ? Result<void>() : reloaded.failure();
 }
 
 Result<void> RestartAfterFreeze::setWatchdogTime(std::chrono::microseconds time) const {
-  auto bus = _machine.services.serviceManager();
+  const auto bus = _machine.services.serviceManager();
   if (!bus) return bus.failure();
   const BusObject properties{"org.freedesktop.systemd1", "/org/freedesktop/systemd1",
                              "org.freedesktop.DBus.Properties"};

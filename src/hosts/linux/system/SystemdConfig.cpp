@@ -90,7 +90,7 @@ std::vector<std::string> SystemdConfig::words(std::string_view section, std::str
 std::optional<SystemdConfig::Assignment> SystemdConfig::last(std::string_view section, std::string_view key) const {
   std::optional<Assignment> last;
   for (const auto& file : files())
-    for (auto& value : assignments(_root.read(file, fileLimit).valueOr(""), section, key)) last = {file, value};
+    for (const auto& value : assignments(_root.read(file, fileLimit).valueOr(""), section, key)) last = {file, value};
   return last && !last->value.empty() ? last : std::nullopt;
 }
 
@@ -107,7 +107,7 @@ std::string SystemdConfig::whatHides(std::string_view section, const std::vector
 
 Result<void> SystemdConfig::setOwn(const std::string& section, const std::map<std::string, std::string>& values) const {
   auto merged = values;
-  for (auto& [key, value] : allAssignments(_root.read(ownDropIn(), fileLimit).valueOr(""), section))
+  for (const auto& [key, value] : allAssignments(_root.read(ownDropIn(), fileLimit).valueOr(""), section))
     merged.emplace(key, value);
   auto text = ownfile::header + ("[" + section + "]\n");
   for (const auto& [key, value] : merged) text += std::string(key).append("=").append(value).append("\n");

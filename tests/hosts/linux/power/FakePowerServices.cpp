@@ -27,22 +27,12 @@ FakePowerServices::FakePowerServices(const std::filesystem::path& tree)
       _peer(tree / "run/dbus/system_bus_socket", {},
             [this](sd_bus_message* call, const std::string& member) { return answer(call, member); }) {}
 
-void FakePowerServices::canSuspend(const std::string& answer) {
-  const std::scoped_lock lock(_mutex);
-  _canSuspend = answer;
-}
-
-void FakePowerServices::maskSleep() {
-  const std::scoped_lock lock(_mutex);
-  _sleepTarget = "masked";
-}
-
 std::string FakePowerServices::sleepsAfter() {
   const std::scoped_lock lock(_mutex);
   return _sleepsAfter;
 }
 
-void FakePowerServices::read() {
+void FakePowerServices::readLogin() {
   const auto lines = linesOf(_tree / "etc/systemd/logind.conf.d/60-tavisk.conf");
   readKey(lines, "IdleAction", _idleAction);
   readKey(lines, "IdleActionSec", _idleMinutes);
@@ -65,7 +55,7 @@ int FakePowerServices::answer(sd_bus_message* call, const std::string& member) {
   const std::scoped_lock lock(_mutex);
   if (member == "Get") return answerGet(call);
   if (member == "Set") return answerSet(call);
-  if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", _canSuspend.c_str());
+  if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", canSuspend.load());
   if (member == "LoadUnit")
     return sd_bus_reply_method_return(call, "o", "/org/freedesktop/systemd1/unit/suspend_2etarget");
   if (member == "Reload") {
@@ -77,7 +67,7 @@ int FakePowerServices::answer(sd_bus_message* call, const std::string& member) {
     return sd_bus_reply_method_return(call, "a(ssssuu)", 2, "idle", "nightly-backup", "", "block", 0, 1, "sleep",
                                       "NetworkManager", "", "delay", 0, 2);
   if (firstText(call) != "systemd-logind.service") return 0;
-  read();
+  readLogin();
   return member == "KillUnit" ? sd_bus_reply_method_return(call, "") : answerRestart(call);
 }
 
@@ -117,7 +107,7 @@ int FakePowerServices::answerGet(sd_bus_message* call) {
   constexpr std::uint64_t microseconds = 60'000'000;
   if (name == "IdleAction") return sd_bus_reply_method_return(call, "v", "s", _idleAction.c_str());
   if (name == "HandlePowerKey") return sd_bus_reply_method_return(call, "v", "s", _powerKey.c_str());
-  if (name == "LoadState") return sd_bus_reply_method_return(call, "v", "s", _sleepTarget.c_str());
+  if (name == "LoadState") return sd_bus_reply_method_return(call, "v", "s", sleepTarget.load());
   if (name == "IdleActionUSec")
     return sd_bus_reply_method_return(call, "v", "t", std::stoull(_idleMinutes) * microseconds);
   return sd_bus_reply_method_return(call, "v", "t", _watchdogSet != 0 ? _watchdogSet : _watchdogRead);

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <cstdint>
 #include <mutex>
 #include <string>
@@ -17,13 +18,14 @@ class FakePowerServices {
  public:
   explicit FakePowerServices(const std::filesystem::path& tree);
 
-  void canSuspend(const std::string& answer);
-  void maskSleep();
   /// After what time the machine would really sleep. The timer is set when the service starts, not later; it is then
   /// "at once" as nobody has been logged in for long, unless somebody holds a lock against idleness.
   std::string sleepsAfter();
   /// The service manager forgets what was set, and goes by its configuration.
   void startAgain();
+
+  std::atomic<const char*> canSuspend = "yes";
+  std::atomic<const char*> sleepTarget = "loaded";
 
  private:
   int answer(sd_bus_message* call, const std::string& member);
@@ -32,13 +34,11 @@ class FakePowerServices {
   int answerInhibit(sd_bus_message* call);
   int answerRestart(sd_bus_message* call);
   bool isHeldBusy() const;
-  void read();
+  void readLogin();
   void readManager();
 
   std::filesystem::path _tree;
   std::mutex _mutex;
-  std::string _canSuspend = "yes";
-  std::string _sleepTarget = "loaded";
   std::string _idleAction = "ignore";
   std::string _idleMinutes = "30";
   std::string _powerKey = "poweroff";

@@ -144,6 +144,25 @@ class PowerTree : public LinuxTree {
   LinuxPowerSettingsService& power() { return _power; }
   LinuxPowerController& delays() { return _delays; }
 
+  /// Changes a setting, whatever feeds the machine, and tells what came of it.
+  Effect set(SleepTimer timer, Minutes minutes) {
+    _power.setUntilSleep(timer, mains, minutes);
+    return lastEffect();
+  }
+  Effect turn(PowerSwitch which, bool on) {
+    _power.setOn(which, mains, on);
+    return lastEffect();
+  }
+  Effect setRestartsAfterFreeze(bool restarts) {
+    _power.setRestartsAfterFreeze(restarts);
+    return lastEffect();
+  }
+  Effect lastEffect() const { return log.effects.empty() ? Effect{} : log.effects.back(); }
+  /// How the last value that was read is told.
+  std::string lastRead() const { return log.values.empty() ? "" : log.values.back().live.value_or(""); }
+
+  const PowerSource mains{"AC Power"};
+
   TreeConsole console{*this};
   TreeCards cards;
   TreeController controllerLink;
