@@ -12,7 +12,7 @@ namespace {
 
 /// What an absent key reads as, as the services read it.
 std::string readAbsent(const KeyRow& row) {
-  MachineSection absent(std::string(row.place), nullptr);
+  const MachineSection absent(std::string(row.place), nullptr);
   if (row.type == KeyType::boolean) return absent.boolean(row.key) ? "true" : "false";
   if (row.type == KeyType::integer) return std::to_string(absent.integer(row.key));
   return absent.text(row.key);
@@ -29,16 +29,16 @@ TEST(KeyTable, hasEachKeyOnceInAPlaceThatItHasToo) {
   std::set<std::string> known{""};
   for (const auto& row : keyTable()) {
     EXPECT_TRUE(known.contains(std::string(row.place))) << row.place;
-    auto key = std::string(row.place) + (row.place.empty() ? "" : "/") + std::string(row.key);
+    const auto key = placeUnder(row);
     EXPECT_TRUE(known.insert(key).second) << key;
     if (row.type == KeyType::dictionaries) known.insert(key + "/*");
   }
 }
 
 TEST(KeyTable, hasNoDefaultForAKeyThatItDoesNotHave) {
-  MachineSection absent("Clock", nullptr);
-  EXPECT_THROW((void)absent.integer("Tine"), std::logic_error);
-  EXPECT_THROW((void)absent.integer("Time"), std::logic_error) << "absent is absent";
+  const MachineSection absent("Clock", nullptr);
+  EXPECT_THROW(static_cast<void>(absent.integer("Tine")), std::logic_error);
+  EXPECT_THROW(static_cast<void>(absent.integer("Time")), std::logic_error) << "absent is absent";
 }
 
 }  // namespace

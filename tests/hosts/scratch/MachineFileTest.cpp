@@ -18,6 +18,7 @@ namespace {
 using namespace std::chrono_literals;
 using testing::ElementsAre;
 using testing::HasSubstr;
+using testing::IsEmpty;
 
 class MachineFileTest : public testing::Test {
  protected:
@@ -26,6 +27,7 @@ class MachineFileTest : public testing::Test {
     EXPECT_TRUE(file) << file.failure().why;
     return std::move(file).value();
   }
+  std::string path() const { return machine.directory() + "/machine.plist"; }
   std::string whyNotOpened() {
     auto file = MachineFile::open(machine.directory(), machine.effects);
     return file ? "opened" : file.failure().on + ": " + file.failure().why;
@@ -92,24 +94,25 @@ TEST_F(MachineFileTest, refusesValuesOfAWrongTypeByFileKeyAndExpectation) {
   };
   for (const auto& [list, why] : cases) {
     machine.describe(*writePropertyList(list));
-    auto path = machine.directory() + "/machine.plist";
-    EXPECT_EQ(whyNotOpened(), why ? path + ": " + why : "opened");
+    EXPECT_EQ(whyNotOpened(), why ? path() + ": " + why : "opened");
   }
 }
 
-TEST_F(MachineFileTest, refusesWhatIsNoMachine) {
-  machine.describe(plist("<dict><key>Clock</key><dict></plist>"));
-  EXPECT_THAT(whyNotOpened(), HasSubstr("/machine.plist: "));
-  machine.describe("");
-  EXPECT_THAT(whyNotOpened(), HasSubstr("/machine.plist: "));
-  std::filesystem::remove(machine.directory() + "/machine.plist");
-  std::filesystem::create_symlink("../elsewhere", machine.directory() + "/machine.plist");
-  EXPECT_THAT(whyNotOpened(), HasSubstr("/machine.plist: No such file or directory"));
-  EXPECT_EQ(MachineFile::open(machine.directory() + "//", machine.effects).failure().on,
-            machine.directory() + "/machine.plist");
-  EXPECT_EQ(MachineFile::open("/no/such", machine.effects).failure(),
-            systemFailure("rehearse", "/no/such", ENOENT));
-  EXPECT_EQ(MachineFile::open("/etc/passwd", machine.effects).failure().why, "Not a directory");
+TEST_F(MachineFileTest, refusesWhatIsNoPropertyList) {
+  for (const char* text : {"", "<plist><dict>"}) {
+    machine.describe(text);
+    EXPECT_THAT(whyNotOpened(), HasSubstr("/machine.plist: "));
+  }
+}
+
+TEST_F(MachineFileTest, refusesALinkThatLeadsNowhere) {
+  std::filesystem::create_symlink("../elsewhere", path());
+  EXPECT_EQ(whyNotOpened(), path() + ": No such file or directory");
+}
+
+TEST_F(MachineFileTest, refusesWhatIsNoFolder) {
+  for (const auto& [name, error] : {std::pair("/no/such", ENOENT), {"/etc/passwd", ENOTDIR}})
+    EXPECT_EQ(MachineFile::open(name, machine.effects).failure(), systemFailure("rehearse", name, error));
 }
 
 TEST_F(MachineFileTest, keepsUnknownKeysAndTheOrderOfAll) {
@@ -120,7 +123,7 @@ TEST_F(MachineFileTest, keepsUnknownKeysAndTheOrderOfAll) {
   const std::string after = "</integer>\n\t</dict>\n\t<key>Apple</key>\n\t<true/>\n";
   machine.describe(plist("<dict>\n" + before + "1" + after + "</dict>\n"));
   EXPECT_TRUE(open()->change([](auto& values) { values.dictionary("Clock").set("Time", 2); }));
-  auto text = contentsOf(machine.directory() + "/machine.plist");
+  auto text = contentsOf(path());
   EXPECT_THAT(text, HasSubstr("<dict>\n" + before + "2" + after + "</dict>\n"));
 }
 
@@ -138,8 +141,8 @@ TEST_F(MachineFileTest, isReadAgainOnlyWhenItChanged) {
 
 TEST_F(MachineFileTest, mayBeALinkInsideItsFolder) {
   machine.set("Clock", "Offset", 1);
-  std::filesystem::rename(machine.directory() + "/machine.plist", machine.directory() + "/real");
-  std::filesystem::create_symlink("/real", machine.directory() + "/machine.plist");
+  std::filesystem::rename(path(), machine.directory() + "/real");
+  std::filesystem::create_symlink("/real", path());
   auto file = open();
   EXPECT_EQ(file->section("Clock").integer("Offset"), 1);
   EXPECT_TRUE(file->change([](auto& values) { values.dictionary("Clock").set("Offset", 2); }));
@@ -149,40 +152,66 @@ TEST_F(MachineFileTest, mayBeALinkInsideItsFolder) {
 
 TEST_F(MachineFileTest, standsAtTheLastGoodContentsAndSaysSoOnce) {
   machine.set("Clock", "Offset", 1);
-  auto& host = machine.host();
-  auto file = open();
+  const auto file = open();
   machine.describe("<plist><dict>");
   for (int times = 0; times < 3; ++times) EXPECT_EQ(file->section("Clock").integer("Offset"), 1);
-  ASSERT_EQ(machine.effectsLog().size(), 1U);
-  EXPECT_THAT(machine.effectsLog()[0], HasSubstr("machine.plist"));
-  host.networkTime().start();
-  EXPECT_THAT(machine.effectsLog().back(), HasSubstr(R"("setting":"Network Time","outcome":"failed")"));
-  EXPECT_EQ(contentsOf(machine.directory() + "/machine.plist"), "<plist><dict>");
+  ASSERT_EQ(machine.log.effects.size(), 1U);
+  EXPECT_EQ(machine.log.effects[0].failure->on, path());
+  EXPECT_EQ(machine.log.effects[0].note, "the contents last read stand");
   machine.describe(plist("<dict/>"));
   EXPECT_EQ(file->section("Clock").integer("Offset"), 0);
 }
 
-TEST_F(MachineFileTest, tellsObserversWhatOthersChanged) {
-  auto file = open();
-  auto told = file->contents();
-  machine.set("Disks", "disk0", PropertyList::Dictionary());
-  std::vector<std::pair<std::size_t, std::size_t>> sizes;
-  auto observation = file->observeChanges(machine.runLoop, told, [&](const auto& before, const auto& now) {
-    sizes.emplace_back(before->size(), now->size());
-  });
-  auto hasTold = [&](std::size_t times) {
-    return machine.runLoop.runUntil(RunLoop::Clock::now() + 5s, [&] { return sizes.size() >= times; });
-  };
-  EXPECT_TRUE(hasTold(1)) << "what changed before the observation began";
+TEST_F(MachineFileTest, isNotReplacedWhileItCannotBeRead) {
+  const auto file = open();
+  machine.describe("<plist><dict>");
+  EXPECT_EQ(file->change(countTwice()).failure().on, path());
+  EXPECT_EQ(contentsOf(path()), "<plist><dict>");
+}
+
+/// What an observer is told: how many sections there were before and after each change.
+class ObservedMachineTest : public MachineFileTest {
+ protected:
+  void observe() {
+    observation = file->observeChanges(machine.runLoop, told, [this](const auto& before, const auto& now) {
+      changes.emplace_back(before->size(), now->size());
+    });
+  }
+  bool isTold() {
+    return machine.runLoop.runUntil(RunLoop::Clock::now() + 5s, [&] { return !changes.empty(); });
+  }
+
+  std::unique_ptr<MachineFile> file = open();
+  MachineFile::Contents told = file->contents();
+  RunLoop::Registration observation;
+  std::vector<std::pair<std::size_t, std::size_t>> changes;
+};
+
+TEST_F(ObservedMachineTest, tellsWhatChangedBeforeTheObservationBegan) {
+  machine.set("Clock", "Time", 1);
+  observe();
+  EXPECT_TRUE(isTold());
+  EXPECT_THAT(changes, ElementsAre(std::pair(0, 1)));
+}
+
+TEST_F(ObservedMachineTest, tellsWhatOthersChangeOnceItCanBeRead) {
+  observe();
+  machine.runLoop.runPass();
   machine.describe("not yet");
-  machine.describe(plist("<dict/>"));
-  EXPECT_TRUE(hasTold(2));
+  machine.runLoop.runPass();
+  machine.describe(plist("<dict><key>Mine</key><true/></dict>"));
+  EXPECT_TRUE(isTold());
+  EXPECT_THAT(changes, ElementsAre(std::pair(0, 1)));
+}
+
+TEST_F(ObservedMachineTest, tellsNothingOfOtherFilesNorAfterItsEnd) {
+  observe();
   machine.host().systemLog().write("no change of the machine");
   machine.runLoop.runPass();
   observation.cancel();
   machine.set("Clock", "Time", 1);
   machine.runLoop.runPass();
-  EXPECT_THAT(sizes, ElementsAre(std::pair(0, 1), std::pair(1, 0)));
+  EXPECT_THAT(changes, IsEmpty());
 }
 
 TEST_F(MachineFileTest, losesNothingBetweenTwoProcesses) {
@@ -218,45 +247,72 @@ TEST_F(MachineFileTest, isWholeWheneverItsWriterIsKilled) {
   EXPECT_THAT(names(), ElementsAre("machine.lock", "machine.plist"));
 }
 
-TEST_F(MachineFileTest, waitsForAnotherRunButOnOtherThreadsNotForLong) {
-  auto file = open();
-  FileDescriptor other(::open((machine.directory() + "/machine.lock").c_str(), O_RDONLY | O_CREAT, 0644));
-  ASSERT_EQ(::flock(other.number(), LOCK_EX), 0);
-  std::thread([&] {
-    auto before = RunLoop::Clock::now();
-    EXPECT_THAT(file->change(countTwice()).failure().why, HasSubstr("another run"));
-    EXPECT_LT(RunLoop::Clock::now() - before, 2s);
-  }).join();
+/// Another run that keeps the machine locked.
+class LockedMachineTest : public MachineFileTest {
+ protected:
+  LockedMachineTest() : other(::open((machine.directory() + "/machine.lock").c_str(), O_RDONLY | O_CREAT, 0644)) {
+    EXPECT_EQ(::flock(other.number(), LOCK_EX), 0);
+  }
+  FileDescriptor other;
+};
+
+TEST_F(LockedMachineTest, isWaitedFor) {
+  const auto file = open();
   std::thread release([&] {
-    std::this_thread::sleep_for(200ms);
+    std::this_thread::sleep_for(100ms);
     ::flock(other.number(), LOCK_UN);
   });
   EXPECT_TRUE(file->change(countTwice()));
   release.join();
 }
 
-TEST_F(MachineFileTest, recordsAChangeThatCannotBeWritten) {
-  bool ran = withOwnMounts([&] {
+TEST_F(LockedMachineTest, isNotWaitedForLongOnOtherThreads) {
+  const auto file = open();
+  std::thread([&] {
+    const auto before = RunLoop::Clock::now();
+    EXPECT_THAT(file->change(countTwice()).failure().why, HasSubstr("another run"));
+    EXPECT_LT(RunLoop::Clock::now() - before, 2s);
+  }).join();
+}
+
+/// Does the work on a machine in a file system of its own, and tells the host's effects there.
+void withSmallMachine(const ScratchMachine& machine, const std::function<void(Host& host, EffectLog& told)>& work) {
+  const bool ran = withOwnMounts([&] {
     ASSERT_TRUE(mountMemory(machine.directory(), "64k"));
-    machine.set("Network Time", "Server", "old.example");
     EffectSink effects;
     EffectLog told;
     effects.addChannel(told);
     RunLoop runLoop;
-    auto host = std::move(ScratchHost::open(machine.directory(), effects, runLoop)).value();
-    host->systemLog().write("first");
-    host->networkTime().setServer({std::string(70'000, 'x')});
-    EXPECT_TRUE(told.lines.back().find("No space left on device") != std::string::npos);
-    EXPECT_EQ(host->networkTime().server().address, "old.example");
-    host->systemLog().write(std::string(70'000, 'x'));
-    host->systemLog().write("last");
-    EXPECT_THAT(machine.systemLog(), ElementsAre("first", "last")) << "no half of a line";
-    ASSERT_EQ(::mount("", machine.directory().c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
-    host->networkTime().start();
-    EXPECT_THAT(told.lines.back(), HasSubstr("Read-only file system"));
-    EXPECT_FALSE(host->networkTime().isRunning());
+    const auto host = ScratchHost::open(machine.directory(), effects, runLoop);
+    work(**host, told);
   });
   if (!ran) GTEST_SKIP() << "may not have mounts of its own";
+}
+
+TEST_F(MachineFileTest, saysWhenThereIsNoRoomForAChange) {
+  withSmallMachine(machine, [](Host& host, EffectLog& told) {
+    host.networkTime().setServer({"old.example"});
+    host.networkTime().setServer({std::string(70'000, 'x')});
+    EXPECT_EQ(told.effects.back().failure->code, std::errc::no_space_on_device);
+    EXPECT_EQ(host.networkTime().server().address, "old.example");
+  });
+}
+
+TEST_F(MachineFileTest, saysWhenItMayNotBeWritten) {
+  withSmallMachine(machine, [&](Host& host, EffectLog& told) {
+    ASSERT_EQ(::mount("", machine.directory().c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
+    host.networkTime().start();
+    EXPECT_EQ(told.effects.back().failure->code, std::errc::read_only_file_system);
+    EXPECT_FALSE(host.networkTime().isRunning());
+  });
+}
+
+TEST_F(MachineFileTest, leavesNoHalfLineInTheSystemLog) {
+  withSmallMachine(machine, [&](Host& host, EffectLog& /*told*/) {
+    for (const auto& message : {std::string("first"), std::string(70'000, 'x'), std::string("last")})
+      host.systemLog().write(message);
+    EXPECT_THAT(machine.systemLog(), ElementsAre("first", "last"));
+  });
 }
 
 }  // namespace

@@ -7,6 +7,7 @@
 #include "platform/DiskEventsContract.h"
 #include "platform/HostNamesContract.h"
 #include "platform/NetworkTimeContract.h"
+#include "platform/PowerControllerContract.h"
 #include "platform/PowerSettingsContract.h"
 #include "platform/PreferencesContract.h"
 #include "platform/RemoteAccessContract.h"
@@ -127,6 +128,30 @@ struct ScratchPower {
   PropertyList::Dictionary source;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PowerSettingsContract, ScratchPower);
+
+struct ScratchController {
+  static constexpr const char* className = "VelmarKCS";
+  ScratchController() {
+    PropertyList::Dictionary service;
+    service.set("ServerID", 0);
+    describe(service);
+  }
+  PowerController& service() { return machine.host().powerController(); }
+  void refuseDelays() {
+    auto described = machine.description();
+    auto service = described.dictionary("Registry").dictionary("Services").dictionary(className);
+    service.set("Set Status", 5);
+    describe(service);
+  }
+  const std::vector<Effect>& effects() { return machine.log.effects; }
+  void describe(const PropertyList::Dictionary& service) {
+    PropertyList::Dictionary services;
+    services.set(className, service);
+    machine.set("Registry", "Services", services);
+  }
+  ScratchMachine machine;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PowerControllerContract, ScratchController);
 
 struct ScratchBootLoader {
   BootLoaderFile& service() { return machine.host().bootLoaderFile(); }

@@ -4,13 +4,15 @@
 
 #include <cerrno>
 
+#include "effects/EffectMatchers.h"
+#include "effects/SettingNames.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/machine/KeyboardLock.h"
 
 namespace tavisk {
 namespace {
 
-using testing::AllOf, testing::ElementsAre, testing::HasSubstr;
+using testing::ElementsAre;
 
 constexpr std::uint8_t lock = 0x02;
 
@@ -72,13 +74,17 @@ TEST(EnclosureLock, DisablesKeyboardsWhileItIsEngaged) {
     bool disables;
     const char* before;
     const char* after;
-    const char* outcome;
+    Outcome outcome;
   };
   constexpr std::uint8_t others = 0x0D;
+  using enum Outcome;
   const Case cases[] = {
-      {lock, true, "0", "1", "applied"},           {lock | others, true, "1", "1", "unchanged"},
-      {others, true, "0", "0", "unchanged"},       {others, true, "1", "0", "applied"},
-      {lock | others, false, "1", "0", "applied"}, {0, false, "0", "0", "unchanged"},
+      {lock, true, "0", "1", applied},           {lock | others, true, "1", "1", unchanged},
+      {others, true, "0", "0", unchanged},       {others, true, "1", "0", applied},
+      {lock | others, false, "1", "0", applied}, {0, false, "0", "0", unchanged},
+  };
+  const auto textOf = [](const std::string& inhibited) {
+    return inhibited == "1" ? "keyboards disabled" : "keyboards enabled";
   };
   for (const auto& test : cases) {
     PanelTree tree;
@@ -86,30 +92,46 @@ TEST(EnclosureLock, DisablesKeyboardsWhileItIsEngaged) {
     for (const char* name : {"input1", "input2"})
       tree.write(std::string("/sys/class/input/") + name + "/inhibited", test.before);
     tree.setDisablesKeyboard(test.disables);
-    EXPECT_THAT(tree.lastTold(), HasSubstr("\"outcome\":\"" + std::string(test.outcome)));
+    EXPECT_EQ(tree.lastEffect(),
+              (Effect{.setting = setting::keyboardLock,
+                      .outcome = test.outcome,
+                      .before = textOf(test.before),
+                      .asked = textOf(test.after),
+                      .live = textOf(test.after),
+                      .note = (test.state & lock) != 0 ? "the lock is engaged" : "the lock is open"}));
     for (const char* name : {"input1", "input2"}) EXPECT_EQ(tree.inhibited(name), test.after);
     for (const char* name : {"input3", "input4", "input5"}) EXPECT_EQ(tree.inhibited(name), "0") << name;
   }
 }
 
-TEST(EnclosureLock, SaysWhatIsMissing) {
-  PanelTree without;
-  without.panel.capabilities = 0xFF & ~lock;
-  without.panel.state = lock;
-  without.setDisablesKeyboard(true);
-  EXPECT_THAT(without.lastTold(), AllOf(HasSubstr("not supported"), HasSubstr("the preference is kept")));
-  EXPECT_EQ(without.inhibited("input1"), "0");
+TEST(EnclosureLock, TellsWhenKeyboardsDiffer) {
+  PanelTree tree;
+  tree.panel.state = lock;
+  tree.write("/sys/class/input/input1/inhibited", "1\n");
+  tree.setDisablesKeyboard(true);
+  EXPECT_EQ(tree.lastEffect().before, "some keyboards disabled");
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
+}
 
-  PanelTree none;
-  none.panel.error = ENODEV;
-  none.setDisablesKeyboard(true);
-  EXPECT_THAT(none.lastTold(), HasSubstr("not supported"));
+TEST(EnclosureLock, LeavesTheKeyboardsOfAMachineThatTellsOfNoLock) {
+  for (const auto& [error, why] : {std::pair(0, "no lock of the front panel"), {ENODEV, "No such device"}}) {
+    PanelTree tree;
+    tree.panel.error = error;
+    tree.panel.capabilities = 0xFF & ~lock;
+    tree.panel.state = lock;
+    tree.setDisablesKeyboard(true);
+    EXPECT_THAT(tree.lastEffect(), UnsupportedFor(why));
+    EXPECT_EQ(tree.lastEffect().note, "the preference is kept");
+    EXPECT_EQ(tree.inhibited("input1"), "0");
+  }
+}
 
-  PanelTree old;
-  old.panel.state = lock;
-  std::filesystem::remove(old.at("/sys/class/input/input2/inhibited"));
-  old.setDisablesKeyboard(true);
-  EXPECT_THAT(old.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("input2/inhibited")));
+TEST(EnclosureLock, SaysWhichKeyboardCannotBeDisabled) {
+  PanelTree tree;
+  tree.panel.state = lock;
+  std::filesystem::remove(tree.at("/sys/class/input/input2/inhibited"));
+  tree.setDisablesKeyboard(true);
+  EXPECT_THAT(tree.lastEffect(), FailedFor("input2/inhibited"));
 }
 
 }  // namespace

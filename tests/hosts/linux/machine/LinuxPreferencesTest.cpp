@@ -7,6 +7,8 @@
 #include <cerrno>
 #include <csignal>
 
+#include "effects/EffectMatchers.h"
+#include "effects/SettingNames.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/shared/FileLock.h"
 #include "platform/PreferencesContract.h"
@@ -14,7 +16,7 @@
 namespace tavisk {
 namespace {
 
-using testing::AllOf, testing::HasSubstr;
+using testing::HasSubstr;
 
 constexpr const char* preferencesFile = "/etc/tavisk/preferences/AnyApplication.plist";
 
@@ -46,27 +48,39 @@ TEST(LinuxPreferences, AreWrittenTogetherWithThoseOfOtherRuns) {
     EXPECT_THAT(tree.file(preferencesFile), HasSubstr(part));
 }
 
-TEST(LinuxPreferences, AreNotWrittenUnderAnothersLockNorOverDamage) {
+TEST(LinuxPreferences, AreNotWrittenUnderAnothersLock) {
+  LinuxTree tree;
+  auto& processes = tree.host().processes();
+  processes.setMachineBoolean("a", true);
+  tree.write(preferencesFile, "<dict/>");
+  const auto held = lockFile(SystemRoot(tree.at("/")), "/etc/tavisk/preferences/.lock", std::chrono::seconds(0));
+  processes.writeMachinePreferences();
+  EXPECT_THAT(tree.lastEffect(), FailedFor("another run keeps it locked"));
+  EXPECT_EQ(tree.file(preferencesFile), "<dict/>");
+}
+
+TEST(LinuxPreferences, ReadAsNoneOutOfADamagedFileAndAreKeptBesideIt) {
   LinuxTree tree;
   tree.write(preferencesFile, "<dict>");
   EXPECT_FALSE(tree.host().preferences().value("a"));
-  EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr(preferencesFile)));
-  auto& processes = tree.host().processes();
-  processes.setMachineBoolean("a", true);
-  {
-    const auto held = lockFile(SystemRoot(tree.at("/")), "/etc/tavisk/preferences/.lock", std::chrono::seconds(0));
-    processes.writeMachinePreferences();
-    EXPECT_THAT(tree.lastTold(), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("another run keeps it locked")));
-  }
-  EXPECT_EQ(tree.file(preferencesFile), "<dict>");
-  processes.setMachineBoolean("a", true);
-  processes.writeMachinePreferences();
-  EXPECT_THAT(tree.lastTold(), HasSubstr(R"("outcome":"applied")"));
+  EXPECT_THAT(tree.lastEffect(), FailedFor(preferencesFile));
+  tree.host().processes().setMachineBoolean("a", true);
+  tree.host().processes().writeMachinePreferences();
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_EQ(tree.file(std::string(preferencesFile) + ".damaged"), "<dict>");
 }
 
+TEST(LinuxPreferences, OfAnotherTypeAreToldAsWhatTheyAre) {
+  LinuxTree tree;
+  tree.write(preferencesFile, "<plist><dict><key>a</key><string>yes</string></dict></plist>");
+  tree.host().processes().setMachineBoolean("a", false);
+  tree.host().processes().writeMachinePreferences();
+  EXPECT_EQ(tree.lastEffect().before, "string");
+  EXPECT_EQ(tree.lastEffect().stored, "off");
+}
+
 /// What a signal to a process of this machine comes to. A whole host would tell the journal of the machine too.
-std::string told(ProcessId process, int signal) {
+Effect effectOf(int signal, ProcessId process) {
   EffectSink effects;
   EffectLog log;
   effects.addChannel(log);
@@ -78,7 +92,7 @@ std::string told(ProcessId process, int signal) {
   NoController link;
   ManagementController controller(link);
   LinuxProcessUtilities(machine, preferences, controller).sendSignal(signal, process);
-  return log.lines.back();
+  return log.effects.back();
 }
 
 TEST(LinuxProcesses, GetSignals) {
@@ -87,12 +101,17 @@ TEST(LinuxProcesses, GetSignals) {
     ::pause();
     ::_exit(0);
   }
-  EXPECT_THAT(told(child, SIGTERM), AllOf(HasSubstr(R"("outcome":"applied")"), HasSubstr("15 to process")));
+  EXPECT_EQ(effectOf(SIGTERM, child),
+            (Effect{.setting = setting::signalToProcess, .asked = "15 to process " + std::to_string(child)}));
   int status = 0;
   ASSERT_EQ(::waitpid(child, &status, 0), child);
   EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGTERM);
-  EXPECT_THAT(told(child, SIGTERM), AllOf(HasSubstr(R"("outcome":"failed")"), HasSubstr("No such process")));
-  for (ProcessId group : {0, -1, -child, INT32_MIN}) EXPECT_THAT(told(group, SIGTERM), HasSubstr("no process id"));
+  EXPECT_EQ(effectOf(SIGTERM, child).failure->code, std::errc::no_such_process);
+}
+
+TEST(LinuxProcesses, GetNoSignalsAsAGroup) {
+  for (const ProcessId group : {0, -1, -::getpgrp(), INT32_MIN})
+    EXPECT_THAT(effectOf(SIGCONT, group), FailedFor("no process id"));
 }
 
 TEST(LinuxProcesses, AreFoundByNameTheFirstOne) {
@@ -103,8 +122,8 @@ TEST(LinuxProcesses, AreFoundByNameTheFirstOne) {
   }
   EXPECT_EQ(tree.host().processes().processNamed("sshd"), 77);
   EXPECT_EQ(tree.host().processes().processNamed("ssh"), 0);
-  tree.host().processes().sendSignal(SIGHUP, 77);
-  EXPECT_THAT(tree.lastTold(), HasSubstr("a tree of files has no processes"));
+  tree.host().processes().sendSignal(SIGCONT, 77);
+  EXPECT_THAT(tree.lastEffect(), FailedFor("a tree of files has no processes"));
 }
 
 }  // namespace

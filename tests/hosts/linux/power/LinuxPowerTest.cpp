@@ -3,6 +3,7 @@
 #include <gmock/gmock.h>
 
 #include "hosts/linux/power/PowerTree.h"
+#include "platform/PowerControllerContract.h"
 #include "platform/PowerSettingsContract.h"
 
 namespace tavisk {
@@ -237,6 +238,15 @@ TEST(LinuxPower, WithoutServicesSaysWhatLasts) {
   EXPECT_EQ(tree.set(SleepTimer::hardDisk, {10}).note, "no device manager runs here: lasts until the restart");
 }
 
+struct LinuxController {
+  static constexpr const char* className = "VelmarKCS";
+  PowerController& service() { return tree.delays(); }
+  void refuseDelays() { tree.controllerLink.delayRefusal = 0xC0; }
+  const std::vector<Effect>& effects() { return tree.log.effects; }
+  PowerTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, PowerControllerContract, LinuxController);
+
 /// Sets units through the whole conversation; the first status that is not 0.
 ControllerStatus setDelay(PowerTree& tree, std::uint8_t units) {
   PropertyList::Dictionary properties;
@@ -251,7 +261,6 @@ std::optional<std::int64_t> delayOf(PowerTree& tree) {
 
 TEST(LinuxPowerController, KeepsTheDelayInTheController) {
   PowerTree tree;
-  EXPECT_FALSE(tree.delays().serviceOfClass("VelmarPMU"));
   EXPECT_EQ(setDelay(tree, 255), 0);
   EXPECT_EQ(tree.controllerLink.delay, (std::vector<std::uint8_t>{0x1D, 0xE2})) << "7650 seconds, high byte first";
   EXPECT_EQ(delayOf(tree), 255);
