@@ -53,8 +53,8 @@ Result<void> FolderWriter::writeFile(const std::string& name, std::string_view c
   removeLeftovers();
   const auto temporary = makeTemporary();
   if (!temporary) return temporary.failure();
-  if (const auto filled = fill(*temporary, name, contents, modeWhenNew); !filled) return filled;
-  if (const auto placed = putInPlace(*temporary, name, contents); !placed) return placed;
+  if (auto filled = fill(*temporary, name, contents, modeWhenNew); !filled) return filled;
+  if (auto placed = putInPlace(*temporary, name, contents); !placed) return placed;
   return syncFolder();
 }
 
@@ -112,8 +112,8 @@ Result<FolderWriter::Temporary> FolderWriter::makeTemporary() {
 
 Result<void> FolderWriter::fill(const Temporary& temporary, const std::string& name, std::string_view contents,
                                 unsigned modeWhenNew) {
-  if (const auto taken = takeOver(temporary.file, name, modeWhenNew); !taken) return taken;
-  if (const auto written = writeAll(temporary.file, contents, _path); !written) return written;
+  if (auto taken = takeOver(temporary.file, name, modeWhenNew); !taken) return taken;
+  if (auto written = writeAll(temporary.file, contents, _path); !written) return written;
   if (::fsync(temporary.file.number()) != 0) return failure("flush");
   return {};
 }
@@ -154,7 +154,7 @@ Result<void> FolderWriter::putInPlace(const Temporary& temporary, const std::str
 Result<void> FolderWriter::rewrite(const std::string& name, std::string_view contents) {
   const auto file = openNamed(_folder, name, O_WRONLY | O_NOFOLLOW | O_NONBLOCK);
   if (!file) return retold(file.failure(), "open", _path);
-  if (const auto written = writeAll(*file, contents, _path); !written) return written;
+  if (auto written = writeAll(*file, contents, _path); !written) return written;
   if (::ftruncate(file->number(), static_cast<off_t>(contents.size())) != 0) return failure("cut");
   if (::fsync(file->number()) != 0) return failure("flush");
   return {};

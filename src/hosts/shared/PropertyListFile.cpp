@@ -29,7 +29,7 @@ Result<std::optional<PropertyList::Dictionary>> PropertyListFile::read() const {
 Result<void> PropertyListFile::write(const PropertyList::Dictionary& contents) const {
   const auto written = writePropertyList(contents);
   if (!written) return retold(written.failure(), written.failure().tried, _path);
-  if (const auto kept = keepDamaged(); !kept) return kept;
+  if (auto kept = keepDamaged(); !kept) return kept;
   return _root.write(_path, *written);
 }
 

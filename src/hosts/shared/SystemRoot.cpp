@@ -161,7 +161,7 @@ Result<void> SystemRoot::makeFolders(const std::string& path) const {
 }
 
 Result<void> SystemRoot::write(const std::string& path, std::string_view contents, unsigned modeWhenNew) const {
-  if (const auto made = makePrefix(path); !made) return made;
+  if (auto made = makePrefix(path); !made) return made;
   const auto resolved = standardized(path);
   if (!resolved) return resolved.failure();
   const auto place = placeOf(*resolved);
