@@ -40,7 +40,7 @@ std::string canonicalSubtag(const std::string& subtag) {
 }  // namespace
 
 std::string canonicalLocaleIdentifier(std::string_view language) {
-  const auto name =
+  const auto* name =
       std::ranges::find_if(languageNames, [&](const auto& row) { return row.first == lowerCased(language); });
   if (name != languageNames.end()) return name->second;
   const auto subtags = split(language.substr(0, language.find_first_of(".@")), "-_");

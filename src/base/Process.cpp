@@ -79,7 +79,7 @@ SignalWaiter::SignalWaiter(const EndingSignals& signals, End end, Status status)
     : _signals(signals.set()), _end(std::move(end)), _status(std::move(status)), _thread([this] { wait(); }) {}
 
 SignalWaiter::~SignalWaiter() {
-  State expected = State::waiting;
+  auto expected = State::waiting;
   if (_state.compare_exchange_strong(expected, State::stopped)) pthread_kill(_thread.native_handle(), SIGINT);
   _thread.join();
 }
@@ -90,7 +90,7 @@ void SignalWaiter::wait() {
   pthread_sigmask(SIG_BLOCK, &all, nullptr);
   int signal = 0;
   sigwait(&_signals, &signal);
-  State expected = State::waiting;
+  auto expected = State::waiting;
   if (_state.compare_exchange_strong(expected, State::ending)) endProcess(std::string("SIG") + sigabbrev_np(signal));
 }
 

@@ -138,7 +138,7 @@ PropertyList::Date dateOf(pugi::xml_node element) {
   const std::chrono::seconds second(field(17, 2));
   const bool isTime = hour.count() < 24 && minute.count() < 60 && second.count() < 60;
   if (date.year() == std::chrono::year(0) || !date.ok() || !isTime) throw notADate;
-  const std::chrono::sys_seconds moment = std::chrono::sys_days(date) + hour + minute + second;
+  const auto moment = std::chrono::sys_days(date) + hour + minute + second;
   return {moment.time_since_epoch().count()};
 }
 

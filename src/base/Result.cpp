@@ -7,7 +7,7 @@
 namespace tavisk {
 
 std::string describe(const Failure& failure) {
-  const std::string where = failure.on.empty() ? "" : " on " + failure.on;
+  const auto where = failure.on.empty() ? "" : " on " + failure.on;
   return escaped(failure.tried + where + ": " + failure.why);
 }
 

@@ -16,7 +16,7 @@ void FoundSystems::store(const std::string& path, SDDiskRef system) {
 SDDiskRef FoundSystems::remove(const std::string& path) {
   const auto found = _byPath.find(path);
   if (found == _byPath.end()) return nullptr;
-  const Entry entry = std::move(*found->second);
+  const auto entry = std::move(*found->second);
   _entries.erase(found->second);
   _byPath.erase(found);
   auto& paths = _pathsOfDisk[entry.disk];

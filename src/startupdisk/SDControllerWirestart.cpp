@@ -38,7 +38,7 @@ void SDController::addWirestartImage(const SDRecordRef& image) {
 void SDController::removeWirestartImageWithIdentifier(const std::optional<std::string>& identifier) {
   if (!identifier) return;
   const auto image = _removeImage(*identifier);
-  const std::any object = image ? std::any(image) : std::any();
+  const auto object = image ? std::any(image) : std::any();
   _post(sdnotification::systemDidDissappear, object);
   _post(sdnotification::wirestartVolumeDidDissappear, object);
 }

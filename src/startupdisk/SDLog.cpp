@@ -49,7 +49,7 @@ std::string formatMessage(std::string_view format, std::initializer_list<Message
   const auto* value = values.begin();
   for (auto percent = format.find('%'); percent != std::string_view::npos; percent = format.find('%')) {
     const auto conversion = format.find_first_of(conversions, percent);
-    const MessageValue next = value == values.end() ? MessageValue(std::nullopt) : *value++;
+    const auto next = value == values.end() ? MessageValue(std::nullopt) : *value++;
     message += format.substr(0, percent);
     message += format[conversion] == 'x' ? next.asHexadecimal() : next.asText();
     format.remove_prefix(conversion + 1);

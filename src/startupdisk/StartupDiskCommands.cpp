@@ -78,7 +78,7 @@ void ServerCommands::setStartupDisk(const std::string& disk) {
 }
 
 std::vector<std::string> ServerCommands::knownStartupDisks() const {
-  const SDController* controller = _startupDisk ? _startupDisk->madeController() : nullptr;
+  const auto* controller = _startupDisk ? _startupDisk->madeController() : nullptr;
   std::vector<std::string> names;
   if (!controller) return names;
   for (const auto& system : controller->systems()) {

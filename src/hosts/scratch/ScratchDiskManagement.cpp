@@ -121,7 +121,7 @@ ServiceStatus ScratchDiskManagement::setFirmwareVariable(const std::string& name
 template <typename Value>
 ServiceStatus ScratchDiskManagement::change(const MachineSetting<Value>& setting, const Value& asked,
                                             const char* statusKey) {
-  ServiceStatus status = failed;  // what a refusal leaves
+  auto status = failed;  // what a refusal leaves
   auto parts = _settings.parts(setting);
   parts.store = [&, write = parts.store](const Value& value) -> Result<void> {
     const auto answer = static_cast<ServiceStatus>(_machine.section(section).integer(statusKey));

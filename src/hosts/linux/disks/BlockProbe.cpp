@@ -112,7 +112,7 @@ Result<PartitionTable> probePartitionTable(const SystemRoot& root, const std::st
   };
   if (const int error = errorOf(isListed, noTable); error != 0) return systemFailure("read", node, error);
   PartitionTable result;
-  const auto table = !list ? nullptr : ::blkid_partlist_get_table(list);
+  auto* table = !list ? nullptr : ::blkid_partlist_get_table(list);
   if (!table) return result;
   result.type = textOrNone(::blkid_parttable_get_type(table));
   result.uuid = textOrNone(::blkid_parttable_get_id(table));

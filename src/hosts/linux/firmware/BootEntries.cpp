@@ -51,7 +51,7 @@ Result<std::vector<BootEntry>> BootEntries::all() const {
 Result<std::vector<std::uint16_t>> BootEntries::order() const {
   const auto bytes = _variables.read(orderVariable());
   if (!bytes) return bytes.failure();
-  std::string_view rest = *bytes ? **bytes : std::string_view();
+  auto rest = *bytes ? **bytes : std::string_view();
   std::vector<std::uint16_t> order;
   while (const auto number = takeNumber(rest, numberSize)) order.push_back(static_cast<std::uint16_t>(*number));
   if (!rest.empty()) return Failure{"read", EfiVariables::pathOf(orderVariable()), "an order of half numbers"};
@@ -71,7 +71,7 @@ Result<std::optional<BootEntry>> BootEntries::first() const {
 Result<std::optional<BootEntry>> BootEntries::onlyNext() const {
   const auto bytes = _variables.read({"BootNext"});
   if (!bytes) return bytes.failure();
-  std::string_view rest = *bytes ? **bytes : std::string_view();
+  auto rest = *bytes ? **bytes : std::string_view();
   const auto number = takeNumber(rest, numberSize);
   if (!number) return std::nullopt;
   return read(static_cast<std::uint16_t>(*number));

@@ -47,7 +47,7 @@ std::string unquoted(std::string_view text) {
 
 std::string assignment(std::string_view variable, std::string_view value) {
   auto line = std::string(variable) + "=\"";
-  for (char c : value) {
+  for (const char c : value) {
     if (escapedInQuotes.find(c) != std::string_view::npos) line += '\\';
     line += c;
   }
