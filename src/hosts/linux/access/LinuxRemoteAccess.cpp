@@ -17,7 +17,6 @@ namespace {
 constexpr const char* sshProgram = "/usr/sbin/sshd";
 constexpr const char* sshFolder = "/etc/ssh";
 constexpr const char* sshConfig = "/etc/ssh/sshd_config";
-constexpr std::size_t sshConfigLimit = std::size_t{1} << 20U;
 // The sessions of the server are processes of the same name: its own is in the file.
 constexpr const char* sshProcessFile = "/run/sshd.pid";
 constexpr const char* keyMaker = "/usr/bin/ssh-keygen";
@@ -40,7 +39,7 @@ bool namesHostKeys(const SystemRoot& root) {
     const auto words = split(line, " \t\r=\"");
     return !words.empty() && lowerCased(words.front()) == "hostkey";
   };
-  return std::ranges::any_of(configurationLines(root.read(sshConfig, sshConfigLimit).valueOr("")), names);
+  return std::ranges::any_of(configurationLines(root.read(sshConfig, configurationLimit).valueOr("")), names);
 }
 
 }  // namespace

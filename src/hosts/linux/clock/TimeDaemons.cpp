@@ -14,7 +14,6 @@
 namespace tavisk {
 namespace {
 
-constexpr std::size_t fileLimit = std::size_t{1} << 20U;
 constexpr const char* chronyConfig = "/etc/chrony/chrony.conf";
 constexpr const char* ntpsecConfig = "/etc/ntpsec/ntp.conf";
 constexpr const char* openntpdConfig = "/etc/openntpd/ntpd.conf";
@@ -24,7 +23,7 @@ constexpr std::string_view commentSigns = "#%;!";
 /// The lines of a file as words: chrony.conf(5) and ntp.conf(5) agree on comments and on one directive a line.
 std::vector<std::vector<std::string>> directives(const SystemRoot& root, const std::string& file) {
   std::vector<std::vector<std::string>> found;
-  for (const auto& line : configurationLines(root.read(file, fileLimit).valueOr(""), commentSigns)) {
+  for (const auto& line : configurationLines(root.read(file, configurationLimit).valueOr(""), commentSigns)) {
     auto words = split(line, " \t\r");
     words[0] = lowerCased(words[0]);
     found.push_back(std::move(words));

@@ -19,7 +19,6 @@
 namespace tavisk {
 namespace {
 
-constexpr std::size_t fileLimit = std::size_t{1} << 20U;
 constexpr std::size_t hostsLimit = std::size_t{4} << 20U;
 constexpr const char* prettyName = "PRETTY_HOSTNAME";
 constexpr const char* kernelNameFile = "/proc/sys/kernel/hostname";
@@ -29,7 +28,7 @@ constexpr const char* cloudConfig = "/etc/cloud/cloud.cfg";
 constexpr const char* cloudConfigFolder = "/etc/cloud/cloud.cfg.d";
 constexpr const char* responderConfig = "/etc/avahi/avahi-daemon.conf";
 
-Result<std::string> readIfThere(const SystemRoot& root, const char* file, std::size_t limit = fileLimit) {
+Result<std::string> readIfThere(const SystemRoot& root, const char* file, std::size_t limit = configurationLimit) {
   if (!root.exists(file)) return std::string();
   return root.read(file, limit);
 }
@@ -92,7 +91,7 @@ std::optional<bool> hostNamePreservedIn(const std::string& text) {
 bool preservesHostName(const SystemRoot& root) {
   bool isPreserved = false;
   for (const auto& file : cloudConfigFiles(root))
-    isPreserved = hostNamePreservedIn(root.read(file, fileLimit).valueOr("")).value_or(isPreserved);
+    isPreserved = hostNamePreservedIn(root.read(file, configurationLimit).valueOr("")).value_or(isPreserved);
   return isPreserved;
 }
 
@@ -128,7 +127,7 @@ Result<void> setStaticHostName(const SystemRoot& root, const std::string& name) 
 }
 
 Result<std::optional<std::string>> kernelHostName(const SystemRoot& root) {
-  const auto text = root.read(kernelNameFile, fileLimit);
+  const auto text = root.read(kernelNameFile, configurationLimit);
   if (!text) return text.failure();
   const auto lines = split(*text, "\n");
   if (lines.empty() || lines.front() == kernelWithoutName) return std::optional<std::string>();
@@ -163,7 +162,7 @@ std::string hostsWithName(std::string_view hosts, const std::string& before, con
 std::string whoUndoesHostName(const SystemRoot& root, const std::string& name) {
   std::string owners;
   if (isOwnedByCloud(root)) owners = "cloud-init (/etc/cloud has no \"preserve_hostname: true\")";
-  const auto announced = assignments(root.read(responderConfig, fileLimit).valueOr(""), "server", "host-name");
+  const auto announced = assignments(root.read(responderConfig, configurationLimit).valueOr(""), "server", "host-name");
   if (!announced.empty() && compareIgnoringCase(announced.back(), firstLabel(name)) != 0)
     owners += std::string(owners.empty() ? "" : ", ") + responderConfig + " (host-name=" + announced.back() + ")";
   return owners;

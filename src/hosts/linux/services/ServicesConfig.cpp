@@ -10,7 +10,6 @@
 namespace tavisk {
 namespace {
 
-constexpr std::size_t fileLimit = std::size_t{1} << 20U;
 constexpr std::size_t longestUnitName = 255;
 
 // systemd.special(7): starting or stopping these changes the state of the whole machine.
@@ -58,7 +57,7 @@ std::vector<std::string> wordsOf(const std::string& text, std::string_view purpo
 
 Result<std::vector<std::string>> configuredUnits(const SystemRoot& root, std::string_view purpose) {
   if (!root.exists(servicesConfig)) return std::vector<std::string>();
-  const auto text = root.read(servicesConfig, fileLimit);
+  const auto text = root.read(servicesConfig, configurationLimit);
   if (!text) return text.failure();
   auto units = wordsOf(*text, purpose);
   for (const auto& unit : units) {

@@ -2,12 +2,16 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstddef>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
 
 namespace tavisk {
+
+/// What is read of a configuration file; a larger one is a failure.
+inline constexpr std::size_t configurationLimit = std::size_t{1} << 20U;
 
 /// The lines of a configuration that say something, trimmed: not the empty ones, nor those that begin with one of the
 /// comment signs.

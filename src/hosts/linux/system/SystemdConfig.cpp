@@ -11,7 +11,6 @@ namespace tavisk {
 namespace {
 
 constexpr const char* folders[] = {"/etc/systemd/", "/run/systemd/", "/usr/local/lib/systemd/", "/usr/lib/systemd/"};
-constexpr std::size_t fileLimit = std::size_t{1} << 20U;
 
 /// A line that ends in a backslash goes on in the next one, with a space between.
 std::vector<std::string> logicalLines(std::string_view text) {
@@ -78,7 +77,7 @@ std::vector<std::string> SystemdConfig::files() const {
 std::vector<std::string> SystemdConfig::words(std::string_view section, std::string_view key) const {
   std::vector<std::string> words;
   for (const auto& file : files()) {
-    for (const auto& value : assignments(_root.read(file, fileLimit).valueOr(""), section, key)) {
+    for (const auto& value : assignments(_root.read(file, configurationLimit).valueOr(""), section, key)) {
       const auto added = split(value, " \t");
       if (added.empty()) words.clear();
       words.insert(words.end(), added.begin(), added.end());
@@ -90,7 +89,8 @@ std::vector<std::string> SystemdConfig::words(std::string_view section, std::str
 std::optional<SystemdConfig::Assignment> SystemdConfig::last(std::string_view section, std::string_view key) const {
   std::optional<Assignment> last;
   for (const auto& file : files())
-    for (const auto& value : assignments(_root.read(file, fileLimit).valueOr(""), section, key)) last = {file, value};
+    for (const auto& value : assignments(_root.read(file, configurationLimit).valueOr(""), section, key))
+      last = {file, value};
   return last && !last->value.empty() ? last : std::nullopt;
 }
 
@@ -98,7 +98,7 @@ std::string SystemdConfig::whatHides(std::string_view section, const std::vector
   const auto ownName = baseName(ownDropIn());
   for (const auto& file : files()) {
     const bool isLater = file.find(".conf.d/") != std::string::npos && baseName(file) > ownName;
-    const auto text = isLater ? _root.read(file, fileLimit).valueOr("") : "";
+    const auto text = isLater ? _root.read(file, configurationLimit).valueOr("") : "";
     for (const auto& key : keys)
       if (!assignments(text, section, key).empty()) return file;
   }
@@ -107,7 +107,7 @@ std::string SystemdConfig::whatHides(std::string_view section, const std::vector
 
 Result<void> SystemdConfig::setOwn(const std::string& section, const std::map<std::string, std::string>& values) const {
   auto merged = values;
-  for (const auto& [key, value] : allAssignments(_root.read(ownDropIn(), fileLimit).valueOr(""), section))
+  for (const auto& [key, value] : allAssignments(_root.read(ownDropIn(), configurationLimit).valueOr(""), section))
     merged.emplace(key, value);
   auto text = ownfile::header + ("[" + section + "]\n");
   for (const auto& [key, value] : merged) text += std::string(key).append("=").append(value).append("\n");
