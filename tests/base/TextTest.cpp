@@ -4,10 +4,15 @@
 
 #include <limits>
 
+#include "base/DnsName.h"
+#include "base/Json.h"
+#include "base/Locale.h"
 #include "base/Text.h"
 
 namespace tavisk {
 namespace {
+
+using namespace std::string_literals;
 
 TEST(Text, tellsUtf8FromOtherBytes) {
   for (const char* text : {"", "a", "\x7F", "\u00E9", "\uD7FF", "\uE000", "\uFFFF", "\U00010000", "\U0010FFFF"}) {
@@ -83,6 +88,58 @@ TEST(Text, decodesByTheByteOrderMark) {
       {"\xFE\xFF\xD8\x3D\x20\xAC\xDE\x01\x41", "\uFFFD\u20ac\uFFFD"},
   };
   for (const auto& [bytes, text] : cases) EXPECT_EQ(decodedText(bytes), text);
+}
+
+TEST(Json, escapesTexts) {
+  const std::pair<std::string, const char*> cases[] = {
+      {"", R"("")"},
+      {"\"\\/", R"("\"\\/")"},
+      {"\b\f\n\r\t", R"("\b\f\n\r\t")"},
+      {std::string("\0\x1B\x7F", 3), R"("\u0000\u001b\u007f")"},
+      {"\u009B\u202E", R"("\u009b\u202e")"},
+      {"\u00E9\U0001F600", "\"\u00E9\U0001F600\""},
+      {"a\xFF\xE2\x82z", "\"a\uFFFD\uFFFD\uFFFDz\""},
+  };
+  for (const auto& [text, expected] : cases) {
+    EXPECT_EQ(JsonObject().text("", text).str(), "{\"\":" + std::string(expected) + "}");
+  }
+}
+
+TEST(Locale, MakesIdentifiersRegular) {
+  const std::pair<const char*, const char*> cases[] = {
+      {"en", "en"},
+      {"English", "en"},
+      {"JAPANESE", "ja"},
+      {"EN-us", "en_US"},
+      {"de_AT.UTF-8", "de_AT"},
+      {"sr@latin", "sr"},
+      {"zh-hant-tw", "zh-Hant_TW"},
+      {"es-419", "es_419"},
+      {"C", "C"},
+      {"", ""},
+      {"Klingonese", "Klingonese"},
+  };
+  for (const auto& [language, identifier] : cases) EXPECT_EQ(canonicalLocaleIdentifier(language), identifier);
+}
+
+TEST(DnsName, isMadeOfLabels) {
+  const std::string label(63, 'a');
+  const std::string longest = label + "." + label + "." + label + "." + std::string(61, 'a');
+  for (const auto& name : {"a"s, "A-1"s, "10.example"s, label, longest}) EXPECT_TRUE(isDnsName(name)) << name;
+  for (const auto& name : {""s, "."s, "a."s, ".a"s, "a..b"s, "-a"s, "a-"s, "a.-b"s, "a-.b"s, "a_b"s, "a b"s, "zürich"s,
+                           "a\n"s, "a\0"s, label + "a", longest + "a"})
+    EXPECT_FALSE(isDnsName(name)) << name;
+}
+
+TEST(HostName, isOneWordThatNamesAHost) {
+  const std::string label(63, 'a');
+  const std::string longest = label + "." + label + "." + label + "." + std::string(61, 'b');
+  for (const auto& name :
+       {"time.example"s, "a"s, "x_1.example."s, label, longest, "192.0.2.7"s, "::1"s, "2001:db8::7"s})
+    EXPECT_TRUE(isHostNameOrAddress(name)) << name;
+  for (const auto& text : {""s, "."s, "a..b"s, "-a"s, "a b"s, "a\nserver b"s, "a#b"s, label + "a", "::1\n"s, "\0"s,
+                           "::1\0x"s, longest + "b"})
+    EXPECT_FALSE(isHostNameOrAddress(text)) << text;
 }
 
 }  // namespace

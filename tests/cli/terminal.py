@@ -31,7 +31,7 @@ class Terminal:
         fcntl.ioctl(self.end, termios.TIOCSWINSZ, struct.pack("HHHH", rows, columns, 0, 0))
 
     def type(self, text):
-        os.write(self.end, text if isinstance(text, bytes) else text.encode())
+        os.write(self.end, text.encode(errors="surrogateescape"))
 
     def wait_for(self, text):
         """Everything shown since the last wait, up to the text."""
@@ -39,13 +39,9 @@ class Terminal:
         while text not in self.seen:
             if not select.select([self.end], [], [], max(0, deadline - time.monotonic()))[0]:
                 raise AssertionError(f"{text!r} did not come, only {self.seen!r}")
-            self.seen += self.read()
+            self.seen += os.read(self.end, 4096).decode(errors="surrogateescape")
         shown, _, self.seen = self.seen.partition(text)
         return (shown + text).replace("\r\n", "\n")
-
-    def read(self):
-        piece = os.read(self.end, 4096)
-        return piece.decode(errors="surrogateescape")
 
     def status(self):
         return self.process.wait(PATIENCE)

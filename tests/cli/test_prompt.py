@@ -15,23 +15,13 @@ UP, LEFT, HOME = "\x1b[A", "\x1b[D", "\x01"
 ENDED = "\r\n> "
 
 
-def volume(name):
-    return {"Volume Name": name, "Mount Point": f"/Volumes/{name}"}
-
-
 class AtThePrompt(unittest.TestCase):
     def setUp(self):
         zones = ["Europe/Madrid", "Europe/Malta", "Asia/Tokyo", "UTC"]
         clock = {"Time": 1173258303, "Known Time Zones": zones}
         self.machine = ScratchMachine(PROGRAM, {"Clock": clock, "Remote Shell": {"Enabled": True}})
         self.addCleanup(self.machine.__exit__)
-        for name in ("Main", "Backup"):
-            self.machine.file(f"/Volumes/{name}{FOLDER}/boot.efi")
-            self.machine.file(f"/Volumes/{name}/mach_kernel")
-        self.open()
-
-    def open(self, **environment):
-        self.terminal = Terminal(self.machine, TERM="xterm", **environment)
+        self.terminal = Terminal(self.machine, TERM="xterm")
         self.addCleanup(self.terminal.close)
         self.terminal.wait_for("help.\r\n")
         self.terminal.wait_for("> ")
@@ -40,7 +30,13 @@ class AtThePrompt(unittest.TestCase):
         """What a line is answered, from the end of the line to the next prompt."""
         self.terminal.type(keys + "\n")
         self.terminal.wait_for("\r\n")
-        return self.terminal.wait_for("> ").removesuffix("\n> ")
+        return self.terminal.wait_for("> ").removesuffix("> ").removesuffix("\n")
+
+    def exchange(self, *typed_and_shown):
+        for typed, shown in typed_and_shown:
+            with self.subTest(typed):
+                self.terminal.type(typed)
+                self.terminal.wait_for(shown)
 
     def status(self):
         status = self.terminal.status()
@@ -62,24 +58,14 @@ class AtThePrompt(unittest.TestCase):
             ("", ""),
         ):
             with self.subTest(keys):
-                self.terminal.type(keys.encode(errors="surrogateescape") + b"\n")
-                self.terminal.wait_for("\r\n")
-                self.assertEqual(self.terminal.wait_for("> ").removesuffix("> ").removesuffix("\n"), expected)
+                self.assertEqual(self.answer(keys), expected)
 
     def test_history_has_commands_and_no_answers(self):
         self.answer("getdate")
-        self.terminal.type("setremotelogin off\n")
-        self.terminal.wait_for("(yes/no)? ")
-        self.terminal.type("perhaps\n")
-        self.terminal.wait_for("(yes/no)? ")
-        self.terminal.type("NO\n")
-        self.terminal.wait_for(ENDED)
+        self.exchange(("setremotelogin off\n", "(yes/no)? "), ("perhaps\n", "(yes/no)? "), ("NO\n", ENDED))
         self.answer("  ")
         self.assertEqual(self.answer(UP * 2), "Date: 3/7/2007")
-        self.terminal.type(UP * 2 + "\n")
-        self.terminal.wait_for("(yes/no)? ")
-        self.terminal.type("yes\n")
-        self.terminal.wait_for(ENDED)
+        self.exchange((UP * 2 + "\n", "(yes/no)? "), ("yes\n", ENDED))
         self.assertFalse(self.machine.read()["Remote Shell"]["Enabled"])
 
     def test_lines_typed_ahead_of_a_question_answer_it(self):
@@ -89,7 +75,7 @@ class AtThePrompt(unittest.TestCase):
         self.assertEqual(os.read(self.terminal.other_end, 80), b"for the shell\n")
 
     def test_tab_completes_words_and_values(self):
-        for keys, expected in (
+        self.exchange(*((keys + "\n", "\r\n" + expected + ENDED) for keys, expected in (
             ("GETDA\t", "Date: 3/7/2007"),
             ("-printc\t\x15-versi\t", "tavisk, Version 1.4a1\r\nCopyright 2026 The tavisk developers"),
             ("-setwakeonmodem of\t-gettimez\t", "Time Zone: UTC"),
@@ -97,42 +83,27 @@ class AtThePrompt(unittest.TestCase):
             ("settimezone as\t\t", "Set TimeZone: Asia/Tokyo"),
             ("setdate -gettimez\t", "setdate: Error: -gettimez is invalid date format... use mm:dd:yy"),
             ("-bogus getda\t", "Error: -bogus is not a valid command"),
-        ):
-            with self.subTest(keys):
-                self.terminal.type(keys + "\n")
-                self.terminal.wait_for("\r\n" + expected + ENDED)
+        )))
 
     def test_tab_lists_what_it_cannot_choose_among(self):
-        self.terminal.type("settimezone \t")
-        self.terminal.wait_for("\r\nAsia/  Europe/  UTC\r\n")
-        self.terminal.wait_for("> settimezone ")
-        self.terminal.type("europe/\t\t")
-        self.terminal.wait_for("\r\nEurope/Madrid  Europe/Malta\r\n")
-        self.terminal.wait_for("> settimezone Europe/Ma")
+        self.exchange(("settimezone \t", "\r\nAsia/  Europe/  UTC\r\n"), ("", "> settimezone "),
+                      ("europe/\t\t", "\r\nEurope/Madrid  Europe/Malta\r\n"), ("", "> settimezone Europe/Ma"))
         self.assertEqual(self.answer("lt\t"), "Set TimeZone: Europe/Malta")
 
     def test_tab_knows_the_startup_disks_that_a_command_found_and_looks_for_none(self):
-        self.machine.change({"Disks": {"disk0s1": volume("Main"), "disk1s1": volume("Two Words")}})
+        disks = {f"disk{number}s1": {"Volume Name": name, "Mount Point": f"/Volumes/{name}"}
+                 for number, name in enumerate(("Main", "Two Words"))}
+        self.machine.change({"Disks": disks})
         main = f"/Volumes/Main{FOLDER}"
-        for keys, expected in (
-            ("setstartupdisk m\t", f"Not a System Folder: /Volumes/m{FOLDER}"),
-            ("setstartupdisk m\t", f"Set Startup Disk to Path: {main}"),
-            (f"setstartupdisk {main[:10]}\t", f"Set Startup Disk to Path: {main}"),
-        ):
-            self.terminal.type(keys + "\n")
-            self.terminal.wait_for("\r\n" + expected + ENDED)
-
-    def test_a_volume_plugged_in_at_the_prompt_is_listed(self):
-        self.machine.change({"Disks": {"disk0s1": volume("Main")}})
-        self.assertEqual(self.answer("liststartupdisks"), f"/Volumes/Main{FOLDER}")
-        self.machine.change({"Disks": {"disk1s1": volume("Backup")}})
-        self.answer("getdate")
-        self.assertEqual(self.answer("liststartupdisks"), f"/Volumes/Main{FOLDER}\n/Volumes/Backup{FOLDER}")
+        self.machine.file(f"{main}/boot.efi")
+        self.machine.file(f"{main}/mach_kernel")
+        chosen = f"\r\nSet Startup Disk to Path: {main}{ENDED}"
+        self.exchange(("setstartupdisk m\t\n", f"\r\nNot a System Folder: /Volumes/m{FOLDER}{ENDED}"),
+                      ("setstartupdisk m\t\n", chosen), (f"setstartupdisk {main[:10]}\t\n", chosen))
 
     def test_a_failure_meanwhile_is_told_below_the_line(self):
         self.answer("liststartupdisks")
-        self.terminal.type("getd")
-        self.terminal.wait_for("getd")
+        self.exchange(("getd", "getd"))
         self.machine.plist.write_bytes(b"<plist>")
         self.terminal.wait_for("\r\ntavisk: ")
         self.terminal.wait_for("\r\n> getd")

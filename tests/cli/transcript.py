@@ -40,19 +40,10 @@ def bytes_of(text):
 class Case:
     def __init__(self, title):
         self.title = title
-        self.description = None
-        self.files = []
-        self.links = []
-        self.environment = {}
-        self.words = None
-        self.typed = b""
-        self.output = b""
-        self.errors = []
-        self.status = 0
-        self.changes = {}
-        self.plists = []
-        self.effects = None
-        self.log = []
+        self.description = self.words = self.effects = None
+        self.files, self.links, self.plists, self.errors, self.log = [], [], [], [], []
+        self.environment, self.changes = {}, {}
+        self.typed, self.output, self.status = b"", b"", 0
 
     def prepare(self, line):
         keyword, _, rest = line.partition(" ")

@@ -22,25 +22,18 @@ inline void PrintTo(const SettingValue& value, std::ostream* out) {
   *out << toJson(value);
 }
 
-/// Remembers what it is told: as values, and in one order a line each: "begins SETTING ASKED", or the JSON of the
-/// effect or value.
+/// Remembers what it is told.
 class EffectLog final : public EffectChannel {
  public:
   void changeBegins(const std::string& setting, const std::string& asked) override {
-    lines.push_back("begins " + setting + " " + asked);
+    begun.push_back(setting + " " + asked);
   }
-  void record(const Effect& effect) override {
-    effects.push_back(effect);
-    lines.push_back(toJson(effect));
-  }
-  void observe(const SettingValue& value) override {
-    values.push_back(value);
-    lines.push_back(toJson(value));
-  }
+  void record(const Effect& effect) override { effects.push_back(effect); }
+  void observe(const SettingValue& value) override { values.push_back(value); }
 
+  std::vector<std::string> begun;  ///< "SETTING ASKED"
   std::vector<Effect> effects;
   std::vector<SettingValue> values;
-  std::vector<std::string> lines;
 };
 
 }  // namespace tavisk

@@ -24,7 +24,7 @@ TEST(EffectSink, tellsEveryChannel) {
   sink.record({.setting = "Time"});
   sink.observe({.setting = "Time", .live = "5"});
   for (const auto* log : {&first, &second}) {
-    EXPECT_EQ(log->lines.front(), "begins Time 5");
+    EXPECT_THAT(log->begun, ElementsAre("Time 5"));
     EXPECT_THAT(log->effects, ElementsAre(Effect{.setting = "Time"}));
     EXPECT_THAT(log->values, ElementsAre(SettingValue{.setting = "Time", .live = "5"}));
   }

@@ -56,5 +56,40 @@ TEST(Dispatch, repeatsAnInvalidCountUntilNobodyListens) {
   }
 }
 
+TEST(Dispatch, needsItsCommandTable) {
+  const std::string untranslated = "Error: Command info could not be translated.\n";
+  const std::pair<std::string_view, std::string> cases[] = {
+      {{}, "Error: Command info could not be found.\n"},
+      {"", untranslated},
+      {"<dict>", untranslated},
+      {"<array/>", untranslated},
+      {"<dict><key>-getdate</key><string>getDate</string></dict>", untranslated},
+      {"<dict><key>-getdate</key><dict><key>selector</key><string>getDate</string></dict></dict>", untranslated},
+  };
+  for (const auto& [table, output] : cases) {
+    ScratchMachine machine;
+    const auto result = runTool(machine, {"-gettimezone"}, {.commandTable = table});
+    EXPECT_EQ(result.output, output);
+    EXPECT_EQ(result.status, 0);
+  }
+}
+
+const std::string banner = "> tavisk\n> type -help for help.\n> ";
+const std::string endOfInput = "Error: fgets returned NULL.\n";
+
+std::string answersTo(std::string_view typed) {
+  MachineInUtc machine;
+  return runTool(machine, {}, {.typed = typed}).output;
+}
+
+TEST(InteractiveMode, takesLongLinesInPieces) {
+  const std::string whole(2040, ' ');
+  const auto line = [&](const std::string& end) { return whole + end + "\n"; };
+  // 2055 bytes with the newline fit; of one more, the newline is a line of its own, and the last character is lost.
+  EXPECT_EQ(answersTo(line("      -getdate")), banner + "Date: 3/7/2007\n> " + endOfInput);
+  EXPECT_EQ(answersTo(line("       -getdate")), banner + "Error: -getdat is not a valid command\n> > " + endOfInput);
+  EXPECT_EQ(answersTo(line("      -getdateXgettime")), banner + "Date: 3/7/2007\n> Time: 21:05:03\n> " + endOfInput);
+}
+
 }  // namespace
 }  // namespace tavisk

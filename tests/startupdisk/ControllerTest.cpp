@@ -2,6 +2,9 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
+#include <cstdlib>
+#include <ctime>
+
 #include "startupdisk/StartupDisk.h"
 #include "startupdisk/StartupDiskTest.h"
 
@@ -50,16 +53,13 @@ TEST(Controller, PassesOverWhatCannotStartTheMachine) {
   const auto scheme = [](int code) { return keys({{"Scheme", code}}); };
   const std::string noDisk = "Disk disk0s2 V can not boot this machine, removing from list.";
   const std::string noDisc = "Optical disc disk0s2 V can not boot this machine, removing from list.";
-  const std::vector<std::string> searched{mounted, "Found " + systemFolder("V") + "/boot.efi",
-                                          "Found " + systemFolder("V") + "/mach_kernel"};
-  const std::vector<std::string> searchedX{mounted, "Found " + systemFolder("V") + "/BootX",
-                                           "Found " + systemFolder("V") + "/mach_kernel"};
+  const std::string ignored = "Disk Image found, and ignored: disk0s2 /Volumes/V";
+  const std::string kernel = "Found " + systemFolder("V") + "/mach_kernel";
+  const std::vector<std::string> searched{mounted, "Found " + systemFolder("V") + "/boot.efi", kernel};
+  const std::vector<std::string> searchedX{mounted, "Found " + systemFolder("V") + "/BootX", kernel};
   const Case cases[] = {
       {"unmounted", 2, keys({{"Mount Point", ""}}), {}},
-      {"disk image",
-       2,
-       keys({{"Protocol", "Disk Image"}}),
-       {mounted, "Disk Image found, and ignored: disk0s2 /Volumes/V"}},
+      {"disk image", 2, keys({{"Protocol", "Disk Image"}}), {mounted, ignored}},
       {"good disc", 2, disc(0, true), searched},
       {"disc of another machine", 2, disc(0, false), {mounted, noDisc}},
       {"unreadable disc", 2, disc(5, true), {mounted, noDisc}},
@@ -79,7 +79,7 @@ TEST(Controller, PassesOverWhatCannotStartTheMachine) {
     machine.addLumaraX("disk1s2", "Network", keys({{"Network", true}}));
     machine.addLumaraX("disk2s2", "Raw", keys({{"Mountable", false}}));
     machine.debug();
-    machine.set("Registry", "Device Tree", keys({{"/", keys({{"compatible", PropertyList::Data()}})}}));
+    machine.haveDeviceTree("");
     machine.controller();
     auto log = machine.systemLog();
     ASSERT_EQ(log.front(), "-[SDController(VolumeEvents) _volumeAppeared:]: disk0s2 V isCDROM: 0 isDVDROM: 0");
@@ -170,8 +170,7 @@ TEST(Controller, ExcludesSystemsThatThisMachineCannotUse) {
     StartupMachine machine;
     machine.set("Kernel", "Model", test.model);
     machine.set("Kernel", "Network Start", test.networkStart);
-    const PropertyList::Data data(test.compatible.begin(), test.compatible.end());
-    machine.set("Registry", "Device Tree", keys({{"/", keys({{"compatible", data}})}}));
+    machine.haveDeviceTree(test.compatible);
     machine.addVolume("disk0s2", "V", keys({{"Mount Point", test.mountPoint}}));
     machine.controller();
     machine.debug();
@@ -180,10 +179,9 @@ TEST(Controller, ExcludesSystemsThatThisMachineCannotUse) {
     system->setObject(test.version, recordkey::systemVersionMajor);
     machine.controller().foundSystemOnVolume(system);
     EXPECT_EQ(machine.listed().size(), test.listed ? 1U : 0U) << test.model << test.networkStart << test.version;
-    const auto log = machine.systemLog();
     if (test.listed) continue;
-    EXPECT_EQ(log.back(), test.version == 9 ? "Lumara 9 System Folder excluded: /folder"
-                                            : "Excluding systems on root volume when Wirestarted.");
+    EXPECT_EQ(machine.systemLog().back(), test.version == 9 ? "Lumara 9 System Folder excluded: /folder"
+                                                            : "Excluding systems on root volume when Wirestarted.");
   }
 }
 
@@ -220,6 +218,39 @@ TEST(Controller, HearsNothingMoreOnceItIsGoneOrUnregistered) {
   machine.addLumaraX("disk1s2", "B");
   machine.runPasses(2);
   EXPECT_THAT(recorder.take(), IsEmpty());
+}
+
+#ifdef NDEBUG
+constexpr int volumes = 10'000;
+constexpr double mostSeconds = 0.5;
+#else
+constexpr int volumes = 1'000;
+constexpr double mostSeconds = 2;  // checked, and perhaps sanitized
+#endif
+
+/// Processor time: other work on the machine does not count, nor does the wait of a controller's creation.
+double secondsOf(const std::function<void()>& work) {
+  const auto start = std::clock();
+  work();
+  return static_cast<double>(std::clock() - start) / CLOCKS_PER_SEC;
+}
+
+TEST(Controller, ListsAndDropsThousandsOfVolumesAtOnce) {
+  // Thousands of folders are made soonest in memory.
+  if (std::filesystem::is_directory("/dev/shm")) setenv("TMPDIR", "/dev/shm", 1);
+  StartupMachine machine;
+  Keys disks;
+  for (int number = 0; number < volumes; ++number) {
+    const auto mountPoint = "/Volumes/V" + std::to_string(number);
+    disks.set("disk" + std::to_string(number) + "s2", keys({{"Mount Point", mountPoint}}));
+    machine.installLumaraX(mountPoint);
+  }
+  machine.describe(*writePropertyList(keys({{"Disks", disks}})));
+  machine.environment();
+  EXPECT_LT(secondsOf([&] { EXPECT_EQ(machine.listed().size(), volumes); }), mostSeconds);
+  machine.describe(*writePropertyList(Keys()));
+  EXPECT_LT(secondsOf([&] { machine.runPasses(1); }), mostSeconds);
+  EXPECT_TRUE(machine.listed().empty());
 }
 
 }  // namespace

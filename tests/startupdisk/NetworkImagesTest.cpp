@@ -145,19 +145,13 @@ TEST(Firmware, TakesAMachineForCompatibleUnlessTheTreeSaysOtherwise) {
     std::vector<std::string> log;
   };
   const auto tree = [](const std::string& bytes) {
-    return [=](StartupMachine& machine) {
-      const PropertyList::Data data(bytes.begin(), bytes.end());
-      machine.set("Registry", "Device Tree", keys({{"/", keys({{"compatible", data}})}}));
-    };
+    return [=](StartupMachine& machine) { machine.haveDeviceTree(bytes); };
   };
+  const auto emptyTree = [](StartupMachine& machine) { machine.set("Registry", "Device Tree", keys({{"/", Keys()}})); };
   const Case cases[] = {
       {[](auto& machine) { machine.set("Registry", "Master Port Status", 5); }, true, {"IOMasterPort() returned 5"}},
       {[](auto&) {}, true, {"IORegistryEntryFromPath() returned nil"}},
-      {[](auto& machine) {
-         machine.set("Registry", "Device Tree", keys({{"/", Keys()}}));
-       },
-       true,
-       {"IORegistryEntryCreateCFProperty() returned nil"}},
+      {emptyTree, true, {"IORegistryEntryCreateCFProperty() returned nil"}},
       {tree(std::string("A\0HalbRISC\0", 11)), true, {}},
       {tree(std::string("A\0HalbRISC", 10)), false, {}},
       {tree(std::string("halbrisc\0HalbRISC2\0", 19)), false, {}},
@@ -174,19 +168,17 @@ TEST(Firmware, TakesAMachineForCompatibleUnlessTheTreeSaysOtherwise) {
 
 TEST(Firmware, KnowsOnlyInterfacesThatCanStartTheMachine) {
   StartupMachine machine;
-  const auto at = [](const char* path, const Keys& other) {
-    Keys values = keys({{"Path", path}});
-    for (const auto& [key, value] : other) values.set(key, value);
-    return values;
+  const auto at = [](const char* path, const char* key, const PropertyList& value) {
+    return keys({{"Path", path}, {key, value}});
   };
   machine.set("Registry", "Interfaces",
-              keys({{"lo0", at("/lo", keys({{"Loopback", true}}))},
-                    {"en0", at("/a", {})},
-                    {"en1", at("/down", keys({{"Up", false}}))},
-                    {"en2", at("/six", keys({{"IPv4", false}}))},
-                    {"en3", at("/a", {})},
-                    {"en4", at("/x", keys({{"Parent Status", 0x1A}}))},
-                    {"en5", at("/y", keys({{"Path Status", std::int64_t{0xE00002F0}}}))}}));
+              keys({{"lo0", at("/lo", "Loopback", true)},
+                    {"en0", at("/a", "Up", true)},
+                    {"en1", at("/down", "Up", false)},
+                    {"en2", at("/six", "IPv4", false)},
+                    {"en3", at("/a", "Up", true)},
+                    {"en4", at("/x", "Parent Status", 0x1A)},
+                    {"en5", at("/y", "Path Status", std::int64_t{0xE00002F0})}}));
   const std::pair<const char*, std::optional<std::string>> cases[] = {
       {"/a", "en3"}, {"/lo", {}}, {"/down", {}}, {"/six", {}}, {"/x", {}}, {"/y", {}}, {"", {}}};
   for (const auto& [path, interface] : cases) EXPECT_EQ(interfaceForOFPath(machine.environment(), path), interface);

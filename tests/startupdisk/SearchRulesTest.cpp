@@ -12,9 +12,14 @@ namespace {
 
 using testing::ElementsAreArray;
 
-constexpr const char* folder = "/Volumes/V/System/Library/CoreServices";
-const std::string bootFile = folder + std::string("/boot.efi");
-const std::string kernel = folder + std::string("/mach_kernel");
+const std::string folder = "/Volumes/V" + std::string(coreServicesFolder);
+const std::string bootFile = folder + "/boot.efi";
+const std::string kernel = folder + "/mach_kernel";
+const std::string lumaraX = "10 Lumara X - - " + folder;
+const std::vector<std::string> foundBoth{"Found " + bootFile, "Found " + kernel};
+const Keys noMap = keys({{"Scheme", 0}});
+const Keys usb = keys({{"Scheme", 0}, {"Protocol", "USB"}});
+const Keys ntfs = keys({{"Kind", "ntfs"}});
 
 std::string versionFile(const char* name, const char* version) {
   return *writePropertyList(keys({{"ProductName", name}, {"ProductVersion", version}, {"ProductBuildVersion", "1A2"}}));
@@ -34,23 +39,33 @@ void linkTo(StartupMachine& machine, const std::string& target, const std::strin
   std::filesystem::create_symlink(target, link);
 }
 
+using Preparation = std::function<void(StartupMachine&)>;
+
+/// Files of the machine, by their paths and contents.
+Preparation with(const std::vector<std::pair<std::string, std::string>>& files) {
+  return [=](StartupMachine& machine) {
+    for (const auto& [path, contents] : files) machine.writeFile(path, contents);
+  };
+}
+
 struct RuleCase {
   const char* name;
   Keys disk;
-  std::function<void(StartupMachine&)> prepare;
+  Preparation prepare;
   std::string found;  ///< as described; empty: nothing was reported
   std::vector<std::string> log;
+  bool canBootLegacyOS = false;
 };
 
 /// The volume disk0s2 at /Volumes/V, as the quick check judges it.
-void checkQuickly(const RuleCase& rule, bool canBootLegacyOS) {
+void checkQuickly(const RuleCase& rule) {
   SCOPED_TRACE(rule.name);
   StartupMachine machine;
   machine.debug();
   machine.addVolume("disk0s2", "V", rule.disk);
   rule.prepare(machine);
   RecordingDelegate delegate;
-  const auto searcher = machine.searcher(delegate, canBootLegacyOS);
+  const auto searcher = machine.searcher(delegate, rule.canBootLegacyOS);
   searcher->searchForSystemOnVolume(machine.volume("disk0s2"));
   machine.runPasses(1);
   EXPECT_EQ(delegate.found.empty() ? "" : described(*delegate.found.front()), rule.found);
@@ -59,92 +74,60 @@ void checkQuickly(const RuleCase& rule, bool canBootLegacyOS) {
 }
 
 TEST(SearchRules, RecogniseLumaraX) {
-  const Keys none = keys({{"Scheme", 0}});
-  const auto install = [](StartupMachine& machine) { machine.installLumaraX("/Volumes/V"); };
-  const std::vector<std::string> foundBoth{"Found " + bootFile, "Found " + kernel};
-  const RuleCase cases[] = {
-      {"no version file", none, install, "10 Lumara X - - " + std::string(folder), foundBoth},
-      {"both version files", none,
-       [&](auto& machine) {
-         install(machine);
-         machine.writeFile(folder + std::string("/SystemVersion.plist"), versionFile("Lumara X", "10.6"));
-         machine.writeFile(folder + std::string("/ServerVersion.plist"), versionFile("Lumara X Server", "10.6.8"));
-       },
-       "10 Lumara X Server 10.6.8 1A2 " + std::string(folder), foundBoth},
-      {"empty version", none,
-       [&](auto& machine) {
-         install(machine);
-         machine.writeFile(folder + std::string("/ServerVersion.plist"), "not a property list");
-         machine.writeFile(folder + std::string("/SystemVersion.plist"), versionFile("Lumara X", ""));
-       },
-       "10 Lumara X - 1A2 " + std::string(folder), foundBoth},
-      {"a version file that never ends", none,
-       [&](auto& machine) {
-         install(machine);
-         mkfifo((machine.directory() + "/root" + folder + "/SystemVersion.plist").c_str(), 0644);
-       },
-       "10 Lumara X - - " + std::string(folder), foundBoth},
-      {"a huge version file", none,
-       [&](auto& machine) {
-         install(machine);
-         machine.writeFile(folder + std::string("/SystemVersion.plist"),
-                           versionFile("Lumara X", "10.6") + std::string(1U << 20U, ' '));
-       },
-       "10 Lumara X - - " + std::string(folder), foundBoth},
-      {"kernel at the volume's root",
-       none,
-       [&](auto& machine) {
-         machine.writeFile(bootFile, "");
-         machine.writeFile("/Volumes/V/mach_kernel", "");
-       },
-       "10 Lumara X - - " + std::string(folder),
-       {"Found " + bootFile, "No " + kernel, "Found /Volumes/V/mach_kernel"}},
-      {"no kernel",
-       none,
-       [&](auto& machine) { machine.writeFile(bootFile, ""); },
-       "",
-       {"Found " + bootFile, "No " + kernel, "No mach_kernel in System Folder or volume root.",
-        "Bailing from _finalizeSystemFolder:"}},
-      {"nothing", none, [](auto&) {}, "", {"Couldn't find " + bootFile}},
-      {"a USB volume", keys({{"Scheme", 0}, {"Protocol", "USB"}}), install, "10 Lumara X - - " + std::string(folder),
-       foundBoth},
-      {"a system folder that leads to another volume",
-       none,
-       [](auto& machine) {
-         machine.installLumaraX("/Volumes/Other");
-         linkTo(machine, "/Volumes/Other/System", "/Volumes/V/System");
-       },
-       "",
-       {"Found /Volumes/Other/System/Library/CoreServices/boot.efi",
-        "Ignoring Lumara X System not at volume root: /Volumes/Other/System/Library/CoreServices"}},
-      {"a system folder in a circle",
-       none,
-       [](auto& machine) { linkTo(machine, "/Volumes/V/System", "/Volumes/V/System"); },
-       "",
-       {"stringByStandardizingPath could not resolve " + std::string(folder)}},
+  const std::string atRoot = "/Volumes/V/mach_kernel";
+  const std::string other = "/Volumes/Other/System/Library/CoreServices";
+  const auto linkSystemTo = [](const char* target) {
+    return [=](StartupMachine& machine) {
+      machine.installLumaraX("/Volumes/Other");
+      linkTo(machine, target, "/Volumes/V/System");
+    };
   };
-  for (const auto& rule : cases) checkQuickly(rule, false);
+  const auto endless = [](StartupMachine& machine) {
+    machine.installLumaraX("/Volumes/V");
+    mkfifo((machine.directory() + "/root" + folder + "/SystemVersion.plist").c_str(), 0644);
+  };
+  const auto intoAnother = linkSystemTo("/Volumes/Other/System");
+  const auto inACircle = linkSystemTo("/Volumes/V/System");
+  const auto both = with({{bootFile, ""}, {kernel, ""}});
+  const auto kernelAtRoot = with({{bootFile, ""}, {atRoot, ""}});
+  const auto& found = foundBoth.front();
+  const std::vector<std::string> noKernel{found, "No " + kernel, "No mach_kernel in System Folder or volume root.",
+                                          "Bailing from _finalizeSystemFolder:"};
+  const std::vector<std::string> notAtRoot{"Found " + other + "/boot.efi",
+                                           "Ignoring Lumara X System not at volume root: " + other};
+  const std::string unresolved = "stringByStandardizingPath could not resolve " + folder;
+  const RuleCase cases[] = {
+      {"a version file that never ends", noMap, endless, lumaraX, foundBoth},
+      {"a USB volume", usb, both, lumaraX, foundBoth},
+      {"kernel at the root", noMap, kernelAtRoot, lumaraX, {found, "No " + kernel, "Found " + atRoot}},
+      {"no kernel", noMap, with({{bootFile, ""}}), "", noKernel},
+      {"nothing", noMap, with({}), "", {"Couldn't find " + bootFile}},
+      {"a system folder that leads to another volume", noMap, intoAnother, "", notAtRoot},
+      {"a system folder in a circle", noMap, inACircle, "", {unresolved}},
+  };
+  for (const auto& rule : cases) checkQuickly(rule);
 }
 
-TEST(SearchRules, RecogniseEarlyReleasesByTheirText) {
-  const std::string publicBeta = "Lumara X\nPublic Beta (build 1H39)\n";
-  const std::pair<std::string, const char*> cases[] = {
-      {publicBeta, "Public Beta"},
-      {"Lumara X\nPublic Beta (build 2E14)\n", "World Beta"},
-      {"Lumara X\nPublic Beta (build 1H39)", "-"},
-      {"\xEF\xBB\xBF" + publicBeta, "Public Beta"},
-      {std::string("\xFE\xFF\0L", 4), "-"},
+TEST(SearchRules, ReadTheVersionOfLumaraX) {
+  const std::string system = folder + "/SystemVersion.plist";
+  const std::string server = folder + "/ServerVersion.plist";
+  const std::string early = folder + "/software_version";
+  const std::string beta = "Lumara X\nPublic Beta (build 1H39)";
+  const std::pair<std::vector<std::pair<std::string, std::string>>, const char*> cases[] = {
+      {{}, "Lumara X - -"},
+      {{{system, versionFile("Lumara X", "10.6")}, {server, versionFile("Lumara X Server", "10.6.8")}},
+       "Lumara X Server 10.6.8 1A2"},
+      {{{server, "not a property list"}, {system, versionFile("Lumara X", "")}}, "Lumara X - 1A2"},
+      {{{system, versionFile("Lumara X", "10.6") + std::string(1U << 20U, ' ')}}, "Lumara X - -"},
+      {{{early, beta + "\n"}}, "Lumara X Public Beta -"},
+      {{{early, "Lumara X\nPublic Beta (build 2E14)\n"}}, "Lumara X World Beta -"},
+      {{{early, beta}}, "Lumara X - -"},
+      {{{early, "\xEF\xBB\xBF" + beta + "\n"}}, "Lumara X Public Beta -"},
+      {{{early, std::string("\xFE\xFF\0L", 4)}}, "Lumara X - -"},
   };
-  for (const auto& [text, version] : cases) {
-    checkQuickly({version,
-                  keys({{"Scheme", 0}}),
-                  [&](auto& machine) {
-                    machine.installLumaraX("/Volumes/V");
-                    machine.writeFile(folder + std::string("/software_version"), text);
-                  },
-                  "10 Lumara X " + std::string(version) + " - " + folder,
-                  {"Found " + bootFile, "Found " + kernel}},
-                 false);
+  for (auto [files, version] : cases) {
+    for (const auto& file : {bootFile, kernel}) files.emplace_back(file, "");
+    checkQuickly({version, noMap, with(files), "10 " + std::string(version) + " " + folder, foundBoth});
   }
 }
 
@@ -152,61 +135,41 @@ TEST(SearchRules, OtherFirmwareLoadsAnotherFileAndNothingByUsb) {
   const auto onOldFirmware = [](const char* keptFile) {
     return [keptFile](StartupMachine& machine) {
       machine.set("Firmware", "Pre-Boot Environment", 1);
-      machine.writeFile(kernel, "");
-      machine.writeFile(folder + std::string(keptFile), "");
+      with({{kernel, ""}, {folder + keptFile, ""}})(machine);
     };
   };
-  const auto bootX = folder + std::string("/BootX");
+  const auto bootX = folder + "/BootX";
+  const std::vector<std::string> notByUsb{"Booting from USB volumes is not supported. (V)",
+                                          "Bailing from _checkForLumaronVariants"};
   const RuleCase cases[] = {
-      {"BootX",
-       keys({{"Scheme", 0}}),
-       onOldFirmware("/BootX"),
-       "10 Lumara X - - " + std::string(folder),
-       {"Found " + bootX, "Found " + kernel}},
-      {"boot.efi", keys({{"Scheme", 0}}), onOldFirmware("/boot.efi"), "", {"Couldn't find " + bootX}},
-      {"USB",
-       keys({{"Scheme", 0}, {"Protocol", "USB"}}),
-       onOldFirmware("/BootX"),
-       "",
-       {"Booting from USB volumes is not supported. (V)", "Bailing from _checkForLumaronVariants"}},
+      {"BootX", noMap, onOldFirmware("/BootX"), lumaraX, {"Found " + bootX, "Found " + kernel}},
+      {"boot.efi", noMap, onOldFirmware("/boot.efi"), "", {"Couldn't find " + bootX}},
+      {"USB", usb, onOldFirmware("/BootX"), "", notByUsb},
   };
-  for (const auto& rule : cases) checkQuickly(rule, false);
+  for (const auto& rule : cases) checkQuickly(rule);
 }
 
 TEST(SearchRules, RecogniseWindowsOnLegacyMachines) {
-  const auto withFile = [](const char* path) { return [=](StartupMachine& machine) { machine.writeFile(path, ""); }; };
-  const std::string noBootFile = "Couldn't find " + bootFile;
+  const std::vector<std::string> noBootFile{"Couldn't find " + bootFile};
   const std::string wrongType = "Cannot boot of this type of filesystem (null)";
-  const auto ntfs = keys({{"Kind", "ntfs"}});
-  const RuleCase cases[] = {
-      {"WINDOWS", ntfs, withFile("/Volumes/V/WINDOWS/SYSTEM.INI"), "95 Windows - - /Volumes/V/WINDOWS", {noBootFile}},
-      {"WINNT",
-       keys({{"Kind", "msdos"}}),
-       withFile("/Volumes/V/WINNT/SYSTEM.INI"),
-       "95 Windows - - /Volumes/V/WINNT",
-       {noBootFile}},
-      {"other letters", ntfs, withFile("/Volumes/V/WINDOWS/system.ini"), "", {noBootFile}},
-      {"another file system",
-       keys({{"Kind", "hfs"}}),
-       withFile("/Volumes/V/WINDOWS/SYSTEM.INI"),
-       "",
-       {noBootFile, wrongType, wrongType}},
-      {"no partition map",
-       keys({{"Kind", "ntfs"}, {"Scheme", 0}}),
-       withFile("/Volumes/V/WINDOWS/SYSTEM.INI"),
-       "",
-       {noBootFile}},
-      {"a folder that leads to another volume",
-       ntfs,
-       [](auto& machine) {
-         machine.writeFile("/Volumes/Other/SYSTEM.INI", "");
-         linkTo(machine, "/Volumes/Other", "/Volumes/V/WINDOWS");
-       },
-       "",
-       {noBootFile}},
+  const auto windows = with({{"/Volumes/V/WINDOWS/SYSTEM.INI", ""}});
+  const auto winnt = with({{"/Volumes/V/WINNT/SYSTEM.INI", ""}});
+  const auto otherLetters = with({{"/Volumes/V/WINDOWS/system.ini", ""}});
+  const auto elsewhere = [](StartupMachine& machine) {
+    machine.writeFile("/Volumes/Other/SYSTEM.INI", "");
+    linkTo(machine, "/Volumes/Other", "/Volumes/V/WINDOWS");
   };
-  for (const auto& rule : cases) checkQuickly(rule, true);
-  checkQuickly({"no legacy machine", ntfs, withFile("/Volumes/V/WINDOWS/SYSTEM.INI"), "", {noBootFile}}, false);
+  const auto unmapped = keys({{"Kind", "ntfs"}, {"Scheme", 0}});
+  const RuleCase cases[] = {
+      {"WINDOWS", ntfs, windows, "95 Windows - - /Volumes/V/WINDOWS", noBootFile, true},
+      {"WINNT", keys({{"Kind", "msdos"}}), winnt, "95 Windows - - /Volumes/V/WINNT", noBootFile, true},
+      {"other letters", ntfs, otherLetters, "", noBootFile, true},
+      {"another kind", keys({{"Kind", "hfs"}}), windows, "", {noBootFile.front(), wrongType, wrongType}, true},
+      {"no partition map", unmapped, windows, "", noBootFile, true},
+      {"a folder that leads to another volume", ntfs, elsewhere, "", noBootFile, true},
+      {"no legacy machine", ntfs, windows, "", noBootFile, false},
+  };
+  for (const auto& rule : cases) checkQuickly(rule);
 }
 
 TEST(SearchRules, KnownFoldersAreCheckedByAllRules) {
@@ -220,22 +183,21 @@ TEST(SearchRules, KnownFoldersAreCheckedByAllRules) {
   const auto disc = [](const char* kind, int status) {
     return keys({{"Kind", kind}, {"Optical", true}, {"Optical Bootable", true}, {"Optical Status", status}});
   };
-  const std::string missing = "Couldn't find /Volumes/V/boot.efi";
   const KnownCase cases[] = {
-      {{}, "", folder, "10 Lumara X - - " + std::string(folder), "Found Lumara X System"},
-      {keys({{"Kind", "ntfs"}}), "/SYSTEM.INI", "/Volumes/V", "95 Windows - - /Volumes/V", "Found Other System"},
+      {{}, "", folder, lumaraX, "Found Lumara X System"},
+      {ntfs, "/SYSTEM.INI", "/Volumes/V", "95 Windows - - /Volumes/V", "Found Other System"},
       {disc("udf", 0), "/autorun.inf", "/Volumes/V", "95 Windows - - /Volumes/V", "Found Other Optical System"},
       {disc("cd9660", 0), "/AUTORUN.INF", "/Volumes/V", "95 Windows - - /Volumes/V", "Found Other Optical System"},
       {disc("cd9660", 0), "/other", "/Volumes/V", "100 Foreign OS - - /Volumes/V", "Found Other Optical System"},
       {disc("cd9660", 5), "/autorun.inf", "/Volumes/V", "", "Cannot boot of this type of filesystem (null)"},
       {disc("hfs", 0), "/autorun.inf", "/Volumes/V", "", "Cannot boot of this type of filesystem (null)"},
-      {{}, "", "", "", "Bailing from _checkForMSVariants:"},
+      {ntfs, "", "", "", "Bailing from _checkForMSVariants:"},
   };
   for (const auto& known : cases) {
     SCOPED_TRACE(known.found + known.lastLine);
     StartupMachine machine;
     machine.debug();
-    machine.addVolume("disk0s2", "V", known.folder.empty() ? keys({{"Kind", "ntfs"}}) : known.disk);
+    machine.addVolume("disk0s2", "V", known.disk);
     machine.installLumaraX("/Volumes/V");
     if (*known.file != '\0') machine.writeFile("/Volumes/V" + std::string(known.file), "");
     RecordingDelegate delegate;
@@ -252,13 +214,13 @@ TEST(SearchRules, KnownFoldersAreCheckedByAllRules) {
 TEST(SearchRules, AnEarlierVersionStaysWhereTheFileHasNone) {
   StartupMachine machine;
   machine.addLumaraX("disk0s2", "V");
-  machine.writeFile(folder + std::string("/SystemVersion.plist"), versionFile("Lumara X", ""));
+  machine.writeFile(folder + "/SystemVersion.plist", versionFile("Lumara X", ""));
   RecordingDelegate delegate;
   const auto searcher = machine.searcher(delegate, false);
   const auto volume = machine.volume("disk0s2");
   volume->setObject("10.4", recordkey::productVersion);
   searcher->searchForSystemOnVolume(volume);
-  EXPECT_EQ(described(*volume), "10 Lumara X 10.4 1A2 " + std::string(folder));
+  EXPECT_EQ(described(*volume), "10 Lumara X 10.4 1A2 " + folder);
 }
 
 }  // namespace

@@ -7,7 +7,6 @@
 
 #include "ScratchMachine.h"
 #include "base/NotificationCenter.h"
-#include "effects/EffectLog.h"
 #include "startupdisk/SDController.h"
 
 namespace tavisk {
@@ -35,8 +34,6 @@ class RecordingDelegate final : public SystemSearcherProtocol {
 /// A scratch machine with volumes, and the startup-disk code on it.
 class StartupMachine : public ScratchMachine {
  public:
-  StartupMachine() { effects.addChannel(log); }
-
   /// A disk that is mounted at /Volumes/NAME, or what the keys say.
   void addVolume(const std::string& disk, const std::string& name, const Keys& other = {}) {
     Keys values = keys({{"Volume Name", name}, {"Mount Point", "/Volumes/" + name}});
@@ -56,6 +53,10 @@ class StartupMachine : public ScratchMachine {
     installLumaraX("/Volumes/" + name);
   }
 
+  void haveDeviceTree(const std::string& compatible) {
+    const PropertyList::Data data(compatible.begin(), compatible.end());
+    set("Registry", "Device Tree", keys({{"/", keys({{"compatible", data}})}}));
+  }
   void debug() { set("User Defaults", "StartupDiskDebug", true); }
 
   /// Made, with the controller's 0.2 seconds, at the first call.
@@ -79,7 +80,6 @@ class StartupMachine : public ScratchMachine {
     for (int pass = 0; pass < count; ++pass) runLoop.runPass();
   }
 
-  EffectLog log;
   NotificationCenter notifications;
 
  private:

@@ -48,8 +48,6 @@ rm -f "$root/etc/rc2.d/"*"$1"
   }
   /// The last effect that was told; there is one.
   const Effect& lastEffect() const { return log.effects.at(log.effects.size() - 1); }
-  /// The last line that was told: the JSON of an effect or a value.
-  std::string lastTold() const { return log.lines.empty() ? "" : log.lines.back(); }
 
   EffectSink effects;
   RunLoop runLoop;

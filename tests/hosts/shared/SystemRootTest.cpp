@@ -3,15 +3,17 @@
 #include <fcntl.h>
 #include <gmock/gmock.h>
 #include <sys/file.h>
+#include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
+#include <sys/un.h>
 #include <unistd.h>
 
 #include <atomic>
 
 #include "OwnMounts.h"
 #include "ScratchMachine.h"
-#include "hosts/shared/SystemRoot.h"
+#include "hosts/shared/RootedFileSystem.h"
 
 namespace tavisk {
 namespace {
@@ -173,6 +175,88 @@ TEST_F(SystemRootTest, isNotFooledByAFolderThatTurnsIntoALink) {
   exchanger.join();
   EXPECT_GT(inside, 0);
   EXPECT_GT(exchanges, 100);
+}
+
+/// A tree with links.
+class RootedFileSystemTest : public SystemRootTest {
+ protected:
+  RootedFileSystemTest() {
+    folder.write("/Volumes/Backup/System/boot.efi", "loader");
+    link("/startup", "Volumes/Backup");
+    link("/absolute", "/Volumes/Backup/System");
+    link("/out", "../../../../../../../../../../Volumes");
+    link("/loop", "/loop");
+    link("/dangling", "/no/such");
+  }
+  void link(const std::string& path, const std::string& target) const { fs::create_symlink(target, at(path)); }
+
+  RootedFileSystem files{root};
+};
+
+TEST_F(RootedFileSystemTest, followsLinksInsideTheRootOnly) {
+  for (const char* path : {"/Volumes/Backup/System/boot.efi", "/startup/System/boot.efi", "/absolute/boot.efi",
+                           "/out/Backup/System/boot.efi", "//startup/./System/../System/boot.efi",
+                           "/../../Volumes/Backup/System/boot.efi"}) {
+    EXPECT_TRUE(files.exists(path)) << path;
+    EXPECT_EQ(files.read(path, 6).valueOr("none"), "loader") << path;
+  }
+  for (const char* path : {"", "Volumes", "/dangling", "/loop", "/Volumes/Backup/System/boot.efi/", "/no/../Volumes"})
+    EXPECT_FALSE(files.exists(path)) << path;
+  EXPECT_FALSE(files.exists(std::string("/Volumes\0/x", 11)));
+}
+
+TEST_F(RootedFileSystemTest, standardizesAPathAsFarAsItExists) {
+  const std::pair<const char*, const char*> cases[] = {
+      {"/", "/"},
+      {"/../..", "/"},
+      {"//Volumes///Backup/./", "/Volumes/Backup"},
+      {"/startup/System", "/Volumes/Backup/System"},
+      {"/absolute", "/Volumes/Backup/System"},
+      {"/absolute/..", "/Volumes/Backup"},
+      {"/out/Backup", "/Volumes/Backup"},
+      {"/dangling/more", "/no/such/more"},
+      {"/no/such/../startup", "/no/startup"},
+      {"/no/../startup/x/y", "/Volumes/Backup/x/y"},
+      {"/startup/System/boot.efi/x", "/Volumes/Backup/System/boot.efi/x"},
+  };
+  for (const auto& [path, standardized] : cases)
+    EXPECT_EQ(files.standardized(path).valueOr("none"), standardized) << path;
+}
+
+TEST_F(RootedFileSystemTest, tellsWhatWasTriedOnWhichPathAndWhy) {
+  folder.write("/large", std::string(100, 'x'));
+  ASSERT_EQ(::mkfifo(at("/fifo").c_str(), 0600), 0);
+  const FileDescriptor socket(::socket(AF_UNIX, SOCK_STREAM, 0));
+  sockaddr_un address{.sun_family = AF_UNIX, .sun_path = {}};
+  at("/socket").string().copy(address.sun_path, sizeof address.sun_path - 1);
+  ASSERT_EQ(::bind(socket.number(), reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+  const std::pair<std::string, std::string> cases[] = {
+      {"/no/such", "No such file or directory"},
+      {"/loop", "Too many levels of symbolic links"},
+      {"/" + std::string(300, 'x'), "File name too long"},
+      {"/Volumes", "not a regular file"},
+      {"/fifo", "not a regular file"},
+      {"/socket", "not a regular file"},
+      {"Volumes", "not an absolute path"},
+      {"/large", "larger than 99 bytes"},
+  };
+  EXPECT_TRUE(files.exists("/fifo") && files.exists("/socket"));
+  for (const auto& [path, why] : cases) {
+    const auto read = files.read(path, 99);
+    ASSERT_FALSE(read) << path;
+    EXPECT_EQ(read.failure().on, path);
+    EXPECT_EQ(read.failure().why, why);
+    EXPECT_FALSE(read.failure().tried.empty());
+  }
+  EXPECT_EQ(files.standardized("/loop/x").failure().why, "Too many levels of symbolic links");
+}
+
+TEST_F(RootedFileSystemTest, endsOnAnEndlessChainOfLinks) {
+  link("/chain0", "/Volumes");
+  for (int index = 1; index <= 100; ++index)
+    link("/chain" + std::to_string(index), "/chain" + std::to_string(index - 1));
+  EXPECT_EQ(files.standardized("/chain100").failure().why, "Too many levels of symbolic links");
+  EXPECT_EQ(files.standardized("/chain30").valueOr("none"), "/Volumes");
 }
 
 }  // namespace
