@@ -114,7 +114,7 @@ TEST(EnclosureLock, TellsWhenKeyboardsDiffer) {
 }
 
 TEST(EnclosureLock, LeavesTheKeyboardsOfAMachineThatTellsOfNoLock) {
-  for (const auto& [error, why] : {std::pair(0, "no lock of the front panel"), {ENODEV, "No such device"}}) {
+  for (const auto& [error, why] : {std::pair(0, "no lock of the front panel"), {ENODEV, "this machine has none, or no driver"}}) {
     PanelTree tree;
     tree.panel.error = error;
     tree.panel.capabilities = 0xFF & ~lock;
