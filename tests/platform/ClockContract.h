@@ -60,19 +60,13 @@ TYPED_TEST_P(ClockContract, isInUtcUntilAZoneIsSet) {
   auto& clock = this->machine.service();
   EXPECT_EQ(clock.timeZone(), utc());
   for (const auto& zone : {this->paris, this->cairo, this->cairo}) {
+    const auto before = clock.timeZone();
     clock.setTimeZone(zone);
     EXPECT_EQ(clock.timeZone(), zone);
-  }
-}
-
-TYPED_TEST_P(ClockContract, tellsWhatBecameOfAZone) {
-  for (const auto outcome : {Outcome::applied, Outcome::unchanged}) {
-    const auto before = this->machine.service().timeZone().text;
-    this->machine.service().setTimeZone(this->paris);
     auto told = this->machine.effects().back();
     told.where.clear();
-    const auto& zone = this->paris.text;
-    EXPECT_EQ(told, (Effect{setting::timeZone, outcome, before, zone, zone, zone}));
+    const auto outcome = zone == before ? Outcome::unchanged : Outcome::applied;
+    EXPECT_EQ(told, (Effect{setting::timeZone, outcome, before.text, zone.text, zone.text, zone.text}));
   }
 }
 
@@ -83,7 +77,6 @@ TYPED_TEST_P(ClockContract, takesRulesFromZoneFilesOnly) {
 }
 
 REGISTER_TYPED_TEST_SUITE_P(ClockContract, goesOnFromTheTimeThatWasSet, tellsTheRealTimeAtFirst,
-                            knowsEachInstalledZoneOnce, isInUtcUntilAZoneIsSet, tellsWhatBecameOfAZone,
-                            takesRulesFromZoneFilesOnly);
+                            knowsEachInstalledZoneOnce, isInUtcUntilAZoneIsSet, takesRulesFromZoneFilesOnly);
 
 }  // namespace tavisk

@@ -16,17 +16,6 @@
 namespace tavisk {
 namespace {
 
-int listenAt(const std::filesystem::path& path) {
-  std::filesystem::create_directories(path.parent_path());
-  int listener = ::socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0);
-  sockaddr_un address{};
-  address.sun_family = AF_UNIX;
-  path.string().copy(address.sun_path, sizeof address.sun_path - 1);
-  if (::bind(listener, reinterpret_cast<sockaddr*>(&address), sizeof address) != 0 || ::listen(listener, 4) != 0)
-    throw std::runtime_error("no socket for a fake of the bus");
-  return listener;
-}
-
 sd_bus* greeted(int connection) {
   sd_bus* bus = nullptr;
   sd_bus_new(&bus);
@@ -49,6 +38,17 @@ sd_bus* joined(const std::filesystem::path& socket, const std::vector<std::strin
 
 }  // namespace
 
+FileDescriptor socketAt(const std::filesystem::path& path, int type) {
+  std::filesystem::create_directories(path.parent_path());
+  FileDescriptor socket(::socket(AF_UNIX, type | SOCK_CLOEXEC, 0));
+  sockaddr_un address{};
+  address.sun_family = AF_UNIX;
+  path.string().copy(address.sun_path, sizeof address.sun_path - 1);
+  if (::bind(socket.number(), reinterpret_cast<sockaddr*>(&address), sizeof address) != 0)
+    throw std::runtime_error("no socket for a fake service");
+  return socket;
+}
+
 std::string firstText(sd_bus_message* message) {
   const char* text = "";
   sd_bus_message_read_basic(message, 's', &text);
@@ -58,7 +58,8 @@ std::string firstText(sd_bus_message* message) {
 BusPeer::BusPeer(const std::filesystem::path& socket, const std::vector<std::string>& namesOnBus, Answer answer)
     : _wake(::eventfd(0, EFD_CLOEXEC)), _answer(std::move(answer)) {
   if (namesOnBus.empty()) {
-    _listener = listenAt(socket);
+    _listener = socketAt(socket, SOCK_STREAM);
+    ::listen(_listener.number(), 4);
     _thread = std::thread([this] { serveCallers(); });
   } else {
     _thread = std::thread([this, bus = joined(socket, namesOnBus)] { serve(bus); });
@@ -66,15 +67,14 @@ BusPeer::BusPeer(const std::filesystem::path& socket, const std::vector<std::str
 }
 
 BusPeer::~BusPeer() {
-  ::eventfd_write(_wake, 1);
+  ::eventfd_write(_wake.number(), 1);
   _thread.join();
-  ::close(_wake);
-  ::close(_listener);
 }
 
 void BusPeer::serveCallers() {
-  pollfd waiting[] = {{_listener, POLLIN, 0}, {_wake, POLLIN, 0}};
-  while (::poll(waiting, 2, -1) > 0 && waiting[1].revents == 0) serve(greeted(::accept(_listener, nullptr, nullptr)));
+  pollfd waiting[] = {{_listener.number(), POLLIN, 0}, {_wake.number(), POLLIN, 0}};
+  while (::poll(waiting, 2, -1) > 0 && waiting[1].revents == 0)
+    serve(greeted(::accept(_listener.number(), nullptr, nullptr)));
 }
 
 void BusPeer::serve(sd_bus* bus) {
@@ -85,7 +85,7 @@ void BusPeer::serve(sd_bus* bus) {
     int result = sd_bus_process(bus, nullptr);
     if (result < 0) break;
     if (result > 0) continue;
-    pollfd waiting[] = {{sd_bus_get_fd(bus), POLLIN, 0}, {_wake, POLLIN, 0}};
+    pollfd waiting[] = {{sd_bus_get_fd(bus), POLLIN, 0}, {_wake.number(), POLLIN, 0}};
     if (::poll(waiting, 2, -1) < 0 || waiting[1].revents != 0) break;
   }
   sd_bus_close_unref(bus);

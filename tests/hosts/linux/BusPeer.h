@@ -9,6 +9,8 @@
 #include <thread>
 #include <vector>
 
+#include "base/FileDescriptor.h"
+
 struct sd_bus_message;
 struct sd_bus;
 
@@ -35,12 +37,15 @@ class BusPeer {
   void serveCallers();
   void serve(sd_bus* bus);
 
-  int _listener = -1;
-  int _wake;
+  FileDescriptor _listener;
+  FileDescriptor _wake;
   Answer _answer;
   std::atomic<bool> _hangUp = false;
   std::thread _thread;
 };
+
+/// A socket in the file system; `type` is SOCK_STREAM or SOCK_DGRAM.
+FileDescriptor socketAt(const std::filesystem::path& path, int type);
 
 /// The next argument of a call, a text.
 std::string firstText(sd_bus_message* message);

@@ -9,6 +9,11 @@
 
 namespace tavisk {
 
+/// A machine whose message bus is down, with a service manager.
+struct ManagedTree : LinuxTree {
+  FakeServiceManager manager{(write("/run/systemd/system/x", ""), at("/run/systemd/private"))};
+};
+
 /// Machines for the contract suites on trees of files of several kinds.
 template <typename Tree>
 struct ClockOf {

@@ -27,8 +27,19 @@ class LinuxTree {
     std::filesystem::remove(at(path));
     std::filesystem::create_symlink(target, at(path));
   }
-  /// Has a program that switches init scripts as /etc/rc2.d then shows.
-  void haveRunLevels() {
+  /// Has an init script by which the program runs as process 77, which it writes into /run a little later; and a
+  /// program that switches init scripts as /etc/rc2.d then shows.
+  void haveInitScript(const std::string& name, const std::string& program) {
+    writeProgram("/etc/init.d/" + name, "#!/bin/sh\nroot=${0%/etc/init.d/*}\nprogram=" + program + R"sh(
+case $1 in
+start)
+  mkdir -p "$root/proc/77" "$root/run"
+  echo "77 ($program) S 1" > "$root/proc/77/stat"; echo $program > "$root/proc/77/cmdline"
+  (sleep 0.1; echo 77 > "$root/run/$program.pid") >/dev/null 2>&1 &
+  ;;
+stop) rm -rf "$root/proc/77" "$root/run/$program.pid" ;;
+esac
+)sh");
     writeProgram("/usr/sbin/update-rc.d", R"sh(#!/bin/sh
 root=${0%/usr/sbin/update-rc.d}
 mkdir -p "$root/etc/rc2.d"

@@ -7,8 +7,7 @@
 #include "ToolRun.h"
 #include "effects/EffectMatchers.h"
 #include "effects/SettingNames.h"
-#include "hosts/linux/FakeServiceManager.h"
-#include "hosts/linux/LinuxTree.h"
+#include "hosts/linux/LinuxContractMachines.h"
 #include "platform/RemoteAccessContract.h"
 
 namespace tavisk {
@@ -20,38 +19,23 @@ using namespace std::chrono_literals;
 constexpr const char* running = "active";
 
 /// A machine with init scripts; the server writes its process id a little later, and alice is logged in.
-class ScriptedTree : public LinuxTree {
- public:
+struct ScriptedTree : LinuxTree {
   ScriptedTree() {
     write("/etc/ssh/ssh_host_rsa_key", "");
     writeProgram("/usr/sbin/sshd", "");
     write("/proc/78/stat", "78 (sshd) S 1");
     write("/proc/78/cmdline", "sshd: alice [priv]");
-    writeProgram("/etc/init.d/ssh", R"sh(#!/bin/sh
-root=${0%/etc/init.d/ssh}
-case $1 in
-start)
-  mkdir -p "$root/proc/77" "$root/run"
-  echo "77 (sshd) S 1" > "$root/proc/77/stat"; echo sshd > "$root/proc/77/cmdline"
-  (sleep 0.1; echo 77 > "$root/run/sshd.pid") >/dev/null 2>&1 &
-  ;;
-stop) rm -rf "$root/proc/77" "$root/run/sshd.pid" ;;
-esac
-)sh");
-    haveRunLevels();
+    haveInitScript("ssh", "sshd");
   }
 };
 
-class ManagedTree : public LinuxTree {
- public:
-  ManagedTree() : manager((write("/run/systemd/system/x", ""), at("/run/systemd/private"))) {
+struct SshUnits : ManagedTree {
+  SshUnits() {
     write("/etc/ssh/ssh_host_rsa_key", "");
-    writeProgram("/usr/sbin/sshd", "");
     write("/usr/sbin/sshd", "");
     write("/etc/tavisk/services.conf", "remote-events = events.socket events.service\n");
     for (const char* unit : {"ssh.service", "ssh.socket", "events.socket", "events.service"}) manager.set(unit, {});
   }
-  FakeServiceManager manager;
 };
 
 template <typename Tree>
@@ -61,9 +45,9 @@ struct RemoteShellOf {
 };
 struct RemoteEvents {
   RemoteEventsService& service() { return tree.host().remoteEvents(); }
-  ManagedTree tree;
+  SshUnits tree;
 };
-using Machines = testing::Types<RemoteShellOf<ScriptedTree>, RemoteShellOf<ManagedTree>, RemoteEvents>;
+using Machines = testing::Types<RemoteShellOf<ScriptedTree>, RemoteShellOf<SshUnits>, RemoteEvents>;
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, RemoteAccessContract, Machines);
 
 TEST(RemoteLogin, SwitchesServiceAndSocketTogether) {
@@ -77,6 +61,8 @@ TEST(RemoteLogin, SwitchesServiceAndSocketTogether) {
   const FakeUnit runtime{.file = "enabled-runtime"}, both{.active = running, .file = "enabled"};
   const std::vector<std::string> enableAndStart = {"EnableUnitFiles ssh.service", "Reload", "StartUnit ssh.service"};
   const std::vector<std::string> disableSocket = {"DisableUnitFiles ssh.socket", "Reload"};
+  const std::vector<std::string> disableAndStop = {disableSocket[0], "Reload", "StopUnit ssh.socket",
+                                                   "StopUnit ssh.service"};
   const Case cases[] = {
       {none, none, false, {}, enableAndStart},
       {none, absent, false, {}, enableAndStart},
@@ -84,15 +70,11 @@ TEST(RemoteLogin, SwitchesServiceAndSocketTogether) {
       {broken, absent, true, {"StopUnit ssh.service"}, {"EnableUnitFiles ssh.service", "Reload"}},
       {none, enabled, true, disableSocket, {"StartUnit ssh.socket"}},
       {none, runtime, true, disableSocket, {"StartUnit ssh.socket"}},
-      {active,
-       both,
-       true,
-       {"DisableUnitFiles ssh.socket", "Reload", "StopUnit ssh.socket", "StopUnit ssh.service"},
-       {}},
+      {active, both, true, disableAndStop, {}},
   };
   for (const auto& test : cases) {
     for (bool on : {false, true}) {
-      ManagedTree tree;
+      SshUnits tree;
       tree.manager.set("ssh.service", test.service);
       tree.manager.set("ssh.socket", test.socket);
       auto& login = tree.host().remoteShell();
@@ -112,7 +94,7 @@ TEST(RemoteLogin, SaysWhatStandsAgainstIt) {
       {"", {.jobResult = "failed"}, Outcome::failed, "its job ended with: failed"},
   };
   for (const auto& [config, unit, outcome, why] : cases) {
-    ManagedTree tree;
+    SshUnits tree;
     tree.write("/etc/tavisk/services.conf", config);
     tree.manager.set("ssh.service", unit);
     tree.manager.set("ssh.socket", {.load = "not-found"});
@@ -130,7 +112,7 @@ TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
       {"false", "#HostKey /srv/key\n", Outcome::failed},
   };
   for (const auto& [maker, config, outcome] : cases) {
-    ManagedTree tree;
+    SshUnits tree;
     std::filesystem::remove(tree.at("/etc/ssh/ssh_host_rsa_key"));
     tree.write("/etc/ssh/sshd_config", config);
     tree.writeProgram("/usr/bin/ssh-keygen", std::string("#!/bin/sh\nroot=${0%/usr/bin/ssh-keygen}\n") + maker);
@@ -141,7 +123,7 @@ TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
 }
 
 TEST(RemoteEvents, SwitchAllUnitsAndAskTheFirst) {
-  ManagedTree tree;
+  SshUnits tree;
   auto& events = tree.host().remoteEvents();
   tree.manager.set("events.service", {.active = running, .file = "enabled"});
   EXPECT_FALSE(events.isEnabled());
@@ -154,16 +136,13 @@ TEST(RemoteEvents, SwitchAllUnitsAndAskTheFirst) {
 }
 
 TEST(RemoteEvents, AreNotSupportedWithoutAllOfTheirUnits) {
-  ManagedTree tree;
+  SshUnits tree;
   tree.manager.set("events.service", {.load = "not-found"});
-  tree.host().remoteEvents().setEnabled(true);
-  EXPECT_THAT(tree.lastEffect(), UnsupportedFor("not all of them"));
-}
-
-TEST(RemoteEvents, AreNotSupportedWithoutUnits) {
-  LinuxTree tree;
-  tree.host().remoteEvents().setEnabled(true);
-  EXPECT_THAT(tree.lastEffect(), UnsupportedFor("services.conf"));
+  for (const char* why : {"not all of them", "services.conf"}) {
+    tree.host().remoteEvents().setEnabled(true);
+    EXPECT_THAT(tree.lastEffect(), UnsupportedFor(why));
+    tree.write("/etc/tavisk/services.conf", "");
+  }
   EXPECT_FALSE(tree.host().remoteEvents().isEnabled());
 }
 
@@ -176,7 +155,7 @@ TEST(RemoteAccess, HasOneTimeForAllWaitsOfACommandButForQuestions) {
     }
     void restoreTerminal() override {}
   } user;
-  ManagedTree tree;
+  SshUnits tree;
   for (const char* unit : {"events.socket", "events.service"}) tree.manager.set(unit, {.delay = longestCommand / 4});
   tree.manager.set("ssh.service", {.active = running});
   const std::vector<std::string> words = {"setremotevelmarevents", "on", "setremotelogin", "off"};

@@ -11,18 +11,9 @@ namespace tavisk {
 namespace {
 
 /// A machine with chrony and init scripts; both programs work on the tree that they stand in.
-class ChronyTree : public LinuxTree {
- public:
+struct ChronyTree : LinuxTree {
   ChronyTree() {
-    writeProgram("/etc/init.d/chrony", R"sh(#!/bin/sh
-root=${0%/etc/init.d/chrony}
-echo "$1" >> "$root/calls"
-case $1 in
-start) mkdir -p "$root/proc/77"; echo "77 (chronyd) S 1" > "$root/proc/77/stat"; echo chronyd > "$root/proc/77/cmdline" ;;
-stop) rm -rf "$root/proc/77" ;;
-esac
-)sh");
-    haveRunLevels();
+    haveInitScript("chrony", "chronyd");
     writeProgram("/usr/sbin/chronyd", "");
     write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\n");
     writeProgram("/usr/bin/chronyc", R"sh(#!/bin/sh
@@ -40,6 +31,11 @@ struct LinuxNetworkTime {
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, NetworkTimeContract, LinuxNetworkTime);
 
+struct ChronyTest : testing::Test {
+  ChronyTree tree;
+  NetworkTimeService& client = tree.host().networkTime();
+};
+
 TEST(LinuxNetworkTime, SaysThatThereIsNoClient) {
   LinuxTree tree;
   auto& client = tree.host().networkTime();
@@ -51,31 +47,25 @@ TEST(LinuxNetworkTime, SaysThatThereIsNoClient) {
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::notSupported);
 }
 
-TEST(LinuxNetworkTime, WritesTheServerWhereTheClientReadsIt) {
-  ChronyTree tree;
-  auto& client = tree.host().networkTime();
+TEST_F(ChronyTest, WritesTheServerWhereTheClientReadsIt) {
   client.setServer({"time.example"});
   EXPECT_EQ(tree.file("/etc/chrony/sources.d/60-tavisk.sources"),
             "# Written by tavisk. Changes made here are replaced.\nserver time.example iburst\n");
 }
 
-TEST(LinuxNetworkTime, HasTheClientReadItsServersAgain) {
-  ChronyTree tree;
-  tree.host().networkTime().restartAsynchronously();
+TEST_F(ChronyTest, HasTheClientReadItsServersAgain) {
+  client.restartAsynchronously();
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_EQ(tree.file("/reloaded"), "reload sources LC_ALL=C\nPATH=/usr/sbin:/usr/bin:/sbin:/bin\n");
 }
 
-TEST(LinuxNetworkTime, NotesTheServerThatStaysInUse) {
-  ChronyTree tree;
+TEST_F(ChronyTest, NotesTheServerThatStaysInUse) {
   tree.write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\npool pool.example iburst\n");
-  tree.host().networkTime().setServer({"next.example"});
+  client.setServer({"next.example"});
   EXPECT_EQ(tree.lastEffect().note, "configured elsewhere, pool.example stays in use beside it");
 }
 
-TEST(LinuxNetworkTime, WritesNoServerThatTheClientDoesNotRead) {
-  ChronyTree tree;
-  auto& client = tree.host().networkTime();
+TEST_F(ChronyTest, WritesNoServerThatTheClientDoesNotRead) {
   client.setServer({"time.example"});
   tree.write("/etc/chrony/chrony.conf", "pool pool.example iburst\n");
   client.setServer({"other.example"});
@@ -83,12 +73,11 @@ TEST(LinuxNetworkTime, WritesNoServerThatTheClientDoesNotRead) {
   EXPECT_EQ(client.server().address, "pool.example") << "chronyd does not read the tool's own file any more";
 }
 
-TEST(LinuxNetworkTime, TellsWhenSuccessChangedNothing) {
-  ChronyTree tree;
+TEST_F(ChronyTest, TellsWhenSuccessChangedNothing) {
   for (const auto& [script, why] : {std::pair("#!/bin/sh\nexit 0\n", "chronyd does not run"),
                                     std::pair("#!/bin/sh\necho no such key >&2\nexit 3\n", "status 3: no such key")}) {
     tree.writeProgram("/etc/init.d/chrony", script);
-    tree.host().networkTime().start();
+    client.start();
     EXPECT_THAT(tree.lastEffect(), FailedFor(why));
   }
 }

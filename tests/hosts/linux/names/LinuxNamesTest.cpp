@@ -14,8 +14,7 @@ namespace tavisk {
 namespace {
 
 /// A machine called "machine" that has neither a bus nor a responder.
-class NamedTree : public LinuxTree {
- public:
+struct NamedTree : LinuxTree {
   NamedTree() {
     write("/etc/hostname", "machine\n");
     write("/etc/hosts", "127.0.0.1\tlocalhost\n127.0.1.1\tmachine\n");
@@ -29,6 +28,11 @@ struct LinuxNames {
   NamedTree tree;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, HostNamesContract, LinuxNames);
+
+struct NamesTest : testing::Test {
+  NamedTree tree;
+  HostConfigService& names = tree.host().hostConfiguration();
+};
 
 TEST(HostNameFiles, RenameTheMachineInHostsAndNobodyElse) {
   const std::tuple<const char*, const char*, const char*, const char*> cases[] = {
@@ -45,9 +49,8 @@ TEST(HostNameFiles, RenameTheMachineInHostsAndNobodyElse) {
   for (const auto& [hosts, before, now, after] : cases) EXPECT_EQ(hostsWithName(hosts, before, now), after) << hosts;
 }
 
-TEST(LinuxNames, ChangesEveryPlaceOfTheHostName) {
-  NamedTree tree;
-  tree.host().hostConfiguration().setLocalNetworkName("mail-2.example");
+TEST_F(NamesTest, ChangesEveryPlaceOfTheHostName) {
+  names.setLocalNetworkName("mail-2.example");
   EXPECT_EQ(tree.lastEffect(), (Effect{.setting = setting::localSubnetName,
                                        .outcome = Outcome::applied,
                                        .before = "machine",
@@ -62,22 +65,19 @@ TEST(LinuxNames, ChangesEveryPlaceOfTheHostName) {
   EXPECT_EQ(tree.host().dynamicStore().open("test")->computerName(), "mail-2.example") << "without one for people";
 }
 
-TEST(LinuxNames, AreLeftToTheFilesOnABusWithoutTheirService) {
-  NamedTree tree;
+TEST_F(NamesTest, AreLeftToTheFilesOnABusWithoutTheirService) {
   tree.write("/run/systemd/system/x", "");
   const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {},
                     [](sd_bus_message* call, const std::string& /*member*/) {
                       return sd_bus_reply_method_errorf(call, SD_BUS_ERROR_SERVICE_UNKNOWN, "no such name");
                     });
-  tree.host().hostConfiguration().setComputerName("Mail Server 2");
+  names.setComputerName("Mail Server 2");
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_EQ(tree.lastEffect().live, "Mail Server 2");
 }
 
-TEST(LinuxNames, RefusesComputerNamesThatItCannotKeepWhole) {
-  NamedTree tree;
+TEST_F(NamesTest, RefusesComputerNamesThatItCannotKeepWhole) {
   tree.write("/etc/machine-info", "PRETTY_HOSTNAME=Old\n");
-  auto& names = tree.host().hostConfiguration();
   for (const char* name : {"a\nb", "\x7F", "\xFF"}) {
     names.setComputerName(name);
     EXPECT_THAT(tree.lastEffect(), FailedFor("the name ")) << name;
@@ -85,10 +85,9 @@ TEST(LinuxNames, RefusesComputerNamesThatItCannotKeepWhole) {
   EXPECT_EQ(tree.file("/etc/machine-info"), "PRETTY_HOSTNAME=Old\n");
 }
 
-TEST(LinuxNames, RefusesHostNamesThatTheKernelDoesNotHold) {
-  NamedTree tree;
+TEST_F(NamesTest, RefusesHostNamesThatTheKernelDoesNotHold) {
   for (const std::string& name : {std::string(), std::string(32, 'a') + "." + std::string(32, 'b')}) {
-    tree.host().hostConfiguration().setLocalNetworkName(name);
+    names.setLocalNetworkName(name);
     EXPECT_THAT(tree.lastEffect(), FailedFor("1 to 64 bytes"));
   }
   EXPECT_EQ(tree.file("/etc/hostname"), "machine\n");
@@ -110,13 +109,12 @@ TEST(LinuxNames, AreNotSetWhereHostsCannotBeRead) {
   EXPECT_FALSE(tree.has("/etc/hostname"));
 }
 
-TEST(LinuxNames, CompletesAChangeThatWasCutOff) {
-  NamedTree tree;
+TEST_F(NamesTest, CompletesAChangeThatWasCutOff) {
   tree.write("/etc/hostname", "new\n");
-  tree.host().hostConfiguration().setLocalNetworkName("new");
+  names.setLocalNetworkName("new");
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied) << "the kernel had the old name";
   EXPECT_EQ(tree.file("/proc/sys/kernel/hostname"), "new\n");
-  tree.host().hostConfiguration().setLocalNetworkName("new");
+  names.setLocalNetworkName("new");
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::unchanged);
 }
 

@@ -25,8 +25,11 @@ struct LinuxPower {
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, PowerSettingsContract, LinuxPower);
 
-TEST(ComputerSleep, IsInForceAndKept) {
+struct PowerTest : testing::Test {
   PowerTree tree;
+};
+
+TEST_F(PowerTest, ComputerSleepIsInForceAndKept) {
   tree.turn(PowerSwitch::powerButtonSleep, true);
   const auto effect = tree.set(SleepTimer::computer, {20});
   EXPECT_EQ(effect.outcome, Outcome::applied);
@@ -37,8 +40,7 @@ TEST(ComputerSleep, IsInForceAndKept) {
             "[Login]\nHandlePowerKey=suspend\nIdleAction=suspend\nIdleActionSec=20min\n");
 }
 
-TEST(ComputerSleep, IsUndoneByALaterFile) {
-  PowerTree tree;
+TEST_F(PowerTest, ComputerSleepIsUndoneByALaterFile) {
   tree.write("/etc/systemd/logind.conf.d/70-other.conf", "[Login]\nIdleAction=ignore\n");
   const auto effect = tree.set(SleepTimer::computer, {30});
   EXPECT_EQ(effect.undoneBy, "/etc/systemd/logind.conf.d/70-other.conf");
@@ -58,8 +60,7 @@ TEST(ComputerSleep, NeedsAMachineThatCanSleep) {
   EXPECT_FALSE(sleepless.power().supports(PowerSwitch::powerButtonSleep, sleepless.mains));
 }
 
-TEST(DisplaySleep, AboveAnHourIsAWish) {
-  PowerTree tree;
+TEST_F(PowerTest, DisplaySleepAboveAnHourIsAWish) {
   const auto effect = tree.set(SleepTimer::display, {120});
   EXPECT_EQ(effect.outcome, Outcome::applied);
   EXPECT_EQ(effect.live, "60");
@@ -71,8 +72,7 @@ TEST(DisplaySleep, AboveAnHourIsAWish) {
   EXPECT_EQ(tree.set(SleepTimer::display, {5}).outcome, Outcome::notSupported);
 }
 
-TEST(HardDiskSleep, StopsEveryDiskWithAMotor) {
-  PowerTree tree;
+TEST_F(PowerTest, HardDiskSleepStopsEveryDiskWithAMotor) {
   for (const auto* disk : {"sdb", "sdc", "sdd"}) tree.addDisk(disk);
   tree.write("/sys/block/sdc/queue/rotational", "0\n");
   tree.write("/sys/block/sdd/device/scsi_disk/0:0:0:0/manage_runtime_start_stop", "0\n");
@@ -88,19 +88,17 @@ TEST(HardDiskSleep, StopsEveryDiskWithAMotor) {
               HasSubstr(R"(ATTR{device/power/autosuspend_delay_ms}="600000", ATTR{device/power/control}="auto")"));
 }
 
-TEST(HardDiskSleep, OfDisksThatDifferIsToldForEach) {
-  PowerTree tree;
+TEST_F(PowerTest, HardDiskSleepOfDisksThatDifferIsToldForEach) {
   tree.addDisk("sdb");
   tree.set(SleepTimer::hardDisk, {10});
   tree.write("/sys/block/sda/device/power/control", "on\n");
   EXPECT_EQ(tree.power().untilSleep(SleepTimer::hardDisk, tree.mains), Minutes{10});
-  EXPECT_EQ(tree.lastRead(), "10 on sdb, 0 on sda");
+  EXPECT_EQ(tree.log.values.back().live, "10 on sdb, 0 on sda");
   tree.set(SleepTimer::hardDisk, {10});
   EXPECT_EQ(tree.diskFile("sda", "power/control"), "auto");
 }
 
-TEST(WakeOnNetworkAccess, IsSetOnEveryCardThatCan) {
-  PowerTree tree;
+TEST_F(PowerTest, WakeOnNetworkAccessIsSetOnEveryCardThatCan) {
   tree.addCard("eth1", {{0x20, 0}});
   tree.addCard("eth2", {{0x01, 0}});
   tree.addCard("eth3", {{0x20, 0}});
@@ -115,8 +113,7 @@ TEST(WakeOnNetworkAccess, IsSetOnEveryCardThatCan) {
                 HasSubstr("[Link]\nWakeOnLan=magic\n"));
 }
 
-TEST(WakeOnNetworkAccess, IsReadBackFromCardsThatIgnoreIt) {
-  PowerTree tree;
+TEST_F(PowerTest, WakeOnNetworkAccessIsReadBackFromCardsThatIgnoreIt) {
   tree.addCard("eth1", {{0x20, 0x20}, false});
   const auto effect = tree.turn(PowerSwitch::wakeOnNetworkAccess, false);
   EXPECT_EQ(effect.outcome, Outcome::failed);
@@ -124,8 +121,7 @@ TEST(WakeOnNetworkAccess, IsReadBackFromCardsThatIgnoreIt) {
   EXPECT_TRUE(tree.power().isOn(PowerSwitch::wakeOnNetworkAccess, tree.mains));
 }
 
-TEST(WakeOnModem, SetsThePlaceOfThePortNotItsTerminal) {
-  PowerTree tree;
+TEST_F(PowerTest, WakeOnModemSetsThePlaceOfThePortNotItsTerminal) {
   tree.addPort("ttyS1", "00:05");
   tree.remove("/sys/devices/pnp0/00:05/power");
   const auto effect = tree.turn(PowerSwitch::wakeOnModem, true);
@@ -143,7 +139,7 @@ TEST(LinuxPower, RecordedMachinesChangeOnlyWhatCan) {
   for (const auto* card : {"eth0", "eth1", "eth2", "eth3", "eth4"})
     EXPECT_EQ(guest.cards.cards[card].modes.enabled, card == std::string("eth0") ? magicPacket : 0) << card;
   EXPECT_EQ(guest.file("/sys/devices/pnp0/00:03/power/wakeup"), "enabled");
-  EXPECT_FALSE(guest.delays().serviceOfClass("VelmarKCS"));
+  EXPECT_FALSE(guest.delays().serviceOfClass(controllerClass));
 
   PowerTree server("server.devices");
   server.set(SleepTimer::hardDisk, {5});
@@ -151,11 +147,10 @@ TEST(LinuxPower, RecordedMachinesChangeOnlyWhatCan) {
   EXPECT_EQ(server.file("/sys/block/sdb/device/power/control"), "on\n") << "it has no motor";
   for (const auto which : {PowerSwitch::wakeOnNetworkAccess, PowerSwitch::wakeOnModem})
     EXPECT_FALSE(server.power().supports(which, server.mains));
-  EXPECT_TRUE(server.delays().serviceOfClass("VelmarKCS"));
+  EXPECT_TRUE(server.delays().serviceOfClass(controllerClass));
 }
 
-TEST(RestartAfterPowerFailure, ComesFromTheController) {
-  PowerTree tree;
+TEST_F(PowerTest, RestartAfterPowerFailureComesFromTheController) {
   tree.controllerLink.policies = 0x03;
   tree.turn(PowerSwitch::restartAfterPowerFailure, true);
   EXPECT_EQ(tree.controllerLink.policy, 1) << "as before, where it cannot always turn on";
@@ -163,9 +158,8 @@ TEST(RestartAfterPowerFailure, ComesFromTheController) {
   EXPECT_TRUE(tree.power().supports(PowerSwitch::restartAfterPowerFailure, tree.mains)) << "it did not say";
 }
 
-TEST(RestartAfterPowerFailure, ComesFromTheFirmwareWithoutAController) {
+TEST_F(PowerTest, RestartAfterPowerFailureComesFromTheFirmwareWithoutAController) {
   const std::string attribute = "/sys/class/firmware-attributes/maker/attributes/PowerBack/";
-  PowerTree tree;
   tree.controllerLink.error = ENODEV;
   tree.write(attribute + "current_value", "Last\n");
   tree.write(attribute + "possible_values", "Stay Off;Start;Last\n");
@@ -176,11 +170,10 @@ TEST(RestartAfterPowerFailure, ComesFromTheFirmwareWithoutAController) {
   EXPECT_EQ(tree.file(attribute + "current_value"), "Stay Off");
 }
 
-TEST(RestartAfterFreeze, NeedsWatchdogAndKernel) {
-  PowerTree tree;
+TEST_F(PowerTest, RestartAfterFreezeNeedsWatchdogAndKernel) {
   tree.write("/proc/sys/kernel/panic", "5\n");
   EXPECT_TRUE(tree.power().restartsAfterFreeze());
-  EXPECT_EQ(tree.lastRead(), "on after a kernel panic only");
+  EXPECT_EQ(tree.log.values.back().live, "on after a kernel panic only");
   const auto effect = tree.setRestartsAfterFreeze(true);
   EXPECT_EQ(effect.outcome, Outcome::applied);
   EXPECT_EQ(effect.live, "on");
@@ -189,11 +182,10 @@ TEST(RestartAfterFreeze, NeedsWatchdogAndKernel) {
 
   tree.write("/sys/class/watchdog/watchdog0/state", "inactive\n");
   tree.power().restartsAfterFreeze();
-  EXPECT_EQ(tree.lastRead(), "on after a kernel panic only") << "the service manager could not open it";
+  EXPECT_EQ(tree.log.values.back().live, "on after a kernel panic only") << "the service manager could not open it";
 }
 
-TEST(RestartAfterFreeze, StaysWithAWatchdogThatCannotBeStopped) {
-  PowerTree tree;
+TEST_F(PowerTest, RestartAfterFreezeStaysWithAWatchdogThatCannotBeStopped) {
   tree.setRestartsAfterFreeze(true);
   tree.write("/sys/class/watchdog/watchdog0/state", "active\n");
   tree.write("/sys/class/watchdog/watchdog0/nowayout", "1\n");
@@ -204,21 +196,18 @@ TEST(RestartAfterFreeze, StaysWithAWatchdogThatCannotBeStopped) {
   EXPECT_EQ(effect.stored, "off");
 }
 
-TEST(RestartAfterFreeze, IsTurnedOffAfterARestartToo) {
-  PowerTree tree;
+TEST_F(PowerTest, RestartAfterFreezeIsTurnedOffAfterARestartToo) {
   tree.setRestartsAfterFreeze(true);
   tree.bus.startAgain();
   EXPECT_EQ(tree.setRestartsAfterFreeze(false).live, "off");
 }
 
-TEST(RestartAfterFreeze, IsUndoneByALaterFile) {
-  PowerTree tree;
+TEST_F(PowerTest, RestartAfterFreezeIsUndoneByALaterFile) {
   tree.write("/etc/sysctl.d/99-sysctl.conf", "# kernel.panic=10\nkernel.panic=0\n");
   EXPECT_EQ(tree.setRestartsAfterFreeze(true).stored, "on by the watchdog only");
 }
 
-TEST(RestartAfterFreeze, WithoutAWatchdogIsOfTheKernelAlone) {
-  PowerTree tree;
+TEST_F(PowerTest, RestartAfterFreezeWithoutAWatchdogIsOfTheKernelAlone) {
   tree.remove("/dev/watchdog0");
   const auto effect = tree.setRestartsAfterFreeze(true);
   EXPECT_EQ(effect.live, "on");
@@ -229,8 +218,7 @@ TEST(RestartAfterFreeze, WithoutAWatchdogIsOfTheKernelAlone) {
   EXPECT_EQ(tree.lastEffect().where, "") << "what is in force was read, not what is kept";
 }
 
-TEST(LinuxPower, WithoutServicesSaysWhatLasts) {
-  PowerTree tree;
+TEST_F(PowerTest, PowerSettingsWithoutServicesSaysWhatLasts) {
   tree.remove("/run/systemd/system");
   tree.remove("/run/udev/control");
   EXPECT_EQ(tree.set(SleepTimer::computer, {10}).outcome, Outcome::notSupported);
@@ -239,7 +227,6 @@ TEST(LinuxPower, WithoutServicesSaysWhatLasts) {
 }
 
 struct LinuxController {
-  static constexpr const char* className = "VelmarKCS";
   PowerController& service() { return tree.delays(); }
   void refuseDelays() { tree.controllerLink.delayRefusal = 0xC0; }
   const std::vector<Effect>& effects() { return tree.log.effects; }
@@ -247,70 +234,50 @@ struct LinuxController {
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, PowerControllerContract, LinuxController);
 
-/// Sets units through the whole conversation; the first status that is not 0.
-ControllerStatus setDelay(PowerTree& tree, std::uint8_t units) {
-  PropertyList::Dictionary properties;
-  properties.set("ServerID", PropertyList::Data{units});
-  const auto [status, connection] = tree.delays().open(tree.delays().serviceOfClass("VelmarKCS"), 0x0101FACE);
-  return status != 0 ? status : tree.delays().setProperties(connection, properties);
-}
-
-std::optional<std::int64_t> delayOf(PowerTree& tree) {
-  return tree.delays().numberProperty({"VelmarKCS"}, "ServerID");
-}
-
-TEST(LinuxPowerController, KeepsTheDelayInTheController) {
-  PowerTree tree;
-  EXPECT_EQ(setDelay(tree, 255), 0);
+TEST_F(PowerTest, ControllerKeepsTheDelayInTheController) {
+  EXPECT_EQ(setDelay(tree.delays(), 255), 0);
   EXPECT_EQ(tree.controllerLink.delay, (std::vector<std::uint8_t>{0x1D, 0xE2})) << "7650 seconds, high byte first";
-  EXPECT_EQ(delayOf(tree), 255);
+  EXPECT_EQ(delayOf(tree.delays()), 255);
   EXPECT_EQ(tree.log.values.back().unit, "units of 30 seconds");
 }
 
 TEST(LinuxPowerController, StatusesAreTheControllersAnswers) {
-  for (const auto& [code, status] : {std::pair(0xC0, EBUSY),
-                                     {0xC1, ENOSYS},
-                                     {0xC7, EINVAL},
-                                     {0xCC, EINVAL},
-                                     {0xD4, EACCES},
-                                     {0xC3, ETIMEDOUT},
-                                     {0xFF, EIO}}) {
+  const std::pair<std::uint8_t, int> cases[] = {{0xC0, EBUSY},  {0xC1, ENOSYS},    {0xC7, EINVAL}, {0xCC, EINVAL},
+                                                {0xD4, EACCES}, {0xC3, ETIMEDOUT}, {0xFF, EIO}};
+  for (const auto& [code, status] : cases) {
     PowerTree tree;
-    tree.controllerLink.delayRefusal = static_cast<std::uint8_t>(code);
-    EXPECT_EQ(setDelay(tree, 3), status);
+    tree.controllerLink.delayRefusal = code;
+    EXPECT_EQ(setDelay(tree.delays(), 3), status);
     EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
   }
 }
 
-TEST(LinuxPowerController, DoesNotGuessTheRequestsOfOtherMakers) {
-  PowerTree tree;
+TEST_F(PowerTest, ControllerDoesNotGuessTheRequestsOfOtherMakers) {
   tree.controllerLink.maker = 0x58;
-  EXPECT_EQ(setDelay(tree, 3), ENOSYS);
+  EXPECT_EQ(setDelay(tree.delays(), 3), ENOSYS);
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::notSupported);
   EXPECT_THAT(tree.lastEffect().failure->why, HasSubstr("manufacturer 344"));
-  EXPECT_EQ(delayOf(tree), std::nullopt);
+  EXPECT_EQ(delayOf(tree.delays()), std::nullopt);
 }
 
-TEST(LinuxPowerController, StatusesTellOfTheWayToTheController) {
-  PowerTree tree;
+TEST_F(PowerTest, ControllerStatusesTellOfTheWayToTheController) {
   tree.controllerLink.error = ETIMEDOUT;
-  EXPECT_EQ(setDelay(tree, 3), ETIMEDOUT);
+  EXPECT_EQ(setDelay(tree.delays(), 3), ETIMEDOUT);
   tree.remove("/sys/class/ipmi");
-  EXPECT_EQ(setDelay(tree, 3), ENODEV);
+  EXPECT_EQ(setDelay(tree.delays(), 3), ENODEV);
 }
 
-TEST(LinuxPowerController, TakesTheAdministratorsRequests) {
+TEST_F(PowerTest, ControllerTakesTheAdministratorsRequests) {
   constexpr const char* file = "/etc/tavisk/startup-delay.conf";
-  PowerTree tree;
   tree.controllerLink.maker = 0x58;
   tree.write(file, "# rack 7\nmanufacturer=344 netfn=0x30 set=0x54 width=2 order=little unit=10\n");
-  EXPECT_EQ(setDelay(tree, 100), 0);
+  EXPECT_EQ(setDelay(tree.delays(), 100), 0);
   EXPECT_EQ(tree.controllerLink.delay, (std::vector<std::uint8_t>{0x2C, 0x01}));
-  EXPECT_EQ(delayOf(tree), 100) << "a wish, as this controller does not tell";
+  EXPECT_EQ(delayOf(tree.delays()), 100) << "a wish, as this controller does not tell";
   for (const auto* line : {"manufacturer=344 netfn=0x30 set=0x54 width=1 order=little unit=1",
                            "manufacturer=344 netfn=0x30 set=0x54 width=2 order=little unit=7"}) {
     tree.write(file, line);
-    EXPECT_EQ(setDelay(tree, 100), EINVAL) << line;
+    EXPECT_EQ(setDelay(tree.delays(), 100), EINVAL) << line;
   }
   for (const auto* line : {"manufacturer=344 netfn=0x30 set=0x154 width=2 order=big unit=1",
                            "manufacturer=344 netfn=0x30 set=0x54 width=5 order=big unit=1",
@@ -318,7 +285,7 @@ TEST(LinuxPowerController, TakesTheAdministratorsRequests) {
                            "manufacturer=344 netfn=0x30 set=0x54 width=2 order=big unit=0",
                            "manufacturer=344 netfn=0x30 set=0x54 width=2 order=big unit=1 more=1"}) {
     tree.write(file, line);
-    EXPECT_EQ(setDelay(tree, 100), ENOSYS) << line;
+    EXPECT_EQ(setDelay(tree.delays(), 100), ENOSYS) << line;
     EXPECT_THAT(tree.lastEffect().failure->why, HasSubstr("not understood")) << line;
   }
 }

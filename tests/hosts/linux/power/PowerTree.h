@@ -99,13 +99,11 @@ class PowerTree : public LinuxTree {
   }
 
   void addServices() {
-    write("/run/systemd/system/mark", "");
-    write("/run/udev/control", "");
-    write("/dev/tty1", "");
-    write("/dev/watchdog0", "");
-    write("/sys/module/kernel/parameters/consoleblank", "0\n");
-    write("/proc/sys/kernel/panic", "0\n");
-    write("/sys/bus/acpi/devices/LNXPWRBN:00/path", "");
+    for (const auto* mark : {"/run/systemd/system/mark", "/run/udev/control", "/dev/tty1", "/dev/watchdog0",
+                             "/sys/bus/acpi/devices/LNXPWRBN:00/path"})
+      write(mark, "");
+    for (const auto* number : {"/sys/module/kernel/parameters/consoleblank", "/proc/sys/kernel/panic"})
+      write(number, "0\n");
   }
 
   void addDisk(const std::string& name) {
@@ -157,9 +155,6 @@ class PowerTree : public LinuxTree {
     _power.setRestartsAfterFreeze(restarts);
     return lastEffect();
   }
-  Effect lastEffect() const { return log.effects.empty() ? Effect{} : log.effects.back(); }
-  /// How the last value that was read is told.
-  std::string lastRead() const { return log.values.empty() ? "" : log.values.back().live.value_or(""); }
 
   const PowerSource mains{"AC Power"};
 

@@ -3,7 +3,6 @@
 #include <gmock/gmock.h>
 
 #include "effects/EffectMatchers.h"
-#include "hosts/linux/FakeServiceManager.h"
 #include "hosts/linux/LinuxContractMachines.h"
 
 namespace tavisk {
@@ -12,19 +11,17 @@ namespace {
 using testing::ElementsAre;
 using Fault = FakeServiceManager::Fault;
 
-/// A machine whose message bus is down, with a service manager and chrony.
-class ManagedTree : public LinuxTree {
- public:
-  ManagedTree() : manager((write("/run/systemd/system/x", ""), at("/run/systemd/private"))) { haveChrony(*this); }
+struct ChronyUnits : ManagedTree {
+  ChronyUnits() { haveChrony(*this); }
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(LinuxWithUnits, NetworkTimeContract, NetworkTimeOf<ChronyUnits>);
 
-  FakeServiceManager manager;
+struct UnitDaemonsTest : testing::Test {
+  ChronyUnits tree;
+  NetworkTimeService& client = tree.host().networkTime();
 };
 
-INSTANTIATE_TYPED_TEST_SUITE_P(LinuxWithUnits, NetworkTimeContract, NetworkTimeOf<ManagedTree>);
-
-TEST(UnitDaemons, EnablesAndReloadsBeforeItStarts) {
-  ManagedTree tree;
-  auto& client = tree.host().networkTime();
+TEST_F(UnitDaemonsTest, EnablesAndReloadsBeforeItStarts) {
   client.setLaunchAtStartup(true);
   client.start();
   client.stop();
@@ -32,9 +29,7 @@ TEST(UnitDaemons, EnablesAndReloadsBeforeItStarts) {
                                                 "StopUnit chrony.service"));
 }
 
-TEST(UnitDaemons, PrefersTheFirstThatIsNotMasked) {
-  ManagedTree tree;
-  auto& client = tree.host().networkTime();
+TEST_F(UnitDaemonsTest, PrefersTheFirstThatIsNotMasked) {
   tree.manager.set("ntpsec.service", {.active = "activating"});
   EXPECT_FALSE(client.isRunning()) << "chrony comes first";
   tree.manager.set(chrony, {.load = "masked"});
@@ -43,19 +38,17 @@ TEST(UnitDaemons, PrefersTheFirstThatIsNotMasked) {
   EXPECT_FALSE(client.isRunning());
 }
 
-TEST(UnitDaemons, TellWhichUnitFilesCannotBeEnabled) {
-  ManagedTree tree;
+TEST_F(UnitDaemonsTest, TellWhichUnitFilesCannotBeEnabled) {
   tree.manager.breakNext("EnableUnitFiles", Fault::error);
-  tree.host().networkTime().setLaunchAtStartup(true);
+  client.setLaunchAtStartup(true);
   EXPECT_THAT(tree.lastEffect(), FailedFor("EnableUnitFiles on chrony.service"));
   EXPECT_EQ(tree.lastEffect().failure->code, BusErrorCode::accessDenied);
 }
 
-TEST(UnitDaemons, RestartsOtherClientsWithoutWaiting) {
-  ManagedTree tree;
+TEST_F(UnitDaemonsTest, RestartsOtherClientsWithoutWaiting) {
   tree.manager.set(chrony, {.load = "not-found"});
   tree.manager.set("systemd-timesyncd.service", {.active = "active", .jobResult = ""});
-  tree.host().networkTime().restartAsynchronously();
+  client.restartAsynchronously();
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_THAT(tree.manager.calls(), ElementsAre("TryRestartUnit systemd-timesyncd.service"));
 }
@@ -70,7 +63,7 @@ TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
       {{}, Fault::hangUp, "Connection"},
   };
   for (const auto& [unit, fault, why] : cases) {
-    ManagedTree tree;
+    ChronyUnits tree;
     tree.manager.set(chrony, unit);
     if (fault) tree.manager.breakNext("StartUnit", *fault);
     tree.host().networkTime().start();
@@ -80,11 +73,10 @@ TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
   }
 }
 
-TEST(UnitDaemons, WaitOnceForAManagerThatIsSilent) {
-  ManagedTree tree;
+TEST_F(UnitDaemonsTest, WaitOnceForAManagerThatIsSilent) {
   const auto began = RunLoop::Clock::now();
   tree.manager.breakNext("LoadUnit", Fault::silence);
-  tree.host().networkTime().start();
+  client.start();
   EXPECT_THAT(tree.lastEffect(), FailedFor("answer"));
   EXPECT_LT(RunLoop::Clock::now() - began, Bus::usualTime + std::chrono::milliseconds(500));
 }

@@ -2,9 +2,9 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 #include <sys/socket.h>
-#include <sys/un.h>
 #include <unistd.h>
 
+#include "hosts/linux/BusPeer.h"
 #include "hosts/linux/LinuxTree.h"
 
 namespace tavisk {
@@ -13,34 +13,20 @@ namespace {
 using testing::AllOf, testing::EndsWith, testing::HasSubstr, testing::IsEmpty, testing::MatchesRegex, testing::Not;
 
 /// A log daemon's socket.
-class LogSocket {
- public:
-  explicit LogSocket(const std::filesystem::path& path) : _socket(::socket(AF_UNIX, SOCK_DGRAM | SOCK_NONBLOCK, 0)) {
-    std::filesystem::create_directories(path.parent_path());
-    sockaddr_un address{};
-    address.sun_family = AF_UNIX;
-    path.string().copy(address.sun_path, sizeof address.sun_path - 1);
-    if (::bind(_socket, reinterpret_cast<sockaddr*>(&address), sizeof address) != 0) throw std::runtime_error("bind");
-  }
-  LogSocket(const LogSocket&) = delete;
-  LogSocket& operator=(const LogSocket&) = delete;
-  ~LogSocket() { ::close(_socket); }
-
+struct LogSocket {
   /// The next entry; empty when there is none.
-  std::string next() {
+  std::string next() const {
     std::string datagram(65536, '\0');
-    auto length = ::recv(_socket, datagram.data(), datagram.size(), 0);
+    const auto length = ::recv(socket.number(), datagram.data(), datagram.size(), MSG_DONTWAIT);
     return datagram.substr(0, length < 0 ? 0 : static_cast<std::size_t>(length));
   }
-
- private:
-  int _socket;
+  FileDescriptor socket;
 };
 
 TEST(JournalLog, TellsAChangeFieldByField) {
   LinuxTree tree;
-  LogSocket journal(tree.at("/run/systemd/journal/socket"));
-  LogSocket syslog(tree.at("/dev/log"));
+  const LogSocket journal{socketAt(tree.at("/run/systemd/journal/socket"), SOCK_DGRAM)};
+  const LogSocket syslog{socketAt(tree.at("/dev/log"), SOCK_DGRAM)};
   tree.write("/proc/self/loginuid", "1000");
   tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif2");
   tree.host().clock().setTimeZone({"Europe/Paris"});
@@ -59,7 +45,7 @@ TEST(JournalLog, TellsAChangeFieldByField) {
 
 TEST(JournalLog, LetsNoForeignTextMakeFieldsOrControlATerminal) {
   LinuxTree tree;
-  LogSocket journal(tree.at("/run/systemd/journal/socket"));
+  const LogSocket journal{socketAt(tree.at("/run/systemd/journal/socket"), SOCK_DGRAM)};
   tree.host().clock().setTimeZone({"x\nPRIORITY=0\n\x1b[2J\xff"});
   journal.next();
   EXPECT_THAT(journal.next(),
@@ -69,7 +55,7 @@ TEST(JournalLog, LetsNoForeignTextMakeFieldsOrControlATerminal) {
 TEST(SystemLog, GoesToSyslogWithoutAJournal) {
   LinuxTree tree;
   tree.host().systemLog().write("heard by nobody");
-  LogSocket syslog(tree.at("/dev/log"));
+  const LogSocket syslog{socketAt(tree.at("/dev/log"), SOCK_DGRAM)};
   tree.host().systemLog().write("two\nlines\n");
   EXPECT_THAT(syslog.next(), MatchesRegex(R"(<30>[A-Z][a-z]{2} [ 0-9]{2} [0-9:]{8} tavisk\[[0-9]+\]: two\\nlines)"));
   EXPECT_THAT(syslog.next(), IsEmpty());
