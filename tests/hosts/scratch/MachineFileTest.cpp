@@ -7,9 +7,12 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <set>
+
 #include "OwnMounts.h"
 #include "ScratchMachine.h"
-#include "effects/EffectLog.h"
+#include "base/Text.h"
+#include "hosts/scratch/KeyTable.h"
 #include "hosts/scratch/MachineFile.h"
 
 namespace tavisk {
@@ -19,6 +22,31 @@ using namespace std::chrono_literals;
 using testing::ElementsAre;
 using testing::HasSubstr;
 using testing::IsEmpty;
+
+/// What an absent key reads as, as the services read it.
+std::string readAbsent(const KeyRow& row) {
+  const MachineSection absent(std::string(row.place), nullptr);
+  if (row.type == KeyType::boolean) return absent.boolean(row.key) ? "true" : "false";
+  if (row.type == KeyType::integer) return std::to_string(absent.integer(row.key));
+  return absent.text(row.key);
+}
+
+TEST(KeyTable, hasDefaultsOfTheTypesOfTheirKeys) {
+  for (const auto& row : keyTable()) {
+    if (!row.otherwise) continue;
+    EXPECT_EQ(readAbsent(row), *row.otherwise) << row.place << "/" << row.key;
+  }
+}
+
+TEST(KeyTable, hasEachKeyOnceInAPlaceThatItHasToo) {
+  std::set<std::string> known{""};
+  for (const auto& row : keyTable()) {
+    EXPECT_TRUE(known.contains(std::string(row.place))) << row.place;
+    const auto key = placeUnder(row);
+    EXPECT_TRUE(known.insert(key).second) << key;
+    if (row.type == KeyType::dictionaries) known.insert(key + "/*");
+  }
+}
 
 class MachineFileTest : public testing::Test {
  protected:
@@ -39,6 +67,13 @@ class MachineFileTest : public testing::Test {
     work();
     ::_exit(0);
   }
+  void inSmallFileSystem(const std::function<void()>& work) {
+    const bool ran = withOwnMounts([&] {
+      ASSERT_TRUE(mountMemory(machine.directory(), "64k"));
+      work();
+    });
+    if (!ran) GTEST_SKIP() << "may not have mounts of its own";
+  }
   std::vector<std::string> names() { return SystemRoot(machine.directory()).list("/").valueOr({}); }
 
   ScratchMachine machine;
@@ -54,52 +89,49 @@ MachineFile::Edit countTwice(int times = 1) {
   };
 }
 
+PropertyList under(const std::string& key, PropertyList value) {
+  PropertyList::Dictionary dictionary;
+  dictionary.set(key, std::move(value));
+  return dictionary;
+}
+
 std::string plist(const std::string& inside) {
   return "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<plist version=\"1.0\">\n" + inside + "</plist>\n";
 }
 
 TEST_F(MachineFileTest, refusesValuesOfAWrongTypeByFileKeyAndExpectation) {
-  using Dictionary = PropertyList::Dictionary;
-  auto nested = [](std::initializer_list<const char*> keys, PropertyList value) {
-    for (auto key = std::rbegin(keys); key != std::rend(keys); ++key) {
-      Dictionary outer;
-      outer.set(*key, std::move(value));
-      value = std::move(outer);
-    }
-    return value;
+  const PropertyList::Array mixed{PropertyList(1), PropertyList("two")};
+  const std::tuple<const char*, PropertyList, const char*> cases[] = {
+      {"Clock", "noon", ": expected a dictionary"},
+      {"Clock|Time", "noon", ": expected an integer"},
+      {"Network Time|Running", 1, ": expected a boolean"},
+      {"Refusals|Time", true, ": expected a string"},
+      {"User|Groups", mixed, ": expected an array of integers"},
+      {"Clock|Known Time Zones", mixed, ": expected an array of strings"},
+      {"User Defaults|SDWirestartScanInterval", "1", ": expected a number"},
+      {"Power Sources|AC Power|Wake On LAN", 1, ": expected a boolean"},
+      {"Registry|Device Tree|/pci/eth|mac", "00", ": expected data"},
+      {"Firmware|Boot Preference|Lumara 9", 9, ": expected a boolean"},
+      {"Signals", mixed, ": expected an array of dictionaries"},
+      {"Signals", PropertyList::Array{under("Process", 1), under("Process", "sshd")},
+       " 2 \"Process\": expected an integer"},
+      {"Registry|Services|BMC|ServerID", "x", nullptr},
+      {"Unknown|Time", "noon", nullptr},
+      {"User Defaults|SDWirestartScanInterval", 1, nullptr},
   };
-  PropertyList::Array mixed{PropertyList(1), PropertyList("two")};
-  PropertyList::Array signals{nested({"Process"}, 1), nested({"Process"}, "sshd")};
-  const std::pair<PropertyList, const char*> cases[] = {
-      {nested({"Clock"}, "noon"), R"("Clock": expected a dictionary)"},
-      {nested({"Clock", "Time"}, "noon"), R"("Clock" "Time": expected an integer)"},
-      {nested({"Network Time", "Running"}, 1), R"("Network Time" "Running": expected a boolean)"},
-      {nested({"Refusals", "Time"}, true), R"("Refusals" "Time": expected a string)"},
-      {nested({"User", "Groups"}, mixed), R"("User" "Groups": expected an array of integers)"},
-      {nested({"Clock", "Known Time Zones"}, mixed), R"("Clock" "Known Time Zones": expected an array of strings)"},
-      {nested({"User Defaults", "SDWirestartScanInterval"}, "1"),
-       R"("User Defaults" "SDWirestartScanInterval": expected a number)"},
-      {nested({"Power Sources", "AC Power", "Wake On LAN"}, 1),
-       R"("Power Sources" "AC Power" "Wake On LAN": expected a boolean)"},
-      {nested({"Registry", "Device Tree", "/pci/eth", "mac"}, "00"),
-       R"("Registry" "Device Tree" "/pci/eth" "mac": expected data)"},
-      {nested({"Firmware", "Boot Preference", "Lumara 9"}, 9),
-       R"("Firmware" "Boot Preference" "Lumara 9": expected a boolean)"},
-      {nested({"Signals"}, mixed), R"("Signals": expected an array of dictionaries)"},
-      {nested({"Signals"}, signals), R"("Signals" 2 "Process": expected an integer)"},
-      {PropertyList("machine"), "expected a dictionary"},
-      {nested({"Registry", "Services", "BMC", "ServerID"}, "x"), nullptr},
-      {nested({"Unknown", "Time"}, "noon"), nullptr},
-      {nested({"User Defaults", "SDWirestartScanInterval"}, 1), nullptr},
-  };
-  for (const auto& [list, why] : cases) {
+  for (const auto& [place, value, why] : cases) {
+    auto list = value;
+    std::string where;
+    const auto keys = split(place, "|");
+    for (const auto& key : keys) where += " \"" + key + "\"";
+    for (auto key = keys.rbegin(); key != keys.rend(); ++key) list = under(*key, list);
     machine.describe(*writePropertyList(list));
-    EXPECT_EQ(whyNotOpened(), why ? path() + ": " + why : "opened");
+    EXPECT_EQ(whyNotOpened(), why ? path() + ":" + where + why : "opened");
   }
 }
 
-TEST_F(MachineFileTest, refusesWhatIsNoPropertyList) {
-  for (const char* text : {"", "<plist><dict>"}) {
+TEST_F(MachineFileTest, refusesWhatIsNoPropertyListOfADictionary) {
+  for (const auto& text : {std::string(), std::string("<plist><dict>"), plist("<string>machine</string>")}) {
     machine.describe(text);
     EXPECT_THAT(whyNotOpened(), HasSubstr("/machine.plist: "));
   }
@@ -177,9 +209,6 @@ class ObservedMachineTest : public MachineFileTest {
       changes.emplace_back(before->size(), now->size());
     });
   }
-  bool isTold() {
-    return machine.runLoop.runUntil(RunLoop::Clock::now() + 5s, [&] { return !changes.empty(); });
-  }
 
   std::unique_ptr<MachineFile> file = open();
   MachineFile::Contents told = file->contents();
@@ -190,17 +219,7 @@ class ObservedMachineTest : public MachineFileTest {
 TEST_F(ObservedMachineTest, tellsWhatChangedBeforeTheObservationBegan) {
   machine.set("Clock", "Time", 1);
   observe();
-  EXPECT_TRUE(isTold());
-  EXPECT_THAT(changes, ElementsAre(std::pair(0, 1)));
-}
-
-TEST_F(ObservedMachineTest, tellsWhatOthersChangeOnceItCanBeRead) {
-  observe();
-  machine.runLoop.runPass();
-  machine.describe("not yet");
-  machine.runLoop.runPass();
-  machine.describe(plist("<dict><key>Mine</key><true/></dict>"));
-  EXPECT_TRUE(isTold());
+  EXPECT_TRUE(machine.runLoop.runUntil(RunLoop::Clock::now() + 5s, [&] { return !changes.empty(); }));
   EXPECT_THAT(changes, ElementsAre(std::pair(0, 1)));
 }
 
@@ -247,27 +266,10 @@ TEST_F(MachineFileTest, isWholeWheneverItsWriterIsKilled) {
   EXPECT_THAT(names(), ElementsAre("machine.lock", "machine.plist"));
 }
 
-/// Another run that keeps the machine locked.
-class LockedMachineTest : public MachineFileTest {
- protected:
-  LockedMachineTest() : other(::open((machine.directory() + "/machine.lock").c_str(), O_RDONLY | O_CREAT, 0644)) {
-    EXPECT_EQ(::flock(other.number(), LOCK_EX), 0);
-  }
-  FileDescriptor other;
-};
-
-TEST_F(LockedMachineTest, isWaitedFor) {
+TEST_F(MachineFileTest, isNotWaitedForLongOnOtherThreads) {
   const auto file = open();
-  std::thread release([&] {
-    std::this_thread::sleep_for(100ms);
-    ::flock(other.number(), LOCK_UN);
-  });
-  EXPECT_TRUE(file->change(countTwice()));
-  release.join();
-}
-
-TEST_F(LockedMachineTest, isNotWaitedForLongOnOtherThreads) {
-  const auto file = open();
+  const FileDescriptor other(::open((machine.directory() + "/machine.lock").c_str(), O_RDONLY | O_CREAT, 0644));
+  ASSERT_EQ(::flock(other.number(), LOCK_EX), 0);
   std::thread([&] {
     const auto before = RunLoop::Clock::now();
     EXPECT_THAT(file->change(countTwice()).failure().why, HasSubstr("another run"));
@@ -275,42 +277,20 @@ TEST_F(LockedMachineTest, isNotWaitedForLongOnOtherThreads) {
   }).join();
 }
 
-/// Does the work on a machine in a file system of its own, and tells the host's effects there.
-void withSmallMachine(const ScratchMachine& machine, const std::function<void(Host& host, EffectLog& told)>& work) {
-  const bool ran = withOwnMounts([&] {
-    ASSERT_TRUE(mountMemory(machine.directory(), "64k"));
-    EffectSink effects;
-    EffectLog told;
-    effects.addChannel(told);
-    RunLoop runLoop;
-    const auto host = ScratchHost::open(machine.directory(), effects, runLoop);
-    work(**host, told);
-  });
-  if (!ran) GTEST_SKIP() << "may not have mounts of its own";
-}
-
-TEST_F(MachineFileTest, saysWhenThereIsNoRoomForAChange) {
-  withSmallMachine(machine, [](Host& host, EffectLog& told) {
-    host.networkTime().setServer({"old.example"});
-    host.networkTime().setServer({std::string(70'000, 'x')});
-    EXPECT_EQ(told.effects.back().failure->code, std::errc::no_space_on_device);
-    EXPECT_EQ(host.networkTime().server().address, "old.example");
-  });
-}
-
 TEST_F(MachineFileTest, saysWhenItMayNotBeWritten) {
-  withSmallMachine(machine, [&](Host& host, EffectLog& told) {
+  inSmallFileSystem([&] {
+    machine.host();
     ASSERT_EQ(::mount("", machine.directory().c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
-    host.networkTime().start();
-    EXPECT_EQ(told.effects.back().failure->code, std::errc::read_only_file_system);
-    EXPECT_FALSE(host.networkTime().isRunning());
+    machine.host().networkTime().start();
+    EXPECT_EQ(machine.log.effects.back().failure->code, std::errc::read_only_file_system);
+    EXPECT_FALSE(machine.host().networkTime().isRunning());
   });
 }
 
 TEST_F(MachineFileTest, leavesNoHalfLineInTheSystemLog) {
-  withSmallMachine(machine, [&](Host& host, EffectLog& /*told*/) {
+  inSmallFileSystem([&] {
     for (const auto& message : {std::string("first"), std::string(70'000, 'x'), std::string("last")})
-      host.systemLog().write(message);
+      machine.host().systemLog().write(message);
     EXPECT_THAT(machine.systemLog(), ElementsAre("first", "last"));
   });
 }

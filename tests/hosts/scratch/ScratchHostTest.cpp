@@ -5,7 +5,9 @@
 #include "platform/BootLoaderFileContract.h"
 #include "platform/ClockContract.h"
 #include "platform/DiskEventsContract.h"
+#include "platform/DiskManagementContract.h"
 #include "platform/HostNamesContract.h"
+#include "platform/IORegistryContract.h"
 #include "platform/NetworkTimeContract.h"
 #include "platform/PowerControllerContract.h"
 #include "platform/PowerSettingsContract.h"
@@ -17,22 +19,24 @@ namespace {
 
 using testing::ElementsAre;
 
-struct ScratchAuthenticator {
-  AdminAuthenticator& service() { return machine.host().authenticator(); }
+/// One service of a rehearsed machine.
+template <auto Service>
+struct ScratchService {
+  auto& service() { return (machine.host().*Service)(); }
+  const std::vector<Effect>& effects() { return machine.log.effects; }
   ScratchMachine machine;
 };
+
+using ScratchAuthenticator = ScratchService<&Host::authenticator>;
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, AdminAuthenticatorContract, ScratchAuthenticator);
 
-struct ScratchClock {
+struct ScratchClock : ScratchService<&Host::clock> {
   static constexpr bool setsClock = true;
-  ClockService& service() { return machine.host().clock(); }
   void haveZones(const std::vector<ZoneName>& zones) {
     PropertyList::Array known;
     for (const auto& zone : zones) known.push_back(zone.text);
     machine.set("Clock", "Known Time Zones", known);
   }
-  const std::vector<Effect>& effects() { return machine.log.effects; }
-  ScratchMachine machine;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, ClockContract, ScratchClock);
 
@@ -79,23 +83,55 @@ class ScratchDiskEvents {
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, DiskEventsContract, ScratchDiskEvents);
 
-struct ScratchNetworkTime {
+PropertyList::Dictionary keys(std::initializer_list<PropertyList::Dictionary::Entry> entries) {
+  PropertyList::Dictionary keys;
+  for (const auto& [key, value] : entries) keys.set(key, value);
+  return keys;
+}
+
+struct ScratchDiskMachine : ScratchService<&Host::diskManagement> {
+  static constexpr bool maySet = true;
+  ScratchDiskMachine() {
+    machine.set("Disks", inside.text, keys({}));
+    machine.set("Disks", stick.text, keys({{"Internal", false}, {"Protocol", "USB"}, {"Scheme", 1}}));
+    machine.set("Disks", disc.text,
+                keys({{"DVD", true}, {"Optical", true}, {"Optical Bootable", true}, {"Scheme", 0}}));
+    machine.set("Disks", image.text, keys({{"Internal", false}, {"Protocol", "Disk Image"}, {"Scheme", 0}}));
+  }
+  void refuseSets() {
+    machine.refuse("Startup Disk", "locked");
+    machine.refuse("Firmware Variable SecureBoot", "locked");
+  }
+  std::optional<PropertyList> kept() { return machine.description().dictionary("Firmware"); }
+  std::string variable(const char* name) {
+    return *machine.get("Firmware", "Variables")->asDictionary()->find(name)->asString();
+  }
+
+  const DiskName inside{"disk0"};
+  const DiskName stick{"disk1"};
+  const DiskName disc{"disk2"};
+  const DiskName image{"disk3"};
+  EffectLog& log = machine.log;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, DiskManagementContract, ScratchDiskMachine);
+
+struct ScratchRegistry : ScratchService<&Host::registry> {
+  void haveTree(const char* property, const IORegistry::Data& value) {
+    machine.set("Registry", "Device Tree", keys({{"/", keys({{property, value}})}}));
+  }
+  void haveInterface(const char* name, const char* path) {
+    machine.set("Registry", "Interfaces", keys({{name, keys({{"Path", path}})}}));
+  }
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, IORegistryContract, ScratchRegistry);
+
+struct ScratchNetworkTime : ScratchService<&Host::networkTime> {
   static constexpr bool takesAnyText = true;
-  NetworkTimeService& service() { return machine.host().networkTime(); }
   bool launchesAtStartup() { return machine.get("Network Time", "Launch At Startup") == PropertyList(true); }
-  ScratchMachine machine;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, NetworkTimeContract, ScratchNetworkTime);
 
-struct ScratchRemoteShell {
-  RemoteShellService& service() { return machine.host().remoteShell(); }
-  ScratchMachine machine;
-};
-struct ScratchRemoteEvents {
-  RemoteEventsService& service() { return machine.host().remoteEvents(); }
-  ScratchMachine machine;
-};
-using ScratchRemoteAccess = testing::Types<ScratchRemoteShell, ScratchRemoteEvents>;
+using ScratchRemoteAccess = testing::Types<ScratchService<&Host::remoteShell>, ScratchService<&Host::remoteEvents>>;
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, RemoteAccessContract, ScratchRemoteAccess);
 
 struct ScratchNames {
@@ -113,51 +149,30 @@ struct ScratchPreferences {
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PreferencesContract, ScratchPreferences);
 
-struct ScratchPower {
+struct ScratchPower : ScratchService<&Host::powerSettings> {
   static constexpr const char* keys[] = {"Wake On Ring", "Wake On LAN", "Auto Restart", "Power Button Sleep"};
   ScratchPower() {
     for (const char* key : keys) source.set(key, false);
     machine.set("Power Sources", "AC Power", source);
   }
-  PowerSettingsService& service() { return machine.host().powerSettings(); }
   void lack(PowerSwitch which) {
     source.remove(keys[static_cast<int>(which)]);
     machine.set("Power Sources", "AC Power", source);
   }
-  ScratchMachine machine;
   PropertyList::Dictionary source;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PowerSettingsContract, ScratchPower);
 
-struct ScratchController {
+struct ScratchController : ScratchService<&Host::powerController> {
   static constexpr const char* className = "VelmarKCS";
-  ScratchController() {
-    PropertyList::Dictionary service;
-    service.set("ServerID", 0);
-    describe(service);
-  }
-  PowerController& service() { return machine.host().powerController(); }
-  void refuseDelays() {
-    auto described = machine.description();
-    auto service = described.dictionary("Registry").dictionary("Services").dictionary(className);
-    service.set("Set Status", 5);
-    describe(service);
-  }
-  const std::vector<Effect>& effects() { return machine.log.effects; }
-  void describe(const PropertyList::Dictionary& service) {
-    PropertyList::Dictionary services;
-    services.set(className, service);
-    machine.set("Registry", "Services", services);
-  }
-  ScratchMachine machine;
+  ScratchController() { machine.set("Registry", "Services", keys({{className, keys({{"ServerID", 0}})}})); }
+  void refuseDelays() { machine.refuse(setting::startupDelay, "locked"); }
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PowerControllerContract, ScratchController);
 
-struct ScratchBootLoader {
-  BootLoaderFile& service() { return machine.host().bootLoaderFile(); }
+struct ScratchBootLoader : ScratchService<&Host::bootLoaderFile> {
   void put(const std::string& path, const char* contents) { machine.writeFile(path, contents); }
   std::string file(const std::string& path) { return machine.file(path); }
-  ScratchMachine machine;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, BootLoaderFileContract, ScratchBootLoader);
 

@@ -38,10 +38,6 @@ class DiskTree : public LinuxTree {
     write("/sys" + path + "/partition", std::to_string(partition) + "\n");
     write("/sys" + path + "/start", std::to_string(start) + "\n");
   }
-  void removeDevice(const std::string& name, const std::string& number) {
-    std::filesystem::remove(at("/sys/class/block/" + name));
-    std::filesystem::remove(at("/sys/dev/block/" + number));
-  }
   void setSubsystem(const std::string& path, const std::string& name) {
     link("/sys" + path + "/subsystem", "/sys/bus/" + name);
   }
@@ -56,6 +52,14 @@ class DiskTree : public LinuxTree {
     write("/dev/" + name, "");
     std::filesystem::resize_file(at("/dev/" + name), size * 512);
     return at("/dev/" + name);
+  }
+
+  /// An image whose old partition table has the signature 11223344 and one partition: 2048 units from 2048 on.
+  void addMbr(const std::string& name, std::uint64_t size, char type) {
+    std::fstream file(addImage(name, size), std::ios::binary | std::ios::in | std::ios::out);
+    file.seekp(440).write("\x44\x33\x22\x11", 4);
+    file.seekp(446).write("\x80\0\0\0\x0c\0\0\0\0\x08\0\0\0\x08\0\0", 16);
+    file.seekp(450).put(type).seekp(510).write("\x55\xaa", 2);
   }
 
   /// One more mount, of a device by its number.

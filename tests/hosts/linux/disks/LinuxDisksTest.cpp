@@ -6,7 +6,7 @@
 #include "OwnMounts.h"
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/disks/DiskTree.h"
-#include "hosts/linux/disks/LinuxDiskQueries.h"
+#include "hosts/linux/disks/LinuxDisks.h"
 #include "platform/DiskEventsContract.h"
 
 namespace tavisk {
@@ -111,23 +111,6 @@ class ServerDisks : public DiskTree {
   std::shared_ptr<const DiskDescription> describe(const std::string& disk) {
     return host().diskEvents().description({disk});
   }
-  /// As LinuxHost has them; they read the same tree.
-  LinuxDisks& disks() {
-    queries();
-    return *_disks;
-  }
-  LinuxDiskQueries& queries() {
-    if (!_queries)
-      _queries.emplace(_disks.emplace(_machine.emplace(LinuxMachine{*_root, effects, runLoop, *_services})));
-    return *_queries;
-  }
-
- private:
-  std::optional<SystemRoot> _root{at("/")};
-  std::optional<ServiceAccess> _services{std::in_place, *_root, runLoop};
-  std::optional<LinuxMachine> _machine;
-  std::optional<LinuxDisks> _disks;
-  std::optional<LinuxDiskQueries> _queries;
 };
 
 TEST(LinuxDisks, DescribesWhatTheDeviceManagerKnows) {
@@ -170,7 +153,7 @@ TEST(LinuxDisks, ReadsTheDiskWhereNoDeviceManagerRuns) {
   EXPECT_TRUE(start->volumeMountable);
   EXPECT_EQ(tree.describe("sda")->mediaContent, "gpt");
   EXPECT_FALSE(tree.describe("sda")->volumeMountable);
-  EXPECT_EQ(tree.queries().partitionScheme({"sda1"}), 2);
+  EXPECT_EQ(tree.host().diskManagement().partitionScheme({"sda1"}), 2);
 
   // Mounted and not to be read: what the mount table says is left, and the failure is told.
   EXPECT_EQ(tree.describe("sda2")->volumeKind, "ext4");
@@ -205,7 +188,10 @@ TEST(LinuxDisks, FindsTheDiskOfAnyPath) {
 
 TEST(LinuxDisks, NoticesAtAMountWhatCameWithoutAnEvent) {
   ServerDisks tree;
-  auto& disks = tree.disks();
+  const SystemRoot root(tree.at("/"));
+  ServiceAccess services(root, tree.runLoop);
+  const LinuxMachine machine{root, tree.effects, tree.runLoop, services};
+  LinuxDisks disks(machine);
   tree.know("8:1", "E:ID_FS_TYPE=vfat\n");
   ASSERT_TRUE(disks.find({"sda1"}));
   EXPECT_EQ(disks.find({"sda1"})->volumeKind, "msdos");
@@ -221,49 +207,21 @@ TEST(LinuxDisks, NoticesAtAMountWhatCameWithoutAnEvent) {
   EXPECT_EQ(disks.find({"sdc"})->volumePath, "/second");
 }
 
-TEST(LinuxDiskQueries, AnswerForAPartitionAsForItsDisk) {
+TEST(LinuxDisks, AnswerForAPartitionAsForItsDisk) {
   ServerDisks tree;
   tree.know("8:0", "E:ID_PART_TABLE_TYPE=dos\n");
-  auto& queries = tree.queries();
+  auto& queries = tree.host().diskManagement();
   EXPECT_TRUE(queries.is(DiskTrait::internal, {"sda2"}));
   EXPECT_EQ(queries.protocolOf({"sda2"}), "SATA");
   EXPECT_EQ(queries.partitionScheme({"sda2"}), 3);
 }
 
-TEST(LinuxDiskQueries, KnowADriveWithoutADisc) {
+TEST(LinuxDisks, KnowADriveWithoutADisc) {
   ServerDisks tree;
   tree.know("11:0", "E:ID_CDROM=1\n");
   EXPECT_EQ(tree.describe("sr0"), nullptr);
-  EXPECT_TRUE(tree.queries().is(DiskTrait::optical, {"sr0"}));
-  EXPECT_NE(tree.queries().opticalBootability({"sr0"}).status, 0);
-}
-
-TEST(LinuxDisks, TellsPartitionsAndImagesOfThisMachine) {
-  if (!runTool("command -v sgdisk && command -v partx")) GTEST_SKIP() << "sgdisk is missing";
-  std::string why = RealDisks::run([](RealDisks& machine) {
-    TemporaryFolder folder;
-    const auto image = folder.write("image", "");
-    std::filesystem::resize_file(image, 8U << 20U);
-    ASSERT_TRUE(runTool("sgdisk -n 1:2048:8191 -t 1:ef00 " + image.string()));
-    const LoopDevice disk(image);
-    ASSERT_TRUE(disk);
-    DiskListener listener(machine.service(), machine.runLoop());
-    machine.service().schedule(machine.runLoop());
-    listener.listen();
-    machine.runLoop().runPass();
-    if (!std::filesystem::exists("/sys/class/block/" + disk.name() + "p1")) {
-      ASSERT_TRUE(runTool("partx -a " + disk.node()));
-      EXPECT_TRUE(listener.hears("appeared " + disk.name() + "p1 "));
-    }
-    const auto partition = machine.service().description({disk.name() + "p1"});
-    ASSERT_TRUE(partition);
-    EXPECT_EQ(partition->mediaContent, efiSystemPartitionGuid);
-    EXPECT_EQ(partition->mediaSize, 6144 * 512);
-    EXPECT_EQ(machine.service().wholeDisk({disk.name() + "p1"}).text, disk.name());
-    machine.service().unschedule();
-    ASSERT_TRUE(runTool("partx -d " + disk.node()));
-  });
-  if (!why.empty()) GTEST_SKIP() << why;
+  EXPECT_TRUE(tree.host().diskManagement().is(DiskTrait::optical, {"sr0"}));
+  EXPECT_NE(tree.host().diskManagement().opticalBootability({"sr0"}).status, 0);
 }
 
 TEST(DeviceEvents, NameTheBlockDevice) {

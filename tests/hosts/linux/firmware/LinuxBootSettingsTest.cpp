@@ -8,13 +8,43 @@
 
 #include <array>
 
-#include "effects/EffectMatchers.h"
-#include "effects/SettingNames.h"
 #include "hosts/linux/firmware/BootTree.h"
 #include "hosts/linux/firmware/LinuxBootSettings.h"
+#include "platform/DiskManagementContract.h"
 
 namespace tavisk {
 namespace {
+
+struct LinuxDiskMachine {
+  LinuxDiskMachine() {
+    tree.addDisk(inside.text, "8:0", 8192);
+    tree.addDisk(stick.text, "8:16", 64, DiskTree::usb);
+    tree.setSubsystem("/devices/pci0000:00/0000:00:14.0/usb1/1-2", "usb");
+    tree.addDisk(disc.text, "11:0", 2048, "/devices/pci0000:00/0000:00:1f.2/ata2/host1/target1:0:0/1:0:0:0");
+    tree.addDisk(image.text, "7:0", 64, "/devices/virtual");
+    tree.know("8:0", "E:ID_PART_TABLE_TYPE=gpt\n");
+    tree.know("8:16", "E:ID_PART_TABLE_TYPE=mac\n");
+    tree.know("11:0", DiskTree::bootableDvd);
+    tree.setEntry(0, {fileNode(R"(\EFI\debian\shimx64.efi)")});
+    tree.setOrder({0});
+  }
+  DiskManagementService& service() { return tree.host().diskManagement(); }
+  void refuseSets() {}  // no volume has a boot file, and the variable is the firmware's own
+  std::map<std::string, std::string> kept() const { return tree.allVariables(); }
+  std::string variable(const char* name) const {
+    constexpr std::size_t attributesSize = 4;
+    return tree.file(EfiVariables::pathOf({name, efiOwnVendor})).substr(attributesSize);
+  }
+
+  const bool maySet = ::geteuid() == 0;
+  const DiskName inside{"sda"};
+  const DiskName stick{"sdb"};
+  const DiskName disc{"sr0"};
+  const DiskName image{"loop0"};
+  BootTree tree;
+  EffectLog& log = tree.log;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, DiskManagementContract, LinuxDiskMachine);
 
 constexpr const char* systemFolder = "/System/Library/CoreServices";
 const std::string mainFile = systemFolder + std::string("/boot.efi");
@@ -22,13 +52,6 @@ const std::string backupFile = "/Volumes/Backup" + mainFile;
 constexpr const char* mainUuid = "0f1e2d3c-4b5a-6978-8796-a5b4c3d2e1f0";
 constexpr const char* backupPath = R"(HD(1,MBR,11223344-01,0x800,0x800)/File(\System\Library\CoreServices\boot.efi))";
 constexpr const char* otherPath = R"(File(\EFI\debian\shimx64.efi))";
-
-void writeMbr(const std::filesystem::path& image) {
-  std::fstream file(image, std::ios::binary | std::ios::in | std::ios::out);
-  file.seekp(440).write("\x44\x33\x22\x11", 4);
-  file.seekp(446).write("\x80\0\0\0\x0c\0\0\0\0\x08\0\0\0\x08\0\0", 16);
-  file.seekp(510).write("\x55\xaa", 2);
-}
 
 /// Main (ext4, sda2) with its EFI system partition (sda1), and Backup (FAT, sdb1 of an MBR disk).
 class LinuxBootSettingsTest : public testing::Test {
@@ -85,7 +108,7 @@ class LinuxBootSettingsTest : public testing::Test {
   void addBackup() {
     tree.addDisk("sdb", "8:16", 8192, DiskTree::usb);
     tree.addPartition("sdb", 1, "8:17", 2048, 2048, DiskTree::usb);
-    writeMbr(tree.addImage("sdb", 8192));
+    tree.addMbr("sdb", 8192, 0x0C);
     _hasTools &= runTool("mkfs.vfat -n BACKUP " + tree.addImage("sdb1", 2048));
     tree.mount("8:17", "/dev/sdb1", "/Volumes/Backup", "vfat");
     tree.write(backupFile, firmwareProgram());

@@ -4,6 +4,7 @@
 
 #include "hosts/linux/disks/DiskTree.h"
 #include "platform/BootLoaderFileContract.h"
+#include "platform/IORegistryContract.h"
 
 namespace tavisk {
 namespace {
@@ -17,6 +18,21 @@ struct LinuxBootLoader {
   LinuxTree tree;
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, BootLoaderFileContract, LinuxBootLoader);
+
+struct LinuxRegistry {
+  IORegistry& service() { return tree.host().registry(); }
+  void haveTree(const std::string& property, const IORegistry::Data& value) {
+    tree.write("/sys/firmware/devicetree/base/" + property, std::string(value.begin(), value.end()));
+  }
+  void haveInterface(const std::string& name, const std::string& device) {
+    tree.write("/sys/bus/some/uevent", "");
+    for (const auto& path : {device, device + "/virtio0", device + "/virtio0/net/" + name})
+      tree.link("/sys" + path + "/subsystem", "/sys/bus/some");
+    tree.link("/sys/class/net/" + name, "../.." + device + "/virtio0/net/" + name);
+  }
+  LinuxTree tree;
+};
+INSTANTIATE_TYPED_TEST_SUITE_P(Linux, IORegistryContract, LinuxRegistry);
 
 TEST(LinuxKernelValues, NameTheModelAsItsMakerDoes) {
   const std::tuple<std::string, std::string, std::string> cases[] = {

@@ -4,7 +4,6 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <cerrno>
 #include <csignal>
 
 #include "effects/EffectMatchers.h"
@@ -19,11 +18,6 @@ namespace {
 using testing::HasSubstr;
 
 constexpr const char* preferencesFile = "/etc/tavisk/preferences/AnyApplication.plist";
-
-struct NoController final : ControllerLink {
-  Result<void> open() override { return systemFailure("open", "no controller", ENODEV); }
-  Result<std::vector<std::uint8_t>> exchange(const ControllerRequest&) override { return open().failure(); }
-};
 
 struct LinuxPreferences {
   PreferencesStore& preferences() { return tree.host().preferences(); }
@@ -41,11 +35,15 @@ TEST(LinuxPreferences, AreWrittenTogetherWithThoseOfOtherRuns) {
   LinuxTree tree;
   auto& processes = tree.host().processes();
   processes.setMachineBoolean("a", true);
-  tree.write(preferencesFile, "<plist><dict><key>other</key><date>2026-01-01T00:00:00Z</date></dict></plist>");
+  tree.write(
+      preferencesFile,
+      "<plist><dict><key>other</key><date>2026-01-01T00:00:00Z</date><key>b</key><string>x</string></dict></plist>");
   processes.setMachineBoolean("b", false);
   processes.writeMachinePreferences();
   for (const char* part : {"<key>other</key>", "2026-01-01T00:00:00Z", "<key>a</key>", "<key>b</key>"})
     EXPECT_THAT(tree.file(preferencesFile), HasSubstr(part));
+  EXPECT_EQ(tree.lastEffect().before, "string") << "another type is told as what it is";
+  EXPECT_EQ(tree.lastEffect().stored, "off");
 }
 
 TEST(LinuxPreferences, AreNotWrittenUnderAnothersLock) {
@@ -70,15 +68,6 @@ TEST(LinuxPreferences, ReadAsNoneOutOfADamagedFileAndAreKeptBesideIt) {
   EXPECT_EQ(tree.file(std::string(preferencesFile) + ".damaged"), "<dict>");
 }
 
-TEST(LinuxPreferences, OfAnotherTypeAreToldAsWhatTheyAre) {
-  LinuxTree tree;
-  tree.write(preferencesFile, "<plist><dict><key>a</key><string>yes</string></dict></plist>");
-  tree.host().processes().setMachineBoolean("a", false);
-  tree.host().processes().writeMachinePreferences();
-  EXPECT_EQ(tree.lastEffect().before, "string");
-  EXPECT_EQ(tree.lastEffect().stored, "off");
-}
-
 /// What a signal to a process of this machine comes to. A whole host would tell the journal of the machine too.
 Effect effectOf(int signal, ProcessId process) {
   EffectSink effects;
@@ -89,7 +78,7 @@ Effect effectOf(int signal, ProcessId process) {
   ServiceAccess services(root, runLoop);
   const LinuxMachine machine{root, effects, runLoop, services};
   LinuxPreferencesStore preferences(machine);
-  NoController link;
+  IpmiDevice link(root, runLoop);
   ManagementController controller(link);
   LinuxProcessUtilities(machine, preferences, controller).sendSignal(signal, process);
   return log.effects.back();
