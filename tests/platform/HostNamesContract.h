@@ -18,7 +18,7 @@ class HostNamesContract : public testing::Test {
 TYPED_TEST_SUITE_P(HostNamesContract);
 
 TYPED_TEST_P(HostNamesContract, goByTheNamesThatWereSetLast) {
-  auto session = this->machine.store().open("test");
+  const auto session = this->machine.store().open("test");
   ASSERT_TRUE(session);
   this->machine.configuration().setLocalNetworkName("mail-server-2");
   for (const char* name : {"Mail Server 2", R"(Z"$\`rich 'a' #1)", "Z\xC3\xBCrich", "  "}) {

@@ -25,7 +25,7 @@ TYPED_TEST_SUITE_P(PreferencesContract);
 
 TYPED_TEST_P(PreferencesContract, keepWhatWasSetLast) {
   EXPECT_EQ(this->machine.preferences().value(this->key), std::nullopt);
-  for (bool value : {true, true, false}) {
+  for (const bool value : {true, true, false}) {
     this->set(value);
     EXPECT_EQ(this->machine.preferences().value(this->key), PropertyList(value));
     EXPECT_EQ(this->machine.preferences().value("another"), std::nullopt);

@@ -18,7 +18,7 @@ TYPED_TEST_SUITE_P(RemoteAccessContract);
 TYPED_TEST_P(RemoteAccessContract, isWhatItWasSetToLast) {
   auto& service = this->machine.service();
   EXPECT_FALSE(service.isEnabled());
-  for (bool enabled : {true, true, false, false, true}) {
+  for (const bool enabled : {true, true, false, false, true}) {
     service.setEnabled(enabled);
     EXPECT_EQ(service.isEnabled(), enabled);
   }

@@ -55,11 +55,9 @@ MachineSetting<ZoneName> zoneSetting() {
           }};
 }
 
-/// An empty text names no zone.
 std::vector<ZoneName> zonesNamedIn(const PropertyList::Array& texts) {
   std::vector<ZoneName> zones;
-  for (const auto& text : texts)
-    if (!text.asString()->empty()) zones.push_back({*text.asString()});
+  for (const auto& text : texts) zones.push_back({*text.asString()});
   return zones;
 }
 
@@ -96,7 +94,9 @@ void ScratchClockService::setTime(std::int64_t secondsSince1970) {
 
 std::vector<ZoneName> ScratchClockService::knownTimeZones() {
   const MachineSetting<std::vector<ZoneName>> known{setting::knownTimeZones, "", knownZones, nullptr};
-  return _settings.read(known).value_or(std::vector<ZoneName>());
+  auto zones = _settings.read(known).value_or(std::vector<ZoneName>());
+  std::erase_if(zones, [](const auto& zone) { return zone.text.empty(); });
+  return zones;
 }
 
 ZoneName ScratchClockService::timeZone() {

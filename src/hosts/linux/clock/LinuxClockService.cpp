@@ -55,7 +55,7 @@ std::int64_t LinuxClockService::now() {
 std::optional<Failure> LinuxClockService::whyNoClock() const {
   if (_machine.root.prefix() != "/")
     return Failure{"set the clock", _machine.root.prefix(), "a tree of files has no clock"};
-  if (auto failure = whyNeedsRoot("set the clock", "CLOCK_REALTIME")) return failure;
+  if (const auto failure = whyNeedsRoot("set the clock", "CLOCK_REALTIME")) return failure;
   if (!maySetSystemTime()) return Failure{"set the clock", "CLOCK_REALTIME", inContainer};
   return std::nullopt;
 }
@@ -64,7 +64,7 @@ std::optional<Failure> LinuxClockService::whyNoClock() const {
 std::string LinuxClockService::whoCorrectsTheClock() {
   for (const char* program : {"chronyd", "ntpd", "systemd-timesyncd", "phc2sys", "VBoxService"})
     if (!processesNamed(_machine.root, program).empty()) return program;
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return {};
   auto corrected = (*bus)->property(timeDaemon(), "NTP", "b");
   return corrected && std::move(corrected).value().readBoolean() ? "the network-time client" : "";
@@ -91,8 +91,8 @@ void LinuxClockService::setTime(std::int64_t secondsSince1970) {
 }
 
 Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
-  if (auto failure = whyOutOfClockRange(asked.seconds())) return *failure;
-  if (auto bus = _machine.services.systemBus()) {
+  if (const auto failure = whyOutOfClockRange(asked.seconds())) return *failure;
+  if (const auto bus = _machine.services.systemBus()) {
     const auto set = setByDaemon(**bus, asked);
     if (set) return {};
     if (!leavesItToOthers(set.failure())) return withAdvice(set.failure());
@@ -101,8 +101,8 @@ Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
 }
 
 Result<void> LinuxClockService::changeTimeDirectly(std::int64_t secondsSince1970) const {
-  if (auto failure = whyNoClock()) return *failure;
-  if (auto set = setSystemTime(secondsSince1970); !set) return set;
+  if (const auto failure = whyNoClock()) return *failure;
+  if (const auto set = setSystemTime(secondsSince1970); !set) return set;
   return setHardwareClock(_machine.root, secondsSince1970);
 }
 
@@ -137,7 +137,7 @@ void LinuxClockService::setTimeZone(const ZoneName& zone) {
 }
 
 Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone) {
-  if (auto bus = _machine.services.systemBus()) {
+  if (const auto bus = _machine.services.systemBus()) {
     const auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone.text, (*bus)->isInteractive());
     if (!set && !leavesItToOthers(set.failure())) return set.failure();
     // The daemon does nothing for the zone that it found when it started, whatever the link says since.
@@ -147,8 +147,8 @@ Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone) {
 }
 
 Result<void> LinuxClockService::changeTimeZoneDirectly(const ZoneName& zone) const {
-  if (auto failure = whyNeedsRoot("set the time zone", "/etc/localtime")) return *failure;
-  if (auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
+  if (const auto failure = whyNeedsRoot("set the time zone", "/etc/localtime")) return *failure;
+  if (const auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
   return updateTimeZoneFile(_machine.root, zone);
 }
 

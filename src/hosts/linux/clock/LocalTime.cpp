@@ -3,6 +3,7 @@
 #include "hosts/linux/clock/LocalTime.h"
 
 #include "base/Text.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 
 namespace tavisk {
 namespace {
@@ -16,11 +17,8 @@ constexpr std::size_t timeZoneFileLimit = 4096;
 std::optional<ZoneName> timeZoneFileName(const SystemRoot& root) {
   const auto text = root.read(timeZoneFile, timeZoneFileLimit);
   if (!text) return std::nullopt;
-  for (const auto& line : split(*text, "\n")) {
-    const auto words = split(line, " \t\r");
-    if (!words.empty() && !words.front().starts_with('#')) return ZoneName{words.front()};
-  }
-  return ZoneName{};
+  const auto lines = configurationLines(*text);
+  return lines.empty() ? ZoneName() : ZoneName{split(lines.front(), " \t\r").front()};
 }
 
 std::optional<ZoneName> machineTimeZone(const SystemRoot& root) {

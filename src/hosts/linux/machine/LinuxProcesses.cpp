@@ -49,7 +49,7 @@ Result<void> LinuxProcessUtilities::signalProcess(int signal, ProcessId process)
 
 void LinuxProcessTermination::disable() {
   if (_holds++ > 0) return;
-  auto bus = _machine.services.systemBus();
+  const auto bus = _machine.services.systemBus();
   if (!bus) return;
   auto hold =
       (*bus)->query(loginManager(), "Inhibit", "h", "shutdown", "tavisk", "The startup disk is being set", "delay");
