@@ -21,14 +21,6 @@ struct UnitDaemonsTest : testing::Test {
   NetworkTimeService& client = tree.host().networkTime();
 };
 
-TEST_F(UnitDaemonsTest, EnablesAndReloadsBeforeItStarts) {
-  client.setLaunchAtStartup(true);
-  client.start();
-  client.stop();
-  EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles chrony.service", "Reload", "StartUnit chrony.service",
-                                                "StopUnit chrony.service"));
-}
-
 TEST_F(UnitDaemonsTest, PrefersTheFirstThatIsNotMasked) {
   tree.manager.set("ntpsec.service", {.active = "activating"});
   EXPECT_FALSE(client.isRunning()) << "chrony comes first";
