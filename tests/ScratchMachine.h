@@ -51,9 +51,6 @@ class ScratchMachine {
   std::string file(const std::string& path) const { return contentsOf(_folder.path() / ("root" + path)); }
 
   std::vector<std::string> systemLog() const { return linesOf(_folder.path() / "system.log"); }
-  /// One JSON object each.
-  std::vector<std::string> effectsLog() const { return linesOf(_folder.path() / "effects.log"); }
-
   /// Opened at the first call, which throws std::runtime_error when the machine is refused.
   ScratchHost& host() {
     if (!_host) {

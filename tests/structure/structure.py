@@ -35,6 +35,7 @@ RULES = [
     ("reasons are for people: a failure is asked for its code", r"src/", r"\.why\.(starts_with|ends_with|find|compare)|\.why [!=]="),
     ("one kind of lock guard", ANY_CODE, r"std::lock_guard"),
     ("a pointer is asked as it is", ANY_CODE, r"\b(if|while) \([^;]*[!=]= nullptr|[!=]= nullptr (\?|&&|\|\|)"),
+    ("what implements an interface is final", r"src/(?!platform/|startupdisk/SDController\.h)", r"^(class|struct) \w+ : public"),
     ("algorithms take ranges", ANY_CODE,
      r"std::(find|any_of|all_of|none_of|sort|stable_sort|copy|transform|count|replace)(_if)?\(\w+(\.|->)begin\(\)"),
 ]
@@ -66,20 +67,20 @@ def form_faults(path, text):
         yield f"{path}: {len(lines)} lines; at most {LONGEST_SOURCE}"
     if "namespace tavisk {\n\nnamespace {" in text:
         yield f"{path}: a blank line between the two namespaces"
-    # A class that something derives from has virtual members of its own to override.
-    for head in re.findall(r"^class (\w+) : public \w+[^{]*\{(?=(?:(?!^\};).)*\boverride\b)", text, re.M | re.S):
-        if " final" not in head and f"class {head} final" not in text and not re.search(r"virtual|protected:", text):
-            yield f"{path}: {head} is not final"
 
 
-def arrows(contributing):
-    """What each room may include, by the drawing: a line "A --> B" an arrow, "NAME[FOLDER]" a room."""
+def arrows_of(contributing):
+    """The arrows of the drawing, from folder to folder: a line "A --> B" is one, "NAME[FOLDER]" a room."""
     rooms = dict(re.findall(r"(\w+)\[([\w./ ]+)\]", contributing))
-    reach = {folder: {folder} for folder in rooms.values()}
-    pairs = [(rooms[a], rooms[b]) for a, targets in re.findall(r"^ *(\w+) --> ([\w &]+)$", contributing, re.M)
-             for b in targets.split(" & ")]
+    return [(rooms[a], rooms[b]) for a, targets in re.findall(r"^ *(\w+) --> ([\w &]+)$", contributing, re.M)
+            for b in targets.split(" & ")]
+
+
+def reach_of(arrows):
+    """What each room may include."""
+    reach = {room: {room} for arrow in arrows for room in arrow}
     for _ in reach:
-        for source, target in pairs:
+        for source, target in arrows:
             reach[source] |= reach[target]
     return reach
 
@@ -103,14 +104,12 @@ def arrow_faults(code, reach):
                 yield f"{path}: no arrow leads from {room} to {included}"
 
 
-def unused_arrows(code, contributing, reach):
+def unused_arrows(code, arrows, reach):
     used = {(room_of(path.removeprefix("src/"), reach), room_of(included, reach))
             for path, text in code.items() for included in includes_of(text)}
-    rooms = dict(re.findall(r"(\w+)\[([\w./ ]+)\]", contributing))
-    for a, targets in re.findall(r"^ *(\w+) --> ([\w &]+)$", contributing, re.M):
-        for b in targets.split(" & "):
-            if (rooms[a], rooms[b]) not in used:
-                yield f"CONTRIBUTING.md: nothing follows the arrow from {rooms[a]} to {rooms[b]}"
+    for source, target in arrows:
+        if (source, target) not in used:
+            yield f"CONTRIBUTING.md: nothing follows the arrow from {source} to {target}"
 
 
 def circle_faults(code):
@@ -143,11 +142,11 @@ def main(tree):
         with open(os.path.join(tree, path), encoding="utf-8", errors="replace") as file:
             texts[path] = file.read()
     code = {path: text for path, text in texts.items() if re.match(CODE, path)}
-    contributing = texts.get("CONTRIBUTING.md", "")
-    reach = arrows(contributing)
+    arrows = arrows_of(texts.get("CONTRIBUTING.md", ""))
+    reach = reach_of(arrows)
     faults = [fault for path, text in texts.items() for fault in rule_faults(path, text.splitlines())]
     faults += [fault for path, text in texts.items() if re.match(ANY_CODE, path) for fault in form_faults(path, text)]
-    faults += [*arrow_faults(code, reach), *unused_arrows(code, contributing, reach), *circle_faults(code),
+    faults += [*arrow_faults(code, reach), *unused_arrows(code, arrows, reach), *circle_faults(code),
                *folder_faults(texts)]
     print("\n".join(faults) if faults else "structure: in order")
     return 1 if faults else 0
