@@ -44,14 +44,14 @@ void keepKnownVariables() {
 }  // namespace
 
 bool prepareProcess() {
-  (void)std::signal(SIGPIPE, SIG_IGN);
-  (void)std::signal(SIGXFSZ, SIG_IGN);
+  static_cast<void>(std::signal(SIGPIPE, SIG_IGN));
+  static_cast<void>(std::signal(SIGXFSZ, SIG_IGN));
   keepKnownVariables();
   return openMissingDescriptors();
 }
 
 void complain(const std::string& text) {
-  (void)std::fputs(("tavisk: " + text + "\n").c_str(), stderr);
+  static_cast<void>(std::fputs(("tavisk: " + text + "\n").c_str(), stderr));
 }
 
 EndingSignals::EndingSignals() : _set() {

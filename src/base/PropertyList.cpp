@@ -75,7 +75,7 @@ PropertyList::Type PropertyList::type() const {
 
 const PropertyList::Dictionary* PropertyList::asDictionary() const {
   const auto* dictionary = std::get_if<std::unique_ptr<Dictionary>>(&_value);
-  return !dictionary ? nullptr : dictionary->get();
+  return dictionary ? dictionary->get() : nullptr;
 }
 
 PropertyList::Dictionary* PropertyList::asDictionary() {

@@ -6,6 +6,7 @@
 #include <optional>
 #include <string>
 #include <system_error>
+#include <type_traits>
 #include <utility>
 #include <variant>
 
@@ -36,6 +37,11 @@ bool isAbsent(const Failure& failure);
 /// "TRIED on ON: WHY", escaped() and on one line; an empty `on` is left out.
 std::string describe(const Failure& failure);
 
+/// What stands for a value without loss: a text where there may be none. No number of another type does.
+template <typename Other, typename Value>
+concept NearlyA = std::convertible_to<Other, Value> && !std::same_as<Other, Value> &&
+                  !std::convertible_to<Other, Failure> && !std::is_arithmetic_v<Value>;
+
 /// A value, or the reason why there is none.
 template <typename Value>
 class [[nodiscard]] Result {
@@ -43,13 +49,10 @@ class [[nodiscard]] Result {
   // Both conversions are wanted: `return value;` and `return Failure{...};`.
   Result(Value value) : _state(std::in_place_index<0>, std::move(value)) {}
   Result(Failure failure) : _state(std::in_place_index<1>, std::move(failure)) {}
-  /// What is nearly the value: a text where there may be none, an answer of a narrower type.
-  template <typename Other>
-  requires std::convertible_to<Other, Value> &&(!std::convertible_to<Other, Failure>)Result(Other value)
-      : _state(std::in_place_index<0>, std::move(value)) {}
-  template <typename Other>
-  requires std::convertible_to<Other, Value> &&(!std::same_as<Other, Value>)Result(Result<Other> other)
-      : Result(other ? Result(std::move(other).value()) : Result(other.failure())) {}
+  template <NearlyA<Value> Other>
+  Result(Other value) : _state(std::in_place_index<0>, std::move(value)) {}
+  template <NearlyA<Value> Other>
+  Result(Result<Other> other) : Result(other ? Result(std::move(other).value()) : Result(other.failure())) {}
 
   explicit operator bool() const { return _state.index() == 0; }
   const Value& value() const& { return std::get<0>(_state); }

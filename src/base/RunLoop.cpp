@@ -36,7 +36,7 @@ FileDescriptor needed(int descriptor, const char* call) {
 /// Takes the count out of an eventfd or timerfd, so that it is ready no more.
 void drain(const FileDescriptor& counter) {
   std::uint64_t count = 0;
-  (void)!::read(counter.number(), &count, sizeof count);
+  static_cast<void>(!::read(counter.number(), &count, sizeof count));
 }
 
 struct Timer {

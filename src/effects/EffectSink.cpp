@@ -16,7 +16,7 @@ std::unique_lock<std::mutex> lockSoon(std::mutex& mutex) {
   std::unique_lock lock(mutex, std::try_to_lock);
   for (int attempt = 0; !lock && attempt < attempts; ++attempt) {
     std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    (void)lock.try_lock();
+    static_cast<void>(lock.try_lock());
   }
   return lock;
 }

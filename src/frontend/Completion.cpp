@@ -87,7 +87,8 @@ std::vector<std::string> completionsOf(const std::string& text, const MachineVal
     for (auto& word : words) word = upToNextFolder(word, typed.size());
   }
   std::ranges::sort(words, isListedBefore);
-  words.erase(std::unique(words.begin(), words.end()), words.end());
+  const auto repeated = std::ranges::unique(words);
+  words.erase(repeated.begin(), repeated.end());
   return words;
 }
 

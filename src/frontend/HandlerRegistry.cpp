@@ -11,9 +11,9 @@ namespace tavisk {
 
 std::span<const HandlerRows> handlerFamilies() {
   static const std::array families = {
-      helpHandlers(),         dateAndTimeHandlers(),    timeZoneHandlers(),         networkTimeHandlers(),
+      helpHandlers(),         dateAndTimeHandlers(),    timeZonesHandlers(),        networkTimeHandlers(),
       sleepTimersHandlers(),  wakeAndRestartHandlers(), startupDelayHandlers(),     remoteLoginHandlers(),
-      remoteEventsHandlers(), computerNameHandlers(),   bootArchitectureHandlers(), keyboardLockHandlers(),
+      remoteEventsHandlers(), namesHandlers(),          bootArchitectureHandlers(), keyboardLockHandlers(),
       startupDiskHandlers(),
   };
   return families;

@@ -26,14 +26,14 @@ using HandlerRows = std::span<const HandlerRow>;
 /// The rows of each family, defined beside the family's handlers.
 HandlerRows helpHandlers();
 HandlerRows dateAndTimeHandlers();
-HandlerRows timeZoneHandlers();
+HandlerRows timeZonesHandlers();
 HandlerRows networkTimeHandlers();
 HandlerRows sleepTimersHandlers();
 HandlerRows wakeAndRestartHandlers();
 HandlerRows startupDelayHandlers();
 HandlerRows remoteLoginHandlers();
 HandlerRows remoteEventsHandlers();
-HandlerRows computerNameHandlers();
+HandlerRows namesHandlers();
 HandlerRows bootArchitectureHandlers();
 HandlerRows keyboardLockHandlers();
 HandlerRows startupDiskHandlers();

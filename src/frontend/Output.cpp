@@ -20,7 +20,7 @@ void Output::print(const char* format, ...) {
   const auto size = std::vsnprintf(nullptr, 0, format, arguments);
   va_end(arguments);
   std::string text(static_cast<std::size_t>(std::max(size, 0)), '\0');
-  (void)std::vsnprintf(text.data(), text.size() + 1, format, again);
+  static_cast<void>(std::vsnprintf(text.data(), text.size() + 1, format, again));
   va_end(again);
   write(text);
 }

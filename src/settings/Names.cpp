@@ -51,7 +51,7 @@ void ServerCommands::setLocalSubnetName(const std::string& name) {
   setError(false);
 }
 
-HandlerRows computerNameHandlers() {
+HandlerRows namesHandlers() {
   static constexpr HandlerRow rows[] = {
       {"getComputerName", &ServerCommands::getComputerName},
       {"setComputerName:", &ServerCommands::setComputerName},

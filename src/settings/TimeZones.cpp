@@ -44,7 +44,7 @@ void ServerCommands::setTimeZone(const std::string& timeZone) {
   _context.output.print("Set TimeZone: %s\n", timeZone.c_str());
 }
 
-HandlerRows timeZoneHandlers() {
+HandlerRows timeZonesHandlers() {
   static constexpr HandlerRow rows[] = {
       {"getTimeZone", &ServerCommands::getTimeZone},
       {"listTimeZones", &ServerCommands::listTimeZones},

@@ -98,7 +98,7 @@ SDRecordRef SDController::_selectedImageOn(const std::string& interface) const {
 
 bool SDController::doesCurrentBootDeviceMatchSystemFolder(const SDRecord& system, const SDRecord* withCurrentBootDisk) {
   const auto folder = system.textForKey(recordkey::systemFolderPath);
-  const auto device = !withCurrentBootDisk ? nullptr : currentBootDevice();
+  const auto device = withCurrentBootDisk ? currentBootDevice() : nullptr;
   if (!device) {
     _environment.log.debug("dCBDMSF doesn't know boot-dev yet to check %@", {folder});
     return false;

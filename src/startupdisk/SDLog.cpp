@@ -38,8 +38,8 @@ std::string MessageValue::asHexadecimal() const {
   constexpr std::size_t width = 8;
   const auto* number = std::get_if<std::int64_t>(&_value);
   std::array<char, width> digits{};
-  const auto end = std::to_chars(digits.data(), digits.data() + digits.size(),
-                                 static_cast<std::uint32_t>(!number ? 0 : *number), 16);
+  const auto end =
+      std::to_chars(digits.data(), digits.data() + digits.size(), static_cast<std::uint32_t>(number ? *number : 0), 16);
   const std::string text(digits.data(), end.ptr);
   return std::string(width - text.size(), '0') + text;
 }

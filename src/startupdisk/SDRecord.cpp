@@ -10,14 +10,14 @@ namespace tavisk {
 std::optional<std::string> SDRecord::textForKey(const std::string& key) const {
   const auto value = objectForKey(key);
   const auto* text = value ? std::get_if<std::string>(&*value) : nullptr;
-  return !text ? std::nullopt : std::optional(*text);
+  return text ? std::optional(*text) : std::nullopt;
 }
 
 std::optional<std::int64_t> SDRecord::integerForKey(const std::string& key) const {
   const auto value = objectForKey(key);
   if (!value) return std::nullopt;
   const auto* number = std::get_if<std::int64_t>(&*value);
-  return !number ? leadingInteger(std::get<std::string>(*value)) : *number;
+  return number ? *number : leadingInteger(std::get<std::string>(*value));
 }
 
 std::optional<ContextValue> SDImage::objectForKey(const std::string& key) const {

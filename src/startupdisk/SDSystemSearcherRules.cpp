@@ -25,8 +25,8 @@ void describe(SDDisk& disk, const char* productName, std::int64_t systemVersionM
 
 std::optional<std::string> textIn(const PropertyList::Dictionary& dictionary, const char* key) {
   const auto* value = dictionary.find(key);
-  const auto* text = !value ? nullptr : value->asString();
-  return !text ? std::nullopt : std::optional(*text);
+  const auto* text = value ? value->asString() : nullptr;
+  return text ? std::optional(*text) : std::nullopt;
 }
 
 void copyText(const PropertyList::Dictionary& from, const char* key, SDDisk& disk) {

@@ -69,7 +69,7 @@ void TerminalKeys::waitForByte(const TerminalSignals& signals) {
   const auto happened = _runLoop.watch(signals.descriptor(), RunLoop::Readiness::readable, [&] {
     while (const auto signal = signals.take()) _onSignal(*signal);
   });
-  (void)_runLoop.runUntil(RunLoop::Clock::time_point::max(), [&] { return isReadable; });
+  static_cast<void>(_runLoop.runUntil(RunLoop::Clock::time_point::max(), [&] { return isReadable; }));
 }
 
 }  // namespace tavisk

@@ -43,7 +43,7 @@ void TerminalLineSource::openEditor() {
   if (!editor) return;
   _editor = std::move(editor).value();
   // The editor and the plain reader take turns: neither may keep what is for the other.
-  (void)std::setvbuf(stdin, nullptr, _IONBF, 0);
+  static_cast<void>(std::setvbuf(stdin, nullptr, _IONBF, 0));
 }
 
 std::optional<std::string> TerminalLineSource::edit(const std::string& prompt, const Completions& completions) {
@@ -64,8 +64,8 @@ std::string TerminalLineSource::takePiece(std::size_t room) {
 
 void TerminalLineSource::restoreTerminal() {
   if (!_isEditing.exchange(false)) return;
-  (void)::tcsetattr(STDIN_FILENO, TCSANOW, &_found);
-  (void)!::write(STDOUT_FILENO, "\n", 1);
+  static_cast<void>(::tcsetattr(STDIN_FILENO, TCSANOW, &_found));
+  static_cast<void>(!::write(STDOUT_FILENO, "\n", 1));
 }
 
 void TerminalLineSource::printAside(const std::function<void()>& print) {

@@ -68,7 +68,7 @@ Result<std::vector<std::string>> namesIn(const FileDescriptor& folder, const std
   const auto close = [](DIR* opened) { ::closedir(opened); };
   const std::unique_ptr<DIR, decltype(close)> stream(::fdopendir(listed.number()), close);
   if (!stream) return systemFailure("list", path, errno);
-  (void)listed.release();  // the stream closes it
+  static_cast<void>(listed.release());  // the stream closes it
   std::vector<std::string> names;
   errno = 0;
   while (const dirent* entry = ::readdir(stream.get())) {

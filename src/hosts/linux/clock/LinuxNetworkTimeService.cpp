@@ -68,7 +68,7 @@ Setting<bool> LinuxNetworkTimeService::runningSetting() {
   setting.live = [this]() -> Result<bool> {
     const auto found = client();
     if (!found) return found.failure();
-    return !*found ? false : daemons().isRunning((*found)->daemon);
+    return *found ? daemons().isRunning((*found)->daemon) : Result<bool>(false);
   };
   setting.apply = [this](bool isOn) {
     return withClient<void>([&](const TimeDaemon& client) {
@@ -107,7 +107,7 @@ Setting<std::string> LinuxNetworkTimeService::serverSetting() {
   setting.stored = [this]() -> Result<Value> {
     const auto found = client();
     if (!found) return found.failure();
-    return !*found ? Value() : Value((*found)->server(_machine.root));
+    return *found ? Value((*found)->server(_machine.root)) : Value();
   };
   return setting;
 }
@@ -130,7 +130,7 @@ NetworkTimeServer LinuxNetworkTimeService::server() {
 }
 
 std::string LinuxNetworkTimeService::whatStaysInUse(const TimeDaemon& client) const {
-  const auto other = !client.otherServer ? std::string() : client.otherServer(_machine.root);
+  const auto other = client.otherServer ? client.otherServer(_machine.root) : std::string();
   return other.empty() ? "" : "configured elsewhere, " + other + " stays in use beside it";
 }
 

@@ -47,7 +47,7 @@ std::string firstServer(const SystemRoot& root, const std::string& file) {
 /// The tool's own file aside.
 std::string firstServerInFolder(const SystemRoot& root, const std::string& folder, std::string_view ending) {
   for (const auto& name : root.list(folder).valueOr({})) {
-    if (!name.ends_with(ending) || name.starts_with(ownfile::name)) continue;
+    if (!name.ends_with(ending) || name.starts_with(std::string(ownfile::name) + ".")) continue;
     if (auto server = firstServer(root, (folder + "/").append(name)); !server.empty()) return server;
   }
   return {};

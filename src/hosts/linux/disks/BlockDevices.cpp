@@ -202,7 +202,7 @@ std::string BlockDevices::transportOf(const DiskName& disk) const {
     // The nearest one counts, unless something further up tells more.
     if (!carried) carried = bySubsystem(subsystem);
   }
-  return !carried ? "" : carried;
+  return carried ? carried : "";
 }
 
 bool BlockDevices::isInternal(const DiskName& disk) const {

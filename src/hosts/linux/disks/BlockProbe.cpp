@@ -59,7 +59,7 @@ class Probe {
 
 /// What libblkid has no text for is empty.
 std::string textOrNone(const char* value) {
-  return !value ? "" : value;
+  return value ? value : "";
 }
 
 std::string typeOf(blkid_partition partition) {
@@ -112,7 +112,7 @@ Result<PartitionTable> probePartitionTable(const SystemRoot& root, const std::st
   };
   if (const int error = errorOf(isListed, noTable); error != 0) return systemFailure("read", node, error);
   PartitionTable result;
-  auto* table = !list ? nullptr : ::blkid_partlist_get_table(list);
+  auto* table = list ? ::blkid_partlist_get_table(list) : nullptr;
   if (!table) return result;
   result.type = textOrNone(::blkid_parttable_get_type(table));
   result.uuid = textOrNone(::blkid_parttable_get_id(table));

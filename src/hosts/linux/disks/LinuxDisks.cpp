@@ -76,7 +76,7 @@ std::optional<DiskName> LinuxDisks::holding(const std::string& path) {
   const std::scoped_lock lock(_mutex);
   readOnce();
   const auto* mount = _mounts.holding(path);
-  return !mount ? std::nullopt : diskOf(*mount, 0);
+  return mount ? diskOf(*mount, 0) : std::nullopt;
 }
 
 LinuxDisks::Snapshot LinuxDisks::renew(const ChangedDevices& changed) {

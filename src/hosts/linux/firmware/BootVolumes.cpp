@@ -176,9 +176,11 @@ std::optional<DiskName> BootVolumes::fileSystemWith(const std::string& uuid, con
   const auto linked = _devices.withNode("/dev/disk/by-uuid/" + uuid);
   if (linked && _devices.wholeDisk(linked->name) == disk) return linked->name;
   for (const auto& name : _devices.list()) {
-    const auto facts = _devices.wholeDisk(name) == disk ? _disks.facts(name) : std::nullopt;
-    const bool isFileSystem = facts && facts->volume.usage == "filesystem";
-    if (isFileSystem && compareIgnoringCase(facts->volume.uuid.value_or(""), uuid) == 0) return name;
+    const auto device = _devices.wholeDisk(name) == disk ? _devices.find(name) : std::nullopt;
+    if (!device || device->size == 0 || !_devices.answersReads(*device)) continue;
+    const auto volume = _disks.volumeNow(*device);
+    const bool isFileSystem = volume && volume->usage == "filesystem";
+    if (isFileSystem && compareIgnoringCase(volume->uuid.value_or(""), uuid) == 0) return name;
   }
   return std::nullopt;
 }

@@ -5,7 +5,8 @@
 namespace tavisk {
 namespace {
 
-/// The value in force. Where another one is stored has no part in it when that cannot be read.
+/// Reads the value in force. That it cannot be read is no fault of the place where another one is stored, which is left
+/// out of the effect then.
 template <typename Value>
 std::optional<Value> read(Setting<Value> setting, EffectSink& effects) {
   if (setting.live && setting.stored) setting.where.clear();

@@ -79,7 +79,7 @@ std::string BusMessage::readText() {
   const char* text = nullptr;
   if (_library->sd_bus_message_read_basic(_message, 's', &text) <= 0)
     note(_library->sd_bus_message_read_basic(_message, 'o', &text));
-  return !text ? std::string() : text;
+  return text ? text : std::string();
 }
 
 bool BusMessage::readBoolean() {

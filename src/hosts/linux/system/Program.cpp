@@ -114,9 +114,8 @@ Result<RunningProgram> RunningProgram::start(const SystemRoot& root, std::vector
                                   pointersTo(environment).data());
   if (error != 0) return systemFailure("run", words.front(), error);
   RunningProgram running(id);
-  auto handle = ProcessHandle::of(id);
-  if (!handle) return handle.failure();
-  running._handle = std::move(handle).value();
+  // Without one nobody is woken at the end of the program, which then is found out after its time.
+  if (auto handle = ProcessHandle::of(id)) running._handle = std::move(handle).value();
   return running;
 }
 
