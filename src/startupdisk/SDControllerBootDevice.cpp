@@ -28,13 +28,13 @@ std::optional<std::string> descriptionOf(const SDRecordRef& record) {
 }  // namespace
 
 SDRecordRef SDController::currentBootDevice() {
-  if (const auto known = _knownBootDevice()) {
+  if (auto known = _knownBootDevice()) {
     _environment.log.debug("currentBootDevice cached: %@", {known->description()});
     return known;
   }
   _askBootPreference();
   _askNetworkBootPreference();
-  const auto device = _knownBootDevice();
+  auto device = _knownBootDevice();
   _environment.log.debug("currentBootDevice: %@", {descriptionOf(device)});
   return device;
 }
@@ -60,7 +60,7 @@ SDDiskRef SDController::_takeBootPreference() {
   _environment.log.debug("currentBootDevice: being checked by DiskManagement");
   const auto preference = _dmm.bootPreference();
   if (preference.status != 0 || !preference.disk) return nullptr;
-  const auto bootDisk = _recordOf(*preference.disk);
+  auto bootDisk = _recordOf(*preference.disk);
   _rememberBootDevice(bootDisk);
   _environment.log.debug("currentBootDevice found _curBootDevice: %@", {bootDisk->description()});
   return bootDisk;

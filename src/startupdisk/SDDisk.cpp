@@ -22,7 +22,7 @@ SDDiskRef SDDisk::diskFromDisk(const SDDisk& disk) {
 
 SDDiskRef SDDisk::wholeDiskFromSDDisk(const SDDisk& disk) {
   if (!disk._disk) return nullptr;
-  const auto whole = diskFromDisk(disk);
+  auto whole = diskFromDisk(disk);
   whole->setDisk(disk._services.session.wholeDisk(*disk._disk));
   return whole;
 }

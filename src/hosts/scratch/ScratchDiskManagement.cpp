@@ -129,7 +129,7 @@ ServiceStatus ScratchDiskManagement::change(const MachineSetting<Value>& setting
       status = answer;
       return Failure{"set", "the rehearsed firmware", "status " + std::to_string(answer)};
     }
-    const auto written = write(value);
+    auto written = write(value);
     if (written) status = 0;
     return written;
   };

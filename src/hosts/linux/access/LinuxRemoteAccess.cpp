@@ -176,7 +176,7 @@ Result<bool> LinuxRemoteEventsService::startsAtBoot() {
 }
 
 Result<bool> LinuxRemoteEventsService::isOnInAnyWay() {
-  const auto starts = startsAtBoot();
+  auto starts = startsAtBoot();
   if (!starts || *starts) return starts;
   const auto named = units();
   if (!named) return named.failure();

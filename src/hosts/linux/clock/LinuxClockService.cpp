@@ -55,7 +55,7 @@ std::int64_t LinuxClockService::now() {
 std::optional<Failure> LinuxClockService::whyNoClock() const {
   if (_machine.root.prefix() != "/")
     return Failure{"set the clock", _machine.root.prefix(), "a tree of files has no clock"};
-  if (const auto failure = whyNeedsRoot("set the clock", "CLOCK_REALTIME")) return failure;
+  if (auto failure = whyNeedsRoot("set the clock", "CLOCK_REALTIME")) return failure;
   if (!maySetSystemTime()) return Failure{"set the clock", "CLOCK_REALTIME", inContainer};
   return std::nullopt;
 }
@@ -102,7 +102,7 @@ Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
 
 Result<void> LinuxClockService::changeTimeDirectly(std::int64_t secondsSince1970) const {
   if (const auto failure = whyNoClock()) return *failure;
-  if (const auto set = setSystemTime(secondsSince1970); !set) return set;
+  if (auto set = setSystemTime(secondsSince1970); !set) return set;
   return setHardwareClock(_machine.root, secondsSince1970);
 }
 
@@ -148,13 +148,13 @@ Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone) {
 
 Result<void> LinuxClockService::changeTimeZoneDirectly(const ZoneName& zone) const {
   if (const auto failure = whyNeedsRoot("set the time zone", "/etc/localtime")) return *failure;
-  if (const auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
+  if (auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
   return updateTimeZoneFile(_machine.root, zone);
 }
 
 /// The daemon leaves Debian's second copy of the name alone.
 Result<void> LinuxClockService::updateNameFile(const ZoneName& zone) const {
-  const auto updated = updateTimeZoneFile(_machine.root, zone);
+  auto updated = updateTimeZoneFile(_machine.root, zone);
   if (updated) return updated;
   return whyNeedsRoot("write", "/etc/timezone").value_or(updated.failure());
 }

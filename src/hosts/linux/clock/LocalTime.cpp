@@ -23,7 +23,7 @@ std::optional<ZoneName> timeZoneFileName(const SystemRoot& root) {
 
 std::optional<ZoneName> machineTimeZone(const SystemRoot& root) {
   if (const auto target = root.readLink(localTimeLink))
-    if (const auto zone = zoneOfPath(*target)) return zone;
+    if (auto zone = zoneOfPath(*target)) return zone;
   const auto zone = timeZoneFileName(root);
   return zone && zone->isWellFormed() ? zone : std::nullopt;
 }

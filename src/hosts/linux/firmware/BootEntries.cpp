@@ -62,7 +62,7 @@ Result<std::optional<BootEntry>> BootEntries::first() const {
   const auto numbersInOrder = order();
   if (!numbersInOrder) return numbersInOrder.failure();
   for (const auto number : *numbersInOrder) {
-    const auto entry = read(number);
+    auto entry = read(number);
     if (!entry || (*entry && (*entry)->option.isStartedUnasked())) return entry;
   }
   return std::nullopt;
@@ -91,7 +91,7 @@ Result<void> BootEntries::putFirst(const EfiLoadOption& option, const KeepOrder&
   if (*known) return changeOrder((*known)->number, keep);
   const auto made = make(option);
   if (!made) return made.failure();
-  const auto changed = changeOrder(*made, keep);
+  auto changed = changeOrder(*made, keep);
   if (!changed) static_cast<void>(_variables.removeEntry({bootEntryName(*made)}, bytesOf(option)));
   return changed;
 }
@@ -99,7 +99,7 @@ Result<void> BootEntries::putFirst(const EfiLoadOption& option, const KeepOrder&
 Result<void> BootEntries::changeOrder(std::uint16_t first, const KeepOrder& keep) const {
   const auto before = order();
   if (!before) return before.failure();
-  if (const auto kept = keep(*before); !kept) return kept;
+  if (auto kept = keep(*before); !kept) return kept;
   std::string bytes;
   for (const auto number : withFirst(first, *before)) appendNumber(bytes, number, numberSize);
   return _variables.write(orderVariable(), bytes);

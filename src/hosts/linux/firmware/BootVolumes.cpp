@@ -51,7 +51,7 @@ Result<BootTarget> BootVolumes::targetOf(const DiskName& volume, const std::stri
   if (!device) return unknownDisk(volume);
   const auto facts = _disks.volumeNow(*device);
   if (!facts) return facts.failure();
-  const auto found =
+  auto found =
       isReadByFirmware(facts->type.value_or("")) ? onVolume(*device, systemFolder) : besideVolume(*device, *facts);
   if (!found) return found;
   auto target = *found;
@@ -84,7 +84,7 @@ Result<BootTarget> BootVolumes::besideVolume(const BlockDevice& volume, const Vo
   auto why = disk.text + " has no EFI system partition for " + *file;
   std::error_code code;
   for (const auto& partition : *partitions) {
-    const auto target = onSystemPartition(partition, *file);
+    auto target = onSystemPartition(partition, *file);
     if (target) return target;
     why = describe(target.failure());
     code = target.failure().code;
@@ -186,7 +186,7 @@ std::optional<DiskName> BootVolumes::fileSystemWith(const std::string& uuid, con
 }
 
 Result<DiskName> BootVolumes::volumeOf(const EfiPartition& partition, const std::string& file) const {
-  const auto started = partitionWith(partition);
+  auto started = partitionWith(partition);
   const auto uuid = fileSystemOf(file);
   if (!started || !uuid) return started;
   const auto disk = _devices.wholeDisk(*started);

@@ -154,7 +154,7 @@ Result<void> EfiVariables::writeFile(const std::string& path, std::string_view c
   auto file = _root.open(path, O_WRONLY | O_NONBLOCK);
   if (!file && isNew && isAbsent(file.failure())) file = _root.open(path, O_WRONLY | O_CREAT | O_EXCL, modeWhenNew);
   if (!file) return file.failure();
-  const auto written = writeOnce(*file, contents, path);
+  auto written = writeOnce(*file, contents, path);
   if (written) return cutTo(*file, contents.size(), path);
   if (isNew) {
     const Unprotected removable(_root, path);

@@ -63,7 +63,7 @@ Setting<KeyboardState>::Found stateOf(const SystemRoot& root, const std::vector<
 
 Result<void> setAll(const SystemRoot& root, const std::vector<std::string>& keyboards, KeyboardState state) {
   for (const auto& keyboard : keyboards)
-    if (const auto set = setInhibited(root, keyboard, state == KeyboardState::disabled); !set) return set;
+    if (auto set = setInhibited(root, keyboard, state == KeyboardState::disabled); !set) return set;
   return {};
 }
 

@@ -56,7 +56,7 @@ void LinuxPreferencesStore::writeOut() {
 
 Result<void> LinuxPreferencesStore::store(const std::string& key, bool value) {
   if (const auto failure = whyNeedsRoot("write", _file.path())) return *failure;
-  if (const auto made = _machine.root.makeFolders(folder); !made) return made;
+  if (auto made = _machine.root.makeFolders(folder); !made) return made;
   const auto patience = std::chrono::duration_cast<std::chrono::milliseconds>(_machine.runLoop.timeFor(longestLock));
   const auto held = lockFile(_machine.root, lock, patience);
   if (!held) return held.failure();

@@ -4,11 +4,9 @@
 
 #include <string>
 
-namespace tavisk {
-
 /// The files that the tool writes for itself alone among those of other packages. All of them are taken away when the
 /// package is purged.
-namespace ownfile {
+namespace tavisk::ownfile {
 
 /// The first line of each.
 inline constexpr const char* header = "# Written by tavisk. Changes made here are replaced.\n";
@@ -35,5 +33,4 @@ inline std::string udevRule(const std::string& setting) {
   return "/etc/udev/rules.d/60-tavisk-" + setting + ".rules";
 }
 
-}  // namespace ownfile
-}  // namespace tavisk
+}  // namespace tavisk::ownfile
