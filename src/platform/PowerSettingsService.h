@@ -21,7 +21,7 @@ struct Minutes {
 
   bool isNever() const { return count == 0; }
   std::chrono::minutes duration() const { return std::chrono::minutes(count); }
-  auto operator<=>(const Minutes&) const = default;
+  auto operator<=>(const Minutes&) const = default;  // NOLINT(modernize-use-nullptr): the compiler's own 0
 };
 
 std::string textOf(Minutes minutes);
