@@ -121,7 +121,7 @@ ControllerStatus LinuxPowerController::setDelay(std::uint32_t manufacturer, std:
   delay.name = setting::startupDelay;
   if (!known) delay.supported = [&] { return known.failure(); };
   delay.apply = [&](std::int64_t asked) -> Result<void> {
-    const auto sent = sendDelay(*known, units);
+    auto sent = sendDelay(*known, units);
     if (!sent) status = sent.failure().code.value();
     if (!sent || known->get) return sent;
     return _machine.root.write(wishFile, textOf(asked) + "\n");

@@ -160,7 +160,7 @@ Result<void> WakeOnNetworkAccess::store(bool wakes) const {
 }
 
 std::string WakeOnNetworkAccess::whyItDoesNotLast() const {
-  const auto reason = whyNoRuleLasts(_machine.root);
+  auto reason = whyNoRuleLasts(_machine.root);
   if (!reason.empty() || _machine.root.readLink(hidingLink).valueOr("") != "/dev/null") return reason;
   return std::string(hidingLink) + " hides the file: lasts until the restart";
 }

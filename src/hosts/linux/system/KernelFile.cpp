@@ -10,7 +10,7 @@ namespace tavisk {
 
 Result<std::string> readKernelFile(const SystemRoot& root, const std::string& path) {
   constexpr std::size_t limit = 4096;
-  const auto text = root.read(path, limit);
+  auto text = root.read(path, limit);
   if (!text) return text;
   return text->substr(0, text->find_last_not_of(std::string_view(" \t\n\0", 4)) + 1);
 }
