@@ -32,6 +32,6 @@ if(TAVISK_SANITIZE)
   add_compile_options(-fsanitize=${TAVISK_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
   add_link_options(-fsanitize=${TAVISK_SANITIZE})
 else()
-  # Shared, the C++ library would double the time to start.
-  add_link_options(-static-libstdc++ -static-libgcc)
+  # Shared, the C++ library would double the time to start; of the static one only what is used is taken.
+  add_link_options(-static-libstdc++ -static-libgcc -Wl,--gc-sections)
 endif()
