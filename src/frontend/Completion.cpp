@@ -87,8 +87,7 @@ std::vector<std::string> completionsOf(const std::string& text, const MachineVal
     for (auto& word : words) word = upToNextFolder(word, typed.size());
   }
   std::ranges::sort(words, isListedBefore);
-  const auto repeated = std::ranges::unique(words);
-  words.erase(repeated.begin(), repeated.end());
+  words.erase(std::unique(words.begin(), words.end()), words.end());
   return words;
 }
 
