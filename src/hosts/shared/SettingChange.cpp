@@ -96,13 +96,4 @@ Effect carryOut(const Steps& steps, EffectSink& effects, RunLoop& runLoop) {
   return change.effect();
 }
 
-void tellFailedRead(const std::string& setting, const std::string& where, const Failure& failure, EffectSink& effects) {
-  Effect effect;
-  effect.setting = setting;
-  effect.outcome = Outcome::failed;
-  effect.where = where;
-  effect.failure = failure;
-  effects.record(effect);
-}
-
 }  // namespace tavisk::change

@@ -109,7 +109,6 @@ struct Steps {
 };
 
 Effect carryOut(const Steps& steps, EffectSink& effects, RunLoop& runLoop);
-void tellFailedRead(const std::string& setting, const std::string& where, const Failure& failure, EffectSink& effects);
 
 template <typename Value>
 std::string textOfReading(const Reading<Value>& reading) {
@@ -168,7 +167,8 @@ template <typename Value>
 std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects) {
   const auto found = setting.live ? setting.live() : setting.stored();
   if (!found) {
-    change::tellFailedRead(setting.name, setting.where, found.failure(), effects);
+    effects.record(
+        {.setting = setting.name, .outcome = Outcome::failed, .where = setting.where, .failure = found.failure()});
     return std::nullopt;
   }
   SettingValue value{setting.name, std::nullopt, std::nullopt, setting.unit};

@@ -33,4 +33,13 @@ std::optional<Reading<Value>> readingOfAll(std::vector<DeviceValue<Value>> value
   return Reading<Value>(greatest, std::move(detail));
 }
 
+/// Does the same with each of the machine's devices, those after a failure too. The first failure is the answer.
+template <typename Devices, typename Set>
+Result<void> setEach(const Devices& devices, Set set) {
+  Result<void> all;
+  for (const auto& device : devices)
+    if (auto done = set(device); !done && all) all = done;
+  return all;
+}
+
 }  // namespace tavisk

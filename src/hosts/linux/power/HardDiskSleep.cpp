@@ -84,10 +84,7 @@ Setting<Minutes>::Found HardDiskSleep::live() const {
 }
 
 Result<void> HardDiskSleep::apply(Minutes asked) const {
-  Result<void> all;
-  for (const auto& disk : disks())
-    if (auto set = setMinutes(disk.device, asked); !set && all) all = set;
-  return all;
+  return setEach(disks(), [asked](const Disk& disk) { return setMinutes(disk.device, asked); });
 }
 
 Setting<Minutes> HardDiskSleep::hardDiskSleep() const {

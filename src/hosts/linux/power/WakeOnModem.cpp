@@ -54,10 +54,7 @@ Setting<bool>::Found WakeOnModem::live() const {
 }
 
 Result<void> WakeOnModem::apply(bool wakes) const {
-  Result<void> all;
-  for (const auto& port : ports())
-    if (auto set = port.place.write(wakeSwitch, wordFor(wakes)); !set && all) all = set;
-  return all;
+  return setEach(ports(), [wakes](const Port& port) { return port.place.write(wakeSwitch, wordFor(wakes)); });
 }
 
 Setting<bool> WakeOnModem::wakeOnModem() const {

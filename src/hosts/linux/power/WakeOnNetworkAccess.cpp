@@ -119,10 +119,7 @@ Setting<bool>::Found WakeOnNetworkAccess::live() const {
 Result<void> WakeOnNetworkAccess::apply(bool wakes) const {
   const auto cards = wakingCards();
   if (!cards) return cards.failure();
-  Result<void> all;
-  for (const auto& card : *cards)
-    if (auto set = _cards.setWakeModes(card, wakes ? magicPacket : 0); !set && all) all = set;
-  return all;
+  return setEach(*cards, [&](const std::string& card) { return _cards.setWakeModes(card, wakes ? magicPacket : 0); });
 }
 
 /// The device manager notes by which file it has set up a card.
