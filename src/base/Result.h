@@ -66,6 +66,14 @@ class [[nodiscard]] Result {
   std::variant<Value, Failure> _state;
 };
 
+/// For what may be missing: an absent file (isAbsent()) is no value; every other failure stays one.
+template <typename Value>
+Result<std::optional<Value>> orAbsent(Result<Value> found);
+
+/// The same, where a missing file says as much as an empty one.
+template <typename Value>
+Result<Value> orEmpty(Result<Value> found);
+
 /// Success, or the reason why not.
 template <>
 class [[nodiscard]] Result<void> {
@@ -79,5 +87,18 @@ class [[nodiscard]] Result<void> {
  private:
   std::optional<Failure> _failure;
 };
+
+template <typename Value>
+Result<std::optional<Value>> orAbsent(Result<Value> found) {
+  if (found) return std::optional(std::move(found).value());
+  if (isAbsent(found.failure())) return std::optional<Value>();
+  return found.failure();
+}
+
+template <typename Value>
+Result<Value> orEmpty(Result<Value> found) {
+  if (!found && isAbsent(found.failure())) return Value();
+  return found;
+}
 
 }  // namespace tavisk

@@ -19,10 +19,10 @@ class Change {
   const Effect& effect() const { return _effect; }
 
   bool isSupported() {
-    auto reason = _steps.supported ? _steps.supported() : std::nullopt;
-    if (!reason) return true;
-    _effect.outcome = Outcome::notSupported;
-    _effect.failure = std::move(reason);
+    const auto support = _steps.supported ? _steps.supported() : Support(std::nullopt);
+    if (support && !*support) return true;
+    _effect.outcome = support ? Outcome::notSupported : Outcome::failed;
+    _effect.failure = support ? (*support)->reason : support.failure();
     return false;
   }
 

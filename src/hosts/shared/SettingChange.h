@@ -39,6 +39,20 @@ std::string textOf(Switch isOn) {
   return isOn ? "on" : "off";
 }
 
+/// Why a machine cannot have a setting, as against a look that fails.
+struct NotSupported {
+  Failure reason;
+};
+
+/// Whether a machine can have a setting: absent, it can. A failure says that this could not be found out.
+using Support = Result<std::optional<NotSupported>>;
+
+/// On the way out: a reason that may be a failed look.
+inline Support asSupport(std::optional<Failure> reason) {
+  if (!reason) return std::nullopt;
+  return std::optional(NotSupported{*std::move(reason)});
+}
+
 /// A remark that is the same whatever is asked.
 inline auto saying(std::string text) {
   return [text = std::move(text)](const auto&) { return text; };
@@ -55,12 +69,12 @@ struct Setting {
   /// Asked for once when a change begins.
   using Remark = std::function<std::string(const Value& asked)>;
 
-  std::string name;                                   ///< one of effects/SettingNames.h
-  std::string unit;                                   ///< see SettingValue
-  std::string where;                                  ///< see Effect
-  Remark undoneBy;                                    ///< see Effect
-  Remark note;                                        ///< see Effect
-  std::function<std::optional<Failure>()> supported;  ///< the reason when this machine cannot have the setting
+  std::string name;   ///< one of effects/SettingNames.h
+  std::string unit;   ///< see SettingValue
+  std::string where;  ///< see Effect
+  Remark undoneBy;    ///< see Effect
+  Remark note;        ///< see Effect
+  std::function<Support()> supported;
   Read live;
   Read stored;
   Write store;
@@ -99,7 +113,7 @@ struct Steps {
   std::string asked;
   std::function<std::string()> undoneBy;
   std::function<std::string()> note;
-  std::function<std::optional<Failure>()> supported;
+  std::function<Support()> supported;
   std::function<Result<Sight>()> live;
   std::function<Result<Sight>()> stored;
   std::function<Result<void>()> store;

@@ -85,6 +85,12 @@ Result<FileDescriptor> SystemRoot::open(const std::string& path, int flags, unsi
   return openBeneath(*prefix, path, flags, mode);
 }
 
+Result<bool> SystemRoot::isThere(const std::string& path) const {
+  const auto found = orAbsent(open(path, O_PATH));
+  if (!found) return retold(found.failure(), "look for", path);
+  return found->has_value();
+}
+
 bool SystemRoot::exists(const std::string& path) const {
   return static_cast<bool>(open(path, O_PATH));
 }

@@ -36,6 +36,9 @@ class SystemRoot {
 
   /// `flags` and `mode` are those of open(2); the descriptor is closed on exec.
   Result<FileDescriptor> open(const std::string& path, int flags, unsigned mode = 0) const;
+  /// Whether something is at the path; a link that leads nowhere is nothing. Absent is what isAbsent() says: whatever
+  /// else keeps it from being looked at is a failure.
+  Result<bool> isThere(const std::string& path) const;
   bool exists(const std::string& path) const;
   /// Absent when there is no such file or it cannot be looked at. Links among the folders of the path are followed out
   /// of the prefix too: this only tells whether to read again, and is asked often.

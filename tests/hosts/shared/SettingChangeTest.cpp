@@ -117,8 +117,10 @@ TEST_F(SettingChangeTest, takesAbsentForEmpty) {
 
 TEST_F(SettingChangeTest, writesNothingThatTheMachineCannotHave) {
   const auto reason = systemFailure("find", "/sys/power", ENOENT);
-  setting.supported = [&] { return reason; };
+  setting.supported = [&] { return std::optional(NotSupported{reason}); };
   EXPECT_EQ(change("9"), effectOf(Outcome::notSupported, {}, {}, {}, reason));
+  setting.supported = [&] { return reason; };
+  EXPECT_EQ(change("9"), effectOf(Outcome::failed, {}, {}, {}, reason)) << "it could not be found out";
   EXPECT_THAT(steps, IsEmpty());
 }
 

@@ -91,12 +91,12 @@ void LinuxRemoteShellService::setEnabled(bool enabled) {
   Setting<bool> setting;
   setting.name = setting::remoteLogin;
   setting.note = [](bool on) { return on ? "" : "open sessions stay open"; };
-  setting.supported = [this] { return whyNotSupported(); };
+  setting.supported = [this] { return asSupport(whyNotSupported()); };
   setting.live = [this] { return hasAny(&DaemonGroup::running); };
   setting.stored = [this] { return hasAny(&DaemonGroup::startingAtBoot); };
   setting.store = [this](bool on) { return store(on); };
   setting.apply = [this](bool on) { return apply(on); };
-  carryOut(setting, enabled, _machine.effects, _machine.runLoop);
+  carryOut(setting, enabled, _machine);
 }
 
 Result<bool> LinuxRemoteShellService::hasAny(Result<std::vector<Daemon>> (DaemonGroup::*those)() const) {
@@ -194,7 +194,7 @@ bool LinuxRemoteEventsService::isEnabled() {
 void LinuxRemoteEventsService::setEnabled(bool enabled) {
   Setting<bool> setting;
   setting.name = setting::remoteEvents;
-  setting.supported = [this] { return whyNotSupported(); };
+  setting.supported = [this] { return asSupport(whyNotSupported()); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return startsAtBoot(); };
   setting.store = [this](bool on) {
@@ -206,7 +206,7 @@ void LinuxRemoteEventsService::setEnabled(bool enabled) {
     if (!named) return named.failure();
     return on ? named->startAll() : named->stopAll();
   };
-  carryOut(setting, enabled, _machine.effects, _machine.runLoop);
+  carryOut(setting, enabled, _machine);
 }
 
 }  // namespace tavisk

@@ -87,7 +87,7 @@ void LinuxClockService::setTime(std::int64_t secondsSince1970) {
     asked.isNow();
     return changeTime(asked);
   };
-  carryOut(time, secondsSince1970, _machine.effects, _machine.runLoop);
+  carryOut(time, secondsSince1970, _machine);
 }
 
 Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
@@ -133,7 +133,7 @@ ZoneName LinuxClockService::timeZone() {
 void LinuxClockService::setTimeZone(const ZoneName& zone) {
   auto setting = timeZoneSetting();
   setting.store = [this](const ZoneName& asked) { return changeTimeZone(asked); };
-  carryOut(setting, zoneOfPath(zone.file()).value_or(zone), _machine.effects, _machine.runLoop);
+  carryOut(setting, zoneOfPath(zone.file()).value_or(zone), _machine);
 }
 
 Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone) {

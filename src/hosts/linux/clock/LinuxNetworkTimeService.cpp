@@ -54,13 +54,13 @@ template <typename Value>
 Setting<Value> LinuxNetworkTimeService::named(const char* name) {
   Setting<Value> setting;
   setting.name = name;
-  setting.supported = [this] { return whyNotSupported(); };
+  setting.supported = [this] { return asSupport(whyNotSupported()); };
   return setting;
 }
 
 template <typename Value>
 void LinuxNetworkTimeService::change(const Setting<Value>& setting, const std::type_identity_t<Value>& asked) {
-  carryOut(setting, asked, _machine.effects, _machine.runLoop);
+  carryOut(setting, asked, _machine);
 }
 
 Setting<bool> LinuxNetworkTimeService::runningSetting() {
@@ -139,7 +139,8 @@ void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
   if (const auto found = client(); found && *found) {
     setting.where = (*found)->serverFile;
     setting.note = [this, client = *found](const auto&) { return whatStaysInUse(*client); };
-    if ((*found)->whyNotRead) setting.supported = [this, client = *found] { return client->whyNotRead(_machine.root); };
+    if ((*found)->whyNotRead)
+      setting.supported = [this, client = *found] { return asSupport(client->whyNotRead(_machine.root)); };
   }
   setting.store = [this](const std::string& address) {
     return withClient<void>([&](const TimeDaemon& client) { return storeServer(client, address); });

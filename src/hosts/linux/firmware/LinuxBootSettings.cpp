@@ -117,7 +117,7 @@ ServiceStatus LinuxBootSettings::setBootPreference(const BootChoice& choice) {
   parts.name = setting::startupDisk;
   parts.where = EfiVariables::pathOf(BootEntries::orderVariable());
   parts.note = [this](const auto&) { return noteOnNextStart(); };
-  parts.supported = [this] { return _variables.whyNone(); };
+  parts.supported = [this] { return asSupport(_variables.whyNone()); };
   parts.stored = [this]() -> Setting<std::string>::Found {
     const auto entry = _entries.first();
     if (!entry) return entry.failure();
@@ -166,7 +166,7 @@ ServiceStatus LinuxBootSettings::setFirmwareVariable(const std::string& name, co
   Setting<std::string> parts;
   parts.name = setting::firmwareVariable + name;
   parts.where = EfiVariables::pathOf(variable);
-  parts.supported = [this] { return _variables.whyNone(); };
+  parts.supported = [this] { return asSupport(_variables.whyNone()); };
   parts.stored = [this, variable] { return _variables.read(variable); };
   parts.store = [this, variable](const std::string& text) { return _variables.write(variable, text); };
   return change(std::move(parts), value);
@@ -178,7 +178,7 @@ ServiceStatus LinuxBootSettings::change(Setting<std::string> parts, const std::s
     if (const auto failure = whyNeedsRoot("write", where)) return *failure;
     return store(value);
   };
-  const auto effect = carryOut(parts, asked, _machine.effects, _machine.runLoop);
+  const auto effect = carryOut(parts, asked, _machine);
   const bool isDone = effect.outcome == Outcome::applied || effect.outcome == Outcome::unchanged;
   return isDone ? 0 : failed;
 }

@@ -118,10 +118,10 @@ void EnclosureLock::setDisablesKeyboard(bool disables) {
   Setting<KeyboardState> setting;
   setting.name = setting::keyboardLock;
   setting.note = saying(remarkOn(engaged));
-  setting.supported = [&] { return whyNotSupported(engaged, found); };
+  setting.supported = [&] { return asSupport(whyNotSupported(engaged, found)); };
   setting.live = [&] { return stateOf(_machine.root, found); };
   setting.apply = [&](KeyboardState state) { return setAll(_machine.root, found, state); };
-  carryOut(setting, asked, _machine.effects, _machine.runLoop);
+  carryOut(setting, asked, _machine);
 }
 
 }  // namespace tavisk

@@ -20,7 +20,7 @@ bool LinuxBootLoaderFile::write(const PropertyList::Dictionary& contents) {
     const auto failure = whyNeedsRoot("write", path);
     return failure ? Result<void>(*failure) : write(architecture);
   };
-  const auto effect = carryOut(setting, architectureIn(contents), _machine.effects, _machine.runLoop);
+  const auto effect = carryOut(setting, architectureIn(contents), _machine);
   return effect.outcome != Outcome::failed;
 }
 

@@ -50,7 +50,7 @@ void LinuxPreferencesStore::writeOut() {
   for (const auto& [key, value] : std::exchange(_pending, {})) {
     auto setting = preference(key);
     setting.store = [this, &key = key](bool isOn) { return store(key, isOn); };
-    carryOut(setting, value, _machine.effects, _machine.runLoop);
+    carryOut(setting, value, _machine);
   }
 }
 

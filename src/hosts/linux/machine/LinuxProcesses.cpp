@@ -29,8 +29,7 @@ void LinuxProcessUtilities::sendSignal(int signal, ProcessId process) {
   Setting<std::string> setting;
   setting.name = setting::signalToProcess;
   setting.apply = [&](const std::string&) { return signalProcess(signal, process); };
-  carryOut(setting, std::to_string(signal) + " to process " + std::to_string(process), _machine.effects,
-           _machine.runLoop);
+  carryOut(setting, std::to_string(signal) + " to process " + std::to_string(process), _machine);
 }
 
 Result<void> LinuxProcessUtilities::signalProcess(int signal, ProcessId process) const {

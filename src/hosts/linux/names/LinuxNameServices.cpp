@@ -91,7 +91,7 @@ void LinuxHostConfigService::setComputerName(const std::string& name) {
   setting.live = [this] { return serviceComputerName(); };
   setting.stored = [this] { return prettyHostName(_machine.root); };
   setting.store = [this](const std::string& value) { return storeComputerName(value); };
-  carryOut(setting, name, _machine.effects, _machine.runLoop);
+  carryOut(setting, name, _machine);
 }
 
 /// Where the service does not run, who asks for the name reads the file.
@@ -122,7 +122,7 @@ void LinuxHostConfigService::setLocalNetworkName(const std::string& name) {
   setting.stored = [this] { return staticHostName(_machine.root); };
   setting.store = [this](const std::string& value) { return storeLocalName(value); };
   setting.apply = [this](const std::string& value) { return applyLocalName(value); };
-  carryOut(setting, name, _machine.effects, _machine.runLoop);
+  carryOut(setting, name, _machine);
 }
 
 /// The kernel's name, unless another one is announced than its first label.

@@ -180,7 +180,7 @@ Setting<Minutes> ComputerSleep::computerSleep() {
     if (asked.isNever()) return "";
     return "a machine on which nobody is logged in counts as idle, however busy its services are";
   };
-  setting.supported = [this] { return whyCannotSleep(); };
+  setting.supported = [this] { return asSupport(whyCannotSleep()); };
   setting.live = [this] { return liveMinutes(); };
   setting.stored = [this] { return storedMinutes(); };
   setting.store = [this](Minutes asked) { return storeMinutes(asked); };
@@ -193,7 +193,7 @@ Setting<bool> ComputerSleep::powerButtonSleep() {
   setting.name = setting::powerButtonSleep;
   setting.where = _config.ownDropIn();
   setting.undoneBy = [this](bool) { return _config.whatHides(section, {"HandlePowerKey"}); };
-  setting.supported = [this] { return whyNoButton(); };
+  setting.supported = [this] { return asSupport(whyNoButton()); };
   setting.live = [this] { return liveButton(); };
   setting.stored = [this] { return storedButton(); };
   setting.store = [this](bool sleeps) { return store({{"HandlePowerKey", sleeps ? "suspend" : "poweroff"}}); };

@@ -72,7 +72,7 @@ Setting<Minutes> DisplaySleep::displaySleep() const {
   setting.unit = "minutes";
   setting.where = ownfile::consoleBlanking;
   setting.note = [this](Minutes asked) { return noteOn(asked); };
-  setting.supported = [this] { return whyNoConsole(); };
+  setting.supported = [this] { return asSupport(whyNoConsole()); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };
   setting.store = [this](Minutes asked) { return store(asked); };

@@ -97,7 +97,7 @@ Setting<Minutes> HardDiskSleep::hardDiskSleep() const {
     return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::laptopMode, OtherOwner::powertop,
                                         OtherOwner::smartd, OtherOwner::hdIdle});
   };
-  setting.supported = [this] { return whyNoDisk(); };
+  setting.supported = [this] { return asSupport(whyNoDisk()); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return _rule.value(); };
   setting.store = [this](Minutes asked) { return _rule.write(asked, ruleFor(asked)); };

@@ -119,14 +119,14 @@ ControllerStatus LinuxPowerController::setDelay(std::uint32_t manufacturer, std:
   ControllerStatus status = 0;
   auto delay = known ? delaySetting(*known) : Setting<std::int64_t>();
   delay.name = setting::startupDelay;
-  if (!known) delay.supported = [&] { return known.failure(); };
+  if (!known) delay.supported = [&] { return asSupport(known.failure()); };
   delay.apply = [&](std::int64_t asked) -> Result<void> {
     auto sent = sendDelay(*known, units);
     if (!sent) status = sent.failure().code.value();
     if (!sent || known->get) return sent;
     return _machine.root.write(wishFile, textOf(asked) + "\n");
   };
-  const auto outcome = carryOut(delay, units, _machine.effects, _machine.runLoop).outcome;
+  const auto outcome = carryOut(delay, units, _machine).outcome;
   if (outcome == Outcome::notSupported) return ENOSYS;
   return outcome == Outcome::failed && status == 0 ? EIO : status;
 }

@@ -14,7 +14,9 @@ std::optional<Value> read(Setting<Value> setting, EffectSink& effects) {
 }
 
 std::optional<Failure> whyNotSupported(const Setting<bool>& setting) {
-  return setting.supported ? setting.supported() : std::nullopt;
+  const auto support = setting.supported ? setting.supported() : Support(std::nullopt);
+  if (!support) return support.failure();
+  return *support ? std::optional((*support)->reason) : std::nullopt;
 }
 
 }  // namespace
@@ -60,7 +62,7 @@ Minutes LinuxPowerSettingsService::untilSleep(SleepTimer timer, const PowerSourc
 }
 
 void LinuxPowerSettingsService::setUntilSleep(SleepTimer timer, const PowerSource& /*source*/, Minutes minutes) {
-  carryOut(settingOf(timer), minutes, _machine.effects, _machine.runLoop);
+  carryOut(settingOf(timer), minutes, _machine);
 }
 
 bool LinuxPowerSettingsService::supports(PowerSwitch which, const PowerSource& /*source*/) {
@@ -80,7 +82,7 @@ bool LinuxPowerSettingsService::isOn(PowerSwitch which, const PowerSource& /*sou
 }
 
 void LinuxPowerSettingsService::setOn(PowerSwitch which, const PowerSource& /*source*/, bool on) {
-  carryOut(settingOf(which), on, _machine.effects, _machine.runLoop);
+  carryOut(settingOf(which), on, _machine);
 }
 
 bool LinuxPowerSettingsService::restartsAfterFreeze() {
@@ -88,7 +90,7 @@ bool LinuxPowerSettingsService::restartsAfterFreeze() {
 }
 
 void LinuxPowerSettingsService::setRestartsAfterFreeze(bool restarts) {
-  carryOut(_restartAfterFreeze.restartAfterFreeze(), restarts, _machine.effects, _machine.runLoop);
+  carryOut(_restartAfterFreeze.restartAfterFreeze(), restarts, _machine);
 }
 
 }  // namespace tavisk

@@ -81,7 +81,7 @@ Setting<bool> RestartAfterPowerFailure::restartAfterPowerFailure() {
   const auto attribute = mayHave ? std::nullopt : restartAttribute(_machine.root);
   auto setting = attribute ? ofFirmware(*attribute) : ofController();
   setting.name = setting::restartAfterPowerFailure;
-  if (!mayHave && !attribute) setting.supported = [reason = known.failure()] { return reason; };
+  if (!mayHave && !attribute) setting.supported = [reason = known.failure()] { return asSupport(reason); };
   return setting;
 }
 

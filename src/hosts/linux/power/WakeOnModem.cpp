@@ -62,7 +62,7 @@ Setting<bool> WakeOnModem::wakeOnModem() const {
   setting.name = setting::wakeOnModem;
   setting.where = _rule.file();
   setting.note = [this](bool) { return whyNoRuleLasts(_machine.root); };
-  setting.supported = [this] { return whyNoPort(); };
+  setting.supported = [this] { return asSupport(whyNoPort()); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return _rule.value(); };
   setting.store = [this](bool wakes) { return _rule.write(wakes, ruleFor(wakes)); };

@@ -170,7 +170,7 @@ Setting<bool> WakeOnNetworkAccess::wakeOnNetworkAccess() const {
     return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::networkManager});
   };
   setting.note = [this](bool) { return whyItDoesNotLast(); };
-  setting.supported = [this] { return whyNoCard(); };
+  setting.supported = [this] { return asSupport(whyNoCard()); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };
   setting.store = [this](bool wakes) { return store(wakes); };

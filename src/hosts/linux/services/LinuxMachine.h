@@ -2,9 +2,13 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <type_traits>
+
 #include "base/RunLoop.h"
 #include "effects/EffectSink.h"
 #include "hosts/linux/services/ServiceAccess.h"
+#include "hosts/linux/system/MachineLock.h"
+#include "hosts/shared/SettingChange.h"
 #include "hosts/shared/SystemRoot.h"
 
 namespace tavisk {
@@ -16,5 +20,19 @@ struct LinuxMachine {
   RunLoop& runLoop;
   ServiceAccess& services;
 };
+
+/// carryOut() while no other run changes this machine.
+template <typename Value>
+Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, const LinuxMachine& machine) {
+  const auto lock = MachineLock(machine.root, machine.runLoop).hold();
+  if (lock) return carryOut(setting, asked, machine.effects, machine.runLoop);
+  const Effect effect{.setting = setting.name,
+                      .outcome = Outcome::failed,
+                      .asked = textOf(asked),
+                      .where = setting.where,
+                      .failure = lock.failure()};
+  machine.effects.record(effect);
+  return effect;
+}
 
 }  // namespace tavisk

@@ -20,6 +20,10 @@ inline constexpr const char* timesyncdServer = "/etc/systemd/timesyncd.conf.d/60
 inline constexpr const char* consoleBlanking = "/etc/tmpfiles.d/60-tavisk.conf";
 inline constexpr const char* kernelPanic = "/etc/sysctl.d/60-tavisk.conf";
 
+/// Held while a setting is changed (MachineLock).
+inline constexpr const char* machineLockFolder = "/run/tavisk";
+inline constexpr const char* machineLock = "/run/tavisk/lock";
+
 /// Beside the main file of one of the service manager's daemons: "timesyncd.conf".
 inline std::string systemdDropIn(const std::string& mainFile) {
   return "/etc/systemd/" + mainFile + ".d/60-tavisk.conf";
