@@ -13,6 +13,7 @@
 
 #include "base/Text.h"
 #include "hosts/linux/system/OwnFiles.h"
+#include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
 namespace {
@@ -52,6 +53,7 @@ Result<FileDescriptor> MachineLock::openFile() const {
   constexpr int flags = O_RDWR | O_NOFOLLOW | O_NONBLOCK;
   auto file = _root.open(ownfile::machineLock, flags);
   if (file || !isAbsent(file.failure())) return file;
+  if (auto failure = whyNeedsRoot("lock", ownfile::machineLock)) return *failure;
   if (auto made = makeFolder(); !made) return made.failure();
   file = _root.open(ownfile::machineLock, flags | O_CREAT, fileMode);
   if (!file) return file;
