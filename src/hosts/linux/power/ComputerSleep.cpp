@@ -63,17 +63,20 @@ Result<bool> ComputerSleep::liveButton() {
   return isSleep(std::move(action).value().readText());
 }
 
-Minutes ComputerSleep::storedMinutes() const {
+Result<Minutes> ComputerSleep::storedMinutes() const {
   constexpr std::chrono::minutes withoutOne{30};
   const auto action = _config.last(section, "IdleAction");
-  if (!action || !isSleep(action->value)) return {};
+  if (!action) return action.failure();
+  if (!*action || !isSleep((*action)->value)) return Minutes{};
   const auto time = _config.last(section, "IdleActionSec");
-  return Minutes::covering(time ? timeSpan(time->value).value_or(withoutOne) : withoutOne);
+  if (!time) return time.failure();
+  return Minutes::covering(*time ? timeSpan((*time)->value).value_or(withoutOne) : withoutOne);
 }
 
-bool ComputerSleep::storedButton() const {
+Result<bool> ComputerSleep::storedButton() const {
   const auto action = _config.last(section, "HandlePowerKey");
-  return action && isSleep(action->value);
+  if (!action) return action.failure();
+  return *action && isSleep((*action)->value);
 }
 
 std::optional<Failure> ComputerSleep::whyCannotSleep() {
@@ -133,7 +136,7 @@ Result<void> ComputerSleep::storeMinutes(Minutes asked) {
 }
 
 std::string ComputerSleep::whoUndoesMinutes() {
-  const auto file = _config.whatHides(section, {"IdleAction", "IdleActionSec"});
+  const auto file = _config.whatHides(section, {"IdleAction", "IdleActionSec"}).valueOr("");
   return file.empty() ? whatBlocksSleep() : file;
 }
 
@@ -192,7 +195,7 @@ Setting<bool> ComputerSleep::powerButtonSleep() {
   Setting<bool> setting;
   setting.name = setting::powerButtonSleep;
   setting.where = _config.ownDropIn();
-  setting.undoneBy = [this](bool) { return _config.whatHides(section, {"HandlePowerKey"}); };
+  setting.undoneBy = [this](bool) { return _config.whatHides(section, {"HandlePowerKey"}).valueOr(""); };
   setting.supported = [this] { return asSupport(whyNoButton()); };
   setting.live = [this] { return liveButton(); };
   setting.stored = [this] { return storedButton(); };

@@ -24,8 +24,8 @@ class ComputerSleep {
   Result<BusMessage> property(const char* name, const char* signature);
   Result<Minutes> liveMinutes();
   Result<bool> liveButton();
-  Minutes storedMinutes() const;
-  bool storedButton() const;
+  Result<Minutes> storedMinutes() const;
+  Result<bool> storedButton() const;
   std::optional<Failure> whyCannotSleep();
   std::optional<Failure> whyNoButton();
   std::string whatBlocksSleep();

@@ -47,9 +47,11 @@ std::string ruleFor(Minutes minutes) {
 bool HardDiskSleep::canStop(const SysDevice& disk) const {
   const auto folder = disk.path() + "/scsi_disk";
   for (const auto& address : _machine.root.list(folder).valueOr({})) {
-    const auto scsi = SysDevice::at(_machine.root, std::string(folder).append("/").append(address));
+    const auto scsi =
+        SysDevice::at(_machine.root, std::string(folder).append("/").append(address)).valueOr(std::nullopt);
     if (!scsi) continue;
-    const auto* attribute = scsi->has("manage_runtime_start_stop") ? "manage_runtime_start_stop" : "manage_start_stop";
+    const auto* attribute =
+        scsi->has("manage_runtime_start_stop").valueOr(false) ? "manage_runtime_start_stop" : "manage_start_stop";
     return scsi->read(attribute).valueOr("") == "1";
   }
   return false;
@@ -58,11 +60,11 @@ bool HardDiskSleep::canStop(const SysDevice& disk) const {
 std::vector<HardDiskSleep::Disk> HardDiskSleep::disks() const {
   std::vector<Disk> found;
   for (const auto& name : _machine.root.list("/sys/block").valueOr({})) {
-    const auto block = SysDevice::at(_machine.root, "/sys/block/" + name);
+    const auto block = SysDevice::at(_machine.root, "/sys/block/" + name).valueOr(std::nullopt);
     if (!name.starts_with("sd") || !block || block->read("removable").valueOr("") != "0" ||
         block->read("queue/rotational").valueOr("") != "1")
       continue;
-    auto device = SysDevice::at(_machine.root, block->path() + "/device");
+    auto device = SysDevice::at(_machine.root, block->path() + "/device").valueOr(std::nullopt);
     if (device && device->read(delay) && canStop(*device)) found.push_back({name, *device});
   }
   return found;

@@ -80,19 +80,26 @@ std::string RestartAfterFreeze::watchdogFact(const char* name) const {
   return readKernelFile(_machine.root, std::string(watchdogFacts) + name).valueOr("");
 }
 
-bool RestartAfterFreeze::isPanicStored() const {
+Result<bool> RestartAfterFreeze::isPanicStored() const {
+  const auto files = configurationFiles(
+      _machine.root, {"/etc/sysctl.d/", "/run/sysctl.d/", "/usr/local/lib/sysctl.d/", "/usr/lib/sysctl.d/"});
+  if (!files) return files.failure();
   std::string seconds;
-  for (const auto& file : configurationFiles(
-           _machine.root, {"/etc/sysctl.d/", "/run/sysctl.d/", "/usr/local/lib/sysctl.d/", "/usr/lib/sysctl.d/"}))
-    seconds = panicIn(_machine.root.read(file, powerFileLimit).valueOr("")).value_or(seconds);
+  for (const auto& file : *files) {
+    const auto text = orEmpty(_machine.root.read(file, powerFileLimit));
+    if (!text) return text.failure();
+    seconds = panicIn(*text).value_or(seconds);
+  }
   return isOnPanic(seconds);
 }
 
-Reading<bool> RestartAfterFreeze::stored() const {
-  const bool onPanic = isPanicStored();
-  if (!_machine.services.hasServiceManager()) return onPanic;
+Setting<bool>::Found RestartAfterFreeze::stored() const {
+  const auto onPanic = isPanicStored();
+  if (!onPanic) return onPanic.failure();
+  if (!_machine.services.hasServiceManager()) return *onPanic;
   const auto watchdog = _config.last(section, key);
-  return together(watchdog && isWatchdogTime(watchdog->value), onPanic);
+  if (!watchdog) return watchdog.failure();
+  return together(*watchdog && isWatchdogTime((*watchdog)->value), *onPanic);
 }
 
 Result<void> RestartAfterFreeze::store(bool restarts) const {
@@ -135,7 +142,7 @@ Setting<bool> RestartAfterFreeze::restartAfterFreeze() const {
   setting.name = setting::restartAfterFreeze;
   setting.where = ownfile::kernelPanic;
   if (_machine.services.hasServiceManager()) setting.where = _config.ownDropIn() + ", " + ownfile::kernelPanic;
-  setting.undoneBy = [this](bool) { return _config.whatHides(section, {key}); };
+  setting.undoneBy = [this](bool) { return _config.whatHides(section, {key}).valueOr(""); };
   setting.note = [this](bool) -> std::string {
     return hasWatchdog() ? "" : "no watchdog here: only a kernel that has panicked restarts, not one that hangs";
   };

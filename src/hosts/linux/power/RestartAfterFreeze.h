@@ -24,12 +24,12 @@ class RestartAfterFreeze {
   /// What the service manager means to do; whether the watchdog runs is a fact of its own.
   Result<bool> isWatchdogUsed() const;
   std::string watchdogFact(const char* name) const;
-  Reading<bool> stored() const;
+  Setting<bool>::Found stored() const;
   Result<void> store(bool restarts) const;
   Result<void> apply(bool restarts) const;
   Result<void> setWatchdog(bool restarts) const;
   Result<void> setWatchdogTime(std::chrono::microseconds time) const;
-  bool isPanicStored() const;
+  Result<bool> isPanicStored() const;
 
   LinuxMachine _machine;
   SystemdConfig _config;

@@ -16,8 +16,15 @@ const char* wordFor(bool wakes) {
 }
 
 /// The place of a serial port on the board, if the port can wake the machine from there.
-std::optional<SysDevice> wakingPlace(std::optional<SysDevice> device) {
-  while (device && !(device->subsystem() == "pnp" && device->canWake())) device = device->parent();
+Result<std::optional<SysDevice>> wakingPlace(Result<std::optional<SysDevice>> device) {
+  while (device && *device) {
+    const auto subsystem = (*device)->subsystem();
+    if (!subsystem) return subsystem.failure();
+    const auto wakes = *subsystem == "pnp" ? (*device)->canWake() : Result<bool>(false);
+    if (!wakes) return wakes.failure();
+    if (*wakes) break;
+    device = (*device)->parent();
+  }
   return device;
 }
 
@@ -33,7 +40,8 @@ std::vector<WakeOnModem::Port> WakeOnModem::ports() const {
   for (const auto& terminal : _machine.root.list(terminals).valueOr({})) {
     if (!terminal.starts_with("ttyS")) continue;
     const auto device = (std::string(terminals) + "/").append(terminal).append("/device");
-    if (auto place = wakingPlace(SysDevice::at(_machine.root, device))) found.push_back({terminal, *place});
+    const auto place = wakingPlace(SysDevice::at(_machine.root, device));
+    if (place && *place) found.push_back({terminal, **place});
   }
   return found;
 }

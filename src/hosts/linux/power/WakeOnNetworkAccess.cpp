@@ -53,10 +53,15 @@ Result<void> ask(const char* tried, const std::string& card, ethtool_wolinfo& mo
 }
 
 /// Of a card on a USB or platform bus it is often the device above that wakes; of a PCI card it is the card.
-bool isKnownToWake(const std::optional<SysDevice>& device) {
-  if (!device || device->canWake()) return device.has_value();
-  const auto above = device->subsystem() == "pci" ? std::nullopt : device->parent();
-  return above && above->canWake();
+Result<bool> isKnownToWake(const Result<std::optional<SysDevice>>& device) {
+  if (!device) return device.failure();
+  if (!*device) return false;
+  auto wakes = (*device)->canWake();
+  if (!wakes || *wakes) return wakes;
+  const auto subsystem = (*device)->subsystem();
+  if (!subsystem) return subsystem.failure();
+  const auto above = *subsystem == "pci" ? std::nullopt : (*device)->parent();
+  return above ? above->canWake() : Result<bool>(false);
 }
 
 }  // namespace
@@ -81,7 +86,8 @@ Result<void> KernelNetworkCards::setWakeModes(const std::string& card, std::uint
 }
 
 Result<bool> WakeOnNetworkAccess::canWake(const std::string& card) const {
-  if (!isKnownToWake(SysDevice::at(_machine.root, cardFolder + card + "/device"))) return false;
+  auto isKnown = isKnownToWake(SysDevice::at(_machine.root, cardFolder + card + "/device"));
+  if (!isKnown || !*isKnown) return isKnown;
   const auto modes = _cards.wakeModes(card);
   if (!modes) return modes.failure();
   return (modes->supported & magicPacket) != 0;

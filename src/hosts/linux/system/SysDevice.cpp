@@ -12,14 +12,18 @@ constexpr std::string_view top = "/sys/devices";
 
 }  // namespace
 
-std::optional<SysDevice> SysDevice::at(const SystemRoot& root, const std::string& path) {
+Result<std::optional<SysDevice>> SysDevice::at(const SystemRoot& root, const std::string& path) {
   auto resolved = root.standardized(path);
-  if (!resolved || !root.exists(*resolved)) return std::nullopt;
-  return SysDevice(root, std::move(resolved).value());
+  if (!resolved) return resolved.failure();
+  const auto there = root.isThere(*resolved);
+  if (!there) return there.failure();
+  return *there ? std::optional(SysDevice(root, std::move(resolved).value())) : std::nullopt;
 }
 
-std::string SysDevice::subsystem() const {
-  return baseName(_root->readLink(_path + "/subsystem").valueOr(""));
+Result<std::string> SysDevice::subsystem() const {
+  const auto link = orGone(_root->readLink(_path + "/subsystem"));
+  if (!link) return link.failure();
+  return *link ? baseName(**link) : std::string();
 }
 
 std::optional<SysDevice> SysDevice::parent() const {
@@ -28,12 +32,12 @@ std::optional<SysDevice> SysDevice::parent() const {
   return SysDevice(*_root, std::move(above));
 }
 
-bool SysDevice::canWake() const {
+Result<bool> SysDevice::canWake() const {
   return has(wakeSwitch);
 }
 
-bool SysDevice::has(const std::string& name) const {
-  return _root->exists(_path + "/" + name);
+Result<bool> SysDevice::has(const std::string& name) const {
+  return _root->isThere(_path + "/" + name);
 }
 
 Result<std::string> SysDevice::read(const std::string& name) const {
