@@ -26,8 +26,8 @@ class ComputerSleep {
   Result<bool> liveButton();
   Result<Minutes> storedMinutes() const;
   Result<bool> storedButton() const;
-  std::optional<Failure> whyCannotSleep();
-  std::optional<Failure> whyNoButton();
+  Support sleepSupported();
+  Support buttonSupported();
   std::string whatBlocksSleep();
   Result<void> store(const std::map<std::string, std::string>& values);
   Result<void> storeMinutes(Minutes asked);

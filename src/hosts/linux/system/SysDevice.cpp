@@ -44,8 +44,21 @@ Result<std::string> SysDevice::read(const std::string& name) const {
   return readKernelFile(*_root, _path + "/" + name);
 }
 
+Result<bool> SysDevice::says(const std::string& name, std::string_view text) const {
+  const auto value = orGone(read(name));
+  if (!value) return value.failure();
+  return *value == text;
+}
+
+Result<std::vector<std::string>> SysDevice::list(const std::string& folder) const {
+  const auto names = orGone(_root->list(_path + "/" + folder));
+  if (!names) return names.failure();
+  return names->value_or(std::vector<std::string>());
+}
+
 Result<void> SysDevice::write(const std::string& name, std::string_view value) const {
-  return writeKernelFile(*_root, _path + "/" + name, value);
+  const auto written = writeKernelFile(*_root, _path + "/" + name, value);
+  return !written && isGone(written.failure()) ? Result<void>() : written;
 }
 
 }  // namespace tavisk

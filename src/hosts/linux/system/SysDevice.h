@@ -5,6 +5,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "hosts/shared/SystemRoot.h"
 
@@ -29,6 +30,11 @@ class SysDevice {
   Result<bool> has(const std::string& name) const;
   /// isGone(): there is no such file, or no such device any more.
   Result<std::string> read(const std::string& name) const;
+  /// Whether it has the attribute and that says this.
+  Result<bool> says(const std::string& name, std::string_view text) const;
+  /// The names in one of its folders; none when it has no such folder.
+  Result<std::vector<std::string>> list(const std::string& folder) const;
+  /// To write to what is gone is no failure.
   Result<void> write(const std::string& name, std::string_view value) const;
 
  private:

@@ -155,7 +155,8 @@ TEST_F(PowerTest, RestartAfterPowerFailureComesFromTheController) {
   tree.turn(PowerSwitch::restartAfterPowerFailure, true);
   EXPECT_EQ(tree.controllerLink.policy, 1) << "as before, where it cannot always turn on";
   tree.controllerLink.error = EBUSY;
-  EXPECT_TRUE(tree.power().supports(PowerSwitch::restartAfterPowerFailure, tree.mains)) << "it did not say";
+  EXPECT_FALSE(tree.power().supports(PowerSwitch::restartAfterPowerFailure, tree.mains));
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed) << "it did not say";
 }
 
 TEST_F(PowerTest, RestartAfterPowerFailureComesFromTheFirmwareWithoutAController) {
@@ -226,6 +227,99 @@ TEST_F(PowerTest, PowerSettingsWithoutServicesSaysWhatLasts) {
   EXPECT_EQ(tree.set(SleepTimer::hardDisk, {10}).note, "no device manager runs here: lasts until the restart");
 }
 
+TEST_F(PowerTest, HardDiskSleepLeavesOutADiskThatGoesAway) {
+  tree.addDisk("sdb");
+  tree.remove("/sys/block/sdb/device/power/control");
+  const auto effect = tree.set(SleepTimer::hardDisk, {10});
+  EXPECT_EQ(effect.outcome, Outcome::applied);
+  EXPECT_EQ(effect.before, "0");
+}
+
+/// What a change of a setting looks at, and whether that tells also if the machine can have it.
+struct Look {
+  const char* path;
+  Effect (*change)(PowerTree&);
+  std::optional<PowerSwitch> supporting = std::nullopt;
+};
+
+template <SleepTimer timer>
+Effect setTimer(PowerTree& tree) {
+  return tree.set(timer, {20});
+}
+template <PowerSwitch which>
+Effect turnOn(PowerTree& tree) {
+  return tree.turn(which, true);
+}
+template <bool restarts>
+Effect setFreeze(PowerTree& tree) {
+  return tree.setRestartsAfterFreeze(restarts);
+}
+constexpr auto setComputer = setTimer<SleepTimer::computer>;
+constexpr auto setDisplay = setTimer<SleepTimer::display>;
+constexpr auto setDisk = setTimer<SleepTimer::hardDisk>;
+constexpr auto turnModem = turnOn<PowerSwitch::wakeOnModem>;
+constexpr auto turnNetwork = turnOn<PowerSwitch::wakeOnNetworkAccess>;
+constexpr auto turnButton = turnOn<PowerSwitch::powerButtonSleep>;
+constexpr auto turnFirmware = turnOn<PowerSwitch::restartAfterPowerFailure>;
+
+const Look looks[] = {
+    {"/run/dbus/system_bus_socket", setComputer},
+    {"/etc/systemd/logind.conf.d/70-later.conf", setComputer},
+    {"/dev/tty1", setDisplay},
+    {"/sys/block", setDisk},
+    {"/sys/devices/pci0000:00/0000:00:1f.2/sda-port/0:0:0:0/scsi_disk", setDisk},
+    {"/sys/devices/pci0000:00/0000:00:1f.2/sda-port/0:0:0:0/block/sda/queue/rotational", setDisk},
+    {"/etc/sysctl.d/70-later.conf", setFreeze<true>},
+    {"/dev/watchdog0", setFreeze<true>},
+    {"/sys/class/watchdog/watchdog0/nowayout", setFreeze<false>},
+    {"/run/udev/data/n2", turnNetwork},
+    {"/sys/class/net", turnNetwork, PowerSwitch::wakeOnNetworkAccess},
+    {"/sys/devices/pci0000:00/eth0-slot/power/wakeup", turnNetwork, PowerSwitch::wakeOnNetworkAccess},
+    {"/sys/class/tty", turnModem, PowerSwitch::wakeOnModem},
+    {"/sys/devices/pnp0/00:04/power/wakeup", turnModem, PowerSwitch::wakeOnModem},
+    {"/sys/bus/acpi/devices", turnButton, PowerSwitch::powerButtonSleep},
+    {"/run/dbus/system_bus_socket", turnButton, PowerSwitch::powerButtonSleep},
+    {"/sys/class/firmware-attributes", turnFirmware, PowerSwitch::restartAfterPowerFailure},
+    {"/sys/class/firmware-attributes/maker/attributes/AcPwrRcvry/possible_values", turnFirmware,
+     PowerSwitch::restartAfterPowerFailure},
+    {"/etc/tavisk/firmware-attributes.conf", turnFirmware, PowerSwitch::restartAfterPowerFailure},
+};
+
+TEST(LinuxPower, WhatCannotBeLookedAtIsAFailure) {
+  for (const auto& look : looks) {
+    PowerTree tree;
+    if (look.change == setFreeze<false>) tree.setRestartsAfterFreeze(true);
+    if (look.change == turnFirmware) tree.controllerLink.error = ENODEV;
+    tree.write("/sys/class/firmware-attributes/maker/attributes/Other/possible_values", "On;Off\n");
+    tree.loop(look.path);
+    const auto expectFailure = [&](const Effect& effect) {
+      EXPECT_EQ(effect.outcome, Outcome::failed) << look.path;
+      EXPECT_EQ(effect.failure.value_or(Failure()).code, std::errc::too_many_symbolic_link_levels) << look.path;
+    };
+    expectFailure(look.change(tree));
+    if (!look.supporting) continue;
+    EXPECT_FALSE(tree.power().supports(*look.supporting, tree.mains)) << look.path;
+    EXPECT_FALSE(tree.power().canSet(*look.supporting, tree.mains)) << look.path;
+    for (std::size_t i = tree.log.effects.size() - 2; i < tree.log.effects.size(); ++i)
+      expectFailure(tree.log.effects[i]);
+  }
+}
+
+TEST_F(PowerTest, OwnFilesThatCannotBeReadStayAsTheyAre) {
+  const std::string tooLong((std::size_t{1} << 20U) + 1, '#');
+  const Look files[] = {{"/etc/systemd/logind.conf.d/60-tavisk.conf", setComputer},
+                        {"/etc/tmpfiles.d/60-tavisk.conf", setDisplay},
+                        {"/etc/udev/rules.d/60-tavisk-disk-sleep.rules", setDisk},
+                        {"/etc/udev/rules.d/60-tavisk-wake-on-ring.rules", turnModem},
+                        {"/etc/systemd/network/99-default.link.d/60-tavisk.conf", turnNetwork},
+                        {"/etc/sysctl.d/60-tavisk.conf", setFreeze<true>}};
+  for (const auto& [path, change, supporting] : files) {
+    tree.write(path, tooLong);
+    EXPECT_EQ(change(tree).outcome, Outcome::failed) << path;
+    EXPECT_EQ(tree.file(path).size(), tooLong.size()) << path;
+  }
+}
+
 struct LinuxController {
   PowerController& service() { return tree.delays(); }
   void refuseDelays() { tree.controllerLink.delayRefusal = 0xC0; }
@@ -263,6 +357,13 @@ TEST_F(PowerTest, ControllerDoesNotGuessTheRequestsOfOtherMakers) {
 TEST_F(PowerTest, ControllerStatusesTellOfTheWayToTheController) {
   tree.controllerLink.error = ETIMEDOUT;
   EXPECT_EQ(setDelay(tree.delays(), 3), ETIMEDOUT);
+  tree.controllerLink.error = 0;
+  tree.loop("/etc/tavisk/startup-delay.conf");
+  EXPECT_EQ(setDelay(tree.delays(), 3), ELOOP);
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
+  tree.loop("/sys/class/ipmi");
+  EXPECT_FALSE(tree.delays().serviceOfClass(controllerClass));
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
   tree.remove("/sys/class/ipmi");
   EXPECT_EQ(setDelay(tree.delays(), 3), ENODEV);
 }
@@ -286,6 +387,7 @@ TEST_F(PowerTest, ControllerTakesTheAdministratorsRequests) {
                            "manufacturer=344 netfn=0x30 set=0x54 width=2 order=big unit=1 more=1"}) {
     tree.write(file, line);
     EXPECT_EQ(setDelay(tree.delays(), 100), ENOSYS) << line;
+    EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed) << "it may have one";
     EXPECT_THAT(tree.lastEffect().failure->why, HasSubstr("not understood")) << line;
   }
 }
