@@ -161,6 +161,15 @@ Result<void> ComputerSleep::restartService(Minutes asked) {
   return restarted && !minutes ? minutes.failure() : restarted;
 }
 
+/// A service that only reads its configuration again would also tell a time that was stored and not yet taken up.
+Result<void> ComputerSleep::applyButton() {
+  const auto minutes = storedMinutes();
+  if (!minutes) return minutes.failure();
+  const auto live = liveMinutes();
+  if (!live) return live.failure();
+  return *minutes == *live ? rereadConfiguration() : restartService(*minutes);
+}
+
 Result<void> ComputerSleep::rereadConfiguration() {
   const auto bus = _machine.services.systemBus();
   if (!bus) return bus.failure();
@@ -205,7 +214,7 @@ Setting<bool> ComputerSleep::powerButtonSleep() {
   setting.live = [this] { return liveButton(); };
   setting.stored = [this] { return storedButton(); };
   setting.store = [this](bool sleeps) { return store({{"HandlePowerKey", sleeps ? "suspend" : "poweroff"}}); };
-  setting.apply = [this](bool) { return rereadConfiguration(); };
+  setting.apply = [this](bool) { return applyButton(); };
   setting.settled = onceButtonReads();
   return setting;
 }

@@ -33,6 +33,7 @@ class ComputerSleep {
   Result<void> storeMinutes(Minutes asked);
   std::string whoUndoesMinutes();
   Result<void> restartService(Minutes asked);
+  Result<void> applyButton();
   Result<void> rereadConfiguration();
   std::function<bool(bool)> onceButtonReads();
 

@@ -227,6 +227,12 @@ TEST_F(PowerTest, PowerSettingsWithoutServicesSaysWhatLasts) {
   EXPECT_EQ(tree.set(SleepTimer::hardDisk, {10}).note, "no device manager runs here: lasts until the restart");
 }
 
+TEST_F(PowerTest, ComputerSleepThatIsHalfMadeIsCompleted) {
+  tree.write("/etc/systemd/logind.conf.d/60-tavisk.conf", "[Login]\nIdleAction=suspend\nIdleActionSec=20min\n");
+  tree.turn(PowerSwitch::powerButtonSleep, true);
+  EXPECT_EQ(tree.bus.sleepsAfter(), "20min") << "the service tells this time, so it has to go by it";
+}
+
 TEST_F(PowerTest, HardDiskSleepLeavesOutADiskThatGoesAway) {
   tree.addDisk("sdb");
   tree.remove("/sys/block/sdb/device/power/control");
