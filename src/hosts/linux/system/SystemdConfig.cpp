@@ -55,7 +55,11 @@ Result<std::vector<std::string>> configurationFiles(const SystemRoot& root, cons
   }
   std::vector<std::string> files;
   files.reserve(byName.size());
-  for (const auto& [name, path] : byName) files.push_back(path);
+  for (const auto& [name, path] : byName) {
+    const auto target = root.standardized(path);
+    if (!target) return target.failure();
+    if (*target != "/dev/null") files.push_back(path);
+  }
   return files;
 }
 

@@ -47,7 +47,8 @@ class SystemdConfig {
 };
 
 /// The files of these folders (each with "/" at its end) that end in ".conf", sorted by name; where two have the same
-/// name, that of the earlier folder. A folder may be missing.
+/// name, that of the earlier folder. A folder may be missing. A link to /dev/null is no file and hides the others of
+/// its name.
 Result<std::vector<std::string>> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders);
 
 /// The values of a key in one file of such a kind, in order; later lines come later.

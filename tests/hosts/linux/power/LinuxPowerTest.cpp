@@ -1,6 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
+#include <sys/stat.h>
 
 #include "hosts/linux/power/PowerTree.h"
 #include "platform/PowerControllerContract.h"
@@ -324,6 +325,16 @@ TEST_F(PowerTest, OwnFilesThatCannotBeReadStayAsTheyAre) {
     EXPECT_EQ(change(tree).outcome, Outcome::failed) << path;
     EXPECT_EQ(tree.file(path).size(), tooLong.size()) << path;
   }
+}
+
+TEST_F(PowerTest, FilesThatAreMaskedSayNothing) {
+  tree.write("/dev/null", "");
+  for (const auto* file : {"/etc/systemd/logind.conf.d/10-other.conf", "/etc/sysctl.d/10-other.conf"})
+    tree.link(file, "/dev/null");
+  std::filesystem::remove(tree.at("/dev/null"));
+  ::mkfifo(tree.at("/dev/null").c_str(), 0600);
+  EXPECT_EQ(tree.set(SleepTimer::computer, {20}).outcome, Outcome::applied);
+  EXPECT_EQ(tree.setRestartsAfterFreeze(true).outcome, Outcome::applied);
 }
 
 struct LinuxController {
