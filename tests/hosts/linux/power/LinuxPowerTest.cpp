@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
-#include <sys/stat.h>
 
 #include "hosts/linux/power/PowerTree.h"
 #include "platform/PowerControllerContract.h"
@@ -226,115 +225,6 @@ TEST_F(PowerTest, PowerSettingsWithoutServicesSaysWhatLasts) {
   EXPECT_EQ(tree.set(SleepTimer::computer, {10}).outcome, Outcome::notSupported);
   EXPECT_EQ(tree.setRestartsAfterFreeze(true).outcome, Outcome::applied);
   EXPECT_EQ(tree.set(SleepTimer::hardDisk, {10}).note, "no device manager runs here: lasts until the restart");
-}
-
-TEST_F(PowerTest, ComputerSleepThatIsHalfMadeIsCompleted) {
-  tree.write("/etc/systemd/logind.conf.d/60-tavisk.conf", "[Login]\nIdleAction=suspend\nIdleActionSec=20min\n");
-  tree.turn(PowerSwitch::powerButtonSleep, true);
-  EXPECT_EQ(tree.bus.sleepsAfter(), "20min") << "the service tells this time, so it has to go by it";
-}
-
-TEST_F(PowerTest, HardDiskSleepLeavesOutADiskThatGoesAway) {
-  tree.addDisk("sdb");
-  tree.remove("/sys/block/sdb/device/power/control");
-  const auto effect = tree.set(SleepTimer::hardDisk, {10});
-  EXPECT_EQ(effect.outcome, Outcome::applied);
-  EXPECT_EQ(effect.before, "0");
-}
-
-/// What a change of a setting looks at, and whether that tells also if the machine can have it.
-struct Look {
-  const char* path;
-  Effect (*change)(PowerTree&);
-  std::optional<PowerSwitch> supporting = std::nullopt;
-};
-
-template <SleepTimer timer>
-Effect setTimer(PowerTree& tree) {
-  return tree.set(timer, {20});
-}
-template <PowerSwitch which>
-Effect turnOn(PowerTree& tree) {
-  return tree.turn(which, true);
-}
-template <bool restarts>
-Effect setFreeze(PowerTree& tree) {
-  return tree.setRestartsAfterFreeze(restarts);
-}
-constexpr auto setComputer = setTimer<SleepTimer::computer>;
-constexpr auto setDisplay = setTimer<SleepTimer::display>;
-constexpr auto setDisk = setTimer<SleepTimer::hardDisk>;
-constexpr auto turnModem = turnOn<PowerSwitch::wakeOnModem>;
-constexpr auto turnNetwork = turnOn<PowerSwitch::wakeOnNetworkAccess>;
-constexpr auto turnButton = turnOn<PowerSwitch::powerButtonSleep>;
-constexpr auto turnFirmware = turnOn<PowerSwitch::restartAfterPowerFailure>;
-
-const Look looks[] = {
-    {"/run/dbus/system_bus_socket", setComputer},
-    {"/etc/systemd/logind.conf.d/70-later.conf", setComputer},
-    {"/dev/tty1", setDisplay},
-    {"/sys/block", setDisk},
-    {"/sys/devices/pci0000:00/0000:00:1f.2/sda-port/0:0:0:0/scsi_disk", setDisk},
-    {"/sys/devices/pci0000:00/0000:00:1f.2/sda-port/0:0:0:0/block/sda/queue/rotational", setDisk},
-    {"/etc/sysctl.d/70-later.conf", setFreeze<true>},
-    {"/dev/watchdog0", setFreeze<true>},
-    {"/sys/class/watchdog/watchdog0/nowayout", setFreeze<false>},
-    {"/run/udev/data/n2", turnNetwork},
-    {"/sys/class/net", turnNetwork, PowerSwitch::wakeOnNetworkAccess},
-    {"/sys/devices/pci0000:00/eth0-slot/power/wakeup", turnNetwork, PowerSwitch::wakeOnNetworkAccess},
-    {"/sys/class/tty", turnModem, PowerSwitch::wakeOnModem},
-    {"/sys/devices/pnp0/00:04/power/wakeup", turnModem, PowerSwitch::wakeOnModem},
-    {"/sys/bus/acpi/devices", turnButton, PowerSwitch::powerButtonSleep},
-    {"/run/dbus/system_bus_socket", turnButton, PowerSwitch::powerButtonSleep},
-    {"/sys/class/firmware-attributes", turnFirmware, PowerSwitch::restartAfterPowerFailure},
-    {"/sys/class/firmware-attributes/maker/attributes/AcPwrRcvry/possible_values", turnFirmware,
-     PowerSwitch::restartAfterPowerFailure},
-    {"/etc/tavisk/firmware-attributes.conf", turnFirmware, PowerSwitch::restartAfterPowerFailure},
-};
-
-TEST(LinuxPower, WhatCannotBeLookedAtIsAFailure) {
-  for (const auto& look : looks) {
-    PowerTree tree;
-    if (look.change == setFreeze<false>) tree.setRestartsAfterFreeze(true);
-    if (look.change == turnFirmware) tree.controllerLink.error = ENODEV;
-    tree.write("/sys/class/firmware-attributes/maker/attributes/Other/possible_values", "On;Off\n");
-    tree.loop(look.path);
-    const auto expectFailure = [&](const Effect& effect) {
-      EXPECT_EQ(effect.outcome, Outcome::failed) << look.path;
-      EXPECT_EQ(effect.failure.value_or(Failure()).code, std::errc::too_many_symbolic_link_levels) << look.path;
-    };
-    expectFailure(look.change(tree));
-    if (!look.supporting) continue;
-    EXPECT_FALSE(tree.power().supports(*look.supporting, tree.mains)) << look.path;
-    EXPECT_FALSE(tree.power().canSet(*look.supporting, tree.mains)) << look.path;
-    for (std::size_t i = tree.log.effects.size() - 2; i < tree.log.effects.size(); ++i)
-      expectFailure(tree.log.effects[i]);
-  }
-}
-
-TEST_F(PowerTest, OwnFilesThatCannotBeReadStayAsTheyAre) {
-  const std::string tooLong((std::size_t{1} << 20U) + 1, '#');
-  const Look files[] = {{"/etc/systemd/logind.conf.d/60-tavisk.conf", setComputer},
-                        {"/etc/tmpfiles.d/60-tavisk.conf", setDisplay},
-                        {"/etc/udev/rules.d/60-tavisk-disk-sleep.rules", setDisk},
-                        {"/etc/udev/rules.d/60-tavisk-wake-on-ring.rules", turnModem},
-                        {"/etc/systemd/network/99-default.link.d/60-tavisk.conf", turnNetwork},
-                        {"/etc/sysctl.d/60-tavisk.conf", setFreeze<true>}};
-  for (const auto& [path, change, supporting] : files) {
-    tree.write(path, tooLong);
-    EXPECT_EQ(change(tree).outcome, Outcome::failed) << path;
-    EXPECT_EQ(tree.file(path).size(), tooLong.size()) << path;
-  }
-}
-
-TEST_F(PowerTest, FilesThatAreMaskedSayNothing) {
-  tree.write("/dev/null", "");
-  for (const auto* file : {"/etc/systemd/logind.conf.d/10-other.conf", "/etc/sysctl.d/10-other.conf"})
-    tree.link(file, "/dev/null");
-  std::filesystem::remove(tree.at("/dev/null"));
-  ::mkfifo(tree.at("/dev/null").c_str(), 0600);
-  EXPECT_EQ(tree.set(SleepTimer::computer, {20}).outcome, Outcome::applied);
-  EXPECT_EQ(tree.setRestartsAfterFreeze(true).outcome, Outcome::applied);
 }
 
 struct LinuxController {
