@@ -51,14 +51,27 @@ void LinuxAdminAuthenticator::authenticate() {
 
 Result<void> LinuxAdminAuthenticator::authorize() {
   const auto bus = _machine.services.systemBus();
-  if (!bus) return {};  // without a bus there is no polkit
-  if ((*bus)->isInteractive()) _agent.emplace(_machine.root, _machine.runLoop);
-  const auto answer = checkAuthorization(**bus, action);
+  // Without a bus there is no polkit.
+  if (!bus) return isAbsent(bus.failure()) ? Result<void>() : bus.failure();
+  const auto asker = ::isatty(STDIN_FILENO) == 1 ? Bus::Asker([this] { return haveAgent(); }) : Bus::Asker();
+  _machine.services.askUserBy(asker);
+  const auto answer = checkAuthorization(**bus, action, asker);
   if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return {};
   if (!answer) return answer.failure();
   const std::scoped_lock lock(_mutex);
   _temporaryId = answer->temporaryId;
-  if (!answer->isGranted) return Failure{"authorize", action, "polkit does not grant it to this user"};
+  if (answer->isGranted) return {};
+  const bool isUnasked = answer->isForTheAsking && !asker;
+  return Failure{"authorize", action,
+                 isUnasked ? "polkit asks for a password, and there is no terminal to ask at: sudo tavisk ..."
+                           : "polkit does not grant it to this user"};
+}
+
+Result<void> LinuxAdminAuthenticator::haveAgent() {
+  if (_agent) return {};
+  auto started = PolkitAgent::start(_machine.root, _machine.runLoop);
+  if (!started) return started.failure();
+  _agent = std::move(started).value();
   return {};
 }
 

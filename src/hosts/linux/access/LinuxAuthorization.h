@@ -32,6 +32,7 @@ class LinuxAdminAuthenticator final : public AdminAuthenticator {
 
  private:
   Result<void> authorize();
+  Result<void> haveAgent();
   std::string takeTemporaryId();
 
   LinuxMachine _machine;

@@ -28,18 +28,31 @@ std::vector<Daemon> openSshUnits() {
           {"sshd.socket", "", ""}};
 }
 
-bool hasHostKey(const SystemRoot& root) {
+Result<bool> hasHostKey(const SystemRoot& root) {
   const auto isKey = [](const std::string& name) { return name.starts_with("ssh_host_") && name.ends_with("_key"); };
-  return std::ranges::any_of(root.list(sshFolder).valueOr({}), isKey);
+  const auto names = orEmpty(root.list(sshFolder));
+  if (!names) return names.failure();
+  return std::ranges::any_of(*names, isKey);
 }
 
 /// Whether the administrator keeps the keys elsewhere (sshd_config(5)).
-bool namesHostKeys(const SystemRoot& root) {
+Result<bool> namesHostKeys(const SystemRoot& root) {
   const auto names = [](const std::string& line) {
     const auto words = split(line, " \t\r=\"");
     return !words.empty() && lowerCased(words.front()) == "hostkey";
   };
-  return std::ranges::any_of(configurationLines(root.read(sshConfig, configurationLimit).valueOr("")), names);
+  const auto text = orEmpty(root.read(sshConfig, configurationLimit));
+  if (!text) return text.failure();
+  return std::ranges::any_of(configurationLines(*text), names);
+}
+
+/// Whether the server is another than the one whose keys can be made, or has keys.
+Result<bool> needsNoHostKey(const SystemRoot& root) {
+  const auto isOpenSsh = root.isThere(sshProgram);
+  if (!isOpenSsh) return isOpenSsh;
+  if (!*isOpenSsh) return true;
+  auto has = hasHostKey(root);
+  return has && !*has ? namesHostKeys(root) : has;
 }
 
 }  // namespace
@@ -63,11 +76,13 @@ Result<Answer> LinuxRemoteShellService::withServer(Use use) {
   return use(*found);
 }
 
-std::optional<Failure> LinuxRemoteShellService::whyNotSupported() {
+Support LinuxRemoteShellService::supported() {
   const auto known = knownServer();
-  const auto found = server();
-  if (!known || !found || !found->members().empty()) return std::nullopt;
-  return Failure{"find an SSH server", known->names(), "none of them is installed"};
+  if (!known) return known.failure();
+  const auto found = known->present();
+  if (!found) return found.failure();
+  if (!found->members().empty()) return std::nullopt;
+  return std::optional(NotSupported{{"find an SSH server", known->names(), "none of them is installed"}});
 }
 
 Result<bool> LinuxRemoteShellService::isOnInAnyWay() {
@@ -91,7 +106,7 @@ void LinuxRemoteShellService::setEnabled(bool enabled) {
   Setting<bool> setting;
   setting.name = setting::remoteLogin;
   setting.note = [](bool on) { return on ? "" : "open sessions stay open"; };
-  setting.supported = [this] { return asSupport(whyNotSupported()); };
+  setting.supported = [this] { return supported(); };
   setting.live = [this] { return hasAny(&DaemonGroup::running); };
   setting.stored = [this] { return hasAny(&DaemonGroup::startingAtBoot); };
   setting.store = [this](bool on) { return store(on); };
@@ -133,12 +148,15 @@ Result<void> LinuxRemoteShellService::apply(bool enabled) {
 
 Result<void> LinuxRemoteShellService::ensureHostKeys() {
   constexpr const char* tried = "make host keys";
-  const bool isOtherServer = !_machine.root.exists(sshProgram);
-  if (isOtherServer || hasHostKey(_machine.root) || namesHostKeys(_machine.root)) return {};
+  const auto needsNone = needsNoHostKey(_machine.root);
+  if (!needsNone) return needsNone.failure();
+  if (*needsNone) return {};
   if (auto failure = whyNeedsRoot(tried, sshFolder)) return *failure;
   const auto made = runProgram(_machine.root, {keyMaker, "-A"}, _machine.runLoop);
   if (!made) return made.failure();
-  if (hasHostKey(_machine.root)) return {};
+  const auto has = hasHostKey(_machine.root);
+  if (!has) return has.failure();
+  if (*has) return {};
   return Failure{tried, keyMaker, "it reported success, but there is no key in /etc/ssh"};
 }
 
@@ -148,13 +166,16 @@ Result<DaemonGroup> LinuxRemoteEventsService::units() {
   return DaemonGroup(_machine.services.daemons(), std::move(units).value());
 }
 
-std::optional<Failure> LinuxRemoteEventsService::whyNotSupported() {
+Support LinuxRemoteEventsService::supported() {
+  constexpr const char* tried = "find units";
   const auto named = units();
-  if (!named) return std::nullopt;
-  if (named->members().empty()) return Failure{"find units", servicesConfig, "it names none for remote-events"};
+  if (!named) return named.failure();
+  if (named->members().empty())
+    return std::optional(NotSupported{{tried, servicesConfig, "it names none for remote-events"}});
   const auto present = named->present();
-  if (!present || present->members().size() == named->members().size()) return std::nullopt;
-  return Failure{"find units", named->names(), "not all of them are installed"};
+  if (!present) return present.failure();
+  if (present->members().size() == named->members().size()) return std::nullopt;
+  return std::optional(NotSupported{{tried, named->names(), "not all of them are installed"}});
 }
 
 Setting<bool>::Found LinuxRemoteEventsService::live() {
@@ -194,7 +215,7 @@ bool LinuxRemoteEventsService::isEnabled() {
 void LinuxRemoteEventsService::setEnabled(bool enabled) {
   Setting<bool> setting;
   setting.name = setting::remoteEvents;
-  setting.supported = [this] { return asSupport(whyNotSupported()); };
+  setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return startsAtBoot(); };
   setting.store = [this](bool on) {

@@ -27,7 +27,7 @@ class LinuxRemoteShellService final : public RemoteShellService {
   Result<DaemonGroup> server();
   template <typename Answer, typename Use>
   Result<Answer> withServer(Use use);
-  std::optional<Failure> whyNotSupported();
+  Support supported();
   Result<bool> hasAny(Result<std::vector<Daemon>> (DaemonGroup::*those)() const);
   Result<bool> isOnInAnyWay();
   Result<void> store(bool enabled);
@@ -49,7 +49,7 @@ class LinuxRemoteEventsService final : public RemoteEventsService {
 
  private:
   Result<DaemonGroup> units();
-  std::optional<Failure> whyNotSupported();
+  Support supported();
   /// "partly on" when some run.
   Setting<bool>::Found live();
   Result<bool> startsAtBoot();

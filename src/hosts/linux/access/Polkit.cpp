@@ -6,6 +6,7 @@
 #include <unistd.h>
 
 #include <array>
+#include <cerrno>
 #include <chrono>
 #include <utility>
 
@@ -15,7 +16,11 @@ namespace tavisk {
 namespace {
 
 constexpr std::chrono::seconds longestStart{3};
+constexpr std::chrono::milliseconds longestEnd{100};
 constexpr std::uint32_t allowUserInteraction = 1;
+constexpr const char* checkMember = "CheckAuthorization";
+constexpr const char* checkReply = "(bba{ss})";
+constexpr const char* agentProgram = "/usr/bin/pkttyagent";
 constexpr const char* temporaryIdKey = "polkit.temporary_authorization_id";
 
 BusObject authority() {
@@ -51,24 +56,32 @@ std::string detail(BusMessage& details, const std::string& key) {
   return found;
 }
 
-}  // namespace
-
-Result<Authorization> checkAuthorization(Bus& bus, const char* action) {
+Result<Authorization> check(Bus& bus, const char* action, bool asks) {
   const Bus::Writer arguments = [&](BusMessage& message) {
     writeSubject(message, bus.uniqueName());
     message.write(action);
     message.open('a', "{ss}");
     message.close();
-    message.write(bus.isInteractive() ? allowUserInteraction : 0U);
+    message.write(asks ? allowUserInteraction : 0U);
     message.write("");
   };
-  auto reply = bus.call(authority(), "CheckAuthorization", "(bba{ss})", arguments);
+  auto reply = asks ? bus.callWithQuestion(authority(), checkMember, checkReply, arguments)
+                    : bus.query(authority(), checkMember, checkReply, arguments);
   if (!reply) return reply.failure();
   auto answer = std::move(reply).value();
   answer.enter('r', "bba{ss}");
   const bool isGranted = answer.readBoolean();
-  answer.readBoolean();
-  return Authorization{isGranted, detail(answer, temporaryIdKey)};
+  const bool isForTheAsking = answer.readBoolean();
+  return Authorization{isGranted, isForTheAsking, detail(answer, temporaryIdKey)};
+}
+
+}  // namespace
+
+Result<Authorization> checkAuthorization(Bus& bus, const char* action, const Bus::Asker& asker) {
+  const auto answer = check(bus, action, false);
+  if (!answer || answer->isGranted || !answer->isForTheAsking || !asker) return answer;
+  if (const auto ready = asker(); !ready) return ready.failure();
+  return check(bus, action, true);
 }
 
 Result<void> revokeAuthorization(Bus& bus, const std::string& temporaryId) {
@@ -77,20 +90,24 @@ Result<void> revokeAuthorization(Bus& bus, const std::string& temporaryId) {
   return {};
 }
 
-PolkitAgent::PolkitAgent(const SystemRoot& root, RunLoop& runLoop) {
+Result<PolkitAgent> PolkitAgent::start(const SystemRoot& root, RunLoop& runLoop) {
+  constexpr const char* tried = "ask for a password by";
   std::array<int, 2> ends{};
-  if (::pipe2(ends.data(), O_CLOEXEC) != 0) return;
+  if (::pipe2(ends.data(), O_CLOEXEC) != 0) return systemFailure(tried, agentProgram, errno);
   const FileDescriptor readyEnd(ends[0]);
   FileDescriptor agentEnd(ends[1]);
-  auto started =
-      RunningProgram::start(root, {"/usr/bin/pkttyagent", "--notify-fd", "3", "--fallback"}, {-1, agentEnd.number()});
-  if (!started) return;
-  _agent = std::move(started).value();
+  auto started = RunningProgram::start(root, {agentProgram, "--notify-fd", "3", "--fallback"}, {-1, agentEnd.number()});
+  if (!started) return retold(started.failure(), tried, agentProgram);
+  PolkitAgent agent(std::move(started).value());
   agentEnd = FileDescriptor();
-  // It closes its end when it is ready.
-  bool isReady = false;
-  const auto watching = runLoop.watch(readyEnd.number(), RunLoop::Readiness::readable, [&] { isReady = true; });
-  static_cast<void>(runLoop.runUntil(RunLoop::Clock::now() + longestStart, [&] { return isReady; }));
+  // It closes its end when polkit knows it, or when it ends because polkit does not.
+  bool isClosed = false;
+  const auto watching = runLoop.watch(readyEnd.number(), RunLoop::Readiness::readable, [&] { isClosed = true; });
+  if (!runLoop.runUntil(RunLoop::Clock::now() + longestStart, [&] { return isClosed; }))
+    return Failure{tried, agentProgram, "it was not ready in time"};
+  if (agent._program.endsBefore(RunLoop::Clock::now() + longestEnd, runLoop))
+    return Failure{tried, agentProgram, "polkit did not take it"};
+  return agent;
 }
 
 }  // namespace tavisk

@@ -2,8 +2,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <optional>
 #include <string>
+#include <utility>
 
 #include "base/Result.h"
 #include "base/RunLoop.h"
@@ -16,12 +16,14 @@ namespace tavisk {
 /// polkit's answer about an action.
 struct Authorization {
   bool isGranted;
+  bool isForTheAsking;      ///< not granted: the user would have to authenticate first
   std::string temporaryId;  ///< empty when nothing has to be given back
 };
 
-/// Asks polkit whether this process may do an action; at a terminal it may ask the user to authenticate. Fails with
-/// serviceUnknown where polkit is not installed.
-Result<Authorization> checkAuthorization(Bus& bus, const char* action);
+/// Asks polkit whether this process may do an action. Where the user has to authenticate first, polkit asks as soon as
+/// `asker` has made that possible (see Bus::Asker); an empty one: the user is not asked. Fails with serviceUnknown
+/// where polkit is not installed.
+Result<Authorization> checkAuthorization(Bus& bus, const char* action, const Bus::Asker& asker);
 
 /// Gives a temporary authorization back.
 Result<void> revokeAuthorization(Bus& bus, const std::string& temporaryId);
@@ -29,11 +31,13 @@ Result<void> revokeAuthorization(Bus& bus, const std::string& temporaryId);
 /// Asks the user for passwords at the terminal on behalf of polkit (pkttyagent(1)), as long as this object exists.
 class PolkitAgent {
  public:
-  /// Returns when the agent is ready, after a few seconds at most; a machine that has none goes without.
-  PolkitAgent(const SystemRoot& root, RunLoop& runLoop);
+  /// Returns when polkit knows the agent and will ask through it. Fails when that is not so after a few seconds.
+  static Result<PolkitAgent> start(const SystemRoot& root, RunLoop& runLoop);
 
  private:
-  std::optional<RunningProgram> _agent;
+  explicit PolkitAgent(RunningProgram program) : _program(std::move(program)) {}
+
+  RunningProgram _program;
 };
 
 }  // namespace tavisk

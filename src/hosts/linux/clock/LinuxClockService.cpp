@@ -32,7 +32,7 @@ bool leavesItToOthers(const Failure& failure) {
 /// By the difference: it stays right however long the daemon takes, to start or to ask the user.
 Result<void> setByDaemon(Bus& bus, const AskedTime& asked) {
   constexpr bool relative = true;
-  const auto set = bus.call(timeDaemon(), "SetTime", "", asked.microsecondsAhead(), relative, bus.isInteractive());
+  const auto set = bus.call(timeDaemon(), "SetTime", "", asked.microsecondsAhead(), relative, false);
   if (!set) return set.failure();
   return {};
 }
@@ -63,7 +63,7 @@ std::optional<Failure> LinuxClockService::whyNoClock() const {
 /// Also what the service manager knows nothing of, such as a virtual machine's tools.
 std::string LinuxClockService::whoCorrectsTheClock() {
   for (const char* program : {"chronyd", "ntpd", "systemd-timesyncd", "phc2sys", "VBoxService"})
-    if (!processesNamed(_machine.root, program).empty()) return program;
+    if (const auto found = processesNamed(_machine.root, program); found && !found->empty()) return program;
   const auto bus = _machine.services.systemBus();
   if (!bus) return {};
   auto corrected = (*bus)->property(timeDaemon(), "NTP", "b");
@@ -138,7 +138,7 @@ void LinuxClockService::setTimeZone(const ZoneName& zone) {
 
 Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone) {
   if (const auto bus = _machine.services.systemBus()) {
-    const auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone.text, (*bus)->isInteractive());
+    const auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone.text, false);
     if (!set && !leavesItToOthers(set.failure())) return set.failure();
     // The daemon does nothing for the zone that it found when it started, whatever the link says since.
     if (set && machineTimeZone(_machine.root) == zone) return updateNameFile(zone);

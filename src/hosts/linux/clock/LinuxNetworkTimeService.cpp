@@ -71,7 +71,9 @@ Setting<bool> LinuxNetworkTimeService::runningSetting() {
     return *found ? daemons().isRunning((*found)->daemon) : Result<bool>(false);
   };
   setting.apply = [this](bool isOn) {
-    return withClient<void>([&](const TimeDaemon& client) {
+    return withClient<void>([&](const TimeDaemon& client) -> Result<void> {
+      // The other half of the switch, setLaunchAtStartup().
+      if (auto may = daemons().checkMayStartAtBoot(client.daemon, isOn); !may) return may;
       return isOn ? daemons().start(client.daemon) : daemons().stop(client.daemon);
     });
   };

@@ -100,7 +100,7 @@ std::optional<Failure> openntpdWhyNotRead(const SystemRoot&) {
 }
 
 std::string timesyncdServer(const SystemRoot& root) {
-  const auto servers = SystemdConfig(root, "timesyncd.conf").words("Time", "NTP");
+  const auto servers = SystemdConfig(root, "timesyncd.conf").words("Time", "NTP").valueOr({});
   return servers.empty() ? std::string() : servers.front();
 }
 

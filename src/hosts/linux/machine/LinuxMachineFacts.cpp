@@ -72,8 +72,8 @@ bool LinuxKernelValues::isRootOnNetwork() const {
 
 std::string LinuxKeyboardInputService::layout() const {
   for (const auto* file : {keyboardFile, consoleFile})
-    if (const auto layout = assignedValue(_root, file, "XKBLAYOUT")) return *layout;
-  return assignedValue(_root, consoleFile, "KEYMAP").value_or("");
+    if (const auto layout = assignedValue(_root, file, "XKBLAYOUT").valueOr(std::nullopt)) return *layout;
+  return assignedValue(_root, consoleFile, "KEYMAP").valueOr(std::nullopt).value_or("");
 }
 
 std::optional<std::int64_t> LinuxKeyboardInputService::currentLayoutNumber() {

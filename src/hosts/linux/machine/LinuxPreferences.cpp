@@ -81,7 +81,7 @@ std::vector<std::string> LinuxUserDefaults::strings(const std::string& key) {
 /// "pt_BR" of "pt_BR.UTF-8@euro"; C and POSIX are no languages.
 std::vector<std::string> LinuxUserDefaults::machineLanguages() const {
   for (const auto* place : localeFiles) {
-    const auto locale = assignedValue(_root, place, "LANG").value_or("");
+    const auto locale = assignedValue(_root, place, "LANG").valueOr(std::nullopt).value_or("");
     const auto language = locale.substr(0, locale.find_first_of(".@"));
     if (!language.empty() && language != "C" && language != "POSIX") return {language};
   }

@@ -22,7 +22,8 @@ constexpr const char* tried = "send signal";
 
 ProcessId LinuxProcessUtilities::processNamed(const std::string& name) {
   const auto found = processesNamed(_machine.root, name);
-  return found.empty() ? 0 : *std::ranges::min_element(found);
+  if (!found) _machine.effects.recordFailure(setting::signalToProcess, found.failure());
+  return !found || found->empty() ? 0 : *std::ranges::min_element(*found);
 }
 
 void LinuxProcessUtilities::sendSignal(int signal, ProcessId process) {

@@ -78,7 +78,7 @@ class LinuxSession final : public DynamicStore::Session {
 Result<bool> LinuxHostConfigService::setByService(const char* member, const std::string& name) {
   const auto bus = _machine.services.systemBus();
   if (!bus) return false;
-  const auto set = (*bus)->call(nameService(), member, "", name, (*bus)->isInteractive());
+  const auto set = (*bus)->call(nameService(), member, "", name, false);
   if (set) return true;
   if (set.failure().code == BusErrorCode::serviceUnknown) return false;
   return set.failure();

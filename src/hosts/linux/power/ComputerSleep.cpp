@@ -7,6 +7,7 @@
 #include <memory>
 
 #include "effects/SettingNames.h"
+#include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/Rights.h"
@@ -27,15 +28,17 @@ bool isSleep(const std::string& action) {
   return std::ranges::find(words, action) != std::end(words);
 }
 
-bool hasPowerButton(const SystemRoot& root) {
+Result<bool> hasPowerButton(const SystemRoot& root) {
   const auto isButton = [](const std::string& device) {
     return device.starts_with("LNXPWRBN") || device.starts_with("PNP0C0C");
   };
-  const auto isNamedSo = [&](const std::string& device) {
-    return readKernelFile(root, inputs + ("/" + device) + "/name").valueOr("") == "Power Button";
-  };
-  return std::ranges::any_of(root.list("/sys/bus/acpi/devices").valueOr({}), isButton) ||
-         std::ranges::any_of(root.list(inputs).valueOr({}), isNamedSo);
+  const auto devices = orEmpty(root.list("/sys/bus/acpi/devices"));
+  if (!devices) return devices.failure();
+  if (std::ranges::any_of(*devices, isButton)) return true;
+  const auto names = ofEachIn(
+      root, inputs, [&](const auto& input) { return orGone(readKernelFile(root, inputs + ("/" + input) + "/name")); });
+  if (!names) return names.failure();
+  return std::ranges::find(*names, "Power Button") != names->end();
 }
 
 }  // namespace
@@ -63,40 +66,45 @@ Result<bool> ComputerSleep::liveButton() {
   return isSleep(std::move(action).value().readText());
 }
 
-Minutes ComputerSleep::storedMinutes() const {
+Result<Minutes> ComputerSleep::storedMinutes() const {
   constexpr std::chrono::minutes withoutOne{30};
   const auto action = _config.last(section, "IdleAction");
-  if (!action || !isSleep(action->value)) return {};
+  if (!action) return action.failure();
+  if (!*action || !isSleep((*action)->value)) return Minutes{};
   const auto time = _config.last(section, "IdleActionSec");
-  return Minutes::covering(time ? timeSpan(time->value).value_or(withoutOne) : withoutOne);
+  if (!time) return time.failure();
+  return Minutes::covering(*time ? timeSpan((*time)->value).value_or(withoutOne) : withoutOne);
 }
 
-bool ComputerSleep::storedButton() const {
+Result<bool> ComputerSleep::storedButton() const {
   const auto action = _config.last(section, "HandlePowerKey");
-  return action && isSleep(action->value);
+  if (!action) return action.failure();
+  return *action && isSleep((*action)->value);
 }
 
-std::optional<Failure> ComputerSleep::whyCannotSleep() {
+Support ComputerSleep::sleepSupported() {
   constexpr const char* tried = "CanSuspend";
   if (!_machine.services.hasServiceManager())
-    return Failure{tried, loginManager().service, "this machine has no login service"};
+    return NotSupported{{tried, loginManager().service, "this machine has no login service"}};
   const auto bus = _machine.services.systemBus();
+  if (!bus && isAbsent(bus.failure())) return NotSupported{bus.failure()};
   if (!bus) return bus.failure();
   auto answer = (*bus)->query(loginManager(), tried, "s");
-  // A service that does not answer is no reason: whatever is done with it then tells why.
-  if (!answer)
-    return answer.failure().code == BusErrorCode::serviceUnknown ? std::optional(answer.failure()) : std::nullopt;
+  if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return NotSupported{answer.failure()};
+  if (!answer) return answer.failure();
   if (std::move(answer).value().readText() == "na")
-    return Failure{tried, loginManager().service, "this machine cannot sleep"};
+    return NotSupported{{tried, loginManager().service, "this machine cannot sleep"}};
   // The service would take the setting and refuse to act by it.
   const auto presence = _machine.services.daemons().presence(sleepTarget);
-  if (!presence || *presence != Daemons::Presence::masked) return std::nullopt;
-  return Failure{tried, sleepTarget.unit, "it is masked: this machine is kept from sleeping"};
+  if (!presence) return presence.failure();
+  if (*presence != Daemons::Presence::masked) return std::nullopt;
+  return NotSupported{{tried, sleepTarget.unit, "it is masked: this machine is kept from sleeping"}};
 }
 
-std::optional<Failure> ComputerSleep::whyNoButton() {
-  if (!hasPowerButton(_machine.root)) return Failure{"find", inputs, "this machine has no power button"};
-  return whyCannotSleep();
+Support ComputerSleep::buttonSupported() {
+  const auto hasOne = hasPowerButton(_machine.root);
+  if (!hasOne) return hasOne.failure();
+  return *hasOne ? sleepSupported() : NotSupported{{"find", inputs, "this machine has no power button"}};
 }
 
 /// Programs that keep the machine from sleeping as long as they run.
@@ -133,7 +141,7 @@ Result<void> ComputerSleep::storeMinutes(Minutes asked) {
 }
 
 std::string ComputerSleep::whoUndoesMinutes() {
-  const auto file = _config.whatHides(section, {"IdleAction", "IdleActionSec"});
+  const auto file = _config.whatHides(section, {"IdleAction", "IdleActionSec"}).valueOr("");
   return file.empty() ? whatBlocksSleep() : file;
 }
 
@@ -151,6 +159,15 @@ Result<void> ComputerSleep::restartService(Minutes asked) {
   const auto minutes = liveMinutes();
   if (!restarted && minutes && *minutes == asked) return {};
   return restarted && !minutes ? minutes.failure() : restarted;
+}
+
+/// A service that only reads its configuration again would also tell a time that was stored and not yet taken up.
+Result<void> ComputerSleep::applyButton() {
+  const auto minutes = storedMinutes();
+  if (!minutes) return minutes.failure();
+  const auto live = liveMinutes();
+  if (!live) return live.failure();
+  return *minutes == *live ? rereadConfiguration() : restartService(*minutes);
 }
 
 Result<void> ComputerSleep::rereadConfiguration() {
@@ -180,7 +197,7 @@ Setting<Minutes> ComputerSleep::computerSleep() {
     if (asked.isNever()) return "";
     return "a machine on which nobody is logged in counts as idle, however busy its services are";
   };
-  setting.supported = [this] { return asSupport(whyCannotSleep()); };
+  setting.supported = [this] { return sleepSupported(); };
   setting.live = [this] { return liveMinutes(); };
   setting.stored = [this] { return storedMinutes(); };
   setting.store = [this](Minutes asked) { return storeMinutes(asked); };
@@ -192,12 +209,12 @@ Setting<bool> ComputerSleep::powerButtonSleep() {
   Setting<bool> setting;
   setting.name = setting::powerButtonSleep;
   setting.where = _config.ownDropIn();
-  setting.undoneBy = [this](bool) { return _config.whatHides(section, {"HandlePowerKey"}); };
-  setting.supported = [this] { return asSupport(whyNoButton()); };
+  setting.undoneBy = [this](bool) { return _config.whatHides(section, {"HandlePowerKey"}).valueOr(""); };
+  setting.supported = [this] { return buttonSupported(); };
   setting.live = [this] { return liveButton(); };
   setting.stored = [this] { return storedButton(); };
   setting.store = [this](bool sleeps) { return store({{"HandlePowerKey", sleeps ? "suspend" : "poweroff"}}); };
-  setting.apply = [this](bool) { return rereadConfiguration(); };
+  setting.apply = [this](bool) { return applyButton(); };
   setting.settled = onceButtonReads();
   return setting;
 }

@@ -24,15 +24,16 @@ class ComputerSleep {
   Result<BusMessage> property(const char* name, const char* signature);
   Result<Minutes> liveMinutes();
   Result<bool> liveButton();
-  Minutes storedMinutes() const;
-  bool storedButton() const;
-  std::optional<Failure> whyCannotSleep();
-  std::optional<Failure> whyNoButton();
+  Result<Minutes> storedMinutes() const;
+  Result<bool> storedButton() const;
+  Support sleepSupported();
+  Support buttonSupported();
   std::string whatBlocksSleep();
   Result<void> store(const std::map<std::string, std::string>& values);
   Result<void> storeMinutes(Minutes asked);
   std::string whoUndoesMinutes();
   Result<void> restartService(Minutes asked);
+  Result<void> applyButton();
   Result<void> rereadConfiguration();
   std::function<bool(bool)> onceButtonReads();
 

@@ -6,10 +6,7 @@
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
-#include "hosts/linux/power/PowerLimits.h"
 #include "hosts/linux/system/KernelFile.h"
-#include "hosts/linux/system/OwnFiles.h"
-#include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
 namespace {
@@ -31,32 +28,36 @@ Result<void> FirstConsole::write(const std::string& sequence) {
   return writeKernelFile(_root, terminal, sequence);
 }
 
-std::optional<Failure> DisplaySleep::whyNoConsole() const {
-  for (const auto* path : {terminal, secondsFile})
-    if (!_machine.root.exists(path)) return Failure{"find the text console", path, "this machine has none"};
+Support DisplaySleep::supported() const {
+  for (const auto* path : {terminal, secondsFile}) {
+    const auto there = _machine.root.isThere(path);
+    if (!there) return there.failure();
+    if (!*there) return NotSupported{{"find the text console", path, "this machine has none"}};
+  }
   return std::nullopt;
 }
 
 Setting<Minutes>::Found DisplaySleep::live() const {
-  if (whyNoConsole()) return Minutes{};
+  const auto support = supported();
+  if (!support) return support.failure();
+  if (*support) return Minutes{};
   const auto seconds = readKernelFile(_machine.root, secondsFile);
   if (!seconds) return seconds.failure();
   return Minutes::covering(std::chrono::seconds(leadingInteger(*seconds)));
 }
 
-std::optional<Minutes> DisplaySleep::stored() const {
-  const auto text = _machine.root.read(ownfile::consoleBlanking, powerFileLimit).valueOr("");
-  const auto line = text.find(lineStart);
+Result<std::optional<Minutes>> DisplaySleep::stored() const {
+  const auto text = _file.text();
+  if (!text) return text.failure();
+  const auto line = text->find(lineStart);
   if (line == std::string::npos) return std::nullopt;
   const auto start = line + lineStart.size();
-  const auto minutes = parseNumber<unsigned long>(text.substr(start, text.find(lineEnd, start) - start));
+  const auto minutes = parseNumber<unsigned long>(text->substr(start, text->find(lineEnd, start) - start));
   return minutes ? std::optional(Minutes{*minutes}) : std::nullopt;
 }
 
 Result<void> DisplaySleep::store(Minutes asked) const {
-  if (auto failure = whyNeedsRoot("write", ownfile::consoleBlanking)) return *failure;
-  const auto line = std::string(lineStart) + textOf(asked) + lineEnd;
-  return _machine.root.write(ownfile::consoleBlanking, ownfile::header + line + "\n");
+  return _file.replace(std::string(lineStart) + textOf(asked) + lineEnd + "\n");
 }
 
 std::string DisplaySleep::noteOn(Minutes asked) const {
@@ -70,9 +71,9 @@ Setting<Minutes> DisplaySleep::displaySleep() const {
   Setting<Minutes> setting;
   setting.name = setting::displaySleep;
   setting.unit = "minutes";
-  setting.where = ownfile::consoleBlanking;
+  setting.where = _file.path();
   setting.note = [this](Minutes asked) { return noteOn(asked); };
-  setting.supported = [this] { return asSupport(whyNoConsole()); };
+  setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };
   setting.store = [this](Minutes asked) { return store(asked); };

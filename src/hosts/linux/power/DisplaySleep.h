@@ -2,7 +2,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "hosts/linux/power/OwnFile.h"
 #include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/linux/system/OwnFiles.h"
 #include "hosts/shared/SettingChange.h"
 #include "platform/PowerSettingsService.h"
 
@@ -29,20 +31,22 @@ class FirstConsole final : public Console {
 class DisplaySleep {
  public:
   /// The console must outlive the object.
-  DisplaySleep(const LinuxMachine& machine, Console& console) : _machine(machine), _console(console) {}
+  DisplaySleep(const LinuxMachine& machine, Console& console)
+      : _machine(machine), _console(console), _file(machine.root, ownfile::consoleBlanking) {}
 
   /// Refers to the object.
   Setting<Minutes> displaySleep() const;
 
  private:
-  std::optional<Failure> whyNoConsole() const;
+  Support supported() const;
   Setting<Minutes>::Found live() const;
-  std::optional<Minutes> stored() const;
+  Result<std::optional<Minutes>> stored() const;
   std::string noteOn(Minutes asked) const;
   Result<void> store(Minutes asked) const;
 
   LinuxMachine _machine;
   Console& _console;
+  OwnFile _file;
 };
 
 }  // namespace tavisk

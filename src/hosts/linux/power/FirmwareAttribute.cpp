@@ -21,9 +21,11 @@ struct Row {
   std::string off;
 };
 
-std::vector<Row> knownRows(const SystemRoot& root) {
+Result<std::vector<Row>> knownRows(const SystemRoot& root) {
+  const auto text = orEmpty(root.read(firmwareAttributesFile, powerFileLimit));
+  if (!text) return text.failure();
   std::vector<Row> rows;
-  for (const auto& line : configurationLines(root.read(firmwareAttributesFile, powerFileLimit).valueOr(""))) {
+  for (const auto& line : configurationLines(*text)) {
     const auto parts = split(line, "=;");
     if (parts.size() == 3)
       rows.push_back({std::string(trimmed(parts[0])), std::string(trimmed(parts[1])), std::string(trimmed(parts[2]))});
@@ -35,10 +37,11 @@ std::vector<Row> knownRows(const SystemRoot& root) {
 }
 
 /// Whether the firmware knows both words. Drivers part them by ";" or ",".
-bool takes(const SystemRoot& root, const FirmwareAttribute& attribute) {
+Result<bool> takes(const SystemRoot& root, const FirmwareAttribute& attribute) {
+  const auto values = orGone(readKernelFile(root, attribute.folder + "possible_values"));
+  if (!values) return values.failure();
   std::vector<std::string> words;
-  for (const auto& word : split(readKernelFile(root, attribute.folder + "possible_values").valueOr(""), ";,\n"))
-    words.emplace_back(trimmed(word));
+  for (const auto& word : split(values->value_or(""), ";,\n")) words.emplace_back(trimmed(word));
   const auto has = [&](const std::string& word) { return std::ranges::find(words, word) != words.end(); };
   return has(attribute.on) && has(attribute.off);
 }
@@ -55,13 +58,18 @@ Result<void> FirmwareAttribute::set(const SystemRoot& root, bool turnOn) const {
   return writeKernelFile(root, folder + "current_value", turnOn ? on : off);
 }
 
-std::optional<FirmwareAttribute> restartAttribute(const SystemRoot& root) {
-  const auto drivers = root.list(classFolder).valueOr({});
-  if (drivers.empty()) return std::nullopt;
-  for (const auto& row : knownRows(root)) {
-    for (const auto& driver : drivers) {
+Result<std::optional<FirmwareAttribute>> restartAttribute(const SystemRoot& root) {
+  const auto drivers = orEmpty(root.list(classFolder));
+  if (!drivers) return drivers.failure();
+  if (drivers->empty()) return std::nullopt;
+  const auto rows = knownRows(root);
+  if (!rows) return rows.failure();
+  for (const auto& row : *rows) {
+    for (const auto& driver : *drivers) {
       const FirmwareAttribute attribute{classFolder + driver + "/attributes/" + row.name + "/", row.on, row.off};
-      if (takes(root, attribute)) return attribute;
+      const auto isTaken = takes(root, attribute);
+      if (!isTaken) return isTaken.failure();
+      if (*isTaken) return attribute;
     }
   }
   return std::nullopt;

@@ -25,6 +25,6 @@ struct FirmwareAttribute {
 inline constexpr const char* firmwareAttributesFile = "/etc/tavisk/firmware-attributes.conf";
 
 /// What makes this machine restart after a power failure; absent when its firmware offers nothing that is known.
-std::optional<FirmwareAttribute> restartAttribute(const SystemRoot& root);
+Result<std::optional<FirmwareAttribute>> restartAttribute(const SystemRoot& root);
 
 }  // namespace tavisk

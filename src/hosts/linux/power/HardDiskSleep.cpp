@@ -6,6 +6,7 @@
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/power/OtherOwners.h"
+#include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
 namespace {
@@ -17,12 +18,13 @@ std::string milliseconds(Minutes minutes) {
   return std::to_string(std::chrono::milliseconds(minutes.duration()).count());
 }
 
-Result<Minutes> minutesOf(const SysDevice& disk) {
-  const auto mode = disk.read(control);
+Result<std::optional<Minutes>> minutesOf(const SysDevice& disk) {
+  const auto mode = orGone(disk.read(control));
   if (!mode) return mode.failure();
-  const auto time = disk.read(delay);
+  const auto time = orGone(disk.read(delay));
   if (!time) return time.failure();
-  return *mode == "auto" ? Minutes::covering(std::chrono::milliseconds(leadingInteger(*time))) : Minutes{};
+  if (!*mode || !*time) return std::nullopt;
+  return **mode == "auto" ? Minutes::covering(std::chrono::milliseconds(leadingInteger(**time))) : Minutes{};
 }
 
 Result<void> setMinutes(const SysDevice& disk, Minutes minutes) {
@@ -40,47 +42,46 @@ std::string ruleFor(Minutes minutes) {
          R"(", ATTR{device/power/control}="auto")";
 }
 
-}  // namespace
-
 /// Where the kernel does not stop the motor itself, a suspended disk goes on turning. One attribute was split in two in
 /// Linux 6.6.
-bool HardDiskSleep::canStop(const SysDevice& disk) const {
-  const auto folder = disk.path() + "/scsi_disk";
-  for (const auto& address : _machine.root.list(folder).valueOr({})) {
-    const auto scsi = SysDevice::at(_machine.root, std::string(folder).append("/").append(address));
-    if (!scsi) continue;
-    const auto* attribute = scsi->has("manage_runtime_start_stop") ? "manage_runtime_start_stop" : "manage_start_stop";
-    return scsi->read(attribute).valueOr("") == "1";
-  }
-  return false;
+Result<bool> canStop(const SysDevice& disk) {
+  const auto addresses = disk.list("scsi_disk");
+  if (!addresses) return addresses.failure();
+  if (addresses->empty()) return false;
+  const auto folder = "scsi_disk/" + addresses->front();
+  const auto attribute = orGone(disk.read(folder + "/manage_runtime_start_stop"));
+  if (!attribute) return attribute.failure();
+  return *attribute ? **attribute == "1" : disk.says(folder + "/manage_start_stop", "1");
 }
 
-std::vector<HardDiskSleep::Disk> HardDiskSleep::disks() const {
-  std::vector<Disk> found;
-  for (const auto& name : _machine.root.list("/sys/block").valueOr({})) {
-    const auto block = SysDevice::at(_machine.root, "/sys/block/" + name);
-    if (!name.starts_with("sd") || !block || block->read("removable").valueOr("") != "0" ||
-        block->read("queue/rotational").valueOr("") != "1")
-      continue;
-    auto device = SysDevice::at(_machine.root, block->path() + "/device");
-    if (device && device->read(delay) && canStop(*device)) found.push_back({name, *device});
-  }
-  return found;
+}  // namespace
+
+Result<std::optional<HardDiskSleep::Disk>> HardDiskSleep::stoppableDisk(const std::string& name) const {
+  if (!name.starts_with("sd")) return std::nullopt;
+  const auto block = SysDevice::at(_machine.root, "/sys/block/" + name);
+  const auto disk = SysDevice::at(_machine.root, "/sys/block/" + name + "/device");
+  if (!block || !disk) return (block ? disk : block).failure();
+  if (!*block || !*disk) return std::nullopt;
+  const auto stops = allHold({[&] { return (*block)->says("removable", "0"); },
+                              [&] { return (*block)->says("queue/rotational", "1"); }, [&] { return canStop(**disk); },
+                              [&] { return (*disk)->has(delay); }});
+  if (!stops) return stops.failure();
+  return *stops ? std::optional(Disk{name, **disk}) : std::nullopt;
 }
 
-std::optional<Failure> HardDiskSleep::whyNoDisk() const {
-  if (!disks().empty()) return std::nullopt;
-  return Failure{"find", "/sys/block/sd*", "no built-in disk here has a motor that the kernel can stop"};
+Result<std::vector<HardDiskSleep::Disk>> HardDiskSleep::disks() const {
+  return ofEachIn(_machine.root, "/sys/block", [this](const std::string& name) { return stoppableDisk(name); });
+}
+
+Support HardDiskSleep::supported() const {
+  return supportBy(disks(), {"find", "/sys/block/sd*", "no built-in disk here has a motor that the kernel can stop"});
 }
 
 Setting<Minutes>::Found HardDiskSleep::live() const {
-  std::vector<DeviceValue<Minutes>> values;
-  for (const auto& disk : disks()) {
-    const auto minutes = minutesOf(disk.device);
-    if (!minutes) return minutes.failure();
-    values.push_back({disk.name, *minutes});
-  }
-  return readingOfAll(std::move(values)).value_or(Minutes{});
+  const auto found =
+      readingOfAll(ofEach(disks(), [](const Disk& disk) { return on(disk.name, minutesOf(disk.device)); }));
+  if (!found) return found.failure();
+  return found->value_or(Minutes{});
 }
 
 Result<void> HardDiskSleep::apply(Minutes asked) const {
@@ -97,7 +98,7 @@ Setting<Minutes> HardDiskSleep::hardDiskSleep() const {
     return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::laptopMode, OtherOwner::powertop,
                                         OtherOwner::smartd, OtherOwner::hdIdle});
   };
-  setting.supported = [this] { return asSupport(whyNoDisk()); };
+  setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return _rule.value(); };
   setting.store = [this](Minutes asked) { return _rule.write(asked, ruleFor(asked)); };

@@ -25,9 +25,10 @@ class HardDiskSleep {
     std::string name;
     SysDevice device;
   };
-  std::vector<Disk> disks() const;
-  bool canStop(const SysDevice& disk) const;
-  std::optional<Failure> whyNoDisk() const;
+  Result<std::vector<Disk>> disks() const;
+  /// Absent when the kernel cannot stop its motor, or it has none.
+  Result<std::optional<Disk>> stoppableDisk(const std::string& name) const;
+  Support supported() const;
   Setting<Minutes>::Found live() const;
   Result<void> apply(Minutes asked) const;
 

@@ -7,6 +7,7 @@
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
@@ -26,6 +27,16 @@ std::optional<std::uint8_t> byteIn(const PropertyList::Dictionary& properties) {
   return data && data->size() == 1 ? std::optional(data->front()) : std::nullopt;
 }
 
+ControllerStatus statusOf(const Failure& failure, int withoutCode) {
+  return failure.code ? failure.code.value() : withoutCode;
+}
+
+/// A controller of another maker cannot have the setting; a file that cannot be read or understood says nothing of it.
+Support whyNotKnown(const Failure& failure) {
+  if (failure.code == std::errc::function_not_supported) return NotSupported{failure};
+  return failure;
+}
+
 Failure invalid(const char* tried, const char* why) {
   return {tried, managementController, why, std::make_error_code(std::errc::invalid_argument)};
 }
@@ -34,22 +45,25 @@ Failure invalid(const char* tried, const char* why) {
 
 ControllerStatus LinuxPowerController::recorded(const Failure& failure) {
   _machine.effects.recordFailure(setting::startupDelay, failure);
-  return failure.code.value();
+  return statusOf(failure, EIO);
 }
 
 ControllerStatus LinuxPowerController::masterPort() {
-  if (_machine.root.exists(deviceClass)) return 0;
-  return recorded(systemFailure("look at the devices", deviceClass, ENODEV));
+  const auto there = _machine.root.isThere(deviceClass);
+  if (!there) return recorded(there.failure());
+  return *there ? 0 : recorded(systemFailure("look at the devices", deviceClass, ENODEV));
 }
 
 std::optional<PowerController::Service> LinuxPowerController::serviceOfClass(const std::string& className) {
   if (className != controllerClass) return std::nullopt;
   // The driver is loaded by this, where it is not yet; whether it opens is not asked here.
   static_cast<void>(_controller.open());
-  const auto isKcs = [this](const std::string& controller) {
-    return readKernelFile(_machine.root, controllers + controller + "/device/type").valueOr("") == "kcs";
+  const auto typeOf = [this](const std::string& controller) {
+    return orGone(readKernelFile(_machine.root, controllers + controller + "/device/type"));
   };
-  const bool hasOne = std::ranges::any_of(_machine.root.list(controllers).valueOr({}), isKcs);
+  const auto types = ofEachIn(_machine.root, controllers, typeOf);
+  if (!types) recorded(types.failure());
+  const bool hasOne = types && std::ranges::find(*types, "kcs") != types->end();
   return hasOne ? std::optional(Service{className}) : std::nullopt;
 }
 
@@ -60,8 +74,10 @@ Result<std::int64_t> LinuxPowerController::askDelay(const StartupDelayRequests& 
   return static_cast<std::int64_t>(requests.delayIn(*answer).value_or(0) / secondsEach);
 }
 
-std::optional<std::int64_t> LinuxPowerController::keptWish() const {
-  return parseNumber<std::int64_t>(readKernelFile(_machine.root, wishFile).valueOr(""));
+Result<std::optional<std::int64_t>> LinuxPowerController::keptWish() const {
+  const auto wish = orEmpty(readKernelFile(_machine.root, wishFile));
+  if (!wish) return wish.failure();
+  return parseNumber<std::int64_t>(*wish);
 }
 
 Result<void> LinuxPowerController::sendDelay(const StartupDelayRequests& requests, std::uint32_t units) {
@@ -119,15 +135,15 @@ ControllerStatus LinuxPowerController::setDelay(std::uint32_t manufacturer, std:
   ControllerStatus status = 0;
   auto delay = known ? delaySetting(*known) : Setting<std::int64_t>();
   delay.name = setting::startupDelay;
-  if (!known) delay.supported = [&] { return asSupport(known.failure()); };
+  if (!known) delay.supported = [&] { return whyNotKnown(known.failure()); };
   delay.apply = [&](std::int64_t asked) -> Result<void> {
     auto sent = sendDelay(*known, units);
-    if (!sent) status = sent.failure().code.value();
+    if (!sent) status = statusOf(sent.failure(), EIO);
     if (!sent || known->get) return sent;
     return _machine.root.write(wishFile, textOf(asked) + "\n");
   };
   const auto outcome = carryOut(delay, units, _machine).outcome;
-  if (outcome == Outcome::notSupported) return ENOSYS;
+  if (!known) return statusOf(known.failure(), ENOSYS);
   return outcome == Outcome::failed && status == 0 ? EIO : status;
 }
 

@@ -29,7 +29,7 @@ class LinuxPowerController final : public PowerController {
  private:
   Setting<std::int64_t> delaySetting(const StartupDelayRequests& requests);
   Result<std::int64_t> askDelay(const StartupDelayRequests& requests);
-  std::optional<std::int64_t> keptWish() const;
+  Result<std::optional<std::int64_t>> keptWish() const;
   Result<void> sendDelay(const StartupDelayRequests& requests, std::uint32_t units);
   ControllerStatus setDelay(std::uint32_t manufacturer, std::uint8_t units);
   /// The failure goes to the effects; its code is the status.

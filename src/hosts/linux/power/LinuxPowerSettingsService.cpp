@@ -13,10 +13,16 @@ std::optional<Value> read(Setting<Value> setting, EffectSink& effects) {
   return observe(setting, effects);
 }
 
-std::optional<Failure> whyNotSupported(const Setting<bool>& setting) {
-  const auto support = setting.supported ? setting.supported() : Support(std::nullopt);
-  if (!support) return support.failure();
-  return *support ? std::optional((*support)->reason) : std::nullopt;
+/// A look that fails is told as such: nobody knows then whether the machine can have the setting.
+Support supportOf(const Setting<bool>& setting, EffectSink& effects) {
+  auto support = setting.supported ? setting.supported() : Support(std::nullopt);
+  if (!support) effects.recordFailure(setting.name, support.failure());
+  return support;
+}
+
+bool isSupported(const Setting<bool>& setting, EffectSink& effects) {
+  const auto support = supportOf(setting, effects);
+  return support && !*support;
 }
 
 }  // namespace
@@ -66,19 +72,19 @@ void LinuxPowerSettingsService::setUntilSleep(SleepTimer timer, const PowerSourc
 }
 
 bool LinuxPowerSettingsService::supports(PowerSwitch which, const PowerSource& /*source*/) {
-  return !whyNotSupported(settingOf(which));
+  return isSupported(settingOf(which), _machine.effects);
 }
 
 bool LinuxPowerSettingsService::canSet(PowerSwitch which, const PowerSource& /*source*/) {
   const auto setting = settingOf(which);
-  const auto reason = whyNotSupported(setting);
-  if (reason) _machine.effects.recordUnsupported(setting.name, *reason);
-  return !reason;
+  const auto support = supportOf(setting, _machine.effects);
+  if (support && *support) _machine.effects.recordUnsupported(setting.name, (*support)->reason);
+  return support && !*support;
 }
 
 bool LinuxPowerSettingsService::isOn(PowerSwitch which, const PowerSource& /*source*/) {
   const auto setting = settingOf(which);
-  return !whyNotSupported(setting) && read(setting, _machine.effects).value_or(false);
+  return isSupported(setting, _machine.effects) && read(setting, _machine.effects).value_or(false);
 }
 
 void LinuxPowerSettingsService::setOn(PowerSwitch which, const PowerSource& /*source*/, bool on) {

@@ -25,7 +25,7 @@ constexpr Traces known[] = {
 };
 
 bool isAtWork(const SystemRoot& root, const Traces& traces) {
-  if (traces.process) return !processesNamed(root, traces.process).empty();
+  if (traces.process) return !processesNamed(root, traces.process).valueOr({}).empty();
   // The link may lead nowhere on a machine that is looked at from outside.
   return static_cast<bool>(root.readLink(traces.startedBy));
 }

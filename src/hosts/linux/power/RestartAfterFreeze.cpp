@@ -4,12 +4,11 @@
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/power/PowerLimits.h"
 #include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
-#include "hosts/linux/system/OwnFiles.h"
-#include "hosts/linux/system/Rights.h"
 #include "hosts/linux/system/TimeSpan.h"
 
 namespace tavisk {
@@ -53,8 +52,8 @@ bool isWatchdogTime(const std::string& text) {
 
 }  // namespace
 
-bool RestartAfterFreeze::hasWatchdog() const {
-  return _machine.root.exists("/dev/watchdog0");
+Result<bool> RestartAfterFreeze::hasWatchdog() const {
+  return _machine.root.isThere("/dev/watchdog0");
 }
 
 Result<bool> RestartAfterFreeze::isWatchdogUsed() const {
@@ -69,47 +68,59 @@ Result<bool> RestartAfterFreeze::isWatchdogUsed() const {
 Setting<bool>::Found RestartAfterFreeze::live() const {
   const auto panic = readKernelFile(_machine.root, panicFile);
   if (!panic) return panic.failure();
-  if (!hasWatchdog() || !_machine.services.hasServiceManager()) return isOnPanic(*panic);
+  const auto hasOne = hasWatchdog();
+  if (!hasOne) return hasOne.failure();
+  if (!*hasOne || !_machine.services.hasServiceManager()) return isOnPanic(*panic);
   const auto isUsed = isWatchdogUsed();
   if (!isUsed) return isUsed.failure();
-  return together(*isUsed && watchdogFact("state") != "inactive", isOnPanic(*panic));
+  const auto isIdle = isWatchdog("state", "inactive");
+  if (!isIdle) return isIdle.failure();
+  return together(*isUsed && !*isIdle, isOnPanic(*panic));
 }
 
-/// Empty when the kernel does not tell.
-std::string RestartAfterFreeze::watchdogFact(const char* name) const {
-  return readKernelFile(_machine.root, std::string(watchdogFacts) + name).valueOr("");
+Result<bool> RestartAfterFreeze::isWatchdog(const char* fact, const char* word) const {
+  const auto said = orGone(readKernelFile(_machine.root, std::string(watchdogFacts) + fact));
+  if (!said) return said.failure();
+  return *said == word;
 }
 
-bool RestartAfterFreeze::isPanicStored() const {
+Result<bool> RestartAfterFreeze::isPanicStored() const {
+  const auto files = configurationFiles(
+      _machine.root, {"/etc/sysctl.d/", "/run/sysctl.d/", "/usr/local/lib/sysctl.d/", "/usr/lib/sysctl.d/"});
+  if (!files) return files.failure();
   std::string seconds;
-  for (const auto& file : configurationFiles(
-           _machine.root, {"/etc/sysctl.d/", "/run/sysctl.d/", "/usr/local/lib/sysctl.d/", "/usr/lib/sysctl.d/"}))
-    seconds = panicIn(_machine.root.read(file, powerFileLimit).valueOr("")).value_or(seconds);
+  for (const auto& file : *files) {
+    const auto text = orEmpty(_machine.root.read(file, powerFileLimit));
+    if (!text) return text.failure();
+    seconds = panicIn(*text).value_or(seconds);
+  }
   return isOnPanic(seconds);
 }
 
-Reading<bool> RestartAfterFreeze::stored() const {
-  const bool onPanic = isPanicStored();
-  if (!_machine.services.hasServiceManager()) return onPanic;
+Setting<bool>::Found RestartAfterFreeze::stored() const {
+  const auto onPanic = isPanicStored();
+  if (!onPanic) return onPanic.failure();
+  if (!_machine.services.hasServiceManager()) return *onPanic;
   const auto watchdog = _config.last(section, key);
-  return together(watchdog && isWatchdogTime(watchdog->value), onPanic);
+  if (!watchdog) return watchdog.failure();
+  return together(*watchdog && isWatchdogTime((*watchdog)->value), *onPanic);
 }
 
 Result<void> RestartAfterFreeze::store(bool restarts) const {
-  if (auto failure = whyNeedsRoot("write", ownfile::kernelPanic)) return *failure;
   const auto panic = std::string("kernel.panic = ") + panicSecondsFor(restarts) + "\n";
-  if (auto written = _machine.root.write(ownfile::kernelPanic, ownfile::header + panic); !written) return written;
-  if (!_machine.services.hasServiceManager()) return {};
+  if (auto written = _panicFile.replace(panic); !written || !_machine.services.hasServiceManager()) return written;
   return _config.setOwn(section, {{key, restarts ? std::to_string(watchdogTime.count()) : "off"}});
 }
 
 /// The manager does not take up the file over a value that was set, so it gets both. To set 0 is to go back to the file
 /// as it was when it was read. A watchdog that cannot be stopped would soon reset the machine.
-Result<void> RestartAfterFreeze::setWatchdog(bool restarts) const {
-  const bool isForGood = watchdogFact("nowayout") == "1" && watchdogFact("state") == "active";
-  if (!restarts && isForGood && isWatchdogUsed().valueOr(true))
-    return Failure{"turn off", "/dev/watchdog0", "it cannot be stopped before the restart (nowayout)"};
-  if (auto set = setWatchdogTime(restarts ? watchdogTime : std::chrono::seconds(0)); !set || restarts) return set;
+Result<void> RestartAfterFreeze::turnWatchdogOff() const {
+  const auto isForGood =
+      allHold({[this] { return isWatchdog("nowayout", "1"); }, [this] { return isWatchdog("state", "active"); },
+               [this] { return isWatchdogUsed(); }});
+  if (!isForGood) return isForGood.failure();
+  if (*isForGood) return Failure{"turn off", "/dev/watchdog0", "it cannot be stopped before the restart (nowayout)"};
+  if (auto set = setWatchdogTime(std::chrono::seconds(0)); !set) return set;
   const auto isUsed = isWatchdogUsed();
   if (!isUsed) return isUsed.failure();
   return *isUsed ? reloadServiceManager(_machine.services) : Result<void>();
@@ -126,18 +137,21 @@ Result<void> RestartAfterFreeze::setWatchdogTime(std::chrono::microseconds time)
 
 Result<void> RestartAfterFreeze::apply(bool restarts) const {
   const auto panic = writeKernelFile(_machine.root, panicFile, panicSecondsFor(restarts));
-  const auto watchdog = _machine.services.hasServiceManager() ? setWatchdog(restarts) : Result<void>();
+  if (!_machine.services.hasServiceManager()) return panic;
+  const auto watchdog = restarts ? setWatchdogTime(watchdogTime) : turnWatchdogOff();
   return panic ? watchdog : panic;
 }
 
 Setting<bool> RestartAfterFreeze::restartAfterFreeze() const {
   Setting<bool> setting;
   setting.name = setting::restartAfterFreeze;
-  setting.where = ownfile::kernelPanic;
-  if (_machine.services.hasServiceManager()) setting.where = _config.ownDropIn() + ", " + ownfile::kernelPanic;
-  setting.undoneBy = [this](bool) { return _config.whatHides(section, {key}); };
+  setting.where = _panicFile.path();
+  if (_machine.services.hasServiceManager()) setting.where = _config.ownDropIn() + ", " + setting.where;
+  setting.undoneBy = [this](bool) { return _config.whatHides(section, {key}).valueOr(""); };
   setting.note = [this](bool) -> std::string {
-    return hasWatchdog() ? "" : "no watchdog here: only a kernel that has panicked restarts, not one that hangs";
+    return hasWatchdog().valueOr(true)
+               ? ""
+               : "no watchdog here: only a kernel that has panicked restarts, not one that hangs";
   };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };

@@ -2,7 +2,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "hosts/linux/power/OwnFile.h"
 #include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/linux/system/OwnFiles.h"
 #include "hosts/linux/system/SystemdConfig.h"
 #include "hosts/shared/SettingChange.h"
 
@@ -13,26 +15,29 @@ namespace tavisk {
 /// may differ; the detail then says which one is on.
 class RestartAfterFreeze {
  public:
-  explicit RestartAfterFreeze(const LinuxMachine& machine) : _machine(machine), _config(machine.root, "system.conf") {}
+  explicit RestartAfterFreeze(const LinuxMachine& machine)
+      : _machine(machine), _config(machine.root, "system.conf"), _panicFile(machine.root, ownfile::kernelPanic) {}
 
   /// Refers to the object.
   Setting<bool> restartAfterFreeze() const;
 
  private:
-  bool hasWatchdog() const;
+  Result<bool> hasWatchdog() const;
   Setting<bool>::Found live() const;
   /// What the service manager means to do; whether the watchdog runs is a fact of its own.
   Result<bool> isWatchdogUsed() const;
-  std::string watchdogFact(const char* name) const;
-  Reading<bool> stored() const;
+  /// Whether the kernel says so of the watchdog; it need not tell.
+  Result<bool> isWatchdog(const char* fact, const char* word) const;
+  Setting<bool>::Found stored() const;
   Result<void> store(bool restarts) const;
   Result<void> apply(bool restarts) const;
-  Result<void> setWatchdog(bool restarts) const;
+  Result<void> turnWatchdogOff() const;
   Result<void> setWatchdogTime(std::chrono::microseconds time) const;
-  bool isPanicStored() const;
+  Result<bool> isPanicStored() const;
 
   LinuxMachine _machine;
   SystemdConfig _config;
+  OwnFile _panicFile;
 };
 
 }  // namespace tavisk

@@ -21,10 +21,10 @@ constexpr bool knows(unsigned policies, Policy policy) {
   return ((policies >> policy) & 1U) != 0;
 }
 
-/// Whether the controller may still have such policies: whatever is done with it then tells why it did not say.
-bool isUndecided(const std::error_code& error) {
-  return error == std::errc::permission_denied || error == std::errc::device_or_resource_busy ||
-         error == std::errc::timed_out;
+/// Whether there is no controller with such policies, as against one that did not say.
+bool hasNone(const std::error_code& error) {
+  return !error || error == std::errc::no_such_device || error == std::errc::no_such_device_or_address ||
+         error == std::errc::function_not_supported || error == std::errc::invalid_argument;
 }
 
 }  // namespace
@@ -77,11 +77,15 @@ Setting<bool> RestartAfterPowerFailure::ofFirmware(const FirmwareAttribute& attr
 
 Setting<bool> RestartAfterPowerFailure::restartAfterPowerFailure() {
   const auto known = policies();
-  const bool mayHave = known || isUndecided(known.failure().code);
-  const auto attribute = mayHave ? std::nullopt : restartAttribute(_machine.root);
-  auto setting = attribute ? ofFirmware(*attribute) : ofController();
+  const bool isLackedByController = !known && hasNone(known.failure().code);
+  const auto attribute = isLackedByController ? restartAttribute(_machine.root) : std::nullopt;
+  auto setting = attribute && *attribute ? ofFirmware(**attribute) : ofController();
   setting.name = setting::restartAfterPowerFailure;
-  if (!mayHave && !attribute) setting.supported = [reason = known.failure()] { return asSupport(reason); };
+  if (known || (attribute && *attribute)) return setting;
+  if (!isLackedByController || !attribute)
+    setting.supported = [failed = attribute ? known.failure() : attribute.failure()]() -> Support { return failed; };
+  else
+    setting.supported = [reason = known.failure()]() -> Support { return NotSupported{reason}; };
   return setting;
 }
 

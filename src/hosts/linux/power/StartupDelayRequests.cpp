@@ -78,7 +78,9 @@ std::optional<std::uint64_t> StartupDelayRequests::delayIn(const std::vector<std
 }
 
 Result<StartupDelayRequests> startupDelayRequests(const SystemRoot& root, std::uint32_t manufacturer) {
-  for (const auto& line : configurationLines(root.read(startupDelayFile, powerFileLimit).valueOr(""))) {
+  const auto text = orEmpty(root.read(startupDelayFile, powerFileLimit));
+  if (!text) return text.failure();
+  for (const auto& line : configurationLines(*text)) {
     const auto requests = requestsIn(line);
     if (!requests) return Failure{"read", startupDelayFile, "this line is not understood: " + line};
     if (requests->manufacturer == manufacturer) return *requests;
@@ -86,7 +88,8 @@ Result<StartupDelayRequests> startupDelayRequests(const SystemRoot& root, std::u
   const auto* known = std::ranges::find(builtIn, manufacturer, &StartupDelayRequests::manufacturer);
   if (known != std::end(builtIn)) return *known;
   return Failure{"find the requests for the start-up delay", startupDelayFile,
-                 "none is known for controllers of manufacturer " + std::to_string(manufacturer)};
+                 "none is known for controllers of manufacturer " + std::to_string(manufacturer),
+                 std::make_error_code(std::errc::function_not_supported)};
 }
 
 }  // namespace tavisk

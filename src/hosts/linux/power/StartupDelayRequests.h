@@ -35,7 +35,8 @@ struct StartupDelayRequests {
 /// "manufacturer=343 netfn=0x30 set=0x54 get=0x55 width=2 order=big unit=1"; without "get" when there is none.
 inline constexpr const char* startupDelayFile = "/etc/tavisk/startup-delay.conf";
 
-/// Fails at a line of that file that is not understood, and when no row is for this maker.
+/// Fails with the code ENOSYS when no row is for this maker, without a code at a line of that file that is not
+/// understood.
 Result<StartupDelayRequests> startupDelayRequests(const SystemRoot& root, std::uint32_t manufacturer);
 
 }  // namespace tavisk

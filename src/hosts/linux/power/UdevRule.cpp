@@ -3,9 +3,7 @@
 #include "hosts/linux/power/UdevRule.h"
 
 #include "base/Text.h"
-#include "hosts/linux/power/PowerLimits.h"
 #include "hosts/linux/system/OwnFiles.h"
-#include "hosts/linux/system/Rights.h"
 #include "hosts/shared/SettingChange.h"
 
 namespace tavisk {
@@ -40,25 +38,26 @@ std::optional<bool> valueOf(const std::string& text) {
 
 template <typename Value>
 UdevRule<Value>::UdevRule(const SystemRoot& root, const std::string& setting)
-    : _root(root), _file(ownfile::udevRule(setting)) {}
+    : _file(root, ownfile::udevRule(setting)) {}
 
 template <typename Value>
-std::optional<Value> UdevRule<Value>::value() const {
-  const auto text = textIn(_root.read(_file, powerFileLimit).valueOr(""));
+Result<std::optional<Value>> UdevRule<Value>::value() const {
+  const auto rule = _file.text();
+  if (!rule) return rule.failure();
+  const auto text = textIn(*rule);
   return text ? valueOf<Value>(*text) : std::nullopt;
 }
 
 template <typename Value>
 Result<void> UdevRule<Value>::write(Value value, const std::string& rule) const {
-  if (auto failure = whyNeedsRoot("write", _file)) return *failure;
-  return _root.write(_file, ownfile::header + std::string(valueLine) + textOf(value) + "\n" + rule + "\n");
+  return _file.replace(std::string(valueLine) + textOf(value) + "\n" + rule + "\n");
 }
 
 template class UdevRule<Minutes>;
 template class UdevRule<bool>;
 
 std::string whyNoRuleLasts(const SystemRoot& root) {
-  return root.exists("/run/udev/control") ? "" : "no device manager runs here: lasts until the restart";
+  return root.isThere("/run/udev/control").valueOr(true) ? "" : "no device manager runs here: lasts until the restart";
 }
 
 }  // namespace tavisk

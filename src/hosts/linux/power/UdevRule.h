@@ -5,7 +5,7 @@
 #include <optional>
 #include <string>
 
-#include "hosts/shared/SystemRoot.h"
+#include "hosts/linux/power/OwnFile.h"
 #include "platform/PowerSettingsService.h"
 
 namespace tavisk {
@@ -18,15 +18,14 @@ class UdevRule {
   /// `setting` is part of the file's name: "disk-sleep". The root must outlive the object.
   UdevRule(const SystemRoot& root, const std::string& setting);
 
-  const std::string& file() const { return _file; }
+  const std::string& file() const { return _file.path(); }
   /// Absent when there is no such file.
-  std::optional<Value> value() const;
+  Result<std::optional<Value>> value() const;
   /// `rule` is one line; it is to set what `value` means.
   Result<void> write(Value value, const std::string& rule) const;
 
  private:
-  const SystemRoot& _root;
-  std::string _file;
+  OwnFile _file;
 };
 
 extern template class UdevRule<Minutes>;

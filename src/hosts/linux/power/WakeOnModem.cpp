@@ -4,6 +4,7 @@
 
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/DeviceValues.h"
+#include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
 namespace {
@@ -16,9 +17,21 @@ const char* wordFor(bool wakes) {
 }
 
 /// The place of a serial port on the board, if the port can wake the machine from there.
-std::optional<SysDevice> wakingPlace(std::optional<SysDevice> device) {
-  while (device && !(device->subsystem() == "pnp" && device->canWake())) device = device->parent();
+Result<std::optional<SysDevice>> wakingPlace(std::optional<SysDevice> device) {
+  for (; device; device = device->parent()) {
+    const auto subsystem = device->subsystem();
+    if (!subsystem) return subsystem.failure();
+    const auto canWake = device->canWake();
+    if (!canWake) return canWake.failure();
+    if (*subsystem == "pnp" && *canWake) break;
+  }
   return device;
+}
+
+Result<std::optional<bool>> wakes(const SysDevice& place) {
+  const auto word = orGone(place.read(wakeSwitch));
+  if (!word) return word.failure();
+  return *word ? std::optional(**word == enabled) : std::nullopt;
 }
 
 std::string ruleFor(bool wakes) {
@@ -28,29 +41,25 @@ std::string ruleFor(bool wakes) {
 
 }  // namespace
 
-std::vector<WakeOnModem::Port> WakeOnModem::ports() const {
-  std::vector<Port> found;
-  for (const auto& terminal : _machine.root.list(terminals).valueOr({})) {
-    if (!terminal.starts_with("ttyS")) continue;
-    const auto device = (std::string(terminals) + "/").append(terminal).append("/device");
-    if (auto place = wakingPlace(SysDevice::at(_machine.root, device))) found.push_back({terminal, *place});
-  }
-  return found;
+Result<std::optional<WakeOnModem::Port>> WakeOnModem::wakingPort(const std::string& terminal) const {
+  if (!terminal.starts_with("ttyS")) return std::nullopt;
+  const auto device = SysDevice::at(_machine.root, (std::string(terminals) + "/").append(terminal).append("/device"));
+  if (!device) return device.failure();
+  const auto place = wakingPlace(*device);
+  if (!place) return place.failure();
+  return *place ? std::optional(Port{terminal, **place}) : std::nullopt;
 }
 
-std::optional<Failure> WakeOnModem::whyNoPort() const {
-  if (!ports().empty()) return std::nullopt;
-  return Failure{"find", std::string(terminals) + "/ttyS*", "no serial port here can wake the machine"};
+Result<std::vector<WakeOnModem::Port>> WakeOnModem::ports() const {
+  return ofEachIn(_machine.root, terminals, [this](const std::string& terminal) { return wakingPort(terminal); });
+}
+
+Support WakeOnModem::supported() const {
+  return supportBy(ports(), {"find", std::string(terminals) + "/ttyS*", "no serial port here can wake the machine"});
 }
 
 Setting<bool>::Found WakeOnModem::live() const {
-  std::vector<DeviceValue<bool>> values;
-  for (const auto& port : ports()) {
-    const auto word = port.place.read(wakeSwitch);
-    if (!word) return word.failure();
-    values.push_back({port.terminal, *word == enabled});
-  }
-  return readingOfAll(std::move(values));
+  return readingOfAll(ofEach(ports(), [](const Port& port) { return on(port.terminal, wakes(port.place)); }));
 }
 
 Result<void> WakeOnModem::apply(bool wakes) const {
@@ -62,7 +71,7 @@ Setting<bool> WakeOnModem::wakeOnModem() const {
   setting.name = setting::wakeOnModem;
   setting.where = _rule.file();
   setting.note = [this](bool) { return whyNoRuleLasts(_machine.root); };
-  setting.supported = [this] { return asSupport(whyNoPort()); };
+  setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return _rule.value(); };
   setting.store = [this](bool wakes) { return _rule.write(wakes, ruleFor(wakes)); };

@@ -25,8 +25,10 @@ class WakeOnModem {
     std::string terminal;
     SysDevice place;
   };
-  std::vector<Port> ports() const;
-  std::optional<Failure> whyNoPort() const;
+  Result<std::vector<Port>> ports() const;
+  /// Absent when the terminal is no serial port that can wake the machine.
+  Result<std::optional<Port>> wakingPort(const std::string& terminal) const;
+  Support supported() const;
   Setting<bool>::Found live() const;
   Result<void> apply(bool wakes) const;
 

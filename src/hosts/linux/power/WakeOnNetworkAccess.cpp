@@ -9,12 +9,14 @@
 #include <sys/socket.h>
 
 #include <cerrno>
+#include <set>
 
 #include "base/FileDescriptor.h"
 #include "base/Path.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/power/OtherOwners.h"
+#include "hosts/linux/power/OwnFile.h"
 #include "hosts/linux/power/PowerLimits.h"
 #include "hosts/linux/power/UdevRule.h"
 #include "hosts/linux/system/ConfigurationLines.h"
@@ -53,10 +55,13 @@ Result<void> ask(const char* tried, const std::string& card, ethtool_wolinfo& mo
 }
 
 /// Of a card on a USB or platform bus it is often the device above that wakes; of a PCI card it is the card.
-bool isKnownToWake(const std::optional<SysDevice>& device) {
-  if (!device || device->canWake()) return device.has_value();
-  const auto above = device->subsystem() == "pci" ? std::nullopt : device->parent();
-  return above && above->canWake();
+Result<bool> isKnownToWake(const SysDevice& device) {
+  const auto canWake = device.canWake();
+  if (!canWake || *canWake) return canWake;
+  const auto subsystem = device.subsystem();
+  if (!subsystem) return subsystem.failure();
+  const auto above = *subsystem == "pci" ? std::nullopt : device.parent();
+  return above ? above->canWake() : false;
 }
 
 }  // namespace
@@ -67,7 +72,8 @@ Result<WakeModes> KernelNetworkCards::wakeModes(const std::string& card) {
   modes.cmd = ETHTOOL_GWOL;
   const auto answer = ask("ETHTOOL_GWOL", card, modes);
   if (answer) return WakeModes{modes.supported, modes.wolopts};
-  if (answer.failure().code == std::errc::operation_not_supported) return WakeModes{};
+  const auto& error = answer.failure().code;
+  if (error == std::errc::operation_not_supported || error == std::errc::no_such_device) return WakeModes{};
   return answer.failure();
 }
 
@@ -77,83 +83,81 @@ Result<void> KernelNetworkCards::setWakeModes(const std::string& card, std::uint
   ethtool_wolinfo wanted{};
   wanted.cmd = ETHTOOL_SWOL;
   wanted.wolopts = modes;
-  return ask(tried, card, wanted);
+  const auto done = ask(tried, card, wanted);
+  return !done && done.failure().code == std::errc::no_such_device ? Result<void>() : done;
 }
 
-Result<bool> WakeOnNetworkAccess::canWake(const std::string& card) const {
-  if (!isKnownToWake(SysDevice::at(_machine.root, cardFolder + card + "/device"))) return false;
+Result<std::optional<std::string>> WakeOnNetworkAccess::wakingCard(const std::string& card) const {
+  const auto device = SysDevice::at(_machine.root, cardFolder + card + "/device");
+  if (!device) return device.failure();
+  if (!*device) return std::nullopt;
+  const auto isKnown = isKnownToWake(**device);
+  if (!isKnown) return isKnown.failure();
+  if (!*isKnown) return std::nullopt;
   const auto modes = _cards.wakeModes(card);
   if (!modes) return modes.failure();
-  return (modes->supported & magicPacket) != 0;
+  return (modes->supported & magicPacket) != 0 ? std::optional(card) : std::nullopt;
 }
 
 Result<std::vector<std::string>> WakeOnNetworkAccess::wakingCards() const {
-  std::vector<std::string> found;
-  for (const auto& card : _machine.root.list(cardFolder).valueOr({})) {
-    const auto can = canWake(card);
-    if (!can) return can.failure();
-    if (*can) found.push_back(card);
-  }
-  return found;
+  return ofEachIn(_machine.root, cardFolder, [this](const std::string& card) { return wakingCard(card); });
 }
 
-/// Cards that cannot be asked are no reason: whatever is done with them then tells why.
-std::optional<Failure> WakeOnNetworkAccess::whyNoCard() const {
-  const auto cards = wakingCards();
-  if (!cards || !cards->empty()) return std::nullopt;
-  return Failure{"find", "/sys/class/net", "no network card here can wake the machine"};
+Support WakeOnNetworkAccess::supported() const {
+  return supportBy(wakingCards(), {"find", "/sys/class/net", "no network card here can wake the machine"});
 }
 
 Setting<bool>::Found WakeOnNetworkAccess::live() const {
-  const auto cards = wakingCards();
-  if (!cards) return cards.failure();
-  std::vector<DeviceValue<bool>> values;
-  for (const auto& card : *cards) {
+  const auto valueOf = [this](const std::string& card) -> Result<std::optional<DeviceValue<bool>>> {
     const auto modes = _cards.wakeModes(card);
     if (!modes) return modes.failure();
-    values.push_back({card, modes->enabled != 0});
-  }
-  return readingOfAll(std::move(values));
+    return DeviceValue<bool>{card, modes->enabled != 0};
+  };
+  return readingOfAll(ofEach(wakingCards(), valueOf));
 }
 
 Result<void> WakeOnNetworkAccess::apply(bool wakes) const {
-  const auto cards = wakingCards();
-  if (!cards) return cards.failure();
-  return setEach(*cards, [&](const std::string& card) { return _cards.setWakeModes(card, wakes ? magicPacket : 0); });
+  return setEach(wakingCards(),
+                 [&](const std::string& card) { return _cards.setWakeModes(card, wakes ? magicPacket : 0); });
 }
 
 /// The device manager notes by which file it has set up a card.
-std::string WakeOnNetworkAccess::linkFileOf(const std::string& card) const {
-  const auto number = readKernelFile(_machine.root, cardFolder + card + "/ifindex").valueOr("");
-  const auto facts = _machine.root.read("/run/udev/data/n" + number, powerFileLimit).valueOr("");
-  for (const auto& line : configurationLines(facts))
+Result<std::string> WakeOnNetworkAccess::linkFileOf(const std::string& card) const {
+  const auto number = orGone(readKernelFile(_machine.root, cardFolder + card + "/ifindex"));
+  if (!number) return number.failure();
+  const auto facts = orEmpty(_machine.root.read("/run/udev/data/n" + number->value_or(""), powerFileLimit));
+  if (!facts) return facts.failure();
+  for (const auto& line : configurationLines(*facts))
     if (const auto fact = namedValueIn(line); fact && fact->name == "E:ID_NET_LINK_FILE") return baseName(fact->value);
   return usualLinkFile;
 }
 
 /// The usual one as well, for cards that are still to come.
-std::set<std::string> WakeOnNetworkAccess::dropIns() const {
+Result<std::vector<std::string>> WakeOnNetworkAccess::dropIns() const {
+  const auto cards = wakingCards();
+  if (!cards) return cards.failure();
   std::set<std::string> files{ownfile::linkDropIn(usualLinkFile)};
-  for (const auto& card : wakingCards().valueOr({})) files.insert(ownfile::linkDropIn(linkFileOf(card)));
-  return files;
+  for (const auto& card : *cards) {
+    const auto file = linkFileOf(card);
+    if (!file) return file.failure();
+    files.insert(ownfile::linkDropIn(*file));
+  }
+  return std::vector(files.begin(), files.end());
 }
 
-std::optional<Reading<bool>> WakeOnNetworkAccess::stored() const {
-  std::vector<DeviceValue<bool>> values;
-  for (const auto& file : dropIns()) {
-    const auto words = assignments(_machine.root.read(file, powerFileLimit).valueOr(""), section, key);
-    values.push_back({file, words.empty() ? std::nullopt : std::optional(words.back() != never)});
-  }
-  return readingOfAll(std::move(values));
+Setting<bool>::Found WakeOnNetworkAccess::stored() const {
+  const auto valueOf = [this](const std::string& file) -> Result<std::optional<DeviceValue<bool>>> {
+    const auto text = OwnFile(_machine.root, file).text();
+    if (!text) return text.failure();
+    const auto words = assignments(*text, section, key);
+    return DeviceValue<bool>{file, words.empty() ? std::nullopt : std::optional(words.back() != never)};
+  };
+  return readingOfAll(ofEach(dropIns(), valueOf));
 }
 
 Result<void> WakeOnNetworkAccess::store(bool wakes) const {
-  for (const auto& file : dropIns()) {
-    if (auto failure = whyNeedsRoot("write", file)) return *failure;
-    const auto text = std::string(ownfile::header) + "[Link]\nWakeOnLan=" + (wakes ? "magic" : never) + "\n";
-    if (auto written = _machine.root.write(file, text); !written) return written;
-  }
-  return {};
+  const auto lines = std::string("[Link]\nWakeOnLan=") + (wakes ? "magic" : never) + "\n";
+  return setEach(dropIns(), [&](const std::string& file) { return OwnFile(_machine.root, file).replace(lines); });
 }
 
 std::string WakeOnNetworkAccess::whyItDoesNotLast() const {
@@ -170,7 +174,7 @@ Setting<bool> WakeOnNetworkAccess::wakeOnNetworkAccess() const {
     return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::networkManager});
   };
   setting.note = [this](bool) { return whyItDoesNotLast(); };
-  setting.supported = [this] { return asSupport(whyNoCard()); };
+  setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };
   setting.store = [this](bool wakes) { return store(wakes); };

@@ -3,7 +3,8 @@
 #pragma once
 
 #include <cstdint>
-#include <set>
+#include <optional>
+#include <string>
 #include <vector>
 
 #include "hosts/linux/services/LinuxMachine.h"
@@ -23,9 +24,9 @@ inline constexpr std::uint32_t magicPacket = 1U << 5U;
 class NetworkCards {
  public:
   virtual ~NetworkCards() = default;
-  /// A card without such modes has none supported.
+  /// A card without such modes has none supported, and so has one that has gone away.
   virtual Result<WakeModes> wakeModes(const std::string& card) = 0;
-  /// Success proves nothing: some drivers ignore it.
+  /// Success proves nothing: some drivers ignore it, and a card may have gone away.
   virtual Result<void> setWakeModes(const std::string& card, std::uint32_t modes) = 0;
 };
 
@@ -52,15 +53,16 @@ class WakeOnNetworkAccess {
   Setting<bool> wakeOnNetworkAccess() const;
 
  private:
-  Result<bool> canWake(const std::string& card) const;
+  /// The card by its name; absent when it cannot wake the machine.
+  Result<std::optional<std::string>> wakingCard(const std::string& card) const;
   Result<std::vector<std::string>> wakingCards() const;
-  std::optional<Failure> whyNoCard() const;
+  Support supported() const;
   Setting<bool>::Found live() const;
-  std::optional<Reading<bool>> stored() const;
+  Setting<bool>::Found stored() const;
   Result<void> store(bool wakes) const;
   Result<void> apply(bool wakes) const;
-  std::set<std::string> dropIns() const;
-  std::string linkFileOf(const std::string& card) const;
+  Result<std::vector<std::string>> dropIns() const;
+  Result<std::string> linkFileOf(const std::string& card) const;
   std::string whyItDoesNotLast() const;
 
   LinuxMachine _machine;

@@ -4,7 +4,6 @@
 
 #include <fcntl.h>
 #include <sys/socket.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -82,11 +81,7 @@ std::error_code make_error_code(BusErrorCode code) {
 }
 
 Bus::Bus(const SystemdLibrary& library, sd_bus* bus, Kind kind, RunLoop* runLoop)
-    : _library(library),
-      _bus(bus),
-      _kind(kind),
-      _runLoop(runLoop),
-      _interactive(::geteuid() != 0 && ::isatty(STDIN_FILENO) == 1) {}
+    : _library(library), _bus(bus), _kind(kind), _runLoop(runLoop) {}
 
 Bus::~Bus() {
   _library.sd_bus_close_unref(_bus);
@@ -153,7 +148,15 @@ bool Bus::wasSilent(const BusObject& object) const {
 
 Result<BusMessage> Bus::call(const BusObject& object, const char* member, const char* replySignature,
                              const Writer& arguments, std::chrono::seconds longest) {
-  return exchange(object, member, replySignature, arguments, _interactive, _interactive ? timeForQuestions : longest);
+  auto reply = exchange(object, member, replySignature, arguments, false, longest);
+  if (reply || !_asker || reply.failure().code != BusErrorCode::interactionRequired) return reply;
+  if (const auto ready = _asker(); !ready) return ready.failure();
+  return callWithQuestion(object, member, replySignature, arguments);
+}
+
+Result<BusMessage> Bus::callWithQuestion(const BusObject& object, const char* member, const char* replySignature,
+                                         const Writer& arguments) {
+  return exchange(object, member, replySignature, arguments, true, timeForQuestions);
 }
 
 Result<BusMessage> Bus::query(const BusObject& object, const char* member, const char* replySignature,
@@ -162,7 +165,7 @@ Result<BusMessage> Bus::query(const BusObject& object, const char* member, const
 }
 
 Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, const char* replySignature,
-                                 const Writer& arguments, bool mayAsk, std::chrono::seconds longest) {
+                                 const Writer& arguments, bool asks, std::chrono::seconds longest) {
   if (wasSilent(object)) return Failure{member, object.path, "this service has just left a call without an answer"};
   sd_bus_message* handle = nullptr;
   int result = _library.sd_bus_message_new_method_call(_bus, &handle, destination(object), object.path.c_str(),
@@ -173,13 +176,13 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
   if (const auto error = request.error()) return systemFailure(member, object.path, error.value());
   const auto left = timeFor(longest);
   if (left.count() == 0) return systemFailure(member, object.path, ETIMEDOUT);
-  const auto question = mayAsk && _runLoop ? _runLoop->pauseLimit() : RunLoop::Registration();
-  _library.sd_bus_message_set_allow_interactive_authorization(handle, mayAsk ? 1 : 0);
+  const auto question = asks && _runLoop ? _runLoop->pauseLimit() : RunLoop::Registration();
+  _library.sd_bus_message_set_allow_interactive_authorization(handle, asks ? 1 : 0);
 
   BusError error(_library);
   sd_bus_message* answer = nullptr;
   const auto began = std::chrono::steady_clock::now();
-  result = _library.sd_bus_call(_bus, handle, microseconds(mayAsk ? longest : left), error.handle(), &answer);
+  result = _library.sd_bus_call(_bus, handle, microseconds(asks ? longest : left), error.handle(), &answer);
   // A service that ended during the call has the same error at once.
   const auto now = std::chrono::steady_clock::now();
   if (result == -ETIMEDOUT && now - began >= longest) _silentSince[object.service] = now;

@@ -50,16 +50,18 @@ class Bus {
   ~Bus();
 
   bool isOpen() const;
-  /// Whether services may ask the user to authenticate while a call waits: the user is not root and sits at a terminal.
-  /// Calls then have all the time they need, and it does not count against the limit.
-  bool isInteractive() const { return _interactive; }
+  /// Makes the user ready to be asked to authenticate: success means that a question will be shown.
+  using Asker = std::function<Result<void>()>;
+  /// Without one (as at first, or an empty one) the user is not asked.
+  void askUserBy(Asker asker) { _asker = std::move(asker); }
 
   /// By which others on the message bus know this connection.
   std::string uniqueName() const;
 
   using Writer = std::function<void(BusMessage&)>;
   /// Calls and waits for the reply. A service that has not answered in time is not asked again for a while: calls to it
-  /// fail at once.
+  /// fail at once. When the service wants the user to authenticate first, and there is a way to ask, it is called again
+  /// by callWithQuestion().
   Result<BusMessage> call(const BusObject& object, const char* member, const char* replySignature,
                           const Writer& arguments, std::chrono::seconds longest = usualTime);
   template <typename... Arguments>
@@ -75,6 +77,9 @@ class Bus {
                            const Arguments&... arguments) {
     return query(object, member, replySignature, Writer([&](BusMessage& message) { (message.write(arguments), ...); }));
   }
+  /// As call(), of a service that asks the user meanwhile: the time of the question does not count against the limit.
+  Result<BusMessage> callWithQuestion(const BusObject& object, const char* member, const char* replySignature,
+                                      const Writer& arguments);
   /// The value of a property, ready to be read.
   Result<BusMessage> property(const BusObject& object, const char* name, const char* signature);
   /// `value` writes one of this type.
@@ -112,7 +117,7 @@ class Bus {
   int start(const FileDescriptor& connection);
   int awaitReady();
   Result<BusMessage> exchange(const BusObject& object, const char* member, const char* replySignature,
-                              const Writer& arguments, bool mayAsk, std::chrono::seconds longest);
+                              const Writer& arguments, bool asks, std::chrono::seconds longest);
   const char* destination(const BusObject& object) const;
   bool wasSilent(const BusObject& object) const;
 
@@ -120,7 +125,7 @@ class Bus {
   sd_bus* _bus;
   Kind _kind;
   RunLoop* _runLoop;
-  bool _interactive;
+  Asker _asker;
   std::map<std::string, std::chrono::steady_clock::time_point, std::less<>> _silentSince;  ///< by service
 };
 

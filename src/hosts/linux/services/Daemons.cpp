@@ -2,7 +2,17 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/services/Daemons.h"
 
+#include "hosts/linux/system/Rights.h"
+
 namespace tavisk {
+
+Result<void> Daemons::checkMayStartAtBoot(const Daemon& daemon, bool start) {
+  const auto forRoot = whyNeedsRoot(start ? "enable" : "disable", daemon.unit);
+  if (!forRoot) return {};
+  const auto starts = startsAtBoot(daemon);
+  if (!starts) return starts.failure();
+  return *starts == start ? Result<void>() : *forRoot;
+}
 
 DaemonGroup::DaemonGroup(Daemons& daemons, std::vector<std::string> units)
     : _daemons(daemons), _units(std::make_shared<const std::vector<std::string>>(std::move(units))) {

@@ -28,7 +28,7 @@ class Daemons {
   virtual Result<Presence> presence(const Daemon& daemon) = 0;
   virtual Result<bool> isRunning(const Daemon& daemon) = 0;
   virtual Result<bool> startsAtBoot(const Daemon& daemon) = 0;
-  /// One after the other; the first failure ends it.
+  /// One after the other; the first failure ends it. Only root may; whoever is not is refused before anything changes.
   virtual Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) = 0;
   /// Success means that the daemon runs: one that was started and ended at once, or never began, is a failure.
   virtual Result<void> start(const Daemon& daemon) = 0;
@@ -37,6 +37,10 @@ class Daemons {
   virtual Result<void> restart(const Daemon& daemon) = 0;
   /// A daemon that does not run stays so. Returns without waiting for the restart to end.
   virtual Result<void> restartIfRunning(const Daemon& daemon) = 0;
+
+  /// Asked before a daemon is started or stopped that is to start at boot or no longer to: fails where setStartAtBoot()
+  /// would have something to change and the caller is not root.
+  Result<void> checkMayStartAtBoot(const Daemon& daemon, bool start);
 };
 
 /// Daemons that belong together, such as a service and the socket that starts it, the most important one first.

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/services/InitScriptDaemons.h"
 
+#include <algorithm>
 #include <chrono>
 #include <string_view>
 #include <utility>
@@ -34,32 +35,39 @@ bool isLinkTo(std::string_view script, std::string_view kinds, std::string_view 
 }  // namespace
 
 Result<Daemons::Presence> InitScriptDaemons::presence(const Daemon& daemon) {
-  const bool hasScript = *daemon.script != '\0' && _root.exists(scriptOf(daemon));
-  return hasScript && hasProgram(daemon) ? Presence::installed : Presence::absent;
+  const auto hasScript = *daemon.script == '\0' ? Result<bool>(false) : _root.isThere(scriptOf(daemon));
+  const auto isInstalled = hasScript && *hasScript ? hasProgram(daemon) : hasScript;
+  if (!isInstalled) return isInstalled.failure();
+  return *isInstalled ? Presence::installed : Presence::absent;
 }
 
 /// A package that was removed, but not purged, leaves its script behind.
-bool InitScriptDaemons::hasProgram(const Daemon& daemon) const {
-  return _root.exists(std::string("/usr/sbin/") + daemon.program) ||
-         _root.exists(std::string("/usr/bin/") + daemon.program);
+Result<bool> InitScriptDaemons::hasProgram(const Daemon& daemon) const {
+  auto there = _root.isThere(std::string("/usr/sbin/") + daemon.program);
+  if (!there || *there) return there;
+  return _root.isThere(std::string("/usr/bin/") + daemon.program);
 }
 
-std::vector<ProcessId> InitScriptDaemons::processes(const Daemon& daemon) const {
+Result<std::vector<ProcessId>> InitScriptDaemons::processes(const Daemon& daemon) const {
   auto found = processesNamed(_root, daemon.program);
-  if (*daemon.processFile == '\0') return found;
-  const auto written = leadingInteger(_root.read(daemon.processFile, processFileLimit).valueOr(""));
-  std::erase_if(found, [written](ProcessId id) { return id != written; });
-  return found;
+  if (!found || *daemon.processFile == '\0') return found;
+  const auto written = orEmpty(_root.read(daemon.processFile, processFileLimit));
+  if (!written) return written.failure();
+  auto own = std::move(found).value();
+  std::erase_if(own, [id = leadingInteger(*written)](ProcessId process) { return process != id; });
+  return own;
 }
 
 Result<bool> InitScriptDaemons::isRunning(const Daemon& daemon) {
-  return !processes(daemon).empty();
+  const auto found = processes(daemon);
+  if (!found) return found.failure();
+  return !found->empty();
 }
 
-bool InitScriptDaemons::hasLink(const Daemon& daemon, const char* kinds) const {
-  for (const auto& link : _root.list(levelFolder).valueOr({}))
-    if (isLinkTo(daemon.script, kinds, link)) return true;
-  return false;
+Result<bool> InitScriptDaemons::hasLink(const Daemon& daemon, const char* kinds) const {
+  const auto links = orEmpty(_root.list(levelFolder));
+  if (!links) return links.failure();
+  return std::ranges::any_of(*links, [&](const auto& link) { return isLinkTo(daemon.script, kinds, link); });
 }
 
 Result<bool> InitScriptDaemons::startsAtBoot(const Daemon& daemon) {
@@ -74,16 +82,16 @@ Result<void> InitScriptDaemons::setStartAtBoot(const std::vector<Daemon>& daemon
 
 Result<void> InitScriptDaemons::turnLinks(const Daemon& daemon, bool starts) {
   // "enable" and "disable" turn links round; there must be some.
-  if (!hasLink(daemon, "SK"))
+  const auto isLinked = hasLink(daemon, "SK");
+  if (!isLinked) return isLinked.failure();
+  if (!*isLinked)
     if (auto made = run({linkTool, daemon.script, "defaults"}); !made) return made;
   return run({linkTool, daemon.script, starts ? "enable" : "disable"});
 }
 
 Result<void> InitScriptDaemons::start(const Daemon& daemon) {
   if (auto started = runScript(daemon, "start"); !started) return started;
-  if (awaitBeginning(daemon)) return {};
-  return Failure{"start", scriptOf(daemon),
-                 "it reported success, but " + std::string(daemon.program) + " does not run"};
+  return awaitBeginning(daemon);
 }
 
 Result<void> InitScriptDaemons::stop(const Daemon& daemon) {
@@ -92,26 +100,36 @@ Result<void> InitScriptDaemons::stop(const Daemon& daemon) {
 }
 
 /// A daemon may write the file with its process id after its script has ended.
-bool InitScriptDaemons::awaitBeginning(const Daemon& daemon) {
-  const auto runs = [&] { return !processes(daemon).empty(); };
-  if (*daemon.processFile == '\0') return runs();
+Result<void> InitScriptDaemons::awaitBeginning(const Daemon& daemon) {
+  auto running = isRunning(daemon);
+  const auto runs = [&] { return !(running = isRunning(daemon)) || *running; };
   const auto looking = _runLoop.every(betweenLooks, [] {});
-  return _runLoop.runUntil(RunLoop::Clock::now() + longestStart, runs);
+  if (*daemon.processFile != '\0') static_cast<void>(_runLoop.runUntil(RunLoop::Clock::now() + longestStart, runs));
+  if (!running) return running.failure();
+  if (*running) return {};
+  return Failure{"start", scriptOf(daemon),
+                 "it reported success, but " + std::string(daemon.program) + " does not run"};
 }
 
 /// The script may have sent a signal and not waited.
 Result<void> InitScriptDaemons::awaitEnd(const Daemon& daemon) {
+  const auto ending = processes(daemon);
+  if (!ending) return ending.failure();
   std::vector<ProcessHandle> handles;
   std::vector<RunLoop::Registration> watches;
-  for (const auto process : processes(daemon)) {
+  for (const auto process : *ending) {
     auto handle = ProcessHandle::of(process);
-    if (!handle) continue;  // it has ended since
+    if (!handle && handle.failure().code == std::errc::no_such_process) continue;  // it has ended since
+    if (!handle) return handle.failure();
     handles.push_back(std::move(handle).value());
     const auto stopLooking = [&watches, index = watches.size()] { watches[index].cancel(); };
     watches.push_back(_runLoop.watch(handles.back().descriptor(), RunLoop::Readiness::readable, stopLooking));
   }
-  const auto isGone = [&] { return processes(daemon).empty(); };
-  if (_runLoop.runUntil(RunLoop::Clock::now() + longestStop, isGone)) return {};
+  auto running = isRunning(daemon);
+  const auto isGone = [&] { return !(running = isRunning(daemon)) || !*running; };
+  static_cast<void>(_runLoop.runUntil(RunLoop::Clock::now() + longestStop, isGone));
+  if (!running) return running.failure();
+  if (!*running) return {};
   return Failure{"stop", scriptOf(daemon), "it reported success, but " + std::string(daemon.program) + " still runs"};
 }
 
@@ -121,7 +139,8 @@ Result<void> InitScriptDaemons::restart(const Daemon& daemon) {
 
 Result<void> InitScriptDaemons::restartIfRunning(const Daemon& daemon) {
   const auto running = isRunning(daemon);
-  if (!running || !*running) return {};
+  if (!running) return running.failure();
+  if (!*running) return {};
   return runScript(daemon, "restart");
 }
 

@@ -29,11 +29,11 @@ class InitScriptDaemons final : public Daemons {
   Result<void> restartIfRunning(const Daemon& daemon) override;
 
  private:
-  bool hasProgram(const Daemon& daemon) const;
-  std::vector<ProcessId> processes(const Daemon& daemon) const;
-  bool hasLink(const Daemon& daemon, const char* kinds) const;
+  Result<bool> hasProgram(const Daemon& daemon) const;
+  Result<std::vector<ProcessId>> processes(const Daemon& daemon) const;
+  Result<bool> hasLink(const Daemon& daemon, const char* kinds) const;
   Result<void> turnLinks(const Daemon& daemon, bool starts);
-  bool awaitBeginning(const Daemon& daemon);
+  Result<void> awaitBeginning(const Daemon& daemon);
   Result<void> awaitEnd(const Daemon& daemon);
   Result<void> runScript(const Daemon& daemon, const char* action);
   Result<void> run(const std::vector<std::string>& words);

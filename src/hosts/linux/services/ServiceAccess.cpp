@@ -2,10 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/services/ServiceAccess.h"
 
+#include <cerrno>
 #include <chrono>
-
-#include "hosts/linux/services/InitScriptDaemons.h"
-#include "hosts/linux/services/UnitDaemons.h"
 
 namespace tavisk {
 namespace {
@@ -15,8 +13,18 @@ constexpr std::chrono::seconds slow{1};
 
 }  // namespace
 
-bool ServiceAccess::hasServiceManager() const {
-  return _root.exists(managerMark);
+Result<bool> ServiceAccess::lookForManager() {
+  const auto now = RunLoop::Clock::now();
+  if (_lookFailure && now - _lookedAt < Bus::timeWithoutRetry) return *_lookFailure;
+  _lookFailure.reset();
+  auto there = _root.isThere(managerMark);
+  if (!there) _lookFailure = there.failure();
+  _lookedAt = now;
+  return there;
+}
+
+bool ServiceAccess::hasServiceManager() {
+  return lookForManager().valueOr(true);
 }
 
 Result<const SystemdLibrary*> ServiceAccess::library() {
@@ -29,20 +37,28 @@ Result<const SystemdLibrary*> ServiceAccess::library() {
 }
 
 Result<std::unique_ptr<Bus>> ServiceAccess::open(const Connection& connection) {
-  if (!hasServiceManager()) return Failure{"connect", connection.socket, "this machine has no service manager"};
+  const auto isManaged = lookForManager();
+  if (!isManaged) return isManaged.failure();
+  if (!*isManaged)
+    return Failure{"connect", connection.socket, "this machine has no service manager",
+                   std::error_code(ENOENT, std::generic_category())};
   const auto opened = library();
   if (!opened) return opened.failure();
   return Bus::open(**opened, _root, connection.socket, connection.kind, &_runLoop);
 }
 
 Result<Bus*> ServiceAccess::use(Connection& connection) {
-  if (connection.bus && connection.bus->isOpen()) return connection.bus.get();
+  if (connection.bus && connection.bus->isOpen()) {
+    connection.bus->askUserBy(_asker);
+    return connection.bus.get();
+  }
   const auto began = RunLoop::Clock::now();
   if (connection.failure && began - connection.failedAt < Bus::timeWithoutRetry) return *connection.failure;
   connection.failure.reset();
   auto bus = open(connection);
   if (bus) {
     connection.bus = std::move(bus).value();
+    connection.bus->askUserBy(_asker);
     return connection.bus.get();
   }
   connection.failedAt = RunLoop::Clock::now();
@@ -67,9 +83,8 @@ Result<std::unique_ptr<Bus>> ServiceAccess::openSystemBus() const {
 }
 
 Daemons& ServiceAccess::daemons() {
-  if (!_daemons && hasServiceManager()) _daemons = std::make_unique<UnitDaemons>(*this, _runLoop);
-  if (!_daemons) _daemons = std::make_unique<InitScriptDaemons>(_root, _runLoop);
-  return *_daemons;
+  if (hasServiceManager()) return _units;
+  return _scripts;
 }
 
 }  // namespace tavisk

@@ -7,29 +7,39 @@
 
 #include "base/RunLoop.h"
 #include "hosts/linux/services/Bus.h"
-#include "hosts/linux/services/Daemons.h"
+#include "hosts/linux/services/InitScriptDaemons.h"
+#include "hosts/linux/services/UnitDaemons.h"
 #include "hosts/shared/SystemRoot.h"
 
 namespace tavisk {
 
 /// How the services of this machine are reached: over the system bus, straight from the service manager where the bus
-/// is down, or, where the machine has no service manager, by files and programs. Found out when it is first asked for.
+/// is down, or, where the machine has no service manager, by files and programs.
 class ServiceAccess {
  public:
   /// Both must outlive the object.
   ServiceAccess(const SystemRoot& root, RunLoop& runLoop) : _root(root), _runLoop(runLoop) {}
 
-  /// Whether the service manager runs the machine (sd_booted(3)).
-  bool hasServiceManager() const;
-  /// Fails too where the machine has no service manager. Opened again after the bus went away.
+  /// Whether the service manager runs the machine (sd_booted(3)). Yes too where that cannot be found out: whatever is
+  /// then asked of the manager, its daemons and the bus fails with the reason, and no other way is taken.
+  bool hasServiceManager();
+  /// Fails too where the machine has no service manager, or no bus: isAbsent() tells that. Opened again after the bus
+  /// went away.
   Result<Bus*> systemBus();
   Result<Bus*> serviceManager();
   /// A connection of the caller's own, for use by another thread than the main one. systemBus() was called before.
   Result<std::unique_ptr<Bus>> openSystemBus() const;
 
+  /// Those of the service manager, or the init scripts of a machine that has none.
   Daemons& daemons();
 
+  /// How the user is made ready to be asked to authenticate. From now on a call that a service grants only then calls
+  /// this first; its failure is that of the call.
+  void askUserBy(Bus::Asker asker) { _asker = std::move(asker); }
+
  private:
+  /// A look that failed is not repeated for a while: all that builds on it has the same answer.
+  Result<bool> lookForManager();
   Result<const SystemdLibrary*> library();
   /// A connection that is kept; one that could not be had in time is not tried again for a while.
   struct Connection {
@@ -47,7 +57,11 @@ class ServiceAccess {
   std::optional<SystemdLibrary> _library;
   Connection _systemBus{"/run/dbus/system_bus_socket", Bus::Kind::messageBus};
   Connection _manager{"/run/systemd/private", Bus::Kind::straightToService};
-  std::unique_ptr<Daemons> _daemons;
+  std::optional<Failure> _lookFailure;
+  RunLoop::Clock::time_point _lookedAt;
+  Bus::Asker _asker;
+  UnitDaemons _units{*this, _runLoop};
+  InitScriptDaemons _scripts{_root, _runLoop};
 };
 
 }  // namespace tavisk

@@ -56,8 +56,7 @@ std::vector<std::string> wordsOf(const std::string& text, std::string_view purpo
 }  // namespace
 
 Result<std::vector<std::string>> configuredUnits(const SystemRoot& root, std::string_view purpose) {
-  if (!root.exists(servicesConfig)) return std::vector<std::string>();
-  const auto text = root.read(servicesConfig, configurationLimit);
+  const auto text = orEmpty(root.read(servicesConfig, configurationLimit));
   if (!text) return text.failure();
   auto units = wordsOf(*text, purpose);
   for (const auto& unit : units) {

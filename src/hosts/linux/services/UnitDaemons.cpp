@@ -6,7 +6,9 @@
 #include <map>
 #include <vector>
 
+#include "hosts/linux/services/ServiceAccess.h"
 #include "hosts/linux/services/SystemServices.h"
+#include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
 namespace {
@@ -124,6 +126,9 @@ Result<bool> UnitDaemons::startsAtBoot(const Daemon& daemon) {
 
 /// Reads the unit files once for all of them, also when one could not be changed.
 Result<void> UnitDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
+  // There is no leave for single units: who may change one unit file may change all of them.
+  if (const auto forRoot = whyNeedsRoot(start ? "enable" : "disable", daemons.empty() ? "" : daemons.front().unit))
+    return *forRoot;
   Result<void> last;
   bool isAnyChanged = false;
   for (const auto& daemon : daemons) {

@@ -131,8 +131,8 @@ bool isUserId(const std::string& text) {
 
 Fields whoAsks(const SystemRoot& root) {
   Fields who{{"TAVISK_UID", std::to_string(::getuid())}, {"TAVISK_TERMINAL", terminal()}};
-  const auto login = root.read("/proc/self/loginuid", loginIdLimit).valueOr("");
-  if (isUserId(login)) who.emplace_back("TAVISK_LOGIN_UID", login);
+  const auto login = root.read("/proc/self/loginuid", loginIdLimit);
+  if (login && isUserId(*login)) who.emplace_back("TAVISK_LOGIN_UID", *login);
   // Anyone can set the variable; of root it is believed.
   const auto* sudo = ::getuid() == 0 ? std::getenv("SUDO_UID") : nullptr;  // NOLINT(concurrency-mt-unsafe)
   if (sudo && isUserId(sudo)) who.emplace_back("TAVISK_SUDO_UID", sudo);

@@ -4,6 +4,9 @@
 
 #include <fcntl.h>
 
+#include <algorithm>
+#include <cerrno>
+
 #include "base/FileDescriptor.h"
 
 namespace tavisk {
@@ -13,6 +16,12 @@ Result<std::string> readKernelFile(const SystemRoot& root, const std::string& pa
   auto text = root.read(path, limit);
   if (!text) return text;
   return text->substr(0, text->find_last_not_of(std::string_view(" \t\n\0", 4)) + 1);
+}
+
+bool isGone(const Failure& failure) {
+  constexpr int errors[] = {ENODEV, ENXIO, ENOMEDIUM};
+  const auto is = [&](int error) { return failure.code == std::error_code(error, std::generic_category()); };
+  return isAbsent(failure) || std::ranges::any_of(errors, is);
 }
 
 Result<void> writeKernelFile(const SystemRoot& root, const std::string& path, std::string_view text) {

@@ -12,6 +12,7 @@
 #include <cerrno>
 
 #include "base/Text.h"
+#include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
 
@@ -101,29 +102,45 @@ Result<std::vector<std::uint8_t>> receive(const FileDescriptor& file) {
 
 }  // namespace
 
-bool IpmiDevice::hasController() const {
-  return std::ranges::any_of(tracesOfController, [this](const char* path) { return _root.exists(path); });
+Result<bool> IpmiDevice::hasController() const {
+  for (const auto* path : tracesOfController)
+    if (auto there = _root.isThere(path); !there || *there) return there;
+  return false;
 }
 
-void IpmiDevice::loadDriver() {
-  _hasTriedToLoad = true;
-  const auto* program = _root.exists("/usr/sbin/modprobe") ? "/usr/sbin/modprobe" : "/sbin/modprobe";
-  if (!runProgram(_root, {program, "-a", "-q", "ipmi_si", "ipmi_devintf"}, _runLoop)) return;
+Result<void> IpmiDevice::loadDriver() {
+  const auto present = _root.isThere("/usr/sbin/modprobe");
+  if (!present) return present.failure();
+  const auto* program = *present ? "/usr/sbin/modprobe" : "/sbin/modprobe";
+  // One that cannot be loaded leaves no device behind: that is then told.
+  if (!runProgram(_root, {program, "-a", "-q", "ipmi_si", "ipmi_devintf"}, _runLoop)) return {};
   const auto looks = _runLoop.every(betweenLooks, [] {});
-  const auto isThere = [this] { return _root.exists(device); };
+  const auto isThere = [this] { return _root.isThere(device).valueOr(false); };
   static_cast<void>(_runLoop.runUntil(RunLoop::Clock::now() + longestLoading, isThere));
+  return {};
+}
+
+Result<void> IpmiDevice::ensureDriver() {
+  if (_hasTriedToLoad || ::geteuid() != 0) return {};
+  const auto present = _root.isThere(device);
+  if (!present) return present.failure();
+  const auto has = *present ? Result<bool>(false) : hasController();
+  if (!has) return has.failure();
+  if (!*has) return {};
+  _hasTriedToLoad = true;
+  return loadDriver();
 }
 
 Result<void> IpmiDevice::open() {
   if (_device) return {};
-  if (!_hasTriedToLoad && !_root.exists(device) && ::geteuid() == 0 && hasController()) loadDriver();
+  if (const auto ready = ensureDriver(); !ready) return linkFailure(ready.failure().code.value());
   auto file = _root.open(device, O_RDWR | O_NONBLOCK);
   if (file) {
     _device = std::move(file).value();
     return {};
   }
+  if (isGone(file.failure())) return linkFailure(ENODEV);
   const auto& error = file.failure().code;
-  if (error == std::errc::no_such_file_or_directory) return linkFailure(ENODEV);
   return linkFailure(error ? error.value() : EIO);
 }
 

@@ -43,8 +43,10 @@ class IpmiDevice final : public ControllerLink {
   Result<std::vector<std::uint8_t>> exchange(const ControllerRequest& request) override;
 
  private:
-  bool hasController() const;
-  void loadDriver();
+  Result<bool> hasController() const;
+  Result<void> loadDriver();
+  /// Where the machine is known to have a controller and no driver for it yet, the first time.
+  Result<void> ensureDriver();
 
   const SystemRoot& _root;
   RunLoop& _runLoop;

@@ -13,6 +13,6 @@ namespace tavisk {
 /// The processes that run a program of this name, in no particular order: this machine's own, without those of
 /// containers, without kernel threads, processes that have ended, and the caller itself. Empty also when /proc is
 /// missing or hides them (proc(5), hidepid).
-std::vector<ProcessId> processesNamed(const SystemRoot& root, const std::string& name);
+Result<std::vector<ProcessId>> processesNamed(const SystemRoot& root, const std::string& name);
 
 }  // namespace tavisk

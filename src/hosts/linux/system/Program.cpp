@@ -97,7 +97,9 @@ Result<EndedProgram> runToEnd(const SystemRoot& root, const std::vector<std::str
   auto program = std::move(started).value();
   if (!program.endsBefore(RunLoop::Clock::now() + longestRun, runLoop)) return outOfTime(words);
   ::lseek(output.number(), 0, SEEK_SET);
-  return EndedProgram{program.status(), readAll(output, outputLimit, words.front()).valueOr("")};
+  auto printed = readAll(output, outputLimit, words.front());
+  if (!printed) return printed.failure();
+  return EndedProgram{program.status(), std::move(printed).value()};
 }
 
 }  // namespace

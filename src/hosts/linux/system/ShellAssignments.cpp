@@ -63,8 +63,11 @@ std::optional<std::string> assignedValue(std::string_view text, std::string_view
   return value;
 }
 
-std::optional<std::string> assignedValue(const SystemRoot& root, const std::string& file, std::string_view variable) {
-  return assignedValue(root.read(file, fileLimit).valueOr(""), variable);
+Result<std::optional<std::string>> assignedValue(const SystemRoot& root, const std::string& file,
+                                                 std::string_view variable) {
+  const auto text = orEmpty(root.read(file, fileLimit));
+  if (!text) return text.failure();
+  return assignedValue(*text, variable);
 }
 
 std::string withAssignment(std::string_view text, std::string_view variable, std::string_view value) {

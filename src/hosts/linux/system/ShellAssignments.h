@@ -14,8 +14,9 @@ namespace tavisk {
 /// several assignments the last one counts. Absent when there is none.
 std::optional<std::string> assignedValue(std::string_view text, std::string_view variable);
 
-/// The same in a file; absent too when it cannot be read.
-std::optional<std::string> assignedValue(const SystemRoot& root, const std::string& file, std::string_view variable);
+/// The same in a file; absent too when there is no such file.
+Result<std::optional<std::string>> assignedValue(const SystemRoot& root, const std::string& file,
+                                                 std::string_view variable);
 
 /// The text with this value, quoted, in place of the variable's assignments or else at the end; an empty value takes
 /// them out. All other lines stay as they are. The value holds no newline.

@@ -12,14 +12,18 @@ constexpr std::string_view top = "/sys/devices";
 
 }  // namespace
 
-std::optional<SysDevice> SysDevice::at(const SystemRoot& root, const std::string& path) {
+Result<std::optional<SysDevice>> SysDevice::at(const SystemRoot& root, const std::string& path) {
   auto resolved = root.standardized(path);
-  if (!resolved || !root.exists(*resolved)) return std::nullopt;
-  return SysDevice(root, std::move(resolved).value());
+  if (!resolved) return resolved.failure();
+  const auto there = root.isThere(*resolved);
+  if (!there) return there.failure();
+  return *there ? std::optional(SysDevice(root, std::move(resolved).value())) : std::nullopt;
 }
 
-std::string SysDevice::subsystem() const {
-  return baseName(_root->readLink(_path + "/subsystem").valueOr(""));
+Result<std::string> SysDevice::subsystem() const {
+  const auto link = orGone(_root->readLink(_path + "/subsystem"));
+  if (!link) return link.failure();
+  return *link ? baseName(**link) : std::string();
 }
 
 std::optional<SysDevice> SysDevice::parent() const {
@@ -28,20 +32,33 @@ std::optional<SysDevice> SysDevice::parent() const {
   return SysDevice(*_root, std::move(above));
 }
 
-bool SysDevice::canWake() const {
+Result<bool> SysDevice::canWake() const {
   return has(wakeSwitch);
 }
 
-bool SysDevice::has(const std::string& name) const {
-  return _root->exists(_path + "/" + name);
+Result<bool> SysDevice::has(const std::string& name) const {
+  return _root->isThere(_path + "/" + name);
 }
 
 Result<std::string> SysDevice::read(const std::string& name) const {
   return readKernelFile(*_root, _path + "/" + name);
 }
 
+Result<bool> SysDevice::says(const std::string& name, std::string_view text) const {
+  const auto value = orGone(read(name));
+  if (!value) return value.failure();
+  return *value == text;
+}
+
+Result<std::vector<std::string>> SysDevice::list(const std::string& folder) const {
+  const auto names = orGone(_root->list(_path + "/" + folder));
+  if (!names) return names.failure();
+  return names->value_or(std::vector<std::string>());
+}
+
 Result<void> SysDevice::write(const std::string& name, std::string_view value) const {
-  return writeKernelFile(*_root, _path + "/" + name, value);
+  const auto written = writeKernelFile(*_root, _path + "/" + name, value);
+  return !written && isGone(written.failure()) ? Result<void>() : written;
 }
 
 }  // namespace tavisk

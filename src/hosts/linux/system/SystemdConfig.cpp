@@ -45,14 +45,21 @@ std::vector<NamedValue> allAssignments(std::string_view text, std::string_view s
 
 }  // namespace
 
-std::vector<std::string> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders) {
+Result<std::vector<std::string>> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders) {
   std::map<std::string, std::string> byName;
-  for (const auto& folder : folders)
-    for (const auto& name : root.list(folder).valueOr({}))
+  for (const auto& folder : folders) {
+    const auto names = orEmpty(root.list(folder));
+    if (!names) return names.failure();
+    for (const auto& name : *names)
       if (name.ends_with(".conf")) byName.emplace(name, folder + name);
+  }
   std::vector<std::string> files;
   files.reserve(byName.size());
-  for (const auto& [name, path] : byName) files.push_back(path);
+  for (const auto& [name, path] : byName) {
+    const auto target = root.standardized(path);
+    if (!target) return target.failure();
+    if (*target != "/dev/null") files.push_back(path);
+  }
   return files;
 }
 
@@ -63,52 +70,71 @@ std::vector<std::string> assignments(std::string_view text, std::string_view sec
   return values;
 }
 
-std::vector<std::string> SystemdConfig::files() const {
+Result<std::vector<std::string>> SystemdConfig::files() const {
   std::vector<std::string> files;
-  for (const auto* folder : folders)
-    if (files.empty() && _root.exists(folder + _file)) files.push_back(folder + _file);
-
   std::vector<std::string> dropInFolders;
-  for (const auto* folder : folders) dropInFolders.push_back(folder + _file + ".d/");
-  for (auto& path : configurationFiles(_root, dropInFolders)) files.push_back(std::move(path));
+  for (const auto* folder : folders) {
+    dropInFolders.push_back(folder + _file + ".d/");
+    const auto there = files.empty() ? _root.isThere(folder + _file) : Result<bool>(false);
+    if (!there) return there.failure();
+    if (*there) files.push_back(folder + _file);
+  }
+  const auto dropIns = configurationFiles(_root, dropInFolders);
+  if (!dropIns) return dropIns.failure();
+  files.insert(files.end(), dropIns->begin(), dropIns->end());
   return files;
 }
 
-std::vector<std::string> SystemdConfig::words(std::string_view section, std::string_view key) const {
+/// A file that is gone since it was listed says nothing.
+Result<std::vector<SystemdConfig::Assignment>> SystemdConfig::all(std::string_view section,
+                                                                  std::string_view key) const {
+  const auto present = files();
+  if (!present) return present.failure();
+  std::vector<Assignment> found;
+  for (const auto& file : *present) {
+    const auto text = orEmpty(_root.read(file, configurationLimit));
+    if (!text) return text.failure();
+    for (auto& value : assignments(*text, section, key)) found.push_back({file, std::move(value)});
+  }
+  return found;
+}
+
+Result<std::vector<std::string>> SystemdConfig::words(std::string_view section, std::string_view key) const {
+  const auto assigned = all(section, key);
+  if (!assigned) return assigned.failure();
   std::vector<std::string> words;
-  for (const auto& file : files()) {
-    for (const auto& value : assignments(_root.read(file, configurationLimit).valueOr(""), section, key)) {
-      const auto added = split(value, " \t");
-      if (added.empty()) words.clear();
-      words.insert(words.end(), added.begin(), added.end());
-    }
+  for (const auto& each : *assigned) {
+    const auto added = split(each.value, " \t");
+    if (added.empty()) words.clear();
+    words.insert(words.end(), added.begin(), added.end());
   }
   return words;
 }
 
-std::optional<SystemdConfig::Assignment> SystemdConfig::last(std::string_view section, std::string_view key) const {
-  std::optional<Assignment> last;
-  for (const auto& file : files())
-    for (const auto& value : assignments(_root.read(file, configurationLimit).valueOr(""), section, key))
-      last = {file, value};
-  return last && !last->value.empty() ? last : std::nullopt;
+Result<std::optional<SystemdConfig::Assignment>> SystemdConfig::last(std::string_view section,
+                                                                     std::string_view key) const {
+  const auto assigned = all(section, key);
+  if (!assigned) return assigned.failure();
+  if (assigned->empty() || assigned->back().value.empty()) return std::nullopt;
+  return std::optional(assigned->back());
 }
 
-std::string SystemdConfig::whatHides(std::string_view section, const std::vector<std::string>& keys) const {
+Result<std::string> SystemdConfig::whatHides(std::string_view section, const std::vector<std::string>& keys) const {
   const auto ownName = baseName(ownDropIn());
-  for (const auto& file : files()) {
-    const bool isLater = file.find(".conf.d/") != std::string::npos && baseName(file) > ownName;
-    const auto text = isLater ? _root.read(file, configurationLimit).valueOr("") : "";
-    for (const auto& key : keys)
-      if (!assignments(text, section, key).empty()) return file;
+  for (const auto& key : keys) {
+    const auto assigned = all(section, key);
+    if (!assigned) return assigned.failure();
+    for (const auto& [file, value] : *assigned)
+      if (file.find(".conf.d/") != std::string::npos && baseName(file) > ownName) return file;
   }
-  return {};
+  return std::string();
 }
 
 Result<void> SystemdConfig::setOwn(const std::string& section, const std::map<std::string, std::string>& values) const {
+  const auto present = orEmpty(_root.read(ownDropIn(), configurationLimit));
+  if (!present) return present.failure();
   auto merged = values;
-  for (const auto& [key, value] : allAssignments(_root.read(ownDropIn(), configurationLimit).valueOr(""), section))
-    merged.emplace(key, value);
+  for (const auto& [key, value] : allAssignments(*present, section)) merged.emplace(key, value);
   auto text = ownfile::header + ("[" + section + "]\n");
   for (const auto& [key, value] : merged) text += std::string(key).append("=").append(value).append("\n");
   return _root.write(ownDropIn(), text);

@@ -21,31 +21,35 @@ class SystemdConfig {
   SystemdConfig(const SystemRoot& root, std::string file) : _root(root), _file(std::move(file)) {}
 
   /// The words of a key that collects values, such as "NTP": an empty assignment forgets the ones before it.
-  std::vector<std::string> words(std::string_view section, std::string_view key) const;
+  Result<std::vector<std::string>> words(std::string_view section, std::string_view key) const;
   /// A value and the file that it comes from.
   struct Assignment {
     std::string file;
     std::string value;
   };
   /// The last assignment of a key that has one value; absent when there is none, or when it is empty.
-  std::optional<Assignment> last(std::string_view section, std::string_view key) const;
+  Result<std::optional<Assignment>> last(std::string_view section, std::string_view key) const;
   /// The tool's own drop-in.
   std::string ownDropIn() const;
   /// The file that hides what the own drop-in says of these keys; empty when none does.
-  std::string whatHides(std::string_view section, const std::vector<std::string>& keys) const;
-  /// Writes these keys into the own drop-in, which has this one section; its other keys stay.
+  Result<std::string> whatHides(std::string_view section, const std::vector<std::string>& keys) const;
+  /// Writes these keys into the own drop-in, which has this one section; its other keys stay. One that cannot
+  /// be read is left as it is. Reads and writes: not to be called by two at once (MachineLock).
   Result<void> setOwn(const std::string& section, const std::map<std::string, std::string>& values) const;
 
  private:
-  std::vector<std::string> files() const;
+  Result<std::vector<std::string>> files() const;
+  /// The values of a key in each of the files, in order.
+  Result<std::vector<Assignment>> all(std::string_view section, std::string_view key) const;
 
   const SystemRoot& _root;
   std::string _file;
 };
 
 /// The files of these folders (each with "/" at its end) that end in ".conf", sorted by name; where two have the same
-/// name, that of the earlier folder.
-std::vector<std::string> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders);
+/// name, that of the earlier folder. A folder may be missing. A link to /dev/null is no file and hides the others of
+/// its name.
+Result<std::vector<std::string>> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders);
 
 /// The values of a key in one file of such a kind, in order; later lines come later.
 std::vector<std::string> assignments(std::string_view text, std::string_view section, std::string_view key);

@@ -155,7 +155,8 @@ TEST_F(PowerTest, RestartAfterPowerFailureComesFromTheController) {
   tree.turn(PowerSwitch::restartAfterPowerFailure, true);
   EXPECT_EQ(tree.controllerLink.policy, 1) << "as before, where it cannot always turn on";
   tree.controllerLink.error = EBUSY;
-  EXPECT_TRUE(tree.power().supports(PowerSwitch::restartAfterPowerFailure, tree.mains)) << "it did not say";
+  EXPECT_FALSE(tree.power().supports(PowerSwitch::restartAfterPowerFailure, tree.mains));
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed) << "it did not say";
 }
 
 TEST_F(PowerTest, RestartAfterPowerFailureComesFromTheFirmwareWithoutAController) {
@@ -263,6 +264,13 @@ TEST_F(PowerTest, ControllerDoesNotGuessTheRequestsOfOtherMakers) {
 TEST_F(PowerTest, ControllerStatusesTellOfTheWayToTheController) {
   tree.controllerLink.error = ETIMEDOUT;
   EXPECT_EQ(setDelay(tree.delays(), 3), ETIMEDOUT);
+  tree.controllerLink.error = 0;
+  tree.loop("/etc/tavisk/startup-delay.conf");
+  EXPECT_EQ(setDelay(tree.delays(), 3), ELOOP);
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
+  tree.loop("/sys/class/ipmi");
+  EXPECT_FALSE(tree.delays().serviceOfClass(controllerClass));
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
   tree.remove("/sys/class/ipmi");
   EXPECT_EQ(setDelay(tree.delays(), 3), ENODEV);
 }
@@ -286,6 +294,7 @@ TEST_F(PowerTest, ControllerTakesTheAdministratorsRequests) {
                            "manufacturer=344 netfn=0x30 set=0x54 width=2 order=big unit=1 more=1"}) {
     tree.write(file, line);
     EXPECT_EQ(setDelay(tree.delays(), 100), ENOSYS) << line;
+    EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed) << "it may have one";
     EXPECT_THAT(tree.lastEffect().failure->why, HasSubstr("not understood")) << line;
   }
 }

@@ -139,6 +139,12 @@ class PowerTree : public LinuxTree {
   }
   void remove(const std::string& path) { std::filesystem::remove_all(at(path)); }
 
+  /// Puts something that cannot be looked at in its place: a link that leads round.
+  void loop(const std::string& path) {
+    remove(path);
+    link(path, at(path).filename());
+  }
+
   LinuxPowerSettingsService& power() { return _power; }
   LinuxPowerController& delays() { return _delays; }
 

@@ -32,10 +32,10 @@ TEST(ProcessScan, FindsRunningProgramsOfThisMachine) {
   process("18", "garbage", "chronyd");
   tree.write("/proc/uptime", "1");
   const SystemRoot root(tree.at("/"));
-  EXPECT_THAT(processesNamed(root, "chronyd"), UnorderedElementsAre(10));
-  EXPECT_THAT(processesNamed(root, "systemd-timesyncd"), UnorderedElementsAre(15, 17));
-  EXPECT_THAT(processesNamed(root, "systemd-timesyn"), UnorderedElementsAre(15, 16, 17));
-  EXPECT_THAT(processesNamed(SystemRoot("/nowhere"), "chronyd"), IsEmpty());
+  EXPECT_THAT(processesNamed(root, "chronyd").valueOr({}), UnorderedElementsAre(10));
+  EXPECT_THAT(processesNamed(root, "systemd-timesyncd").valueOr({}), UnorderedElementsAre(15, 17));
+  EXPECT_THAT(processesNamed(root, "systemd-timesyn").valueOr({}), UnorderedElementsAre(15, 16, 17));
+  EXPECT_THAT(processesNamed(SystemRoot("/nowhere"), "chronyd").valueOr({0}), IsEmpty());
 }
 
 }  // namespace
