@@ -1,0 +1,49 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/disks/FailedLooks.h"
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <chrono>
+
+#include "effects/SettingNames.h"
+
+namespace tavisk {
+namespace {
+
+constexpr std::chrono::seconds longestCommand{15};
+
+}  // namespace
+
+bool isGone(const Failure& failure) {
+  constexpr std::array gone{ENODEV, ENXIO, ENOMEDIUM};
+  const auto isCode = [&](int error) { return failure.code == std::error_code(error, std::generic_category()); };
+  return isAbsent(failure) || std::ranges::any_of(gone, isCode);
+}
+
+void FailedLooks::tell(const Failure& failure) {
+  {
+    const std::scoped_lock lock(_mutex);
+    const auto now = RunLoop::Clock::now();
+    auto [told, isNew] = _told.try_emplace(failure.why, now);
+    if (!isNew && now - told->second < longestCommand) return;
+    told->second = now;
+  }
+  _effects.recordFailure(setting::startupDisk, failure);
+}
+
+void FailedLooks::tellDoubt(const Failure& failure) {
+  {
+    const std::scoped_lock lock(_mutex);
+    if (!_doubt) _doubt = failure;
+  }
+  tell(failure);
+}
+
+std::optional<Failure> FailedLooks::takeDoubt() {
+  const std::scoped_lock lock(_mutex);
+  return std::exchange(_doubt, std::nullopt);
+}
+
+}  // namespace tavisk
