@@ -19,8 +19,10 @@ class BootLoaderFile {
 
   /// Absent when it is missing, cannot be read or is no property-list dictionary.
   virtual std::optional<PropertyList::Dictionary> read() = 0;
-  /// Replaces the file whole, or makes it and its folders. A file that read() cannot understand is kept beside it as
-  /// NAME.damaged first. Whether it was written; the reason why not goes to the effects.
+  /// Gives the file the architecture of the contents, or takes it out; what else the file holds at that moment stays,
+  /// and what it lacks of the contents is added. The file is replaced whole, or made with its folders. One that read()
+  /// cannot understand is kept beside it as NAME.damaged first; one that cannot be read is left alone. Whether it was
+  /// written; the reason why not goes to the effects.
   virtual bool write(const PropertyList::Dictionary& contents) = 0;
 };
 

@@ -32,10 +32,19 @@ void DiskCallbacks::tell(const DiskEvent& event, const DiskDescription& disk) co
   }
 }
 
+void DiskCallbacks::tellGone(const DiskDescription& before, const DiskDescription& after, const DiskName& disk) const {
+  const auto requests = _requests;
+  for (const auto& request : requests)
+    if (request.kind == DiskEvent::Kind::disappeared && request.match.accepts(before) && !request.match.accepts(after))
+      request.callback({DiskEvent::Kind::disappeared, disk, {}}, request.context);
+}
+
 void DiskCallbacks::tellDifferences(const DiskSnapshot& before, const DiskSnapshot& after) const {
   for (const auto& event : differences(before, after)) {
-    const bool isGone = event.kind == DiskEvent::Kind::disappeared;
-    tell(event, *(isGone ? before : after).find(event.disk));
+    const auto was = before.find(event.disk);
+    const auto is = after.find(event.disk);
+    tell(event, is ? *is : *was);
+    if (was && is) tellGone(*was, *is, event.disk);
   }
 }
 

@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/shared/KernelArchitecture.h"
 
+#include <utility>
+
 #include "effects/SettingNames.h"
 
 namespace tavisk {
@@ -12,6 +14,14 @@ using Contents = Result<std::optional<PropertyList::Dictionary>>;
 Result<std::optional<std::string>> architectureOf(const Contents& read) {
   if (!read) return read.failure();
   return architectureIn(read->value_or(PropertyList::Dictionary()));
+}
+
+/// The file as it is, with the architecture of the contents.
+PropertyList::Dictionary changed(PropertyList::Dictionary file, const PropertyList::Dictionary& contents) {
+  for (const auto& [key, value] : contents)
+    if (key == BootLoaderFile::architectureKey || !file.find(key)) file.set(key, value);
+  if (!contents.find(BootLoaderFile::architectureKey)) file.remove(BootLoaderFile::architectureKey);
+  return file;
 }
 
 }  // namespace
@@ -35,7 +45,11 @@ Setting<std::string> kernelArchitecture(const PropertyListFile& file, const Prop
   setting.name = setting::kernelArchitecture;
   setting.where = file.path();
   setting.stored = [&file] { return architectureOf(file.read()); };
-  setting.store = [&file, &contents](const std::string&) { return file.write(contents); };
+  setting.store = [&file, &contents](const std::string&) -> Result<void> {
+    auto present = file.readToChange();
+    if (!present) return present.failure();
+    return file.write(changed(std::move(present).value(), contents));
+  };
   // Also when nothing changes: whether the file can be written is what is asked for.
   setting.always = true;
   return setting;

@@ -26,6 +26,12 @@ Result<std::optional<PropertyList::Dictionary>> PropertyListFile::read() const {
   return parseDictionary(**found, _path);
 }
 
+Result<PropertyList::Dictionary> PropertyListFile::readToChange() const {
+  const auto found = text();
+  if (!found) return found.failure();
+  return *found ? parseDictionary(**found, _path).valueOr({}) : PropertyList::Dictionary();
+}
+
 Result<void> PropertyListFile::write(const PropertyList::Dictionary& contents) const {
   const auto written = writePropertyList(contents);
   if (!written) return retold(written.failure(), written.failure().tried, _path);
@@ -41,8 +47,7 @@ Result<void> PropertyListFile::keepDamaged() const {
 }
 
 Result<std::optional<std::string>> PropertyListFile::text() const {
-  if (!_root.exists(_path)) return std::nullopt;
-  return _root.read(_path, ownFileLimits.bytes);
+  return orAbsent(_root.read(_path, ownFileLimits.bytes));
 }
 
 }  // namespace tavisk

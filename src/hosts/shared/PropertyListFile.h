@@ -20,6 +20,9 @@ class PropertyListFile {
   const std::string& path() const { return _path; }
   /// Absent when there is no file; a failure when it cannot be read or is something else.
   Result<std::optional<PropertyList::Dictionary>> read() const;
+  /// What a change of the file begins with, to be read while nobody else changes it: empty when there is no file or
+  /// write() would keep it beside as damaged. A file that cannot be read is a failure, and must not be written.
+  Result<PropertyList::Dictionary> readToChange() const;
   /// Replaces the file whole, or makes it and its folders. What read() cannot understand is kept beside it first, as
   /// NAME.damaged.
   Result<void> write(const PropertyList::Dictionary& contents) const;

@@ -6,9 +6,11 @@
 #include <array>
 #include <span>
 #include <string_view>
+#include <utility>
 
 #include "base/Path.h"
 #include "base/Text.h"
+#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 
 namespace tavisk {
@@ -74,34 +76,74 @@ bool isRemote(const std::string& transport) {
   return transport == transport::iscsi || transport == transport::network || transport == transport::diskImage;
 }
 
-}  // namespace
+/// A question about devices, which may take many reads. What has gone reads as nothing; the first read that fails makes
+/// the whole answer a failure.
+class DeviceLook {
+ public:
+  explicit DeviceLook(const SystemRoot& root) : _root(root) {}
 
-std::vector<DiskName> BlockDevices::list() const {
+  template <typename Value>
+  Result<Value> told(Value answer) {
+    if (_failure) return *std::move(_failure);
+    return answer;
+  }
+
+  std::vector<DiskName> list();
+  std::optional<BlockDevice> find(const DiskName& name);
+  std::optional<BlockDevice> withNumber(DeviceNumber number);
+  std::optional<BlockDevice> withNode(const std::string& node);
+  DiskName wholeDisk(const DiskName& name);
+  unsigned logicalBlockSize(const DiskName& disk);
+  bool answersReads(const BlockDevice& device);
+  bool isRemovable(const DiskName& disk);
+  bool isOptical(const DiskName& disk);
+  std::string transportOf(const DiskName& disk);
+  bool isInternal(const DiskName& disk);
+
+ private:
+  template <typename Value>
+  Value seen(Result<Value> read) {
+    if (read) return std::move(read).value();
+    if (!_failure && !isGone(read.failure())) _failure = read.failure();
+    return Value();
+  }
+  std::string attribute(const std::string& path, const char* name);
+  std::uint64_t count(const std::string& path, const char* name);
+  std::string subsystemOf(const std::string& path);
+  std::optional<std::string> pathOf(const DiskName& name);
+  std::optional<DiskName> firstBeneath(const std::string& path);
+  std::vector<std::string> carriersOf(const DiskName& disk);
+
+  const SystemRoot& _root;
+  std::optional<Failure> _failure;
+};
+
+std::vector<DiskName> DeviceLook::list() {
   std::vector<DiskName> names;
-  for (auto& name : _root.list("/sys/class/block").valueOr({})) names.push_back({std::move(name)});
+  for (auto& name : seen(_root.list("/sys/class/block"))) names.push_back({std::move(name)});
   return names;
 }
 
-std::optional<std::string> BlockDevices::pathOf(const DiskName& name) const {
+std::optional<std::string> DeviceLook::pathOf(const DiskName& name) {
   constexpr std::string_view upToSys = "../..";
   if (!isFileName(name.text)) return std::nullopt;
-  const auto target = _root.readLink("/sys/class/block/" + name.text);
-  if (!target || !target->starts_with("../../devices/")) return std::nullopt;
-  return target->substr(upToSys.size());
+  const auto target = seen(_root.readLink("/sys/class/block/" + name.text));
+  if (!target.starts_with("../../devices/")) return std::nullopt;
+  return target.substr(upToSys.size());
 }
 
-/// Without the newline; empty when there is none or it cannot be read.
-std::string BlockDevices::attribute(const std::string& path, const char* name) const {
-  auto text = _root.read("/sys" + path + "/" + name, attributeLimit).valueOr("");
+/// Without the newline; empty when there is none.
+std::string DeviceLook::attribute(const std::string& path, const char* name) {
+  auto text = seen(_root.read("/sys" + path + "/" + name, attributeLimit));
   while (text.ends_with('\n')) text.pop_back();
   return text;
 }
 
-std::uint64_t BlockDevices::count(const std::string& path, const char* name) const {
+std::uint64_t DeviceLook::count(const std::string& path, const char* name) {
   return parseNumber<std::uint64_t>(attribute(path, name)).value_or(0);
 }
 
-std::optional<BlockDevice> BlockDevices::find(const DiskName& name) const {
+std::optional<BlockDevice> DeviceLook::find(const DiskName& name) {
   const auto path = pathOf(name);
   if (!path) return std::nullopt;
   const auto uevent = attribute(*path, "uevent");
@@ -120,33 +162,33 @@ std::optional<BlockDevice> BlockDevices::find(const DiskName& name) const {
   return device;
 }
 
-std::optional<BlockDevice> BlockDevices::withNumber(DeviceNumber number) const {
+std::optional<BlockDevice> DeviceLook::withNumber(DeviceNumber number) {
   const auto link = "/sys/dev/block/" + std::to_string(number.major) + ":" + std::to_string(number.minor);
-  const auto target = _root.readLink(link);
-  return target ? find({baseName(*target)}) : std::nullopt;
+  const auto target = seen(_root.readLink(link));
+  return target.empty() ? std::nullopt : find({baseName(target)});
 }
 
-std::optional<BlockDevice> BlockDevices::withNode(const std::string& node) const {
+std::optional<BlockDevice> DeviceLook::withNode(const std::string& node) {
   constexpr std::string_view folder = "/dev/";
-  const auto path = _root.standardized(node);
-  if (!path || !path->starts_with(folder)) return std::nullopt;
-  auto name = path->substr(folder.size());
+  const auto path = seen(_root.standardized(node));
+  if (!path.starts_with(folder)) return std::nullopt;
+  auto name = path.substr(folder.size());
   std::ranges::replace(name, '/', '!');  // sysfs has "cciss!c0d0" for /dev/cciss/c0d0
   return find({name});
 }
 
 /// The first of the devices that a mapped volume or an array is on.
-std::optional<DiskName> BlockDevices::firstBeneath(const std::string& path) const {
-  const auto names = _root.list("/sys" + path + "/slaves").valueOr({});
+std::optional<DiskName> DeviceLook::firstBeneath(const std::string& path) {
+  const auto names = seen(_root.list("/sys" + path + "/slaves"));
   return names.empty() ? std::nullopt : std::optional(DiskName{names.front()});
 }
 
-DiskName BlockDevices::wholeDisk(const DiskName& name) const {
+DiskName DeviceLook::wholeDisk(const DiskName& name) {
   auto disk = name;
   for (int depth = 0; depth < deepestMapping; ++depth) {
     const auto path = pathOf(disk);
     if (!path) return disk;
-    const bool isPartition = _root.exists("/sys" + *path + "/partition");
+    const bool isPartition = seen(_root.isThere("/sys" + *path + "/partition"));
     const auto beneath = isPartition ? diskAbove(*path) : firstBeneath(*path);
     if (!beneath) return disk;
     disk = *beneath;
@@ -154,27 +196,27 @@ DiskName BlockDevices::wholeDisk(const DiskName& name) const {
   return disk;
 }
 
-unsigned BlockDevices::logicalBlockSize(const DiskName& disk) const {
+unsigned DeviceLook::logicalBlockSize(const DiskName& disk) {
   const auto size = count(pathOf(disk).value_or(""), "queue/logical_block_size");
   return size != 0 ? static_cast<unsigned>(size) : usualBlockSize;
 }
 
-bool BlockDevices::answersReads(const BlockDevice& device) const {
+bool DeviceLook::answersReads(const BlockDevice& device) {
   return device.number.major != floppyMajor && attribute(device.path, "dm/suspended") != "1";
 }
 
-bool BlockDevices::isRemovable(const DiskName& disk) const {
+bool DeviceLook::isRemovable(const DiskName& disk) {
   return attribute(pathOf(disk).value_or(""), "removable") == "1";
 }
 
-bool BlockDevices::isOptical(const DiskName& disk) const {
+bool DeviceLook::isOptical(const DiskName& disk) {
   constexpr const char* scsiOptical = "5";  // a peripheral device type of SCSI
   const auto path = pathOf(disk);
   return path && (disk.text.starts_with("sr") || attribute(*path, "device/type") == scsiOptical);
 }
 
 /// The folders of the device tree above a disk, the nearest first.
-std::vector<std::string> BlockDevices::carriersOf(const DiskName& disk) const {
+std::vector<std::string> DeviceLook::carriersOf(const DiskName& disk) {
   constexpr std::string_view top = "/devices";
   std::vector<std::string> carriers;
   auto path = pathOf(disk).value_or("");
@@ -185,11 +227,11 @@ std::vector<std::string> BlockDevices::carriersOf(const DiskName& disk) const {
   return carriers;
 }
 
-std::string BlockDevices::subsystemOf(const std::string& path) const {
-  return baseName(_root.readLink("/sys" + path + "/subsystem").valueOr(""));
+std::string DeviceLook::subsystemOf(const std::string& path) {
+  return baseName(seen(_root.readLink("/sys" + path + "/subsystem")));
 }
 
-std::string BlockDevices::transportOf(const DiskName& disk) const {
+std::string DeviceLook::transportOf(const DiskName& disk) {
   const auto path = pathOf(disk);
   if (!path) return "";
   if (const auto* found = byNumberedName(namesOfDevices, disk.text)) return found;
@@ -205,7 +247,7 @@ std::string BlockDevices::transportOf(const DiskName& disk) const {
   return carried ? carried : "";
 }
 
-bool BlockDevices::isInternal(const DiskName& disk) const {
+bool DeviceLook::isInternal(const DiskName& disk) {
   if (!pathOf(disk) || isRemovable(disk)) return false;
   const auto transport = transportOf(disk);
   if (isRemote(transport)) return false;
@@ -215,6 +257,63 @@ bool BlockDevices::isInternal(const DiskName& disk) const {
     if (transport == transport::usb && !removable.empty()) return removable == "fixed";
   }
   return transport != transport::usb;
+}
+
+}  // namespace
+
+Result<std::vector<DiskName>> BlockDevices::list() const {
+  DeviceLook look(_root);
+  return look.told(look.list());
+}
+
+Result<std::optional<BlockDevice>> BlockDevices::find(const DiskName& name) const {
+  DeviceLook look(_root);
+  return look.told(look.find(name));
+}
+
+Result<std::optional<BlockDevice>> BlockDevices::withNumber(DeviceNumber number) const {
+  DeviceLook look(_root);
+  return look.told(look.withNumber(number));
+}
+
+Result<std::optional<BlockDevice>> BlockDevices::withNode(const std::string& node) const {
+  DeviceLook look(_root);
+  return look.told(look.withNode(node));
+}
+
+Result<DiskName> BlockDevices::wholeDisk(const DiskName& name) const {
+  DeviceLook look(_root);
+  return look.told(look.wholeDisk(name));
+}
+
+Result<unsigned> BlockDevices::logicalBlockSize(const DiskName& disk) const {
+  DeviceLook look(_root);
+  return look.told(look.logicalBlockSize(disk));
+}
+
+Result<bool> BlockDevices::answersReads(const BlockDevice& device) const {
+  DeviceLook look(_root);
+  return look.told(look.answersReads(device));
+}
+
+Result<bool> BlockDevices::isRemovable(const DiskName& disk) const {
+  DeviceLook look(_root);
+  return look.told(look.isRemovable(disk));
+}
+
+Result<bool> BlockDevices::isOptical(const DiskName& disk) const {
+  DeviceLook look(_root);
+  return look.told(look.isOptical(disk));
+}
+
+Result<std::string> BlockDevices::transportOf(const DiskName& disk) const {
+  DeviceLook look(_root);
+  return look.told(look.transportOf(disk));
+}
+
+Result<bool> BlockDevices::isInternal(const DiskName& disk) const {
+  DeviceLook look(_root);
+  return look.told(look.isInternal(disk));
 }
 
 }  // namespace tavisk

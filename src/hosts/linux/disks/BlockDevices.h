@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "base/Result.h"
 #include "hosts/linux/disks/MountTable.h"
 #include "hosts/shared/SystemRoot.h"
 #include "platform/DiskDescription.h"
@@ -34,44 +35,38 @@ inline constexpr const char* iscsi = "iSCSI";
 inline constexpr const char* network = "Network";
 }  // namespace transport
 
-/// The block devices of the machine, read from sysfs at each question. From any thread.
+/// The block devices of the machine, read from sysfs at each question. A device that goes away meanwhile is not there,
+/// and no failure; what else keeps something from being looked at is one. From any thread.
 class BlockDevices {
  public:
   /// The root is not owned.
   explicit BlockDevices(const SystemRoot& root) : _root(root) {}
 
   /// The names of all, sorted by bytes.
-  std::vector<DiskName> list() const;
-  std::optional<BlockDevice> find(const DiskName& name) const;
-  std::optional<BlockDevice> withNumber(DeviceNumber number) const;
+  Result<std::vector<DiskName>> list() const;
+  Result<std::optional<BlockDevice>> find(const DiskName& name) const;
+  Result<std::optional<BlockDevice>> withNumber(DeviceNumber number) const;
   /// The device that a node is of: "/dev/sda2", or a link to one.
-  std::optional<BlockDevice> withNode(const std::string& node) const;
+  Result<std::optional<BlockDevice>> withNode(const std::string& node) const;
 
   /// The hardware at the bottom: the disk of a partition; of a mapped volume or an array the first of the disks that
   /// it is on. A name that is not known is its own.
-  DiskName wholeDisk(const DiskName& name) const;
+  Result<DiskName> wholeDisk(const DiskName& name) const;
 
   /// Of a whole disk, in bytes; 512 when it is not known.
-  unsigned logicalBlockSize(const DiskName& disk) const;
+  Result<unsigned> logicalBlockSize(const DiskName& disk) const;
   /// Whether reading a device comes back soon: a suspended mapping does not, and an empty floppy drive takes seconds.
-  bool answersReads(const BlockDevice& device) const;
+  Result<bool> answersReads(const BlockDevice& device) const;
   /// Whether a whole disk gives its medium away.
-  bool isRemovable(const DiskName& disk) const;
+  Result<bool> isRemovable(const DiskName& disk) const;
   /// Whether a whole disk is a drive for optical discs.
-  bool isOptical(const DiskName& disk) const;
+  Result<bool> isOptical(const DiskName& disk) const;
   /// How a whole disk is connected: one of `transport`, or "SATA", "NVMe" ...; empty when that is not known.
-  std::string transportOf(const DiskName& disk) const;
+  Result<std::string> transportOf(const DiskName& disk) const;
   /// Whether a whole disk stays in the machine, as far as the machine knows.
-  bool isInternal(const DiskName& disk) const;
+  Result<bool> isInternal(const DiskName& disk) const;
 
  private:
-  std::string attribute(const std::string& path, const char* name) const;
-  std::uint64_t count(const std::string& path, const char* name) const;
-  std::string subsystemOf(const std::string& path) const;
-  std::optional<std::string> pathOf(const DiskName& name) const;
-  std::optional<DiskName> firstBeneath(const std::string& path) const;
-  std::vector<std::string> carriersOf(const DiskName& disk) const;
-
   const SystemRoot& _root;
 };
 

@@ -41,6 +41,8 @@ std::optional<std::string> blockDeviceIn(std::string_view event) {
 
 Result<DeviceEvents> DeviceEvents::open(const SystemRoot& root) {
   constexpr const char* what = "events of devices";
+  const auto hasManager = root.isThere("/run/udev/control");
+  if (!hasManager) return hasManager.failure();
   FileDescriptor socket(::socket(AF_NETLINK, SOCK_RAW | SOCK_CLOEXEC | SOCK_NONBLOCK, NETLINK_KOBJECT_UEVENT));
   if (!socket) return systemFailure("socket", what, errno);
   // Beyond the usual limit for root only; others have less room, and look at all devices when it was not enough.
@@ -48,7 +50,7 @@ Result<DeviceEvents> DeviceEvents::open(const SystemRoot& root) {
     ::setsockopt(socket.number(), SOL_SOCKET, SO_RCVBUF, &storm, sizeof storm);
   sockaddr_nl address{};
   address.nl_family = AF_NETLINK;
-  address.nl_groups = root.exists("/run/udev/control") ? deviceManagerGroup : kernelGroup;
+  address.nl_groups = *hasManager ? deviceManagerGroup : kernelGroup;
   if (::bind(socket.number(), reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0)
     return systemFailure("bind", what, errno);
   return DeviceEvents(std::move(socket));
@@ -63,6 +65,7 @@ ChangedDevices DeviceEvents::take() const {
     if (length < 0 && errno == ENOBUFS) {
       changed.all = true;
     } else if (length <= 0) {
+      changed.all |= length < 0 && errno != EAGAIN;
       return changed;
     } else if (auto name = blockDeviceIn({event.data(), static_cast<std::size_t>(length)})) {
       changed.names.insert(std::move(*name));

@@ -12,6 +12,7 @@
 #include <string_view>
 
 #include "base/Text.h"
+#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 
 namespace tavisk {
@@ -37,12 +38,11 @@ std::string unescaped(std::string_view text) {
 /// `udevadm info` shows. Nothing where no device manager runs.
 class DeviceProperties {
  public:
-  DeviceProperties(const SystemRoot& root, DeviceNumber number) {
-    constexpr std::string_view mark = "E:";
+  static Result<DeviceProperties> of(const SystemRoot& root, DeviceNumber number) {
     const auto file = "/run/udev/data/b" + std::to_string(number.major) + ":" + std::to_string(number.minor);
-    for (const auto& line : configurationLines(root.read(file, recordLimit).valueOr("")))
-      if (auto property = namedValueIn(line); property && property->name.starts_with(mark))
-        _values[property->name.substr(mark.size())] = std::move(property->value);
+    const auto record = orEmpty(root.read(file, recordLimit));
+    if (!record) return record.failure();
+    return DeviceProperties(*record);
   }
 
   std::optional<std::string> find(const std::string& name) const {
@@ -64,6 +64,13 @@ class DeviceProperties {
   }
 
  private:
+  explicit DeviceProperties(const std::string& record) {
+    constexpr std::string_view mark = "E:";
+    for (const auto& line : configurationLines(record))
+      if (auto property = namedValueIn(line); property && property->name.starts_with(mark))
+        _values[property->name.substr(mark.size())] = std::move(property->value);
+  }
+
   std::map<std::string, std::string> _values;
 };
 
@@ -88,20 +95,21 @@ OpticalMedium mediumOfProfile(unsigned profile) {
   return OpticalMedium::other;
 }
 
-OpticalMedium askDrive(const SystemRoot& root, const std::string& node) {
+Result<OpticalMedium> askDrive(const SystemRoot& root, const std::string& node) {
   const auto drive = root.open(node, O_RDONLY | O_NONBLOCK);
-  if (!drive) return OpticalMedium::none;
+  if (!drive) return isGone(drive.failure()) ? Result(OpticalMedium::none) : drive.failure();
   const int status = ::ioctl(drive->number(), CDROM_DRIVE_STATUS, CDSL_CURRENT);
   if (status == CDS_NO_DISC || status == CDS_TRAY_OPEN || status == CDS_DRIVE_NOT_READY) return OpticalMedium::none;
   return mediumOfProfile(currentProfile(*drive));
 }
 
 /// From the device manager, else from the drive itself.
-OpticalMedium mediumIn(const SystemRoot& root, const std::string& node, const DeviceProperties& properties) {
+Result<OpticalMedium> mediumIn(const SystemRoot& root, const std::string& node, const DeviceProperties& properties) {
   if (properties.isAnySet("ID_CDROM_MEDIA_CD")) return OpticalMedium::cd;
   if (properties.isAnySet("ID_CDROM_MEDIA_DVD")) return OpticalMedium::dvd;
   if (properties.isSet("ID_CDROM_MEDIA")) return OpticalMedium::other;
-  return properties.isSet("ID_CDROM") ? OpticalMedium::none : askDrive(root, node);
+  if (properties.isSet("ID_CDROM")) return OpticalMedium::none;
+  return askDrive(root, node);
 }
 
 VolumeFacts volumeFrom(const DeviceProperties& properties) {
@@ -109,16 +117,16 @@ VolumeFacts volumeFrom(const DeviceProperties& properties) {
           properties.findEscaped("ID_FS_UUID_ENC"), properties.findEscaped("ID_FS_BOOT_SYSTEM_ID")};
 }
 
-void readDisk(const SystemRoot& root, DiskFacts& facts) {
-  if (!BlockDevices(root).answersReads(facts.device)) {
-    facts.unread = Failure{"read", facts.device.node, "it would not answer"};
-    return;
-  }
+Result<void> readDisk(const SystemRoot& root, DiskFacts& facts) {
+  const auto answers = BlockDevices(root).answersReads(facts.device);
+  if (!answers) return answers.failure();
+  if (!*answers) return Failure{"read", facts.device.node, "it would not answer"};
   const auto volume = probeVolume(root, facts.device.node);
   if (volume) facts.volume = *volume;
   const auto table = facts.device.partition == 0 ? probePartitionTable(root, facts.device.node) : PartitionTable{};
   if (table) facts.table = *table;
-  if (!volume) facts.unread = volume.failure();
+  if (!volume) return volume.failure();
+  return table ? Result<void>() : table.failure();
 }
 
 /// What is above the disk in the device tree.
@@ -126,28 +134,41 @@ std::string carrierOf(const BlockDevice& device) {
   return device.path.substr(0, device.path.find("/block/"));
 }
 
-}  // namespace
+void readMedium(const SystemRoot& root, const DeviceProperties& properties, DiskFacts& facts) {
+  const auto medium = mediumIn(root, facts.device.node, properties);
+  facts.medium = medium.valueOr(OpticalMedium::other);
+  if (!medium) facts.unread = medium.failure();
+}
 
-std::optional<DiskFacts> factsOf(const SystemRoot& root, const DiskName& name) {
-  const BlockDevices devices(root);
-  const auto device = devices.find(name);
-  const bool hasNode = device && device->number.major != 0;  // the paths of a multipath device have none
-  if (!hasNode || device->size == 0) return std::nullopt;
-  DiskFacts facts;
-  facts.device = *device;
-  const DeviceProperties properties(root, device->number);
-  if (devices.isOptical(device->disk)) {
-    facts.medium = mediumIn(root, device->node, properties);
-    if (facts.medium == OpticalMedium::none) return std::nullopt;
-  }
-  facts.busPath = properties.find("ID_PATH").value_or(carrierOf(*device));
+void readContents(const SystemRoot& root, const DeviceProperties& properties, DiskFacts& facts) {
+  facts.busPath = properties.find("ID_PATH").value_or(carrierOf(facts.device));
   facts.partitionType = properties.find("ID_PART_ENTRY_TYPE");
   if (properties.find("ID_FS_TYPE") || properties.find("ID_PART_TABLE_TYPE")) {
     facts.volume = volumeFrom(properties);
     facts.table.type = properties.find("ID_PART_TABLE_TYPE").value_or("");
-  } else {
-    readDisk(root, facts);
+  } else if (const auto isRead = readDisk(root, facts); !isRead && !facts.unread) {
+    facts.unread = isRead.failure();
   }
+}
+
+}  // namespace
+
+Result<std::optional<DiskFacts>> factsOf(const SystemRoot& root, const DiskName& name) {
+  const BlockDevices devices(root);
+  const auto found = devices.find(name);
+  if (!found) return found.failure();
+  const auto& device = *found;
+  const bool hasNode = device && device->number.major != 0;  // the paths of a multipath device have none
+  if (!hasNode || device->size == 0) return std::nullopt;
+  const auto properties = DeviceProperties::of(root, device->number);
+  if (!properties) return properties.failure();
+  const auto isOptical = devices.isOptical(device->disk);
+  if (!isOptical) return isOptical.failure();
+  DiskFacts facts;
+  facts.device = *device;
+  if (*isOptical) readMedium(root, *properties, facts);
+  if (*isOptical && facts.medium == OpticalMedium::none) return std::nullopt;
+  readContents(root, *properties, facts);
   return facts;
 }
 

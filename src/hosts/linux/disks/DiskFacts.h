@@ -22,11 +22,11 @@ struct DiskFacts {
   std::optional<std::string> partitionType;  ///< when the device manager knows it; else it stands in the disk's table
   std::string busPath;
   OpticalMedium medium = OpticalMedium::none;
-  std::optional<Failure> unread;  ///< why the volume and the table are not known
+  std::optional<Failure> unread;  ///< why the medium, the volume or the table is not known
 };
 
 /// Asks the device manager's database, or reads the disk where that says nothing. Absent when there is no such device
-/// or nothing in it.
-std::optional<DiskFacts> factsOf(const SystemRoot& root, const DiskName& name);
+/// or nothing in it; a failure when that could not be found out.
+Result<std::optional<DiskFacts>> factsOf(const SystemRoot& root, const DiskName& name);
 
 }  // namespace tavisk

@@ -6,8 +6,6 @@
 
 #include <utility>
 
-#include "effects/SettingNames.h"
-
 namespace tavisk {
 
 void LinuxDiskEventSession::schedule(RunLoop& runLoop) {
@@ -20,10 +18,7 @@ void LinuxDiskEventSession::schedule(RunLoop& runLoop) {
 
 void LinuxDiskEventSession::watchDevices(RunLoop& runLoop) {
   auto events = DeviceEvents::open(_machine.root);
-  if (!events) {
-    _machine.effects.recordFailure(setting::startupDisk, events.failure());
-    return;
-  }
+  if (!events) return _disks.looks().tell(events.failure());
   _deviceEvents.emplace(std::move(events).value());
   _deviceChanges = runLoop.watch(_deviceEvents->descriptor(), RunLoop::Readiness::readable, [this] {
     if (const auto changed = _deviceEvents->take(); changed.all || !changed.names.empty()) tell(changed);
@@ -32,7 +27,7 @@ void LinuxDiskEventSession::watchDevices(RunLoop& runLoop) {
 
 void LinuxDiskEventSession::watchMounts(RunLoop& runLoop) {
   auto mounts = _machine.root.open(MountTable::file, O_RDONLY);
-  if (!mounts) return;  // reading them tells of it
+  if (!mounts) return _disks.looks().tell(mounts.failure());
   _mounts = std::move(mounts).value();
   _mountChanges = runLoop.watch(_mounts.number(), RunLoop::Readiness::priority, [this] { tell({}); });
 }
@@ -52,9 +47,9 @@ void LinuxDiskEventSession::tell(const ChangedDevices& changed) {
 }
 
 std::optional<DiskName> LinuxDiskEventSession::diskOfPath(const std::string& path) {
-  const auto place = _machine.root.standardized(path);
-  if (!place || (*place != "/" && !_machine.root.exists(*place))) return std::nullopt;
-  return _disks.holding(*place);
+  const auto place = _disks.looks().orTold(orEmpty(_machine.root.standardized(path)));
+  if (place.empty() || (place != "/" && !_disks.looks().orTold(_machine.root.isThere(place)))) return std::nullopt;
+  return _disks.holding(place);
 }
 
 }  // namespace tavisk

@@ -24,7 +24,7 @@ class LinuxDiskEventSession final : public DiskEventSession {
 
   std::shared_ptr<const DiskDescription> description(const DiskName& disk) override { return _disks.find(disk); }
   std::optional<DiskName> diskOfPath(const std::string& path) override;
-  DiskName wholeDisk(const DiskName& disk) override { return _disks.devices().wholeDisk(disk); }
+  DiskName wholeDisk(const DiskName& disk) override { return _disks.wholeDisk(disk); }
 
  private:
   void watchDevices(RunLoop& runLoop);

@@ -19,27 +19,31 @@ int schemeOf(const std::string& table) {
 
 }  // namespace
 
+bool LinuxDiskQueries::isOptical(const DiskName& whole) const {
+  return _disks.looks().orTold(_disks.devices().isOptical(whole));
+}
+
 bool LinuxDiskQueries::is(DiskTrait trait, const DiskName& disk) {
-  const auto whole = _disks.devices().wholeDisk(disk);
+  const auto whole = _disks.wholeDisk(disk);
   const auto medium = [&] {
     const auto facts = _disks.facts(whole);
     return facts ? facts->medium : OpticalMedium::none;
   };
   switch (trait) {
     case DiskTrait::internal:
-      return _disks.devices().isInternal(whole);
+      return _disks.looks().orTold(_disks.devices().isInternal(whole));
     case DiskTrait::cd:
       return medium() == OpticalMedium::cd;
     case DiskTrait::dvd:
       return medium() == OpticalMedium::dvd;
     case DiskTrait::optical:
-      return _disks.devices().isOptical(whole);
+      return isOptical(whole);
   }
   return false;
 }
 
 std::string LinuxDiskQueries::protocolOf(const DiskName& disk) {
-  return _disks.devices().transportOf(_disks.devices().wholeDisk(disk));
+  return _disks.looks().orTold(_disks.devices().transportOf(_disks.wholeDisk(disk)));
 }
 
 std::string LinuxDiskQueries::nameOf(DiskProtocol protocol) {
@@ -47,14 +51,14 @@ std::string LinuxDiskQueries::nameOf(DiskProtocol protocol) {
 }
 
 int LinuxDiskQueries::partitionScheme(const DiskName& disk) {
-  const auto facts = _disks.facts(_disks.devices().wholeDisk(disk));
+  const auto facts = _disks.facts(_disks.wholeDisk(disk));
   return facts ? schemeOf(facts->table.type) : partitionmap::noneKnown;
 }
 
 DiskQueries::OpticalBootability LinuxDiskQueries::opticalBootability(const DiskName& disk) {
-  const auto whole = _disks.devices().wholeDisk(disk);
+  const auto whole = _disks.wholeDisk(disk);
   const auto facts = _disks.facts(whole);
-  if (!facts || facts->unread || !_disks.devices().isOptical(whole)) return {failed, false};
+  if (!facts || facts->unread || !isOptical(whole)) return {failed, false};
   return {0, facts->volume.bootSystemId == "EL TORITO SPECIFICATION"};
 }
 

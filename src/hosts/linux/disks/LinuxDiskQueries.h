@@ -19,6 +19,8 @@ class LinuxDiskQueries final : public DiskQueries {
   OpticalBootability opticalBootability(const DiskName& disk) override;
 
  private:
+  bool isOptical(const DiskName& whole) const;
+
   LinuxDisks& _disks;
 };
 

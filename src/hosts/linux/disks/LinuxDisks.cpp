@@ -8,7 +8,6 @@
 #include <utility>
 
 #include "base/Text.h"
-#include "effects/SettingNames.h"
 
 namespace tavisk {
 namespace {
@@ -56,7 +55,20 @@ std::string folderBeneath(const Mount& overlay) {
   return lowest;
 }
 
+/// Whether a disk is one that this system may not read, or has no node for; or one that would not answer.
+bool isOutOfReach(const Failure& failure) {
+  return !failure.code || isGone(failure) || failure.code == std::errc::permission_denied ||
+         failure.code == std::errc::operation_not_permitted;
+}
+
 }  // namespace
+
+DiskName LinuxDisks::wholeDisk(const DiskName& name) {
+  const auto disk = _devices.wholeDisk(name);
+  if (disk) return *disk;
+  _looks.tell(disk.failure());
+  return name;
+}
 
 std::shared_ptr<const DiskDescription> LinuxDisks::find(const DiskName& name) {
   const std::scoped_lock lock(_mutex);
@@ -100,15 +112,15 @@ void LinuxDisks::readOnce() {
 }
 
 void LinuxDisks::readMounts() {
-  _bySource.clear();
   auto mounts = MountTable::read(_machine.root);
-  if (!mounts) _machine.effects.recordFailure(setting::startupDisk, mounts.failure());
-  _mounts = std::move(mounts).valueOr(MountTable(""));
+  if (!mounts) return _looks.tell(mounts.failure());
+  _mounts = std::move(mounts).value();
+  _bySource.clear();
   std::map<std::string, std::optional<BlockDevice>> known;
   for (const auto& mount : _mounts.mounts()) {
     if (!mount.visible || !isNumberedApart(mount.type)) continue;
     auto [entry, isNew] = known.try_emplace(mount.source);
-    if (isNew) entry->second = _devices.withNode(mount.source);
+    if (isNew) entry->second = _looks.orTold(_devices.withNode(mount.source));
     if (!entry->second) continue;
     auto& best = _bySource[entry->second->name.text];
     if (!best || (best->root != "/" && mount.root == "/")) best = &mount;
@@ -119,14 +131,14 @@ void LinuxDisks::readDevices(const ChangedDevices& changed) {
   auto names = changed.names;
   if (changed.all) {
     for (const auto& [name, facts] : _facts) names.insert(name);
-    for (const auto& name : _devices.list()) names.insert(name.text);
+    for (const auto& name : _looks.orTold(_devices.list())) names.insert(name.text);
   }
   names.merge(newlyMounted());
   for (const auto& name : names) readDevice(name);
 }
 
 /// Devices that may have got their file system, or have come, without an event.
-std::set<std::string> LinuxDisks::newlyMounted() const {
+std::set<std::string> LinuxDisks::newlyMounted() {
   std::set<std::string> names;
   std::set<DeviceNumber> known;
   for (const auto& [name, facts] : _facts) {
@@ -137,23 +149,25 @@ std::set<std::string> LinuxDisks::newlyMounted() const {
   }
   for (const auto& mount : _mounts.mounts()) {
     if (!mount.visible || mount.device.major == 0 || !known.insert(mount.device).second) continue;
-    if (const auto device = _devices.withNumber(mount.device)) names.insert(device->name.text);
+    if (const auto device = _looks.orTold(_devices.withNumber(mount.device))) names.insert(device->name.text);
   }
   return names;
 }
 
 void LinuxDisks::readDevice(const std::string& name) {
+  const auto facts = factsOf(_machine.root, {name});
+  if (!facts) return _looks.tell(facts.failure());
   _facts.erase(name);
-  auto facts = factsOf(_machine.root, {name});
-  if (!facts) return;
-  tellUnread(*facts);
-  _facts.emplace(name, std::move(*facts));
+  if (!*facts) return;
+  tellUnread(**facts);
+  _facts.emplace(name, **facts);
 }
 
 /// In a container the machine's disks cannot be read, and are none of its business.
-void LinuxDisks::tellUnread(const DiskFacts& facts) const {
+void LinuxDisks::tellUnread(const DiskFacts& facts) {
+  if (!facts.unread) return;
   const auto* mount = mountOf(facts.device);
-  if (facts.unread && mount && mount->root == "/") _machine.effects.recordFailure(setting::startupDisk, *facts.unread);
+  if ((mount && mount->root == "/") || !isOutOfReach(*facts.unread)) _looks.tell(*facts.unread);
 }
 
 LinuxDisks::Snapshot LinuxDisks::describe() const {
@@ -200,13 +214,14 @@ std::optional<std::string> LinuxDisks::contentOf(const DiskFacts& facts) const {
   return facts.table.type.empty() ? std::nullopt : std::optional(facts.table.type);
 }
 
-std::optional<DiskName> LinuxDisks::diskOf(const Mount& mount, int depth) const {
+std::optional<DiskName> LinuxDisks::diskOf(const Mount& mount, int depth) {
   if (isNetworkType(mount.type)) return DiskName{mount.source};
   if (mount.type == "overlay") {
     const auto* beneath = depth < deepestOverlay ? _mounts.holding(folderBeneath(mount)) : nullptr;
     return !beneath || beneath == &mount ? std::nullopt : diskOf(*beneath, depth + 1);
   }
-  const auto device = isNumberedApart(mount.type) ? _devices.withNode(mount.source) : _devices.withNumber(mount.device);
+  const auto device =
+      _looks.orTold(isNumberedApart(mount.type) ? _devices.withNode(mount.source) : _devices.withNumber(mount.device));
   return device ? std::optional(device->name) : std::nullopt;
 }
 

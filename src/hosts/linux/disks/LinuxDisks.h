@@ -11,6 +11,7 @@
 
 #include "hosts/linux/disks/DeviceEvents.h"
 #include "hosts/linux/disks/DiskFacts.h"
+#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/disks/MountTable.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/DiskSnapshot.h"
@@ -19,14 +20,19 @@
 namespace tavisk {
 
 /// The disks of the machine as this run knows them: block devices with a medium, by name, then network volumes. They
-/// change only when the session says so, in a pass of the run loop. From any thread.
+/// change only when the session says so, in a pass of the run loop. What cannot be looked at then stays as it was, and
+/// is told. From any thread.
 class LinuxDisks {
  public:
   using Snapshot = std::shared_ptr<const DiskSnapshot>;
 
-  explicit LinuxDisks(const LinuxMachine& machine) : _machine(machine), _devices(machine.root) {}
+  explicit LinuxDisks(const LinuxMachine& machine)
+      : _machine(machine), _devices(machine.root), _looks(machine.effects) {}
 
   const BlockDevices& devices() const { return _devices; }
+  FailedLooks& looks() { return _looks; }
+  /// As BlockDevices; one that could not be looked at is its own.
+  DiskName wholeDisk(const DiskName& name);
   /// Null when there is no such disk. Between renew and forgetOld the disks that have gone are still found.
   std::shared_ptr<const DiskDescription> find(const DiskName& name);
   /// Absent when there is no such device, or no medium in it.
@@ -50,17 +56,18 @@ class LinuxDisks {
   void readOnce();
   void readMounts();
   void readDevices(const ChangedDevices& changed);
-  std::set<std::string> newlyMounted() const;
+  std::set<std::string> newlyMounted();
   void readDevice(const std::string& name);
-  void tellUnread(const DiskFacts& facts) const;
+  void tellUnread(const DiskFacts& facts);
   Snapshot describe() const;
   const Mount* mountOf(const BlockDevice& device) const;
   std::shared_ptr<DiskDescription> describe(const DiskFacts& facts) const;
   std::optional<std::string> contentOf(const DiskFacts& facts) const;
-  std::optional<DiskName> diskOf(const Mount& mount, int depth) const;
+  std::optional<DiskName> diskOf(const Mount& mount, int depth);
 
   LinuxMachine _machine;
   BlockDevices _devices;
+  FailedLooks _looks;
   std::mutex _mutex;                        ///< of all that follows
   std::map<std::string, DiskFacts> _facts;  ///< by name
   MountTable _mounts{""};

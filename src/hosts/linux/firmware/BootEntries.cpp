@@ -124,7 +124,8 @@ Result<std::uint16_t> BootEntries::lowestFree() const {
     const auto number = static_cast<std::uint16_t>(candidate);
     if (std::ranges::find(*numbersInOrder, number) != numbersInOrder->end()) continue;
     const auto present = _variables.read({bootEntryName(number)});
-    if (present && !*present) return number;
+    if (!present) return present.failure();
+    if (!*present) return number;
   }
   return Failure{"make a boot entry", EfiVariables::folder, "all numbers are in use"};
 }

@@ -42,11 +42,17 @@ class BootVolumes {
   Result<BootTarget> onSystemPartition(const DiskName& name, const std::string& file) const;
   Result<EfiPartition> identityOf(const BlockDevice& partition) const;
   Result<std::vector<DiskName>> systemPartitionsOf(const DiskName& disk) const;
-  bool isDiskImage(const DiskName& disk) const;
-  std::optional<DiskName> partitionOf(const DiskName& disk, int number) const;
-  std::vector<DiskName> partitionsWith(const std::string& uuid) const;
+  Result<BlockDevice> deviceOf(const DiskName& name) const;
+  Result<std::vector<BlockDevice>> allDevices() const;
+  Result<bool> mayHaveContents(const BlockDevice& device) const;
+  Result<bool> isOn(const DiskName& disk, const BlockDevice& device) const;
+  Result<bool> isOnHardware(const BlockDevice& device) const;
+  Result<bool> isSeenByFirmware(const BlockDevice& disk) const;
+  Result<std::optional<DiskName>> partitionOf(const DiskName& disk, int number) const;
+  Result<std::vector<DiskName>> partitionsWith(const std::string& uuid) const;
+  Result<std::vector<DiskName>> partitionsWith(const std::string& uuid, const BlockDevice& disk) const;
   Result<DiskName> partitionWith(const EfiPartition& partition) const;
-  std::optional<DiskName> fileSystemWith(const std::string& uuid, const DiskName& disk) const;
+  Result<std::optional<DiskName>> fileSystemWith(const std::string& uuid, const DiskName& disk) const;
 
   const SystemRoot& _root;
   LinuxDisks& _disks;

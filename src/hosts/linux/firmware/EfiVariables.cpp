@@ -99,12 +99,14 @@ std::string EfiVariables::pathOf(const EfiVariableName& variable) {
   return std::string(folder) + "/" + variable.name + "-" + variable.vendor;
 }
 
-std::optional<Failure> EfiVariables::whyNone() const {
-  if (!_root.exists("/sys/firmware/efi"))
-    return Failure{"read", "the firmware's variables", "this machine was not started by UEFI firmware"};
-  const auto all = _root.list(folder);
+Support EfiVariables::support() const {
+  const auto isUefi = _root.isThere("/sys/firmware/efi");
+  if (!isUefi) return isUefi.failure();
+  if (!*isUefi)
+    return NotSupported{{"read", "the firmware's variables", "this machine was not started by UEFI firmware"}};
+  const auto all = orEmpty(_root.list(folder));
   if (!all) return all.failure();
-  if (all->empty()) return Failure{"read", folder, "no variables are shown here; is efivarfs mounted?"};
+  if (all->empty()) return NotSupported{{"read", folder, "no variables are shown here; is efivarfs mounted?"}};
   return std::nullopt;
 }
 
@@ -120,8 +122,7 @@ Result<std::vector<std::string>> EfiVariables::names(std::string_view vendor) co
 
 /// The kernel shows a variable that was made and not yet written as an empty file.
 Result<std::optional<EfiVariables::Stored>> EfiVariables::find(const std::string& path) const {
-  if (!_root.exists(path)) return std::nullopt;
-  const auto contents = _root.read(path, longestVariable);
+  const auto contents = orEmpty(_root.read(path, longestVariable));
   if (!contents) return contents.failure();
   if (contents->empty()) return std::nullopt;
   std::string_view rest = *contents;

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "base/Result.h"
+#include "hosts/shared/SettingChange.h"
 #include "hosts/shared/SystemRoot.h"
 
 namespace tavisk {
@@ -38,8 +39,8 @@ class EfiVariables {
   static constexpr const char* folder = "/sys/firmware/efi/efivars";
   static std::string pathOf(const EfiVariableName& variable);
 
-  /// The reason when this machine has no variables, or hides them.
-  std::optional<Failure> whyNone() const;
+  /// Not supported when this machine has no variables, or hides them.
+  Support support() const;
   /// The names of all that are this vendor's, sorted by bytes; also of those that a broken write left without a value.
   Result<std::vector<std::string>> names(std::string_view vendor) const;
   /// Without its attributes; absent when there is no such variable.

@@ -26,20 +26,42 @@ std::string nameOf(const BootEntry& entry) {
   return bootEntryName(entry.number) + " (" + entry.option.description + ")";
 }
 
-bool isOpenFirmware(const SystemRoot& root) {
-  const auto properties = root.list(deviceTree).valueOr({});
-  return std::ranges::any_of(properties,
+Result<bool> isOpenFirmware(const SystemRoot& root) {
+  const auto properties = orEmpty(root.list(deviceTree));
+  if (!properties) return properties.failure();
+  return std::ranges::any_of(*properties,
                              [](const auto& name) { return name == "openprom" || name.starts_with("ibm,"); });
 }
 
 }  // namespace
 
 LinuxBootSettings::LinuxBootSettings(const LinuxMachine& machine, LinuxDisks& disks)
-    : _machine(machine), _variables(machine.root), _entries(_variables), _volumes(machine.root, disks) {}
+    : _machine(machine),
+      _variables(machine.root),
+      _entries(_variables),
+      _volumes(machine.root, disks),
+      _looks(disks.looks()) {}
+
+Result<int> LinuxBootSettings::environment() const {
+  const auto isUefi = _machine.root.isThere("/sys/firmware/efi");
+  if (!isUefi) return isUefi.failure();
+  if (*isUefi) return preboot::loadsBootEfi;
+  const auto isOpen = isOpenFirmware(_machine.root);
+  if (!isOpen) return isOpen.failure();
+  return *isOpen ? preboot::openFirmware : preboot::noneKnown;
+}
 
 int LinuxBootSettings::preBootEnvironment() {
-  if (_machine.root.exists("/sys/firmware/efi")) return preboot::loadsBootEfi;
-  return isOpenFirmware(_machine.root) ? preboot::openFirmware : preboot::noneKnown;
+  const auto found = environment();
+  if (found) return *found;
+  _looks.tellDoubt(found.failure());
+  return preboot::noneKnown;
+}
+
+/// Whoever sets has asked for the environment, the keyboard or the language, and may have got a wrong answer.
+Support LinuxBootSettings::support() const {
+  if (const auto doubt = _looks.takeDoubt()) return *doubt;
+  return _variables.support();
 }
 
 BootSettings::LegacyBootSupport LinuxBootSettings::legacyBootSupport() {
@@ -58,7 +80,9 @@ BootSettings::LegacyBootSupport LinuxBootSettings::legacyBootSupport() {
 
 /// What firmware starts at the next start.
 Result<std::optional<BootEntry>> LinuxBootSettings::preferred() const {
-  if (const auto failure = _variables.whyNone()) return *failure;
+  const auto support = _variables.support();
+  if (!support) return support.failure();
+  if (*support) return (*support)->reason;
   auto once = _entries.onlyNext();
   return !once || *once ? once : _entries.first();
 }
@@ -88,27 +112,34 @@ BootSettings::BootPreference LinuxBootSettings::bootPreference() {
 
 /// Without firmware that keeps one there is no such preference, which is no failure.
 BootSettings::NetworkBootPreference LinuxBootSettings::networkBootPreference() {
-  const auto entry = preferred();
-  const auto path = entry && *entry ? pathOf(**entry) : std::nullopt;
+  const auto support = _variables.support();
+  if (support && *support) return {};
+  const auto entry = support ? preferred() : support.failure();
+  if (!entry) return failedNetwork(entry.failure());
+  const auto path = *entry ? pathOf(**entry) : std::nullopt;
   const auto network = path ? networkPathOf(*path) : std::nullopt;
   if (!network) return {};
   const auto interface = interfaceWith(network->hardwareAddress);
-  if (interface.empty()) {
-    _machine.effects.recordFailure(
-        setting::networkStartupDisk,
-        {"find the interface of", nameOf(**entry), "none here has the address " + network->hardwareAddress});
-    return {failed, {}, {}, {}};
-  }
-  _machine.effects.observe({setting::networkStartupDisk, interface, std::nullopt, ""});
-  return {0, network->uri, network->server, interface};
+  if (!interface) return failedNetwork(retold(interface.failure(), "find the interface of", nameOf(**entry)));
+  _machine.effects.observe({setting::networkStartupDisk, *interface, std::nullopt, ""});
+  return {0, network->uri, network->server, *interface};
 }
 
-std::string LinuxBootSettings::interfaceWith(const std::string& hardwareAddress) const {
-  for (const auto& name : _machine.root.list(interfaces).valueOr({})) {
-    const auto address = readKernelFile(_machine.root, std::string(interfaces).append("/").append(name) + "/address");
-    if (address && lowerCased(*address) == hardwareAddress) return name;
+BootSettings::NetworkBootPreference LinuxBootSettings::failedNetwork(const Failure& failure) const {
+  _machine.effects.recordFailure(setting::networkStartupDisk, failure);
+  return {failed, {}, {}, {}};
+}
+
+Result<std::string> LinuxBootSettings::interfaceWith(const std::string& hardwareAddress) const {
+  const auto names = orEmpty(_machine.root.list(interfaces));
+  if (!names) return names.failure();
+  for (const auto& name : *names) {
+    const auto file = std::string(interfaces).append("/").append(name) + "/address";
+    const auto address = orGone(readKernelFile(_machine.root, file));
+    if (!address) return address.failure();
+    if (*address && lowerCased(**address) == hardwareAddress) return name;
   }
-  return "";
+  return Failure{"look for", interfaces, "none here has the address " + hardwareAddress};
 }
 
 ServiceStatus LinuxBootSettings::setBootPreference(const BootChoice& choice) {
@@ -117,7 +148,7 @@ ServiceStatus LinuxBootSettings::setBootPreference(const BootChoice& choice) {
   parts.name = setting::startupDisk;
   parts.where = EfiVariables::pathOf(BootEntries::orderVariable());
   parts.note = [this](const auto&) { return noteOnNextStart(); };
-  parts.supported = [this] { return asSupport(_variables.whyNone()); };
+  parts.supported = [this] { return support(); };
   parts.stored = [this]() -> Setting<std::string>::Found {
     const auto entry = _entries.first();
     if (!entry) return entry.failure();
@@ -166,7 +197,7 @@ ServiceStatus LinuxBootSettings::setFirmwareVariable(const std::string& name, co
   Setting<std::string> parts;
   parts.name = setting::firmwareVariable + name;
   parts.where = EfiVariables::pathOf(variable);
-  parts.supported = [this] { return asSupport(_variables.whyNone()); };
+  parts.supported = [this] { return support(); };
   parts.stored = [this, variable] { return _variables.read(variable); };
   parts.store = [this, variable](const std::string& text) { return _variables.write(variable, text); };
   return change(std::move(parts), value);

@@ -15,7 +15,7 @@
 namespace tavisk {
 
 /// What the machine starts from, kept by UEFI firmware. Other firmware has no choice of a disk that Linux could set: it
-/// has no preference, and to set one is not supported.
+/// has no preference, and to set one is not supported. Nothing is set by what could not be looked at.
 class LinuxBootSettings final : public BootSettings {
  public:
   /// The disks are not owned.
@@ -36,7 +36,10 @@ class LinuxBootSettings final : public BootSettings {
   Result<std::optional<DiskName>> preferredVolume() const;
   Result<EfiLoadOption> optionFor(const BootChoice& choice) const;
   std::optional<Failure> whyRefused(const BootTarget& target) const;
-  std::string interfaceWith(const std::string& hardwareAddress) const;
+  Result<int> environment() const;
+  Support support() const;
+  Result<std::string> interfaceWith(const std::string& hardwareAddress) const;
+  NetworkBootPreference failedNetwork(const Failure& failure) const;
   std::string noteOnNextStart() const;
   Result<void> keepOrder(const std::vector<std::uint16_t>& order) const;
   ServiceStatus change(Setting<std::string> parts, const std::string& asked) const;
@@ -45,6 +48,7 @@ class LinuxBootSettings final : public BootSettings {
   EfiVariables _variables;
   BootEntries _entries;
   BootVolumes _volumes;
+  FailedLooks& _looks;
 };
 
 }  // namespace tavisk

@@ -7,6 +7,7 @@
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/shared/SettingChange.h"
@@ -30,23 +31,41 @@ std::string textOf(KeyboardState state) {
   return state == KeyboardState::disabled ? "keyboards disabled" : "keyboards enabled";
 }
 
-std::string valueOf(const SystemRoot& root, const std::string& file) {
-  return readKernelFile(root, file).valueOr("");
+/// Empty when the device has none, or has gone.
+Result<std::string> valueOf(const SystemRoot& root, const std::string& file) {
+  const auto value = orGone(readKernelFile(root, file));
+  if (!value) return value.failure();
+  return value->value_or("");
 }
 
 /// Whether it has the keys Escape to D, bits 1 to 31: by these udev knows keyboards from buttons too.
-bool hasLetters(const SystemRoot& root, const std::string& device) {
+Result<bool> hasLetters(const SystemRoot& root, const std::string& device) {
   constexpr std::uint64_t letters = 0xFFFF'FFFE;
-  const auto words = split(valueOf(root, device + "/capabilities/key"), " ");
+  const auto capabilities = valueOf(root, device + "/capabilities/key");
+  if (!capabilities) return capabilities.failure();
+  const auto words = split(*capabilities, " ");
   if (words.empty()) return false;
   const auto keys = parseNumber<std::uint64_t>(words.back(), 16).value_or(0);
   return (keys & letters) == letters;
 }
 
-bool isOfController(const SystemRoot& root, const std::string& device) {
-  if (lowerCased(valueOf(root, device + "/name")).find("virtual") != std::string::npos) return true;
-  const auto id = valueOf(root, device + "/id/vendor") + ":" + valueOf(root, device + "/id/product");
-  return std::ranges::find(controllersOwn, id) != std::end(controllersOwn);
+Result<bool> isOfController(const SystemRoot& root, const std::string& device) {
+  const auto name = valueOf(root, device + "/name");
+  if (!name) return name.failure();
+  if (lowerCased(*name).find("virtual") != std::string::npos) return true;
+  const auto vendor = valueOf(root, device + "/id/vendor");
+  if (!vendor) return vendor.failure();
+  const auto product = valueOf(root, device + "/id/product");
+  if (!product) return product.failure();
+  return std::ranges::find(controllersOwn, *vendor + ":" + *product) != std::end(controllersOwn);
+}
+
+Result<bool> isKeyboard(const SystemRoot& root, const std::string& device) {
+  const auto letters = hasLetters(root, device);
+  if (!letters || !*letters) return letters;
+  const auto isPretended = isOfController(root, device);
+  if (!isPretended) return isPretended.failure();
+  return !*isPretended;
 }
 
 Setting<KeyboardState>::Found stateOf(const SystemRoot& root, const std::vector<std::string>& keyboards) {
@@ -72,19 +91,30 @@ std::string remarkOn(const Result<bool>& engaged) {
   return *engaged ? "the lock is engaged" : "the lock is open";
 }
 
-std::optional<Failure> whyNotSupported(const Result<bool>& engaged, const std::vector<std::string>& keyboards) {
-  if (!engaged) return engaged.failure();
-  if (keyboards.empty()) return Failure{"find a keyboard", inputClass, "there is none at this machine"};
+/// Whether a machine has no lock: no controller, or one that tells of none.
+bool isLockMissing(const Failure& failure) {
+  return failure.code == std::errc::no_such_device || failure.code == std::errc::function_not_supported;
+}
+
+Support supportOf(const Result<bool>& engaged, const Result<std::vector<std::string>>& keyboards) {
+  if (!engaged && !isLockMissing(engaged.failure())) return engaged.failure();
+  if (!engaged) return NotSupported{engaged.failure()};
+  if (!keyboards) return keyboards.failure();
+  if (keyboards->empty()) return NotSupported{{"find a keyboard", inputClass, "there is none at this machine"}};
   return std::nullopt;
 }
 
 }  // namespace
 
-std::vector<std::string> keyboards(const SystemRoot& root) {
+Result<std::vector<std::string>> keyboards(const SystemRoot& root) {
+  const auto names = orEmpty(root.list(devices));
+  if (!names) return names.failure();
   std::vector<std::string> found;
-  for (const auto& name : root.list(devices).valueOr({})) {
-    const auto device = devices + name;
-    if (name.starts_with("input") && hasLetters(root, device) && !isOfController(root, device)) found.push_back(device);
+  for (const auto& name : *names) {
+    if (!name.starts_with("input")) continue;
+    const auto isFound = isKeyboard(root, devices + name);
+    if (!isFound) return isFound.failure();
+    if (*isFound) found.push_back(devices + name);
   }
   return found;
 }
@@ -103,7 +133,8 @@ Result<bool> EnclosureLock::isEngaged() {
   const auto capabilities = _controller.ask("Get Chassis Capabilities", {chassis, getCapabilities, {}}, 1);
   if (!capabilities) return capabilities.failure();
   if ((capabilities->front() & frontPanelLockout) == 0)
-    return Failure{"Get Chassis Capabilities", managementController, "it tells of no lock of the front panel"};
+    return Failure{"Get Chassis Capabilities", managementController, "it tells of no lock of the front panel",
+                   std::make_error_code(std::errc::no_such_device)};
   const auto status = _controller.ask("Get Chassis Status", {chassis, getStatus, {}}, 3);
   if (!status) return status.failure();
   return ((*status)[2] & frontPanelLockout) != 0;
@@ -118,9 +149,9 @@ void EnclosureLock::setDisablesKeyboard(bool disables) {
   Setting<KeyboardState> setting;
   setting.name = setting::keyboardLock;
   setting.note = saying(remarkOn(engaged));
-  setting.supported = [&] { return asSupport(whyNotSupported(engaged, found)); };
-  setting.live = [&] { return stateOf(_machine.root, found); };
-  setting.apply = [&](KeyboardState state) { return setAll(_machine.root, found, state); };
+  setting.supported = [&] { return supportOf(engaged, found); };
+  setting.live = [&] { return stateOf(_machine.root, *found); };
+  setting.apply = [&](KeyboardState state) { return setAll(_machine.root, *found, state); };
   carryOut(setting, asked, _machine);
 }
 

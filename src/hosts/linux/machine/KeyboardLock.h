@@ -14,7 +14,7 @@ namespace tavisk {
 
 /// The folders in /sys of the keyboards that stand at the machine, or are plugged into it. The one that a management
 /// controller pretends to be, for who sits elsewhere, is none.
-std::vector<std::string> keyboards(const SystemRoot& root);
+Result<std::vector<std::string>> keyboards(const SystemRoot& root);
 
 /// Whether the kernel passes on nothing of what is typed there (Documentation/input/input-programming.rst).
 Result<bool> isInhibited(const SystemRoot& root, const std::string& keyboard);

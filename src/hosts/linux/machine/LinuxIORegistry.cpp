@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/machine/LinuxIORegistry.h"
 
+#include <utility>
+
 namespace tavisk {
 namespace {
 
@@ -16,22 +18,26 @@ constexpr std::size_t longestProperty = 4096;
 
 std::optional<RegistryEntry> LinuxIORegistry::entryAtPath(const std::string& path) {
   if (!path.starts_with(deviceTree)) return std::nullopt;
-  const auto folder = _root.standardized(firmwareTree + path.substr(deviceTree.size()));
-  if (!folder || !_root.exists(*folder)) return std::nullopt;
-  return RegistryEntry{*folder};
+  auto folder = _looks.orTold(orEmpty(_root.standardized(firmwareTree + path.substr(deviceTree.size()))));
+  if (folder.empty() || !_looks.orTold(_root.isThere(folder))) return std::nullopt;
+  return RegistryEntry{std::move(folder)};
 }
 
 std::optional<IORegistry::Data> LinuxIORegistry::dataProperty(const RegistryEntry& entry, const std::string& property) {
   if (property.find('/') != std::string::npos) return std::nullopt;
-  const auto value = _root.read(entry.name + "/" + property, longestProperty);
+  const auto value = _looks.orTold(orGone(_root.read(entry.name + "/" + property, longestProperty)));
   return value ? std::optional(Data(value->begin(), value->end())) : std::nullopt;
+}
+
+bool LinuxIORegistry::isDevice(const std::string& folder) {
+  return _looks.orTold(_root.isThere(folder + "/subsystem"));
 }
 
 std::optional<RegistryEntry> LinuxIORegistry::serviceNamed(const std::string& bsdName) {
   if (bsdName.empty() || bsdName.find('/') != std::string::npos) return std::nullopt;
   for (const auto* kind : {"/sys/class/net/", "/sys/class/block/"}) {
-    const auto folder = _root.standardized(kind + bsdName);
-    if (folder && _root.exists(*folder + "/subsystem")) return RegistryEntry{*folder};
+    auto folder = _looks.orTold(orEmpty(_root.standardized(kind + bsdName)));
+    if (!folder.empty() && isDevice(folder)) return RegistryEntry{std::move(folder)};
   }
   return std::nullopt;
 }
@@ -39,7 +45,7 @@ std::optional<RegistryEntry> LinuxIORegistry::serviceNamed(const std::string& bs
 std::pair<RegistryStatus, RegistryEntry> LinuxIORegistry::parent(const RegistryEntry& entry, RegistryPlane /*plane*/) {
   auto above = entry.name;
   do above.resize(std::min(above.rfind('/'), above.size()));
-  while (above.size() > std::string_view(devices).size() && !_root.exists(above + "/subsystem"));
+  while (above.size() > std::string_view(devices).size() && !isDevice(above));
   return {0, {above.starts_with(devices) ? above : devices}};
 }
 

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/shared/SystemRoot.h"
 #include "platform/IORegistry.h"
 
@@ -11,8 +12,8 @@ namespace tavisk {
 /// itself, beneath "IODeviceTree:/", is there on machines with a device tree alone.
 class LinuxIORegistry final : public IORegistry {
  public:
-  /// The root is not owned.
-  explicit LinuxIORegistry(const SystemRoot& root) : _root(root) {}
+  /// Neither is owned.
+  LinuxIORegistry(const SystemRoot& root, FailedLooks& looks) : _root(root), _looks(looks) {}
 
   RegistryStatus masterPort() override { return 0; }
   std::optional<RegistryEntry> entryAtPath(const std::string& path) override;
@@ -23,7 +24,10 @@ class LinuxIORegistry final : public IORegistry {
   std::pair<RegistryStatus, std::string> path(const RegistryEntry& entry, RegistryPlane plane) override;
 
  private:
+  bool isDevice(const std::string& folder);
+
   const SystemRoot& _root;
+  FailedLooks& _looks;
 };
 
 }  // namespace tavisk

@@ -17,6 +17,7 @@
 #include "effects/SettingNames.h"
 #include "hosts/linux/disks/BlockDevices.h"
 #include "hosts/linux/disks/MountTable.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/ShellAssignments.h"
 
@@ -47,39 +48,61 @@ std::string_view firstName(std::string_view layouts) {
 
 std::string LinuxKernelValues::model() {
   for (const auto* file : {"/sys/class/dmi/id/product_name", "/sys/firmware/devicetree/base/model"}) {
-    const auto name = readKernelFile(_root, file).valueOr("");
+    const auto name = _looks.orTold(orEmpty(readKernelFile(_root, file)));
     if (!name.empty()) return name.substr(0, longestModel);
   }
   return "";
 }
 
 std::int32_t LinuxKernelValues::networkStart() {
-  const auto words = split(_root.read(commandLine, longestCommandLine).valueOr(""), " \n");
-  const bool isTold = std::ranges::any_of(words, [](const auto& word) { return word.starts_with("BOOTIF="); });
-  return isTold || _root.exists(iscsiStart) || isRootOnNetwork() ? 1 : 0;
+  return _looks.orTold(isFromNetwork()) ? 1 : 0;
 }
 
-bool LinuxKernelValues::isRootOnNetwork() const {
+Result<bool> LinuxKernelValues::isFromNetwork() const {
+  const auto line = orEmpty(_root.read(commandLine, longestCommandLine));
+  if (!line) return line.failure();
+  const auto words = split(*line, " \n");
+  if (std::ranges::any_of(words, [](const auto& word) { return word.starts_with("BOOTIF="); })) return true;
+  auto hasTrace = _root.isThere(iscsiStart);
+  return hasTrace && !*hasTrace ? isRootOnNetwork() : hasTrace;
+}
+
+Result<bool> LinuxKernelValues::isRootOnNetwork() const {
   const auto mounts = MountTable::read(_root);
-  const auto* mount = mounts ? mounts->holding("/") : nullptr;
+  if (!mounts) return mounts.failure();
+  const auto* mount = mounts->holding("/");
   if (!mount) return false;
   if (mount->type.starts_with("nfs")) return true;
   const BlockDevices devices(_root);
   const auto device = devices.withNumber(mount->device);
-  const auto connection = device ? devices.transportOf(devices.wholeDisk(device->name)) : "";
-  return connection == transport::iscsi || connection == transport::network;
+  if (!device) return device.failure();
+  if (!*device) return false;
+  const auto disk = devices.wholeDisk((*device)->name);
+  if (!disk) return disk.failure();
+  const auto connection = devices.transportOf(*disk);
+  if (!connection) return connection.failure();
+  return *connection == transport::iscsi || *connection == transport::network;
 }
 
-std::string LinuxKeyboardInputService::layout() const {
-  for (const auto* file : {keyboardFile, consoleFile})
-    if (const auto layout = assignedValue(_root, file, "XKBLAYOUT").valueOr(std::nullopt)) return *layout;
-  return assignedValue(_root, consoleFile, "KEYMAP").valueOr(std::nullopt).value_or("");
+Result<std::string> LinuxKeyboardInputService::layout() const {
+  for (const auto* file : {keyboardFile, consoleFile}) {
+    const auto layout = assignedValue(_root, file, "XKBLAYOUT");
+    if (!layout) return layout.failure();
+    if (*layout) return **layout;
+  }
+  const auto keymap = assignedValue(_root, consoleFile, "KEYMAP");
+  if (!keymap) return keymap.failure();
+  return keymap->value_or("");
 }
 
 std::optional<std::int64_t> LinuxKeyboardInputService::currentLayoutNumber() {
   const auto current = layout();
+  if (!current) {
+    _looks.tellDoubt(current.failure());
+    return std::nullopt;
+  }
   const auto* known =
-      std::ranges::find_if(countryCodes, [&](const auto& entry) { return entry.first == firstName(current); });
+      std::ranges::find_if(countryCodes, [&](const auto& entry) { return entry.first == firstName(*current); });
   return known == countryCodes.end() ? std::nullopt : std::optional(known->second);
 }
 

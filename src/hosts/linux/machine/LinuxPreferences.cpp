@@ -5,6 +5,7 @@
 #include <chrono>
 
 #include "effects/SettingNames.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/linux/system/ShellAssignments.h"
 #include "hosts/shared/FileLock.h"
@@ -60,32 +61,39 @@ Result<void> LinuxPreferencesStore::store(const std::string& key, bool value) {
   const auto patience = std::chrono::duration_cast<std::chrono::milliseconds>(_machine.runLoop.timeFor(longestLock));
   const auto held = lockFile(_machine.root, lock, patience);
   if (!held) return held.failure();
-  auto preferences = _file.read().valueOr(std::nullopt).value_or(PropertyList::Dictionary());
-  preferences.set(key, value);
-  return _file.write(preferences);
+  auto preferences = _file.readToChange();
+  if (!preferences) return preferences.failure();
+  auto changed = std::move(preferences).value();
+  changed.set(key, value);
+  return _file.write(changed);
 }
 
-/// Read anew each time: a change counts at once. Most machines have no such file.
+/// Read anew each time: a change counts at once.
 std::optional<PropertyList> LinuxUserDefaults::value(const std::string& key) const {
-  if (!_root.stamp(file)) return std::nullopt;
-  const auto defaults = PropertyListFile(_root, file).read().valueOr(std::nullopt);
+  const auto defaults = PropertyListFile(_root, file).readToChange();
+  if (!defaults) _looks.tellDoubt(defaults.failure());
   const auto* value = defaults ? defaults->find(key) : nullptr;
   return value ? std::optional(*value) : std::nullopt;
 }
 
 std::vector<std::string> LinuxUserDefaults::strings(const std::string& key) {
   const auto found = PropertyListDefaults::strings(key);
-  return found.empty() && key == languages ? machineLanguages() : found;
+  if (!found.empty() || key != languages) return found;
+  const auto language = machineLanguage();
+  if (!language) _looks.tellDoubt(language.failure());
+  return language && !language->empty() ? std::vector{*language} : std::vector<std::string>();
 }
 
-/// "pt_BR" of "pt_BR.UTF-8@euro"; C and POSIX are no languages.
-std::vector<std::string> LinuxUserDefaults::machineLanguages() const {
+/// "pt_BR" of "pt_BR.UTF-8@euro"; C and POSIX are no languages. Empty without one.
+Result<std::string> LinuxUserDefaults::machineLanguage() const {
   for (const auto* place : localeFiles) {
-    const auto locale = assignedValue(_root, place, "LANG").valueOr(std::nullopt).value_or("");
+    const auto assigned = assignedValue(_root, place, "LANG");
+    if (!assigned) return assigned.failure();
+    const auto locale = assigned->value_or("");
     const auto language = locale.substr(0, locale.find_first_of(".@"));
-    if (!language.empty() && language != "C" && language != "POSIX") return {language};
+    if (!language.empty() && language != "C" && language != "POSIX") return language;
   }
-  return {};
+  return "";
 }
 
 }  // namespace tavisk

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "base/PropertyList.h"
+#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/PropertyListFile.h"
 #include "hosts/shared/PropertyListPreferences.h"
@@ -36,12 +37,12 @@ class LinuxPreferencesStore final : public PreferencesStore {
   std::vector<std::pair<std::string, bool>> _pending;
 };
 
-/// A property list that the administrator may write. The languages, when it has none, are those of the machine
-/// (locale.conf(5), or /etc/default/locale).
+/// A property list that the administrator may write; one that cannot be understood reads as none. The languages, when
+/// it has none, are those of the machine (locale.conf(5), or /etc/default/locale).
 class LinuxUserDefaults final : public PropertyListDefaults {
  public:
-  /// The root is not owned.
-  explicit LinuxUserDefaults(const SystemRoot& root) : _root(root) {}
+  /// Neither is owned.
+  LinuxUserDefaults(const SystemRoot& root, FailedLooks& looks) : _root(root), _looks(looks) {}
 
   static constexpr const char* file = "/etc/tavisk/preferences/tavisk.plist";
 
@@ -51,9 +52,10 @@ class LinuxUserDefaults final : public PropertyListDefaults {
   std::optional<PropertyList> value(const std::string& key) const override;
 
  private:
-  std::vector<std::string> machineLanguages() const;
+  Result<std::string> machineLanguage() const;
 
   const SystemRoot& _root;
+  FailedLooks& _looks;
 };
 
 }  // namespace tavisk

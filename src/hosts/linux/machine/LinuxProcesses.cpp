@@ -61,7 +61,9 @@ void LinuxProcessTermination::enable() {
 }
 
 Result<ProgramOutput> LinuxProgramRunner::run(const std::string& program, const std::vector<std::string>& arguments) {
-  if (!_machine.root.exists(program)) return Failure{"run", program, "no such program"};
+  const auto isThere = _machine.root.isThere(program);
+  if (!isThere) return retold(isThere.failure(), "run", program);
+  if (!*isThere) return Failure{"run", program, "no such program"};
   std::vector<std::string> words{program};
   words.insert(words.end(), arguments.begin(), arguments.end());
   return outputOfProgram(_machine.root, words, _machine.runLoop);

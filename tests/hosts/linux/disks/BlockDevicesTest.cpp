@@ -18,8 +18,8 @@ TEST(BlockDevices, TellsDisksAndPartitions) {
   tree.write("/sys" + std::string(DiskTree::sata) + "/block/sda/queue/logical_block_size", "4096\n");
   const SystemRoot root(tree.at("/"));
   const BlockDevices devices(root);
-  EXPECT_THAT(devices.list(), ElementsAre(DiskName{"sda"}, DiskName{"sda2"}));
-  const auto partition = devices.find({"sda2"});
+  EXPECT_THAT(*devices.list(), ElementsAre(DiskName{"sda"}, DiskName{"sda2"}));
+  const auto partition = *devices.find({"sda2"});
   ASSERT_TRUE(partition);
   EXPECT_EQ(partition->number, (DeviceNumber{8, 2}));
   EXPECT_EQ(partition->path, std::string(DiskTree::sata) + "/block/sda/sda2");
@@ -28,11 +28,11 @@ TEST(BlockDevices, TellsDisksAndPartitions) {
   EXPECT_EQ(partition->partition, 2);
   EXPECT_EQ(partition->start, 2048U);
   EXPECT_EQ(partition->size, 1000U);
-  EXPECT_EQ(devices.withNumber({8, 2})->name.text, "sda2");
-  EXPECT_EQ(devices.logicalBlockSize({"sda"}), 4096U);
+  EXPECT_EQ((*devices.withNumber({8, 2}))->name.text, "sda2");
+  EXPECT_EQ(*devices.logicalBlockSize({"sda"}), 4096U);
   for (const char* name : {"", ".", "..", "sdb", "sda/sda2", "../block/sda"})
-    EXPECT_FALSE(devices.find({name})) << name;
-  EXPECT_FALSE(devices.withNumber({8, 9}));
+    EXPECT_FALSE(*devices.find({name})) << name;
+  EXPECT_FALSE(*devices.withNumber({8, 9}));
 }
 
 TEST(BlockDevices, FindsTheDiskBeneathAMapping) {
@@ -50,9 +50,9 @@ TEST(BlockDevices, FindsTheDiskBeneathAMapping) {
   const BlockDevices devices(root);
   for (const auto& [name, disk] : {std::pair("sda", "sda"), std::pair("sdb1", "sdb"), std::pair("md0", "sdb"),
                                    std::pair("md01", "sdb"), std::pair("dm-0", "sdb"), std::pair("none", "none")})
-    EXPECT_EQ(devices.wholeDisk({name}).text, disk) << name;
-  EXPECT_EQ(devices.withNode("/dev/mapper/system-root")->name.text, "dm-0");
-  EXPECT_FALSE(devices.withNode("/dev/mapper/other"));
+    EXPECT_EQ(devices.wholeDisk({name})->text, disk) << name;
+  EXPECT_EQ((*devices.withNode("/dev/mapper/system-root"))->name.text, "dm-0");
+  EXPECT_FALSE(*devices.withNode("/dev/mapper/other"));
 }
 
 struct Connection {
@@ -91,8 +91,8 @@ TEST(BlockDevices, TellsHowADiskIsConnected) {
       tree.write(std::string("/sys") + connection.removableAt + "/removable", connection.removable + std::string("\n"));
     const SystemRoot root(tree.at("/"));
     const BlockDevices devices(root);
-    EXPECT_EQ(devices.transportOf({"sdx"}), connection.transport) << connection.carrier;
-    EXPECT_EQ(devices.isInternal({"sdx"}), connection.internal) << connection.carrier << connection.removable;
+    EXPECT_EQ(*devices.transportOf({"sdx"}), connection.transport) << connection.carrier;
+    EXPECT_EQ(*devices.isInternal({"sdx"}), connection.internal) << connection.carrier << connection.removable;
   }
 }
 

@@ -7,6 +7,7 @@
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/disks/DiskTree.h"
 #include "hosts/linux/disks/LinuxDisks.h"
+#include "hosts/shared/DiskCallbacks.h"
 #include "platform/DiskEventsContract.h"
 
 namespace tavisk {
@@ -205,6 +206,54 @@ TEST(LinuxDisks, NoticesAtAMountWhatCameWithoutAnEvent) {
   EXPECT_EQ(disks.find({"sda1"})->volumePath, "/first");
   ASSERT_TRUE(disks.find({"sdc"}));
   EXPECT_EQ(disks.find({"sdc"})->volumePath, "/second");
+}
+
+TEST(LinuxDisks, StayAsTheyWereWhenTheyCannotBeLookedAt) {
+  ServerDisks tree;
+  tree.know("8:2", "E:ID_FS_TYPE=ext4\nE:ID_FS_USAGE=filesystem\n");
+  const SystemRoot root(tree.at("/"));
+  ServiceAccess services(root, tree.runLoop);
+  LinuxDisks disks({root, tree.effects, tree.runLoop, services});
+  const auto before = disks.renew({{}, true});
+  ASSERT_EQ(disks.find({"sda2"})->volumePath, "/");
+  const auto sizeFile = "/sys" + std::string(DiskTree::sata) + "/block/sda/sda2/size";
+  const std::string unseen[] = {MountTable::file, "/sys/class/block", sizeFile, "/run/udev/data/b8:2"};
+  for (const auto& path : unseen) {
+    const auto kept = path + ".kept";
+    std::filesystem::rename(tree.at(path), tree.at(kept));
+    tree.link(path, std::filesystem::path(path).filename());
+    tree.log.effects.clear();
+    LinuxDisks others({root, tree.effects, tree.runLoop, services});
+    others.renew({{}, true});
+    others.renew({{}, true});
+    EXPECT_THAT(tree.log.effects, testing::ElementsAre(FailedFor("Too many levels")));
+    EXPECT_THAT(differences(*before, *disks.renew({{}, true})), IsEmpty()) << path;
+    std::filesystem::remove(tree.at(path));
+    std::filesystem::rename(tree.at(kept), tree.at(path));
+  }
+}
+
+TEST(LinuxDisks, TellOfAVolumeThatIsUnmountedAndLosesItsNodeAtOnce) {
+  ServerDisks tree;
+  const SystemRoot root(tree.at("/"));
+  ServiceAccess services(root, tree.runLoop);
+  LinuxDisks disks({root, tree.effects, tree.runLoop, services});
+  tree.know("8:1", "E:ID_FS_TYPE=ext4\nE:ID_FS_USAGE=filesystem\n");
+  const auto mounts = tree.file(MountTable::file);
+  tree.mount("8:1", "/dev/sda1", "/data", "ext4");
+  const auto before = disks.renew({{}, true});
+  tree.setMounts(mounts);
+  std::filesystem::remove(tree.at("/run/udev/data/b8:1"));
+  const auto after = disks.renew({{"sda1"}, false});
+  DiskCallbacks callbacks;
+  std::vector<DiskEvent::Kind> told;
+  const auto note = [](const DiskEvent& event, void* context) {
+    static_cast<std::vector<DiskEvent::Kind>*>(context)->push_back(event.kind);
+  };
+  for (const auto kind : {DiskEvent::Kind::appeared, DiskEvent::Kind::descriptionChanged, DiskEvent::Kind::disappeared})
+    callbacks.add({note, &told, kind, {true, false}, {DiskKey::volumePath}});
+  callbacks.tellDifferences(*before, *after);
+  EXPECT_THAT(told, testing::ElementsAre(DiskEvent::Kind::disappeared));
 }
 
 TEST(LinuxDisks, AnswerForAPartitionAsForItsDisk) {

@@ -51,7 +51,7 @@ TEST_F(EfiVariablesTest, KeepAttributesAndAreNeverOthers) {
 }
 
 TEST_F(EfiVariablesTest, ThatAreMalformedAreTold) {
-  EXPECT_TRUE(variables.whyNone());
+  EXPECT_TRUE(*variables.support());
   tree.write(tree.pathOf("Boot0001"), "");
   EXPECT_EQ(variables.read({"Boot0001"}).valueOr("failed"), std::nullopt) << "made and not written";
   EXPECT_EQ(write({"Boot0001"}, "x"), "written");

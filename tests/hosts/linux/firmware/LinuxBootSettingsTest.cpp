@@ -1,13 +1,8 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include <fcntl.h>
 #include <gmock/gmock.h>
-#include <sys/ptrace.h>
-#include <sys/syscall.h>
-#include <sys/wait.h>
 
-#include <array>
-
+#include "hosts/linux/TracedRun.h"
 #include "hosts/linux/firmware/BootTree.h"
 #include "hosts/linux/firmware/LinuxBootSettings.h"
 #include "platform/DiskManagementContract.h"
@@ -255,48 +250,14 @@ TEST_F(LinuxBootSettingsTest, HasNoChoiceUnderOtherFirmware) {
   EXPECT_EQ(settings().preBootEnvironment(), preboot::openFirmware);
 }
 
-/// Whether the call that the process is about to make may change a file.
-bool mayChangeFiles(pid_t process) {
-  __ptrace_syscall_info call{};
-  ::ptrace(PTRACE_GET_SYSCALL_INFO, process, sizeof call, &call);
-  if (call.op != PTRACE_SYSCALL_INFO_ENTRY) return false;
-  if (call.entry.nr == SYS_openat2) return (::ptrace(PTRACE_PEEKDATA, process, call.entry.args[2], 0) & O_ACCMODE) != 0;
-  constexpr std::array<std::uint64_t, 8> changing{SYS_write,     SYS_unlinkat, SYS_renameat, SYS_renameat2,
-                                                  SYS_ftruncate, SYS_mkdirat,  SYS_fsync,    SYS_ioctl};
-  return std::ranges::find(changing, call.entry.nr) != changing.end();
-}
-
-/// Runs the work in a process of its own and kills it before its call of that number that may change a file. False when
-/// it ended before.
-bool killedAt(int number, const std::function<void()>& work) {
-  const auto child = ::fork();
-  if (child == 0) {
-    ::ptrace(PTRACE_TRACEME, 0, nullptr, nullptr);
-    ::raise(SIGSTOP);
-    work();
-    ::_exit(0);
-  }
-  int status = 0;
-  ::waitpid(child, &status, 0);
-  ::ptrace(PTRACE_SETOPTIONS, child, nullptr, PTRACE_O_TRACESYSGOOD | PTRACE_O_EXITKILL);
-  while (WIFSTOPPED(status) && (!mayChangeFiles(child) || --number >= 0)) {
-    ::ptrace(PTRACE_SYSCALL, child, nullptr, nullptr);
-    ::waitpid(child, &status, 0);
-  }
-  if (!WIFSTOPPED(status)) return false;
-  ::kill(child, SIGKILL);
-  ::waitpid(child, &status, 0);
-  return true;
-}
-
 TEST_F(LinuxBootSettingsTest, HasTheOldOrderOrTheNewOneWheneverItIsKilled) {
   const auto before = tree.allVariables();
   const auto order = std::string("BootOrder-") + efiGlobalVendor;
   const std::string newOrder("\7\0\0\0\1\0\0\0", 8);
-  const auto doSet = [&] { set("sdb1", "/Volumes/Backup"); };
+  const auto doSet = [&] { return set("sdb1", "/Volumes/Backup"); };
   int call = 0;
   for (bool killed = true; killed; ++call) {
-    killed = killedAt(call, doSet);
+    killed = runWithFault(call, 0, mayChangeFiles, doSet).wentWrong;
     auto after = tree.allVariables();
     EXPECT_TRUE(after[order] == before.at(order) || after[order] == newOrder) << "call " << call;
     EXPECT_LE(after.size(), before.size() + 1) << "call " << call;
@@ -310,6 +271,54 @@ TEST_F(LinuxBootSettingsTest, HasTheOldOrderOrTheNewOneWheneverItIsKilled) {
     tree.setOrder({0});
   }
   EXPECT_GT(call, 8) << "the work was not traced";
+}
+
+TEST_F(LinuxBootSettingsTest, LosesNothingAndTellsNothingUntrueWhicheverCallFails) {
+  tree.setOrder({0, 7});
+  const auto before = tree.allVariables();
+  const auto order = std::string("BootOrder-") + efiGlobalVendor;
+  const std::string newOrder("\7\0\0\0\1\0\0\0\7\0", 10);
+  int call = 0;
+  int successes = 0;
+  for (TracedRun run{true}; run.wentWrong; ++call) {
+    run = runWithFault(call, EIO, isOfFiles, [&] { return set("sdb1", "/Volumes/Backup"); });
+    auto after = tree.allVariables();
+    EXPECT_TRUE(after[order] == newOrder || (run.status != 0 && after[order] == before.at(order))) << "call " << call;
+    EXPECT_EQ(after["Boot0000-" + std::string(efiGlobalVendor)], before.at(std::string("Boot0000-") + efiGlobalVendor));
+    EXPECT_LE(after.size(), before.size() + 1) << "call " << call;
+    if (run.status == 0 || tree.has(LinuxBootSettings::previousOrder)) {
+      EXPECT_EQ(tree.file(LinuxBootSettings::previousOrder), "0000,0007\n") << "call " << call;
+    }
+    successes += run.status == 0 ? 1 : 0;
+    std::filesystem::remove(tree.at(BootTree::pathOf("Boot0001")));
+    std::filesystem::remove_all(tree.at("/var"));
+    tree.setOrder({0, 7});
+  }
+  EXPECT_GT(call, 100) << "the work was not traced";
+  EXPECT_GT(successes, 0);
+}
+
+TEST_F(LinuxBootSettingsTest, SetsNothingByWhatCouldNotBeLookedAt) {
+  const auto setLanguage = [&] { return tree.host().diskManagement().setFirmwareVariable("prev-lang:kbd", "en:0"); };
+  for (const char* file : {"/etc/default/keyboard", "/etc/locale.conf", LinuxUserDefaults::file}) {
+    tree.link(file, "loop");
+    tree.link(std::filesystem::path(file).parent_path() / "loop", "loop");
+    tree.host().keyboardInput().currentLayoutNumber();
+    tree.host().userDefaults().strings("VelmarLanguages");
+    EXPECT_NE(setLanguage(), 0) << file;
+    EXPECT_THAT(tree.lastEffect(), FailedFor(file));
+    std::filesystem::remove(tree.at(file));
+    EXPECT_EQ(setLanguage(), 0) << file;
+  }
+  std::filesystem::remove_all(tree.at("/sys/firmware/efi"));
+  tree.link("/sys/firmware/efi", "efi");
+  EXPECT_EQ(settings().preBootEnvironment(), preboot::noneKnown);
+  EXPECT_THAT(tree.lastEffect(), FailedFor("/sys/firmware/efi"));
+  EXPECT_NE(settings().networkBootPreference().status, 0);
+  for (int times = 0; times < 2; ++times) {
+    EXPECT_NE(set("sdb1", "/Volumes/Backup"), 0);
+    EXPECT_THAT(tree.lastEffect(), FailedFor("/sys/firmware/efi")) << "not \"not supported\"";
+  }
 }
 
 }  // namespace

@@ -112,12 +112,21 @@ TEST(EnclosureLock, LeavesTheKeyboardsOfAMachineThatTellsOfNoLock) {
   }
 }
 
-TEST(EnclosureLock, SaysWhichKeyboardCannotBeDisabled) {
-  PanelTree tree;
-  tree.panel.state = lock;
-  std::filesystem::remove(tree.at("/sys/class/input/input2/inhibited"));
-  tree.setDisablesKeyboard(true);
-  EXPECT_THAT(tree.lastEffect(), FailedFor("input2/inhibited"));
+TEST(EnclosureLock, SaysWhatCannotBeLookedAtOrDisabled) {
+  const std::tuple<const char*, int, const char*> cases[] = {{"inhibited", 0, "input2/inhibited"},
+                                                             {"capabilities/key", 0, "input2/capabilities/key"},
+                                                             {"id/vendor", 0, "input2/id/vendor"},
+                                                             {"name", ETIMEDOUT, "Get Chassis Capabilities"}};
+  for (const auto& [file, error, why] : cases) {
+    PanelTree tree;
+    tree.panel.state = lock;
+    tree.panel.error = error;
+    const auto path = std::string("/sys/class/input/input2/") + file;
+    tree.link(path, std::filesystem::path(path).filename());
+    tree.setDisablesKeyboard(true);
+    EXPECT_THAT(tree.lastEffect(), FailedFor(why));
+    EXPECT_EQ(tree.inhibited("input3"), "0");
+  }
 }
 
 }  // namespace

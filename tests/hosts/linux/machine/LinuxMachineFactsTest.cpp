@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
+#include "effects/EffectMatchers.h"
 #include "hosts/linux/disks/DiskTree.h"
 #include "platform/BootLoaderFileContract.h"
 #include "platform/IORegistryContract.h"
@@ -102,6 +103,18 @@ TEST(LinuxUserDefaults, AreTheAdministratorsAndLanguagesElseTheMachines) {
   EXPECT_THAT(defaults.strings("VelmarLanguages"), ElementsAre("French"));
   machine.write(LinuxUserDefaults::file, "damaged");
   EXPECT_FALSE(defaults.boolean("StartupDiskDebug"));
+}
+
+TEST(LinuxMachineFacts, TellWhatCouldNotBeLookedAtOnceForEachReason) {
+  LinuxTree machine;
+  for (const char* file :
+       {"/sys/class/dmi/id/product_name", "/proc/cmdline", "/sys/class/net/eth0", "/sys/class/block"})
+    machine.link(file, std::filesystem::path(file).filename());
+  EXPECT_EQ(machine.host().kernel().model(), "");
+  EXPECT_EQ(machine.host().kernel().networkStart(), 0);
+  EXPECT_FALSE(machine.host().registry().serviceNamed("eth0"));
+  EXPECT_FALSE(machine.host().programs().run("/proc/cmdline", {}));
+  EXPECT_THAT(machine.log.effects, ElementsAre(FailedFor("product_name")));
 }
 
 TEST(LinuxPrograms, AnswerWithAnyStatus) {

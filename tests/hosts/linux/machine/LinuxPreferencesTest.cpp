@@ -1,14 +1,11 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
-#include <sys/wait.h>
-#include <unistd.h>
-
-#include <csignal>
 
 #include "effects/EffectMatchers.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/LinuxTree.h"
+#include "hosts/linux/TracedRun.h"
 #include "hosts/shared/FileLock.h"
 #include "platform/PreferencesContract.h"
 
@@ -66,6 +63,36 @@ TEST(LinuxPreferences, ReadAsNoneOutOfADamagedFileAndAreKeptBesideIt) {
   tree.host().processes().writeMachinePreferences();
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_EQ(tree.file(std::string(preferencesFile) + ".damaged"), "<dict>");
+}
+
+TEST(PropertyListFiles, KeepTheirOtherKeysWhicheverCallFails) {
+  const auto chooseArchitecture = [](LinuxHost& host) {
+    auto contents = host.bootLoaderFile().read().value_or(PropertyList::Dictionary());
+    contents.set(BootLoaderFile::architectureKey, "i386");
+    return host.bootLoaderFile().write(contents);
+  };
+  const auto setPreference = [](LinuxHost& host) {
+    host.processes().setMachineBoolean("Kernel Architecture", true);
+    host.processes().writeMachinePreferences();
+    return true;
+  };
+  const std::pair<const char*, std::function<bool(LinuxHost&)>> changes[] = {{BootLoaderFile::path, chooseArchitecture},
+                                                                             {preferencesFile, setPreference}};
+  for (const auto& [file, change] : changes) {
+    LinuxTree tree;
+    int call = 0;
+    for (TracedRun run{true}; run.wentWrong; ++call) {
+      tree.write(file, "<dict><key>Timeout</key><integer>5</integer></dict>");
+      run = runWithFault(call, EIO, isOfFiles, [&tree = tree, &change = change] {
+        return change(tree.host()) && tree.lastEffect().outcome == Outcome::applied ? 0 : 1;
+      });
+      const auto after = tree.file(file);
+      EXPECT_THAT(after, HasSubstr("Timeout")) << file << " call " << call;
+      EXPECT_TRUE(run.status != 0 || after.find("Kernel Architecture") != std::string::npos) << file << call;
+      EXPECT_FALSE(tree.has(std::string(file) + ".damaged")) << file << call;
+    }
+    EXPECT_GT(call, 20) << "the work was not traced";
+  }
 }
 
 /// What a signal to a process of this machine comes to. A whole host would tell the journal of the machine too.

@@ -1,0 +1,85 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <fcntl.h>
+#include <sys/ptrace.h>
+#include <sys/syscall.h>
+#include <sys/user.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <csignal>
+#include <cstdint>
+#include <functional>
+
+namespace tavisk {
+
+/// Which system call a traced process is about to make; op is another than ENTRY when it makes none.
+inline __ptrace_syscall_info callOf(pid_t process) {
+  __ptrace_syscall_info call{};
+  ::ptrace(PTRACE_GET_SYSCALL_INFO, process, sizeof call, &call);
+  return call;
+}
+
+inline bool isOneOf(const __ptrace_syscall_info& call, std::initializer_list<std::uint64_t> numbers) {
+  return call.op == PTRACE_SYSCALL_INFO_ENTRY && std::ranges::find(numbers, call.entry.nr) != numbers.end();
+}
+
+/// Whether the call that the process is about to make may change a file.
+inline bool mayChangeFiles(pid_t process) {
+  const auto call = callOf(process);
+  if (isOneOf(call, {SYS_openat2})) return (::ptrace(PTRACE_PEEKDATA, process, call.entry.args[2], 0) & O_ACCMODE) != 0;
+  return isOneOf(
+      call, {SYS_write, SYS_unlinkat, SYS_renameat, SYS_renameat2, SYS_ftruncate, SYS_mkdirat, SYS_fsync, SYS_ioctl});
+}
+
+/// Whether the call looks at a file or a folder, or may change one.
+inline bool isOfFiles(pid_t process) {
+  return mayChangeFiles(process) ||
+         isOneOf(callOf(process), {SYS_openat2, SYS_openat, SYS_open, SYS_read, SYS_pread64, SYS_getdents64, SYS_fstat,
+                                   SYS_readlinkat, SYS_newfstatat, SYS_lstat});
+}
+
+/// A run in a process of its own in which one call went wrong.
+struct TracedRun {
+  bool wentWrong = false;  ///< false: there were not so many calls
+  int status = -1;         ///< what the work returned; -1: it was killed
+};
+
+/// The work's call of that number among the chosen ones fails with the error, or with error 0 is where it is killed.
+inline TracedRun runWithFault(int number, int error, bool (*isChosen)(pid_t), const std::function<int()>& work) {
+  const auto child = ::fork();
+  if (child == 0) {
+    ::ptrace(PTRACE_TRACEME, 0, nullptr, nullptr);
+    ::raise(SIGSTOP);
+    ::_exit(work());
+  }
+  int status = 0;
+  const auto resume = [&](auto request) {
+    ::ptrace(request, child, nullptr, nullptr);
+    ::waitpid(child, &status, 0);
+  };
+  ::waitpid(child, &status, 0);
+  ::ptrace(PTRACE_SETOPTIONS, child, nullptr, PTRACE_O_TRACESYSGOOD | PTRACE_O_EXITKILL);
+  while (WIFSTOPPED(status) && (!isChosen(child) || --number >= 0)) resume(PTRACE_SYSCALL);
+  const bool wentWrong = WIFSTOPPED(status);
+  if (wentWrong && error == 0) {
+    ::kill(child, SIGKILL);
+    ::waitpid(child, &status, 0);
+  } else if (wentWrong) {
+    user_regs_struct registers{};
+    ::ptrace(PTRACE_GETREGS, child, nullptr, &registers);
+    registers.orig_rax = static_cast<unsigned long long>(-1);  // no call
+    ::ptrace(PTRACE_SETREGS, child, nullptr, &registers);
+    resume(PTRACE_SYSCALL);
+    registers.rax = static_cast<unsigned long long>(-error);
+    ::ptrace(PTRACE_SETREGS, child, nullptr, &registers);
+    resume(PTRACE_CONT);
+  }
+  return {wentWrong, WIFEXITED(status) ? WEXITSTATUS(status) : -1};
+}
+
+}  // namespace tavisk
