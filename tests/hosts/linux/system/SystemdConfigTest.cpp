@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "hosts/linux/LinuxTree.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/ShellAssignments.h"
 #include "hosts/linux/system/SysDevice.h"
@@ -20,9 +21,10 @@ TEST(SystemdConfig, KeepsWhatItCannotRead) {
   tree.write(own, "[Login]\nHandlePowerKey=suspend\n");
   ASSERT_TRUE(config.setOwn("Login", {{"IdleAction", "ignore"}}));
   EXPECT_NE(tree.file(own).find("HandlePowerKey=suspend\nIdleAction=ignore\n"), std::string::npos);
-  tree.makeUnreadable(own);
+  const std::string tooLarge(configurationLimit + 1, '#');
+  tree.write(own, tooLarge);
   EXPECT_FALSE(config.setOwn("Login", {{"IdleAction", "suspend"}}));
-  EXPECT_TRUE(std::filesystem::is_symlink(tree.at(own)));
+  EXPECT_EQ(tree.file(own), tooLarge);
 }
 
 TEST(SystemdConfig, TellsThatItCouldNotLook) {
