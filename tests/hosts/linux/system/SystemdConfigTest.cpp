@@ -5,7 +5,6 @@
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
-#include "hosts/linux/system/ShellAssignments.h"
 #include "hosts/linux/system/SysDevice.h"
 #include "hosts/linux/system/SystemdConfig.h"
 
@@ -60,14 +59,6 @@ TEST(SysDevice, IsAbsentOnlyWhenNothingIsThere) {
                                     {EMFILE, false},
                                     {EACCES, false}})
     EXPECT_EQ(isGone(systemFailure("read", "x", error)), isIt) << error;
-}
-
-TEST(ShellAssignments, TellThatTheyCouldNotBeRead) {
-  LinuxTree tree;
-  const SystemRoot root(tree.at("/"));
-  EXPECT_EQ(assignedValue(root, "/etc/default/locale", "LANG").valueOr("failed"), std::nullopt);
-  tree.makeUnreadable("/etc/default/locale");
-  EXPECT_FALSE(assignedValue(root, "/etc/default/locale", "LANG"));
 }
 
 }  // namespace
