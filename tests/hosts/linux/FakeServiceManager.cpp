@@ -68,6 +68,8 @@ int FakeServiceManager::answerFault(sd_bus_message* message, Fault fault) {
   switch (fault) {
     case Fault::error:
       return sd_bus_reply_method_errorf(message, SD_BUS_ERROR_ACCESS_DENIED, "not today");
+    case Fault::question:
+      return sd_bus_reply_method_errorf(message, SD_BUS_ERROR_INTERACTIVE_AUTHORIZATION_REQUIRED, "a password");
     case Fault::wrongType:
       return sd_bus_reply_method_return(message, "t", std::uint64_t{7});
     case Fault::hangUp:

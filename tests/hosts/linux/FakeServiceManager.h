@@ -35,8 +35,9 @@ class FakeServiceManager {
   FakeUnit get(const std::string& unit);
   /// The methods that change something, in the order of their calls: "StartUnit chrony.service".
   std::vector<std::string> calls();
-  /// The next call of this method is answered with an error, with a reply of another type, by hanging up, or never.
-  enum class Fault { error, wrongType, hangUp, silence };
+  /// The next call of this method is answered with an error, with a reply of another type, by hanging up, never, or
+  /// granted only after a question.
+  enum class Fault { error, wrongType, hangUp, silence, question };
   void breakNext(const std::string& method, Fault fault);
 
  private:

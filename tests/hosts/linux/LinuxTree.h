@@ -47,6 +47,11 @@ rm -f "$root/etc/rc2.d/"*"$1"
 [ "$2" = enable ] && touch "$root/etc/rc2.d/S01$1" || touch "$root/etc/rc2.d/K01$1"
 )sh");
   }
+  /// Nothing at the path, or beneath it, can be looked at: a link that leads to itself (ELOOP).
+  void makeUnreadable(const std::string& path) {
+    std::filesystem::remove_all(at(path));
+    link(path, at(path).filename());
+  }
   std::filesystem::path at(const std::string& path) const {
     return _folder.path() / std::filesystem::path(path).relative_path();
   }

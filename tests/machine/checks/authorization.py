@@ -5,7 +5,8 @@ import re
 from check import Check
 
 CONTAINER = frozenset({"container"})
-RULE = "/etc/polkit-1/rules.d/10-test.rules"
+RULE = "/etc/polkit-1/rules.d/zz-test.rules"  # after the package's own
+UNITS = "org.freedesktop.systemd1.manage-units"
 ZONE = "readlink -f /etc/localtime"
 PARIS = "TAVISK_LOG=stderr tavisk -settimezone Europe/Paris"
 
@@ -18,6 +19,12 @@ def with_rule(answer, command, action="a.id"):
     text = f'polkit.addRule(function(a, s) {{ if (s.isInGroup("admin") && a.id == {action}) return polkit.Result.{answer}; }});'
     renewed = "systemctl reset-failed polkit 2>/dev/null; systemctl restart polkit"
     return f"echo '{text}' >{RULE}; {renewed}; {command}; status=$?; rm {RULE}; {renewed}; exit $status"
+
+
+def may(unit, verb):
+    """Told by root on behalf of a process of alice's, as the service manager asks polkit."""
+    return (f"pkcheck --process $! --action-id {UNITS} --detail unit {unit} --detail verb {verb} >/dev/null 2>&1; "
+            f'echo "{verb} {unit}: $?"; ')
 
 
 CHECKS = [
@@ -39,4 +46,16 @@ CHECKS = [
           do=with_rule("YES", by("alice", "TAVISK_LOG=stderr tavisk -setnetworktimeserver time.example")),
           prints="setNetworkTimeServer: time.example\n", errors=re.compile(r"(tavisk: [^\n]*sudo tavisk [^\n]*\n)+"),
           then={"journalctl -b -t tavisk -n 1 -o verbose | grep -c TAVISK_UID=$(id -u alice)": "1\n"}),
+    Check("who may use the tool may not use the service manager by that", needs=CONTAINER, status=1,
+          do=with_rule("YES", by("alice", 'sh -c "systemd-run --no-ask-password touch /run/x || systemctl --no-ask-password mask x.service"'),
+                       '"org.tavisk.manage"'),
+          then={"ls -d /run/x /etc/systemd/system/x.service 2>/dev/null": ""}),
+    Check("the package's rule is about its own units and verbs", needs=CONTAINER,
+          do=with_rule("YES", by("alice", "sleep 60") + " & sleep 1; " + may("ssh.service", "stop") + may("ssh.service", "kill")
+                       + may("cron.service", "stop") + "kill $!", f'"{UNITS}"'),
+          prints="stop ssh.service: 2\nkill ssh.service: 0\nstop cron.service: 0\n"),
+    Check("an administrator is told that enabling needs root before anything moves", needs=CONTAINER | {"openssh-server"},
+          do="tavisk -setremotelogin on >/dev/null; " + with_rule("YES", by("alice", "TAVISK_LOG=stderr tavisk -f -setremotelogin off")),
+          errors=re.compile(r"tavisk: Remote Login: disable on ssh[^\n]*: needs root: sudo tavisk [^\n]*\n"),
+          then={"systemctl is-active ssh": "active\n"}),
 ]

@@ -122,6 +122,42 @@ TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
   }
 }
 
+TEST(RemoteLogin, ChangesNothingAfterALookThatFailed) {
+  for (const char* path : {"/run/systemd", "/etc/init.d", "/usr/sbin/sshd", "/etc/rc2.d", "/proc",
+                           "/etc/tavisk/services.conf", "/etc/ssh", "/etc/ssh/sshd_config"}) {
+    const bool isAboutKeys = std::string(path).starts_with("/etc/ssh");
+    const bool isOn = !isAboutKeys;
+    ScriptedTree tree;
+    std::filesystem::remove(tree.at("/etc/ssh/ssh_host_rsa_key"));
+    tree.writeProgram("/usr/sbin/update-rc.d", "#!/bin/sh\ntouch \"${0%/usr/sbin/update-rc.d}/moved\"\n");
+    tree.write(isOn ? "/etc/rc2.d/S01ssh" : "/etc/rc2.d/K01ssh", "");
+    tree.makeUnreadable(path);
+    auto& login = tree.host().remoteShell();
+    login.setEnabled(!isOn);
+    EXPECT_THAT(tree.lastEffect(), FailedFor("symbolic links")) << path;
+    EXPECT_EQ(tree.has("/moved"), path == std::string("/proc")) << "what is stored does not depend on what runs";
+    if (isAboutKeys) continue;
+    EXPECT_FALSE(login.isEnabled());
+    EXPECT_THAT(tree.lastEffect(), FailedFor("symbolic links")) << path;
+  }
+}
+
+TEST(RemoteAccess, TellsAManagerThatDoesNotAnswer) {
+  SshUnits tree;
+  const std::pair<const char*, std::function<void(bool)>> settings[] = {
+      {setting::remoteLogin, [&](bool on) { tree.host().remoteShell().setEnabled(on); }},
+      {setting::remoteEvents, [&](bool on) { tree.host().remoteEvents().setEnabled(on); }}};
+  for (const auto& [name, set] : settings) {
+    for (const auto fault : {FakeServiceManager::Fault::error, FakeServiceManager::Fault::wrongType}) {
+      tree.manager.breakNext("LoadUnit", fault);
+      set(true);
+      EXPECT_EQ(tree.lastEffect().setting, name);
+      EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
+      EXPECT_TRUE(tree.manager.calls().empty());
+    }
+  }
+}
+
 TEST(RemoteEvents, SwitchAllUnitsAndAskTheFirst) {
   SshUnits tree;
   auto& events = tree.host().remoteEvents();

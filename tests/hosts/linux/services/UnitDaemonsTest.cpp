@@ -1,6 +1,8 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
+#include <sys/syscall.h>
+#include <unistd.h>
 
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/LinuxContractMachines.h"
@@ -8,7 +10,7 @@
 namespace tavisk {
 namespace {
 
-using testing::ElementsAre;
+using testing::ElementsAre, testing::HasSubstr, testing::IsEmpty;
 using Fault = FakeServiceManager::Fault;
 
 struct ChronyUnits : ManagedTree {
@@ -62,6 +64,66 @@ TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
     EXPECT_THAT(tree.lastEffect(), FailedFor(why));
     EXPECT_EQ(tree.lastEffect().failure->tried, "StartUnit");
     EXPECT_FALSE(tree.host().networkTime().isRunning()) << "asked again, after a hang-up too";
+  }
+}
+
+struct ManagedDaemons : testing::Test {
+  ManagedTree tree;
+  const SystemRoot root{tree.at("/")};
+  ServiceAccess services{root, tree.runLoop};
+  const Daemon daemon{"a.service", "", ""};
+};
+
+TEST_F(ManagedDaemons, HaveDoneAJobThatEndedSo) {
+  for (const auto method : {&Daemons::start, &Daemons::stop, &Daemons::restart}) {
+    for (const char* result : {"failed", "canceled", "timeout", "dependency"}) {
+      tree.manager.set(daemon.unit, {.active = "active", .jobResult = result});
+      const auto done = (services.daemons().*method)(daemon);
+      ASSERT_FALSE(done) << result;
+      EXPECT_EQ(done.failure().why, std::string("its job ended with: ") + result);
+    }
+  }
+}
+
+TEST_F(ManagedDaemons, StartWithTheMachineByRootOnly) {
+  tree.manager.set(daemon.unit, {.file = "enabled"});
+  auto& daemons = services.daemons();
+  EXPECT_TRUE(daemons.startsAtBoot(daemon)) << "connects";
+  EXPECT_TRUE(daemons.checkMayStartAtBoot(daemon, false));
+  // Of this thread alone; the manager's goes on.
+  const auto become = [](uid_t user) { return ::syscall(SYS_setresuid, -1, user, -1); };
+  if (become(65534) != 0) GTEST_SKIP() << "only root can be somebody else";
+  const auto disabled = daemons.setStartAtBoot({daemon}, false);
+  const auto mayDisable = daemons.checkMayStartAtBoot(daemon, false);
+  const auto mayEnable = daemons.checkMayStartAtBoot(daemon, true);
+  ASSERT_EQ(become(0), 0);
+  ASSERT_FALSE(disabled);
+  EXPECT_EQ(describe(disabled.failure()), "disable on a.service: needs root: sudo tavisk ...");
+  EXPECT_FALSE(mayDisable);
+  EXPECT_TRUE(mayEnable) << "there is nothing to change";
+  EXPECT_THAT(tree.manager.calls(), IsEmpty());
+}
+
+TEST_F(ManagedDaemons, HaveTheUserAskedWhenAQuestionIsNeeded) {
+  int asked = 0;
+  const Bus::Asker ready = [&]() -> Result<void> { return ++asked, Result<void>(); };
+  const Bus::Asker broken = [&]() -> Result<void> { return ++asked, Failure{"ask", "", "no agent"}; };
+  const std::tuple<Bus::Asker, std::optional<Fault>, int, const char*> cases[] = {
+      {ready, std::nullopt, 0, ""},
+      {ready, Fault::question, 1, ""},
+      {ready, Fault::error, 0, "AccessDenied"},
+      {broken, Fault::question, 1, "no agent"},
+      {nullptr, Fault::question, 0, "InteractiveAuthorizationRequired"},
+  };
+  for (const auto& [asker, fault, times, why] : cases) {
+    asked = 0;
+    tree.manager.set(daemon.unit, {});
+    if (fault) tree.manager.breakNext("StartUnit", *fault);
+    services.askUserBy(asker);
+    const auto started = services.daemons().start(daemon);
+    EXPECT_EQ(asked, times) << why;
+    EXPECT_THAT(started ? "" : started.failure().why, HasSubstr(why));
+    EXPECT_EQ(static_cast<bool>(started), *why == '\0');
   }
 }
 

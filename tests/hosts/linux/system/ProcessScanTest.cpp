@@ -36,6 +36,12 @@ TEST(ProcessScan, FindsRunningProgramsOfThisMachine) {
   EXPECT_THAT(processesNamed(root, "systemd-timesyncd").valueOr({}), UnorderedElementsAre(15, 17));
   EXPECT_THAT(processesNamed(root, "systemd-timesyn").valueOr({}), UnorderedElementsAre(15, 16, 17));
   EXPECT_THAT(processesNamed(SystemRoot("/nowhere"), "chronyd").valueOr({0}), IsEmpty());
+  for (const char* path : {"/proc/15/cmdline", "/proc/11/stat", "/proc/10/ns", "/proc"}) {
+    tree.makeUnreadable(path);
+    EXPECT_FALSE(processesNamed(root, "systemd-timesyncd")) << path;
+    std::filesystem::remove(tree.at(path));
+    EXPECT_TRUE(processesNamed(root, "systemd-timesyncd")) << path << " is gone";
+  }
 }
 
 }  // namespace
