@@ -36,11 +36,15 @@ inline bool mayChangeFiles(pid_t process) {
       call, {SYS_write, SYS_unlinkat, SYS_renameat, SYS_renameat2, SYS_ftruncate, SYS_mkdirat, SYS_fsync, SYS_ioctl});
 }
 
-/// Whether the call looks at a file or a folder, or may change one.
+/// Whether the call looks for a file or a folder, or may change one.
+inline bool opensOrChangesFiles(pid_t process) {
+  return mayChangeFiles(process) || isOneOf(callOf(process), {SYS_openat2});
+}
+
+/// The same, or reads one.
 inline bool isOfFiles(pid_t process) {
-  return mayChangeFiles(process) ||
-         isOneOf(callOf(process), {SYS_openat2, SYS_openat, SYS_open, SYS_read, SYS_pread64, SYS_getdents64, SYS_fstat,
-                                   SYS_readlinkat, SYS_newfstatat, SYS_lstat});
+  return opensOrChangesFiles(process) ||
+         isOneOf(callOf(process), {SYS_openat, SYS_read, SYS_getdents64, SYS_readlinkat, SYS_newfstatat});
 }
 
 /// A run in a process of its own in which one call went wrong.

@@ -281,7 +281,7 @@ TEST_F(LinuxBootSettingsTest, LosesNothingAndTellsNothingUntrueWhicheverCallFail
   int call = 0;
   int successes = 0;
   for (TracedRun run{true}; run.wentWrong; ++call) {
-    run = runWithFault(call, EIO, isOfFiles, [&] { return set("sdb1", "/Volumes/Backup"); });
+    run = runWithFault(call, EIO, opensOrChangesFiles, [&] { return set("sdb1", "/Volumes/Backup"); });
     auto after = tree.allVariables();
     EXPECT_TRUE(after[order] == newOrder || (run.status != 0 && after[order] == before.at(order))) << "call " << call;
     EXPECT_EQ(after["Boot0000-" + std::string(efiGlobalVendor)], before.at(std::string("Boot0000-") + efiGlobalVendor));
