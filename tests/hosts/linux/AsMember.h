@@ -17,7 +17,7 @@ struct AsMember {
     for (const auto& each : std::filesystem::recursive_directory_iterator(tree.at("/")))
       if (!each.is_symlink()) std::filesystem::permissions(each, perms::all);
     std::filesystem::permissions(tree.at("/"), perms::all);
-    if (::seteuid(65534) != 0) throw std::runtime_error("these tests need root");
+    if (::geteuid() == 0 && ::seteuid(65534) != 0) throw std::runtime_error("seteuid");
   }
   AsMember(const AsMember&) = delete;
   AsMember& operator=(const AsMember&) = delete;
