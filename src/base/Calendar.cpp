@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "base/Calendar.h"
 
+#include <sys/stat.h>
+
 #include <algorithm>
 #include <cstdlib>
 #include <ctime>
@@ -62,10 +64,17 @@ std::int64_t offsetAt(std::int64_t secondsSince1970) {
   return !localtime_r(&time, &local) ? 0 : local.tm_gmtoff;
 }
 
+/// The system library would wait for a FIFO to be written.
+bool isRegular(const std::string& file) {
+  struct stat status {};
+  return ::stat(file.c_str(), &status) == 0 && S_ISREG(status.st_mode);
+}
+
 }  // namespace
 
 void setDefaultTimeZone(const std::string& zoneFile) {
-  setenv("TZ", (":" + zoneFile).c_str(), 1);  // NOLINT(concurrency-mt-unsafe): as declared
+  const auto zone = isRegular(zoneFile) ? ":" + zoneFile : "UTC0";
+  setenv("TZ", zone.c_str(), 1);  // NOLINT(concurrency-mt-unsafe): as declared
   tzset();
 }
 

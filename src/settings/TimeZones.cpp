@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 
+#include "base/Calendar.h"
 #include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/ServerCommands.h"
@@ -41,6 +42,7 @@ void ServerCommands::setTimeZone(const std::string& timeZone) {
   }
   clock.setTimeZone(zone);
   _timeZone = zone;
+  setDefaultTimeZone(clock.rulesOf(zone));
   _context.output.print("Set TimeZone: %s\n", timeZone.c_str());
 }
 

@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include "ToolRun.h"
+#include "base/Calendar.h"
 
 namespace tavisk {
 namespace {
@@ -66,6 +67,15 @@ TEST_F(ReservedCommands, findTheServerOfRemoteLogin) {
   machine.set("Processes", "sshd", 4711);
   machine.set("Processes", "sshd-session", 4712);
   EXPECT_EQ(commands.remoteLoginPID(), 4711);
+}
+
+struct TimeZones : ReservedCommands {};
+
+TEST_F(TimeZones, areThoseOfTheRunAtOnce) {
+  for (const auto& [zone, hour] : {std::pair("Asia/Tokyo", 9), std::pair("UTC", 0)}) {
+    commands.setTimeZone(zone);
+    EXPECT_EQ(localDateTime(0).hour, hour);
+  }
 }
 
 struct MachineWithRemoteLogin : ScratchMachine {

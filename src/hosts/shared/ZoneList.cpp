@@ -17,8 +17,9 @@ constexpr int deepestZone = 4;  // "America/Argentina/Buenos_Aires" needs 3
 
 using Names = std::set<std::string>;
 
+/// Empty where there is none.
 Result<std::string> readTable(const SystemRoot& root, const char* name) {
-  return root.read(ZoneName{name}.file(), largestTable);
+  return orEmpty(root.read(ZoneName{name}.file(), largestTable));
 }
 
 /// The fields of each line, as white space separates them.
@@ -38,16 +39,24 @@ Names namesOfSource(const std::string& text) {
 }
 
 Names namesOfTable(const std::string& text) {
-  Names names{"UTC"};
+  Names names;
+  if (!text.empty()) names.insert("UTC");
   forEachLine(text, [&](const std::vector<std::string>& fields) {
     if (fields.size() > 2 && !fields[0].starts_with('#')) names.insert(fields[2]);
   });
   return names;
 }
 
-/// The source and the table also name zones that a package of their own brings.
-void removeUninstalled(const SystemRoot& root, Names& names) {
-  std::erase_if(names, [&](const std::string& name) { return !root.exists(ZoneName{name}.file()); });
+/// Those that have a file: the source and the table also name zones that a package of their own brings.
+Result<Names> installedOf(const SystemRoot& root, const Names& names) {
+  Names installed;
+  for (const auto& name : names) {
+    if (!ZoneName{name}.isWellFormed()) continue;
+    const auto there = root.isThere(ZoneName{name}.file());
+    if (!there) return there.failure();
+    if (*there) installed.insert(name);
+  }
+  return installed;
 }
 
 /// Other trees of the same zones, and files that are no zones.
@@ -56,32 +65,55 @@ bool isNoZone(const std::string& name) {
          name == "localtime";
 }
 
-void addCompiled(const SystemRoot& root, const std::string& below, int depth, Names& names) {
-  const auto entries = root.list(ZoneName{below}.file());
-  if (!entries || depth > deepestZone) return;
+/// A failure without a code is that of a file which is no zone: it is not a regular one, or too large.
+Result<bool> isCompiledZone(const SystemRoot& root, const std::string& name) {
+  const auto file = root.read(ZoneName{name}.file(), largestZone);
+  if (!file && file.failure().code && !isAbsent(file.failure())) return file.failure();
+  return file && file->starts_with("TZif");
+}
+
+Result<void> addCompiled(const SystemRoot& root, const std::string& below, int depth, Names& names) {
+  const auto entries = orEmpty(root.list(ZoneName{below}.file()));
+  if (!entries) return entries.failure();
   for (const auto& entry : *entries) {
-    if (isNoZone(entry)) continue;
     const auto name = below + entry;
-    const auto file = root.read(ZoneName{name}.file(), largestZone);
-    if (!file) addCompiled(root, name + "/", depth + 1, names);
-    if (file && file->starts_with("TZif")) names.insert(name);
+    if (isNoZone(entry) || !ZoneName{name}.isWellFormed()) continue;
+    const auto isZone = isCompiledZone(root, name);
+    if (!isZone) return isZone.failure();
+    if (*isZone) names.insert(name);
+    if (*isZone || depth == deepestZone) continue;
+    if (auto added = addCompiled(root, name + "/", depth + 1, names); !added) return added;
   }
+  return {};
+}
+
+Result<Names> compiledZones(const SystemRoot& root) {
+  Names names;
+  const auto added = addCompiled(root, "", 1, names);
+  if (!added) return added.failure();
+  return names;
+}
+
+Result<Names> zonesNamedBy(const SystemRoot& root, const char* table, Names (*namesOf)(const std::string& text)) {
+  const auto text = readTable(root, table);
+  if (!text) return text.failure();
+  return installedOf(root, namesOf(*text));
+}
+
+Result<Names> namesOfZones(const SystemRoot& root) {
+  auto names = zonesNamedBy(root, "tzdata.zi", namesOfSource);
+  if (names && names->empty()) names = zonesNamedBy(root, "zone1970.tab", namesOfTable);
+  return names && names->empty() ? compiledZones(root) : names;
 }
 
 }  // namespace
 
 Result<std::vector<ZoneName>> installedZones(const SystemRoot& root) {
-  Names names;
-  if (const auto source = readTable(root, "tzdata.zi")) names = namesOfSource(*source);
-  removeUninstalled(root, names);
-  if (names.empty()) {
-    if (const auto table = readTable(root, "zone1970.tab")) names = namesOfTable(*table);
-    removeUninstalled(root, names);
-  }
-  if (names.empty()) addCompiled(root, "", 1, names);
-  if (names.empty()) return Failure{"list time zones", std::string(ZoneName::folder), "no time zones are installed"};
+  const auto names = namesOfZones(root);
+  if (!names) return names.failure();
+  if (names->empty()) return Failure{"list time zones", std::string(ZoneName::folder), "no time zones are installed"};
   std::vector<ZoneName> zones;
-  for (const auto& name : names) zones.push_back({name});
+  for (const auto& name : *names) zones.push_back({name});
   return zones;
 }
 

@@ -23,8 +23,8 @@ class LinuxTree {
     std::filesystem::permissions(_folder.write(path, script), std::filesystem::perms::owner_all);
   }
   void link(const std::string& path, const std::string& target) {
-    write(path, "");
-    std::filesystem::remove(at(path));
+    std::filesystem::create_directories(at(path).parent_path());
+    std::filesystem::remove(at(path));  // not through it what an older link names
     std::filesystem::create_symlink(target, at(path));
   }
   /// Has an init script by which the program runs as process 77, which it writes into /run a little later; and a

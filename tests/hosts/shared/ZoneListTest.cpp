@@ -46,6 +46,26 @@ TEST_F(ZoneListTest, isThatOfTheCompiledFilesWithoutBoth) {
   EXPECT_EQ(zones(), "Africa/Algiers\nAfrica/Cairo\nAfrica/Tunis\nAmerica/Argentina/Salta\nUTC");
 }
 
+TEST_F(ZoneListTest, hasNoNamesThatAreNone) {
+  for (const char* name : {"Asia/Nowhere\r", "Asia/No where", "Asia/No\nwhere"}) write(name, "TZif2...");
+  const auto compiled = zones();
+  write("tzdata.zi", "L UTC UTC\nL UTC Asia/Nowhere\r\nZ Africa/Cairo\r\n");
+  EXPECT_EQ(zones(), "UTC");
+  EXPECT_EQ(compiled, "Africa/Algiers\nAfrica/Cairo\nAfrica/Tunis\nAmerica/Argentina/Salta\nUTC");
+}
+
+TEST_F(ZoneListTest, isShortOfNoZoneThatCannotBeLookedAt) {
+  const SystemRoot root(folder.path());
+  const auto zones = folder.path() / "usr/share/zoneinfo";
+  std::filesystem::create_symlink("Loop", zones / "Loop");
+  EXPECT_EQ(installedZones(root).failure().code, std::errc::too_many_symbolic_link_levels);
+  write("tzdata.zi", "L UTC UTC\nL UTC Loop\n");
+  EXPECT_EQ(installedZones(root).failure().code, std::errc::too_many_symbolic_link_levels);
+  std::filesystem::remove(zones / "tzdata.zi");
+  std::filesystem::create_symlink("tzdata.zi", zones / "tzdata.zi");
+  EXPECT_EQ(installedZones(root).failure().on, "/usr/share/zoneinfo/tzdata.zi");
+}
+
 TEST_F(ZoneListTest, failsWithoutAnyZone) {
   std::filesystem::remove_all(folder.path() / "usr");
   EXPECT_EQ(installedZones(SystemRoot(folder.path())).failure().why, "no time zones are installed");

@@ -10,6 +10,7 @@
 #include "effects/SettingNames.h"
 #include "hosts/linux/clock/LocalTime.h"
 #include "hosts/linux/clock/SystemClock.h"
+#include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/ProcessScan.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/shared/ZoneList.h"
@@ -62,8 +63,10 @@ std::optional<Failure> LinuxClockService::whyNoClock() const {
 
 /// Also what the service manager knows nothing of, such as a virtual machine's tools.
 std::string LinuxClockService::whoCorrectsTheClock() {
-  for (const char* program : {"chronyd", "ntpd", "systemd-timesyncd", "phc2sys", "VBoxService"})
-    if (const auto found = processesNamed(_machine.root, program); found && !found->empty()) return program;
+  for (const char* program : {"chronyd", "ntpd", "systemd-timesyncd", "phc2sys", "VBoxService"}) {
+    const auto running = processesNamed(_machine.root, program);
+    if (running && !running->empty()) return program;
+  }
   const auto bus = _machine.services.systemBus();
   if (!bus) return {};
   auto corrected = (*bus)->property(timeDaemon(), "NTP", "b");
@@ -77,7 +80,8 @@ void LinuxClockService::setTime(std::int64_t secondsSince1970) {
   time.unit = timeUnit;
   time.undoneBy = [this](const auto&) { return whoCorrectsTheClock(); };
   time.live = [&] { return asked.onSystemClock(); };
-  if (asked.onHardwareClock(_machine.root)) {
+  const auto hardware = asked.onHardwareClock(_machine.root);
+  if (!hardware || *hardware) {
     time.where = hardwareClock;
     time.stored = [&] { return asked.onHardwareClock(_machine.root); };
   } else {
@@ -92,7 +96,9 @@ void LinuxClockService::setTime(std::int64_t secondsSince1970) {
 
 Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
   if (const auto failure = whyOutOfClockRange(asked.seconds())) return *failure;
-  if (const auto bus = _machine.services.systemBus()) {
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return bus.failure();
+  if (*bus) {
     const auto set = setByDaemon(**bus, asked);
     if (set) return {};
     if (!leavesItToOthers(set.failure())) return withAdvice(set.failure());
@@ -102,8 +108,10 @@ Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
 
 Result<void> LinuxClockService::changeTimeDirectly(std::int64_t secondsSince1970) const {
   if (const auto failure = whyNoClock()) return *failure;
+  const auto hardware = HardwareClock::open(_machine.root);
+  if (!hardware) return hardware.failure();
   if (auto set = setSystemTime(secondsSince1970); !set) return set;
-  return setHardwareClock(_machine.root, secondsSince1970);
+  return *hardware ? (*hardware)->set(secondsSince1970) : Result<void>();
 }
 
 std::vector<ZoneName> LinuxClockService::knownTimeZones() {
@@ -118,45 +126,74 @@ Setting<ZoneName> LinuxClockService::timeZoneSetting() const {
   Setting<ZoneName> zone;
   zone.name = setting::timeZone;
   zone.where = "/etc/localtime";
-  zone.live = [&root = _machine.root] { return machineTimeZone(root).value_or(utc()); };
-  zone.stored = [&root = _machine.root] {
-    const auto second = timeZoneFileName(root);
-    return second ? second : machineTimeZone(root);
+  zone.live = [this]() -> Setting<ZoneName>::Found {
+    const auto linked = machineTimeZone(_machine.root);
+    if (!linked) return linked.failure();
+    return std::optional(Reading(linked->value_or(utc())));
+  };
+  zone.stored = [&root = _machine.root]() -> Setting<ZoneName>::Found {
+    auto second = timeZoneFileName(root);
+    return second && !*second ? machineTimeZone(root) : second;
   };
   return zone;
 }
 
 ZoneName LinuxClockService::timeZone() {
-  return *observe(timeZoneSetting(), _machine.effects);
+  return observe(timeZoneSetting(), _machine.effects).value_or(utc());
+}
+
+/// The zone that the daemon goes by, which it may have read before the link was changed; absent without a daemon.
+Result<std::optional<ZoneName>> LinuxClockService::daemonsTimeZone() {
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return bus.failure();
+  if (!*bus) return std::optional<ZoneName>();
+  auto zone = (*bus)->property(timeDaemon(), "Timezone", "s");
+  if (zone) return std::optional(ZoneName{std::move(zone).value().readText()});
+  if (zone.failure().code == BusErrorCode::serviceUnknown) return std::optional<ZoneName>();
+  return zone.failure();
 }
 
 void LinuxClockService::setTimeZone(const ZoneName& zone) {
   auto setting = timeZoneSetting();
+  setting.live = [this, ofLink = setting.live]() -> Setting<ZoneName>::Found {
+    auto linked = ofLink();
+    if (!linked) return linked;
+    const auto daemons = daemonsTimeZone();
+    if (!daemons) return daemons.failure();
+    const auto name = (*linked)->value;
+    if (!*daemons || **daemons == name) return linked;
+    return std::optional(Reading(name, name.text + ", " + (*daemons)->text + " in " + timeDaemon().service));
+  };
   setting.store = [this](const ZoneName& asked) { return changeTimeZone(asked); };
   carryOut(setting, zoneOfPath(zone.file()).value_or(zone), _machine);
 }
 
+/// What needs root is asked before the daemon moves the link.
 Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone) {
-  if (const auto bus = _machine.services.systemBus()) {
-    const auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone.text, false);
-    if (!set && !leavesItToOthers(set.failure())) return set.failure();
-    // The daemon does nothing for the zone that it found when it started, whatever the link says since.
-    if (set && machineTimeZone(_machine.root) == zone) return updateNameFile(zone);
-  }
-  return changeTimeZoneDirectly(zone);
+  if (auto failure = whyNoZone(_machine.root, zone)) return *failure;
+  if (auto failure = whyZoneNeedsRoot(_machine.root, zone)) return *failure;
+  const auto isSet = setZoneByDaemon(zone);
+  if (!isSet) return isSet.failure();
+  return *isSet ? updateTimeZoneFile(_machine.root, zone) : changeTimeZoneDirectly(zone);
+}
+
+/// False where it is left to the files: the daemon is not there, or does nothing for the zone that it found when it
+/// started, whatever the link says since.
+Result<bool> LinuxClockService::setZoneByDaemon(const ZoneName& zone) {
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return bus.failure();
+  if (!*bus) return false;
+  const auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone.text, false);
+  if (!set && !leavesItToOthers(set.failure())) return set.failure();
+  const auto linked = machineTimeZone(_machine.root);
+  if (!linked) return linked.failure();
+  return set && *linked == zone;
 }
 
 Result<void> LinuxClockService::changeTimeZoneDirectly(const ZoneName& zone) const {
   if (const auto failure = whyNeedsRoot("set the time zone", "/etc/localtime")) return *failure;
   if (auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
   return updateTimeZoneFile(_machine.root, zone);
-}
-
-/// The daemon leaves Debian's second copy of the name alone.
-Result<void> LinuxClockService::updateNameFile(const ZoneName& zone) const {
-  auto updated = updateTimeZoneFile(_machine.root, zone);
-  if (updated) return updated;
-  return whyNeedsRoot("write", "/etc/timezone").value_or(updated.failure());
 }
 
 std::string LinuxClockService::rulesOf(const ZoneName& zone) {

@@ -23,13 +23,14 @@ class LinuxClockService final : public ClockService {
 
  private:
   Setting<ZoneName> timeZoneSetting() const;
+  Result<std::optional<ZoneName>> daemonsTimeZone();
   std::optional<Failure> whyNoClock() const;
   std::string whoCorrectsTheClock();
   Result<void> changeTime(const AskedTime& asked);
   Result<void> changeTimeDirectly(std::int64_t secondsSince1970) const;
+  Result<bool> setZoneByDaemon(const ZoneName& zone);
   Result<void> changeTimeZone(const ZoneName& zone);
   Result<void> changeTimeZoneDirectly(const ZoneName& zone) const;
-  Result<void> updateNameFile(const ZoneName& zone) const;
 
   LinuxMachine _machine;
 };

@@ -4,6 +4,7 @@
 
 #include "base/DnsName.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
 
@@ -43,18 +44,18 @@ Result<Answer> LinuxNetworkTimeService::withClient(Use use) {
   return use(**found);
 }
 
-/// A client that cannot be asked for is no reason: whatever is done with it then tells why.
-std::optional<Failure> LinuxNetworkTimeService::whyNotSupported() {
+Support LinuxNetworkTimeService::isSupported() {
   const auto found = client();
-  if (!found || *found) return std::nullopt;
-  return noClient();
+  if (!found) return found.failure();
+  if (*found) return std::nullopt;
+  return std::optional(NotSupported{noClient()});
 }
 
 template <typename Value>
 Setting<Value> LinuxNetworkTimeService::named(const char* name) {
   Setting<Value> setting;
   setting.name = name;
-  setting.supported = [this] { return asSupport(whyNotSupported()); };
+  setting.supported = [this] { return isSupported(); };
   return setting;
 }
 
@@ -71,13 +72,22 @@ Setting<bool> LinuxNetworkTimeService::runningSetting() {
     return *found ? daemons().isRunning((*found)->daemon) : Result<bool>(false);
   };
   setting.apply = [this](bool isOn) {
-    return withClient<void>([&](const TimeDaemon& client) -> Result<void> {
-      // The other half of the switch, setLaunchAtStartup().
-      if (auto may = daemons().checkMayStartAtBoot(client.daemon, isOn); !may) return may;
-      return isOn ? daemons().start(client.daemon) : daemons().stop(client.daemon);
-    });
+    return withClient<void>([&](const TimeDaemon& client) { return run(client.daemon, isOn); });
   };
   return setting;
+}
+
+std::optional<Failure> LinuxNetworkTimeService::whyRunningNeedsRoot(const Daemon& daemon, bool isOn) {
+  auto failure = whyNeedsRoot(isOn ? "start" : "stop", daemon.unit);
+  if (!failure) return std::nullopt;
+  const auto startsAtBoot = daemons().startsAtBoot(daemon);
+  if (!startsAtBoot) return startsAtBoot.failure();
+  return *startsAtBoot == isOn ? std::nullopt : failure;
+}
+
+Result<void> LinuxNetworkTimeService::run(const Daemon& daemon, bool isOn) {
+  if (auto failure = whyRunningNeedsRoot(daemon, isOn)) return *failure;
+  return isOn ? daemons().start(daemon) : daemons().stop(daemon);
 }
 
 bool LinuxNetworkTimeService::isRunning() {
@@ -109,31 +119,45 @@ Setting<std::string> LinuxNetworkTimeService::serverSetting() {
   setting.stored = [this]() -> Result<Value> {
     const auto found = client();
     if (!found) return found.failure();
-    return *found ? Value((*found)->server(_machine.root)) : Value();
+    if (!*found) return Value();
+    return (*found)->server(_machine.root);
   };
   return setting;
 }
 
-/// A server that the network offered, or the daemon's own last resort.
-std::string LinuxNetworkTimeService::serverInUseWithoutAny() {
+Result<std::string> LinuxNetworkTimeService::serverInUseWithoutAny() {
   const auto found = client();
-  if (!found || !*found || !(*found)->busService || !(*found)->server(_machine.root).empty()) return {};
-  const auto bus = _machine.services.systemBus();
-  if (!bus || !daemons().isRunning((*found)->daemon).valueOr(false)) return {};
-  const BusObject manager{(*found)->busService, "/org/freedesktop/timesync1", "org.freedesktop.timesync1.Manager"};
+  if (!found) return found.failure();
+  if (!*found || !(*found)->busService) return std::string();
+  const auto configured = (*found)->server(_machine.root);
+  if (!configured) return configured.failure();
+  const auto runs = configured->empty() ? daemons().isRunning((*found)->daemon) : Result<bool>(false);
+  if (!runs) return runs.failure();
+  return *runs ? serverInUse((*found)->busService) : std::string();
+}
+
+/// A server that the network offered, or the daemon's own last resort.
+Result<std::string> LinuxNetworkTimeService::serverInUse(const char* busService) {
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return bus.failure();
+  if (!*bus) return std::string();
+  const BusObject manager{busService, "/org/freedesktop/timesync1", "org.freedesktop.timesync1.Manager"};
   auto name = (*bus)->property(manager, "ServerName", "s");
-  return name ? std::move(name).value().readText() : std::string();
+  if (name) return std::move(name).value().readText();
+  if (name.failure().code == BusErrorCode::serviceUnknown) return std::string();
+  return name.failure();
 }
 
 NetworkTimeServer LinuxNetworkTimeService::server() {
   auto setting = serverSetting();
-  if (const auto inUse = serverInUseWithoutAny(); !inUse.empty()) setting.live = [inUse] { return Value(inUse); };
+  const auto inUse = serverInUseWithoutAny();
+  if (!inUse || !inUse->empty()) setting.live = [&inUse] { return inUse; };
   return {observe(setting, _machine.effects).value_or("")};
 }
 
 std::string LinuxNetworkTimeService::whatStaysInUse(const TimeDaemon& client) const {
   const auto other = client.otherServer ? client.otherServer(_machine.root) : std::string();
-  return other.empty() ? "" : "configured elsewhere, " + other + " stays in use beside it";
+  return !other || other->empty() ? "" : "configured elsewhere, " + *other + " stays in use beside it";
 }
 
 void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
@@ -141,8 +165,8 @@ void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
   if (const auto found = client(); found && *found) {
     setting.where = (*found)->serverFile;
     setting.note = [this, client = *found](const auto&) { return whatStaysInUse(*client); };
-    if ((*found)->whyNotRead)
-      setting.supported = [this, client = *found] { return asSupport(client->whyNotRead(_machine.root)); };
+    if ((*found)->readsServerFile)
+      setting.supported = [this, client = *found] { return client->readsServerFile(_machine.root); };
   }
   setting.store = [this](const std::string& address) {
     return withClient<void>([&](const TimeDaemon& client) { return storeServer(client, address); });

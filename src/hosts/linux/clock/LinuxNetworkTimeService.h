@@ -33,14 +33,19 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   /// What `use` answers for the client; a failure when there is none.
   template <typename Answer, typename Use>
   Result<Answer> withClient(Use use);
-  std::optional<Failure> whyNotSupported();
+  Support isSupported();
+  /// What an administrator who is not root reads where the client would run, or not, until the next start only.
+  std::optional<Failure> whyRunningNeedsRoot(const Daemon& daemon, bool isOn);
+  Result<void> run(const Daemon& daemon, bool isOn);
   template <typename Value>
   Setting<Value> named(const char* name);
   template <typename Value>
   void change(const Setting<Value>& setting, const std::type_identity_t<Value>& asked);
   Setting<bool> runningSetting();
   Setting<std::string> serverSetting();
-  std::string serverInUseWithoutAny();
+  /// Empty when one is configured, or none is in use.
+  Result<std::string> serverInUseWithoutAny();
+  Result<std::string> serverInUse(const char* busService);
   std::string whatStaysInUse(const TimeDaemon& client) const;
   Result<void> storeServer(const TimeDaemon& client, const std::string& address);
   Result<void> reload(const TimeDaemon& client);

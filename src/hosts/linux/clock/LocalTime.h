@@ -11,12 +11,18 @@
 namespace tavisk {
 
 /// The machine's zone (localtime(5)): the link /etc/localtime, else /etc/timezone; absent when neither names one.
-std::optional<ZoneName> machineTimeZone(const SystemRoot& root);
+Result<std::optional<ZoneName>> machineTimeZone(const SystemRoot& root);
 
 /// Debian's second copy of the name, /etc/timezone, whatever it is made of; absent when there is no such file.
-std::optional<ZoneName> timeZoneFileName(const SystemRoot& root);
+Result<std::optional<ZoneName>> timeZoneFileName(const SystemRoot& root);
 
-/// Points /etc/localtime at a zone; the file of that zone must exist. At no moment is the link absent.
+/// The reason against a zone that has no file which holds one.
+std::optional<Failure> whyNoZone(const SystemRoot& root, const ZoneName& zone);
+
+/// What an administrator who is not root reads where the second copy would have to follow.
+std::optional<Failure> whyZoneNeedsRoot(const SystemRoot& root, const ZoneName& zone);
+
+/// Points /etc/localtime at a zone. At no moment is the link absent.
 Result<void> linkLocalTime(const SystemRoot& root, const ZoneName& zone);
 
 /// Brings /etc/timezone into line; a machine that has no such file gets none.

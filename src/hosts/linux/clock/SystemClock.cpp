@@ -34,10 +34,20 @@ std::chrono::microseconds systemMicroseconds() {
 }
 
 /// The third line of /etc/adjtime is UTC or LOCAL; UTC without the file.
-bool keepsLocalTime(const SystemRoot& root) {
+Result<bool> keepsLocalTime(const SystemRoot& root) {
   constexpr std::size_t limit = 4096;
-  const auto lines = split(root.read("/etc/adjtime", limit).valueOr(""), "\n");
+  const auto text = orEmpty(root.read("/etc/adjtime", limit));
+  if (!text) return text.failure();
+  const auto lines = split(*text, "\n");
   return lines.size() > 2 && lines[2] == "LOCAL";
+}
+
+/// A device that is not there, or goes away at the moment, is none.
+template <typename Value>
+Result<std::optional<Value>> ifDevice(Result<Value> found) {
+  const bool isGone = !found && (found.failure().code == std::errc::no_such_device ||
+                                 found.failure().code == std::errc::no_such_device_or_address);
+  return isGone ? Result<std::optional<Value>>(std::optional<Value>()) : orAbsent(std::move(found));
 }
 
 DateTime utcDateTime(std::int64_t secondsSince1970) {
@@ -87,13 +97,16 @@ Result<void> setSystemTime(std::int64_t secondsSince1970) {
   return {};
 }
 
-std::optional<std::int64_t> hardwareTime(const SystemRoot& root) {
+Result<std::optional<std::int64_t>> hardwareTime(const SystemRoot& root) {
   constexpr std::size_t limit = 64;
-  const auto text = root.read("/sys/class/rtc/rtc0/since_epoch", limit);
-  if (!text) return std::nullopt;
-  const auto seconds = leadingInteger(*text);
+  const auto text = ifDevice(root.read("/sys/class/rtc/rtc0/since_epoch", limit));
+  if (!text) return text.failure();
+  if (!*text) return std::optional<std::int64_t>();
+  const auto seconds = leadingInteger(**text);
+  const auto isLocal = keepsLocalTime(root);
+  if (!isLocal) return isLocal.failure();
   // The kernel takes what the clock shows for UTC.
-  return keepsLocalTime(root) ? static_cast<std::int64_t>(secondsSince1970(utcDateTime(seconds))) : seconds;
+  return std::optional(*isLocal ? static_cast<std::int64_t>(secondsSince1970(utcDateTime(seconds))) : seconds);
 }
 
 std::chrono::microseconds AskedTime::sinceThen() const {
@@ -109,10 +122,10 @@ std::int64_t AskedTime::onSystemClock() const {
   return unlessNear(systemMicroseconds(), std::chrono::seconds(1));
 }
 
-std::optional<std::int64_t> AskedTime::onHardwareClock(const SystemRoot& root) const {
-  const auto shown = hardwareTime(root);
-  if (!shown) return std::nullopt;
-  return unlessNear(std::chrono::seconds(*shown), std::chrono::seconds(2));  // it tells no fractions
+Result<std::optional<std::int64_t>> AskedTime::onHardwareClock(const SystemRoot& root) const {
+  auto shown = hardwareTime(root);
+  if (!shown || !*shown) return shown;
+  return std::optional(unlessNear(std::chrono::seconds(**shown), std::chrono::seconds(2)));  // it tells no fractions
 }
 
 std::int64_t AskedTime::unlessNear(std::chrono::microseconds shown, std::chrono::seconds near) const {
@@ -121,12 +134,18 @@ std::int64_t AskedTime::unlessNear(std::chrono::microseconds shown, std::chrono:
   return isNear ? _seconds : std::chrono::floor<std::chrono::seconds>(then).count();
 }
 
-Result<void> setHardwareClock(const SystemRoot& root, std::int64_t secondsSince1970) {
-  if (!root.exists(hardwareClock)) return {};
-  const auto clock = root.open(hardwareClock, O_RDONLY | O_NONBLOCK);
-  if (!clock) return clock.failure();
-  auto time = rtcTime(keepsLocalTime(root) ? localDateTime(secondsSince1970) : utcDateTime(secondsSince1970));
-  if (::ioctl(clock->number(), RTC_SET_TIME, &time) != 0) return systemFailure("RTC_SET_TIME", hardwareClock, errno);
+Result<std::optional<HardwareClock>> HardwareClock::open(const SystemRoot& root) {
+  auto device = ifDevice(root.open(hardwareClock, O_RDONLY | O_NONBLOCK));
+  if (!device) return device.failure();
+  if (!*device) return std::optional<HardwareClock>();
+  const auto isLocal = keepsLocalTime(root);
+  if (!isLocal) return isLocal.failure();
+  return std::optional(HardwareClock(*std::move(device).value(), *isLocal));
+}
+
+Result<void> HardwareClock::set(std::int64_t secondsSince1970) const {
+  auto time = rtcTime(_isLocal ? localDateTime(secondsSince1970) : utcDateTime(secondsSince1970));
+  if (::ioctl(_device.number(), RTC_SET_TIME, &time) != 0) return systemFailure("RTC_SET_TIME", hardwareClock, errno);
   return {};
 }
 

@@ -5,7 +5,9 @@
 #include <chrono>
 #include <cstdint>
 #include <optional>
+#include <utility>
 
+#include "base/FileDescriptor.h"
 #include "base/Result.h"
 #include "hosts/shared/SystemRoot.h"
 
@@ -28,7 +30,7 @@ Result<void> setSystemTime(std::int64_t secondsSince1970);
 inline constexpr const char* hardwareClock = "/dev/rtc0";
 
 /// What the hardware clock says, in seconds since 1970 UTC whichever time it keeps; absent when the machine has none.
-std::optional<std::int64_t> hardwareTime(const SystemRoot& root);
+Result<std::optional<std::int64_t>> hardwareTime(const SystemRoot& root);
 
 /// A time to which the clocks are set, and what they said at the moment from which it counts, however much later they
 /// are read. Once there is such a moment, what is as near as a clock is set and read is the time itself.
@@ -42,7 +44,7 @@ class AskedTime {
   std::int64_t microsecondsAhead() const;
   std::int64_t onSystemClock() const;
   /// Absent when the machine has none.
-  std::optional<std::int64_t> onHardwareClock(const SystemRoot& root) const;
+  Result<std::optional<std::int64_t>> onHardwareClock(const SystemRoot& root) const;
 
  private:
   std::chrono::microseconds sinceThen() const;
@@ -52,8 +54,18 @@ class AskedTime {
   std::optional<std::chrono::steady_clock::time_point> _moment;
 };
 
-/// Sets the hardware clock (rtc(4)), to local time when /etc/adjtime says so (adjtime_config(5)). A machine that has
-/// none is a success.
-Result<void> setHardwareClock(const SystemRoot& root, std::int64_t secondsSince1970);
+/// The hardware clock (rtc(4)), which keeps local time when /etc/adjtime says so (adjtime_config(5)).
+class HardwareClock {
+ public:
+  /// Absent when the machine has none.
+  static Result<std::optional<HardwareClock>> open(const SystemRoot& root);
+  Result<void> set(std::int64_t secondsSince1970) const;
+
+ private:
+  HardwareClock(FileDescriptor device, bool isLocal) : _device(std::move(device)), _isLocal(isLocal) {}
+
+  FileDescriptor _device;
+  bool _isLocal;
+};
 
 }  // namespace tavisk

@@ -20,10 +20,16 @@ constexpr const char* openntpdConfig = "/etc/openntpd/ntpd.conf";
 constexpr const char* chronyReload[] = {"/usr/bin/chronyc", "reload", "sources"};
 constexpr std::string_view commentSigns = "#%;!";
 
-/// The lines of a file as words: chrony.conf(5) and ntp.conf(5) agree on comments and on one directive a line.
-std::vector<std::vector<std::string>> directives(const SystemRoot& root, const std::string& file) {
-  std::vector<std::vector<std::string>> found;
-  for (const auto& line : configurationLines(root.read(file, configurationLimit).valueOr(""), commentSigns)) {
+using Directives = std::vector<std::vector<std::string>>;
+using Server = Result<std::string>;
+
+/// The lines of a file as words: chrony.conf(5) and ntp.conf(5) agree on comments and on one directive a line. Without
+/// the file there are none.
+Result<Directives> directives(const SystemRoot& root, const std::string& file) {
+  const auto text = orEmpty(root.read(file, configurationLimit));
+  if (!text) return text.failure();
+  Directives found;
+  for (const auto& line : configurationLines(*text, commentSigns)) {
     auto words = split(line, " \t\r");
     words[0] = lowerCased(words[0]);
     found.push_back(std::move(words));
@@ -38,70 +44,87 @@ std::string serverOf(const std::vector<std::string>& directive) {
   return directive[1];
 }
 
-std::string firstServer(const SystemRoot& root, const std::string& file) {
-  for (const auto& directive : directives(root, file))
+/// Whether a search is over: a server is found, or something cannot be looked at.
+bool isOver(const Server& server) {
+  return !server || !server->empty();
+}
+
+Server firstServer(const SystemRoot& root, const std::string& file) {
+  const auto found = directives(root, file);
+  if (!found) return found.failure();
+  for (const auto& directive : *found)
     if (auto server = serverOf(directive); !server.empty()) return server;
-  return {};
+  return std::string();
 }
 
 /// The tool's own file aside.
-std::string firstServerInFolder(const SystemRoot& root, const std::string& folder, std::string_view ending) {
-  for (const auto& name : root.list(folder).valueOr({})) {
+Server firstServerInFolder(const SystemRoot& root, const std::string& folder, std::string_view ending) {
+  const auto names = orEmpty(root.list(folder));
+  if (!names) return names.failure();
+  for (const auto& name : *names) {
     if (!name.ends_with(ending) || name.starts_with(std::string(ownfile::name) + ".")) continue;
-    if (auto server = firstServer(root, (folder + "/").append(name)); !server.empty()) return server;
+    if (auto server = firstServer(root, (folder + "/").append(name)); isOver(server)) return server;
   }
-  return {};
+  return std::string();
 }
 
 /// As chronyd reads its configuration: "confdir" and "sourcedir" lines take in the files of folders.
-std::string chronyOtherServer(const SystemRoot& root) {
-  for (const auto& directive : directives(root, chronyConfig)) {
-    auto server = serverOf(directive);
-    for (std::size_t i = 1; i < directive.size() && server.empty(); ++i) {
+Server chronyOtherServer(const SystemRoot& root) {
+  const auto found = directives(root, chronyConfig);
+  if (!found) return found.failure();
+  for (const auto& directive : *found) {
+    Server server = serverOf(directive);
+    for (std::size_t i = 1; i < directive.size() && !isOver(server); ++i) {
       if (directive[0] == "confdir") server = firstServerInFolder(root, directive[i], ".conf");
       if (directive[0] == "sourcedir") server = firstServerInFolder(root, directive[i], ".sources");
     }
-    if (!server.empty()) return server;
+    if (isOver(server)) return server;
   }
-  return {};
+  return std::string();
 }
 
-std::optional<Failure> chronyWhyNotRead(const SystemRoot& root) {
+Support chronyReadsServerFile(const SystemRoot& root) {
+  const auto found = directives(root, chronyConfig);
+  if (!found) return found.failure();
   const auto readsOwnFile = [](const std::vector<std::string>& directive) {
     return directive[0] == "sourcedir" && std::ranges::find(directive, "/etc/chrony/sources.d") != directive.end();
   };
-  if (std::ranges::any_of(directives(root, chronyConfig), readsOwnFile)) return std::nullopt;
-  return Failure{
-      "set the server", ownfile::chronyServer,
-      "chronyd does not read it: " + std::string(chronyConfig) + " has no line \"sourcedir /etc/chrony/sources.d\""};
+  if (std::ranges::any_of(*found, readsOwnFile)) return std::nullopt;
+  return std::optional(NotSupported{
+      {"set the server", ownfile::chronyServer,
+       "chronyd does not read it: " + std::string(chronyConfig) + " has no line \"sourcedir /etc/chrony/sources.d\""}});
 }
 
-std::string ntpsecOtherServer(const SystemRoot& root) {
+Server ntpsecOtherServer(const SystemRoot& root) {
   auto server = firstServer(root, ntpsecConfig);
-  return server.empty() ? firstServerInFolder(root, "/etc/ntpsec/ntp.d", ".conf") : server;
+  return isOver(server) ? server : firstServerInFolder(root, "/etc/ntpsec/ntp.d", ".conf");
 }
 
-std::string chronyServer(const SystemRoot& root) {
-  auto own = chronyWhyNotRead(root) ? std::string() : firstServer(root, ownfile::chronyServer);
-  return own.empty() ? chronyOtherServer(root) : own;
+Server chronyServer(const SystemRoot& root) {
+  const auto reads = chronyReadsServerFile(root);
+  if (!reads) return reads.failure();
+  auto own = *reads ? Server(std::string()) : firstServer(root, ownfile::chronyServer);
+  return isOver(own) ? own : chronyOtherServer(root);
 }
 
-std::string ntpsecServer(const SystemRoot& root) {
+Server ntpsecServer(const SystemRoot& root) {
   auto own = firstServer(root, ownfile::ntpsecServer);
-  return own.empty() ? ntpsecOtherServer(root) : own;
+  return isOver(own) ? own : ntpsecOtherServer(root);
 }
 
-std::string openntpdServer(const SystemRoot& root) {
+Server openntpdServer(const SystemRoot& root) {
   return firstServer(root, openntpdConfig);
 }
 
-std::optional<Failure> openntpdWhyNotRead(const SystemRoot&) {
-  return Failure{"set the server", openntpdConfig, "openntpd reads this file only, and it is the administrator's"};
+Support openntpdReadsServerFile(const SystemRoot&) {
+  return std::optional(
+      NotSupported{{"set the server", openntpdConfig, "openntpd reads this file only, and it is the administrator's"}});
 }
 
-std::string timesyncdServer(const SystemRoot& root) {
-  const auto servers = SystemdConfig(root, "timesyncd.conf").words("Time", "NTP").valueOr({});
-  return servers.empty() ? std::string() : servers.front();
+Server timesyncdServer(const SystemRoot& root) {
+  const auto servers = SystemdConfig(root, "timesyncd.conf").words("Time", "NTP");
+  if (!servers) return servers.failure();
+  return servers->empty() ? std::string() : servers->front();
 }
 
 std::string serverDirective(const std::string& server) {
@@ -119,7 +142,7 @@ constexpr TimeDaemon daemons[] = {
      .server = chronyServer,
      .otherServer = chronyOtherServer,
      .serverLines = serverDirective,
-     .whyNotRead = chronyWhyNotRead,
+     .readsServerFile = chronyReadsServerFile,
      .reload = chronyReload},
     {.daemon = {"ntpsec.service", "ntpsec", "ntpd"},
      .serverFile = ownfile::ntpsecServer,
@@ -130,7 +153,7 @@ constexpr TimeDaemon daemons[] = {
      .serverFile = openntpdConfig,
      .server = openntpdServer,
      .serverLines = serverDirective,
-     .whyNotRead = openntpdWhyNotRead},
+     .readsServerFile = openntpdReadsServerFile},
     {.daemon = {"systemd-timesyncd.service", "", "systemd-timesyncd"},
      .serverFile = ownfile::timesyncdServer,
      .server = timesyncdServer,

@@ -2,12 +2,12 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <optional>
 #include <span>
 #include <string>
 
 #include "base/Result.h"
 #include "hosts/linux/services/Daemons.h"
+#include "hosts/shared/SettingChange.h"
 #include "hosts/shared/SystemRoot.h"
 
 namespace tavisk {
@@ -18,13 +18,13 @@ struct TimeDaemon {
   const char* serverFile;  ///< the tool's own file for the server
 
   /// The server that comes first: the tool's own, else the first one configured; empty when there is none.
-  std::string (*server)(const SystemRoot& root);
+  Result<std::string> (*server)(const SystemRoot& root);
   /// The first server that stays in use beside the tool's own; null: the tool's own takes the place of all others.
-  std::string (*otherServer)(const SystemRoot& root) = nullptr;
+  Result<std::string> (*otherServer)(const SystemRoot& root) = nullptr;
   /// The contents of the server file.
   std::string (*serverLines)(const std::string& server);
-  /// Why the daemon would not read the server file; null: it does.
-  std::optional<Failure> (*whyNotRead)(const SystemRoot& root) = nullptr;
+  /// Whether the daemon would read the server file; null: it does.
+  Support (*readsServerFile)(const SystemRoot& root) = nullptr;
   /// The program by which the running daemon reads its servers again, with its arguments; without one it is restarted.
   std::span<const char* const> reload = {};
   /// Where the running daemon tells which server it uses when none is configured (org.freedesktop.timesync1(5)); null:

@@ -28,9 +28,9 @@ constexpr const char* cloudConfig = "/etc/cloud/cloud.cfg";
 constexpr const char* cloudConfigFolder = "/etc/cloud/cloud.cfg.d";
 constexpr const char* responderConfig = "/etc/avahi/avahi-daemon.conf";
 
-Result<std::string> readIfThere(const SystemRoot& root, const char* file, std::size_t limit = configurationLimit) {
-  if (!root.exists(file)) return std::string();
-  return root.read(file, limit);
+Result<std::string> readIfThere(const SystemRoot& root, const std::string& file,
+                                std::size_t limit = configurationLimit) {
+  return orEmpty(root.read(file, limit));
 }
 
 /// The words of a line of hosts(5) that name this machine, renamed; each name stands once.
@@ -52,26 +52,76 @@ std::vector<std::string> namesAfter(const std::vector<std::string>& names, const
       add(newLabel + name.substr(firstLabel(name).size()));
     }
   }
-  if (!before.empty() && result != names) add(now);
+  if (result != names) add(now);
   return result;
 }
 
-std::string lineWithName(const std::string& line, const std::string& before, const std::string& now) {
-  const auto comment = std::min(line.find('#'), line.size());
-  auto names = split(line.substr(0, comment), " \t\r");
-  if (names.empty() || names.front() != ownAddress) return line;
-  names.erase(names.begin());
-  const auto changed = namesAfter(names, before, now);
-  if (changed == names) return line;
-  auto text = std::string(ownAddress);
-  for (const auto& name : changed) text += (&name == &changed.front() ? "\t" : " ") + name;
-  return text + (comment < line.size() ? " " + line.substr(comment) : "");
+/// A line of hosts(5): the names of our own address, and the comment behind them; another line has no names.
+struct OwnLine {
+  explicit OwnLine(const std::string& line) {
+    const auto end = std::min(line.find('#'), line.size());
+    names = split(line.substr(0, end), " \t\r");
+    if (names.empty() || names.front() != ownAddress)
+      names.clear();
+    else
+      names.erase(names.begin());
+    comment = line.substr(end);
+  }
+  std::string text() const {
+    auto text = std::string(ownAddress);
+    for (const auto& name : names) text += (&name == &names.front() ? "\t" : " ") + name;
+    return text + (comment.empty() ? "" : " " + comment);
+  }
+
+  std::vector<std::string> names;
+  std::string comment;
+};
+
+/// The line with other names, where it has any.
+template <typename Rename>
+std::string renamed(const std::string& line, Rename rename) {
+  OwnLine own(line);
+  if (own.names.empty()) return line;
+  const auto before = own.names;
+  own.names = rename(before);
+  return own.names == before ? line : own.text();
+}
+
+bool nameIt(const std::vector<std::string>& names, const std::string& machine) {
+  const bool isWhole = machine != firstLabel(machine);
+  return std::ranges::any_of(names, [&](const auto& name) { return (isWhole ? name : firstLabel(name)) == machine; });
+}
+
+/// The names of a line that has none which is known. If they are all of one machine that is this one, under a name that
+/// it had at some time before; else they are somebody's aliases, and stay.
+std::vector<std::string> namesWithUnknown(const std::vector<std::string>& names, const std::string& now) {
+  const auto label = firstLabel(names.front());
+  if (std::ranges::all_of(names, [&](const auto& name) { return firstLabel(name) == label; }))
+    return namesAfter(names, names.front(), now);
+  std::vector<std::string> all{now};
+  if (now != firstLabel(now)) all.push_back(firstLabel(now));
+  all.insert(all.end(), names.begin(), names.end());
+  return all;
+}
+
+template <typename Change>
+std::string changedLines(std::string_view text, Change change) {
+  std::string changed;
+  while (!text.empty()) {
+    const auto end = std::min(text.find('\n'), text.size());
+    changed += change(std::string(text.substr(0, end)));
+    if (end < text.size()) changed += '\n';
+    text.remove_prefix(std::min(end + 1, text.size()));
+  }
+  return changed;
 }
 
 /// As cloud-init reads them: a later file goes before an earlier one.
-std::vector<std::string> cloudConfigFiles(const SystemRoot& root) {
+Result<std::vector<std::string>> cloudConfigFiles(const SystemRoot& root) {
+  const auto names = orEmpty(root.list(cloudConfigFolder));
+  if (!names) return names.failure();
   std::vector<std::string> files{cloudConfig};
-  for (const auto& name : root.list(cloudConfigFolder).valueOr({}))
+  for (const auto& name : *names)
     if (name.ends_with(".cfg")) files.push_back(std::string(cloudConfigFolder) + "/" + name);
   return files;
 }
@@ -88,16 +138,23 @@ std::optional<bool> hostNamePreservedIn(const std::string& text) {
   return isPreserved;
 }
 
-bool preservesHostName(const SystemRoot& root) {
+Result<bool> preservesHostName(const SystemRoot& root) {
+  const auto files = cloudConfigFiles(root);
+  if (!files) return files.failure();
   bool isPreserved = false;
-  for (const auto& file : cloudConfigFiles(root))
-    isPreserved = hostNamePreservedIn(root.read(file, configurationLimit).valueOr("")).value_or(isPreserved);
+  for (const auto& file : *files) {
+    const auto text = readIfThere(root, file);
+    if (!text) return text.failure();
+    isPreserved = hostNamePreservedIn(*text).value_or(isPreserved);
+  }
   return isPreserved;
 }
 
+/// As far as it is known for sure.
 bool isOwnedByCloud(const SystemRoot& root) {
-  return root.exists("/usr/bin/cloud-init") && root.exists(cloudConfig) &&
-         !root.exists("/etc/cloud/cloud-init.disabled") && !preservesHostName(root);
+  const auto is = [](const Result<bool>& answer, bool wanted) { return answer && *answer == wanted; };
+  return is(root.isThere("/usr/bin/cloud-init"), true) && is(root.isThere(cloudConfig), true) &&
+         is(root.isThere("/etc/cloud/cloud-init.disabled"), false) && is(preservesHostName(root), false);
 }
 
 }  // namespace
@@ -148,21 +205,39 @@ Result<std::string> hostsOf(const SystemRoot& root) {
   return readIfThere(root, hostsFile, hostsLimit);
 }
 
-std::string hostsWithName(std::string_view hosts, const std::string& before, const std::string& now) {
-  std::string text;
-  while (!hosts.empty()) {
-    const auto end = std::min(hosts.find('\n'), hosts.size());
-    text += lineWithName(std::string(hosts.substr(0, end)), before, now);
-    if (end < hosts.size()) text += '\n';
-    hosts.remove_prefix(std::min(end + 1, hosts.size()));
+bool hostsName(std::string_view hosts, const std::string& name) {
+  bool hasLine = false;
+  bool isNamed = false;
+  changedLines(hosts, [&](const std::string& line) {
+    const auto names = OwnLine(line).names;
+    hasLine = hasLine || !names.empty();
+    isNamed = isNamed || nameIt(names, name);
+    return line;
+  });
+  return isNamed || !hasLine;
+}
+
+std::string hostsWithName(std::string_view hosts, const std::vector<std::string>& before, const std::string& now) {
+  std::string text(hosts);
+  for (const auto& old : before) {
+    if (old.empty()) continue;
+    text = changedLines(text, [&](const std::string& line) {
+      return renamed(line, [&](const auto& names) { return namesAfter(names, old, now); });
+    });
   }
-  return text;
+  bool isDone = hostsName(text, now);
+  return changedLines(text, [&](const std::string& line) {
+    if (isDone || OwnLine(line).names.empty()) return line;
+    isDone = true;
+    return renamed(line, [&](const auto& names) { return namesWithUnknown(names, now); });
+  });
 }
 
 std::string whoUndoesHostName(const SystemRoot& root, const std::string& name) {
   std::string owners;
   if (isOwnedByCloud(root)) owners = "cloud-init (/etc/cloud has no \"preserve_hostname: true\")";
-  const auto announced = assignments(root.read(responderConfig, configurationLimit).valueOr(""), "server", "host-name");
+  const auto configured = root.read(responderConfig, configurationLimit);
+  const auto announced = assignments(configured ? *configured : "", "server", "host-name");
   if (!announced.empty() && compareIgnoringCase(announced.back(), firstLabel(name)) != 0)
     owners += std::string(owners.empty() ? "" : ", ") + responderConfig + " (host-name=" + announced.back() + ")";
   return owners;

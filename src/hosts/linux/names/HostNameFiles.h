@@ -5,6 +5,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "base/DnsName.h"
 #include "base/Result.h"
@@ -31,11 +32,16 @@ Result<void> setKernelHostName(const SystemRoot& root, const std::string& name);
 
 /// The text of hosts(5); empty where there is no such file.
 Result<std::string> hostsOf(const SystemRoot& root);
-/// The text of hosts(5) with the machine's own name, on the line of the address 127.0.1.1, changed from `before` to
-/// `now`; what follows its first label there stays, and so do all other names.
-std::string hostsWithName(std::string_view hosts, const std::string& before, const std::string& now);
+/// Whether a line of the address 127.0.1.1, which is this machine's own, has this name; also where there is no such
+/// line.
+bool hostsName(std::string_view hosts, const std::string& name);
+/// The text of hosts(5) with the machine's own name, on the line of the address 127.0.1.1, changed to `now`; what
+/// follows its first label there stays, and so do all other names. The line has one of the names `before`, or one that
+/// nobody knows any more.
+std::string hostsWithName(std::string_view hosts, const std::vector<std::string>& before, const std::string& now);
 
-/// What on this machine sets another host name when it starts the next time, for people; empty when nothing is known.
+/// What on this machine sets another host name when it starts the next time, for people; empty when nothing is known,
+/// also of what cannot be looked at.
 std::string whoUndoesHostName(const SystemRoot& root, const std::string& name);
 
 }  // namespace tavisk

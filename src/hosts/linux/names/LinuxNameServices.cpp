@@ -8,6 +8,7 @@
 #include "effects/SettingNames.h"
 #include "hosts/linux/names/HostNameFiles.h"
 #include "hosts/linux/names/NameAnnouncer.h"
+#include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/shared/SettingChange.h"
 
@@ -76,8 +77,9 @@ class LinuxSession final : public DynamicStore::Session {
 }  // namespace
 
 Result<bool> LinuxHostConfigService::setByService(const char* member, const std::string& name) {
-  const auto bus = _machine.services.systemBus();
-  if (!bus) return false;
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return bus.failure();
+  if (!*bus) return false;
   const auto set = (*bus)->call(nameService(), member, "", name, false);
   if (set) return true;
   if (set.failure().code == BusErrorCode::serviceUnknown) return false;
@@ -96,8 +98,9 @@ void LinuxHostConfigService::setComputerName(const std::string& name) {
 
 /// Where the service does not run, who asks for the name reads the file.
 Result<LinuxHostConfigService::Value> LinuxHostConfigService::serviceComputerName() {
-  const auto bus = _machine.services.systemBus();
-  if (!bus) return prettyHostName(_machine.root);
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return bus.failure();
+  if (!*bus) return prettyHostName(_machine.root);
   auto name = (*bus)->property(nameService(), "PrettyHostname", "s");
   if (name) return Value(std::move(name).value().readText());
   if (name.failure().code == BusErrorCode::serviceUnknown) return prettyHostName(_machine.root);
@@ -119,7 +122,7 @@ void LinuxHostConfigService::setLocalNetworkName(const std::string& name) {
   setting.where = staticNameFile;
   setting.undoneBy = [this](const auto& asked) { return whoUndoesHostName(_machine.root, asked); };
   setting.live = [this] { return liveLocalName(); };
-  setting.stored = [this] { return staticHostName(_machine.root); };
+  setting.stored = [this] { return storedLocalName(); };
   setting.store = [this](const std::string& value) { return storeLocalName(value); };
   setting.apply = [this](const std::string& value) { return applyLocalName(value); };
   carryOut(setting, name, _machine);
@@ -135,22 +138,51 @@ Result<LinuxHostConfigService::Value> LinuxHostConfigService::liveLocalName() {
   return compareIgnoringCase(**announced, label) == 0 ? name : announced;
 }
 
+/// The name in its file, and with it that the machine's own line among the hosts has another one.
+Setting<std::string>::Found LinuxHostConfigService::storedLocalName() {
+  const auto name = staticHostName(_machine.root);
+  if (!name) return name.failure();
+  const auto hosts = hostsOf(_machine.root);
+  if (!hosts) return hosts.failure();
+  if (!*name) return std::nullopt;
+  const auto stale = hostsName(*hosts, **name) ? "" : **name + ", another one in " + hostsFile;
+  return std::optional(Reading(**name, stale));
+}
+
 /// The name is refused here before it reaches a service that would cut it off.
 Result<void> LinuxHostConfigService::storeLocalName(const std::string& name) {
   if (name.empty() || name.size() > longestKernelHostName)
     return Failure{setLocal, staticNameFile, "the kernel holds names of 1 to 64 bytes"};
-  const auto before = staticHostName(_machine.root).valueOr(std::nullopt).value_or("");
+  const auto stored = staticHostName(_machine.root);
+  if (!stored) return stored.failure();
+  const auto kernels = kernelHostName(_machine.root);
+  if (!kernels) return kernels.failure();
   const auto hosts = hostsOf(_machine.root);
   if (!hosts) return hosts.failure();
-  const auto renamed = hostsWithName(*hosts, before, name);
+  if (auto failure = whyAnnouncingNeedsRoot(name)) return *failure;
+  const auto renamed = hostsWithName(*hosts, {stored->value_or(""), kernels->value_or("")}, name);
   if (renamed == *hosts) return storeStaticName(name);
   // Before the name itself: when a run ends in between, setting the name again completes the change.
   if (auto failure = whyNeedsRoot(setLocal, hostsFile)) return *failure;
   if (auto written = _machine.root.write(hostsFile, renamed); !written) return written;
-  auto stored = storeStaticName(name);
-  if (stored) return stored;
-  const auto restored = _machine.root.write(hostsFile, *hosts);
-  return restored ? stored : restored;
+  auto set = storeStaticName(name);
+  return set ? set : putBackHosts(*hosts, name, set.failure());
+}
+
+/// Where the name was stored all the same it is right among the hosts too.
+Failure LinuxHostConfigService::putBackHosts(const std::string& hosts, const std::string& name, Failure cause) {
+  if (const auto stored = staticHostName(_machine.root); stored && *stored == name) return cause;
+  const auto restored = _machine.root.write(hostsFile, hosts);
+  if (!restored) cause.why += "; " + describe(restored.failure());
+  return cause;
+}
+
+/// The responder takes a name from root alone, and is told it last.
+std::optional<Failure> LinuxHostConfigService::whyAnnouncingNeedsRoot(const std::string& name) {
+  const auto announced = _announcer.respondersName();
+  if (!announced) return announced.failure();
+  const bool isToBeTold = *announced && compareIgnoringCase(**announced, firstLabel(name)) != 0;
+  return isToBeTold ? whyNeedsRoot("announce the host name", "org.freedesktop.Avahi") : std::nullopt;
 }
 
 Result<void> LinuxHostConfigService::storeStaticName(const std::string& name) {
@@ -162,7 +194,9 @@ Result<void> LinuxHostConfigService::storeStaticName(const std::string& name) {
 }
 
 Result<void> LinuxHostConfigService::applyLocalName(const std::string& name) {
-  if (kernelHostName(_machine.root).valueOr(std::nullopt) != name) {
+  const auto kernels = kernelHostName(_machine.root);
+  if (!kernels) return kernels.failure();
+  if (*kernels != name) {
     if (auto failure = whyNeedsRoot(setLocal, "the kernel")) return *failure;
     if (auto set = setKernelHostName(_machine.root, name); !set) return set;
   }

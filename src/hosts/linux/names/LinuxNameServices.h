@@ -30,7 +30,10 @@ class LinuxHostConfigService final : public HostConfigService {
   Result<Value> serviceComputerName();
   Result<void> storeComputerName(const std::string& name);
   Result<Value> liveLocalName();
+  Setting<std::string>::Found storedLocalName();
   Result<void> storeLocalName(const std::string& name);
+  Failure putBackHosts(const std::string& hosts, const std::string& name, Failure cause);
+  std::optional<Failure> whyAnnouncingNeedsRoot(const std::string& name);
   Result<void> storeStaticName(const std::string& name);
   Result<void> applyLocalName(const std::string& name);
 

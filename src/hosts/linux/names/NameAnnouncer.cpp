@@ -5,6 +5,8 @@
 #include <chrono>
 #include <cstdint>
 
+#include "hosts/linux/services/SystemServices.h"
+
 namespace tavisk {
 namespace {
 
@@ -27,8 +29,8 @@ BusObject messageBus() {
 }  // namespace
 
 Result<Bus*> NameAnnouncer::busOf(const char* service) {
-  const auto bus = _services.systemBus();
-  if (!bus) return nullptr;
+  auto bus = systemBusIfAny(_services);
+  if (!bus || !*bus) return bus;
   auto runs = (*bus)->query(messageBus(), "NameHasOwner", "b", service);
   if (!runs) return runs.failure();
   return std::move(runs).value().readBoolean() ? *bus : nullptr;

@@ -24,6 +24,13 @@ BusObject loginManager() {
   return {"org.freedesktop.login1", "/org/freedesktop/login1", "org.freedesktop.login1.Manager"};
 }
 
+Result<Bus*> systemBusIfAny(ServiceAccess& services) {
+  if (!services.hasServiceManager()) return nullptr;
+  auto bus = services.systemBus();
+  if (bus || (!isAbsent(bus.failure()) && bus.failure().code != std::errc::connection_refused)) return bus;
+  return nullptr;
+}
+
 Result<void> reloadServiceManager(ServiceAccess& services) {
   const auto bus = services.serviceManager();
   if (!bus) return bus.failure();

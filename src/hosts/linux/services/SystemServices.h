@@ -16,6 +16,10 @@ BusObject serviceManager();
 BusObject unitAt(const std::string& path);
 BusObject loginManager();
 
+/// The system bus, or null where nobody keeps one: the machine has no service manager, or nothing listens. Any other
+/// reason is a failure, and no reason to do without the bus.
+Result<Bus*> systemBusIfAny(ServiceAccess& services);
+
 /// Has the service manager read its configuration and all unit files again.
 Result<void> reloadServiceManager(ServiceAccess& services);
 

@@ -11,6 +11,7 @@
 #include <cstdlib>
 #include <ctime>
 
+#include "base/Calendar.h"
 #include "base/Text.h"
 #include "hosts/linux/system/LocalSocket.h"
 
@@ -54,6 +55,7 @@ std::string journalDatagram(const JournalEntry& entry) {
 /// "Jan  5 09:00:00", whatever the locale.
 std::string syslogTime(std::time_t time) {
   constexpr std::array months{"Jan", "Feb", "Mar", "Apr", "May", "Jun", "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
+  if (!std::getenv("TZ")) setDefaultTimeZone("/etc/localtime");  // the library by itself would open it whatever it is
   std::tm local{};
   ::localtime_r(&time, &local);
   std::array<char, 32> rest{};

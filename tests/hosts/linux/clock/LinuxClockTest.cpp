@@ -1,9 +1,15 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
+#include <sys/stat.h>
+#include <systemd/sd-bus.h>
+
+#include <atomic>
 
 #include "base/Calendar.h"
 #include "effects/EffectMatchers.h"
+#include "hosts/linux/AsMember.h"
+#include "hosts/linux/BusPeer.h"
 #include "hosts/linux/LinuxContractMachines.h"
 #include "hosts/linux/clock/LocalTime.h"
 #include "hosts/linux/clock/SystemClock.h"
@@ -69,6 +75,56 @@ TEST(LocalTime, KeepsTheZoneWhenTheNewOneHasNoFile) {
   EXPECT_EQ(tree.file("/etc/timezone"), "Asia/Tokyo\n");
 }
 
+/// Puts something in the place of a file that cannot be looked at, or that keeps a reader waiting.
+void obstruct(const LinuxTree& tree, const std::string& path, bool isFifo) {
+  const auto place = tree.at(path);
+  std::filesystem::create_directories(place.parent_path());
+  std::filesystem::remove_all(place);
+  isFifo ? static_cast<void>(::mkfifo(place.c_str(), 0600)) : std::filesystem::create_symlink(place.filename(), place);
+}
+
+TEST(LocalTime, IsSetWhereAllCanBeLookedAtOnly) {
+  const ZoneName paris{"Europe/Paris"};
+  for (const auto& [path, isHarmless] :
+       {std::pair<std::string, bool>("/etc/localtime", true), {"/etc/timezone", false}, {paris.file(), false}}) {
+    for (const bool isFifo : {false, true}) {
+      LinuxTree tree;
+      auto& clock = tree.host().clock();
+      tree.write(paris.file(), "TZif2");
+      obstruct(tree, path, isFifo);
+      EXPECT_EQ(clock.timeZone(), utc());
+      clock.setTimeZone(paris);
+      EXPECT_EQ(tree.lastEffect().outcome, isHarmless ? Outcome::applied : Outcome::failed) << path;
+      EXPECT_EQ(tree.has("/etc/localtime"), isHarmless) << path;
+      setDefaultTimeZone(clock.rulesOf(paris));
+    }
+  }
+}
+
+TEST(LocalTime, IsNotHalfSetByWhoIsNotRoot) {
+  LinuxTree tree;
+  auto& clock = tree.host().clock();
+  std::atomic<int> calls = 0;
+  tree.write("/run/systemd/system/x", "");
+  tree.write("/run/tavisk/lock", "");
+  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+    if (member == "Get") return sd_bus_reply_method_return(call, "v", "s", calls == 0 ? "UTC" : "Europe/Paris");
+    ++calls;
+    tree.link("/etc/localtime", "../usr/share/zoneinfo/" + firstText(call));
+    return sd_bus_reply_method_return(call, "");
+  });
+  tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif2");
+  tree.write("/etc/timezone", "UTC\n");
+  clock.setTimeZone({"Mars/Olympus"});  // the fake lets root connect only
+  const AsMember member(tree);
+  clock.setTimeZone({"Europe/Paris"});
+  EXPECT_THAT(tree.lastEffect(), FailedFor("/etc/timezone: needs root: sudo tavisk"));
+  EXPECT_EQ(calls, 0);
+  std::filesystem::remove(tree.at("/etc/timezone"));
+  clock.setTimeZone({"Europe/Paris"});
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
+}
+
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, ClockContract, ClockOf<LinuxTree>);
 
 TEST(LinuxClock, LeavesTheClockOfThisMachineAloneAndNamesWhatWouldSetItBack) {
@@ -80,15 +136,38 @@ TEST(LinuxClock, LeavesTheClockOfThisMachineAloneAndNamesWhatWouldSetItBack) {
   EXPECT_EQ(tree.lastEffect().undoneBy, "VBoxService");
 }
 
+TEST(LocalTime, IsSetAnewWhereTheDaemonGoesByAnother) {
+  LinuxTree tree;
+  std::string daemons = "Asia/Tokyo";
+  tree.write("/run/systemd/system/x", "");
+  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+    if (member == "Get") return sd_bus_reply_method_return(call, "v", "s", daemons.c_str());
+    daemons = firstText(call);
+    return sd_bus_reply_method_return(call, "");
+  });
+  tree.write("/usr/share/zoneinfo/UTC", "TZif2");
+  tree.link("/etc/localtime", "/usr/share/zoneinfo/UTC");
+  for (const auto outcome : {Outcome::applied, Outcome::unchanged}) {
+    tree.host().clock().setTimeZone(utc());
+    EXPECT_EQ(tree.lastEffect().outcome, outcome);
+  }
+  EXPECT_EQ(tree.log.effects.front().before, "UTC, Asia/Tokyo in org.freedesktop.timedate1");
+}
+
 TEST(LinuxClock, ReadsTheHardwareClockInTheTimeThatItKeeps) {
   LinuxTree tree;
   const SystemRoot root(tree.at("/"));
-  EXPECT_EQ(hardwareTime(root), std::nullopt);
+  EXPECT_EQ(*hardwareTime(root), std::nullopt);
   setDefaultTimeZone("/usr/share/zoneinfo/Asia/Tokyo");
+  obstruct(tree, "/sys/class/rtc/rtc0/since_epoch", false);
+  EXPECT_FALSE(hardwareTime(root));
+  std::filesystem::remove(tree.at("/sys/class/rtc/rtc0/since_epoch"));
   tree.write("/sys/class/rtc/rtc0/since_epoch", "1166999400\n");
-  EXPECT_EQ(hardwareTime(root), 1'166'999'400);
+  EXPECT_EQ(*hardwareTime(root), 1'166'999'400);
   tree.write("/etc/adjtime", "0.0 0 0.0\n0\nLOCAL\n");
-  EXPECT_EQ(hardwareTime(root), 1'166'999'400 - 9 * 3600);
+  EXPECT_EQ(*hardwareTime(root), 1'166'999'400 - 9 * 3600);
+  obstruct(tree, "/etc/adjtime", true);
+  EXPECT_FALSE(hardwareTime(root));
 }
 
 TEST(AskedTime, IsWhatTheClocksSayWhenTheyAreNear) {
@@ -101,7 +180,7 @@ TEST(AskedTime, IsWhatTheClocksSayWhenTheyAreNear) {
     AskedTime asked(now + ahead);
     asked.isNow();
     EXPECT_EQ(asked.onSystemClock() == now + ahead, system) << ahead;
-    EXPECT_EQ(asked.onHardwareClock(root) == now + ahead, hardware) << ahead;
+    EXPECT_EQ(*asked.onHardwareClock(root) == now + ahead, hardware) << ahead;
   }
 }
 

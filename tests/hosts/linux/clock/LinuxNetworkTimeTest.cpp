@@ -3,6 +3,7 @@
 #include <gmock/gmock.h>
 
 #include "effects/EffectMatchers.h"
+#include "hosts/linux/AsMember.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/clock/TimeDaemons.h"
 #include "platform/NetworkTimeContract.h"
@@ -68,6 +69,12 @@ TEST_F(ChronyTest, WritesNoServerThatTheClientDoesNotRead) {
   client.setServer({"other.example"});
   EXPECT_THAT(tree.lastEffect(), UnsupportedFor("sourcedir"));
   EXPECT_EQ(client.server().address, "pool.example") << "chronyd does not read the tool's own file any more";
+  std::filesystem::remove(tree.at("/etc/chrony/chrony.conf"));
+  tree.link("/etc/chrony/chrony.conf", "chrony.conf");
+  client.setServer({"other.example"});
+  EXPECT_THAT(tree.lastEffect(), FailedFor("symbolic links")) << "whether it reads it is not known";
+  EXPECT_EQ(client.server().address, "");
+  EXPECT_THAT(tree.lastEffect(), FailedFor("/etc/chrony/chrony.conf"));
 }
 
 TEST_F(ChronyTest, TellsWhenSuccessChangedNothing) {
@@ -77,6 +84,13 @@ TEST_F(ChronyTest, TellsWhenSuccessChangedNothing) {
     client.start();
     EXPECT_THAT(tree.lastEffect(), FailedFor(why));
   }
+}
+
+TEST_F(ChronyTest, IsNotTurnedOnUntilTheNextStartOnlyByWhoIsNotRoot) {
+  tree.write("/run/tavisk/lock", "");
+  const AsMember member(tree);
+  client.start();
+  EXPECT_THAT(tree.lastEffect(), FailedFor("start on chrony.service: needs root: sudo tavisk"));
 }
 
 struct ServerFiles {
@@ -90,7 +104,7 @@ std::string firstServer(const char* program, const ServerFiles& configured) {
   for (const auto& [path, text] : configured.files) tree.write(path, text);
   const SystemRoot root(tree.at("/"));
   for (const auto& client : timeDaemons())
-    if (std::string_view(client.daemon.program) == program) return client.server(root);
+    if (std::string_view(client.daemon.program) == program) return *client.server(root);
   return "no such program";
 }
 

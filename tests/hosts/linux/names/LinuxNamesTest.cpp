@@ -35,15 +35,20 @@ struct NamesTest : testing::Test {
 };
 
 TEST(HostNameFiles, RenameTheMachineInHostsAndNobodyElse) {
-  const std::tuple<const char*, const char*, const char*, const char*> cases[] = {
-      {"127.0.1.1\told\n", "old", "new", "127.0.1.1\tnew\n"},
-      {"127.0.1.1 old.lan old # me\n", "old", "new", "127.0.1.1\tnew.lan new # me\n"},
-      {"127.0.1.1 old.lan old\n", "old.lan", "new", "127.0.1.1\tnew.lan new\n"},
-      {"127.0.1.1 old.lan old alias\n", "old", "new.example", "127.0.1.1\tnew.example new alias\n"},
-      {"127.0.1.1 old.lan", "old", "new", "127.0.1.1\tnew.lan new"},
-      {"127.0.1.1 older alias\n", "old", "new", "127.0.1.1 older alias\n"},
-      {"127.0.1.1 alias\n", "", "new", "127.0.1.1 alias\n"},
-      {"127.0.0.1 old\n#127.0.1.1 old\n192.0.2.1 old\n\n", "old", "new",
+  const std::tuple<const char*, std::vector<std::string>, const char*, const char*> cases[] = {
+      {"127.0.1.1\told\n", {"old"}, "new", "127.0.1.1\tnew\n"},
+      {"127.0.1.1 old.lan old # me\n", {"old"}, "new", "127.0.1.1\tnew.lan new # me\n"},
+      {"127.0.1.1 old.lan old\n", {"old.lan"}, "new", "127.0.1.1\tnew.lan new\n"},
+      {"127.0.1.1 old.lan old alias\n", {"old"}, "new.example", "127.0.1.1\tnew.example new alias\n"},
+      {"127.0.1.1 old.lan", {"old"}, "new", "127.0.1.1\tnew.lan new"},
+      {"127.0.1.1 alias kernels\n", {"stored", "kernels"}, "new", "127.0.1.1\talias new\n"},
+      {"127.0.1.1 old.lan old # me\n", {"new", ""}, "new", "127.0.1.1\tnew.lan new # me\n"},
+      {"127.0.1.1 older alias\n", {"old"}, "new.example", "127.0.1.1\tnew.example new older alias\n"},
+      {"127.0.1.1 alias\n127.0.1.1 new\n", {"new"}, "new", "127.0.1.1 alias\n127.0.1.1 new\n"},
+      {"127.0.1.1 newer\n127.0.1.1 alias\n", {""}, "new", "127.0.1.1\tnew\n127.0.1.1 alias\n"},
+      {"127.0.0.1 old\n#127.0.1.1 old\n192.0.2.1 old\n\n",
+       {"old"},
+       "new",
        "127.0.0.1 old\n#127.0.1.1 old\n192.0.2.1 old\n\n"},
   };
   for (const auto& [hosts, before, now, after] : cases) EXPECT_EQ(hostsWithName(hosts, before, now), after) << hosts;
@@ -110,13 +115,40 @@ TEST(LinuxNames, AreNotSetWhereHostsCannotBeRead) {
   EXPECT_FALSE(tree.has("/etc/hostname"));
 }
 
-TEST_F(NamesTest, CompletesAChangeThatWasCutOff) {
-  tree.write("/etc/hostname", "new\n");
+TEST(LinuxNames, CompleteAChangeThatWasCutOffAnywhere) {
+  const std::pair<const char*, const char*> places[] = {{"/etc/hostname", "new\n"},
+                                                        {"/proc/sys/kernel/hostname", "new\n"},
+                                                        {"/etc/hosts", "127.0.0.1\tlocalhost\n127.0.1.1\tnew\n"}};
+  for (unsigned done = 0; done < 8; ++done) {
+    NamedTree tree;
+    for (unsigned i = 0; i < 3; ++i)
+      if ((done >> i & 1U) != 0) tree.write(places[i].first, places[i].second);
+    for (const auto outcome : {done == 7 ? Outcome::unchanged : Outcome::applied, Outcome::unchanged}) {
+      tree.host().hostConfiguration().setLocalNetworkName("new");
+      EXPECT_EQ(tree.lastEffect().outcome, outcome) << done;
+      for (const auto& [file, text] : places) EXPECT_EQ(tree.file(file), text) << done;
+    }
+  }
+}
+
+TEST_F(NamesTest, PutHostsBackWhenTheNameIsNotStored) {
+  tree.write("/run/systemd/system/x", "");
+  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [](sd_bus_message* call, const std::string& member) {
+    if (member == "NameHasOwner") return sd_bus_reply_method_return(call, "b", 0);
+    return sd_bus_reply_method_errorf(call, "org.freedesktop.hostname1.ReadOnlyFilesystem", "no");
+  });
   names.setLocalNetworkName("new");
-  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied) << "the kernel had the old name";
-  EXPECT_EQ(tree.file("/proc/sys/kernel/hostname"), "new\n");
+  EXPECT_THAT(tree.lastEffect(), FailedFor("ReadOnlyFilesystem"));
+  EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost\n127.0.1.1\tmachine\n");
+}
+
+TEST_F(NamesTest, AreNotSetWhereTheBusCannotBeAsked) {
+  tree.write("/run/systemd/system/x", "");
+  tree.link("/run/dbus/system_bus_socket", "system_bus_socket");
   names.setLocalNetworkName("new");
-  EXPECT_EQ(tree.lastEffect().outcome, Outcome::unchanged);
+  EXPECT_THAT(tree.lastEffect(), FailedFor("symbolic links"));
+  EXPECT_EQ(tree.file("/etc/hostname"), "machine\n");
+  EXPECT_FALSE(tree.host().dynamicStore().open("test")->localHostName());
 }
 
 TEST(LinuxNames, TellsWhoWillUndoTheHostName) {

@@ -131,7 +131,7 @@ TEST_F(UnitDaemonsTest, WaitOnceForAManagerThatIsSilent) {
   const auto began = RunLoop::Clock::now();
   tree.manager.breakNext("LoadUnit", Fault::silence);
   client.start();
-  EXPECT_THAT(tree.lastEffect(), FailedFor("answer"));
+  EXPECT_THAT(tree.lastEffect(), FailedFor("timed out"));
   EXPECT_LT(RunLoop::Clock::now() - began, Bus::usualTime + std::chrono::milliseconds(500));
 }
 
