@@ -40,8 +40,8 @@ class Report(unittest.TestCase):
     def test_programs_that_are_started_get_none_of_the_descriptors(self):
         with open(self.file, "wb") as other, self.file.open("wb") as named:
             numbers = [other.fileno(), named.fileno()]
-            process = self.machine.start([], {"TAVISK_REPORT": f"fd:{numbers[1]}"}, stdin=-1, stdout=-1, pass_fds=numbers)
-            with process:
+            report = {"TAVISK_REPORT": f"fd:{numbers[1]}"}
+            with self.machine.start([], report, stdin=-1, stdout=-1, pass_fds=numbers) as process:
                 self.assertTrue(process.stdout.read(1))
                 for number in numbers:
                     with open(f"/proc/{process.pid}/fdinfo/{number}", encoding="ascii") as info:
