@@ -26,9 +26,11 @@ constexpr int refusedStatus = 1;
 constexpr std::string_view scratchPrefix = "scratch:";
 
 /// A run that cannot start says why on standard error and in the report.
-int refuse(const std::string& why, Report* report) {
+int refuse(std::string_view why, Report* report) {
   complain(why);
-  if (report) report->runRefused(why, "");
+  doStep([&] {
+    if (report) report->runRefused(std::string(why), "");
+  });
   return refusedStatus;
 }
 
@@ -68,7 +70,7 @@ int run(Report* report, int argc, char** argv) {
   RemoteServerSettings settings({**host, runLoop, notifications, output, input}, effects, report);
   const auto waiter = SignalWaiter::start(
       signals, [&](const std::string& signal) { settings.endedBySignal(signal); },
-      [&] { return settings.statusOfErrorFlag(); });
+      [&] { return settings.statusSoFar(); });
   if (!waiter) {
     output.putLine("Error installing handler!");
     signals.unblock();
@@ -83,7 +85,11 @@ int start(int argc, char** argv) {
   if (!destination) return run(nullptr, argc, argv);
   const auto report = Report::open(*destination);
   if (!report) return refuse(describe(report.failure()), nullptr);
-  return run(report->get(), argc, argv);
+  try {
+    return run(report->get(), argc, argv);
+  } catch (const std::exception& error) {
+    return refuse(reasonOf(error), report->get());
+  }
 }
 
 }  // namespace
@@ -94,6 +100,6 @@ int main(int argc, char** argv) {
   try {
     return tavisk::start(argc, argv);
   } catch (const std::exception& error) {
-    return tavisk::refuse(error.what(), nullptr);
+    return tavisk::refuse(tavisk::reasonOf(error), nullptr);
   }
 }

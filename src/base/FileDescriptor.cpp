@@ -2,12 +2,73 @@
 // SPDX-License-Identifier: MIT
 #include "base/FileDescriptor.h"
 
+#include <fcntl.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <array>
 #include <cerrno>
+#include <chrono>
+#include <thread>
 
 namespace tavisk {
+namespace {
+
+/// Takes what was written off the front of the contents. 0, or the errno by which a write failed.
+int writeFrom(std::string_view& contents, const FileDescriptor& file) {
+  while (!contents.empty()) {
+    const auto count = ::write(file.number(), contents.data(), contents.size());
+    if (count < 0 && errno == EINTR) continue;
+    if (count < 0) return errno;
+    contents.remove_prefix(static_cast<std::size_t>(count));
+  }
+  return 0;
+}
+
+/// A record lock on a whole file, as it tells two runs apart also where both have the descriptor from one parent.
+class AppendLock final {
+ public:
+  explicit AppendLock(const FileDescriptor& file) : _file(file) {
+    constexpr int attempts = 50;
+    for (int attempt = 0; attempt < attempts && !set(F_WRLCK) && (errno == EAGAIN || errno == EACCES); ++attempt) {
+      std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+  }
+  AppendLock(const AppendLock&) = delete;
+  AppendLock& operator=(const AppendLock&) = delete;
+  ~AppendLock() { set(F_UNLCK); }
+
+ private:
+  bool set(short type) const {
+    struct flock lock {};
+    lock.l_type = type;
+    lock.l_whence = SEEK_SET;
+    return ::fcntl(_file.number(), F_SETLK, &lock) == 0;
+  }
+
+  const FileDescriptor& _file;
+};
+
+bool isAppending(const FileDescriptor& file) {
+  return (::fcntl(file.number(), F_GETFL) & O_APPEND) != 0;
+}
+
+/// Where the next byte of a regular file goes; negative for what has no such place.
+off_t placeOfNextByte(const FileDescriptor& file) {
+  struct stat status {};
+  if (::fstat(file.number(), &status) != 0 || !S_ISREG(status.st_mode)) return -1;
+  return isAppending(file) ? status.st_size : ::lseek(file.number(), 0, SEEK_CUR);
+}
+
+bool takeBack(const FileDescriptor& file, off_t begin, std::size_t written) {
+  struct stat status {};
+  const auto end = begin + static_cast<off_t>(written);
+  if (begin < 0 || ::fstat(file.number(), &status) != 0 || status.st_size != end) return false;
+  if (::ftruncate(file.number(), begin) != 0) return false;
+  return isAppending(file) || ::lseek(file.number(), begin, SEEK_SET) == begin;
+}
+
+}  // namespace
 
 FileDescriptor& FileDescriptor::operator=(FileDescriptor&& other) noexcept {
   std::swap(_number, other._number);
@@ -32,13 +93,19 @@ Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const
 }
 
 Result<void> writeAll(const FileDescriptor& file, std::string_view contents, const std::string& path) {
-  while (!contents.empty()) {
-    const auto count = ::write(file.number(), contents.data(), contents.size());
-    if (count < 0 && errno == EINTR) continue;
-    if (count < 0) return systemFailure("write", path, errno);
-    contents.remove_prefix(static_cast<std::size_t>(count));
-  }
-  return {};
+  const int error = writeFrom(contents, file);
+  return error == 0 ? Result<void>() : systemFailure("write", path, error);
+}
+
+Result<void> appendLine(const FileDescriptor& file, std::string_view line, const std::string& path) {
+  const AppendLock lock(file);
+  const auto begin = placeOfNextByte(file);
+  auto rest = line;
+  const int error = writeFrom(rest, file);
+  if (error == 0) return {};
+  const auto written = line.size() - rest.size();
+  if (written > 0 && !takeBack(file, begin, written)) static_cast<void>(!::write(file.number(), "\n", 1));
+  return systemFailure("write", path, error);
 }
 
 }  // namespace tavisk

@@ -37,4 +37,9 @@ Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const
 /// Every byte, however many calls it takes.
 Result<void> writeAll(const FileDescriptor& file, std::string_view contents, const std::string& path);
 
+/// A line with its newline, whole or not at all: the part of it that found room in a regular file is taken back. Where
+/// that cannot be (a pipe, or others have written meanwhile) the part is made a line of its own, if it can be, so that
+/// the next line is whole. Runs that append to the same file wait for each other, but not for long.
+Result<void> appendLine(const FileDescriptor& file, std::string_view line, const std::string& path);
+
 }  // namespace tavisk

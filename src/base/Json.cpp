@@ -72,6 +72,16 @@ JsonObject& JsonObject::json(std::string_view name, std::string_view value) {
   return *this;
 }
 
+JsonObject& JsonObject::array(std::string_view name, std::initializer_list<std::span<const std::string>> parts) {
+  json(name, "[");
+  for (const auto& part : parts) {
+    for (const auto& element : part) (_members += element) += ',';
+  }
+  if (_members.ends_with(',')) _members.pop_back();
+  _members += ']';
+  return *this;
+}
+
 void JsonObject::name(std::string_view name) {
   if (_members.size() > 1) _members += ',';
   appendString(_members, name);

@@ -2,7 +2,21 @@
 // SPDX-License-Identifier: MIT
 #include "base/Locks.h"
 
+#include <chrono>
+#include <thread>
+
 namespace tavisk {
+
+std::unique_lock<std::mutex> lockSoon(std::mutex& mutex) {
+  // Not a timed mutex: the thread sanitizer of gcc 12 does not know how that one waits.
+  constexpr int attempts = 50;
+  std::unique_lock lock(mutex, std::try_to_lock);
+  for (int attempt = 0; !lock && attempt < attempts; ++attempt) {
+    std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    static_cast<void>(lock.try_lock());
+  }
+  return lock;
+}
 
 void ConditionLock::lock() {
   std::unique_lock guard(_mutex);

@@ -7,6 +7,9 @@
 
 namespace tavisk {
 
+/// Takes the mutex, but gives up after 50 ms or a little more: its holder may be stuck for good.
+std::unique_lock<std::mutex> lockSoon(std::mutex& mutex);
+
 /// A lock that carries an integer condition: a thread may wait for the lock until the condition has a value.
 /// Any thread may unlock it.
 class ConditionLock {

@@ -10,7 +10,7 @@
 #include <cstdio>
 #include <cstring>
 #include <ctime>
-#include <exception>
+#include <new>
 #include <string_view>
 #include <system_error>
 #include <utility>
@@ -47,11 +47,16 @@ bool prepareProcess() {
   static_cast<void>(std::signal(SIGPIPE, SIG_IGN));
   static_cast<void>(std::signal(SIGXFSZ, SIG_IGN));
   keepKnownVariables();
+  static_cast<void>(close_range(STDERR_FILENO + 1, ~0U, CLOSE_RANGE_CLOEXEC));
   return openMissingDescriptors();
 }
 
-void complain(const std::string& text) {
-  static_cast<void>(std::fputs(("tavisk: " + text + "\n").c_str(), stderr));
+void complain(std::string_view text) {
+  static_cast<void>(std::fprintf(stderr, "tavisk: %.*s\n", static_cast<int>(text.size()), text.data()));
+}
+
+std::string_view reasonOf(const std::exception& error) {
+  return dynamic_cast<const std::bad_alloc*>(&error) ? "out of memory" : error.what();
 }
 
 EndingSignals::EndingSignals() : _set() {
@@ -96,19 +101,16 @@ void SignalWaiter::wait() {
 
 void SignalWaiter::endProcess(const std::string& signal) {
   const auto end = [this, signal] {
-    try {
-      _end(signal);
-    } catch (const std::exception&) {
-      // What cannot be done any more is left undone.
-    }
+    doStep([&] { _end(signal); });
     _exit(_status());
   };
   try {
     std::thread(end).detach();
-  } catch (const std::system_error&) {
+  } catch (const std::exception&) {
     end();
   }
-  sigtimedwait(&_signals, nullptr, &endTakesAtMost);
+  // Every signal is blocked in this thread: it sleeps for all of the time.
+  nanosleep(&endTakesAtMost, nullptr);
   _exit(_status());
 }
 

@@ -4,9 +4,11 @@
 
 #include <atomic>
 #include <csignal>
+#include <exception>
 #include <functional>
 #include <memory>
 #include <string>
+#include <string_view>
 #include <thread>
 
 namespace tavisk {
@@ -15,12 +17,25 @@ namespace tavisk {
 /// cannot be used at all: no standard descriptors and no /dev/null.
 ///
 /// Standard descriptors that are closed are opened such that reads find the end and writes fail: no other file can take
-/// their place. Writing to a closed pipe or beyond the size limit becomes an error. Of the environment, only TAVISK_*,
-/// LANG, LC_*, TERM, NO_COLOR and SUDO_UID are kept.
+/// their place. All others are closed in programs that this one starts. Writing to a closed pipe or beyond the size
+/// limit becomes an error. Of the environment, only TAVISK_*, LANG, LC_*, TERM, NO_COLOR and SUDO_UID are kept.
 bool prepareProcess();
 
-/// One line on standard error: "tavisk: TEXT".
-void complain(const std::string& text);
+/// One line on standard error: "tavisk: TEXT". Asks for no memory.
+void complain(std::string_view text);
+
+/// What people are told of an exception, in one piece with the object: "out of memory".
+std::string_view reasonOf(const std::exception& error);
+
+/// Does one step of the end of a run, whose other steps are done also when this one throws.
+template <typename Step>
+void doStep(const Step& step) noexcept {
+  try {
+    step();
+  } catch (const std::exception&) {
+    // What cannot be done any more is left undone.
+  }
+}
 
 /// The signals that end a run: INT, TERM, and HUP unless the run was started with it ignored, as nohup(1) does.
 /// Making one blocks them in this thread and in all threads that it starts from then on.
@@ -36,7 +51,7 @@ class EndingSignals {
 };
 
 /// A thread that waits for the ending signals and then ends the process within 100 ms, wherever the other threads are:
-/// what takes longer is left undone, and a second signal ends it at once.
+/// what takes longer is left undone. Further signals change nothing.
 class SignalWaiter {
  public:
   /// What is done before the end, given the name of the signal ("SIGTERM"). Called in a thread of its own.

@@ -116,9 +116,10 @@ struct RunLoop::State {
 
   void cancel(Watch& watch) {
     watch.isCancelled = true;
-    auto& others = watches[watch.descriptor];
-    std::erase_if(others, [&watch](const auto& other) { return other.get() == &watch; });
-    if (others.empty()) watches.erase(watch.descriptor);
+    const auto others = watches.find(watch.descriptor);
+    if (others == watches.end()) return;
+    std::erase_if(others->second, [&watch](const auto& other) { return other.get() == &watch; });
+    if (others->second.empty()) watches.erase(others);
     updateEvents(watch.descriptor);
   }
 
@@ -268,22 +269,24 @@ void RunLoop::post(Work work) {
 
 RunLoop::Registration RunLoop::after(Clock::duration delay, Work work) {
   const auto timer = std::make_shared<Timer>(Timer{Duration::zero(), std::move(work), {}});
+  auto registration = registrationOf(_state, timer);
   _state->arm(timer, afterNow(delay));
-  return registrationOf(_state, timer);
+  return registration;
 }
 
 RunLoop::Registration RunLoop::every(Clock::duration interval, Work work) {
   const auto timer = std::make_shared<Timer>(Timer{interval, std::move(work), {}});
+  auto registration = registrationOf(_state, timer);
   _state->arm(timer, afterNow(interval));
-  return registrationOf(_state, timer);
+  return registration;
 }
 
 RunLoop::Registration RunLoop::watch(int descriptor, Readiness readiness, Work work) {
   const std::uint32_t events = readiness == Readiness::readable ? EPOLLIN : EPOLLPRI;
   const auto watch = std::make_shared<Watch>(Watch{descriptor, events, std::move(work)});
+  auto registration = registrationOf(_state, watch);
   _state->watches[descriptor].push_back(watch);
-  if (_state->updateEvents(descriptor)) return registrationOf(_state, watch);
-  _state->cancel(*watch);
+  if (_state->updateEvents(descriptor)) return registration;
   return {};
 }
 

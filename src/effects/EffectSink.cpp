@@ -3,28 +3,23 @@
 #include "effects/EffectSink.h"
 
 #include <algorithm>
-#include <chrono>
-#include <thread>
+#include <exception>
+
+#include "base/Locks.h"
 
 namespace tavisk {
-namespace {
-
-/// Takes the mutex, but gives up when its holder does not let go: the holder may be stuck for good.
-/// (Not a timed mutex: the thread sanitizer of gcc 12 does not know how that one waits.)
-std::unique_lock<std::mutex> lockSoon(std::mutex& mutex) {
-  constexpr int attempts = 50;
-  std::unique_lock lock(mutex, std::try_to_lock);
-  for (int attempt = 0; !lock && attempt < attempts; ++attempt) {
-    std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    static_cast<void>(lock.try_lock());
-  }
-  return lock;
-}
-
-}  // namespace
 
 void EffectChannel::changeBegins(const std::string& /*setting*/, const std::string& /*asked*/) {}
+void EffectChannel::changeEnds(const std::string& /*setting*/) {}
 void EffectChannel::observe(const SettingValue& /*value*/) {}
+
+Effect unfinishedChange(const std::string& setting, const std::string& asked, const std::string& why) {
+  return {.setting = setting,
+          .outcome = Outcome::failed,
+          .asked = asked,
+          .note = "it may be made, or a part of it",
+          .failure = Failure{"change", setting, why}};
+}
 
 void EffectSink::addChannel(EffectChannel& channel) {
   const std::scoped_lock lock(_mutex);
@@ -34,14 +29,14 @@ void EffectSink::addChannel(EffectChannel& channel) {
 void EffectSink::changeBegins(const std::string& setting, const std::string& asked) {
   const std::scoped_lock lock(_mutex);
   _open.push_back({setting, asked});
-  for (auto* channel : _channels) channel->changeBegins(setting, asked);
+  tellAll([&](EffectChannel& channel) { channel.changeBegins(setting, asked); });
 }
 
 void EffectSink::record(const Effect& effect) {
   const std::scoped_lock lock(_mutex);
   const auto open = std::ranges::find(_open, effect.setting, &OpenChange::setting);
   if (open != _open.end()) _open.erase(open);
-  for (auto* channel : _channels) channel->record(effect);
+  tellEnd(effect);
 }
 
 void EffectSink::recordFailure(const std::string& setting, const Failure& failure,
@@ -55,21 +50,34 @@ void EffectSink::recordUnsupported(const std::string& setting, const Failure& re
 
 void EffectSink::observe(const SettingValue& value) {
   const std::scoped_lock lock(_mutex);
-  for (auto* channel : _channels) channel->observe(value);
+  tellAll([&](EffectChannel& channel) { channel.observe(value); });
 }
 
 void EffectSink::interrupt(const std::string& why) {
   const auto lock = lockSoon(_mutex);
   if (!lock) return;
-  for (const auto& open : _open) {
-    const Effect effect{.setting = open.setting,
-                        .outcome = Outcome::failed,
-                        .asked = open.asked,
-                        .failure = Failure{"change", open.setting, why},
-                        .changed = true};
-    for (auto* channel : _channels) channel->record(effect);
-  }
+  for (const auto& open : _open) tellEnd(unfinishedChange(open.setting, open.asked, why));
   _open.clear();
+}
+
+void EffectSink::tellEnd(const Effect& effect) const {
+  tellAll([&](EffectChannel& channel) {
+    channel.record(effect);
+    channel.changeEnds(effect.setting);
+  });
+}
+
+template <typename Tell>
+void EffectSink::tellAll(const Tell& tell) const {
+  std::exception_ptr failure;
+  for (auto* channel : _channels) {
+    try {
+      tell(*channel);
+    } catch (const std::exception&) {
+      failure = std::current_exception();
+    }
+  }
+  if (failure) std::rethrow_exception(failure);
 }
 
 }  // namespace tavisk

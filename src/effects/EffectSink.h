@@ -18,8 +18,13 @@ class EffectChannel {
   virtual ~EffectChannel() = default;
   virtual void changeBegins(const std::string& setting, const std::string& asked);
   virtual void record(const Effect& effect) = 0;
+  /// Follows record() of whatever has that name, unless that has thrown. Must not throw.
+  virtual void changeEnds(const std::string& setting);
   virtual void observe(const SettingValue& value);
 };
+
+/// What is told of a change that has begun, and of whose end nothing is known.
+Effect unfinishedChange(const std::string& setting, const std::string& asked, const std::string& why);
 
 /// Where hosts tell what really happened. It hands everything on to its channels and remembers the changes that have
 /// begun and not ended, so that a run which is ended in the middle leaves its trace.
@@ -47,6 +52,11 @@ class EffectSink {
     std::string setting;
     std::string asked;
   };
+  void tellEnd(const Effect& effect) const;
+  /// Tells each channel, also after one that throws; then throws that again.
+  template <typename Tell>
+  void tellAll(const Tell& tell) const;
+
   std::mutex _mutex;
   std::vector<EffectChannel*> _channels;
   std::vector<OpenChange> _open;

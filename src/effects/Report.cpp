@@ -6,10 +6,13 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
+#include <new>
 #include <string_view>
 
 #include "base/Json.h"
+#include "base/Locks.h"
 #include "base/Process.h"
 #include "base/Text.h"
 
@@ -18,14 +21,16 @@ namespace {
 
 constexpr const char* task = "write the report";
 constexpr std::string_view descriptorPrefix = "fd:";
+constexpr std::size_t roomForLine = 65536;
 
-/// A descriptor of our own for what "fd:N" names; that one stays open.
+/// A descriptor of our own for what "fd:N" names; that one stays open, in this program alone.
 Result<FileDescriptor> copyDescriptor(const std::string& destination) {
   const auto number = parseNumber<int>(std::string_view(destination).substr(descriptorPrefix.size()));
   const auto flags = number && *number >= 0 ? ::fcntl(*number, F_GETFL) : -1;
   if (flags < 0 || (flags & O_ACCMODE) == O_RDONLY) return systemFailure(task, destination, EBADF);
   FileDescriptor copy(::fcntl(*number, F_DUPFD_CLOEXEC, 0));
   if (!copy) return systemFailure(task, destination, errno);
+  if (*number > STDERR_FILENO) ::fcntl(*number, F_SETFD, FD_CLOEXEC);
   return copy;
 }
 
@@ -39,13 +44,11 @@ Result<FileDescriptor> openFile(const std::string& path) {
   return Failure{task, path, "not a regular file"};
 }
 
-std::string toArray(const std::vector<std::string>& elements) {
-  std::string array = "[";
-  for (const auto& element : elements) array += (array.size() > 1 ? "," : "") + element;
-  return array + "]";
-}
-
 }  // namespace
+
+Report::Report(FileDescriptor file) : _file(std::move(file)) {
+  _line.reserve(roomForLine);
+}
 
 Result<std::unique_ptr<Report>> Report::open(const std::string& destination) {
   auto file = destination.starts_with(descriptorPrefix) ? copyDescriptor(destination) : openFile(destination);
@@ -62,27 +65,45 @@ void Report::commandBegins(const std::string& command, std::span<const std::stri
 }
 
 void Report::commandEnds(bool failed, const std::string& output) {
-  const auto entry = takeEntry();
-  if (entry.command) append(entry, failed, output);
+  auto entry = takeEntry();
+  if (entry.command) append(std::move(entry), failed, output);
 }
 
 void Report::wordRefused(const std::string& word, bool failed, const std::string& output) {
   auto entry = takeEntry();
   entry.command = word;
   entry.error = "not a valid command";
-  append(entry, failed, output);
+  append(std::move(entry), failed, output);
 }
 
 void Report::runRefused(const std::string& error, const std::string& output) {
   auto entry = takeEntry();
   entry.error = error;
-  append(entry, true, output);
+  append(std::move(entry), true, output);
 }
 
 void Report::runEndedBySignal(const std::string& signal, bool failed, const std::string& output) {
   auto entry = takeEntry();
   entry.signal = signal;
-  append(entry, failed, output);
+  append(std::move(entry), failed, output);
+}
+
+void Report::changeBegins(const std::string& setting, const std::string& asked) {
+  auto name = setting;
+  auto effect = tavisk::toJson(unfinishedChange(setting, asked, "its end is not known"));
+  const std::scoped_lock lock(_mutex);
+  _entry.open.reserve(_entry.open.size() + 1);
+  _entry.unfinished.reserve(_entry.unfinished.size() + 1);
+  _entry.open.push_back(std::move(name));
+  _entry.unfinished.push_back(std::move(effect));
+}
+
+void Report::changeEnds(const std::string& setting) {
+  const std::scoped_lock lock(_mutex);
+  const auto open = std::ranges::find(_entry.open, setting);
+  if (open == _entry.open.end()) return;
+  _entry.unfinished.erase(_entry.unfinished.begin() + (open - _entry.open.begin()));
+  _entry.open.erase(open);
 }
 
 void Report::record(const Effect& effect) {
@@ -102,8 +123,8 @@ Report::Entry Report::takeEntry() {
   return std::exchange(_entry, {});
 }
 
-std::string Report::toJson(const Entry& entry, bool failed, const std::string& output) {
-  JsonObject object;
+std::string Report::toJson(std::string room, const Entry& entry, bool failed, const std::string& output) {
+  JsonObject object(std::move(room));
   object.integer("report", 1);
   const auto textIfPresent = [&](const char* name, const std::optional<std::string>& value) {
     if (value) object.text(name, *value);
@@ -115,15 +136,32 @@ std::string Report::toJson(const Entry& entry, bool failed, const std::string& o
   textIfPresent("signal", entry.signal);
   object.boolean("failed", failed);
   object.boolean("changed", entry.changed);
-  object.json("values", toArray(entry.values));
-  object.json("effects", toArray(entry.effects));
+  object.array("values", {entry.values});
+  object.array("effects", {entry.effects, entry.unfinished});
   object.text("output", output);
-  return object.str();
+  auto line = object.str();
+  line += '\n';
+  return line;
 }
 
-void Report::append(const Entry& entry, bool failed, const std::string& output) const {
-  const auto written = writeAll(_file, toJson(entry, failed, output) + "\n", "report");
-  if (!written) complain("report: " + written.failure().why);
+void Report::append(Entry entry, bool failed, const std::string& output) {
+  const auto lock = lockSoon(_writing);
+  if (!lock) return lose("report: it takes no more");
+  try {
+    _line = toJson(std::move(_line), entry, failed, output);
+  } catch (const std::bad_alloc&) {
+    entry.values.clear();
+    entry.effects.clear();
+    entry.argument.reset();
+    entry.error = "out of memory";
+    _line = toJson({}, entry, failed, {});
+  }
+  const auto written = appendLine(_file, _line, "report");
+  if (!written) lose("report: " + written.failure().why);
+}
+
+void Report::lose(std::string_view why) {
+  if (!_isLost.exchange(true)) complain(why);
 }
 
 }  // namespace tavisk

@@ -2,11 +2,14 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
+#include <cstddef>
 #include <memory>
 #include <mutex>
 #include <optional>
 #include <span>
 #include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -16,14 +19,15 @@
 
 namespace tavisk {
 
-/// What a run did, for other programs: one JSON object a command, each on its own line and appended by one write.
+/// What a run did, for other programs: one JSON object a command, each a line that is appended whole or not at
+/// all. One that is not is told on standard error, once a run.
 ///
 /// Members, in this order; those marked * only where they apply:
 ///   report     1, the version of this format
 ///   command *  the word as it was typed
 ///   argument * the argument as it was typed, when the command takes one
 ///   handler *  the selector
-///   error *    why the word or the whole run was refused
+///   error *    why the word or the whole run was refused, or broken off ("out of memory")
 ///   signal *   the signal that ended the run ("SIGTERM"); command, argument and handler are those it interrupted
 ///   failed     the error flag afterwards; true when the run was refused
 ///   changed    whether the machine differs from before, or may differ
@@ -31,11 +35,12 @@ namespace tavisk {
 ///   effects    array of what was changed, or could not be changed or read; see Effect. A failure between two commands
 ///              is told with the next one
 ///   output     the printed text, at most its first MiB
+/// Where there is no memory for an object, its argument, values, effects and output are left out.
 /// Texts that are not UTF-8 have U+FFFD for the bytes in question.
 class Report final : public EffectChannel {
  public:
   /// `destination` is the path of a regular file, which is made (mode 0600) or appended to and must not be a link, or
-  /// "fd:N" for a descriptor that is open for writing; that one is not closed.
+  /// "fd:N" for a descriptor that is open for writing; that one is not closed here, but in programs that are started.
   static Result<std::unique_ptr<Report>> open(const std::string& destination);
 
   /// From here to the end, effects and values belong to this command.
@@ -43,11 +48,17 @@ class Report final : public EffectChannel {
   /// Does nothing when no command has begun.
   void commandEnds(bool failed, const std::string& output);
   void wordRefused(const std::string& word, bool failed, const std::string& output);
+  /// Also of a run that is broken off.
   void runRefused(const std::string& error, const std::string& output);
   /// From any thread.
   void runEndedBySignal(const std::string& signal, bool failed, const std::string& output);
 
+  /// Whether an object could not be kept. From any thread.
+  bool isLost() const { return _isLost; }
+
+  void changeBegins(const std::string& setting, const std::string& asked) override;
   void record(const Effect& effect) override;
+  void changeEnds(const std::string& setting) override;
   void observe(const SettingValue& value) override;
 
  private:
@@ -55,16 +66,22 @@ class Report final : public EffectChannel {
   struct Entry {
     std::optional<std::string> command, argument, handler, error, signal;
     bool changed = false;
-    std::vector<std::string> values;   ///< JSON
-    std::vector<std::string> effects;  ///< JSON
+    std::vector<std::string> values;      ///< JSON
+    std::vector<std::string> effects;     ///< JSON
+    std::vector<std::string> open;        ///< settings whose change has begun
+    std::vector<std::string> unfinished;  ///< JSON: what becomes of those if nothing more is heard of them
   };
 
-  explicit Report(FileDescriptor file) : _file(std::move(file)) {}
-  static std::string toJson(const Entry& entry, bool failed, const std::string& output);
+  explicit Report(FileDescriptor file);
+  static std::string toJson(std::string room, const Entry& entry, bool failed, const std::string& output);
   Entry takeEntry();
-  void append(const Entry& entry, bool failed, const std::string& output) const;
+  void append(Entry entry, bool failed, const std::string& output);
+  void lose(std::string_view why);
 
   const FileDescriptor _file;
+  std::mutex _writing;  // guards _line and the end of the file
+  std::string _line;    // its room is for a time without memory
+  std::atomic<bool> _isLost = false;
   std::mutex _mutex;  // guards _entry
   Entry _entry;
 };

@@ -35,7 +35,7 @@ bool RemoteServerSettings::authenticate() {
 }
 
 void RemoteServerSettings::adminDidAuthenticateNotification() {
-  untilOutputIsLost([this] { startLoop(); });
+  safely([this] { startLoop(); });
   _context.notifications.removeObserver(this);
 }
 

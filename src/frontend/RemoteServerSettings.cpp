@@ -3,6 +3,7 @@
 #include "frontend/RemoteServerSettings.h"
 
 #include <cerrno>
+#include <exception>
 #include <system_error>
 
 #include "base/Process.h"
@@ -21,7 +22,7 @@ RemoteServerSettings::~RemoteServerSettings() {
 
 bool RemoteServerSettings::runTool(int argc, char** withArguments) {
   bool isStarted = false;
-  untilOutputIsLost([&] { isStarted = setUp(argc, withArguments); });
+  safely([&] { isStarted = setUp(argc, withArguments); });
   return isStarted;
 }
 
@@ -63,8 +64,8 @@ void RemoteServerSettings::deauthenticate() {
 }
 
 void RemoteServerSettings::exit() {
-  _exitStatus = statusOfErrorFlag();
-  if (_report) _report->commandEnds(_exitStatus != 0, _context.output.takePrinted());
+  if (_report) _report->commandEnds(hasFailed(), _context.output.takePrinted());
+  _exitStatus = statusSoFar();
   const auto lostBy = _context.output.finish();
   if (lostBy && *lostBy != EPIPE) {
     complain("standard output: " + std::generic_category().message(*lostBy));
@@ -81,17 +82,43 @@ void RemoteServerSettings::untilOutputIsLost(const std::function<void()>& work) 
   }
 }
 
-int RemoteServerSettings::statusOfErrorFlag() const {
+void RemoteServerSettings::safely(const std::function<void()>& work) {
+  try {
+    untilOutputIsLost(work);
+  } catch (const std::exception& error) {
+    breakOff(reasonOf(error));
+  }
+}
+
+void RemoteServerSettings::breakOff(std::string_view why) {
+  doStep([this] { giveUpAuthorization(); });
+  doStep([&] { _effects.interrupt(std::string(why)); });
+  doStep([&] {
+    if (_report) _report->runRefused(std::string(why), _context.output.takePrinted());
+  });
+  _context.output.finish();
+  complain(why);
+  _exitStatus = 1;
+  _context.runLoop.stop();
+}
+
+bool RemoteServerSettings::hasFailed() const {
   const std::scoped_lock lock(_serverCommandsMutex);
-  return _serverCommands && _serverCommands->error() ? 1 : 0;
+  return _serverCommands && _serverCommands->error();
+}
+
+int RemoteServerSettings::statusSoFar() const {
+  return hasFailed() || (_report && _report->isLost()) ? 1 : 0;
 }
 
 void RemoteServerSettings::endedBySignal(const std::string& signal) {
   _ended = true;
   _context.input.restoreTerminal();
-  giveUpAuthorization();
-  _effects.interrupt("the run was ended by " + signal);
-  if (_report) _report->runEndedBySignal(signal, statusOfErrorFlag() != 0, _context.output.takePrinted());
+  doStep([this] { giveUpAuthorization(); });
+  doStep([&] { _effects.interrupt("the run was ended by " + signal); });
+  doStep([&] {
+    if (_report) _report->runEndedBySignal(signal, hasFailed(), _context.output.takePrinted());
+  });
   _context.output.finish();
 }
 

@@ -45,8 +45,8 @@ class RemoteServerSettings final {
   /// What is left to do before a signal ends the process: the authorization, the traces of what was under way, the
   /// printed text. Called by the thread that took the signal, while the run goes on in its own.
   void endedBySignal(const std::string& signal);
-  /// The exit status by the error flag as it stands. From any thread.
-  int statusOfErrorFlag() const;
+  /// The exit status as it stands: by the error flag, and 1 when the report is lost. From any thread.
+  int statusSoFar() const;
 
  private:
   bool setUp(int argc, char** withArguments);
@@ -56,6 +56,11 @@ class RemoteServerSettings final {
   void exit();
   /// Runs the work; when standard output is lost in it, ends the run.
   void untilOutputIsLost(const std::function<void()>& work);
+  /// The same; whatever else is thrown breaks the run off.
+  void safely(const std::function<void()>& work);
+  /// Ends the run with status 1, as far as that goes without what has failed, and says why on standard error.
+  void breakOff(std::string_view why);
+  bool hasFailed() const;
 
   bool myIsAuthenticatedAsAdministrator();
   bool authenticate();

@@ -159,6 +159,8 @@ unsigned char LineEditor::run(EditLine* edit, wint_t /*key*/) {
 }
 
 unsigned char LineEditor::complete() {
+  // A tab that was pasted is a part of the line: what is in it is up to whoever copied it.
+  if (TerminalKeys::isMoreWaiting()) return replace({}, "\t");
   const auto* line = _library.el_wline(_edit);
   const auto text = bytesOf({line->buffer, line->cursor});
   const auto typed = text.substr(text.rfind(' ') + 1);

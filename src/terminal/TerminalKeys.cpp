@@ -3,6 +3,7 @@
 #include "terminal/TerminalKeys.h"
 
 #include <pthread.h>
+#include <sys/ioctl.h>
 #include <sys/signalfd.h>
 #include <unistd.h>
 
@@ -51,6 +52,11 @@ std::optional<wchar_t> TerminalKeys::next(const TerminalSignals& signals) {
     if (!byte) return _typed.takeRest();
     _typed.add(*byte);
   }
+}
+
+bool TerminalKeys::isMoreWaiting() {
+  int count = 0;
+  return ::ioctl(STDIN_FILENO, FIONREAD, &count) == 0 && count > 0;
 }
 
 std::optional<char> TerminalKeys::nextByte(const TerminalSignals& signals) {

@@ -42,6 +42,8 @@ class TerminalKeys final {
 
   /// Absent at the end of input.
   std::optional<wchar_t> next(const TerminalSignals& signals);
+  /// Whether more is there already: then it was hardly typed by hand.
+  static bool isMoreWaiting();
 
  private:
   std::optional<char> nextByte(const TerminalSignals& signals);

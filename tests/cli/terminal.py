@@ -5,6 +5,7 @@
 import fcntl
 import os
 import pty
+import re
 import select
 import struct
 import sys
@@ -32,6 +33,14 @@ class Terminal:
 
     def type(self, text):
         os.write(self.end, text.encode(errors="surrogateescape"))
+
+    def type_by_hand(self, text):
+        """A tab is followed by nothing until the program has had it."""
+        for piece in re.findall("[^\t]*\t|[^\t]+", text):
+            self.type(piece)
+            while piece.endswith("\t") and fcntl.ioctl(self.other_end, termios.FIONREAD, b"\0" * 4) != b"\0" * 4:
+                time.sleep(0.001)
+            time.sleep(0.05 if piece.endswith("\t") else 0)
 
     def wait_for(self, text):
         """Everything shown since the last wait, up to the text."""

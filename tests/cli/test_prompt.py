@@ -28,14 +28,14 @@ class AtThePrompt(unittest.TestCase):
 
     def answer(self, keys):
         """What a line is answered, from the end of the line to the next prompt."""
-        self.terminal.type(keys + "\n")
+        self.terminal.type_by_hand(keys + "\n")
         self.terminal.wait_for("\r\n")
         return self.terminal.wait_for("> ").removesuffix("> ").removesuffix("\n")
 
     def exchange(self, *typed_and_shown):
         for typed, shown in typed_and_shown:
             with self.subTest(typed):
-                self.terminal.type(typed)
+                self.terminal.type_by_hand(typed)
                 self.terminal.wait_for(shown)
 
     def status(self):
@@ -84,6 +84,15 @@ class AtThePrompt(unittest.TestCase):
             ("setdate -gettimez\t", "setdate: Error: -gettimez is invalid date format... use mm:dd:yy"),
             ("-bogus getda\t", "Error: -bogus is not a valid command"),
         )))
+
+    def test_a_pasted_tab_is_a_part_of_the_word(self):
+        for line, answer in (("GETDA\t", "Error: GETDA\t is not a valid command"),
+                             ("settimezone as\t", "as\t is not a valid timezone. The command "
+                              "'listtimezones' will show a list of valid time zones.")):
+            self.terminal.type(line + "\n")
+            self.terminal.wait_for("\r\n")
+            self.assertEqual(self.terminal.wait_for("\r\n> ").removesuffix("\n> "), answer)
+        self.assertNotIn("Time Zone", self.machine.read()["Clock"])
 
     def test_tab_lists_what_it_cannot_choose_among(self):
         self.exchange(("settimezone \t", "\r\nAsia/  Europe/  UTC\r\n"), ("", "> settimezone "),

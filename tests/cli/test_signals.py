@@ -67,6 +67,16 @@ class Ending(unittest.TestCase):
                 self.assertEqual(self.end(process, number), 0)
                 self.assert_given_up_once()
 
+    def test_a_second_signal_cuts_nothing_short(self):
+        for attempt in range(30):
+            with self.subTest(attempt):
+                self.machine.write({})
+                process = self.start([])
+                read_until(process.stdout, b"help.\n> ")
+                process.send_signal(signal.SIGINT)
+                self.end(process, signal.SIGTERM)
+                self.assert_given_up_once()
+
     def test_while_the_output_is_stuck_in_a_full_pipe(self):
         process = self.start(["-listtimezones"] * 40)
         time.sleep(0.3)  # until the pipe is full: there is no event for it

@@ -43,6 +43,7 @@ TEST(EffectSink, closesOnlyOpenChangesWhenInterrupted) {
     return Effect{.setting = name,
                   .outcome = Outcome::failed,
                   .asked = "x",
+                  .note = "it may be made, or a part of it",
                   .failure = Failure{"change", name, "ended by SIGINT"},
                   .changed = true};
   };

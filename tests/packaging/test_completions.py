@@ -14,6 +14,9 @@ import tempfile
 
 import shells
 
+sys.path.append(str(pathlib.Path(__file__).parents[1] / "cli"))
+from terminal import stop_without_terminals  # noqa: E402
+
 NOT_IN_HELP = ["-getkernelbootarchitecturesetting", "-setkernelbootarchitecture"]
 SYSTEM_OF_EXAMPLE = "/Volumes/Spare System/System/Library/CoreServices"
 
@@ -53,6 +56,7 @@ def main(program, documents, sources):
     if missing := [shell for shell in shells.SHELLS if not shutil.which(shell)]:
         print("skipped: there is no", *missing)
         return 77
+    stop_without_terminals()
     with tempfile.TemporaryDirectory() as folder:
         machine = shutil.copytree(pathlib.Path(sources, "packaging/machines/two-systems"), pathlib.Path(folder, "m"))
         environment = {**os.environ, "PATH": f"{pathlib.Path(program).parent}:{os.environ['PATH']}", "TERM": "dumb",
