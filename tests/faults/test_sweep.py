@@ -47,9 +47,8 @@ class Faults(unittest.TestCase):
     def test_what_a_fault_leaves(self):
         for command in COMMANDS:
             with self.subTest(command.setting):
-                found = {}
-                injection.sweep(self.place, command, found, injection.few_of)
-                print(f"{command.setting}: {found.pop('runs', 0)} runs", flush=True)
+                runs, found = injection.sweep(self.place, command, injection.few_of)
+                print(f"{command.setting}: {runs} runs", flush=True)
                 self.assertEqual([f"{kind}: {detail}" for kind, details in found.items() for detail in details], [])
 
     def test_a_new_file_is_on_the_disk_before_it_takes_the_old_one_s_place_and_then_its_name(self):
