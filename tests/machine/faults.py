@@ -69,7 +69,7 @@ AT_ONCE = [
     (("localsubnetname", "one", "two"), ("localsubnetname", "three", "four")),
     (("kernelbootarchitecture", "i386", "x86_64"), ("disablekeyboardwhenenclosurelockisengaged", "yes", "no")),
 ]
-HOLD = "exec 9<>/run/tavisk/lock; flock 9; echo $$ >&9; echo $$; exec sleep 20"
+HOLD = "exec 9<>/run/tavisk/lock; flock 9; echo $$$$ | tee /run/tavisk/lock; exec sleep 20"  # systemd-run makes $$ of it
 WAITS = ["tavisk -setcomputername Late", "setpriv --reuid alice --regid alice --init-groups tavisk -setcomputername Late"]
 
 
@@ -120,7 +120,10 @@ class FewFaults(container.Container):
 
     def sweep(self, command, results, **how):
         began = time.monotonic()
-        runs, found = injection.sweep(Inside(self._first_process), command, **how)
+        try:
+            runs, found = injection.sweep(Inside(self._first_process), command, **how)
+        except ValueError as trouble:
+            runs, found = 0, {"nothing to see": [str(trouble)]}
         results.add(f"{self.name}: {command.setting}, {runs} runs with a fault, {time.monotonic() - began:.0f} s",
                     [f"{kind}: {len(details)} times: {detail}" for kind, details in found.items() for detail in details[:3]])
 
@@ -170,5 +173,5 @@ class Faults(FewFaults):
             waited = time.monotonic() - began
         holder = held.result().output.strip()
         expected = re.compile(rf"tavisk: Computer Name: lock [^\n]*: process {holder} is changing [^\n]*\n")
-        problems += [answer.errors or answer.output for answer in answers if not expected.fullmatch(answer.errors)]
+        problems += [answer.errors or answer.output for answer in answers if not expected.search(answer.errors)]
         results.add("at once: who waits is told for whom", problems + ([] if 14 < waited < 18 else [f"{waited} s"]))
