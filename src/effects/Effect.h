@@ -27,6 +27,9 @@ struct Effect {
   std::string undoneBy = {};               ///< what else on this machine may undo it; empty: nothing known
   std::string note = {};                   ///< what an administrator should know besides
   std::optional<Failure> failure = {};     ///< set when failed or not supported
+  /// Whether the machine differs from before, live or stored, whatever the outcome: half of a change that failed is
+  /// one. True too where that could not be seen.
+  bool changed = false;
 
   bool operator==(const Effect&) const = default;
 };

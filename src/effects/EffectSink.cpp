@@ -65,7 +65,8 @@ void EffectSink::interrupt(const std::string& why) {
     const Effect effect{.setting = open.setting,
                         .outcome = Outcome::failed,
                         .asked = open.asked,
-                        .failure = Failure{"change", open.setting, why}};
+                        .failure = Failure{"change", open.setting, why},
+                        .changed = true};
     for (auto* channel : _channels) channel->record(effect);
   }
   _open.clear();

@@ -88,7 +88,7 @@ void Report::runEndedBySignal(const std::string& signal, bool failed, const std:
 void Report::record(const Effect& effect) {
   const std::scoped_lock lock(_mutex);
   if (!_entry.command && effect.outcome != Outcome::failed) return;
-  _entry.changed = _entry.changed || effect.outcome == Outcome::applied;
+  _entry.changed = _entry.changed || effect.changed;
   _entry.effects.push_back(tavisk::toJson(effect));
 }
 

@@ -26,7 +26,7 @@ namespace tavisk {
 ///   error *    why the word or the whole run was refused
 ///   signal *   the signal that ended the run ("SIGTERM"); command, argument and handler are those it interrupted
 ///   failed     the error flag afterwards; true when the run was refused
-///   changed    whether an effect was applied
+///   changed    whether the machine differs from before, or may differ
 ///   values     array of what was read: setting, live, stored, unit
 ///   effects    array of what was changed, or could not be changed or read; see Effect. A failure between two commands
 ///              is told with the next one

@@ -43,7 +43,8 @@ TEST(EffectSink, closesOnlyOpenChangesWhenInterrupted) {
     return Effect{.setting = name,
                   .outcome = Outcome::failed,
                   .asked = "x",
-                  .failure = Failure{"change", name, "ended by SIGINT"}};
+                  .failure = Failure{"change", name, "ended by SIGINT"},
+                  .changed = true};
   };
   EXPECT_THAT(log.effects, ElementsAre(ended("B"), ended("A")));
 

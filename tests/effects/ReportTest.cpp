@@ -68,7 +68,7 @@ TEST_F(ReportTest, tellsTheCommandThatASignalInterrupted) {
   report->runEndedBySignal("SIGTERM", true, "half");
   report->commandEnds(false, "");
   EXPECT_THAT(linesOf(path), ElementsAre(::testing::AllOf(
-                                 HasSubstr(R"("handler":"setTime:","signal":"SIGTERM","failed":true,"changed":false,)"),
+                                 HasSubstr(R"("handler":"setTime:","signal":"SIGTERM","failed":true,"changed":true,)"),
                                  HasSubstr(R"("asked":"0")"), HasSubstr(R"("why":"gone"}],"output":"half"})"))));
 }
 

@@ -139,7 +139,8 @@ Result<void> FolderWriter::keepLabel(const FileDescriptor& fresh, const std::str
   if (!old) return retold(old.failure(), "look at", _path);
   std::array<char, 4096> label{};
   const auto size = ::fgetxattr(old->number(), labelAttribute, label.data(), label.size());
-  if (size <= 0) return {};  // not labelled
+  const bool hasNone = size == 0 || errno == ENODATA || errno == ENOTSUP;
+  if (size <= 0) return hasNone ? Result<void>() : failure("keep label of");
   if (::fsetxattr(fresh.number(), labelAttribute, label.data(), static_cast<std::size_t>(size), 0) != 0)
     return failure("keep label of");
   return {};

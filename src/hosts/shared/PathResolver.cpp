@@ -19,15 +19,18 @@ namespace {
 
 constexpr int mostLinks = 40;  // as the kernel: path_resolution(7)
 
-bool isLink(const FileDescriptor& file) {
+Result<bool> isLink(const FileDescriptor& file, const std::string& path) {
   struct stat status {};
-  return ::fstat(file.number(), &status) == 0 && S_ISLNK(status.st_mode);
+  if (::fstat(file.number(), &status) != 0) return systemFailure("look at", path, errno);
+  return S_ISLNK(status.st_mode);
 }
 
 }  // namespace
 
 Result<std::string> targetOf(const FileDescriptor& link, const std::string& path) {
-  if (!isLink(link)) return Failure{"read link", path, "not a symbolic link"};
+  const auto isOne = isLink(link, path);
+  if (!isOne) return isOne.failure();
+  if (!*isOne) return Failure{"read link", path, "not a symbolic link"};
   std::array<char, PATH_MAX> target{};
   const auto length = ::readlinkat(link.number(), "", target.data(), target.size());
   if (length < 0) return systemFailure("read link", path, errno);
@@ -36,18 +39,14 @@ Result<std::string> targetOf(const FileDescriptor& link, const std::string& path
 
 Result<std::string> PathResolver::resolve(const std::string& path) {
   _path = path;
-  reopenFolder();
   push(path);
-  while (!_pending.empty()) {
+  auto isDone = reopenFolder();
+  while (isDone && !_pending.empty()) {
     const auto name = std::move(_pending.back());
     _pending.pop_back();
-    if (name == ".") continue;
-    if (name == "..") {
-      leave();
-    } else if (const auto entered = enter(name); !entered) {
-      return entered.failure();
-    }
+    if (name != ".") isDone = name == ".." ? leave() : enter(name);
   }
+  if (!isDone) return isDone.failure();
   return resolved();
 }
 
@@ -61,7 +60,9 @@ Result<void> PathResolver::enter(const std::string& name) {
   if (_folder) {
     auto opened = openNamed(_folder, name, O_PATH | O_NOFOLLOW);
     if (!opened && !isAbsent(opened.failure())) return retold(opened.failure(), "resolve", _path);
-    if (opened && isLink(*opened)) return follow(*opened);
+    const auto isOne = opened ? isLink(*opened, _path) : false;
+    if (!isOne) return isOne.failure();
+    if (*isOne) return follow(*opened);
     if (opened) file = std::move(opened).value();
   }
   _resolved.push_back(name);
@@ -75,20 +76,22 @@ Result<void> PathResolver::follow(const FileDescriptor& link) {
   if (!target) return target.failure();
   if (target->starts_with('/')) {
     _resolved.clear();
-    reopenFolder();
+    if (auto opened = reopenFolder(); !opened) return opened;
   }
   push(*target);
   return {};
 }
 
-void PathResolver::leave() {
+Result<void> PathResolver::leave() {
   if (!_resolved.empty()) _resolved.pop_back();
-  reopenFolder();
+  return reopenFolder();
 }
 
-void PathResolver::reopenFolder() {
+Result<void> PathResolver::reopenFolder() {
   auto opened = openBeneath(_root, resolved(), O_PATH);
+  if (!opened && !isAbsent(opened.failure())) return retold(opened.failure(), "resolve", _path);
   _folder = opened ? std::move(opened).value() : FileDescriptor();
+  return {};
 }
 
 std::string PathResolver::resolved() const {

@@ -21,8 +21,8 @@ class PathResolver {
   void push(const std::string& path);
   Result<void> enter(const std::string& name);
   Result<void> follow(const FileDescriptor& link);
-  void leave();
-  void reopenFolder();
+  Result<void> leave();
+  Result<void> reopenFolder();
   std::string resolved() const;
 
   const FileDescriptor& _root;

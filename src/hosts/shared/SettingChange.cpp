@@ -29,11 +29,11 @@ class Change {
   /// Whether something is to be written. A value that cannot be read is not a reason against it: what counts is read
   /// back afterwards.
   bool isNeeded() {
-    const bool isLiveThere = isThere(_steps.live, _effect.live);
-    const bool isStoredThere = isThere(_steps.stored, _effect.stored);
+    _live = lookAt(_steps.live, _effect.live);
+    _stored = lookAt(_steps.stored, _effect.stored);
     _effect.before = _steps.live ? _effect.live : _effect.stored;
-    const bool isRead = _steps.live || _steps.stored;
-    _effect.outcome = isRead && isLiveThere && isStoredThere ? Outcome::unchanged : Outcome::applied;
+    const bool isThere = isRead() && (!_steps.live || isAsked(_live)) && (!_steps.stored || isAsked(_stored));
+    _effect.outcome = isThere ? Outcome::unchanged : Outcome::applied;
     return _steps.always || _effect.outcome == Outcome::applied;
   }
 
@@ -44,12 +44,19 @@ class Change {
   }
 
   void readBack() {
-    readBack(_steps.live, _effect.live, _steps.name);
-    readBack(_steps.stored, _effect.stored, _steps.where.empty() ? _steps.name : _steps.where);
+    if (!isRead()) _effect.changed = _isWritten;
+    readBack(_steps.live, _live, _effect.live, _steps.name);
+    readBack(_steps.stored, _stored, _effect.stored, _steps.where.empty() ? _steps.name : _steps.where);
   }
 
  private:
+  using Look = std::function<Result<Sight>()>;
+  using Before = std::optional<Sight>;  ///< absent: there was nothing to look at, or the look failed
+
   static constexpr std::chrono::seconds longestSettling{3};
+
+  bool isRead() const { return _steps.live || _steps.stored; }
+  static bool isAsked(const Before& sight) { return sight && sight->isAsked; }
 
   /// The first failure is the cause; what follows from it is not told.
   void fail(const Failure& failure) {
@@ -57,30 +64,36 @@ class Change {
     if (!_effect.failure) _effect.failure = failure;
   }
 
-  static bool isThere(const std::function<Result<Sight>()>& look, std::optional<std::string>& text) {
-    if (!look) return true;
-    const auto seen = look().valueOr({});
-    text = seen.text;
-    return seen.isAsked;
+  static Before lookAt(const Look& look, std::optional<std::string>& text) {
+    const auto seen = look ? look() : Result<Sight>(Sight());
+    if (!look || !seen) return std::nullopt;
+    text = seen->text;
+    return *seen;
   }
 
   bool succeeds(const std::function<Result<void>()>& write) {
     const auto written = write ? write() : Result<void>();
     if (!written) fail(written.failure());
+    _isWritten = _isWritten || (write && written);
     return static_cast<bool>(written);
   }
 
-  void readBack(const std::function<Result<Sight>()>& look, std::optional<std::string>& text,
-                const std::string& place) {
+  /// What was not seen before or is not seen now counts as changed when something was written.
+  void readBack(const Look& look, const Before& before, std::optional<std::string>& text, const std::string& place) {
     if (!look) return;
     const auto seen = look();
-    text = seen.valueOr({}).text;
+    text = seen ? seen->text : std::nullopt;
+    const bool differs = before && seen ? before->text != seen->text : _isWritten;
+    _effect.changed = _effect.changed || differs;
     if (!seen) return fail(seen.failure());
     if (!seen->isAsked) fail({"read back", place, text ? "reads " + *text : "reads nothing"});
   }
 
   const Steps& _steps;
   Effect _effect;
+  Before _live;
+  Before _stored;
+  bool _isWritten = false;  ///< a step that writes has succeeded
 };
 
 }  // namespace

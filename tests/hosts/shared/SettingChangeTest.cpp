@@ -49,7 +49,8 @@ class SettingChangeTest : public ::testing::Test {
 
   using Text = std::optional<std::string>;
   /// The effect of a change to "9", with what is the same in every case.
-  static Effect effectOf(Outcome outcome, Text before, Text live, Text stored, std::optional<Failure> failure = {}) {
+  static Effect effectOf(Outcome outcome, bool changed, Text before, Text live, Text stored,
+                         std::optional<Failure> failure = {}) {
     return {.setting = "Sleep",
             .outcome = outcome,
             .before = std::move(before),
@@ -58,7 +59,8 @@ class SettingChangeTest : public ::testing::Test {
             .stored = std::move(stored),
             .where = "/etc/sleep.conf",
             .undoneBy = "a daemon",
-            .failure = std::move(failure)};
+            .failure = std::move(failure),
+            .changed = changed};
   }
 
   RunLoop loop;
@@ -73,14 +75,14 @@ class SettingChangeTest : public ::testing::Test {
 };
 
 TEST_F(SettingChangeTest, storesThenAppliesThenReadsBack) {
-  EXPECT_EQ(change("9"), effectOf(Outcome::applied, "5", "9", "9"));
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, true, "5", "9", "9"));
   EXPECT_THAT(steps, ElementsAre("store", "apply"));
   EXPECT_THAT(log.begun, ElementsAre("Sleep 9"));
 }
 
 TEST_F(SettingChangeTest, writesNothingThatIsThereAlready) {
   live = stored = "9";
-  const auto unchanged = effectOf(Outcome::unchanged, "9", "9", "9");
+  const auto unchanged = effectOf(Outcome::unchanged, false, "9", "9", "9");
   EXPECT_EQ(change("9"), unchanged);
   EXPECT_THAT(steps, IsEmpty());
   EXPECT_THAT(log.begun, IsEmpty());
@@ -100,11 +102,11 @@ TEST_F(SettingChangeTest, writesWhenOnlyOneOfLiveAndStoredIsRight) {
 
 TEST_F(SettingChangeTest, takesAPartThatCannotBeReadForRightButAppliesWhereNoneCan) {
   setting.live = nullptr;
-  EXPECT_EQ(change("9"), effectOf(Outcome::applied, "5", {}, "9"));
-  EXPECT_EQ(change("9"), effectOf(Outcome::unchanged, "9", {}, "9"));
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, true, "5", {}, "9"));
+  EXPECT_EQ(change("9"), effectOf(Outcome::unchanged, false, "9", {}, "9"));
   setting.stored = nullptr;
   setting.apply = nullptr;
-  EXPECT_EQ(change("9"), effectOf(Outcome::applied, {}, {}, {}));
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, true, {}, {}, {}));
   EXPECT_THAT(steps, ElementsAre("store", "apply", "store"));
 }
 
@@ -118,9 +120,9 @@ TEST_F(SettingChangeTest, takesAbsentForEmpty) {
 TEST_F(SettingChangeTest, writesNothingThatTheMachineCannotHave) {
   const auto reason = systemFailure("find", "/sys/power", ENOENT);
   setting.supported = [&] { return std::optional(NotSupported{reason}); };
-  EXPECT_EQ(change("9"), effectOf(Outcome::notSupported, {}, {}, {}, reason));
+  EXPECT_EQ(change("9"), effectOf(Outcome::notSupported, false, {}, {}, {}, reason));
   setting.supported = [&] { return reason; };
-  EXPECT_EQ(change("9"), effectOf(Outcome::failed, {}, {}, {}, reason)) << "it could not be found out";
+  EXPECT_EQ(change("9"), effectOf(Outcome::failed, false, {}, {}, {}, reason)) << "it could not be found out";
   EXPECT_THAT(steps, IsEmpty());
 }
 
@@ -130,23 +132,24 @@ TEST_F(SettingChangeTest, tellsTheFirstFailureAndWhatIsThereNow) {
   struct Case {
     const char* broken;
     const char* ignored;
+    bool changed;
     Text live, stored;
     Failure failure;
     std::vector<std::string> steps;
   };
   const Case cases[] = {
-      {"store", "", "5", "5", full("store"), {"store"}},
-      {"apply", "", "5", "9", full("apply"), {"store", "apply"}},
-      {"", "apply", "5", "9", wrong("Sleep"), {"store", "apply"}},
-      {"", "store", "9", "5", wrong("/etc/sleep.conf"), {"store", "apply"}},
-      {"stored", "", "9", {}, {"stored", "disk", "Input/output error"}, {"store", "apply"}},
+      {"store", "", false, "5", "5", full("store"), {"store"}},
+      {"apply", "", true, "5", "9", full("apply"), {"store", "apply"}},
+      {"", "apply", true, "5", "9", wrong("Sleep"), {"store", "apply"}},
+      {"", "store", true, "9", "5", wrong("/etc/sleep.conf"), {"store", "apply"}},
+      {"stored", "", true, "9", {}, {"stored", "disk", "Input/output error"}, {"store", "apply"}},
   };
   for (const auto& now : cases) {
     live = stored = "5";
     steps.clear();
     broken = now.broken;
     ignored = now.ignored;
-    EXPECT_EQ(change("9"), effectOf(Outcome::failed, "5", now.live, now.stored, now.failure));
+    EXPECT_EQ(change("9"), effectOf(Outcome::failed, now.changed, "5", now.live, now.stored, now.failure));
     EXPECT_EQ(steps, now.steps);
   }
 }
@@ -167,7 +170,7 @@ TEST_F(SettingChangeTest, givesUpWaitingAfterThreeSeconds) {
   setting.settled = [](const std::string& /*value*/) { return false; };
   const auto begin = RunLoop::Clock::now();
   const Failure unsettled{"change", "Sleep", "did not settle in time"};
-  EXPECT_EQ(change("9"), effectOf(Outcome::failed, "5", "9", "9", unsettled));
+  EXPECT_EQ(change("9"), effectOf(Outcome::failed, true, "5", "9", "9", unsettled));
   EXPECT_GE(RunLoop::Clock::now() - begin, std::chrono::seconds(3));
 }
 

@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <gmock/gmock.h>
 #include <sys/file.h>
+#include <sys/resource.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
@@ -82,6 +83,30 @@ TEST_F(SystemRootTest, writesWhereLinksLeadButNotOut) {
   EXPECT_EQ(contentsOf(at("/usr/lib/hosts")), "newer");
   EXPECT_TRUE(root.write("/out/file", "inside"));
   EXPECT_EQ(contentsOf(at("/tmp/file")), "inside");
+}
+
+/// With room for few descriptors each step fails; what was not looked at is not absent.
+TEST_F(SystemRootTest, takesNothingForAbsentThatItCannotOpen) {
+  folder.write("/usr/lib/hosts", "old");
+  fs::create_directory(at("/etc"));
+  fs::create_symlink("../usr/lib/hosts", at("/etc/hosts"));
+  rlimit usual{};
+  ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &usual), 0);
+  const FileDescriptor next(::open("/", O_PATH | O_CLOEXEC));
+  int failures = 0;
+  for (auto room = static_cast<rlim_t>(next.number()); true; ++room) {
+    const rlimit few{room, usual.rlim_max};
+    ::setrlimit(RLIMIT_NOFILE, &few);
+    const auto there = root.isThere("/etc/hosts");
+    const auto written = root.write("/etc/hosts", "new");
+    ::setrlimit(RLIMIT_NOFILE, &usual);
+    EXPECT_TRUE(fs::is_symlink(at("/etc/hosts"))) << room;
+    EXPECT_EQ(contentsOf(at("/usr/lib/hosts")), written ? "new" : "old") << room;
+    EXPECT_TRUE(there ? *there : there.failure().code == std::errc::too_many_files_open) << room;
+    if (written) break;
+    ++failures;
+  }
+  EXPECT_GT(failures, 2);
 }
 
 TEST_F(SystemRootTest, leavesAloneWhatIsNoFile) {

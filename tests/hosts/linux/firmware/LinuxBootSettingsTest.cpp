@@ -88,7 +88,8 @@ class LinuxBootSettingsTest : public testing::Test {
             .before = before,
             .asked = after,
             .stored = after,
-            .where = BootTree::pathOf("BootOrder")};
+            .where = BootTree::pathOf("BootOrder"),
+            .changed = outcome == Outcome::applied};
   }
 
   BootTree tree;

@@ -87,13 +87,13 @@ TEST(EnclosureLock, DisablesKeyboardsWhileItIsEngaged) {
       tree.write("/sys/class/input/input" + std::to_string(number + 1) + "/inhibited", test.before.substr(number, 1));
     tree.setDisablesKeyboard(test.disables);
     const std::string after(2, test.after);
-    EXPECT_EQ(tree.lastEffect(),
-              (Effect{.setting = setting::keyboardLock,
-                      .outcome = test.outcome,
-                      .before = texts[test.before],
-                      .asked = texts[after],
-                      .live = texts[after],
-                      .note = (test.state & lock) != 0 ? "the lock is engaged" : "the lock is open"}));
+    EXPECT_EQ(tree.lastEffect(), (Effect{.setting = setting::keyboardLock,
+                                         .outcome = test.outcome,
+                                         .before = texts[test.before],
+                                         .asked = texts[after],
+                                         .live = texts[after],
+                                         .note = (test.state & lock) != 0 ? "the lock is engaged" : "the lock is open",
+                                         .changed = test.outcome == Outcome::applied}));
     EXPECT_EQ(tree.inhibited("input1") + tree.inhibited("input2"), after);
     for (const char* name : {"input3", "input4", "input5", "event1"}) EXPECT_EQ(tree.inhibited(name), "0") << name;
   }

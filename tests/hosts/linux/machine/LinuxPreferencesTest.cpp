@@ -90,8 +90,9 @@ TEST(LinuxProcesses, GetSignals) {
     ::pause();
     ::_exit(0);
   }
-  EXPECT_EQ(effectOf(SIGTERM, child),
-            (Effect{.setting = setting::signalToProcess, .asked = "15 to process " + std::to_string(child)}));
+  EXPECT_EQ(effectOf(SIGTERM, child), (Effect{.setting = setting::signalToProcess,
+                                              .asked = "15 to process " + std::to_string(child),
+                                              .changed = true}));
   int status = 0;
   ASSERT_EQ(::waitpid(child, &status, 0), child);
   EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGTERM);

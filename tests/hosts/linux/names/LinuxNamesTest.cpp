@@ -57,7 +57,8 @@ TEST_F(NamesTest, ChangesEveryPlaceOfTheHostName) {
                                        .asked = "mail-2.example",
                                        .live = "mail-2.example",
                                        .stored = "mail-2.example",
-                                       .where = "/etc/hostname"}));
+                                       .where = "/etc/hostname",
+                                       .changed = true}));
   EXPECT_EQ(tree.file("/etc/hostname"), "mail-2.example\n");
   EXPECT_EQ(tree.file("/proc/sys/kernel/hostname"), "mail-2.example\n");
   EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost\n127.0.1.1\tmail-2.example mail-2\n");
