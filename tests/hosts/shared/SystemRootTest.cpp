@@ -151,6 +151,17 @@ TEST_F(SystemRootTest, removesOnlyTheLeftoversOfRunsThatAreOver) {
   EXPECT_THAT(root.list("/etc").valueOr({}), ElementsAre(".tavisk-2", "hostname"));
 }
 
+TEST_F(SystemRootTest, doesNotFollowLinksThatNameWhatAProcessHasOpen) {
+  const FileDescriptor open(::open(folder.write("/file", "open").c_str(), O_RDONLY));
+  const FileDescriptor opened(::open(folder.path().c_str(), O_RDONLY | O_DIRECTORY));
+  const auto fd = [](const FileDescriptor& file) { return "/proc/self/fd/" + std::to_string(file.number()); };
+  for (const auto& path : {fd(open), fd(opened) + "/file", "/proc/self/root" + at("/file").string()}) {
+    const auto read = SystemRoot("/").read(path, 100);
+    ASSERT_FALSE(read) << path;
+    EXPECT_EQ(read.failure().why, "Too many levels of symbolic links") << path;
+  }
+}
+
 TEST_F(SystemRootTest, rewritesInPlaceWhereAFileIsMounted) {
   const bool hasRun = withOwnMounts([&] {
     const auto mounted = folder.write("/etc/hosts", "");
