@@ -28,6 +28,13 @@ std::int64_t nanoseconds(const timespec& time) {
   return std::int64_t{time.tv_sec} * 1'000'000'000 + time.tv_nsec;
 }
 
+Result<void> needsRegularFile(const FileDescriptor& file, const std::string& path) {
+  struct stat status {};
+  if (::fstat(file.number(), &status) != 0) return systemFailure("read", path, errno);
+  if (!S_ISREG(status.st_mode)) return Failure{"read", path, "not a regular file"};
+  return {};
+}
+
 /// The path as names with "/" before them, where one look is enough for it: it exists, without a link in it.
 std::optional<std::string> plainPath(const FileDescriptor& prefix, const std::string& path) {
   std::string plain;
@@ -106,19 +113,31 @@ std::optional<FileStamp> SystemRoot::stamp(const std::string& path) const {
                    nanoseconds(status.st_ctim)};
 }
 
-Result<std::string> SystemRoot::read(const std::string& path, std::size_t limit) const {
-  struct stat status {};
-  const auto isRegular = [&](const FileDescriptor& file) {
-    return ::fstat(file.number(), &status) == 0 && S_ISREG(status.st_mode);
-  };
+Result<FileDescriptor> SystemRoot::openRegular(const std::string& path) const {
   const auto seen = open(path, O_PATH);
   if (!seen) return seen.failure();
   // Only looked at so far: to open a device may already do something.
-  if (!isRegular(*seen)) return Failure{"read", path, "not a regular file"};
-  const auto file = open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
+  if (const auto isRegular = needsRegularFile(*seen, path); !isRegular) return isRegular.failure();
+  auto file = open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
+  if (!file) return file;
+  if (const auto isRegular = needsRegularFile(*file, path); !isRegular) return isRegular.failure();
+  return file;
+}
+
+Result<std::string> SystemRoot::read(const std::string& path, std::size_t limit) const {
+  const auto file = openRegular(path);
   if (!file) return file.failure();
-  if (!isRegular(*file)) return Failure{"read", path, "not a regular file"};
   return readAll(*file, limit, path);
+}
+
+Result<std::string> SystemRoot::readBeginning(const std::string& path, std::size_t length) const {
+  const auto file = openRegular(path);
+  if (!file) return file.failure();
+  std::string beginning(length, '\0');
+  const auto count = ::read(file->number(), beginning.data(), length);
+  if (count < 0) return systemFailure("read", path, errno);
+  beginning.resize(static_cast<std::size_t>(count));
+  return beginning;
 }
 
 Result<std::string> SystemRoot::readLink(const std::string& path) const {
