@@ -16,13 +16,14 @@ class DiskCallbacks {
   void add(DiskCallbackRequest request) { _requests.push_back(std::move(request)); }
   void remove(DiskCallback callback, const void* context);
 
-  /// Calls those that asked for this kind of event and match the disk; the keys of a change that a callback does not
-  /// watch are left out, and without any left it is not called.
-  void tell(const DiskEvent& event, const DiskDescription& disk) const;
-  /// Tells what happened from one moment to the next.
+  /// Tells what happened from one moment to the next to those that asked for this kind of event and match the disk: one
+  /// that begins to match has appeared for them, one that ceases to is gone. The keys of a change that a callback does
+  /// not watch are left out, and without any left it is not called.
   void tellDifferences(const DiskSnapshot& before, const DiskSnapshot& after) const;
 
  private:
+  void tell(const DiskEvent& event, const DiskSnapshot::Disk& before, const DiskSnapshot::Disk& after) const;
+
   std::vector<DiskCallbackRequest> _requests;
 };
 
