@@ -81,7 +81,8 @@ Result<std::vector<ZoneName>> installedZones(const SystemRoot& root) {
   if (names.empty()) addCompiled(root, "", 1, names);
   if (names.empty()) return Failure{"list time zones", std::string(ZoneName::folder), "no time zones are installed"};
   std::vector<ZoneName> zones;
-  for (const auto& name : names) zones.push_back({name});
+  for (const auto& name : names)
+    if (const ZoneName zone{name}; zone.fitsOneLine()) zones.push_back(zone);
   return zones;
 }
 
