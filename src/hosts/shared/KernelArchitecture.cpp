@@ -18,8 +18,7 @@ Result<std::optional<std::string>> architectureOf(const Contents& read) {
 
 std::string architectureIn(const PropertyList::Dictionary& contents) {
   const auto* value = contents.find(BootLoaderFile::architectureKey);
-  const auto* architecture = value ? value->asString() : nullptr;
-  return architecture ? *architecture : "default";
+  return value ? plainText(*value) : "default";
 }
 
 Setting<std::string> kernelArchitecture(const Contents& read) {
