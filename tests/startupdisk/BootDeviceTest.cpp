@@ -205,7 +205,9 @@ TEST(BootDevice, TargetDiskModeDependsOnTheFirmware) {
 /// Makes a choice in the moment in which the preference is read.
 struct ChoosesMeanwhile final : EffectChannel {
   void record(const Effect&) override {}
-  void observe(const SettingValue&) override { controller->setDeviceForBoot(image({{"Wirestart", "list"}})); }
+  void observe(const SettingValue& value) override {
+    if (value.setting == setting::startupDisk) controller->setDeviceForBoot(image({{"Wirestart", "list"}}));
+  }
   SDController* controller = nullptr;
 };
 
