@@ -89,19 +89,24 @@ class PropertyList {
 /// The English name that messages use: "dictionary", "integer".
 const char* nameOf(PropertyList::Type type);
 
+/// A value as messages print it where a text is meant: "10.5", 1 and 0 for the booleans, "2000-01-31T23:59:59Z",
+/// "<00ff>", "(a, b)", "{key = value; other = value}".
+std::string plainText(const PropertyList& value);
+
 /// What a reader accepts; beyond it the text is refused.
 struct PropertyListLimits {
   std::size_t bytes;
   std::size_t depth;
   std::size_t nodes;
+  bool takesFirstKey = false;  ///< of a key that a dictionary has twice the first counts; else such a text is refused
 };
 inline constexpr PropertyListLimits ownFileLimits{64U << 20U, 64, 8'000'000};
-inline constexpr PropertyListLimits foreignFileLimits{1U << 20U, 64, 100'000};
+inline constexpr PropertyListLimits foreignFileLimits{1U << 20U, 64, 100'000, true};
 
-/// Reads XML text. A document type line is accepted and ignored, an internal subset refused; only the five named
-/// entities and numeric ones exist; nothing is fetched. The root is a value, alone or in a `plist` element. A repeated
-/// key is refused; attributes are ignored. The failure ("read property list", on nothing: the caller knows the path)
-/// names the offset in bytes and what was expected.
+/// Reads XML text in any encoding that it declares (asUtf8 in base/XmlEncoding.h). A document type line is accepted and
+/// ignored, an internal subset refused; only the five named entities and numeric ones exist; nothing is fetched. The
+/// root is a value, alone or in a `plist` element; attributes are ignored. The failure ("read property list", on
+/// nothing: the caller knows the path) names the offset, in bytes of UTF-8, and what was expected.
 Result<PropertyList> parsePropertyList(std::string_view xml, const PropertyListLimits& limits);
 
 /// XML text with tabs and a final newline. Fails for a text that XML 1.0 cannot hold (control characters, bytes that

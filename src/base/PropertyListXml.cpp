@@ -8,6 +8,7 @@
 #include <stdexcept>
 
 #include "base/PropertyList.h"
+#include "base/XmlEncoding.h"
 #include "base/XmlText.h"
 
 namespace tavisk {
@@ -215,10 +216,12 @@ class Reader {
       if (key.name() != std::string_view("key")) throw malformed(key, "a key");
       count(key);
       const auto name = textOf(key);
-      if (dictionary.find(name)) throw malformed(key, "a key that has not occurred yet");
+      const bool isRepeated = dictionary.find(name) != nullptr;
+      if (isRepeated && !_limits.takesFirstKey) throw malformed(key, "a key that has not occurred yet");
       const auto content = elementFrom(key.next_sibling());
       if (!content) throw malformed(key, "a value after the key");
-      dictionary.set(name, value(content, depth + 1));
+      auto read = value(content, depth + 1);
+      if (!isRepeated) dictionary.set(name, std::move(read));
       key = elementFrom(content.next_sibling());
     }
     return dictionary;
@@ -260,8 +263,7 @@ const char* expectationOf(pugi::xml_parse_status status) {
   }
 }
 
-void refuseWhatIsNoXml(std::string_view text, std::size_t limit) {
-  if (text.size() > limit) throw Malformed(0, "at most " + std::to_string(limit) + " bytes");
+void refuseWhatIsNoXml(std::string_view text) {
   if (text.starts_with("bplist")) throw Malformed(0, "XML, not a binary property list");
   if (const auto offset = offsetOfNonXml(text)) {
     throw Malformed(static_cast<std::ptrdiff_t>(*offset), "a character of XML in UTF-8");
@@ -275,9 +277,13 @@ Result<PropertyList> parsePropertyList(std::string_view xml, const PropertyListL
   // because the library passes unknown ones on as text.
   constexpr unsigned options = pugi::parse_cdata | pugi::parse_doctype | pugi::parse_ws_pcdata | pugi::parse_fragment;
   try {
-    refuseWhatIsNoXml(xml, limits.bytes);
+    if (xml.size() > limits.bytes) throw Malformed(0, "at most " + std::to_string(limits.bytes) + " bytes");
+    const auto decoded = asUtf8(xml);
+    if (!decoded) return decoded.failure();
+    const auto text = decoded->view();
+    refuseWhatIsNoXml(text);
     pugi::xml_document document;
-    const auto parsed = document.load_buffer(xml.data(), xml.size(), options, pugi::encoding_utf8);
+    const auto parsed = document.load_buffer(text.data(), text.size(), options, pugi::encoding_utf8);
     if (!parsed) throw Malformed(parsed.offset, expectationOf(parsed.status));
     return Reader(limits).document(document);
   } catch (const Malformed& malformed) {

@@ -52,12 +52,15 @@ std::string padded(std::int64_t value, std::size_t width) {
   return digits.size() < width ? std::string(width - digits.size(), '0') + digits : digits;
 }
 
-std::string dateText(PropertyList::Date date) {
+void refuseOtherYears(PropertyList::Date date) {
   constexpr std::int64_t firstOfYear1 = -62'135'596'800;
   constexpr std::int64_t lastOfYear9999 = 253'402'300'799;
   if (date.secondsSince1970 < firstOfYear1 || date.secondsSince1970 > lastOfYear9999) {
     throw Unwritable("a date is outside the years 1 to 9999");
   }
+}
+
+std::string dateText(PropertyList::Date date) {
   const std::chrono::sys_seconds time{std::chrono::seconds(date.secondsSince1970)};
   const auto midnight = std::chrono::floor<std::chrono::days>(time);
   const std::chrono::year_month_day day(midnight);
@@ -80,6 +83,24 @@ std::string base64(const PropertyList::Data& data) {
   return text;
 }
 
+std::string joined(const PropertyList::Array& array) {
+  std::string text;
+  for (const auto& item : array) text += (text.empty() ? "" : ", ") + plainText(item);
+  return "(" + text + ")";
+}
+
+std::string joined(const PropertyList::Dictionary& dictionary) {
+  std::string text;
+  for (const auto& [key, value] : dictionary) text += (text.empty() ? "" : "; ") + key + " = " + plainText(value);
+  return "{" + text + "}";
+}
+
+std::string hexText(const PropertyList::Data& data) {
+  std::string text;
+  for (const auto byte : data) text += hexDigits(byte, 2);
+  return "<" + text + ">";
+}
+
 class Writer {
  public:
   void value(const PropertyList& value) {
@@ -97,6 +118,7 @@ class Writer {
       case PropertyList::Type::boolean:
         return line(*value.asBoolean() ? "<true/>" : "<false/>");
       case PropertyList::Type::date:
+        refuseOtherYears(*value.asDate());
         return leaf("date", dateText(*value.asDate()));
       case PropertyList::Type::data:
         return leaf("data", base64(*value.asData()));
@@ -142,6 +164,28 @@ class Writer {
 };
 
 }  // namespace
+
+std::string plainText(const PropertyList& value) {
+  switch (value.type()) {
+    case PropertyList::Type::dictionary:
+      return joined(*value.asDictionary());
+    case PropertyList::Type::array:
+      return joined(*value.asArray());
+    case PropertyList::Type::string:
+      break;
+    case PropertyList::Type::integer:
+      return std::to_string(*value.asInteger());
+    case PropertyList::Type::real:
+      return realText(*value.asReal());
+    case PropertyList::Type::boolean:
+      return *value.asBoolean() ? "1" : "0";
+    case PropertyList::Type::date:
+      return dateText(*value.asDate());
+    case PropertyList::Type::data:
+      return hexText(*value.asData());
+  }
+  return *value.asString();
+}
 
 Result<std::string> writePropertyList(const PropertyList& value) {
   try {

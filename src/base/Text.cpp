@@ -55,6 +55,22 @@ std::string fromUtf16(std::string_view bytes, bool isBigEndian) {
   return text;
 }
 
+bool isCodePoint(char32_t number) {
+  return number <= lastCodePoint && !isBetween(number, 0xD800, 0xDFFF);
+}
+
+std::string fromUtf32(std::string_view bytes, bool isBigEndian) {
+  std::string text;
+  const auto units = utf16Units(bytes, isBigEndian);
+  for (std::size_t place = 0; place + 1 < units.size(); place += 2) {
+    const auto high = units[isBigEndian ? place : place + 1];
+    const auto low = units[isBigEndian ? place + 1 : place];
+    const auto codePoint = (high << 16U) + low;
+    appendUtf8(text, isCodePoint(codePoint) ? codePoint : replacementCharacter);
+  }
+  return text;
+}
+
 void appendEscapedByte(std::string& text, char32_t byte) {
   text += "\\x" + upperCased(hexDigits(byte, 2));
 }
@@ -118,6 +134,9 @@ void appendUtf8(std::string& text, char32_t codePoint) {
 
 std::string decodedText(std::string_view bytes) {
   if (bytes.starts_with("\xEF\xBB\xBF")) return std::string(bytes.substr(3));
+  // Before UTF-16, whose mark the one of UTF-32 begins with.
+  if (bytes.starts_with(std::string_view("\0\0\xFE\xFF", 4))) return fromUtf32(bytes.substr(4), true);
+  if (bytes.starts_with(std::string_view("\xFF\xFE\0\0", 4))) return fromUtf32(bytes.substr(4), false);
   if (bytes.starts_with("\xFE\xFF")) return fromUtf16(bytes.substr(2), true);
   if (bytes.starts_with("\xFF\xFE")) return fromUtf16(bytes.substr(2), false);
   return std::string(bytes);

@@ -31,8 +31,8 @@ std::size_t sequenceLength(char first);
 /// Whether the byte is one of those that follow the first one of a code point.
 bool isContinuation(char byte);
 
-/// The text of a file as UTF-8, in the encoding that its byte order mark declares (UTF-8, UTF-16 of either order);
-/// without a mark the bytes as they are. What cannot be decoded becomes U+FFFD.
+/// The text of a file as UTF-8, in the encoding that its byte order mark declares (UTF-8, UTF-16 and UTF-32 of either
+/// order); without a mark the bytes as they are. What cannot be decoded becomes U+FFFD.
 std::string decodedText(std::string_view bytes);
 
 /// A code point that may change what a terminal shows of other text: C0 and C1 controls, DEL, line and paragraph

@@ -18,7 +18,8 @@ Effect unfinishedChange(const std::string& setting, const std::string& asked, co
           .outcome = Outcome::failed,
           .asked = asked,
           .note = "it may be made, or a part of it",
-          .failure = Failure{"change", setting, why}};
+          .failure = Failure{"change", setting, why},
+          .changed = true};
 }
 
 void EffectSink::addChannel(EffectChannel& channel) {

@@ -33,6 +33,8 @@ inline constexpr const char* keyboardLockPreference = "Keyboard Lock Preference"
 inline constexpr const char* preferencesWrite = "Preferences Write";
 inline constexpr const char* signalToProcess = "Signal To Process";
 inline constexpr const char* startupDisk = "Startup Disk";
+/// A look at the machine's files that failed while startup disks were looked for, and the like.
+inline constexpr const char* files = "Files";
 inline constexpr const char* networkStartupDisk = "Network Startup Disk";
 /// Before the name of a firmware variable: "Firmware Variable prev-lang:kbd".
 inline constexpr const char* firmwareVariable = "Firmware Variable ";

@@ -22,6 +22,8 @@ struct ZoneName {
   std::string file() const { return std::string(folder) + text; }
   /// Whether it is made as the names of zones are: of ASCII letters, digits and "+-_" with single slashes between them.
   bool isWellFormed() const;
+  /// Whether a list of one name a line can have it: not empty, and without a line end.
+  bool fitsOneLine() const { return !text.empty() && text.find_first_of("\r\n") == std::string::npos; }
   /// Whether its file is in the folder, whatever the name is made of.
   bool staysInFolder() const;
 
@@ -52,7 +54,7 @@ class ClockService {
   virtual std::int64_t now() = 0;
   virtual void setTime(std::int64_t secondsSince1970) = 0;
 
-  /// In no particular order; empty when the host has none.
+  /// Each fits one line; in no particular order; empty when the host has none.
   virtual std::vector<ZoneName> knownTimeZones() = 0;
   /// "UTC" when the machine has no zone.
   virtual ZoneName timeZone() = 0;

@@ -35,8 +35,8 @@ void chooseDefaultArchitecture(const CommandContext& context) {
 void ServerCommands::getKernelBootArchitectureSetting() {
   const auto settings = _context.host.bootLoaderFile().read();
   const auto* value = settings ? settings->find(BootLoaderFile::architectureKey) : nullptr;
-  if (const auto* architecture = value ? value->asString() : nullptr) {
-    _context.output.print("kernel architecture is set to: %s\n", architecture->c_str());
+  if (value) {
+    _context.output.print("kernel architecture is set to: %s\n", plainText(*value).c_str());
   } else {
     _context.output.putLine("kernel architecture is set to default");
   }

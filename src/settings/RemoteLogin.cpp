@@ -20,7 +20,6 @@ constexpr const char* question =
 constexpr std::size_t answerBufferSize = 1024;
 
 constexpr const char* watchdogFile = "/var/run/watchdog.pid";
-constexpr std::size_t longestWatchdogFile = 1 << 16;
 constexpr std::size_t longestWatchdogLine = 63;
 constexpr int hangUp = 1;
 
@@ -51,7 +50,7 @@ void ServerCommands::setRemoteLogin(const std::string& onOff) {
   const auto isOn = readOnOff(onOff, "setremotelogin");
   if (!isOn) return;
   // Asked also when it is off already: the answer comes before the look at the state.
-  if (!*isOn && _parent->promptUser() && !promptForRemoteLogin()) return;
+  if (!*isOn && _parent && _parent->promptUser() && !promptForRemoteLogin()) return;
   if (*isOn == isEnabled) {
     _context.output.print("setremotelogin: remote login is already %s.\n", isEnabled ? "On" : "Off");
   } else {
@@ -74,9 +73,9 @@ ProcessId ServerCommands::remoteLoginPID() {
 }
 
 void ServerCommands::setWatchdogSignal() {
-  const auto contents = _context.host.files().read(watchdogFile, longestWatchdogFile).valueOr("");
-  const auto firstLine = std::string_view(contents).substr(0, contents.find('\n'));
-  const auto watchdog = processIdIn(firstLine.substr(0, longestWatchdogLine));
+  const auto beginning = _context.host.files().readBeginning(watchdogFile, longestWatchdogLine);
+  if (!beginning) return;
+  const auto watchdog = processIdIn(std::string_view(*beginning).substr(0, beginning->find('\n')));
   if (watchdog != 0) _context.host.processes().sendSignal(hangUp, watchdog);
 }
 

@@ -101,11 +101,11 @@ std::optional<std::string> getOFPathForBSDName(SDEnvironment& environment, const
   return path.substr(std::min(path.size(), deviceTreePrefix.size()));
 }
 
-std::optional<std::string> interfaceForOFPath(SDEnvironment& environment, const std::string& path) {
+std::optional<std::string> interfaceForOFPath(SDEnvironment& environment, const std::optional<std::string>& path) {
   auto& known = environment.facts.interfaceOfPath;
   if (!known) known = interfacesByPath(environment);
-  if (!known) return std::nullopt;
-  const auto interface = known->find(path);
+  if (!known || !path) return std::nullopt;
+  const auto interface = known->find(*path);
   return interface == known->end() ? std::nullopt : std::optional(interface->second);
 }
 

@@ -23,7 +23,8 @@ std::string machineModelString(SDEnvironment& environment);
 std::optional<std::string> getOFPathForBSDName(SDEnvironment& environment, const std::string& bsdName);
 
 /// The BSD name of the network interface whose device has this device-tree path; absent when there is none. Only
-/// interfaces that are up, not the loopback and have an IPv4 address are known.
-std::optional<std::string> interfaceForOFPath(SDEnvironment& environment, const std::string& path);
+/// interfaces that are up, not the loopback and have an IPv4 address are known: the machine is asked for them at the
+/// first call, also without a path.
+std::optional<std::string> interfaceForOFPath(SDEnvironment& environment, const std::optional<std::string>& path);
 
 }  // namespace tavisk

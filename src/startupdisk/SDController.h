@@ -35,7 +35,8 @@ inline constexpr const char* doneSearching = "SDDoneSearching";
 
 /// Knows which systems on the machine's volumes can start it, and which one it starts from. It follows the volumes as
 /// they come, go and change, and announces what happens with its notifications.
-/// Main thread only, except for currentBootDevice, which several threads may ask.
+/// Main thread only. Other threads may ask for the currentBootDevice while the main thread does nothing but that, or
+/// waits: the device has its locks, but the systems, the images and the notifications have none.
 class SDController : public SystemSearcherProtocol {
  public:
   /// Runs the run loop for 0.2 seconds (longer when the host's first report takes longer): afterwards the systems of
@@ -108,6 +109,8 @@ class SDController : public SystemSearcherProtocol {
   /// Boot device
   SDRecordRef _knownBootDevice();
   void _rememberBootDevice(SDRecordRef device);
+  void _rememberPreference(const SDRecordRef& device);
+  void _rememberAnyImage();
   void _askBootPreference();
   SDDiskRef _takeBootPreference();
   void _announceBootSystem(const SDRecord& bootDisk);
@@ -132,6 +135,7 @@ class SDController : public SystemSearcherProtocol {
   FoundSystems _validSystems;
   std::vector<IdentifiedImage> _wirestartSystems;
   SDRecordRef _curBootDevice;  ///< guarded by _bootLock
+  SDRecordRef _anyImage;       ///< stands for an unspecified network image; guarded by _bootLock
   std::unique_ptr<SDSystemSearcher> _systemSearcher;
   std::mutex _bootSearchLock;  ///< held while the host is asked for the boot preference; only tried, never waited for
   std::mutex _bootLock;        ///< taken after _bootSearchLock; never held across a call to the host

@@ -49,6 +49,20 @@ void SDController::_rememberBootDevice(SDRecordRef device) {
   _curBootDevice.swap(device);
 }
 
+/// Stands against all but no device, and against any image: another caller may have found a better one meanwhile.
+void SDController::_rememberPreference(const SDRecordRef& device) {
+  const std::scoped_lock lock(_bootLock);
+  if (!_curBootDevice || _curBootDevice == _anyImage) _curBootDevice = device;
+}
+
+void SDController::_rememberAnyImage() {
+  const std::scoped_lock lock(_bootLock);
+  if (_curBootDevice) return;
+  const auto image = std::make_shared<SDDisk>(_environment.diskServices(), std::nullopt);
+  image->setObject("any", recordkey::wirestart);
+  _curBootDevice = _anyImage = image;
+}
+
 void SDController::_askBootPreference() {
   if (const auto bootDisk = _takeBootPreference()) _announceBootSystem(*bootDisk);
 }
@@ -61,7 +75,7 @@ SDDiskRef SDController::_takeBootPreference() {
   const auto preference = _dmm.bootPreference();
   if (preference.status != 0 || !preference.disk) return nullptr;
   auto bootDisk = _recordOf(*preference.disk);
-  _rememberBootDevice(bootDisk);
+  _rememberPreference(bootDisk);
   _environment.log.debug("currentBootDevice found _curBootDevice: %@", {bootDisk->description()});
   return bootDisk;
 }
@@ -82,10 +96,8 @@ void SDController::_askNetworkBootPreference() {
   if (preference.status != 0 || !preference.interface) return;
   if (auto image = _selectedImageOn(*preference.interface)) {
     _rememberBootDevice(std::move(image));
-  } else if (!_knownBootDevice()) {
-    const auto anyImage = std::make_shared<SDDisk>(_environment.diskServices(), std::nullopt);
-    anyImage->setObject("any", recordkey::wirestart);
-    _rememberBootDevice(anyImage);
+  } else {
+    _rememberAnyImage();
   }
   _environment.log.debug("currentBootDevice: Wirestart, %@", {descriptionOf(_knownBootDevice())});
 }

@@ -84,7 +84,7 @@ bool SDController::selectedWSImageMatchesBootDevice(const SDRecord& image) {
   auto& bootDevice = _environment.facts.bootDevice;
   if (!bootDevice) bootDevice = runNVRAMTool(_environment, "boot-device");
   const auto path = bootDevice ? std::optional(bootDevice->substr(0, bootDevice->find(':'))) : std::nullopt;
-  const auto bootInterface = path ? interfaceForOFPath(_environment, *path) : std::nullopt;
+  const auto bootInterface = interfaceForOFPath(_environment, path);
   if (!image.has(recordkey::isSelected)) return false;
   return !bootInterface || image.textForKey(recordkey::interface) == *bootInterface;
 }

@@ -92,9 +92,8 @@ void SDSystemSearcher::_waitForQueuedVolume() {
 
 /// Null when the queue was emptied meanwhile.
 SDDiskRef SDSystemSearcher::_takeOldestVolume() {
-  SDDiskRef volume;
   _queueLock.lock();
-  if (_searchQueue.count() != 0) volume = _searchQueue.takeOldest();
+  auto volume = _searchQueue.takeOldest();
   _queueLock.unlockWithCondition(nothingNew);
   return volume;
 }

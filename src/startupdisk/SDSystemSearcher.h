@@ -91,7 +91,6 @@ class SDSystemSearcher {
   std::optional<std::string> _resolveSystemFolder(SDDisk& disk, const char* bailing) const;
   bool _hasBootFile(const std::string& systemFolder, int preBootEnvironment) const;
   bool _isAtVolumeRoot(const std::string& systemFolder, const SDDisk& disk) const;
-  bool _isOnVolume(const std::string& folder, const SDDisk& volume) const;
   bool _hasKernel(const std::string& systemFolder, const std::string& mountPoint) const;
   void _describeLumaraX(SDDisk& disk, const std::string& systemFolder) const;
   void _describeEarlyLumaraX(SDDisk& disk, const std::string& systemFolder) const;

@@ -25,12 +25,16 @@ void describe(SDDisk& disk, const char* productName, std::int64_t systemVersionM
 
 std::optional<std::string> textIn(const PropertyList::Dictionary& dictionary, const char* key) {
   const auto* value = dictionary.find(key);
-  const auto* text = value ? value->asString() : nullptr;
-  return text ? std::optional(*text) : std::nullopt;
+  return value ? std::optional(plainText(*value)) : std::nullopt;
 }
 
+/// What another rule has left under the key goes, also without a new text.
 void copyText(const PropertyList::Dictionary& from, const char* key, SDDisk& disk) {
-  if (auto text = textIn(from, key)) disk.setObject(std::move(*text), key);
+  if (auto text = textIn(from, key)) {
+    disk.setObject(std::move(*text), key);
+  } else {
+    disk.removeObjectForKey(key);
+  }
 }
 
 /// Where a system's files are looked for: in its folder as it was found, then as the mount point gives it.
@@ -38,12 +42,6 @@ std::vector<std::string> candidateFolders(const std::string& systemFolder, const
   std::vector<std::string> folders{systemFolder};
   if (const auto other = mountPoint + coreServicesFolder; other != systemFolder) folders.push_back(other);
   return folders;
-}
-
-/// The standardized folder of the volume, without the final slash of "/".
-std::string volumeRoot(FileSystem& files, const SDDisk& disk) {
-  const auto root = files.standardized(disk.mountPoint()).valueOr("");
-  return root == "/" ? "" : root;
 }
 
 }  // namespace
@@ -106,7 +104,8 @@ bool SDSystemSearcher::_hasBootFile(const std::string& systemFolder, int preBoot
 
 /// A linked system folder could be another volume's: only the volume itself may be reached by links.
 bool SDSystemSearcher::_isAtVolumeRoot(const std::string& systemFolder, const SDDisk& disk) const {
-  if (systemFolder == volumeRoot(_services.files, disk) + coreServicesFolder) return true;
+  const auto root = _services.files.standardized(disk.mountPoint());
+  if (root && systemFolder == (*root == "/" ? "" : *root) + coreServicesFolder) return true;
   _services.log.debug("Ignoring Lumara X System not at volume root: %@", {systemFolder});
   return false;
 }
@@ -185,15 +184,9 @@ bool SDSystemSearcher::_checkForMSVariants(const SDDisk& volume) {
   }
   const auto system = SDDisk::diskFromDisk(volume);
   const auto folder = _resolveSystemFolder(*system, "Bailing from _checkForMSVariants:");
-  if (!folder || !_isOnVolume(*folder, *system) || !_services.files.exists(*folder + "/SYSTEM.INI")) return false;
+  if (!folder || !_services.files.exists(*folder + "/SYSTEM.INI")) return false;
   describe(*system, "Windows", systemversion::windows);
   return _reportFound(system);
-}
-
-/// A link may lead to another volume, whose systems are not this one's.
-bool SDSystemSearcher::_isOnVolume(const std::string& folder, const SDDisk& volume) const {
-  const auto root = volumeRoot(_services.files, volume);
-  return folder == root || folder.starts_with(root + "/");
 }
 
 bool SDSystemSearcher::_hasWindowsFileSystem(const SDDisk& volume) const {

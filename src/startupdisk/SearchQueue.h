@@ -3,9 +3,8 @@
 #pragma once
 
 #include <atomic>
-#include <list>
+#include <deque>
 #include <string>
-#include <unordered_map>
 
 #include "startupdisk/SDDisk.h"
 
@@ -17,15 +16,13 @@ class SearchQueue {
  public:
   std::size_t count() const { return _count; }
   void append(SDDiskRef volume);
-  /// The queue must not be empty.
+  /// Null when the queue is empty.
   SDDiskRef takeOldest();
-  /// Removes the oldest record of this disk, wherever the same record object waits.
+  /// Removes the oldest record of what is this disk now, wherever the same record object waits.
   void withdraw(const std::string& diskIdentifier);
 
  private:
-  using Places = std::list<SDDiskRef>;
-  Places _volumes;
-  std::unordered_map<std::string, std::list<Places::iterator>> _placesOfDisk;
+  std::deque<SDDiskRef> _volumes;
   std::atomic<std::size_t> _count = 0;
 };
 

@@ -30,7 +30,7 @@ std::string nestedArrays(int depth) {
   return repeated("<array>", depth) + repeated("</array>", depth);
 }
 
-std::string whyRefused(std::string_view xml, const PropertyListLimits& limits = foreignFileLimits) {
+std::string whyRefused(std::string_view xml, const PropertyListLimits& limits = ownFileLimits) {
   const auto read = parsePropertyList(xml, limits);
   return read ? "accepted" : read.failure().why;
 }
@@ -167,6 +167,49 @@ TEST(PropertyListXml, keepsItsLimits) {
   EXPECT_EQ(whyRefused(nestedArrays(500'000), ownFileLimits), "offset 448: expected at most 64 levels");
   EXPECT_EQ(whyRefused(repeated("<array>", 500'000), ownFileLimits),
             "offset 3499999: expected the end tag of the innermost element");
+}
+
+TEST(PropertyListXml, readsWhatItsEncodingSays) {
+  const auto encoded = [](std::string_view ascii, std::string_view unit) {
+    std::string bytes;
+    for (const char letter : ascii)
+      for (const char place : unit) bytes += place == 'x' ? letter : place;
+    return bytes;
+  };
+  const auto declared = [](const std::string& encoding) {
+    return "<?xml version='1.0' encoding='" + encoding + "'?><string>";
+  };
+  const std::string plain = "<string>a</string>";
+  const std::string_view units[] = {{"x\0", 2}, {"\0x", 2}, {"x\0\0\0", 4}, {"\0\0\0x", 4}};
+  const std::string_view marks[] = {{"\xFF\xFE", 2}, {"\xFE\xFF", 2}, {"\xFF\xFE\0\0", 4}, {"\0\0\xFE\xFF", 4}};
+  for (std::size_t index = 0; index < std::size(units); ++index) {
+    const auto bytes = encoded(plain, units[index]);
+    for (const auto& xml : {bytes, std::string(marks[index]) + bytes})
+      EXPECT_EQ(*parsePropertyList(xml, foreignFileLimits), PropertyList("a")) << index;
+  }
+  const std::pair<std::string, const char*> cases[] = {
+      {declared("ISO-8859-1") + "caf\xE9</string>", "caf\u00e9"},
+      {declared("windows-1252") + "\x80</string>", "\u20ac"},
+      {declared("utf-8") + "\u20ac</string>", "\u20ac"},
+  };
+  for (const auto& [xml, text] : cases)
+    EXPECT_EQ(*parsePropertyList(xml, foreignFileLimits), PropertyList(text)) << xml;
+  EXPECT_EQ(whyRefused(declared("x/y//IGNORE") + "</string>"), "the encoding x/y//IGNORE is none");
+  EXPECT_EQ(whyRefused(declared("none\x1B") + "</string>"), "the encoding none\\x1B is none");
+  EXPECT_EQ(whyRefused(declared("X-NONE") + "</string>"), "the encoding X-NONE is not known on this machine");
+  EXPECT_EQ(whyRefused(declared("US-ASCII") + "\xE9</string>"),
+            "the encoding US-ASCII is declared, and the text is not in it");
+}
+
+TEST(PropertyListXml, takesTheFirstOfTwoKeysInFilesOfOthers) {
+  const auto read = parsePropertyList("<dict><key>a</key><true/><key>a</key><dict/></dict>", foreignFileLimits);
+  EXPECT_EQ(*read, PropertyList(dictionaryOf({{"a", true}})));
+}
+
+TEST(PropertyList, isPrintedAsPlainText) {
+  EXPECT_EQ(
+      plainText(dictionaryOf({{"a", Array{"x", -1, 10.5, true, false}}, {"b", Date{951868798}}, {"c", Data{0, 255}}})),
+      "{a = (x, -1, 10.5, 1, 0); b = 2000-02-29T23:59:58Z; c = <00ff>}");
 }
 
 TEST(PropertyListXml, writesAFile) {

@@ -84,6 +84,8 @@ TEST(Text, decodesByTheByteOrderMark) {
       {"\xEF\xBB\xBFmarked", "marked"},
       {std::string("\xFF\xFEL\0\n\0", 6), "L\n"},
       {std::string("\xFE\xFF\0L\0\n", 6), "L\n"},
+      {std::string("\xFF\xFE\0\0L\0\0\0\x01\xF6\x01\0\0\xD8\0\0\0", 17), "L\U0001F601\uFFFD"},
+      {std::string("\0\0\xFE\xFF\0\0\0L\0\x11\0\0", 12), "L\uFFFD"},
       {"\xFE\xFF\x03\xA9\x20\xAC\xD8\x3D\xDE\x01", "\u03a9\u20ac\U0001F601"},
       {"\xFE\xFF\xD8\x3D\x20\xAC\xDE\x01\x41", "\uFFFD\u20ac\uFFFD"},
   };

@@ -42,11 +42,19 @@ TEST_F(ReservedCommands, leaveALineInTheSystemLogAtMost) {
 
 TEST_F(ReservedCommands, signalTheWatchdogByItsFile) {
   struct Case {
-    const char* contents;
+    std::string contents;
     int signalled;
   };
   const Case cases[] = {
-      {"", 0}, {"0\n", 0}, {"\n77\n", 0}, {"none", 0}, {"77\n", 77}, {"  78 and more\n5\n", 78}, {"79", 79},
+      {"", 0},
+      {"0\n", 0},
+      {"\n77\n", 0},
+      {"none", 0},
+      {"77\n", 77},
+      {"  78 and more\n5\n", 78},
+      {"79", 79},
+      {"80\n" + std::string(100'000, '9'), 80},
+      {std::string(63, ' ') + "81", 0},
   };
   commands.setWatchdogSignal();
   std::vector<PropertyList> expected;
@@ -60,6 +68,19 @@ TEST_F(ReservedCommands, signalTheWatchdogByItsFile) {
     expected.emplace_back(sent);
   }
   EXPECT_EQ(*machine.description().find("Signals")->asArray(), expected);
+  const auto told = machine.log.effects.size();
+  const auto file = machine.writeFile("/var/run/watchdog.pid", "");
+  std::filesystem::remove(file);
+  std::filesystem::create_directory(file);
+  commands.setWatchdogSignal();
+  ASSERT_EQ(machine.log.effects.size(), told + 1);
+  EXPECT_EQ(machine.log.effects.back().failure->why, "not a regular file");
+}
+
+TEST_F(ReservedCommands, askNobodyWithoutTheToolAroundThem) {
+  machine.set("Remote Shell", "Enabled", true);
+  commands.setRemoteLogin("off");
+  EXPECT_EQ(machine.get("Remote Shell", "Enabled"), PropertyList(false));
 }
 
 TEST_F(ReservedCommands, findTheServerOfRemoteLogin) {

@@ -202,6 +202,23 @@ TEST(BootDevice, TargetDiskModeDependsOnTheFirmware) {
   }
 }
 
+/// Makes a choice in the moment in which the preference is read.
+struct ChoosesMeanwhile final : EffectChannel {
+  void record(const Effect&) override {}
+  void observe(const SettingValue& value) override {
+    if (value.setting == setting::startupDisk) controller->setDeviceForBoot(image({{"Wirestart", "list"}}));
+  }
+  SDController* controller = nullptr;
+};
+
+TEST(BootDevice, IsTheChoiceThatWasMadeWhileThePreferenceWasRead) {
+  BootMachine machine;
+  ChoosesMeanwhile choice;
+  choice.controller = &machine.controller();
+  machine.effects.addChannel(choice);
+  EXPECT_EQ(machine.bootDevice(), "{Wirestart = list}");
+}
+
 TEST(BootDevice, MayBeAskedByTwoAtOnce) {
   BootMachine machine;
   auto& controller = machine.controller();

@@ -185,6 +185,22 @@ TEST(Controller, ExcludesSystemsThatThisMachineCannotUse) {
   }
 }
 
+TEST(Controller, DropsWhatItWouldNotBeToldOfAnyMore) {
+  const auto mounted = keys({{"Mount Point", "/Volumes/A"}});
+  const Keys stopped[] = {keys({{"Mountable", false}}), keys({{"Mount Point", "/Volumes/A"}, {"Network", true}})};
+  StartupMachine machine;
+  machine.addLumaraX("disk0s2", "A");
+  EXPECT_EQ(machine.listed().size(), 1U);
+  for (const auto& keys : stopped) {
+    machine.set("Disks", "disk0s2", keys);
+    machine.runPasses(1);
+    EXPECT_THAT(machine.listed(), IsEmpty());
+    machine.set("Disks", "disk0s2", mounted);
+    machine.runPasses(2);
+    EXPECT_EQ(machine.listed().size(), 1U);
+  }
+}
+
 TEST(Controller, SearchesTheVolumesOfCachedPaths) {
   StartupMachine machine;
   machine.addLumaraX("disk0s2", "A");

@@ -103,6 +103,7 @@ TEST(NetworkImages, MatchTheInterfaceThatTheFirmwareStartsFrom) {
   const auto selectedOnEn0 = image({{"IsSelected", "x"}, {"interface", "en0"}});
   const auto selectedOnEn1 = image({{"IsSelected", "x"}, {"interface", "en1"}});
   EXPECT_TRUE(controller.selectedWSImageMatchesBootDevice(*selectedOnEn1)) << "no variable: read again next time";
+  EXPECT_TRUE(machine.environment().facts.interfaceOfPath) << "asked for also without a path";
   machine.set("Firmware", "Variables", keys({{"boot-device", "/pci/net:bootp"}}));
   EXPECT_TRUE(controller.selectedWSImageMatchesBootDevice(*selectedOnEn0));
   EXPECT_FALSE(controller.selectedWSImageMatchesBootDevice(*selectedOnEn1));

@@ -113,12 +113,16 @@ TEST(SearchRules, ReadTheVersionOfLumaraX) {
   const std::string server = folder + "/ServerVersion.plist";
   const std::string early = folder + "/software_version";
   const std::string beta = "Lumara X\nPublic Beta (build 1H39)";
+  const std::string twice =
+      "<dict><key>ProductName</key><string>Caf\xE9</string><key>ProductName</key><string>Other</string>"
+      "<key>ProductVersion</key><real>10.5</real><key>ProductBuildVersion</key><integer>1</integer></dict>";
   const std::pair<std::vector<std::pair<std::string, std::string>>, const char*> cases[] = {
       {{}, "Lumara X - -"},
       {{{system, versionFile("Lumara X", "10.6")}, {server, versionFile("Lumara X Server", "10.6.8")}},
        "Lumara X Server 10.6.8 1A2"},
       {{{server, "not a property list"}, {system, versionFile("Lumara X", "")}}, "Lumara X - 1A2"},
       {{{system, versionFile("Lumara X", "10.6") + std::string(1U << 20U, ' ')}}, "Lumara X - -"},
+      {{{system, "<?xml version='1.0' encoding='ISO-8859-1'?>" + twice}}, "Caf\u00e9 10.5 1"},
       {{{early, beta + "\n"}}, "Lumara X Public Beta -"},
       {{{early, "Lumara X\nPublic Beta (build 2E14)\n"}}, "Lumara X World Beta -"},
       {{{early, beta}}, "Lumara X - -"},
@@ -166,7 +170,7 @@ TEST(SearchRules, RecogniseWindowsOnLegacyMachines) {
       {"other letters", ntfs, otherLetters, "", noBootFile, true},
       {"another kind", keys({{"Kind", "hfs"}}), windows, "", {noBootFile.front(), wrongType, wrongType}, true},
       {"no partition map", unmapped, windows, "", noBootFile, true},
-      {"a folder that leads to another volume", ntfs, elsewhere, "", noBootFile, true},
+      {"a folder that leads to another volume", ntfs, elsewhere, "95 Windows - - /Volumes/Other", noBootFile, true},
       {"no legacy machine", ntfs, windows, "", noBootFile, false},
   };
   for (const auto& rule : cases) checkQuickly(rule);
@@ -211,16 +215,22 @@ TEST(SearchRules, KnownFoldersAreCheckedByAllRules) {
   }
 }
 
-TEST(SearchRules, AnEarlierVersionStaysWhereTheFileHasNone) {
-  StartupMachine machine;
-  machine.addLumaraX("disk0s2", "V");
-  machine.writeFile(folder + "/SystemVersion.plist", versionFile("Lumara X", ""));
-  RecordingDelegate delegate;
-  const auto searcher = machine.searcher(delegate, false);
-  const auto volume = machine.volume("disk0s2");
-  volume->setObject("10.4", recordkey::productVersion);
-  searcher->searchForSystemOnVolume(volume);
-  EXPECT_EQ(described(*volume), "10 Lumara X 10.4 1A2 " + folder);
+TEST(SearchRules, OnlyAnEarlierVersionStaysWhereTheFileHasNone) {
+  const std::pair<std::string, const char*> cases[] = {{versionFile("Lumara X", ""), "10 Lumara X 10.4 1A2 "},
+                                                       {"<dict/>", "10 - 10.4 - "}};
+  for (const auto& [file, expected] : cases) {
+    StartupMachine machine;
+    machine.addLumaraX("disk0s2", "V");
+    machine.writeFile(folder + "/SystemVersion.plist", file);
+    RecordingDelegate delegate;
+    const auto searcher = machine.searcher(delegate, false);
+    const auto volume = machine.volume("disk0s2");
+    volume->setObject("Windows", recordkey::productName);
+    volume->setObject("10.4", recordkey::productVersion);
+    volume->setObject("9Z", recordkey::productBuildVersion);
+    searcher->searchForSystemOnVolume(volume);
+    EXPECT_EQ(described(*volume), expected + folder);
+  }
 }
 
 }  // namespace

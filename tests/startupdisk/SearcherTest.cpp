@@ -63,6 +63,21 @@ TEST(Searcher, KeepsVolumesUntilTheyAreWithdrawn) {
   }
 }
 
+TEST(Searcher, WithdrawsARecordByTheDiskThatItIsNow) {
+  StartupMachine machine;
+  RecordingDelegate delegate;
+  const auto searcher = machine.searcher(delegate, false);
+  const auto changed = machine.volume("disk0s2");
+  for (const auto& volume : {changed, machine.volume("disk2s2")}) searcher->searchForSystemOnVolume(volume);
+  changed->setDisk(DiskName{"disk1s2"});
+  for (const auto& [disk, left] : {std::pair("disk0s2", 2U), std::pair("disk1s2", 1U)}) {
+    searcher->cancelSearchOnVolume(*machine.volume(disk));
+    EXPECT_EQ(searcher->waitingVolumes(), left) << disk;
+  }
+  searcher->_searchOldestVolume();
+  EXPECT_EQ(searcher->waitingVolumes(), 0U);
+}
+
 /// A worker for the long search, on a thread of the test's own.
 class Worker {
  public:

@@ -10,7 +10,7 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _services(_root, runLoop),
       _machine{_root, effects, runLoop, _services},
       _authenticator(_machine),
-      _files(_root),
+      _files(_root, effects),
       _systemLog(_root),
       _clock(_machine),
       _networkTime(_machine),

@@ -36,7 +36,8 @@ constexpr KeyRow rows[] = {
     {"Clock", "Offset", integer, "0", R"(seconds added to the real clock while there is no "Time"; setting stores it)"},
     {"Clock", "Time Zone", string, "UTC", "name of the zone; its rules are those of the running machine, or UTC"},
     {"Clock", "Time Zone File", string, absent, "the zone file last set"},
-    {"Clock", "Known Time Zones", strings, absent, "absent: the zones installed where the tool runs"},
+    {"Clock", "Known Time Zones", strings, absent,
+     "absent: the zones installed where the tool runs; an empty name, or one with a line end, is passed over"},
 
     {"", "Network Time", dictionary, absent, "the network time client"},
     {"Network Time", "Running", boolean, "false", "whether it runs"},

@@ -135,7 +135,8 @@ MachineFile::Contents MachineFile::contents() {
 
 std::optional<Failure> MachineFile::keep(const std::optional<FileStamp>& stamp, const Result<VersionRef>& version) {
   const std::scoped_lock held(_mutex);
-  _stamp = stamp;
+  // Without a stamp it is not the absence that was read.
+  _stamp = version || stamp ? stamp : FileStamp{};
   if (version) {
     _version = *version;
     _failure.reset();
@@ -207,8 +208,14 @@ Result<MachineFile::VersionRef> MachineFile::read() const {
 }
 
 Result<std::optional<std::string>> MachineFile::readText() const {
-  const bool isMissing = !_folder.exists(fileName) && !_folder.readLink(fileName);
-  if (isMissing) return std::optional<std::string>();
+  // A link that leads nowhere is a mistake, not a machine with nothing in it.
+  const auto there = _folder.isThere(fileName);
+  if (!there) return inFolder(there.failure());
+  if (!*there) {
+    const auto link = orAbsent(_folder.readLink(fileName));
+    if (!link) return inFolder(link.failure());
+    if (!*link) return std::optional<std::string>();
+  }
   auto text = _folder.read(fileName, ownFileLimits.bytes);
   if (!text) return inFolder(text.failure());
   return std::optional(std::move(text).value());

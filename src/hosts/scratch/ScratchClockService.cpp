@@ -57,7 +57,8 @@ MachineSetting<ZoneName> zoneSetting() {
 
 std::vector<ZoneName> zonesNamedIn(const PropertyList::Array& texts) {
   std::vector<ZoneName> zones;
-  for (const auto& text : texts) zones.push_back({*text.asString()});
+  for (const auto& text : texts)
+    if (const ZoneName zone{*text.asString()}; zone.fitsOneLine()) zones.push_back(zone);
   return zones;
 }
 
@@ -94,9 +95,7 @@ void ScratchClockService::setTime(std::int64_t secondsSince1970) {
 
 std::vector<ZoneName> ScratchClockService::knownTimeZones() {
   const MachineSetting<std::vector<ZoneName>> known{setting::knownTimeZones, "", knownZones, nullptr};
-  auto zones = _settings.read(known).value_or(std::vector<ZoneName>());
-  std::erase_if(zones, [](const auto& zone) { return zone.text.empty(); });
-  return zones;
+  return _settings.read(known).value_or(std::vector<ZoneName>());
 }
 
 ZoneName ScratchClockService::timeZone() {

@@ -12,6 +12,7 @@ Result<std::unique_ptr<ScratchHost>> ScratchHost::open(const std::string& direct
   if (!machine) return machine.failure();
   std::unique_ptr<ScratchHost> host(new ScratchHost(directory, std::move(machine).value(), effects, runLoop));
   effects.addChannel(host->_effectsLog);
+  if (const auto unusable = host->_effectsLog.whyUnusable()) effects.recordFailure("Effects Log", *unusable);
   return host;
 }
 
@@ -21,7 +22,7 @@ ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFi
       _settings(*_machine, effects, runLoop),
       _effectsLog(_machine->folder()),
       _root(directory + "/root"),
-      _files(_root),
+      _files(_root, effects),
       _users(*_machine),
       _authenticator(_settings),
       _systemLog(_machine->folder(), effects),

@@ -35,12 +35,17 @@ std::string oneLine(std::string_view message) {
   return line;
 }
 
+Failure notALog(const std::string& path) {
+  return {"append to", path, "not a regular file"};
+}
+
 /// Appends a line and its newline in one piece; the file is made when it is missing. Several runs may append.
 Result<void> appendLine(const SystemRoot& root, const std::string& path, std::string line) {
   const auto file = root.open(path, O_WRONLY | O_APPEND | O_CREAT | O_NOFOLLOW | O_NONBLOCK, 0644);
   if (!file) return file.failure();
   struct stat before {};
   if (::fstat(file->number(), &before) != 0) return systemFailure("look at", path, errno);
+  if (!S_ISREG(before.st_mode)) return notALog(path);
   line += "\n";
   const auto written = ::write(file->number(), line.data(), line.size());
   if (written == static_cast<ssize_t>(line.size())) return {};
@@ -50,6 +55,14 @@ Result<void> appendLine(const SystemRoot& root, const std::string& path, std::st
 }
 
 }  // namespace
+
+std::optional<Failure> EffectsLog::whyUnusable() const {
+  const auto file = orAbsent(_folder.open(effectsPath, O_PATH | O_NOFOLLOW));
+  if (!file) return file.failure();
+  struct stat status {};
+  const bool isLog = !*file || (::fstat((*file)->number(), &status) == 0 && S_ISREG(status.st_mode));
+  return isLog ? std::nullopt : std::optional(notALog(effectsPath));
+}
 
 void EffectsLog::record(const Effect& effect) {
   static_cast<void>(appendLine(_folder, effectsPath, toJson(effect)));

@@ -16,6 +16,8 @@ class EffectsLog final : public EffectChannel {
  public:
   explicit EffectsLog(const SystemRoot& folder) : _folder(folder) {}
 
+  /// Why nothing can ever be appended: something that is no regular file is in its place.
+  std::optional<Failure> whyUnusable() const;
   void record(const Effect& effect) override;
 
  private:

@@ -8,10 +8,21 @@ namespace tavisk {
 namespace {
 
 DiskEvent watchedPart(const DiskEvent& event, const std::vector<DiskKey>& watch) {
-  DiskEvent watched{event.kind, event.disk, {}};
+  DiskEvent watched{DiskEvent::Kind::descriptionChanged, event.disk, {}};
   std::ranges::copy_if(event.changed, std::back_inserter(watched.changed),
                        [&](DiskKey key) { return std::ranges::find(watch, key) != watch.end(); });
   return watched;
+}
+
+/// What an event is to those who asked for some disks only: one that begins to match appears, one that ceases to is
+/// gone. Absent when it is nothing to them.
+std::optional<DiskEvent> seenBy(const DiskCallbackRequest& request, const DiskEvent& event,
+                                const DiskSnapshot::Disk& before, const DiskSnapshot::Disk& after) {
+  const bool was = before && request.match.accepts(*before);
+  const bool is = after && request.match.accepts(*after);
+  if (was != is) return DiskEvent{is ? DiskEvent::Kind::appeared : DiskEvent::Kind::disappeared, event.disk, {}};
+  auto watched = watchedPart(event, request.watch);
+  return is && !watched.changed.empty() ? std::optional(std::move(watched)) : std::nullopt;
 }
 
 }  // namespace
@@ -22,29 +33,16 @@ void DiskCallbacks::remove(DiskCallback callback, const void* context) {
   });
 }
 
-void DiskCallbacks::tell(const DiskEvent& event, const DiskDescription& disk) const {
+void DiskCallbacks::tellDifferences(const DiskSnapshot& before, const DiskSnapshot& after) const {
+  for (const auto& event : differences(before, after)) tell(event, before.find(event.disk), after.find(event.disk));
+}
+
+void DiskCallbacks::tell(const DiskEvent& event, const DiskSnapshot::Disk& before,
+                         const DiskSnapshot::Disk& after) const {
   const auto requests = _requests;  // a callback may take registrations back
   for (const auto& request : requests) {
-    if (request.kind != event.kind || !request.match.accepts(disk)) continue;
-    const auto watched = watchedPart(event, request.watch);
-    if (event.kind != DiskEvent::Kind::descriptionChanged || !watched.changed.empty())
-      request.callback(watched, request.context);
-  }
-}
-
-void DiskCallbacks::tellGone(const DiskDescription& before, const DiskDescription& after, const DiskName& disk) const {
-  const auto requests = _requests;
-  for (const auto& request : requests)
-    if (request.kind == DiskEvent::Kind::disappeared && request.match.accepts(before) && !request.match.accepts(after))
-      request.callback({DiskEvent::Kind::disappeared, disk, {}}, request.context);
-}
-
-void DiskCallbacks::tellDifferences(const DiskSnapshot& before, const DiskSnapshot& after) const {
-  for (const auto& event : differences(before, after)) {
-    const auto was = before.find(event.disk);
-    const auto is = after.find(event.disk);
-    tell(event, is ? *is : *was);
-    if (was && is) tellGone(*was, *is, event.disk);
+    const auto seen = seenBy(request, event, before, after);
+    if (seen && seen->kind == request.kind) request.callback(*seen, request.context);
   }
 }
 

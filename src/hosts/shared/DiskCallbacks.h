@@ -16,15 +16,13 @@ class DiskCallbacks {
   void add(DiskCallbackRequest request) { _requests.push_back(std::move(request)); }
   void remove(DiskCallback callback, const void* context);
 
-  /// Calls those that asked for this kind of event and match the disk; the keys of a change that a callback does not
-  /// watch are left out, and without any left it is not called.
-  void tell(const DiskEvent& event, const DiskDescription& disk) const;
-  /// Tells what happened from one moment to the next. Who asked to be told of disks that go is told so too of a disk
-  /// that is still there but that the match accepts no longer.
+  /// Tells what happened from one moment to the next to those that asked for this kind of event and match the disk: one
+  /// that begins to match has appeared for them, one that ceases to is gone. The keys of a change that a callback does
+  /// not watch are left out, and without any left it is not called.
   void tellDifferences(const DiskSnapshot& before, const DiskSnapshot& after) const;
 
  private:
-  void tellGone(const DiskDescription& before, const DiskDescription& after, const DiskName& disk) const;
+  void tell(const DiskEvent& event, const DiskSnapshot::Disk& before, const DiskSnapshot::Disk& after) const;
 
   std::vector<DiskCallbackRequest> _requests;
 };

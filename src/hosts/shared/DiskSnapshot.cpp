@@ -16,7 +16,9 @@ DiskName nameOf(const DiskSnapshot::Disk& disk) {
 std::optional<DiskEvent> eventOf(const DiskSnapshot::Disk& before, const DiskSnapshot::Disk& after) {
   if (!before) return DiskEvent{DiskEvent::Kind::appeared, nameOf(after), {}};
   auto changed = changedKeys(*before, *after);
-  if (changed.empty()) return std::nullopt;
+  const bool mayMatchElse =
+      before->volumeMountable != after->volumeMountable || before->volumeNetwork != after->volumeNetwork;
+  if (changed.empty() && !mayMatchElse) return std::nullopt;
   return DiskEvent{DiskEvent::Kind::descriptionChanged, nameOf(after), std::move(changed)};
 }
 

@@ -35,7 +35,7 @@ class DiskSnapshot {
 };
 
 /// What has to be told when one moment follows another: the disks that have gone, in the order of before, then those
-/// that are new or changed, in the order of after.
+/// that are new or changed, in the order of after. A change without a key is one of what a DiskMatch asks.
 std::vector<DiskEvent> differences(const DiskSnapshot& before, const DiskSnapshot& after);
 
 }  // namespace tavisk

@@ -28,8 +28,7 @@ PropertyList::Dictionary changed(PropertyList::Dictionary file, const PropertyLi
 
 std::string architectureIn(const PropertyList::Dictionary& contents) {
   const auto* value = contents.find(BootLoaderFile::architectureKey);
-  const auto* architecture = value ? value->asString() : nullptr;
-  return architecture ? *architecture : "default";
+  return value ? plainText(*value) : "default";
 }
 
 Setting<std::string> kernelArchitecture(const Contents& read) {

@@ -113,15 +113,31 @@ std::optional<FileStamp> SystemRoot::stamp(const std::string& path) const {
                    nanoseconds(status.st_ctim)};
 }
 
-Result<std::string> SystemRoot::read(const std::string& path, std::size_t limit) const {
+Result<FileDescriptor> SystemRoot::openRegular(const std::string& path) const {
   const auto seen = open(path, O_PATH);
   if (!seen) return seen.failure();
   // Only looked at so far: to open a device may already do something.
   if (const auto isRegular = needsRegularFile(*seen, path); !isRegular) return isRegular.failure();
-  const auto file = open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
-  if (!file) return file.failure();
+  auto file = open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
+  if (!file) return file;
   if (const auto isRegular = needsRegularFile(*file, path); !isRegular) return isRegular.failure();
+  return file;
+}
+
+Result<std::string> SystemRoot::read(const std::string& path, std::size_t limit) const {
+  const auto file = openRegular(path);
+  if (!file) return file.failure();
   return readAll(*file, limit, path);
+}
+
+Result<std::string> SystemRoot::readBeginning(const std::string& path, std::size_t length) const {
+  const auto file = openRegular(path);
+  if (!file) return file.failure();
+  std::string beginning(length, '\0');
+  const auto count = ::read(file->number(), beginning.data(), length);
+  if (count < 0) return systemFailure("read", path, errno);
+  beginning.resize(static_cast<std::size_t>(count));
+  return beginning;
 }
 
 Result<std::string> SystemRoot::readLink(const std::string& path) const {

@@ -45,6 +45,8 @@ class SystemRoot {
   std::optional<FileStamp> stamp(const std::string& path) const;
   /// A regular file of at most `limit` bytes. Nothing else is opened: no FIFO, no device, no socket.
   Result<std::string> read(const std::string& path, std::size_t limit) const;
+  /// The first `length` bytes of such a file, however large it is, or all where it has no more.
+  Result<std::string> readBeginning(const std::string& path, std::size_t length) const;
   Result<std::string> readLink(const std::string& path) const;
   /// The names in a folder, sorted by bytes, without "." and "..".
   Result<std::vector<std::string>> list(const std::string& path) const;
@@ -64,6 +66,7 @@ class SystemRoot {
   Result<void> makeFolders(const std::string& path) const;
 
  private:
+  Result<FileDescriptor> openRegular(const std::string& path) const;
   Result<FileDescriptor> openPrefix(const std::string& path) const;
   Result<FileDescriptor> makeFolder(const std::string& path) const;
   Result<void> makePrefix(const std::string& path) const;

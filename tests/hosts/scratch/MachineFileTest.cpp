@@ -4,6 +4,7 @@
 #include <gmock/gmock.h>
 #include <signal.h>
 #include <sys/file.h>
+#include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -12,6 +13,7 @@
 #include "OwnMounts.h"
 #include "ScratchMachine.h"
 #include "base/Text.h"
+#include "effects/EffectMatchers.h"
 #include "hosts/scratch/KeyTable.h"
 #include "hosts/scratch/MachineFile.h"
 
@@ -293,6 +295,21 @@ TEST_F(MachineFileTest, leavesNoHalfLineInTheSystemLog) {
       machine.host().systemLog().write(message);
     EXPECT_THAT(machine.systemLog(), ElementsAre("first", "last"));
   });
+}
+
+TEST_F(MachineFileTest, isNoEmptyMachineWhenItCannotBeLookedAt) {
+  machine.set("Clock", "Time Zone", "UTC");
+  const auto file = open();
+  machine.set("Clock", "Time Zone", "GMT");
+  rlimit before{};
+  ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &before), 0);
+  const rlimit none{0, before.rlim_max};
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &none), 0);
+  const auto zone = file->section("Clock").optionalText("Time Zone");
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &before), 0);
+  EXPECT_EQ(zone, "UTC") << "what was read last";
+  EXPECT_THAT(machine.log.effects, ElementsAre(FailedFor("Too many open files")));
+  EXPECT_EQ(file->section("Clock").text("Time Zone"), "GMT");
 }
 
 }  // namespace

@@ -1,6 +1,11 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
 #include "ScratchMachine.h"
+#include "base/FileDescriptor.h"
 #include "platform/AdminAuthenticatorContract.h"
 #include "platform/BootLoaderFileContract.h"
 #include "platform/ClockContract.h"
@@ -175,6 +180,22 @@ struct ScratchBootLoader : ScratchService<&Host::bootLoaderFile> {
   std::string file(const std::string& path) { return machine.file(path); }
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, BootLoaderFileContract, ScratchBootLoader);
+
+TEST(ScratchHost, appendsToRegularFilesOnly) {
+  ScratchMachine machine;
+  std::vector<FileDescriptor> readers;
+  for (const char* log : {"/effects.log", "/system.log"}) {
+    const auto path = machine.directory() + log;
+    ASSERT_EQ(::mkfifo(path.c_str(), 0600), 0);
+    readers.emplace_back(::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+  }
+  machine.host().systemLog().write("message");
+  std::vector<std::string> told;
+  for (const auto& effect : machine.log.effects) told.push_back(effect.setting + ": " + effect.failure->why);
+  EXPECT_THAT(told, ElementsAre("Effects Log: not a regular file", "System Log: not a regular file"));
+  char byte = 0;
+  for (const auto& reader : readers) EXPECT_EQ(::read(reader.number(), &byte, 1), 0);
+}
 
 TEST(ScratchHost, writesOneLineAMessage) {
   ScratchMachine machine;

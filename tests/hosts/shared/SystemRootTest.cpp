@@ -226,8 +226,43 @@ class RootedFileSystemTest : public SystemRootTest {
   }
   void link(const std::string& path, const std::string& target) const { fs::create_symlink(target, at(path)); }
 
-  RootedFileSystem files{root};
+  EffectSink effects;
+  EffectLog log;
+  RootedFileSystem files{root, effects};
 };
+
+TEST_F(RootedFileSystemTest, tellsWhatCannotBeLookedAtOnceAndTheFirstFew) {
+  effects.addChannel(log);
+  for (const char* path : {"/loop", "/loop/x", "/Volumes", "/none", "/Volumes/Backup/System/boot.efi/x"}) {
+    files.exists(path);
+    EXPECT_FALSE(files.read(path, 9));
+    EXPECT_FALSE(files.readBeginning(path, 9));
+  }
+  EXPECT_FALSE(files.standardized("/loop/y"));
+  std::vector<std::string> told;
+  for (const auto& effect : log.effects) told.push_back(effect.setting + " " + describe(*effect.failure));
+  EXPECT_THAT(told, ElementsAre("Files look for on /loop: Too many levels of symbolic links",
+                                "Files look for on /loop/x: Too many levels of symbolic links",
+                                "Files read on /Volumes: not a regular file",
+                                "Files resolve on /loop/y: Too many levels of symbolic links"));
+  for (int number = 0; number < 1'000; ++number) files.exists("/loop/" + std::to_string(number));
+  EXPECT_EQ(log.effects.size(), RootedFileSystem::mostTold);
+  EXPECT_EQ(log.effects.back().note, "what else cannot be looked at is not told");
+}
+
+TEST(RootedFileSystem, hasNoFilesWithoutARoot) {
+  TemporaryFolder folder;
+  EffectSink effects;
+  EffectLog log;
+  effects.addChannel(log);
+  const SystemRoot root(folder.path() / "none");
+  RootedFileSystem files(root, effects);
+  const std::pair<const char*, const char*> cases[] = {{"//a/./b/../c/", "/a/c"}, {"/", "/"}, {"/../..", "/"}};
+  for (const auto& [path, standardized] : cases) EXPECT_EQ(files.standardized(path).valueOr("none"), standardized);
+  EXPECT_FALSE(files.exists("/"));
+  EXPECT_FALSE(files.standardized("relative"));
+  EXPECT_EQ(log.effects.size(), 1U);
+}
 
 TEST_F(RootedFileSystemTest, followsLinksInsideTheRootOnly) {
   for (const char* path : {"/Volumes/Backup/System/boot.efi", "/startup/System/boot.efi", "/absolute/boot.efi",
