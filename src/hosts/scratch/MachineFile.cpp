@@ -15,8 +15,8 @@
 
 #include "base/FileDescriptor.h"
 #include "base/Text.h"
+#include "hosts/scratch/FileLock.h"
 #include "hosts/scratch/KeyTable.h"
-#include "hosts/shared/FileLock.h"
 
 namespace tavisk {
 namespace {

@@ -47,12 +47,6 @@ struct NotSupported {
 /// Whether a machine can have a setting: absent, it can. A failure says that this could not be found out.
 using Support = Result<std::optional<NotSupported>>;
 
-/// On the way out: a reason that may be a failed look.
-inline Support asSupport(std::optional<Failure> reason) {
-  if (!reason) return std::nullopt;
-  return std::optional(NotSupported{*std::move(reason)});
-}
-
 /// A remark that is the same whatever is asked.
 inline auto saying(std::string text) {
   return [text = std::move(text)](const auto&) { return text; };

@@ -2,21 +2,16 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/machine/LinuxPreferences.h"
 
-#include <chrono>
-
 #include "effects/SettingNames.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/linux/system/ShellAssignments.h"
-#include "hosts/shared/FileLock.h"
 
 namespace tavisk {
 namespace {
 
 constexpr const char* folder = "/etc/tavisk/preferences";
-constexpr const char* lock = "/etc/tavisk/preferences/.lock";
 constexpr const char* file = "/etc/tavisk/preferences/AnyApplication.plist";
-constexpr std::chrono::seconds longestLock{3};
 constexpr const char* languages = "VelmarLanguages";
 constexpr const char* localeFiles[] = {"/etc/default/locale", "/etc/locale.conf"};
 
@@ -58,9 +53,6 @@ void LinuxPreferencesStore::writeOut() {
 Result<void> LinuxPreferencesStore::store(const std::string& key, bool value) {
   if (const auto failure = whyNeedsRoot("write", _file.path())) return *failure;
   if (auto made = _machine.root.makeFolders(folder); !made) return made;
-  const auto patience = std::chrono::duration_cast<std::chrono::milliseconds>(_machine.runLoop.timeFor(longestLock));
-  const auto held = lockFile(_machine.root, lock, patience);
-  if (!held) return held.failure();
   auto preferences = _file.readToChange();
   if (!preferences) return preferences.failure();
   auto changed = std::move(preferences).value();

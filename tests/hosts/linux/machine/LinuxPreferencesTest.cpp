@@ -6,7 +6,7 @@
 #include "effects/SettingNames.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/TracedRun.h"
-#include "hosts/shared/FileLock.h"
+#include "hosts/linux/system/MachineLock.h"
 #include "platform/PreferencesContract.h"
 
 namespace tavisk {
@@ -43,14 +43,17 @@ TEST(LinuxPreferences, AreWrittenTogetherWithThoseOfOtherRuns) {
   EXPECT_EQ(tree.lastEffect().stored, "off");
 }
 
-TEST(LinuxPreferences, AreNotWrittenUnderAnothersLock) {
+TEST(LinuxPreferences, AreNotWrittenWhileAnotherRunChangesTheMachine) {
   LinuxTree tree;
   auto& processes = tree.host().processes();
   processes.setMachineBoolean("a", true);
   tree.write(preferencesFile, "<dict/>");
-  const auto held = lockFile(SystemRoot(tree.at("/")), "/etc/tavisk/preferences/.lock", std::chrono::seconds(0));
+  const SystemRoot root(tree.at("/"));
+  RunLoop loop;
+  const auto held = MachineLock(root, loop).hold();
+  const auto limit = tree.runLoop.limitWaits(std::chrono::milliseconds(10));
   processes.writeMachinePreferences();
-  EXPECT_THAT(tree.lastEffect(), FailedFor("another run keeps it locked"));
+  EXPECT_THAT(tree.lastEffect(), FailedFor("is changing a setting of this machine"));
   EXPECT_EQ(tree.file(preferencesFile), "<dict/>");
 }
 

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "hosts/shared/FileLock.h"
+#include "hosts/scratch/FileLock.h"
 
 #include <fcntl.h>
 #include <sys/file.h>
