@@ -58,9 +58,9 @@ CHECKS = [
                        '"org.tavisk.manage"'),
           then={"ls -d /run/x /etc/systemd/system/x.service 2>/dev/null": ""}),
     Check("the package's rule is about its own units and verbs", needs=CONTAINER,
-          do=with_rule("YES", by("alice", "sleep 60") + " & sleep 1; " + may("ssh.service", "stop") + may("ssh.service", "kill")
-                       + may("cron.service", "stop") + "kill $!", f'"{UNITS}"'),
-          prints="stop ssh.service: 2\nkill ssh.service: 0\nstop cron.service: 0\n"),
+          do=by("alice", "sleep 60") + " & sleep 1; " + may("ssh.service", "stop") + may("ssh.service", "kill")
+          + may("cron.service", "stop") + "kill $!",
+          prints="stop ssh.service: 0\nkill ssh.service: 2\nstop cron.service: 2\n"),
     Check("an administrator is told that enabling needs root before anything moves", needs=CONTAINER | {"openssh-server"},
           do="tavisk -setremotelogin on >/dev/null; " + with_rule("YES", by("alice", "TAVISK_LOG=stderr tavisk -f -setremotelogin off")),
           errors=re.compile(r"tavisk: Remote Login: disable on ssh[^\n]*: needs root: sudo tavisk [^\n]*\n"),

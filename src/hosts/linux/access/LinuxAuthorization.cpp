@@ -53,8 +53,14 @@ Result<void> LinuxAdminAuthenticator::authorize() {
   const auto bus = _machine.services.systemBus();
   // Without a bus there is no polkit.
   if (!bus) return isAbsent(bus.failure()) ? Result<void>() : bus.failure();
-  const auto asker = ::isatty(STDIN_FILENO) == 1 ? Bus::Asker([this] { return haveAgent(); }) : Bus::Asker();
-  _machine.services.askUserBy(asker);
+  std::optional<PolkitAgent> agent;
+  const auto startAgent = [&]() -> Result<void> {
+    auto started = PolkitAgent::start(_machine.root, _machine.runLoop);
+    if (!started) return started.failure();
+    agent = std::move(started).value();
+    return {};
+  };
+  const auto asker = ::isatty(STDIN_FILENO) == 1 ? Asker(startAgent) : Asker();
   const auto answer = checkAuthorization(**bus, action, asker);
   if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return {};
   if (!answer) return answer.failure();
@@ -65,14 +71,6 @@ Result<void> LinuxAdminAuthenticator::authorize() {
   return Failure{"authorize", action,
                  isUnasked ? "polkit asks for a password, and there is no terminal to ask at: sudo tavisk ..."
                            : "polkit does not grant it to this user"};
-}
-
-Result<void> LinuxAdminAuthenticator::haveAgent() {
-  if (_agent) return {};
-  auto started = PolkitAgent::start(_machine.root, _machine.runLoop);
-  if (!started) return started.failure();
-  _agent = std::move(started).value();
-  return {};
 }
 
 /// Over a connection of its own: the main thread may be in the middle of a call on the usual one. What cannot be given

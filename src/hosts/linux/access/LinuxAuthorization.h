@@ -32,12 +32,10 @@ class LinuxAdminAuthenticator final : public AdminAuthenticator {
 
  private:
   Result<void> authorize();
-  Result<void> haveAgent();
   std::string takeTemporaryId();
 
   LinuxMachine _machine;
   std::atomic<bool> _isAuthenticated = false;
-  std::optional<PolkitAgent> _agent;
   std::mutex _mutex;
   std::string _temporaryId;  ///< guarded by the mutex
 };

@@ -66,7 +66,7 @@ Result<Authorization> check(Bus& bus, const char* action, bool asks) {
     message.write("");
   };
   auto reply = asks ? bus.callWithQuestion(authority(), checkMember, checkReply, arguments)
-                    : bus.query(authority(), checkMember, checkReply, arguments);
+                    : bus.call(authority(), checkMember, checkReply, arguments);
   if (!reply) return reply.failure();
   auto answer = std::move(reply).value();
   answer.enter('r', "bba{ss}");
@@ -77,7 +77,7 @@ Result<Authorization> check(Bus& bus, const char* action, bool asks) {
 
 }  // namespace
 
-Result<Authorization> checkAuthorization(Bus& bus, const char* action, const Bus::Asker& asker) {
+Result<Authorization> checkAuthorization(Bus& bus, const char* action, const Asker& asker) {
   const auto answer = check(bus, action, false);
   if (!answer || answer->isGranted || !answer->isForTheAsking || !asker) return answer;
   if (const auto ready = asker(); !ready) return ready.failure();
@@ -85,7 +85,7 @@ Result<Authorization> checkAuthorization(Bus& bus, const char* action, const Bus
 }
 
 Result<void> revokeAuthorization(Bus& bus, const std::string& temporaryId) {
-  const auto reply = bus.query(authority(), "RevokeTemporaryAuthorizationById", "", temporaryId);
+  const auto reply = bus.call(authority(), "RevokeTemporaryAuthorizationById", "", temporaryId);
   if (!reply) return reply.failure();
   return {};
 }

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <string>
 #include <utility>
 
@@ -20,10 +21,13 @@ struct Authorization {
   std::string temporaryId;  ///< empty when nothing has to be given back
 };
 
+/// Makes the user ready to be asked to authenticate: success means that a question will be shown.
+using Asker = std::function<Result<void>()>;
+
 /// Asks polkit whether this process may do an action. Where the user has to authenticate first, polkit asks as soon as
-/// `asker` has made that possible (see Bus::Asker); an empty one: the user is not asked. Fails with serviceUnknown
-/// where polkit is not installed.
-Result<Authorization> checkAuthorization(Bus& bus, const char* action, const Bus::Asker& asker);
+/// `asker` has made that possible; an empty one: the user is not asked. Fails with serviceUnknown where polkit is not
+/// installed.
+Result<Authorization> checkAuthorization(Bus& bus, const char* action, const Asker& asker);
 
 /// Gives a temporary authorization back.
 Result<void> revokeAuthorization(Bus& bus, const std::string& temporaryId);

@@ -52,7 +52,7 @@ void LinuxProcessTermination::disable() {
   const auto bus = _machine.services.systemBus();
   if (!bus) return;
   auto hold =
-      (*bus)->query(loginManager(), "Inhibit", "h", "shutdown", "tavisk", "The startup disk is being set", "delay");
+      (*bus)->call(loginManager(), "Inhibit", "h", "shutdown", "tavisk", "The startup disk is being set", "delay");
   if (hold) _hold = std::move(hold).value().readDescriptor();
 }
 

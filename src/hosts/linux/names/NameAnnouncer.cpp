@@ -31,7 +31,7 @@ BusObject messageBus() {
 Result<Bus*> NameAnnouncer::busOf(const char* service) {
   auto bus = systemBusIfAny(_services);
   if (!bus || !*bus) return bus;
-  auto runs = (*bus)->query(messageBus(), "NameHasOwner", "b", service);
+  auto runs = (*bus)->call(messageBus(), "NameHasOwner", "b", service);
   if (!runs) return runs.failure();
   return std::move(runs).value().readBoolean() ? *bus : nullptr;
 }
@@ -40,7 +40,7 @@ Result<std::optional<std::string>> NameAnnouncer::respondersName() {
   const auto bus = busOf(responder().service);
   if (!bus) return bus.failure();
   if (!*bus) return std::optional<std::string>();
-  auto name = (*bus)->query(responder(), "GetHostName", "s");
+  auto name = (*bus)->call(responder(), "GetHostName", "s");
   if (!name) return name.failure();
   return std::optional(std::move(name).value().readText());
 }

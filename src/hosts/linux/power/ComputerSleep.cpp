@@ -89,7 +89,7 @@ Support ComputerSleep::sleepSupported() {
   const auto bus = _machine.services.systemBus();
   if (!bus && isAbsent(bus.failure())) return NotSupported{bus.failure()};
   if (!bus) return bus.failure();
-  auto answer = (*bus)->query(loginManager(), tried, "s");
+  auto answer = (*bus)->call(loginManager(), tried, "s");
   if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return NotSupported{answer.failure()};
   if (!answer) return answer.failure();
   if (std::move(answer).value().readText() == "na")
@@ -112,7 +112,7 @@ std::string ComputerSleep::whatBlocksSleep() {
   std::string names;
   const auto bus = _machine.services.systemBus();
   if (!bus) return names;
-  auto reply = (*bus)->query(loginManager(), "ListInhibitors", "a(ssssuu)");
+  auto reply = (*bus)->call(loginManager(), "ListInhibitors", "a(ssssuu)");
   if (!reply) return names;
   auto inhibitors = std::move(reply).value();
   if (!inhibitors.enter('a', "(ssssuu)")) return names;

@@ -148,10 +148,7 @@ bool Bus::wasSilent(const BusObject& object) const {
 
 Result<BusMessage> Bus::call(const BusObject& object, const char* member, const char* replySignature,
                              const Writer& arguments, std::chrono::seconds longest) {
-  auto reply = exchange(object, member, replySignature, arguments, false, longest);
-  if (reply || !_asker || reply.failure().code != BusErrorCode::interactionRequired) return reply;
-  if (const auto ready = _asker(); !ready) return ready.failure();
-  return callWithQuestion(object, member, replySignature, arguments);
+  return exchange(object, member, replySignature, arguments, false, longest);
 }
 
 Result<BusMessage> Bus::callWithQuestion(const BusObject& object, const char* member, const char* replySignature,
@@ -159,13 +156,8 @@ Result<BusMessage> Bus::callWithQuestion(const BusObject& object, const char* me
   return exchange(object, member, replySignature, arguments, true, timeForQuestions);
 }
 
-Result<BusMessage> Bus::query(const BusObject& object, const char* member, const char* replySignature,
-                              const Writer& arguments) {
-  return exchange(object, member, replySignature, arguments, false, usualTime);
-}
-
 Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, const char* replySignature,
-                                 const Writer& arguments, bool asks, std::chrono::seconds longest) {
+                                 const Writer& arguments, bool isQuestion, std::chrono::seconds longest) {
   if (wasSilent(object)) return Failure{member, object.path, "this service has just left a call without an answer"};
   sd_bus_message* handle = nullptr;
   int result = _library.sd_bus_message_new_method_call(_bus, &handle, destination(object), object.path.c_str(),
@@ -176,13 +168,12 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
   if (const auto error = request.error()) return systemFailure(member, object.path, error.value());
   const auto left = timeFor(longest);
   if (left.count() == 0) return systemFailure(member, object.path, ETIMEDOUT);
-  const auto question = asks && _runLoop ? _runLoop->pauseLimit() : RunLoop::Registration();
-  _library.sd_bus_message_set_allow_interactive_authorization(handle, asks ? 1 : 0);
+  const auto question = isQuestion && _runLoop ? _runLoop->pauseLimit() : RunLoop::Registration();
 
   BusError error(_library);
   sd_bus_message* answer = nullptr;
   const auto began = std::chrono::steady_clock::now();
-  result = _library.sd_bus_call(_bus, handle, microseconds(asks ? longest : left), error.handle(), &answer);
+  result = _library.sd_bus_call(_bus, handle, microseconds(isQuestion ? longest : left), error.handle(), &answer);
   // A service that ended during the call has the same error at once.
   const auto now = std::chrono::steady_clock::now();
   if (result == -ETIMEDOUT && now - began >= longest) _silentSince[object.service] = now;
@@ -195,7 +186,7 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
 
 Result<BusMessage> Bus::property(const BusObject& object, const char* name, const char* signature) {
   const BusObject properties{object.service, object.path, propertiesInterface};
-  auto reply = query(properties, "Get", "v", object.interface, name);
+  auto reply = call(properties, "Get", "v", object.interface, name);
   if (!reply) return retold(reply.failure(), name, object.path);
   auto value = std::move(reply).value();
   if (!value.enter('v', signature)) return Failure{name, object.path, "the value has another type than expected"};

@@ -50,32 +50,18 @@ class Bus {
   ~Bus();
 
   bool isOpen() const;
-  /// Makes the user ready to be asked to authenticate: success means that a question will be shown.
-  using Asker = std::function<Result<void>()>;
-  /// Without one (as at first, or an empty one) the user is not asked.
-  void askUserBy(Asker asker) { _asker = std::move(asker); }
-
   /// By which others on the message bus know this connection.
   std::string uniqueName() const;
 
   using Writer = std::function<void(BusMessage&)>;
-  /// Calls and waits for the reply. A service that has not answered in time is not asked again for a while: calls to it
-  /// fail at once. When the service wants the user to authenticate first, and there is a way to ask, it is called again
-  /// by callWithQuestion().
+  /// Calls and waits for the reply. The user is asked nothing meanwhile: a service that wants a password first refuses
+  /// (interactionRequired). One that has not answered in time is not asked again for a while: calls to it fail at once.
   Result<BusMessage> call(const BusObject& object, const char* member, const char* replySignature,
                           const Writer& arguments, std::chrono::seconds longest = usualTime);
   template <typename... Arguments>
   Result<BusMessage> call(const BusObject& object, const char* member, const char* replySignature,
                           const Arguments&... arguments) {
     return call(object, member, replySignature, Writer([&](BusMessage& message) { (message.write(arguments), ...); }));
-  }
-  /// As call(), of what needs nobody's leave: the user is not asked, and it takes no longer than usual.
-  Result<BusMessage> query(const BusObject& object, const char* member, const char* replySignature,
-                           const Writer& arguments);
-  template <typename... Arguments>
-  Result<BusMessage> query(const BusObject& object, const char* member, const char* replySignature,
-                           const Arguments&... arguments) {
-    return query(object, member, replySignature, Writer([&](BusMessage& message) { (message.write(arguments), ...); }));
   }
   /// As call(), of a service that asks the user meanwhile: the time of the question does not count against the limit.
   Result<BusMessage> callWithQuestion(const BusObject& object, const char* member, const char* replySignature,
@@ -117,7 +103,7 @@ class Bus {
   int start(const FileDescriptor& connection);
   int awaitReady();
   Result<BusMessage> exchange(const BusObject& object, const char* member, const char* replySignature,
-                              const Writer& arguments, bool asks, std::chrono::seconds longest);
+                              const Writer& arguments, bool isQuestion, std::chrono::seconds longest);
   const char* destination(const BusObject& object) const;
   bool wasSilent(const BusObject& object) const;
 
@@ -125,7 +111,6 @@ class Bus {
   sd_bus* _bus;
   Kind _kind;
   RunLoop* _runLoop;
-  Asker _asker;
   std::map<std::string, std::chrono::steady_clock::time_point, std::less<>> _silentSince;  ///< by service
 };
 

@@ -48,17 +48,13 @@ Result<std::unique_ptr<Bus>> ServiceAccess::open(const Connection& connection) {
 }
 
 Result<Bus*> ServiceAccess::use(Connection& connection) {
-  if (connection.bus && connection.bus->isOpen()) {
-    connection.bus->askUserBy(_asker);
-    return connection.bus.get();
-  }
+  if (connection.bus && connection.bus->isOpen()) return connection.bus.get();
   const auto began = RunLoop::Clock::now();
   if (connection.failure && began - connection.failedAt < Bus::timeWithoutRetry) return *connection.failure;
   connection.failure.reset();
   auto bus = open(connection);
   if (bus) {
     connection.bus = std::move(bus).value();
-    connection.bus->askUserBy(_asker);
     return connection.bus.get();
   }
   connection.failedAt = RunLoop::Clock::now();

@@ -33,10 +33,6 @@ class ServiceAccess {
   /// Those of the service manager, or the init scripts of a machine that has none.
   Daemons& daemons();
 
-  /// How the user is made ready to be asked to authenticate. From now on a call that a service grants only then calls
-  /// this first; its failure is that of the call.
-  void askUserBy(Bus::Asker asker) { _asker = std::move(asker); }
-
  private:
   /// A look that failed is not repeated for a while: all that builds on it has the same answer.
   Result<bool> lookForManager();
@@ -59,7 +55,6 @@ class ServiceAccess {
   Connection _manager{"/run/systemd/private", Bus::Kind::straightToService};
   std::optional<Failure> _lookFailure;
   RunLoop::Clock::time_point _lookedAt;
-  Bus::Asker _asker;
   UnitDaemons _units{*this, _runLoop};
   InitScriptDaemons _scripts{_root, _runLoop};
 };

@@ -70,7 +70,7 @@ class EndedJobs {
 Result<BusMessage> UnitDaemons::ask(const Daemon& daemon, const char* member, const char* replySignature) {
   const auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
-  auto reply = (*bus)->query(serviceManager(), member, replySignature, daemon.unit);
+  auto reply = (*bus)->call(serviceManager(), member, replySignature, daemon.unit);
   if (!reply) return about(daemon, reply.failure());
   return reply;
 }

@@ -41,10 +41,10 @@ struct PolkitTree : LinuxTree {
 };
 
 TEST(Polkit, AsksTheUserOnlyThroughAnAgent) {
-  const Bus::Asker ready = [] { return Result<void>(); };
-  const Bus::Asker broken = []() -> Result<void> { return Failure{"ask", "", "no agent"}; };
+  const Asker ready = [] { return Result<void>(); };
+  const Asker broken = []() -> Result<void> { return Failure{"ask", "", "no agent"}; };
   using Answer = PolkitTree::Answer;
-  const std::tuple<Answer, Bus::Asker, std::vector<std::uint32_t>, const char*> cases[] = {
+  const std::tuple<Answer, Asker, std::vector<std::uint32_t>, const char*> cases[] = {
       {Answer::granted, broken, {0}, "tmp7"},      {Answer::question, ready, {0, 1}, "tmp7"},
       {Answer::question, broken, {0}, "no agent"}, {Answer::question, nullptr, {0}, ""},
       {Answer::silence, ready, {0}, "timed out"},
