@@ -9,6 +9,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <thread>
 
 #include "base/Process.h"
 #include "base/Text.h"
@@ -62,7 +63,11 @@ int run(Report* report, int argc, char** argv) {
   RunLoop runLoop;
   Output output(stdout);
   TerminalLineSource input(output, runLoop);
-  log.printThrough([&input](const auto& print) { input.printAside(print); });
+  // The editor belongs to this thread.
+  log.printThrough([&input, own = std::this_thread::get_id()](const auto& print) {
+    if (std::this_thread::get_id() == own) return input.printAside(print);
+    print();
+  });
   const auto host = chooseHost(effects, runLoop);
   if (!host) return refuse(describe(host.failure()), report);
 

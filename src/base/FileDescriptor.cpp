@@ -92,6 +92,20 @@ Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const
   }
 }
 
+Result<std::string> readBeginning(const FileDescriptor& file, std::size_t length, const std::string& path) {
+  std::string beginning(length, '\0');
+  std::size_t size = 0;
+  while (size < length) {
+    const auto count = ::read(file.number(), beginning.data() + size, length - size);
+    if (count < 0 && errno == EINTR) continue;
+    if (count < 0) return systemFailure("read", path, errno);
+    if (count == 0) break;
+    size += static_cast<std::size_t>(count);
+  }
+  beginning.resize(size);
+  return beginning;
+}
+
 Result<void> writeAll(const FileDescriptor& file, std::string_view contents, const std::string& path) {
   const int error = writeFrom(contents, file);
   return error == 0 ? Result<void>() : systemFailure("write", path, error);

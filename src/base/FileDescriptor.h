@@ -34,6 +34,9 @@ class FileDescriptor final {
 /// Everything from the descriptor's place to the end, at most `limit` bytes. `path` is what failures name.
 Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const std::string& path);
 
+/// The first bytes from the descriptor's place, at most `length`.
+Result<std::string> readBeginning(const FileDescriptor& file, std::size_t length, const std::string& path);
+
 /// Every byte, however many calls it takes.
 Result<void> writeAll(const FileDescriptor& file, std::string_view contents, const std::string& path);
 

@@ -246,8 +246,6 @@ class Reader {
 
 const char* expectationOf(pugi::xml_parse_status status) {
   switch (status) {
-    case pugi::status_out_of_memory:
-      return "enough memory";
     case pugi::status_bad_pi:
       return "the end of a processing instruction";
     case pugi::status_bad_comment:
@@ -284,6 +282,7 @@ Result<PropertyList> parsePropertyList(std::string_view xml, const PropertyListL
     refuseWhatIsNoXml(text);
     pugi::xml_document document;
     const auto parsed = document.load_buffer(text.data(), text.size(), options, pugi::encoding_utf8);
+    if (parsed.status == pugi::status_out_of_memory) throw std::bad_alloc();
     if (!parsed) throw Malformed(parsed.offset, expectationOf(parsed.status));
     return Reader(limits).document(document);
   } catch (const Malformed& malformed) {

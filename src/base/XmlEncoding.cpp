@@ -60,13 +60,16 @@ Failure notReadable(std::string_view encoding, const char* why) {
 
 class Converter {
  public:
-  explicit Converter(const std::string& encoding) : _converter(::iconv_open("UTF-8", encoding.c_str())) {}
+  explicit Converter(const std::string& encoding)
+      : _converter(::iconv_open("UTF-8", encoding.c_str())), _error(errno) {}
   Converter(const Converter&) = delete;
   Converter& operator=(const Converter&) = delete;
   ~Converter() {
     if (isOpen()) ::iconv_close(_converter);
   }
 
+  /// Why it is not, an errno value; EINVAL: the encoding is not known.
+  int error() const { return isOpen() ? 0 : _error; }
   bool isOpen() const { return reinterpret_cast<std::intptr_t>(_converter) != -1; }
   /// Absent when the bytes are not so encoded.
   std::optional<std::string> convert(std::string bytes) {
@@ -92,13 +95,15 @@ class Converter {
   }
 
   iconv_t _converter;
+  int _error;
 };
 
 Result<Utf8Text> converted(std::string_view bytes, std::string_view encoding) {
   if (lowerCased(encoding) == "utf-8") return Utf8Text(bytes);
   if (!isEncodingName(encoding)) return notReadable(encoding, "is none");
   Converter converter{std::string(encoding)};
-  if (!converter.isOpen()) return notReadable(encoding, "is not known on this machine");
+  if (converter.error() == EINVAL) return notReadable(encoding, "is not known on this machine");
+  if (!converter.isOpen()) return systemFailure("convert from", std::string(encoding), converter.error());
   auto text = converter.convert(std::string(bytes));
   if (!text) return notReadable(encoding, "is declared, and the text is not in it");
   return Utf8Text(std::move(*text));

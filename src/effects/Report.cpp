@@ -135,7 +135,7 @@ std::string Report::toJson(std::string room, const Entry& entry, bool failed, co
   textIfPresent("error", entry.error);
   textIfPresent("signal", entry.signal);
   object.boolean("failed", failed);
-  object.boolean("changed", entry.changed);
+  object.boolean("changed", entry.changed || !entry.unfinished.empty());
   object.array("values", {entry.values});
   object.array("effects", {entry.effects, entry.unfinished});
   object.text("output", output);
@@ -150,14 +150,24 @@ void Report::append(Entry entry, bool failed, const std::string& output) {
   try {
     _line = toJson(std::move(_line), entry, failed, output);
   } catch (const std::bad_alloc&) {
-    entry.values.clear();
-    entry.effects.clear();
-    entry.argument.reset();
-    entry.error = "out of memory";
-    _line = toJson({}, entry, failed, {});
+    _line = shortened(std::move(entry), failed);
   }
   const auto written = appendLine(_file, _line, "report");
   if (!written) lose("report: " + written.failure().why);
+}
+
+/// The changes that are not known to have ended, and little else.
+std::string Report::shortened(Entry entry, bool failed) {
+  entry.values.clear();
+  entry.effects.clear();
+  entry.argument.reset();
+  entry.error = "out of memory";
+  try {
+    return toJson({}, entry, failed, {});
+  } catch (const std::bad_alloc&) {
+    lose("report: out of memory");
+    throw;
+  }
 }
 
 void Report::lose(std::string_view why) {

@@ -75,6 +75,7 @@ class Report final : public EffectChannel {
   explicit Report(FileDescriptor file);
   static std::string toJson(std::string room, const Entry& entry, bool failed, const std::string& output);
   Entry takeEntry();
+  std::string shortened(Entry entry, bool failed);
   void append(Entry entry, bool failed, const std::string& output);
   void lose(std::string_view why);
 

@@ -43,11 +43,14 @@ bool RemoteServerSettings::isLumaronServer() {
   return _context.host.files().exists("/System/Library/CoreServices/ServerVersion.plist");
 }
 
+/// The mutex is free meanwhile: a signal does not wait for an answer of the user's.
 void RemoteServerSettings::takeAuthorization() {
-  const std::scoped_lock lock(_authorizationMutex);
-  if (_ended) return;
-  _authenticator = &_context.host.authenticator();
-  _authenticator->authenticate();
+  {
+    const std::scoped_lock lock(_authorizationMutex);
+    if (_ended) return;
+    _authenticator = &_context.host.authenticator();
+  }
+  _context.host.authenticator().authenticate();
 }
 
 void RemoteServerSettings::giveUpAuthorization() {

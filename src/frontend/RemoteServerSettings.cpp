@@ -114,12 +114,12 @@ int RemoteServerSettings::statusSoFar() const {
 void RemoteServerSettings::endedBySignal(const std::string& signal) {
   _ended = true;
   _context.input.restoreTerminal();
-  doStep([this] { giveUpAuthorization(); });
   doStep([&] { _effects.interrupt("the run was ended by " + signal); });
   doStep([&] {
     if (_report) _report->runEndedBySignal(signal, hasFailed(), _context.output.takePrinted());
   });
   _context.output.finish();
+  doStep([this] { giveUpAuthorization(); });
 }
 
 }  // namespace tavisk

@@ -135,8 +135,9 @@ MachineFile::Contents MachineFile::contents() {
 
 std::optional<Failure> MachineFile::keep(const std::optional<FileStamp>& stamp, const Result<VersionRef>& version) {
   const std::scoped_lock held(_mutex);
-  // Without a stamp it is not the absence that was read.
-  _stamp = version || stamp ? stamp : FileStamp{};
+  // No stamp stands for absence alone.
+  const bool isAbsence = version && !(*version)->text;
+  _stamp = stamp || isAbsence ? stamp : FileStamp{};
   if (version) {
     _version = *version;
     _failure.reset();

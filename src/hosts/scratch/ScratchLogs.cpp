@@ -16,13 +16,6 @@ namespace {
 constexpr const char* effectsPath = "/effects.log";
 constexpr const char* systemPath = "/system.log";
 
-/// Takes the beginning of a line back that found no room, unless another run has appended to it.
-void takeBack(const FileDescriptor& file, off_t sizeBefore, ssize_t written) {
-  struct stat status {};
-  const bool isLast = ::fstat(file.number(), &status) == 0 && status.st_size == sizeBefore + written;
-  if (isLast && ::ftruncate(file.number(), sizeBefore) != 0) return;  // the half line stays
-}
-
 std::string oneLine(std::string_view message) {
   if (message.ends_with('\n')) message.remove_suffix(1);
   std::string line;
@@ -39,19 +32,16 @@ Failure notALog(const std::string& path) {
   return {"append to", path, "not a regular file"};
 }
 
-/// Appends a line and its newline in one piece; the file is made when it is missing. Several runs may append.
-Result<void> appendLine(const SystemRoot& root, const std::string& path, std::string line) {
+/// The file is made when it is missing.
+Result<void> appendTo(const SystemRoot& root, const std::string& path, const std::string& line) {
   const auto file = root.open(path, O_WRONLY | O_APPEND | O_CREAT | O_NOFOLLOW | O_NONBLOCK, 0644);
   if (!file) return file.failure();
-  struct stat before {};
-  if (::fstat(file->number(), &before) != 0) return systemFailure("look at", path, errno);
-  if (!S_ISREG(before.st_mode)) return notALog(path);
-  line += "\n";
-  const auto written = ::write(file->number(), line.data(), line.size());
-  if (written == static_cast<ssize_t>(line.size())) return {};
-  const int error = written < 0 ? errno : ENOSPC;
-  if (written > 0) takeBack(*file, before.st_size, written);
-  return systemFailure("append to", path, error);
+  struct stat status {};
+  if (::fstat(file->number(), &status) != 0) return systemFailure("look at", path, errno);
+  if (!S_ISREG(status.st_mode)) return notALog(path);
+  const auto appended = appendLine(*file, line + "\n", path);
+  if (!appended) return retold(appended.failure(), "append to", path);
+  return {};
 }
 
 }  // namespace
@@ -65,11 +55,11 @@ std::optional<Failure> EffectsLog::whyUnusable() const {
 }
 
 void EffectsLog::record(const Effect& effect) {
-  static_cast<void>(appendLine(_folder, effectsPath, toJson(effect)));
+  static_cast<void>(appendTo(_folder, effectsPath, toJson(effect)));
 }
 
 void ScratchSystemLog::write(const std::string& message) {
-  const auto written = appendLine(_folder, systemPath, oneLine(message));
+  const auto written = appendTo(_folder, systemPath, oneLine(message));
   if (!written) _effects.recordFailure("System Log", written.failure(), message);
 }
 

@@ -17,6 +17,11 @@ Result<PropertyList::Dictionary> parseDictionary(const std::string& text, const 
   return Failure{"read property list", path, "a dictionary is expected"};
 }
 
+/// Whether the text is at fault, and not the system that reads it.
+bool isDamage(const Failure& failure) {
+  return !failure.code;
+}
+
 }  // namespace
 
 Result<std::optional<PropertyList::Dictionary>> PropertyListFile::read() const {
@@ -29,7 +34,9 @@ Result<std::optional<PropertyList::Dictionary>> PropertyListFile::read() const {
 Result<PropertyList::Dictionary> PropertyListFile::readToChange() const {
   const auto found = text();
   if (!found) return found.failure();
-  return *found ? parseDictionary(**found, _path).valueOr({}) : PropertyList::Dictionary();
+  if (!*found) return PropertyList::Dictionary();
+  auto parsed = parseDictionary(**found, _path);
+  return parsed || !isDamage(parsed.failure()) ? parsed : PropertyList::Dictionary();
 }
 
 Result<void> PropertyListFile::write(const PropertyList::Dictionary& contents) const {
@@ -42,7 +49,9 @@ Result<void> PropertyListFile::write(const PropertyList::Dictionary& contents) c
 Result<void> PropertyListFile::keepDamaged() const {
   const auto old = text();
   if (!old) return old.failure();
-  if (!*old || parseDictionary(**old, _path)) return {};
+  const auto parsed = *old ? parseDictionary(**old, _path) : PropertyList::Dictionary();
+  if (parsed) return {};
+  if (!isDamage(parsed.failure())) return parsed.failure();
   return _root.write(_path + damagedSuffix, **old);
 }
 

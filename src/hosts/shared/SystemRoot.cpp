@@ -133,11 +133,7 @@ Result<std::string> SystemRoot::read(const std::string& path, std::size_t limit)
 Result<std::string> SystemRoot::readBeginning(const std::string& path, std::size_t length) const {
   const auto file = openRegular(path);
   if (!file) return file.failure();
-  std::string beginning(length, '\0');
-  const auto count = ::read(file->number(), beginning.data(), length);
-  if (count < 0) return systemFailure("read", path, errno);
-  beginning.resize(static_cast<std::size_t>(count));
-  return beginning;
+  return tavisk::readBeginning(*file, length, path);
 }
 
 Result<std::string> SystemRoot::readLink(const std::string& path) const {

@@ -9,6 +9,7 @@
 #include <utility>
 
 #include "effects/SettingNames.h"
+#include "hosts/linux/services/SystemServices.h"
 
 namespace tavisk {
 namespace {
@@ -50,9 +51,9 @@ void LinuxAdminAuthenticator::authenticate() {
 }
 
 Result<void> LinuxAdminAuthenticator::authorize() {
-  const auto bus = _machine.services.systemBus();
-  // Without a bus there is no polkit.
-  if (!bus) return isAbsent(bus.failure()) ? Result<void>() : bus.failure();
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return bus.failure();
+  if (!*bus) return {};  // without a bus there is no polkit
   std::optional<PolkitAgent> agent;
   const auto startAgent = [&]() -> Result<void> {
     auto started = PolkitAgent::start(_machine.root, _machine.runLoop);

@@ -77,16 +77,9 @@ Setting<bool> LinuxNetworkTimeService::runningSetting() {
   return setting;
 }
 
-std::optional<Failure> LinuxNetworkTimeService::whyRunningNeedsRoot(const Daemon& daemon, bool isOn) {
-  auto failure = whyNeedsRoot(isOn ? "start" : "stop", daemon.unit);
-  if (!failure) return std::nullopt;
-  const auto startsAtBoot = daemons().startsAtBoot(daemon);
-  if (!startsAtBoot) return startsAtBoot.failure();
-  return *startsAtBoot == isOn ? std::nullopt : failure;
-}
-
 Result<void> LinuxNetworkTimeService::run(const Daemon& daemon, bool isOn) {
-  if (auto failure = whyRunningNeedsRoot(daemon, isOn)) return *failure;
+  // The other half of the switch, setLaunchAtStartup().
+  if (auto may = daemons().checkMayStartAtBoot(daemon, isOn); !may) return may;
   return isOn ? daemons().start(daemon) : daemons().stop(daemon);
 }
 

@@ -35,7 +35,6 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   Result<Answer> withClient(Use use);
   Support isSupported();
   /// What an administrator who is not root reads where the client would run, or not, until the next start only.
-  std::optional<Failure> whyRunningNeedsRoot(const Daemon& daemon, bool isOn);
   Result<void> run(const Daemon& daemon, bool isOn);
   template <typename Value>
   Setting<Value> named(const char* name);

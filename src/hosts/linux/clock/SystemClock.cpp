@@ -118,20 +118,24 @@ std::int64_t AskedTime::microsecondsAhead() const {
   return (std::chrono::seconds(_seconds) + sinceThen() - systemMicroseconds()).count();
 }
 
-std::int64_t AskedTime::onSystemClock() const {
-  return unlessNear(systemMicroseconds(), std::chrono::seconds(1));
+std::int64_t AskedTime::onSystemClock() {
+  return told(systemMicroseconds(), std::chrono::seconds(1), _system);
 }
 
-Result<std::optional<std::int64_t>> AskedTime::onHardwareClock(const SystemRoot& root) const {
+Result<std::optional<std::int64_t>> AskedTime::onHardwareClock(const SystemRoot& root) {
   auto shown = hardwareTime(root);
   if (!shown || !*shown) return shown;
-  return std::optional(unlessNear(std::chrono::seconds(**shown), std::chrono::seconds(2)));  // it tells no fractions
+  return std::optional(told(std::chrono::seconds(**shown), std::chrono::seconds(2), _hardware));  // without fractions
 }
 
-std::int64_t AskedTime::unlessNear(std::chrono::microseconds shown, std::chrono::seconds near) const {
+std::int64_t AskedTime::told(std::chrono::microseconds shown, std::chrono::seconds near,
+                             std::optional<Look>& first) const {
+  const Look look{shown, std::chrono::steady_clock::now()};
+  if (!first) first = look;
   const auto then = shown - sinceThen();
-  const bool isNear = _moment && std::chrono::abs(then - std::chrono::seconds(_seconds)) <= near;
-  return isNear ? _seconds : std::chrono::floor<std::chrono::seconds>(then).count();
+  if (_moment && std::chrono::abs(then - std::chrono::seconds(_seconds)) <= near) return _seconds;
+  const bool hasGoneOn = std::chrono::abs((look.shown - first->shown) - (look.at - first->at)) <= near;
+  return std::chrono::floor<std::chrono::seconds>(_moment && hasGoneOn ? first->shown : then).count();
 }
 
 Result<std::optional<HardwareClock>> HardwareClock::open(const SystemRoot& root) {

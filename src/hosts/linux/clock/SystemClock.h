@@ -33,7 +33,8 @@ inline constexpr const char* hardwareClock = "/dev/rtc0";
 Result<std::optional<std::int64_t>> hardwareTime(const SystemRoot& root);
 
 /// A time to which the clocks are set, and what they said at the moment from which it counts, however much later they
-/// are read. Once there is such a moment, what is as near as a clock is set and read is the time itself.
+/// are read. Once there is such a moment, what is as near as a clock is set and read is the time itself, and a clock
+/// that has only gone on says what it said at the first look.
 class AskedTime {
  public:
   explicit AskedTime(std::int64_t secondsSince1970) : _seconds(secondsSince1970) {}
@@ -42,16 +43,23 @@ class AskedTime {
   std::int64_t seconds() const { return _seconds; }
   /// By how much the system clock has to be put forward, or back.
   std::int64_t microsecondsAhead() const;
-  std::int64_t onSystemClock() const;
+  std::int64_t onSystemClock();
   /// Absent when the machine has none.
-  Result<std::optional<std::int64_t>> onHardwareClock(const SystemRoot& root) const;
+  Result<std::optional<std::int64_t>> onHardwareClock(const SystemRoot& root);
 
  private:
+  using Moment = std::chrono::steady_clock::time_point;
+  struct Look {
+    std::chrono::microseconds shown;
+    Moment at;
+  };
   std::chrono::microseconds sinceThen() const;
-  std::int64_t unlessNear(std::chrono::microseconds shown, std::chrono::seconds near) const;
+  std::int64_t told(std::chrono::microseconds shown, std::chrono::seconds near, std::optional<Look>& first) const;
 
   std::int64_t _seconds;
-  std::optional<std::chrono::steady_clock::time_point> _moment;
+  std::optional<Moment> _moment;
+  std::optional<Look> _system;    ///< the first at that clock
+  std::optional<Look> _hardware;  ///< the first at that clock
 };
 
 /// The hardware clock (rtc(4)), which keeps local time when /etc/adjtime says so (adjtime_config(5)).

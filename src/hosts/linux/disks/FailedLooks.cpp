@@ -27,14 +27,16 @@ void FailedLooks::tell(const Failure& failure) {
 void FailedLooks::tellDoubt(const Failure& failure) {
   {
     const std::scoped_lock lock(_mutex);
-    if (!_doubt) _doubt = failure;
+    if (!_doubt) _doubt = {failure, RunLoop::Clock::now()};
   }
   tell(failure);
 }
 
 std::optional<Failure> FailedLooks::takeDoubt() {
   const std::scoped_lock lock(_mutex);
-  return std::exchange(_doubt, std::nullopt);
+  const auto doubt = std::exchange(_doubt, std::nullopt);
+  const bool isOfThisCommand = doubt && RunLoop::Clock::now() - doubt->at < longestCommand;
+  return isOfThisCommand ? std::optional(doubt->failure) : std::nullopt;
 }
 
 }  // namespace tavisk

@@ -33,14 +33,18 @@ class FailedLooks {
 
   /// The same for what a value of the firmware is made of: whoever writes one has to ask whether it is to be trusted.
   void tellDoubt(const Failure& failure);
-  /// The first such failure since the last call.
+  /// The first such failure since the last call, unless it was told so long ago that another command had it.
   std::optional<Failure> takeDoubt();
 
  private:
   EffectSink& _effects;
   std::mutex _mutex;
   std::map<std::string, RunLoop::Clock::time_point> _told;  ///< by reason
-  std::optional<Failure> _doubt;
+  struct Doubt {
+    Failure failure;
+    RunLoop::Clock::time_point at;
+  };
+  std::optional<Doubt> _doubt;
 };
 
 }  // namespace tavisk

@@ -63,7 +63,8 @@ Result<void> LinuxPreferencesStore::store(const std::string& key, bool value) {
 /// Read anew each time: a change counts at once.
 std::optional<PropertyList> LinuxUserDefaults::value(const std::string& key) const {
   const auto defaults = PropertyListFile(_root, file).readToChange();
-  if (!defaults) _looks.tellDoubt(defaults.failure());
+  if (!defaults && key == languages) _looks.tellDoubt(defaults.failure());
+  if (!defaults) _looks.tell(defaults.failure());
   const auto* value = defaults ? defaults->find(key) : nullptr;
   return value ? std::optional(*value) : std::nullopt;
 }

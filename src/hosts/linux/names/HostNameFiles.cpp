@@ -92,12 +92,9 @@ bool nameIt(const std::vector<std::string>& names, const std::string& machine) {
   return std::ranges::any_of(names, [&](const auto& name) { return (isWhole ? name : firstLabel(name)) == machine; });
 }
 
-/// The names of a line that has none which is known. If they are all of one machine that is this one, under a name that
-/// it had at some time before; else they are somebody's aliases, and stay.
-std::vector<std::string> namesWithUnknown(const std::vector<std::string>& names, const std::string& now) {
-  const auto label = firstLabel(names.front());
-  if (std::ranges::all_of(names, [&](const auto& name) { return firstLabel(name) == label; }))
-    return namesAfter(names, names.front(), now);
+/// The names of a line that has none which is known: the machine's own in front of them. They may be somebody's
+/// aliases.
+std::vector<std::string> namesWithOwn(const std::vector<std::string>& names, const std::string& now) {
   std::vector<std::string> all{now};
   if (now != firstLabel(now)) all.push_back(firstLabel(now));
   all.insert(all.end(), names.begin(), names.end());
@@ -184,7 +181,7 @@ Result<void> setStaticHostName(const SystemRoot& root, const std::string& name) 
 }
 
 Result<std::optional<std::string>> kernelHostName(const SystemRoot& root) {
-  const auto text = root.read(kernelNameFile, configurationLimit);
+  const auto text = orEmpty(root.read(kernelNameFile, configurationLimit));
   if (!text) return text.failure();
   const auto lines = split(*text, "\n");
   if (lines.empty() || lines.front() == kernelWithoutName) return std::optional<std::string>();
@@ -229,7 +226,7 @@ std::string hostsWithName(std::string_view hosts, const std::vector<std::string>
   return changedLines(text, [&](const std::string& line) {
     if (isDone || OwnLine(line).names.empty()) return line;
     isDone = true;
-    return renamed(line, [&](const auto& names) { return namesWithUnknown(names, now); });
+    return renamed(line, [&](const auto& names) { return namesWithOwn(names, now); });
   });
 }
 

@@ -42,6 +42,14 @@ std::string ruleFor(Minutes minutes) {
          R"(", ATTR{device/power/control}="auto")";
 }
 
+/// The kernel answers EIO for a device that is not suspended after a while
+/// (Documentation/ABI/testing/sysfs-devices-power).
+Result<bool> canWait(const SysDevice& disk) {
+  const auto time = orGone(disk.read(delay));
+  if (time) return time->has_value();
+  return time.failure().code == std::errc::io_error ? Result<bool>(false) : time.failure();
+}
+
 /// Where the kernel does not stop the motor itself, a suspended disk goes on turning. One attribute was split in two in
 /// Linux 6.6.
 Result<bool> canStop(const SysDevice& disk) {
@@ -64,7 +72,7 @@ Result<std::optional<HardDiskSleep::Disk>> HardDiskSleep::stoppableDisk(const st
   if (!*block || !*disk) return std::nullopt;
   const auto stops = allHold({[&] { return (*block)->says("removable", "0"); },
                               [&] { return (*block)->says("queue/rotational", "1"); }, [&] { return canStop(**disk); },
-                              [&] { return (*disk)->has(delay); }});
+                              [&] { return canWait(**disk); }});
   if (!stops) return stops.failure();
   return *stops ? std::optional(Disk{name, **disk}) : std::nullopt;
 }

@@ -52,8 +52,10 @@ Result<FileDescriptor> MachineLock::hold() const {
 Result<FileDescriptor> MachineLock::openFile() const {
   constexpr int flags = O_RDWR | O_NOFOLLOW | O_NONBLOCK;
   auto file = _root.open(ownfile::machineLock, flags);
-  if (file || !isAbsent(file.failure())) return file;
+  const bool isRefused = !file && file.failure().code == std::errc::permission_denied;
+  if (file || (!isRefused && !isAbsent(file.failure()))) return file;
   if (auto failure = whyNeedsRoot("lock", ownfile::machineLock)) return *failure;
+  if (isRefused) return file;
   if (auto made = makeFolder(); !made) return made.failure();
   file = _root.open(ownfile::machineLock, flags | O_CREAT, fileMode);
   if (!file) return file;

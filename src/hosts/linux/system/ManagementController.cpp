@@ -42,11 +42,14 @@ struct Completion {
 constexpr Completion completions[] = {
     {0xC0, EBUSY, "it is busy"},
     {0xC1, ENOSYS, "it does not know this request"},
+    {0xC2, ENOSYS, "it does not know this request here"},
     {0xC3, ETIMEDOUT, "it did not come to an end in time"},
     {0xC7, EINVAL, "the request has a wrong length"},
     {0xC9, EINVAL, "the value is out of range"},
     {0xCC, EINVAL, "the request has a wrong value"},
     {0xD4, EACCES, "it does not allow this request"},
+    {0xD5, ENOSYS, "it does not do this in its present state"},
+    {0xD6, ENOSYS, "it has this switched off"},
 };
 
 Failure failureOf(const char* what, int error, std::string why) {

@@ -12,6 +12,7 @@
 namespace tavisk {
 namespace {
 
+constexpr std::size_t longestProgram = 4096;  // PATH_MAX
 constexpr std::size_t procFileLimit = std::size_t{1} << 20U;
 constexpr std::size_t longestCommand = 15;  // the kernel cuts the name in /proc/PID/stat there
 
@@ -55,7 +56,7 @@ class Process {
  private:
   /// False for a kernel thread, which has no command line.
   Result<bool> runsProgram(const std::string& name) const {
-    const auto found = orHidden(_root.read(_folder + "/cmdline", procFileLimit));
+    const auto found = orHidden(_root.readBeginning(_folder + "/cmdline", longestProgram));
     if (!found) return found.failure();
     const auto commandLine = found->value_or("");
     if (commandLine.empty() || name.size() <= longestCommand) return !commandLine.empty();

@@ -97,7 +97,7 @@ Result<EndedProgram> runToEnd(const SystemRoot& root, const std::vector<std::str
   auto program = std::move(started).value();
   if (!program.endsBefore(RunLoop::Clock::now() + longestRun, runLoop)) return outOfTime(words);
   ::lseek(output.number(), 0, SEEK_SET);
-  auto printed = readAll(output, outputLimit, words.front());
+  auto printed = readBeginning(output, outputLimit, words.front());
   if (!printed) return printed.failure();
   return EndedProgram{program.status(), std::move(printed).value()};
 }
