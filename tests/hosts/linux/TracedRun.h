@@ -41,12 +41,6 @@ inline bool opensOrChangesFiles(pid_t process) {
   return mayChangeFiles(process) || isOneOf(callOf(process), {SYS_openat2});
 }
 
-/// The same, or reads one.
-inline bool isOfFiles(pid_t process) {
-  return opensOrChangesFiles(process) ||
-         isOneOf(callOf(process), {SYS_openat, SYS_read, SYS_getdents64, SYS_readlinkat, SYS_newfstatat});
-}
-
 /// A run in a process of its own in which one call went wrong.
 struct TracedRun {
   bool wentWrong = false;  ///< false: there were not so many calls

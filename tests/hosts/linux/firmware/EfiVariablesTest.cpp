@@ -5,13 +5,12 @@
 #include <linux/fs.h>
 #include <sys/ioctl.h>
 
-#include "OwnMounts.h"
 #include "hosts/linux/firmware/BootTree.h"
 
 namespace tavisk {
 namespace {
 
-using testing::ElementsAre, testing::HasSubstr;
+using testing::ElementsAre;
 
 class EfiVariablesTest : public testing::Test {
  protected:
@@ -21,8 +20,7 @@ class EfiVariablesTest : public testing::Test {
   }
 
   BootTree tree;
-  SystemRoot root{tree.at("/")};
-  EfiVariables variables{root};
+  EfiVariables variables{tree.root};
 };
 
 TEST_F(EfiVariablesTest, KeepAttributesAndAreNeverOthers) {
@@ -118,28 +116,6 @@ TEST_F(EfiVariablesTest, KnowWhichEntryIsTriedFirst) {
   EXPECT_EQ(*entries.onlyNext(), std::nullopt);
   tree.setVariable("BootNext", std::string("\1\0", 2));
   EXPECT_EQ((**entries.onlyNext()).number, 1);
-}
-
-TEST_F(EfiVariablesTest, StayAsTheyAreWhenTheStoreIsFullOrReadOnly) {
-  const bool isProven = withOwnMounts([&] {
-    std::filesystem::create_directories(tree.at(tree.variables));
-    ASSERT_TRUE(mountMemory(tree.at(tree.variables), "16k"));
-    tree.setEntry(1, {fileNode("a")});
-    tree.setOrder({1});
-    const auto before = tree.allVariables();
-    std::ofstream(tree.at(std::string(tree.variables) + "/filler")) << std::string(100'000, 'x');
-    auto put = BootEntries(variables).putFirst(backup, keepNothing);
-    EXPECT_FALSE(put);
-    EXPECT_THAT(put ? "" : put.failure().why, HasSubstr("No space left"));
-    std::filesystem::remove(tree.at(std::string(tree.variables) + "/filler"));
-    EXPECT_EQ(tree.allVariables(), before);
-
-    ASSERT_EQ(::mount("", tree.at(tree.variables).c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
-    put = BootEntries(variables).putFirst(backup, keepNothing);
-    EXPECT_THAT(put ? "" : put.failure().why, HasSubstr("Read-only"));
-    EXPECT_EQ(tree.allVariables(), before);
-  });
-  if (!isProven) GTEST_SKIP() << "mounts of its own are not allowed here";
 }
 
 TEST_F(EfiVariablesTest, LoseTheNewEntryWhenTheOrderCannotBeKept) {

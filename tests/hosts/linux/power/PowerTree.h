@@ -139,12 +139,6 @@ class PowerTree : public LinuxTree {
   }
   void remove(const std::string& path) { std::filesystem::remove_all(at(path)); }
 
-  /// Puts something that cannot be looked at in its place: a link that leads round.
-  void loop(const std::string& path) {
-    remove(path);
-    link(path, at(path).filename());
-  }
-
   LinuxPowerSettingsService& power() { return _power; }
   LinuxPowerController& delays() { return _delays; }
 
@@ -188,12 +182,9 @@ class PowerTree : public LinuxTree {
     return bits;
   }
 
-  SystemRoot _root{at("/").string()};
-  ServiceAccess _services{_root, runLoop};
-  LinuxMachine _machine{_root, effects, runLoop, _services};
   ManagementController _controller{controllerLink};
-  LinuxPowerSettingsService _power{_machine, {console, cards, _controller}};
-  LinuxPowerController _delays{_machine, _controller};
+  LinuxPowerSettingsService _power{machine, {console, cards, _controller}};
+  LinuxPowerController _delays{machine, _controller};
 };
 
 }  // namespace tavisk
