@@ -5,6 +5,7 @@
 #include <linux/fs.h>
 #include <sys/ioctl.h>
 
+#include "OwnMounts.h"
 #include "hosts/linux/firmware/BootTree.h"
 
 namespace tavisk {
@@ -116,6 +117,19 @@ TEST_F(EfiVariablesTest, KnowWhichEntryIsTriedFirst) {
   EXPECT_EQ(*entries.onlyNext(), std::nullopt);
   tree.setVariable("BootNext", std::string("\1\0", 2));
   EXPECT_EQ((**entries.onlyNext()).number, 1);
+}
+
+TEST_F(EfiVariablesTest, StayAsTheyAreWhenTheStoreIsFull) {
+  const bool isProven = withOwnMounts([&] {
+    std::filesystem::create_directories(tree.at(tree.variables));
+    ASSERT_TRUE(mountMemory(tree.at(tree.variables), "16k"));
+    tree.setOrder({1});
+    tree.write(tree.pathOf("filler"), std::string(100'000, 'x'));
+    const auto before = tree.allVariables();
+    EXPECT_FALSE(BootEntries(variables).putFirst(backup, keepNothing));
+    EXPECT_EQ(tree.allVariables(), before);
+  });
+  if (!isProven) GTEST_SKIP() << "mounts of its own are not allowed here";
 }
 
 TEST_F(EfiVariablesTest, LoseTheNewEntryWhenTheOrderCannotBeKept) {

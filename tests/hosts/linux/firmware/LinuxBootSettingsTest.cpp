@@ -225,13 +225,10 @@ TEST_F(LinuxBootSettingsTest, KnowsTheStartOverANetwork) {
   EXPECT_FALSE(disk.disk);
 }
 
-TEST_F(LinuxBootSettingsTest, KnowsWhetherFirmwareStartsByTheOldRules) {
+TEST_F(LinuxBootSettingsTest, HasNoChoiceUnderOtherFirmware) {
   EXPECT_FALSE(settings().legacyBootSupport().supported);
   tree.setEntry(8, {{5, 1, fromHex("0200000048440000")}});
-  EXPECT_TRUE(settings().legacyBootSupport().supported);
-}
-
-TEST_F(LinuxBootSettingsTest, HasNoChoiceUnderOtherFirmware) {
+  EXPECT_TRUE(settings().legacyBootSupport().supported) << "by the old rules";
   std::filesystem::remove_all(tree.at("/sys/firmware/efi"));
   EXPECT_EQ(settings().preBootEnvironment(), preboot::noneKnown);
   EXPECT_TRUE(settings().legacyBootSupport().supported);

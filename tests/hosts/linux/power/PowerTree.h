@@ -3,9 +3,7 @@
 #pragma once
 
 #include <algorithm>
-#include <cerrno>
 #include <map>
-#include <optional>
 
 #include "base/Text.h"
 #include "hosts/linux/LinuxTree.h"
@@ -165,21 +163,10 @@ class PowerTree : public LinuxTree {
 
  private:
   void replay(const std::vector<std::string>& words) {
-    if (words.at(0) == "wake") {
-      if (words.size() > 3) cards.cards[words[1]].modes = {bitsOf(words[2]), bitsOf(words[3])};
-    } else if (words.at(1) == "->") {
+    if (words.at(1) == "->")
       link(words[0], words[2]);
-    } else {
+    else
       write(words[0], words.at(2) + "\n");
-    }
-  }
-  /// Of the letters of ethtool; "d" is none.
-  static std::uint32_t bitsOf(const std::string& letters) {
-    constexpr std::string_view all = "pumbagsf";
-    std::uint32_t bits = 0;
-    for (std::size_t i = 0; i < all.size(); ++i)
-      if (letters.find(all[i]) != std::string::npos) bits |= 1U << i;
-    return bits;
   }
 
   ManagementController _controller{controllerLink};

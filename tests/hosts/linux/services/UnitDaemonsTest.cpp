@@ -33,13 +33,6 @@ TEST_F(UnitDaemonsTest, PrefersTheFirstThatIsNotMasked) {
   EXPECT_FALSE(client.isRunning());
 }
 
-TEST_F(UnitDaemonsTest, TellWhichUnitFilesCannotBeEnabled) {
-  tree.manager.breakNext("EnableUnitFiles", Fault::error);
-  client.setLaunchAtStartup(true);
-  EXPECT_THAT(tree.lastEffect(), FailedFor("EnableUnitFiles on chrony.service"));
-  EXPECT_EQ(tree.lastEffect().failure->code, BusErrorCode::accessDenied);
-}
-
 TEST_F(UnitDaemonsTest, RestartsOtherClientsWithoutWaiting) {
   tree.manager.set(chrony, {.load = "not-found"});
   tree.manager.set("systemd-timesyncd.service", {.active = "active", .jobResult = ""});
@@ -124,7 +117,11 @@ TEST_F(ManagedDaemons, HaveTheUserAskedWhenAQuestionIsNeeded) {
   }
 }
 
-TEST_F(UnitDaemonsTest, WaitOnceForAManagerThatIsSilent) {
+TEST_F(UnitDaemonsTest, TellOfAManagerThatRefusesAndWaitOnceForOneThatIsSilent) {
+  tree.manager.breakNext("EnableUnitFiles", Fault::error);
+  client.setLaunchAtStartup(true);
+  EXPECT_THAT(tree.lastEffect(), FailedFor("EnableUnitFiles on chrony.service"));
+  EXPECT_EQ(tree.lastEffect().failure->code, BusErrorCode::accessDenied);
   const auto began = RunLoop::Clock::now();
   tree.manager.breakNext("LoadUnit", Fault::silence);
   client.start();
