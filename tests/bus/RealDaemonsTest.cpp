@@ -38,10 +38,8 @@ class TimeDaemonTest : public testing::Test {
   ClockService& clock = tree.host().clock();
 
  private:
-  Bus& bus() { return *_services.systemBus().value(); }
+  Bus& bus() { return *tree.services.systemBus().value(); }
   const BusObject object{"org.freedesktop.timedate1", "/org/freedesktop/timedate1", "org.freedesktop.timedate1"};
-  SystemRoot _root{tree.at("/")};
-  ServiceAccess _services{_root, tree.runLoop};
 };
 
 TEST_F(TimeDaemonTest, KnowsTheZonesThatWeList) {

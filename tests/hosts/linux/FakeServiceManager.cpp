@@ -13,12 +13,12 @@ namespace {
 constexpr const char* managerPath = "/org/freedesktop/systemd1";
 constexpr const char* managerInterface = "org.freedesktop.systemd1.Manager";
 const std::vector<std::string> names = {"org.freedesktop.systemd1", "org.freedesktop.timesync1"};
-constexpr const char* unitFolder = "/org/freedesktop/systemd1/unit/";
+constexpr const char* unitFolder = "/org/freedesktop/systemd1/unit";
 
 /// Unit names as object paths, without dots and dashes.
 std::string pathOf(const std::string& unit) {
   char* path = nullptr;
-  sd_bus_path_encode("/org/freedesktop/systemd1/unit", unit.c_str(), &path);
+  sd_bus_path_encode(unitFolder, unit.c_str(), &path);
   std::string encoded = path;
   ::free(path);
   return encoded;
@@ -26,7 +26,7 @@ std::string pathOf(const std::string& unit) {
 
 std::string unitAt(const char* path) {
   char* unit = nullptr;
-  if (sd_bus_path_decode(path, "/org/freedesktop/systemd1/unit", &unit) <= 0) return {};
+  if (sd_bus_path_decode(path, unitFolder, &unit) <= 0) return {};
   std::string decoded = unit;
   ::free(unit);
   return decoded;

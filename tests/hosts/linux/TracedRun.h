@@ -10,7 +10,6 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <array>
 #include <csignal>
 #include <cstdint>
 #include <functional>
@@ -39,12 +38,6 @@ inline bool mayChangeFiles(pid_t process) {
 /// Whether the call looks for a file or a folder, or may change one.
 inline bool opensOrChangesFiles(pid_t process) {
   return mayChangeFiles(process) || isOneOf(callOf(process), {SYS_openat2});
-}
-
-/// The same, or reads one.
-inline bool isOfFiles(pid_t process) {
-  return opensOrChangesFiles(process) ||
-         isOneOf(callOf(process), {SYS_openat, SYS_read, SYS_getdents64, SYS_readlinkat, SYS_newfstatat});
 }
 
 /// A run in a process of its own in which one call went wrong.

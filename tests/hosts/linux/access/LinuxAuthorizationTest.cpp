@@ -1,13 +1,81 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include <gtest/gtest.h>
-#include <unistd.h>
+#include <gmock/gmock.h>
+#include <systemd/sd-bus.h>
 
+#include "hosts/linux/BusPeer.h"
 #include "hosts/linux/LinuxTree.h"
+#include "hosts/linux/access/Polkit.h"
 #include "platform/AdminAuthenticatorContract.h"
 
 namespace tavisk {
 namespace {
+
+using testing::HasSubstr;
+using namespace std::chrono_literals;
+
+/// Grants everything at once, after a question, or never answers.
+struct PolkitTree : LinuxTree {
+  enum class Answer { granted, question, silence };
+
+  int answerCall(sd_bus_message* call) {
+    std::uint32_t mayAsk = 0;
+    sd_bus_message_skip(call, "(sa{sv})sa{ss}");
+    sd_bus_message_read_basic(call, 'u', &mayAsk);
+    calls.push_back(mayAsk);
+    if (answer == Answer::silence) return 1;
+    const int grants = answer == Answer::granted || mayAsk != 0 ? 1 : 0;
+    return sd_bus_reply_method_return(call, "(bba{ss})", grants, 1 - grants, 1, "polkit.temporary_authorization_id",
+                                      grants != 0 ? "tmp7" : "");
+  }
+  Bus& bus() { return **services.systemBus(); }
+
+  Answer answer = Answer::granted;
+  std::vector<std::uint32_t> calls;
+  BusPeer peer{(write("/run/systemd/system/x", ""), at("/run/dbus/system_bus_socket")),
+               {},
+               [this](sd_bus_message* call, const std::string&) { return answerCall(call); }};
+};
+
+TEST(Polkit, AsksTheUserOnlyThroughAnAgent) {
+  const Asker ready = [] { return Result<void>(); };
+  const Asker broken = []() -> Result<void> { return Failure{"ask", "", "no agent"}; };
+  using Answer = PolkitTree::Answer;
+  const std::tuple<Answer, Asker, std::vector<std::uint32_t>, const char*> cases[] = {
+      {Answer::granted, broken, {0}, "tmp7"},      {Answer::question, ready, {0, 1}, "tmp7"},
+      {Answer::question, broken, {0}, "no agent"}, {Answer::question, nullptr, {0}, ""},
+      {Answer::silence, ready, {0}, "timed out"},
+  };
+  for (const auto& [answer, asker, calls, outcome] : cases) {
+    PolkitTree tree;
+    tree.answer = answer;
+    auto& bus = tree.bus();
+    const auto limit = tree.runLoop.limitWaits(200ms);
+    const auto found = checkAuthorization(bus, "org.tavisk.manage", asker);
+    EXPECT_EQ(tree.calls, calls) << outcome;
+    EXPECT_THAT(found ? found->temporaryId : found.failure().why, HasSubstr(outcome));
+    EXPECT_EQ(found && found->isGranted, outcome == std::string("tmp7"));
+  }
+}
+
+TEST(PolkitAgent, IsReadyOrToldToBeNone) {
+  const std::pair<const char*, const char*> cases[] = {
+      {"exec sleep 60 3>&-", ""},
+      {"exit 1", "polkit did not take it"},
+      {"exec sleep 60", "not ready in time"},
+      {nullptr, "No such file"},
+  };
+  for (const auto& [script, why] : cases) {
+    LinuxTree tree;
+    if (script) tree.writeProgram("/usr/bin/pkttyagent", std::string("#!/bin/sh\n") + script);
+    const auto limit = tree.runLoop.limitWaits(2s);
+    const auto agent = PolkitAgent::start(tree.root, tree.runLoop);
+    EXPECT_EQ(static_cast<bool>(agent), *why == '\0') << why;
+    if (!agent) {
+      EXPECT_THAT(agent.failure().why, HasSubstr(why));
+    }
+  }
+}
 
 TEST(LinuxUserDatabase, AnswersForTheProcessAndTheMachine) {
   LinuxTree tree;

@@ -3,7 +3,6 @@
 #include <gmock/gmock.h>
 
 #include "effects/EffectMatchers.h"
-#include "hosts/linux/AsMember.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/clock/TimeDaemons.h"
 #include "platform/NetworkTimeContract.h"
@@ -37,17 +36,6 @@ struct ChronyTest : testing::Test {
   NetworkTimeService& client = tree.host().networkTime();
 };
 
-TEST(LinuxNetworkTime, SaysThatThereIsNoClient) {
-  LinuxTree tree;
-  auto& client = tree.host().networkTime();
-  EXPECT_FALSE(client.isRunning());
-  EXPECT_EQ(client.server().address, "");
-  client.start();
-  EXPECT_THAT(tree.lastEffect(), UnsupportedFor("none of them is installed"));
-  client.setServer({"time.example"});
-  EXPECT_EQ(tree.lastEffect().outcome, Outcome::notSupported);
-}
-
 TEST_F(ChronyTest, WritesTheServerWhereTheClientReadsItAgain) {
   client.setServer({"time.example"});
   EXPECT_EQ(tree.file("/etc/chrony/sources.d/60-tavisk.sources"),
@@ -55,9 +43,6 @@ TEST_F(ChronyTest, WritesTheServerWhereTheClientReadsItAgain) {
   client.restartAsynchronously();
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_EQ(tree.file("/reloaded"), "reload sources LC_ALL=C\nPATH=/usr/sbin:/usr/bin:/sbin:/bin\n");
-}
-
-TEST_F(ChronyTest, NotesTheServerThatStaysInUse) {
   tree.write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\npool pool.example iburst\n");
   client.setServer({"next.example"});
   EXPECT_EQ(tree.lastEffect().note, "configured elsewhere, pool.example stays in use beside it");
@@ -102,9 +87,8 @@ struct ServerFiles {
 std::string firstServer(const char* program, const ServerFiles& configured) {
   LinuxTree tree;
   for (const auto& [path, text] : configured.files) tree.write(path, text);
-  const SystemRoot root(tree.at("/"));
   for (const auto& client : timeDaemons())
-    if (std::string_view(client.daemon.program) == program) return *client.server(root);
+    if (std::string_view(client.daemon.program) == program) return *client.server(tree.root);
   return "no such program";
 }
 
@@ -157,6 +141,10 @@ TEST(TimeDaemons, ReadServersAsNtpdDoes) {
 
 TEST(LinuxNetworkTime, KnowsTheClientThatIsReallyThereAndLeavesItsFileAlone) {
   LinuxTree tree;
+  EXPECT_FALSE(tree.host().networkTime().isRunning());
+  EXPECT_EQ(tree.host().networkTime().server().address, "");
+  tree.host().networkTime().start();
+  EXPECT_THAT(tree.lastEffect(), UnsupportedFor("none of them is installed"));
   tree.writeProgram("/etc/init.d/chrony", "#!/bin/sh\n");  // all that is left of a package
   tree.writeProgram("/etc/init.d/openntpd", "#!/bin/sh\n");
   tree.writeProgram("/usr/sbin/ntpd", "");

@@ -16,8 +16,7 @@ TEST(BlockDevices, TellsDisksAndPartitions) {
   tree.addDisk("sda", "8:0", 4096);
   tree.addPartition("sda", 2, "8:2", 2048, 1000);
   tree.write("/sys" + std::string(DiskTree::sata) + "/block/sda/queue/logical_block_size", "4096\n");
-  const SystemRoot root(tree.at("/"));
-  const BlockDevices devices(root);
+  const BlockDevices devices(tree.root);
   EXPECT_THAT(*devices.list(), ElementsAre(DiskName{"sda"}, DiskName{"sda2"}));
   const auto partition = *devices.find({"sda2"});
   ASSERT_TRUE(partition);
@@ -46,8 +45,7 @@ TEST(BlockDevices, FindsTheDiskBeneathAMapping) {
   tree.link("/sys/devices/virtual/block/dm-0/slaves/md01", "../../..");
   tree.link("/dev/mapper/system-root", "../dm-0");
   tree.write("/dev/dm-0", "");
-  const SystemRoot root(tree.at("/"));
-  const BlockDevices devices(root);
+  const BlockDevices devices(tree.root);
   for (const auto& [name, disk] : {std::pair("sda", "sda"), std::pair("sdb1", "sdb"), std::pair("md0", "sdb"),
                                    std::pair("md01", "sdb"), std::pair("dm-0", "sdb"), std::pair("none", "none")})
     EXPECT_EQ(devices.wholeDisk({name})->text, disk) << name;
@@ -89,32 +87,19 @@ TEST(BlockDevices, TellsHowADiskIsConnected) {
     if (*connection.subsystem != 0) tree.setSubsystem(connection.subsystemAt, connection.subsystem);
     if (*connection.removable != 0)
       tree.write(std::string("/sys") + connection.removableAt + "/removable", connection.removable + std::string("\n"));
-    const SystemRoot root(tree.at("/"));
-    const BlockDevices devices(root);
+    const BlockDevices devices(tree.root);
     EXPECT_EQ(*devices.transportOf({"sdx"}), connection.transport) << connection.carrier;
     EXPECT_EQ(*devices.isInternal({"sdx"}), connection.internal) << connection.carrier << connection.removable;
   }
-}
-
-TEST(BlockProbe, ReadsAnOldPartitionTable) {
-  DiskTree tree;
-  tree.addMbr("mbr", 8192, '\xef');
-  const auto table = probePartitionTable(SystemRoot(tree.at("/")), "/dev/mbr");
-  ASSERT_TRUE(table);
-  EXPECT_EQ(table->type, "dos");
-  EXPECT_EQ(table->find(1)->uuid, "11223344-01");
-  EXPECT_EQ(table->find(1)->type, efiSystemPartitionByte);
-  EXPECT_EQ(table->find(2), nullptr);
 }
 
 TEST(BlockProbe, TellsWhatIsEmptyFromWhatCannotBeRead) {
   DiskTree tree;
   tree.addImage("empty", 8);
   tree.write("/dev/folder/file", "");
-  const SystemRoot root(tree.at("/"));
-  EXPECT_EQ(probeVolume(root, "/dev/empty")->type, std::nullopt);
-  EXPECT_EQ(probePartitionTable(root, "/dev/empty")->type, "");
-  for (const char* node : {"/dev/none", "/dev/folder"}) EXPECT_FALSE(probeVolume(root, node)) << node;
+  EXPECT_EQ(probeVolume(tree.root, "/dev/empty")->type, std::nullopt);
+  EXPECT_EQ(probePartitionTable(tree.root, "/dev/empty")->type, "");
+  for (const char* node : {"/dev/none", "/dev/folder"}) EXPECT_FALSE(probeVolume(tree.root, node)) << node;
 }
 
 }  // namespace

@@ -189,10 +189,7 @@ TEST(LinuxDisks, FindsTheDiskOfAnyPath) {
 
 TEST(LinuxDisks, NoticesAtAMountWhatCameWithoutAnEvent) {
   ServerDisks tree;
-  const SystemRoot root(tree.at("/"));
-  ServiceAccess services(root, tree.runLoop);
-  const LinuxMachine machine{root, tree.effects, tree.runLoop, services};
-  LinuxDisks disks(machine);
+  LinuxDisks disks(tree.machine);
   tree.know("8:1", "E:ID_FS_TYPE=vfat\n");
   ASSERT_TRUE(disks.find({"sda1"}));
   EXPECT_EQ(disks.find({"sda1"})->volumeKind, "msdos");
@@ -211,9 +208,7 @@ TEST(LinuxDisks, NoticesAtAMountWhatCameWithoutAnEvent) {
 TEST(LinuxDisks, StayAsTheyWereWhenTheyCannotBeLookedAt) {
   ServerDisks tree;
   tree.know("8:2", "E:ID_FS_TYPE=ext4\nE:ID_FS_USAGE=filesystem\n");
-  const SystemRoot root(tree.at("/"));
-  ServiceAccess services(root, tree.runLoop);
-  LinuxDisks disks({root, tree.effects, tree.runLoop, services});
+  LinuxDisks disks(tree.machine);
   const auto before = disks.renew({{}, true});
   ASSERT_EQ(disks.find({"sda2"})->volumePath, "/");
   const auto sizeFile = "/sys" + std::string(DiskTree::sata) + "/block/sda/sda2/size";
@@ -221,9 +216,9 @@ TEST(LinuxDisks, StayAsTheyWereWhenTheyCannotBeLookedAt) {
   for (const auto& path : unseen) {
     const auto kept = path + ".kept";
     std::filesystem::rename(tree.at(path), tree.at(kept));
-    tree.link(path, std::filesystem::path(path).filename());
+    tree.makeUnreadable(path);
     tree.log.effects.clear();
-    LinuxDisks others({root, tree.effects, tree.runLoop, services});
+    LinuxDisks others(tree.machine);
     others.renew({{}, true});
     others.renew({{}, true});
     EXPECT_THAT(tree.log.effects, testing::ElementsAre(FailedFor("Too many levels")));
@@ -235,9 +230,7 @@ TEST(LinuxDisks, StayAsTheyWereWhenTheyCannotBeLookedAt) {
 
 TEST(LinuxDisks, TellOfAVolumeThatIsUnmountedAndLosesItsNodeAtOnce) {
   ServerDisks tree;
-  const SystemRoot root(tree.at("/"));
-  ServiceAccess services(root, tree.runLoop);
-  LinuxDisks disks({root, tree.effects, tree.runLoop, services});
+  LinuxDisks disks(tree.machine);
   tree.know("8:1", "E:ID_FS_TYPE=ext4\nE:ID_FS_USAGE=filesystem\n");
   const auto mounts = tree.file(MountTable::file);
   tree.mount("8:1", "/dev/sda1", "/data", "ext4");
@@ -256,21 +249,17 @@ TEST(LinuxDisks, TellOfAVolumeThatIsUnmountedAndLosesItsNodeAtOnce) {
   EXPECT_THAT(told, testing::ElementsAre(DiskEvent::Kind::disappeared));
 }
 
-TEST(LinuxDisks, AnswerForAPartitionAsForItsDisk) {
+TEST(LinuxDisks, AnswerForAPartitionAsForItsDiskAndForADriveWithoutADisc) {
   ServerDisks tree;
   tree.know("8:0", "E:ID_PART_TABLE_TYPE=dos\n");
+  tree.know("11:0", "E:ID_CDROM=1\n");
   auto& queries = tree.host().diskManagement();
   EXPECT_TRUE(queries.is(DiskTrait::internal, {"sda2"}));
   EXPECT_EQ(queries.protocolOf({"sda2"}), "SATA");
   EXPECT_EQ(queries.partitionScheme({"sda2"}), 3);
-}
-
-TEST(LinuxDisks, KnowADriveWithoutADisc) {
-  ServerDisks tree;
-  tree.know("11:0", "E:ID_CDROM=1\n");
   EXPECT_EQ(tree.describe("sr0"), nullptr);
-  EXPECT_TRUE(tree.host().diskManagement().is(DiskTrait::optical, {"sr0"}));
-  EXPECT_NE(tree.host().diskManagement().opticalBootability({"sr0"}).status, 0);
+  EXPECT_TRUE(queries.is(DiskTrait::optical, {"sr0"}));
+  EXPECT_NE(queries.opticalBootability({"sr0"}).status, 0);
 }
 
 TEST(DeviceEvents, NameTheBlockDevice) {

@@ -11,7 +11,7 @@
 namespace tavisk {
 namespace {
 
-using testing::ElementsAre, testing::HasSubstr;
+using testing::ElementsAre;
 
 class EfiVariablesTest : public testing::Test {
  protected:
@@ -21,8 +21,7 @@ class EfiVariablesTest : public testing::Test {
   }
 
   BootTree tree;
-  SystemRoot root{tree.at("/")};
-  EfiVariables variables{root};
+  EfiVariables variables{tree.root};
 };
 
 TEST_F(EfiVariablesTest, KeepAttributesAndAreNeverOthers) {
@@ -120,23 +119,14 @@ TEST_F(EfiVariablesTest, KnowWhichEntryIsTriedFirst) {
   EXPECT_EQ((**entries.onlyNext()).number, 1);
 }
 
-TEST_F(EfiVariablesTest, StayAsTheyAreWhenTheStoreIsFullOrReadOnly) {
+TEST_F(EfiVariablesTest, StayAsTheyAreWhenTheStoreIsFull) {
   const bool isProven = withOwnMounts([&] {
     std::filesystem::create_directories(tree.at(tree.variables));
     ASSERT_TRUE(mountMemory(tree.at(tree.variables), "16k"));
-    tree.setEntry(1, {fileNode("a")});
     tree.setOrder({1});
+    tree.write(tree.pathOf("filler"), std::string(100'000, 'x'));
     const auto before = tree.allVariables();
-    std::ofstream(tree.at(std::string(tree.variables) + "/filler")) << std::string(100'000, 'x');
-    auto put = BootEntries(variables).putFirst(backup, keepNothing);
-    EXPECT_FALSE(put);
-    EXPECT_THAT(put ? "" : put.failure().why, HasSubstr("No space left"));
-    std::filesystem::remove(tree.at(std::string(tree.variables) + "/filler"));
-    EXPECT_EQ(tree.allVariables(), before);
-
-    ASSERT_EQ(::mount("", tree.at(tree.variables).c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
-    put = BootEntries(variables).putFirst(backup, keepNothing);
-    EXPECT_THAT(put ? "" : put.failure().why, HasSubstr("Read-only"));
+    EXPECT_FALSE(BootEntries(variables).putFirst(backup, keepNothing));
     EXPECT_EQ(tree.allVariables(), before);
   });
   if (!isProven) GTEST_SKIP() << "mounts of its own are not allowed here";

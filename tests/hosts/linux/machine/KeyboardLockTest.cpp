@@ -53,10 +53,8 @@ class PanelTree : public LinuxTree {
     return file("/sys/class/input/" + name + "/inhibited").substr(0, 1);
   }
   void setDisablesKeyboard(bool disables) {
-    const SystemRoot root(at("/"));
-    ServiceAccess services(root, runLoop);
     ManagementController controller(panel);
-    EnclosureLock({root, effects, runLoop, services}, controller).setDisablesKeyboard(disables);
+    EnclosureLock(machine, controller).setDisablesKeyboard(disables);
   }
 
   Panel panel;
@@ -121,8 +119,7 @@ TEST(EnclosureLock, SaysWhatCannotBeLookedAtOrDisabled) {
     PanelTree tree;
     tree.panel.state = lock;
     tree.panel.error = error;
-    const auto path = std::string("/sys/class/input/input2/") + file;
-    tree.link(path, std::filesystem::path(path).filename());
+    tree.makeUnreadable(std::string("/sys/class/input/input2/") + file);
     tree.setDisablesKeyboard(true);
     EXPECT_THAT(tree.lastEffect(), FailedFor(why));
     EXPECT_EQ(tree.inhibited("input3"), "0");

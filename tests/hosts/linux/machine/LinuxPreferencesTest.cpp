@@ -5,7 +5,6 @@
 #include "effects/EffectMatchers.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/LinuxTree.h"
-#include "hosts/linux/TracedRun.h"
 #include "hosts/linux/system/MachineLock.h"
 #include "platform/PreferencesContract.h"
 
@@ -48,9 +47,7 @@ TEST(LinuxPreferences, AreNotWrittenWhileAnotherRunChangesTheMachine) {
   auto& processes = tree.host().processes();
   processes.setMachineBoolean("a", true);
   tree.write(preferencesFile, "<dict/>");
-  const SystemRoot root(tree.at("/"));
-  RunLoop loop;
-  const auto held = MachineLock(root, loop).hold();
+  const auto held = MachineLock(tree.root, tree.runLoop).hold();
   const auto limit = tree.runLoop.limitWaits(std::chrono::milliseconds(10));
   processes.writeMachinePreferences();
   EXPECT_THAT(tree.lastEffect(), FailedFor("is changing a setting of this machine"));
@@ -66,36 +63,6 @@ TEST(LinuxPreferences, ReadAsNoneOutOfADamagedFileAndAreKeptBesideIt) {
   tree.host().processes().writeMachinePreferences();
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_EQ(tree.file(std::string(preferencesFile) + ".damaged"), "<dict>");
-}
-
-TEST(PropertyListFiles, KeepTheirOtherKeysWhicheverCallFails) {
-  const auto chooseArchitecture = [](LinuxHost& host) {
-    auto contents = host.bootLoaderFile().read().value_or(PropertyList::Dictionary());
-    contents.set(BootLoaderFile::architectureKey, "i386");
-    return host.bootLoaderFile().write(contents);
-  };
-  const auto setPreference = [](LinuxHost& host) {
-    host.processes().setMachineBoolean("Kernel Architecture", true);
-    host.processes().writeMachinePreferences();
-    return true;
-  };
-  const std::pair<const char*, std::function<bool(LinuxHost&)>> changes[] = {{BootLoaderFile::path, chooseArchitecture},
-                                                                             {preferencesFile, setPreference}};
-  for (const auto& [file, change] : changes) {
-    LinuxTree tree;
-    int call = 0;
-    for (TracedRun run{true}; run.wentWrong; ++call) {
-      tree.write(file, "<dict><key>Timeout</key><integer>5</integer></dict>");
-      run = runWithFault(call, EIO, isOfFiles, [&tree = tree, &change = change] {
-        return change(tree.host()) && tree.lastEffect().outcome == Outcome::applied ? 0 : 1;
-      });
-      const auto after = tree.file(file);
-      EXPECT_THAT(after, HasSubstr("Timeout")) << file << " call " << call;
-      EXPECT_TRUE(run.status != 0 || after.find("Kernel Architecture") != std::string::npos) << file << call;
-      EXPECT_FALSE(tree.has(std::string(file) + ".damaged")) << file << call;
-    }
-    EXPECT_GT(call, 20) << "the work was not traced";
-  }
 }
 
 /// What a signal to a process of this machine comes to. A whole host would tell the journal of the machine too.
@@ -127,9 +94,6 @@ TEST(LinuxProcesses, GetSignals) {
   ASSERT_EQ(::waitpid(child, &status, 0), child);
   EXPECT_TRUE(WIFSIGNALED(status) && WTERMSIG(status) == SIGTERM);
   EXPECT_EQ(effectOf(SIGTERM, child).failure->code, std::errc::no_such_process);
-}
-
-TEST(LinuxProcesses, GetNoSignalsAsAGroup) {
   for (const ProcessId group : {0, -1, -::getpgrp(), INT32_MIN})
     EXPECT_THAT(effectOf(SIGCONT, group), FailedFor("no process id"));
 }

@@ -3,9 +3,7 @@
 #pragma once
 
 #include <algorithm>
-#include <cerrno>
 #include <map>
-#include <optional>
 
 #include "base/Text.h"
 #include "hosts/linux/LinuxTree.h"
@@ -139,12 +137,6 @@ class PowerTree : public LinuxTree {
   }
   void remove(const std::string& path) { std::filesystem::remove_all(at(path)); }
 
-  /// Puts something that cannot be looked at in its place: a link that leads round.
-  void loop(const std::string& path) {
-    remove(path);
-    link(path, at(path).filename());
-  }
-
   LinuxPowerSettingsService& power() { return _power; }
   LinuxPowerController& delays() { return _delays; }
 
@@ -171,29 +163,15 @@ class PowerTree : public LinuxTree {
 
  private:
   void replay(const std::vector<std::string>& words) {
-    if (words.at(0) == "wake") {
-      if (words.size() > 3) cards.cards[words[1]].modes = {bitsOf(words[2]), bitsOf(words[3])};
-    } else if (words.at(1) == "->") {
+    if (words.at(1) == "->")
       link(words[0], words[2]);
-    } else {
+    else
       write(words[0], words.at(2) + "\n");
-    }
-  }
-  /// Of the letters of ethtool; "d" is none.
-  static std::uint32_t bitsOf(const std::string& letters) {
-    constexpr std::string_view all = "pumbagsf";
-    std::uint32_t bits = 0;
-    for (std::size_t i = 0; i < all.size(); ++i)
-      if (letters.find(all[i]) != std::string::npos) bits |= 1U << i;
-    return bits;
   }
 
-  SystemRoot _root{at("/").string()};
-  ServiceAccess _services{_root, runLoop};
-  LinuxMachine _machine{_root, effects, runLoop, _services};
   ManagementController _controller{controllerLink};
-  LinuxPowerSettingsService _power{_machine, {console, cards, _controller}};
-  LinuxPowerController _delays{_machine, _controller};
+  LinuxPowerSettingsService _power{machine, {console, cards, _controller}};
+  LinuxPowerController _delays{machine, _controller};
 };
 
 }  // namespace tavisk

@@ -5,9 +5,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <thread>
-
-#include "ScratchMachine.h"
+#include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/system/MachineLock.h"
 
 namespace tavisk {
@@ -17,14 +15,12 @@ class MachineLockTest : public testing::Test {
  protected:
   unsigned modeOf(const char* path) const {
     struct stat status {};
-    ::stat((folder.path().string() + path).c_str(), &status);
+    ::stat(tree.at(path).c_str(), &status);
     return status.st_mode & 07777U;
   }
 
-  TemporaryFolder folder;
-  SystemRoot root{folder.path()};
-  RunLoop loop;
-  MachineLock lock{root, loop};
+  LinuxTree tree;
+  MachineLock lock{tree.root, tree.runLoop};
 };
 
 TEST_F(MachineLockTest, isForMembersAloneAndClosedToStartedPrograms) {
@@ -39,19 +35,19 @@ TEST_F(MachineLockTest, waitsForItsHolderAndThenNamesIt) {
   auto held = lock.hold();
   ASSERT_TRUE(held);
   {
-    const auto limit = loop.limitWaits(std::chrono::milliseconds(30));
+    const auto limit = tree.runLoop.limitWaits(std::chrono::milliseconds(30));
     const auto refused = lock.hold();
     ASSERT_FALSE(refused);
     EXPECT_EQ(refused.failure().why,
               "process " + std::to_string(::getpid()) + " is changing a setting of this machine");
   }
-  const auto release = loop.after(std::chrono::milliseconds(20), [&] { held = Failure{}; });
+  const auto release = tree.runLoop.after(std::chrono::milliseconds(20), [&] { held = Failure{}; });
   EXPECT_TRUE(lock.hold());
 }
 
 TEST_F(MachineLockTest, isNotTakenForFreeWhereItCannotBeOpened) {
-  folder.write("/run/tavisk/other", "");
-  std::filesystem::create_symlink("other", folder.path() / "run/tavisk/lock");
+  tree.write("/run/tavisk/other", "");
+  tree.link("/run/tavisk/lock", "other");
   EXPECT_EQ(lock.hold().failure().code, std::errc::too_many_symbolic_link_levels);
 }
 

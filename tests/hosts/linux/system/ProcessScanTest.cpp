@@ -31,16 +31,15 @@ TEST(ProcessScan, FindsRunningProgramsOfThisMachine) {
   tree.link("/proc/17/exe", "/lib/systemd/systemd-timesyncd (deleted)");
   process("18", "garbage", "chronyd");
   tree.write("/proc/uptime", "1");
-  const SystemRoot root(tree.at("/"));
-  EXPECT_THAT(processesNamed(root, "chronyd").valueOr({}), UnorderedElementsAre(10));
-  EXPECT_THAT(processesNamed(root, "systemd-timesyncd").valueOr({}), UnorderedElementsAre(15, 17));
-  EXPECT_THAT(processesNamed(root, "systemd-timesyn").valueOr({}), UnorderedElementsAre(15, 16, 17));
+  EXPECT_THAT(processesNamed(tree.root, "chronyd").valueOr({}), UnorderedElementsAre(10));
+  EXPECT_THAT(processesNamed(tree.root, "systemd-timesyncd").valueOr({}), UnorderedElementsAre(15, 17));
+  EXPECT_THAT(processesNamed(tree.root, "systemd-timesyn").valueOr({}), UnorderedElementsAre(15, 16, 17));
   EXPECT_THAT(processesNamed(SystemRoot("/nowhere"), "chronyd").valueOr({0}), IsEmpty());
   for (const char* path : {"/proc/15/cmdline", "/proc/11/stat", "/proc/10/ns", "/proc"}) {
     tree.makeUnreadable(path);
-    EXPECT_FALSE(processesNamed(root, "systemd-timesyncd")) << path;
+    EXPECT_FALSE(processesNamed(tree.root, "systemd-timesyncd")) << path;
     std::filesystem::remove(tree.at(path));
-    EXPECT_TRUE(processesNamed(root, "systemd-timesyncd")) << path << " is gone";
+    EXPECT_TRUE(processesNamed(tree.root, "systemd-timesyncd")) << path << " is gone";
   }
 }
 
