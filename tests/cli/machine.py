@@ -64,7 +64,7 @@ class ScratchMachine:
         return plistlib.loads(place.read_bytes()) if place.exists() else {}
 
     def change(self, changes):
-        self.write(merged(self.read(), decoded(changes)))
+        self.write(merged(self.read(), changes))
 
     def place(self, path):
         return self.directory / "root" / path.lstrip("/")
@@ -82,18 +82,16 @@ class ScratchMachine:
         return [json.loads(line) for line in self.lines("effects.log")]
 
     def environment(self, **more):
-        path = "/usr/sbin:/usr/bin:/sbin:/bin"
-        return {"PATH": path, "TAVISK_HOST": f"scratch:{self.directory}", **SANITIZER_OPTIONS, **more}
+        return {"PATH": "/usr/sbin:/usr/bin:/sbin:/bin", "TAVISK_HOST": f"scratch:{self.directory}", **SANITIZER_OPTIONS, **more}
 
     def start(self, words, environment=None, **how):
         return subprocess.Popen([self.program, *words], env=self.environment(**(environment or {})), **how)
 
     def run(self, words, typed=b"", environment=None, **how):
         """Output, standard error and status of one run."""
-        how = {"stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **how}
-        with self.start(words, environment, stdin=subprocess.PIPE, **how) as process:
-            output, errors = process.communicate(typed, timeout=30)
-            return output, errors, process.returncode
+        ended = subprocess.run([self.program, *words], input=typed, env=self.environment(**(environment or {})), timeout=30,
+                               **{"stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **how})
+        return ended.stdout, ended.stderr, ended.returncode
 
 
 def program_and_arguments(arguments):

@@ -3,6 +3,7 @@
 """Lines edited at the prompt of a terminal: keys, history, completion, and what happens meanwhile."""
 
 import os
+import re
 import sys
 import termios
 import unittest
@@ -168,6 +169,32 @@ class WithoutEditing(unittest.TestCase):
                 terminal.wait_for("\r\nError: getdate\tx is not a valid command\r\n> ")
                 terminal.type("\x03")
                 self.assertEqual(terminal.status(), 0)
+
+    def test_volumes_come_change_and_go_at_their_lines(self):
+        def volume(name):
+            return {"Volume Name": name, "Mount Point": f"/Volumes/{name}"}
+
+        def listed():
+            terminal.type("-liststartupdisks\n")
+            return re.findall(f"/Volumes/(.*){FOLDER}", terminal.wait_for("\r\n> "))
+
+        for name in ("Main", "Backup"):
+            self.machine.file(f"/Volumes/{name}{FOLDER}/boot.efi")
+            self.machine.file(f"/Volumes/{name}/mach_kernel")
+        self.machine.change({"Disks": {"disk0s1": volume("Main")}})
+        terminal = self.terminal(TERM="dumb")
+        terminal.wait_for("help.\r\n> ")
+        self.assertEqual(listed(), ["Main"])
+        both = ["Main", "Backup"]
+        self.machine.change({"Disks": {"disk1s1": volume("Backup")}})
+        self.assertEqual([listed() for _ in range(3)], [["Main"], ["Main"], both])
+        for changes, left in (({"disk0s1": {"Kind": "hfs"}}, both), ({"disk0s1": {"Size": 5}}, ["Backup"]),
+                              ({"disk0s1": {"Mount Point": "/Volumes/Backup"}, "disk1s1": None}, ["Backup"])):
+            self.machine.change({"Disks": changes})
+            self.assertEqual([listed() for _ in range(3)][2], left, changes)
+        self.machine.plist.write_bytes(b"<plist><dict><key>Disks</key><dict>")
+        self.assertEqual([listed() for _ in range(3)], [["Backup"]] * 3)
+        self.assertEqual(len(self.machine.effects()), 1)
 
     def test_a_failure_is_told_in_one_line(self):
         self.machine.change({"Refusals": {"Time": "sealed\x85 off"}})

@@ -40,10 +40,10 @@ def bytes_of(text):
 class Case:
     def __init__(self, title):
         self.title = title
-        self.description = self.words = self.effects = None
-        self.files, self.links, self.plists, self.errors, self.log = [], [], [], [], []
-        self.environment, self.changes = {}, {}
-        self.typed, self.output, self.status = b"", b"", 0
+        self.description = self.words = None
+        self.files, self.links, self.environment = [], [], {}
+        self.typed, self.output = b"", b""
+        self.wanted = {"error": [], "log": [], "plist": [], "status": ["0"], "machine": ["{}"], "effects": []}
 
     def prepare(self, line):
         keyword, _, rest = line.partition(" ")
@@ -68,27 +68,16 @@ class Case:
         elif line == "<" or line.startswith("< "):
             self.typed += bytes_of(line[2:]) + b"\n"
         elif line.startswith("!"):
-            self.require(*line[1:].partition(" ")[::2])
+            what, _, value = line[1:].partition(" ")
+            self.wanted[what] = [*self.wanted[what], value] if what in ("error", "log", "plist") else [value]
         else:
             self.output += bytes_of(line[:-1]) if line.endswith("|") else bytes_of(line) + b"\n"
 
-    def require(self, what, value):
-        if what == "error":
-            self.errors.append(value)
-        elif what == "log":
-            self.log.append(value)
-        elif what == "status":
-            self.status = int(value)
-        elif what == "plist":
-            path, _, content = value.partition(" ")
-            self.plists.append((path, decoded(json.loads(content))))
-        else:
-            setattr(self, {"machine": "changes", "effects": "effects"}[what], json.loads(value))
-
     def machines(self, found):
         """The machine as it should be and as it is."""
-        expected = merged(decoded(self.description or {}), decoded(self.changes))
-        if "Authorization" not in self.changes:
+        changes = json.loads(*self.wanted["machine"])
+        expected = merged(decoded(self.description or {}), decoded(changes))
+        if "Authorization" not in changes:
             found.pop("Authorization", None)
             expected.pop("Authorization", None)
         return expected, found
@@ -102,15 +91,15 @@ class Case:
             output, errors, status = machine.run(self.words, self.typed, self.environment)
             errors = errors.decode(errors="replace").replace(str(machine.directory), "DIR").splitlines()
             yield from compared("output", self.output, output)
-            yield from compared("standard error", self.errors, errors)
-            yield from compared("status", self.status, status)
-            yield from compared("system.log", self.log, machine.lines("system.log"))
+            yield from compared("standard error", self.wanted["error"], errors)
+            yield from compared("status", self.wanted["status"], [str(status)])
+            yield from compared("system.log", self.wanted["log"], machine.lines("system.log"))
             yield from compared("machine", *self.machines(machine.read()))
-            for path, content in self.plists:
-                yield from compared(path, content, machine.read(path))
-            if self.effects is not None:
+            for path, _, content in (wanted.partition(" ") for wanted in self.wanted["plist"]):
+                yield from compared(path, decoded(json.loads(content)), machine.read(path))
+            for wanted in self.wanted["effects"]:
                 found = [[effect["setting"], effect["outcome"]] for effect in machine.effects()]
-                yield from compared("effects", self.effects, found)
+                yield from compared("effects", json.loads(wanted), found)
 
 
 def compared(what, expected, found):

@@ -9,6 +9,7 @@ The arrows are those of the drawing in CONTRIBUTING.md, which is read here: a ro
 leads to, however far.
 """
 
+import graphlib
 import os
 import re
 import sys
@@ -114,19 +115,10 @@ def unused_arrows(code, arrows, reach):
 
 def circle_faults(code):
     """Headers that include each other, however far round."""
-    graph = {path.removeprefix("src/"): includes_of(text) for path, text in code.items()}
-    done = set()
-
-    def visit(name, above):
-        if name in above:
-            yield "include circle: " + " -> ".join(above[above.index(name):] + [name])
-        elif name not in done:
-            for included in graph.get(name, []):
-                yield from visit(included, above + [name])
-            done.add(name)
-
-    for name in graph:
-        yield from visit(name, [])
+    try:
+        graphlib.TopologicalSorter({path.removeprefix("src/"): includes_of(text) for path, text in code.items()}).prepare()
+    except graphlib.CycleError as circle:
+        yield "include circle: " + " -> ".join(circle.args[1])
 
 
 def folder_faults(paths):

@@ -14,8 +14,6 @@ def kept(seconds):
 
 CHECKS = [
     Check("the longest delay", needs=SERVER, do=f"tavisk -{SET} 7650", prints=f"{SET}: 7650 seconds\n", then=kept(7650)),
-    Check("only the low byte is kept", needs=SERVER, do=f"tavisk -{SET} 7680", prints=f"{SET}: 7680 seconds\n",
-          then=kept(0)),
     Check("a delay is kept in the controller", needs=SERVER, kept=True, do=f"tavisk -{SET} 90",
           prints=f"{SET}: 90 seconds\n", then=kept(90)),
     Check("the controller stops knowing delays", needs=SERVER, do="controller forgets delays"),
