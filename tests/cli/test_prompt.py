@@ -198,11 +198,8 @@ class WithoutEditing(unittest.TestCase):
 
     def test_a_failure_is_told_in_one_line(self):
         self.machine.change({"Refusals": {"Time": "sealed\x85 off"}})
-        terminal = self.terminal(["-settime", "1:2:3"])
-        shown = terminal.wait_for("Set Time: 01:02:03\r\n")
-        self.assertTrue(shown.startswith(f"tavisk: rehearsing on {self.machine.directory}\ntavisk: Time: "), shown)
-        self.assertIn("sealed\\u{0085} off\n", shown)
-        self.assertEqual(terminal.status(), 0)
+        shown = self.terminal(["-settime", "1:2:3"]).wait_for("Set Time: 01:02:03\r\n")
+        self.assertRegex(shown, rf"^tavisk: rehearsing on {self.machine.directory}\ntavisk: Time: .*sealed\\u\{{0085}} off\n")
 
 
 if __name__ == "__main__":

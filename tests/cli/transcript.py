@@ -69,7 +69,8 @@ class Case:
             self.typed += bytes_of(line[2:]) + b"\n"
         elif line.startswith("!"):
             what, _, value = line[1:].partition(" ")
-            self.wanted[what] = [*self.wanted[what], value] if what in ("error", "log", "plist") else [value]
+            earlier = self.wanted[what]
+            self.wanted[what] = [*earlier, value] if what in ("error", "log", "plist") else [value]
         else:
             self.output += bytes_of(line[:-1]) if line.endswith("|") else bytes_of(line) + b"\n"
 

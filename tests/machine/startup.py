@@ -76,19 +76,15 @@ class Startup(server.Server):
         self._monitor("device_del plugged")
         machine.wait_until(lambda: self.run("test -e /dev/disk/by-label/PLUGGED").status != 0, 200, "the pull")
         seen += [self._listed_at_prompt() for _ in range(3)]
-        plugged = [folder_of("Plugged") in lines for lines in seen]
-        others = {lines.replace(folder_of("Plugged") + "\n", "") for lines in seen}
-        correct = not plugged[0] and plugged[3] and not plugged[6] and len(others) == 1
-        return [] if correct else [repr(lines) for lines in seen]
+        others, plugged = seen[0], seen[0] | {folder_of("Plugged")}
+        correct = plugged == seen[3] != others == seen[6] and all(folders in (others, plugged) for folders in seen)
+        return [] if correct else [repr(folders) for folders in seen]
 
     def _listed_at_prompt(self):
         self.run(": >/run/answers; echo -liststartupdisks >/run/lines")
-        answer = machine.wait_until(lambda: self._prompted(), 200, "the prompt's answer")
-        return "".join(sorted(line + "\n" for line in answer.splitlines() if line.startswith("/")))
-
-    def _prompted(self):
-        answer = self.run("cat /run/answers").output
-        return answer if answer.endswith("> ") else ""
+        answer = machine.wait_until(lambda: self.run("tail -c 2 /run/answers | grep -q '> ' && cat /run/answers").output, 200,
+                                    "the prompt's answer")
+        return {line for line in answer.splitlines() if line.startswith("/")}
 
     def _monitor(self, command):
         with socket.socket(socket.AF_UNIX) as monitor:

@@ -40,11 +40,6 @@ def where_it_may_not_run(daemon):
               errors=re.compile(r"tavisk: Network Time: StartUnit on [^\n]* condition [^\n]*\n"),
               then=enabled | {"journalctl -b -t tavisk TAVISK_SETTING='Network Time' -n 1 -o cat":
                               re.compile(r"Network Time: failed, [^\n]*\n")}),
-        Check(f"{daemon} that is masked stays so", needs=container,
-              do=f"systemctl mask --quiet {daemon}; TAVISK_LOG=stderr {ONE_LINE}",
-              prints="setUsingNetworkTime: On\nNetwork Time: Off\n",
-              errors=re.compile(r"(tavisk: Network Time[^\n]*mask[^\n]*\n)+"),
-              then={f"systemctl is-enabled {daemon}": "masked\n", f"systemctl unmask --quiet {daemon}": ""}),
         Check(f"{daemon} is let run without a clock", needs=container,
               do=f"mkdir -p {drop_in}; printf '%s\\n' '" + "' '".join(WITHOUT_CLOCK[daemon]) +
                  f"' >{drop_in}/test.conf; systemctl daemon-reload"),
