@@ -13,17 +13,6 @@ import tempfile
 SANITIZER_OPTIONS = {name: value for name, value in os.environ.items() if name.endswith("SAN_OPTIONS")}
 
 
-def decoded(value):
-    """JSON to property list: {"data": "00ff"} alone is data, everything else is as it stands."""
-    if isinstance(value, dict):
-        if set(value) == {"data"}:
-            return bytes.fromhex(value["data"])
-        return {key: decoded(item) for key, item in value.items()}
-    if isinstance(value, list):
-        return [decoded(item) for item in value]
-    return value
-
-
 def merged(into, changes):
     """Dictionaries key by key; a null removes."""
     for key, value in changes.items():
@@ -55,7 +44,7 @@ class ScratchMachine:
 
     def write(self, description):
         replacement = self.directory / "machine.new"
-        replacement.write_bytes(plistlib.dumps(decoded(description), sort_keys=False))
+        replacement.write_bytes(plistlib.dumps(description, sort_keys=False))
         replacement.rename(self.plist)
 
     def read(self, path=None):

@@ -17,12 +17,14 @@ PATIENCE = 10
 BANNER = b"> tavisk\n> type -help for help.\n> "
 
 
-class Ending(unittest.TestCase):
+class Run(unittest.TestCase):
     def setUp(self):
         self.machine = ScratchMachine(PROGRAM, {})
         self.addCleanup(self.machine.__exit__)
         self.report = self.machine.directory / "report"
 
+
+class Ending(Run):
     def end(self, words, *signals):
         """Ends a run that waits, at the prompt when there are no words."""
         self.machine.write({})
@@ -59,11 +61,7 @@ class Ending(unittest.TestCase):
         self.assertEqual(self.end(["-listtimezones"] * 40, signal.SIGTERM), 0)
 
 
-class DeadOutput(unittest.TestCase):
-    def setUp(self):
-        self.machine = ScratchMachine(PROGRAM, {})
-        self.addCleanup(self.machine.__exit__)
-
+class DeadOutput(Run):
     def test_a_reader_that_left_ends_the_run_quietly(self):
         reading, writing = os.pipe()
         os.close(reading)

@@ -29,12 +29,17 @@ import re
 import shlex
 import sys
 
-from machine import ScratchMachine, decoded, merged, program_and_arguments
+from machine import ScratchMachine, merged, program_and_arguments
 
 
 def bytes_of(text):
     pieces = re.split(rb"\\x([0-9a-fA-F]{2})", text.encode())
     return b"".join(bytes.fromhex(piece.decode()) if odd % 2 else piece for odd, piece in enumerate(pieces))
+
+
+def value_of(text):
+    """JSON to property list."""
+    return json.loads(text, object_hook=lambda found: bytes.fromhex(found["data"]) if set(found) == {"data"} else found)
 
 
 class Case:
@@ -48,7 +53,7 @@ class Case:
     def prepare(self, line):
         keyword, _, rest = line.partition(" ")
         if keyword == "machine":
-            self.description = json.loads(rest)
+            self.description = value_of(rest)
         elif keyword == "file":
             path, _, content = rest.partition(" ")
             self.files.append((path, bytes_of(content.replace("\\n", "\n"))))
@@ -76,8 +81,8 @@ class Case:
 
     def machines(self, found):
         """The machine as it should be and as it is."""
-        changes = json.loads(*self.wanted["machine"])
-        expected = merged(decoded(self.description or {}), decoded(changes))
+        changes = value_of(*self.wanted["machine"])
+        expected = merged(self.description or {}, changes)
         if "Authorization" not in changes:
             found.pop("Authorization", None)
             expected.pop("Authorization", None)
@@ -97,7 +102,7 @@ class Case:
             yield from compared("system.log", self.wanted["log"], machine.lines("system.log"))
             yield from compared("machine", *self.machines(machine.read()))
             for path, _, content in (wanted.partition(" ") for wanted in self.wanted["plist"]):
-                yield from compared(path, decoded(json.loads(content)), machine.read(path))
+                yield from compared(path, value_of(content), machine.read(path))
             for wanted in self.wanted["effects"]:
                 found = [[effect["setting"], effect["outcome"]] for effect in machine.effects()]
                 yield from compared("effects", json.loads(wanted), found)
