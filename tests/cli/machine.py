@@ -13,17 +13,6 @@ import tempfile
 SANITIZER_OPTIONS = {name: value for name, value in os.environ.items() if name.endswith("SAN_OPTIONS")}
 
 
-def decoded(value):
-    """JSON to property list: {"data": "00ff"} alone is data, everything else is as it stands."""
-    if isinstance(value, dict):
-        if set(value) == {"data"}:
-            return bytes.fromhex(value["data"])
-        return {key: decoded(item) for key, item in value.items()}
-    if isinstance(value, list):
-        return [decoded(item) for item in value]
-    return value
-
-
 def merged(into, changes):
     """Dictionaries key by key; a null removes."""
     for key, value in changes.items():
@@ -55,7 +44,7 @@ class ScratchMachine:
 
     def write(self, description):
         replacement = self.directory / "machine.new"
-        replacement.write_bytes(plistlib.dumps(decoded(description), sort_keys=False))
+        replacement.write_bytes(plistlib.dumps(description, sort_keys=False))
         replacement.rename(self.plist)
 
     def read(self, path=None):
@@ -64,7 +53,7 @@ class ScratchMachine:
         return plistlib.loads(place.read_bytes()) if place.exists() else {}
 
     def change(self, changes):
-        self.write(merged(self.read(), decoded(changes)))
+        self.write(merged(self.read(), changes))
 
     def place(self, path):
         return self.directory / "root" / path.lstrip("/")
@@ -82,18 +71,16 @@ class ScratchMachine:
         return [json.loads(line) for line in self.lines("effects.log")]
 
     def environment(self, **more):
-        path = "/usr/sbin:/usr/bin:/sbin:/bin"
-        return {"PATH": path, "TAVISK_HOST": f"scratch:{self.directory}", **SANITIZER_OPTIONS, **more}
+        return {"PATH": "/usr/sbin:/usr/bin:/sbin:/bin", "TAVISK_HOST": f"scratch:{self.directory}", **SANITIZER_OPTIONS, **more}
 
     def start(self, words, environment=None, **how):
         return subprocess.Popen([self.program, *words], env=self.environment(**(environment or {})), **how)
 
     def run(self, words, typed=b"", environment=None, **how):
         """Output, standard error and status of one run."""
-        how = {"stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **how}
-        with self.start(words, environment, stdin=subprocess.PIPE, **how) as process:
-            output, errors = process.communicate(typed, timeout=30)
-            return output, errors, process.returncode
+        ended = subprocess.run([self.program, *words], input=typed, env=self.environment(**(environment or {})), timeout=30,
+                               **{"stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **how})
+        return ended.stdout, ended.stderr, ended.returncode
 
 
 def program_and_arguments(arguments):

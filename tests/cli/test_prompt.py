@@ -3,6 +3,7 @@
 """Lines edited at the prompt of a terminal: keys, history, completion, and what happens meanwhile."""
 
 import os
+import re
 import sys
 import termios
 import unittest
@@ -15,14 +16,23 @@ UP, LEFT, HOME = "\x1b[A", "\x1b[D", "\x01"
 ENDED = "\r\n> "
 
 
-class AtThePrompt(unittest.TestCase):
+class Prompt(unittest.TestCase):
     def setUp(self):
         zones = ["Europe/Madrid", "Europe/Malta", "Asia/Tokyo", "UTC"]
         clock = {"Time": 1173258303, "Known Time Zones": zones}
         self.machine = ScratchMachine(PROGRAM, {"Clock": clock, "Remote Shell": {"Enabled": True}})
         self.addCleanup(self.machine.__exit__)
-        self.terminal = Terminal(self.machine, TERM="xterm")
-        self.addCleanup(self.terminal.close)
+
+    def start(self, words=(), **environment):
+        terminal = Terminal(self.machine, words, **environment)
+        self.addCleanup(terminal.close)
+        return terminal
+
+
+class AtThePrompt(Prompt):
+    def setUp(self):
+        super().setUp()
+        self.terminal = self.start(TERM="xterm")
         self.terminal.wait_for("help.\r\n")
         self.terminal.wait_for("> ")
 
@@ -140,42 +150,56 @@ class AtThePrompt(unittest.TestCase):
         self.assertEqual(self.machine.read()["Authorization"]["Deauthentications"], 1)
 
     def test_a_resized_screen_and_a_stop_leave_the_line_as_it_is(self):
-        self.terminal.type("getd")
+        self.exchange(("getd", "getd"))
         self.terminal.resize(10, 40)
         self.terminal.wait_for("\r> getd")
         self.terminal.type("\x1aate\n")  # nobody could continue this process: the system does not stop it
         self.terminal.wait_for("\r\nDate: 3/7/2007" + ENDED)
 
 
-class WithoutEditing(unittest.TestCase):
-    def setUp(self):
-        self.machine = ScratchMachine(PROGRAM, {"Clock": {"Time": 1173258303}})
-        self.addCleanup(self.machine.__exit__)
-
-    def terminal(self, words=(), **environment):
-        terminal = Terminal(self.machine, words, **environment)
-        self.addCleanup(terminal.close)
-        return terminal
-
+class WithoutEditing(Prompt):
     def test_a_terminal_that_cannot_do_it_and_a_system_without_the_library(self):
         self.machine.file("/lib/libedit.so.2")
         without = {"TERM": "xterm", "LD_LIBRARY_PATH": f"{self.machine.directory}/root/lib"}
         for environment in ({"TERM": "dumb"}, without):
             with self.subTest(**environment):
-                terminal = self.terminal(**environment)
+                terminal = self.start(**environment)
                 terminal.wait_for("\r\n> tavisk\r\n> type -help for help.\r\n> ")
                 terminal.type("getdate\tx\n")
                 terminal.wait_for("\r\nError: getdate\tx is not a valid command\r\n> ")
                 terminal.type("\x03")
                 self.assertEqual(terminal.status(), 0)
 
+    def test_volumes_come_change_and_go_at_their_lines(self):
+        def volume(name):
+            return {"Volume Name": name, "Mount Point": f"/Volumes/{name}"}
+
+        def listed():
+            terminal.type("-liststartupdisks\n")
+            return re.findall(f"/Volumes/(.*){FOLDER}", terminal.wait_for("\r\n> "))
+
+        for name in ("Main", "Backup"):
+            self.machine.file(f"/Volumes/{name}{FOLDER}/boot.efi")
+            self.machine.file(f"/Volumes/{name}/mach_kernel")
+        self.machine.change({"Disks": {"disk0s1": volume("Main")}})
+        terminal = self.start(TERM="dumb")
+        terminal.wait_for("help.\r\n> ")
+        self.assertEqual(listed(), ["Main"])
+        both = ["Main", "Backup"]
+        self.machine.change({"Disks": {"disk1s1": volume("Backup")}})
+        self.assertEqual([listed() for _ in range(3)], [["Main"], ["Main"], both])
+        for changes, left in (({"disk0s1": {"Kind": "hfs"}}, both), ({"disk0s1": {"Size": 5}}, ["Backup"]),
+                              ({"disk0s1": {"Mount Point": "/Volumes/Backup"}, "disk1s1": None}, ["Backup"])):
+            self.machine.change({"Disks": changes})
+            self.assertEqual([listed() for _ in range(3)][2], left, changes)
+        self.machine.plist.write_bytes(b"<plist><dict><key>Disks</key><dict>")
+        self.assertEqual([listed() for _ in range(3)], [["Backup"]] * 3)
+        self.assertEqual(len(self.machine.effects()), 1)
+
     def test_a_failure_is_told_in_one_line(self):
         self.machine.change({"Refusals": {"Time": "sealed\x85 off"}})
-        terminal = self.terminal(["-settime", "1:2:3"])
-        shown = terminal.wait_for("Set Time: 01:02:03\r\n")
-        self.assertTrue(shown.startswith(f"tavisk: rehearsing on {self.machine.directory}\ntavisk: Time: "), shown)
-        self.assertIn("sealed\\u{0085} off\n", shown)
-        self.assertEqual(terminal.status(), 0)
+        shown = self.start(["-settime", "1:2:3"]).wait_for("Set Time: 01:02:03\r\n")
+        self.assertRegex(shown, rf"^tavisk: rehearsing on {self.machine.directory}\ntavisk: Time: .*sealed\\u\{{0085}} off\n")
 
 
 if __name__ == "__main__":

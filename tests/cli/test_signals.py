@@ -12,91 +12,56 @@ import unittest
 
 from machine import ScratchMachine, program_and_arguments
 
-ENDING_SIGNALS = (signal.SIGINT, signal.SIGTERM, signal.SIGHUP)
-AT_ONCE = 0.1  # seconds
+AT_ONCE = 0.15  # seconds
 PATIENCE = 10
+BANNER = b"> tavisk\n> type -help for help.\n> "
 
 
-def read_until(stream, text):
-    """What the program has written up to and including the text."""
-    seen = b""
-    while text not in seen:
-        piece = os.read(stream.fileno(), 4096)
-        if not piece:
-            raise AssertionError(f"{text!r} did not come, only {seen!r}")
-        seen += piece
-    return seen
-
-
-class Ending(unittest.TestCase):
+class Run(unittest.TestCase):
     def setUp(self):
         self.machine = ScratchMachine(PROGRAM, {})
         self.addCleanup(self.machine.__exit__)
+        self.report = self.machine.directory / "report"
 
-    def start(self, words, **how):
-        how = {"stdin": subprocess.PIPE, "stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **how}
-        process = self.machine.start(words, **how)
-        self.addCleanup(self.finish, process)
-        return process
 
-    @staticmethod
-    def finish(process):
-        process.kill()
-        process.wait()
-        for stream in (process.stdin, process.stdout, process.stderr):
-            if stream:
-                stream.close()
-
-    def end(self, process, number):
-        """The status, after a check of the time that the end took."""
-        begin = time.monotonic()
-        process.send_signal(number)
-        status = process.wait(PATIENCE)
-        self.assertLess(time.monotonic() - begin, AT_ONCE + 0.05)
+class Ending(Run):
+    def end(self, words, *signals):
+        """Ends a run that waits, at the prompt when there are no words."""
+        self.machine.write({})
+        how = {"stdin": subprocess.PIPE, "stdout": subprocess.PIPE, "environment": {"TAVISK_REPORT": str(self.report)}}
+        with self.machine.start(words, **how) as process:
+            if words:
+                time.sleep(0.3)  # until the pipe is full: there is no event for it
+            else:
+                self.assertEqual(process.stdout.read(len(BANNER)), BANNER)
+            begin = time.monotonic()
+            for number in signals:
+                process.send_signal(number)
+            try:
+                status = process.wait(PATIENCE)
+            finally:
+                process.kill()
+            self.assertLess(time.monotonic() - begin, AT_ONCE)
+        self.assertEqual(self.machine.read()["Authorization"], {"Authenticated": False, "Deauthentications": 1})
         return status
 
-    def assert_given_up_once(self):
-        self.assertEqual(self.machine.read()["Authorization"], {"Authenticated": False, "Deauthentications": 1})
-
-    def test_at_the_prompt(self):
-        for number in ENDING_SIGNALS:
+    def test_at_the_prompt_and_in_the_report(self):
+        for number in (signal.SIGINT, signal.SIGTERM, signal.SIGHUP):
             with self.subTest(number):
-                self.machine.write({})
-                process = self.start([])
-                read_until(process.stdout, b"help.\n> ")
-                self.assertEqual(self.end(process, number), 0)
-                self.assert_given_up_once()
+                self.assertEqual(self.end([], number), 0)
+                last = json.loads(self.report.read_text().splitlines()[-1])
+                self.assertEqual((last["report"], last["signal"]), (1, number.name))
 
     def test_a_second_signal_cuts_nothing_short(self):
         for attempt in range(30):
             with self.subTest(attempt):
-                self.machine.write({})
-                process = self.start([])
-                read_until(process.stdout, b"help.\n> ")
-                process.send_signal(signal.SIGINT)
-                self.end(process, signal.SIGTERM)
-                self.assert_given_up_once()
+                self.end([], signal.SIGINT, signal.SIGTERM)
 
     def test_while_the_output_is_stuck_in_a_full_pipe(self):
-        process = self.start(["-listtimezones"] * 40)
-        time.sleep(0.3)  # until the pipe is full: there is no event for it
-        self.assertEqual(self.end(process, signal.SIGTERM), 0)
-        self.assert_given_up_once()
-
-    def test_the_report_has_the_interrupted_run(self):
-        report = self.machine.directory / "report"
-        process = self.start([], environment={"TAVISK_REPORT": str(report)})
-        read_until(process.stdout, b"help.\n> ")
-        self.end(process, signal.SIGHUP)
-        last = json.loads(report.read_text().splitlines()[-1])
-        self.assertEqual((last["report"], last["signal"]), (1, "SIGHUP"))
+        self.assertEqual(self.end(["-listtimezones"] * 40, signal.SIGTERM), 0)
 
 
-class DeadOutput(unittest.TestCase):
-    def setUp(self):
-        self.machine = ScratchMachine(PROGRAM, {})
-        self.addCleanup(self.machine.__exit__)
-
+class DeadOutput(Run):
     def test_a_reader_that_left_ends_the_run_quietly(self):
         reading, writing = os.pipe()
         os.close(reading)

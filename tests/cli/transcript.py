@@ -29,7 +29,7 @@ import re
 import shlex
 import sys
 
-from machine import ScratchMachine, decoded, merged, program_and_arguments
+from machine import ScratchMachine, merged, program_and_arguments
 
 
 def bytes_of(text):
@@ -37,18 +37,23 @@ def bytes_of(text):
     return b"".join(bytes.fromhex(piece.decode()) if odd % 2 else piece for odd, piece in enumerate(pieces))
 
 
+def value_of(text):
+    """JSON to property list."""
+    return json.loads(text, object_hook=lambda found: bytes.fromhex(found["data"]) if set(found) == {"data"} else found)
+
+
 class Case:
     def __init__(self, title):
         self.title = title
-        self.description = self.words = self.effects = None
-        self.files, self.links, self.plists, self.errors, self.log = [], [], [], [], []
-        self.environment, self.changes = {}, {}
-        self.typed, self.output, self.status = b"", b"", 0
+        self.description = self.words = None
+        self.files, self.links, self.environment = [], [], {}
+        self.typed, self.output = b"", b""
+        self.wanted = {"error": [], "log": [], "plist": [], "status": ["0"], "machine": ["{}"], "effects": []}
 
     def prepare(self, line):
         keyword, _, rest = line.partition(" ")
         if keyword == "machine":
-            self.description = json.loads(rest)
+            self.description = value_of(rest)
         elif keyword == "file":
             path, _, content = rest.partition(" ")
             self.files.append((path, bytes_of(content.replace("\\n", "\n"))))
@@ -68,27 +73,17 @@ class Case:
         elif line == "<" or line.startswith("< "):
             self.typed += bytes_of(line[2:]) + b"\n"
         elif line.startswith("!"):
-            self.require(*line[1:].partition(" ")[::2])
+            what, _, value = line[1:].partition(" ")
+            earlier = self.wanted[what]
+            self.wanted[what] = [*earlier, value] if what in ("error", "log", "plist") else [value]
         else:
             self.output += bytes_of(line[:-1]) if line.endswith("|") else bytes_of(line) + b"\n"
 
-    def require(self, what, value):
-        if what == "error":
-            self.errors.append(value)
-        elif what == "log":
-            self.log.append(value)
-        elif what == "status":
-            self.status = int(value)
-        elif what == "plist":
-            path, _, content = value.partition(" ")
-            self.plists.append((path, decoded(json.loads(content))))
-        else:
-            setattr(self, {"machine": "changes", "effects": "effects"}[what], json.loads(value))
-
     def machines(self, found):
         """The machine as it should be and as it is."""
-        expected = merged(decoded(self.description or {}), decoded(self.changes))
-        if "Authorization" not in self.changes:
+        changes = value_of(*self.wanted["machine"])
+        expected = merged(self.description or {}, changes)
+        if "Authorization" not in changes:
             found.pop("Authorization", None)
             expected.pop("Authorization", None)
         return expected, found
@@ -102,15 +97,15 @@ class Case:
             output, errors, status = machine.run(self.words, self.typed, self.environment)
             errors = errors.decode(errors="replace").replace(str(machine.directory), "DIR").splitlines()
             yield from compared("output", self.output, output)
-            yield from compared("standard error", self.errors, errors)
-            yield from compared("status", self.status, status)
-            yield from compared("system.log", self.log, machine.lines("system.log"))
+            yield from compared("standard error", self.wanted["error"], errors)
+            yield from compared("status", self.wanted["status"], [str(status)])
+            yield from compared("system.log", self.wanted["log"], machine.lines("system.log"))
             yield from compared("machine", *self.machines(machine.read()))
-            for path, content in self.plists:
-                yield from compared(path, content, machine.read(path))
-            if self.effects is not None:
+            for path, _, content in (wanted.partition(" ") for wanted in self.wanted["plist"]):
+                yield from compared(path, value_of(content), machine.read(path))
+            for wanted in self.wanted["effects"]:
                 found = [[effect["setting"], effect["outcome"]] for effect in machine.effects()]
-                yield from compared("effects", self.effects, found)
+                yield from compared("effects", json.loads(wanted), found)
 
 
 def compared(what, expected, found):

@@ -2,7 +2,9 @@
 # SPDX-License-Identifier: MIT
 """Runs a set command again and again: each time one system call ends the run or fails, and what is left is looked at."""
 
+import collections
 import dataclasses
+import functools
 import json
 import os
 import pathlib
@@ -51,7 +53,7 @@ class Place:
 
     def __init__(self, start, program, top, work, watched):
         self._start, self._program, self._top, self._work = start, program, pathlib.Path(top), work
-        self._watched, self._known = watched, {}
+        self._watched = watched
         self._at(work).mkdir(parents=True, exist_ok=True)
 
     def _at(self, path):
@@ -87,20 +89,19 @@ class Place:
             if not os.path.lexists(self._at(path)):
                 continue
             seen = self._at(path).lstat()
-            found[path] = (seen.st_mode, seen.st_uid, seen.st_gid, self._contents(path, seen))
+            contents = ""
             if stat.S_ISDIR(seen.st_mode):
                 waiting += [f"{path}/{name}" for name in os.listdir(self._at(path))]
+            elif stat.S_ISLNK(seen.st_mode):
+                contents = os.readlink(self._at(path))
+            elif stat.S_ISREG(seen.st_mode):
+                contents = self._read(path, (seen.st_ino, seen.st_size, seen.st_mtime_ns, seen.st_ctime_ns))
+            found[path] = (seen.st_mode, seen.st_uid, seen.st_gid, contents)
         return found
 
-    def _contents(self, path, seen):
-        if stat.S_ISLNK(seen.st_mode):
-            return os.readlink(self._at(path))
-        if not stat.S_ISREG(seen.st_mode):
-            return ""
-        stamp = (path, seen.st_ino, seen.st_size, seen.st_mtime_ns, seen.st_ctime_ns)
-        if stamp not in self._known:
-            self._known[stamp] = self.plain(self._at(path).read_bytes(), path)
-        return self._known[stamp]
+    @functools.cache
+    def _read(self, path, _stamp):
+        return self.plain(self._at(path).read_bytes(), path)
 
     def restore(self, wanted):
         """By force, and only what differs."""
@@ -123,23 +124,13 @@ class Place:
 
 def calls_in(trace):
     """(name, which of that name) of each call of the first thread, from the one that opens the report."""
-    lines = re.findall(r"^(\d+) +(\w+)\((.*)", trace, re.MULTILINE)
-    counts, calls, begun = {}, [], False
-    for thread, name, words in lines:
-        if thread != lines[0][0]:
-            continue
-        counts[name] = counts.get(name, 0) + 1
+    first = trace.partition(" ")[0]
+    counts, begun = collections.Counter(), False
+    for name, words in re.findall(rf"^{first} +(\w+)\((.*)", trace, re.MULTILINE):
+        counts[name] += 1
         begun = begun or '/report"' in words
         if begun and name not in ("exit", "exit_group") and not (WALKED in words and counts[name] % 20):
-            calls.append((name, counts[name]))
-    return calls
-
-
-def faults_at(calls, slow):
-    for name, count in calls:
-        yield name, count, KILL
-        for error in ERRORS.get(name, "").split()[:1 if slow else None]:
-            yield name, count, error
+            yield name, counts[name]
 
 
 def few_of(faults):
@@ -155,9 +146,10 @@ class Sweep:
         self._old, self._old_text = self._set_to(command.old)
         place.run(command.set(command.new), "-y", "-e", "trace=all")
         self._lacking = {effect["setting"] for effect in self._effects() if effect["outcome"] == "not supported"}
-        self.faults = list(faults_at(calls_in(place.trace()), command.slow))
+        self.faults = [(name, count, fault) for name, count in calls_in(place.trace())
+                       for fault in (KILL, *ERRORS.get(name, "").split()[:1 if command.slow else None])]
         self._new, self._new_text = self._set_to(command.new)
-        self._own = {path for path in self._old | self._new if self._old.get(path) != self._new.get(path)}
+        self._own = set(_differing(self._old, self._new))
         self._set_back()
         if not self._own or len(self.faults) < 50:
             raise ValueError(f"{command.setting} changes {sorted(self._own)}, at {len(self.faults)} faults")
@@ -192,12 +184,11 @@ class Sweep:
         return [effect for entry in self._place.report() or [] for effect in entry["effects"]]
 
     def _is(self, state, wanted):
-        return all(state.get(path) == wanted.get(path) for path in self._own)
+        return not self._own & set(_differing(state, wanted))
 
     def _wrong_files(self, state):
-        paths = {path for path in state | self._old if state.get(path) not in (self._old.get(path), self._new.get(path))}
         return [("neither old nor new" if path in self._own else "another file changed", f"{path}: {state.get(path)}")
-                for path in sorted(paths) if LEFTOVER not in path]
+                for path in _differing(state, self._old, self._new)]
 
     def _wrong_report(self, state, status):
         entries = self._place.report()
@@ -224,11 +215,17 @@ class Sweep:
         if len(texts) != 2:
             return [("the next run fails", str(entries))]
         failed = [effect for effect in self._effects() if effect["outcome"] == "failed"]
-        left = _leftovers(state, "left for good")
-        wrong = [path for path in state | self._new if state.get(path) != self._new.get(path) and LEFTOVER not in path]
+        wrong = _differing(state, self._new)
         harm = [("a third value", texts[0])] if texts[0] not in (self._old_text, self._new_text) else []
-        return harm + left + ([("not completed", f"{wrong} {texts[1]!r} {failed}")] if wrong or failed or texts[1] != self._new_text
-                              else [])
+        if wrong or failed or texts[1] != self._new_text:
+            harm.append(("not completed", f"{wrong} {texts[1]!r} {failed}"))
+        return harm + _leftovers(state, "left for good")
+
+
+def _differing(state, *others):
+    """The paths that are in no other state as they are in this one; but for what a run left."""
+    return sorted(path for path in set(state).union(*others) if LEFTOVER not in path
+                  and all(state.get(path) != other.get(path) for other in others))
 
 
 def _leftovers(state, kind):

@@ -22,7 +22,6 @@ class Controller:
     def __init__(self, path):
         self.policy = 0
         self.delay = bytes(2)
-        self.knows_delay = True
         self.locked = False
         self._listener = socket.socket(socket.AF_UNIX)
         self._listener.bind(str(path))
@@ -30,14 +29,10 @@ class Controller:
         threading.Thread(target=self._serve, daemon=True).start()
 
     def obey(self, command):
-        """"controller tells" what it keeps; "controller forgets delays" and "knows delays" from then on, and so with the
-        panel that "is locked" or "is open"."""
+        """"controller tells" what it keeps; the panel "is locked" or "is open" from then on."""
         if command == "controller tells":
             return f"policy {self.policy}, delay {int.from_bytes(self.delay, 'big')}\n"
-        if command.startswith("controller is "):
-            self.locked = {"controller is locked": True, "controller is open": False}[command]
-        else:
-            self.knows_delay = {"controller knows delays": True, "controller forgets delays": False}[command]
+        self.locked = {"controller is locked": True, "controller is open": False}[command]
         return ""
 
     def _serve(self):
@@ -62,10 +57,10 @@ class Controller:
         if request == SET_POLICY:
             self.policy = data[0] if data[0] < 3 else self.policy
             return SUCCESS, bytes([POLICIES])
-        if request == SET_DELAY and self.knows_delay:
+        if request == SET_DELAY:
             self.delay = data
             return SUCCESS, b""
-        if request == GET_DELAY and self.knows_delay:
+        if request == GET_DELAY:
             return SUCCESS, self.delay
         return UNKNOWN_REQUEST, b""
 

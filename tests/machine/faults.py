@@ -83,29 +83,21 @@ class Inside(injection.Place):
         return b"" if path == "/run/tavisk/lock" else contents
 
 
-class AtOnce:
-    """Two runs that set something at the same moment; the outcome is to be as if one came after the other."""
+def wrong_at_once(places, words, right):
+    """What is wrong after two runs at the same moment: the outcome is to be as if one came after the other."""
+    with concurrent.futures.ThreadPoolExecutor() as at_once:
+        list(at_once.map(injection.Place.run, places, words))
+    state = places[0].state()
+    failed = [entry for place in places for entry in place.report() or ["no report"]
+              if entry == "no report" or any(effect["outcome"] == "failed" for effect in entry["effects"])]
+    paths = sorted(path for after in right for path in state | after if state.get(path) != after.get(path))
+    return failed + ([] if state in right else paths)
 
-    def __init__(self, places, pair):
-        self._places = places
-        # What is set in even turns, and in odd ones; and the two outcomes that are right.
-        self._words = [[Command(setting, *values).set(values[turn]) for setting, *values in pair] for turn in (0, 1)]
-        self._right = [[self._after(words, order) for order in ((0, 1), (1, 0))] for words in self._words]
 
-    def _after(self, words, order):
-        for one in order:
-            self._places[one].run(words[one])
-        return self._places[0].state()
-
-    def wrong(self, turn):
-        """A list of what is wrong after a turn."""
-        with concurrent.futures.ThreadPoolExecutor() as at_once:
-            list(at_once.map(lambda place, words: place.run(words), self._places, self._words[turn % 2]))
-        state, right = self._places[0].state(), self._right[turn % 2]
-        failed = [entry for place in self._places for entry in place.report() or ["no report"]
-                  if entry == "no report" or any(effect["outcome"] == "failed" for effect in entry["effects"])]
-        paths = sorted(path for after in right for path in state | after if state.get(path) != after.get(path))
-        return failed + ([] if state in right else paths)
+def after(places, words, order):
+    for one in order:
+        places[one].run(words[one])
+    return places[0].state()
 
 
 class FewFaults(container.Container):
@@ -156,8 +148,9 @@ class Faults(FewFaults):
 
     def _prove_two_at_once(self, pair, results):
         places = [Inside(self._first_process, f"/run/faults/{number}") for number in (1, 2)]
-        pairs = AtOnce(places, pair)
-        lost = [wrong for turn in range(PAIRS) if (wrong := pairs.wrong(turn))]
+        turns = [[["-set" + setting, values[turn]] for setting, *values in pair] for turn in (0, 1)]
+        right = [[after(places, words, order) for order in ((0, 1), (1, 0))] for words in turns]
+        lost = [wrong for turn in range(PAIRS) if (wrong := wrong_at_once(places, turns[turn % 2], right[turn % 2]))]
         results.add(f"at once: {pair[0][0]} and {pair[1][0]}, {PAIRS} pairs, {len(lost)} lost", [str(wrong) for wrong in lost[:5]])
 
     def _prove_that_who_waits_is_told(self, results):

@@ -33,7 +33,7 @@ class Guest(emulator.Emulated):
 
     def __init__(self):
         tree = trees.layered("guest-tree", trees.SERVER)
-        super().__init__("guest", ["-kernel", trees.kernel(tree), "-initrd", trees.WORK / "guest.cpio",
+        super().__init__("guest", ["-kernel", trees.boot_file(tree, "vmlinuz-*"), "-initrd", trees.WORK / "guest.cpio",
                                    "-append", "console=ttyS0", "-acpitable", f"file={_compiled(WAKING_PORT)}",
                                    *(word for card in CARDS for word in ("-device", card + ",romfile="))])
         _make_root(tree, self._folder / "root")

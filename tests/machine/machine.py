@@ -2,7 +2,6 @@
 # SPDX-License-Identifier: MIT
 """What the machines have in common."""
 
-import abc
 import time
 
 
@@ -10,27 +9,13 @@ class Trouble(Exception):
     """The machine itself, not a setting, went wrong."""
 
 
-class Machine(abc.ABC):
+class Machine:
+    """Each one has start, restart, stop (also when it did not start), and run: the Answer of a shell command, run as root;
+    Trouble when there is none."""
     name = ""
     has = frozenset()  # what checks may need
     own = frozenset()  # the words of which a check has to need all
     cannot = ""        # what cannot be proven on it, for people
-
-    @abc.abstractmethod
-    def start(self):
-        pass
-
-    @abc.abstractmethod
-    def run(self, command):
-        """The Answer of a shell command, run as root; Trouble when there is none."""
-
-    @abc.abstractmethod
-    def restart(self):
-        pass
-
-    @abc.abstractmethod
-    def stop(self):
-        """Also of a machine that did not start."""
 
     def prove_more(self, results):
         """What no Check can say."""

@@ -96,6 +96,6 @@ def _fill_boot_partition(tree, partition):
     entry.write_text(BOOT_ENTRY)
     loader = tree / "usr/lib/systemd/boot/efi/systemd-bootx64.efi"
     trees.run("mmd", "-i", partition, "::/EFI", "::/EFI/BOOT", "::/loader", "::/loader/entries")
-    for source, target in ((loader, "EFI/BOOT/BOOTX64.EFI"), (trees.kernel(tree), "vmlinuz"),
-                           (trees.initial_files(tree), "initrd"), (entry, "loader/entries/debian.conf")):
+    for source, target in ((loader, "EFI/BOOT/BOOTX64.EFI"), (trees.boot_file(tree, "vmlinuz-*"), "vmlinuz"),
+                           (trees.boot_file(tree, "initrd.img-*"), "initrd"), (entry, "loader/entries/debian.conf")):
         trees.run("mcopy", "-i", partition, source, "::/" + target)

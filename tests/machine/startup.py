@@ -23,11 +23,6 @@ MOUNTS = [("/boot/projects", "STARTER", "vfat"), ("/Volumes/Projects", "Projects
           ("/Volumes/Archive", "Archive", "ext4"), ("/Volumes/Backup", "BACKUP", "vfat"),
           ("/Volumes/Empty", "EMPTY", "vfat"), ("/Volumes/Stick", "STICK", "vfat"),
           ("/Volumes/Disc", "DISC", "iso9660"), ("/Volumes/Data Disc", "DATA", "iso9660")]
-LISTED = ["Archive", "Backup", "Disc", "Projects", "Stick"]
-
-
-def folder_of(volume):
-    return f"/Volumes/{volume}/{CORE}"
 
 
 class Startup(server.Server):
@@ -46,8 +41,10 @@ class Startup(server.Server):
         _make_disks(trees.WORK / "startup-disks")
 
     def start(self):
+        """The emulated machine finds its disks so slowly that the service manager may have given them up."""
         super().start()
-        self._wait_for_volumes()
+        found = "udevadm settle --timeout=60 && mount -a"
+        machine.wait_until(lambda: self.run(found).status == 0, 200, "the volumes")
 
     def restart(self):
         """By power: the firmware of this emulator is seen to hang when a machine with such disks restarts warm."""
@@ -61,11 +58,6 @@ class Startup(server.Server):
         results.add("startup: a disk plugged in and pulled at the prompt", self._plug_and_pull())
         results.add("startup: killed before each call that changes a file", sweep.faults(self))
 
-    def _wait_for_volumes(self):
-        """The emulated machine finds its disks so slowly that the service manager may have given them up."""
-        found = "udevadm settle --timeout=60 && mount -a"
-        machine.wait_until(lambda: self.run(found).status == 0, 200, "the volumes")
-
     def _plug_and_pull(self):
         self.run("mkfifo /run/lines; sleep 1000000 >/run/lines & tavisk </run/lines >>/run/answers 2>&1 &")
         seen = [self._listed_at_prompt()]
@@ -76,19 +68,15 @@ class Startup(server.Server):
         self._monitor("device_del plugged")
         machine.wait_until(lambda: self.run("test -e /dev/disk/by-label/PLUGGED").status != 0, 200, "the pull")
         seen += [self._listed_at_prompt() for _ in range(3)]
-        plugged = [folder_of("Plugged") in lines for lines in seen]
-        others = {lines.replace(folder_of("Plugged") + "\n", "") for lines in seen}
-        correct = not plugged[0] and plugged[3] and not plugged[6] and len(others) == 1
-        return [] if correct else [repr(lines) for lines in seen]
+        others, plugged = seen[0], seen[0] | {f"/Volumes/Plugged/{CORE}"}
+        correct = plugged == seen[3] != others == seen[6] and all(folders in (others, plugged) for folders in seen)
+        return [] if correct else [repr(folders) for folders in seen]
 
     def _listed_at_prompt(self):
         self.run(": >/run/answers; echo -liststartupdisks >/run/lines")
-        answer = machine.wait_until(lambda: self._prompted(), 200, "the prompt's answer")
-        return "".join(sorted(line + "\n" for line in answer.splitlines() if line.startswith("/")))
-
-    def _prompted(self):
-        answer = self.run("cat /run/answers").output
-        return answer if answer.endswith("> ") else ""
+        answer = machine.wait_until(lambda: self.run("tail -c 2 /run/answers | grep -q '> ' && cat /run/answers").output, 200,
+                                    "the prompt's answer")
+        return {line for line in answer.splitlines() if line.startswith("/")}
 
     def _monitor(self, command):
         with socket.socket(socket.AF_UNIX) as monitor:

@@ -76,14 +76,6 @@ def install_package(tree):
         env={**os.environ, "PATH": "/usr/sbin:/usr/bin:/sbin:/bin"})
 
 
-def kernel(tree):
-    return _only(tree, "vmlinuz-*")
-
-
-def initial_files(tree):
-    return _only(tree, "initrd.img-*")
-
-
-def _only(tree, pattern):
+def boot_file(tree, pattern):
     (file,) = (tree / "boot").glob(pattern)
     return file

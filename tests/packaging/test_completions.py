@@ -46,12 +46,6 @@ def command_words(environment):
     return [line.split()[1].lower() for line in printed.stdout.splitlines()]
 
 
-def wrong_offers(shell, offered, cases):
-    for (typed, expected), offers in zip(cases, offered, strict=True):
-        if sorted(offers) != sorted(expected):
-            yield f"{shell}: tavisk {typed}: expected {expected}, offered {offers}"
-
-
 def main(program, documents, sources):
     if missing := [shell for shell in shells.SHELLS if not shutil.which(shell)]:
         print("skipped: there is no", *missing)
@@ -63,8 +57,9 @@ def main(program, documents, sources):
                        "TAVISK_HOST": f"scratch:{machine}"}
         cases = [*CASES, ("-", command_words(environment) + NOT_IN_HELP)]
         lines = ["tavisk " + typed for typed, _ in cases]
-        wrong = [line for shell, complete in shells.SHELLS.items() for line in wrong_offers(
-            shell, complete(pathlib.Path(documents, "share"), lines, environment), cases)]
+        wrong = [f"{shell}: tavisk {typed}: expected {expected}, offered {offers}" for shell, complete in shells.SHELLS.items()
+                 for (typed, expected), offers in zip(cases, complete(pathlib.Path(documents, "share"), lines, environment), strict=True)
+                 if sorted(offers) != sorted(expected)]
     print("\n".join(wrong) or "every offer is as expected")
     return 1 if wrong else 0
 

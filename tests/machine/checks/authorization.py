@@ -61,8 +61,4 @@ CHECKS = [
           do=by("alice", "sleep 60") + " & sleep 1; " + may("ssh.service", "stop") + may("ssh.service", "kill")
           + may("cron.service", "stop") + "kill $!",
           prints="stop ssh.service: 0\nkill ssh.service: 2\nstop cron.service: 2\n"),
-    Check("an administrator is told that enabling needs root before anything moves", needs=CONTAINER | {"openssh-server"},
-          do="tavisk -setremotelogin on >/dev/null; " + with_rule("YES", by("alice", "TAVISK_LOG=stderr tavisk -f -setremotelogin off")),
-          errors=re.compile(r"tavisk: Remote Login: disable on ssh[^\n]*: needs root: sudo tavisk [^\n]*\n"),
-          then={"systemctl is-active ssh": "active\n"}),
 ]

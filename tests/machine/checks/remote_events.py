@@ -1,7 +1,5 @@
 # SPDX-FileCopyrightText: 2026 The tavisk developers
 # SPDX-License-Identifier: MIT
-import re
-
 from check import Check
 
 CONTAINER = frozenset({"container", "iproute2"})
@@ -16,15 +14,6 @@ LISTENING = "ss -H -l -t -n 'sport = :7007' | wc -l"
 SET = "TAVISK_LOG=stderr tavisk -setremotevelmarevents {} -getremotevelmarevents"
 
 CHECKS = [
-    Check("remote events are not supported without units", needs=CONTAINER,
-          do="rm -f /etc/tavisk/services.conf; " + SET.format("on"),
-          prints="setremotevelmarevents: On\nRemote Velmar Events: Off\n",
-          errors=re.compile(r"tavisk: Remote Events: [^\n]*services\.conf[^\n]*\n")),
-    Check("a unit that the machine depends on is not touched", needs=CONTAINER,
-          do=CONFIG.format("dbus.service") + SET.format("off"),
-          prints="setremotevelmarevents: remote velmar events are already off.\nRemote Velmar Events: Off\n",
-          errors=re.compile(r"(tavisk: Remote Events: use dbus\.service [^\n]*\n)+"),
-          then={"systemctl is-active dbus.service": "active\n"}),
     Check("remote events are turned off", needs=CONTAINER,
           do=MAKE_UNITS + "systemctl enable --quiet --now events.socket; " + SET.format("off"),
           prints="setremotevelmarevents: Off\nRemote Velmar Events: Off\n", errors="",

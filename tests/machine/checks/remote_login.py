@@ -39,8 +39,6 @@ CHECKS = [
           prints="Remote Login: On\n", then=ON),
     Check("who is logged in stays when remote login is turned off", needs=NEEDS, do=LOGIN + TURN_OFF,
           prints="Remote Login: Off\n", errors="", then=OFF | STAYS),
-    Check("a socket that is enabled is remote login", needs=NEEDS, do=TO_SOCKET + "tavisk -getremotelogin",
-          prints="Remote Login: On\n", then=GREETING),
     Check("socket, service and logins: the first two are turned off", needs=NEEDS, do=TO_SOCKET + LOGIN + TURN_OFF,
           prints="Remote Login: Off\n", errors="", then=OFF | STAYS),
     Check("host keys are made where there are none", needs=NEEDS, do="rm /etc/ssh/ssh_host_*; " + TURN_ON,

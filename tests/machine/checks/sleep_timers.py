@@ -51,10 +51,4 @@ CHECKS = [
     Check("a disk that comes back gets its timer", needs=SERVER,
           do="echo on >/sys/block/sda/device/power/control; udevadm trigger --settle --action=add /sys/block/sda",
           then={DISKS: "auto\non\n60000\n"}),
-    Check("a drop-in that hides the timer is named", needs=SERVER,
-          do="printf '[Login]\\nIdleAction=ignore\\n' >/etc/systemd/logind.conf.d/90-test.conf; "
-             "TAVISK_REPORT=fd:3 tavisk -setcomputersleep 160 3>&1 >/dev/null | grep -o '\"undoneBy\":\"[^\"]*\"'; "
-             "rm /etc/systemd/logind.conf.d/90-test.conf; tavisk -setcomputersleep 170",
-          prints='"undoneBy":"/etc/systemd/logind.conf.d/90-test.conf"\nsetcomputersleep: 170\n',
-          then=idle("suspend", 170)),
 ]

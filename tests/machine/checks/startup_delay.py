@@ -14,15 +14,8 @@ def kept(seconds):
 
 CHECKS = [
     Check("the longest delay", needs=SERVER, do=f"tavisk -{SET} 7650", prints=f"{SET}: 7650 seconds\n", then=kept(7650)),
-    Check("only the low byte is kept", needs=SERVER, do=f"tavisk -{SET} 7680", prints=f"{SET}: 7680 seconds\n",
-          then=kept(0)),
     Check("a delay is kept in the controller", needs=SERVER, kept=True, do=f"tavisk -{SET} 90",
           prints=f"{SET}: 90 seconds\n", then=kept(90)),
-    Check("the controller stops knowing delays", needs=SERVER, do="controller forgets delays"),
-    Check("its answer is told", needs=SERVER, do=f"TAVISK_LOG=stderr tavisk -{SET} 120",
-          prints="setWaitForStartupAfterPowerFailure: Error, IOConnectSetCFProperties returned 0x26\n",
-          errors=re.compile(r"tavisk: Startup Delay: [^\n]*does not know this request[^\n]*\n")),
-    Check("it knows delays again, and has kept its own", needs=SERVER, do="controller knows delays", then=kept(90)),
 ] + [
     Check(f"a {name} without a controller has no delay", needs=frozenset({name}), do=f"tavisk -{GET} -{SET} 30",
           prints=f"{GET}: 0 seconds\nsetWaitForStartupAfterPowerFailure: Error, IOServiceOpen returned 0x13\n")
