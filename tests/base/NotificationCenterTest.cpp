@@ -10,8 +10,7 @@ namespace {
 
 using ::testing::ElementsAre;
 
-class NotificationCenterTest : public ::testing::Test {
- protected:
+struct NotificationCenterTest : ::testing::Test {
   NotificationCenter::Handler note(const std::string& who) {
     return [this, who](const Notification& notification) { told.push_back(who + " " + notification.name); };
   }

@@ -51,20 +51,18 @@ TEST(Text, escapesWhatATerminalWouldObey) {
 TEST(Text, readsLeadingIntegers) {
   constexpr std::int64_t most = std::numeric_limits<std::int64_t>::max();
   constexpr std::int64_t least = std::numeric_limits<std::int64_t>::min();
-  const std::pair<const char*, std::int64_t> cases[] = {
-      {"", 0},
-      {"42", 42},
-      {" \v\f\r42", 42},
-      {"+7x", 7},
-      {"-7 8", -7},
-      {"+-7", 0},
-      {"-+7", 0},
-      {"0x10", 0},
-      {"9223372036854775807", most},
-      {"9223372036854775808", most},
-      {"-9223372036854775808", least},
-      {"-99999999999999999999999", least},
-  };
+  const std::pair<const char*, std::int64_t> cases[] = {{"", 0},
+                                                        {"42", 42},
+                                                        {" \v\f\r42", 42},
+                                                        {"+7x", 7},
+                                                        {"-7 8", -7},
+                                                        {"+-7", 0},
+                                                        {"-+7", 0},
+                                                        {"0x10", 0},
+                                                        {"9223372036854775807", most},
+                                                        {"9223372036854775808", most},
+                                                        {"-9223372036854775808", least},
+                                                        {"-99999999999999999999999", least}};
   for (const auto& [text, expected] : cases) EXPECT_EQ(leadingInteger(text), expected) << text;
 }
 
@@ -108,19 +106,17 @@ TEST(Json, escapesTexts) {
 }
 
 TEST(Locale, MakesIdentifiersRegular) {
-  const std::pair<const char*, const char*> cases[] = {
-      {"en", "en"},
-      {"English", "en"},
-      {"JAPANESE", "ja"},
-      {"EN-us", "en_US"},
-      {"de_AT.UTF-8", "de_AT"},
-      {"sr@latin", "sr"},
-      {"zh-hant-tw", "zh-Hant_TW"},
-      {"es-419", "es_419"},
-      {"C", "C"},
-      {"", ""},
-      {"Klingonese", "Klingonese"},
-  };
+  const std::pair<const char*, const char*> cases[] = {{"en", "en"},
+                                                       {"English", "en"},
+                                                       {"JAPANESE", "ja"},
+                                                       {"EN-us", "en_US"},
+                                                       {"de_AT.UTF-8", "de_AT"},
+                                                       {"sr@latin", "sr"},
+                                                       {"zh-hant-tw", "zh-Hant_TW"},
+                                                       {"es-419", "es_419"},
+                                                       {"C", "C"},
+                                                       {"", ""},
+                                                       {"Klingonese", "Klingonese"}};
   for (const auto& [language, identifier] : cases) EXPECT_EQ(canonicalLocaleIdentifier(language), identifier);
 }
 

@@ -12,8 +12,7 @@ namespace tavisk {
 /// `Machine` offers: service(); launchesAtStartup(), as it is stored; and `takesAnyText`, false where only host names
 /// and addresses are stored.
 template <typename Machine>
-class NetworkTimeContract : public testing::Test {
- protected:
+struct NetworkTimeContract : testing::Test {
   Machine machine;
 };
 

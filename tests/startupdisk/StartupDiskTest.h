@@ -6,18 +6,11 @@
 #include <vector>
 
 #include "ScratchMachine.h"
+#include "base/Keys.h"
 #include "base/NotificationCenter.h"
 #include "startupdisk/SDController.h"
 
 namespace tavisk {
-
-using Keys = PropertyList::Dictionary;
-
-inline PropertyList::Dictionary keys(std::initializer_list<PropertyList::Dictionary::Entry> entries) {
-  Keys keys;
-  for (const auto& [key, value] : entries) keys.set(key, value);
-  return keys;
-}
 
 /// Hears from a searcher.
 class RecordingDelegate final : public SystemSearcherProtocol {

@@ -15,8 +15,7 @@ using ::testing::ElementsAre;
 using ::testing::IsEmpty;
 
 /// A setting in memory. Each step can be made to fail, or to lie.
-class SettingChangeTest : public ::testing::Test {
- protected:
+struct SettingChangeTest : ::testing::Test {
   SettingChangeTest() {
     sink.addChannel(log);
     setting.name = "Sleep";
