@@ -196,11 +196,6 @@ TEST(PropertyListXml, readsWhatItsEncodingSays) {
             "the encoding US-ASCII is declared, and the text is not in it");
 }
 
-TEST(PropertyListXml, takesTheFirstOfTwoKeysInFilesOfOthers) {
-  const auto read = parsePropertyList("<dict><key>a</key><true/><key>a</key><dict/></dict>", foreignFileLimits);
-  EXPECT_EQ(*read, PropertyList(keys({{"a", true}})));
-}
-
 TEST(PropertyList, isPrintedAsPlainText) {
   EXPECT_EQ(plainText(keys({{"a", Array{"x", -1, 10.5, true, false}}, {"b", Date{951868798}}, {"c", Data{0, 255}}})),
             "{a = (x, -1, 10.5, 1, 0); b = 2000-02-29T23:59:58Z; c = <00ff>}");

@@ -15,13 +15,11 @@ namespace {
 using namespace std::string_literals;
 
 TEST(Text, tellsUtf8FromOtherBytes) {
-  for (const char* text : {"", "a", "\x7F", "\u00E9", "\uD7FF", "\uE000", "\uFFFF", "\U00010000", "\U0010FFFF"}) {
+  for (const char* text : {"", "a", "\x7F", "\u00E9", "\uD7FF", "\uE000", "\uFFFF", "\U00010000", "\U0010FFFF"})
     EXPECT_TRUE(isUtf8(text)) << escaped(text);
-  }
   for (const char* text : {"\x80", "\xC1\xBF", "\xC3", "a\xC3(", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xF0\x8F\xBF\xBF",
-                           "\xF4\x90\x80\x80", "\xF5\x80\x80\x80", "\xFF", "\xE2\x82", "\xE2\x28\xA1"}) {
+                           "\xF4\x90\x80\x80", "\xF5\x80\x80\x80", "\xFF", "\xE2\x82", "\xE2\x28\xA1"})
     EXPECT_FALSE(isUtf8(text)) << escaped(text);
-  }
 }
 
 TEST(Text, writesEveryCodePointAsItIsRead) {
@@ -51,18 +49,20 @@ TEST(Text, escapesWhatATerminalWouldObey) {
 TEST(Text, readsLeadingIntegers) {
   constexpr std::int64_t most = std::numeric_limits<std::int64_t>::max();
   constexpr std::int64_t least = std::numeric_limits<std::int64_t>::min();
-  const std::pair<const char*, std::int64_t> cases[] = {{"", 0},
-                                                        {"42", 42},
-                                                        {" \v\f\r42", 42},
-                                                        {"+7x", 7},
-                                                        {"-7 8", -7},
-                                                        {"+-7", 0},
-                                                        {"-+7", 0},
-                                                        {"0x10", 0},
-                                                        {"9223372036854775807", most},
-                                                        {"9223372036854775808", most},
-                                                        {"-9223372036854775808", least},
-                                                        {"-99999999999999999999999", least}};
+  const std::pair<const char*, std::int64_t> cases[] = {
+      {"", 0},
+      {"42", 42},
+      {" \v\f\r42", 42},
+      {"+7x", 7},
+      {"-7 8", -7},
+      {"+-7", 0},
+      {"-+7", 0},
+      {"0x10", 0},
+      {"9223372036854775807", most},
+      {"9223372036854775808", most},
+      {"-9223372036854775808", least},
+      {"-99999999999999999999999", least},
+  };
   for (const auto& [text, expected] : cases) EXPECT_EQ(leadingInteger(text), expected) << text;
 }
 
@@ -106,17 +106,19 @@ TEST(Json, escapesTexts) {
 }
 
 TEST(Locale, MakesIdentifiersRegular) {
-  const std::pair<const char*, const char*> cases[] = {{"en", "en"},
-                                                       {"English", "en"},
-                                                       {"JAPANESE", "ja"},
-                                                       {"EN-us", "en_US"},
-                                                       {"de_AT.UTF-8", "de_AT"},
-                                                       {"sr@latin", "sr"},
-                                                       {"zh-hant-tw", "zh-Hant_TW"},
-                                                       {"es-419", "es_419"},
-                                                       {"C", "C"},
-                                                       {"", ""},
-                                                       {"Klingonese", "Klingonese"}};
+  const std::pair<const char*, const char*> cases[] = {
+      {"en", "en"},
+      {"English", "en"},
+      {"JAPANESE", "ja"},
+      {"EN-us", "en_US"},
+      {"de_AT.UTF-8", "de_AT"},
+      {"sr@latin", "sr"},
+      {"zh-hant-tw", "zh-Hant_TW"},
+      {"es-419", "es_419"},
+      {"C", "C"},
+      {"", ""},
+      {"Klingonese", "Klingonese"},
+  };
   for (const auto& [language, identifier] : cases) EXPECT_EQ(canonicalLocaleIdentifier(language), identifier);
 }
 

@@ -13,8 +13,7 @@
 namespace tavisk {
 
 /// Hears from a searcher.
-class RecordingDelegate final : public SystemSearcherProtocol {
- public:
+struct RecordingDelegate final : SystemSearcherProtocol {
   void searchCompleted() override { ++completions; }
   void searchActivity() override { ++activities; }
   void foundSystemOnVolume(SDDiskRef system) override { found.push_back(std::move(system)); }
@@ -88,7 +87,10 @@ inline SDRecordRef image(const SDImage::Values& values) {
 class NotificationRecorder {
  public:
   explicit NotificationRecorder(NotificationCenter& center) : _center(center) {
-    _center.addObserver(this, "", [this](const Notification& notification) { note(notification); });
+    _center.addObserver(this, "", [this](const Notification& notification) {
+      const auto* record = std::any_cast<SDRecordRef>(&notification.object);
+      _lines.push_back(notification.name + (!record ? "" : " " + (*record)->description()));
+    });
   }
   ~NotificationRecorder() { _center.removeObserver(this); }
   NotificationRecorder(const NotificationRecorder&) = delete;
@@ -97,11 +99,6 @@ class NotificationRecorder {
   std::vector<std::string> take() { return std::exchange(_lines, {}); }
 
  private:
-  void note(const Notification& notification) {
-    const auto* record = std::any_cast<SDRecordRef>(&notification.object);
-    _lines.push_back(notification.name + (!record ? "" : " " + (*record)->description()));
-  }
-
   NotificationCenter& _center;
   std::vector<std::string> _lines;
 };

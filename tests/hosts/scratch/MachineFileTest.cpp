@@ -25,21 +25,6 @@ using namespace std::chrono_literals;
 using testing::ElementsAre;
 using testing::HasSubstr;
 
-/// What an absent key reads as, as the services read it.
-std::string readAbsent(const KeyRow& row) {
-  const MachineSection absent(std::string(row.place), nullptr);
-  if (row.type == KeyType::boolean) return absent.boolean(row.key) ? "true" : "false";
-  if (row.type == KeyType::integer) return std::to_string(absent.integer(row.key));
-  return absent.text(row.key);
-}
-
-TEST(KeyTable, hasDefaultsOfTheTypesOfTheirKeys) {
-  for (const auto& row : keyTable()) {
-    if (!row.otherwise) continue;
-    EXPECT_EQ(readAbsent(row), *row.otherwise) << row.place << "/" << row.key;
-  }
-}
-
 TEST(KeyTable, hasEachKeyOnceInAPlaceThatItHasToo) {
   std::set<std::string> known{""};
   for (const auto& row : keyTable()) {

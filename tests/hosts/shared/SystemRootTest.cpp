@@ -173,19 +173,6 @@ TEST_F(SystemRootTest, rewritesInPlaceWhereAFileIsMounted) {
   if (!ran) GTEST_SKIP() << "may not have mounts of its own";
 }
 
-TEST_F(SystemRootTest, keepsTheOldFileWhenTheNewOneFindsNoRoom) {
-  const bool ran = withOwnMounts([&] {
-    ASSERT_TRUE(mountMemory(folder.path(), "64k"));
-    folder.write("/file", "old");
-    EXPECT_EQ(root.write("/file", std::string(100'000, 'x')).failure(), systemFailure("write", "/file", ENOSPC));
-    EXPECT_EQ(contentsOf(at("/file")), "old");
-    EXPECT_EQ(root.list("/").valueOr({}), std::vector<std::string>{"file"});
-    ASSERT_EQ(::mount("", folder.path().c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
-    EXPECT_EQ(whyNotWritten("/file"), "Read-only file system");
-  });
-  if (!ran) GTEST_SKIP() << "may not have mounts of its own";
-}
-
 TEST_F(SystemRootTest, isNotFooledByAFolderThatTurnsIntoALink) {
   TemporaryFolder outside;
   outside.write("file", "outside");
@@ -314,14 +301,6 @@ TEST_F(RootedFileSystemTest, tellsWhatWasTriedOnWhichPathAndWhy) {
     EXPECT_FALSE(read.failure().tried.empty());
   }
   EXPECT_EQ(files.standardized("/loop/x").failure().why, "Too many levels of symbolic links");
-}
-
-TEST_F(RootedFileSystemTest, endsOnAnEndlessChainOfLinks) {
-  link("/chain0", "/Volumes");
-  for (int index = 1; index <= 100; ++index)
-    link("/chain" + std::to_string(index), "/chain" + std::to_string(index - 1));
-  EXPECT_EQ(files.standardized("/chain100").failure().why, "Too many levels of symbolic links");
-  EXPECT_EQ(files.standardized("/chain30").valueOr("none"), "/Volumes");
 }
 
 }  // namespace
