@@ -2,8 +2,6 @@
 // SPDX-License-Identifier: MIT
 #include <gtest/gtest.h>
 
-#include <cmath>
-#include <cstdlib>
 #include <limits>
 #include <random>
 
@@ -18,19 +16,13 @@ void PrintTo(const DateTime& time, std::ostream* out) {
 
 namespace {
 
-class CalendarTest : public ::testing::Test {
- protected:
+struct CalendarTest : ::testing::Test {
   static void useZone(const std::string& name) { setDefaultTimeZone("/usr/share/zoneinfo/" + name); }
   ~CalendarTest() override { useZone("UTC"); }
 };
 
 TEST_F(CalendarTest, goesBothWays) {
-  struct Case {
-    const char* zone;
-    std::int64_t seconds;
-    DateTime local;
-  };
-  const Case cases[] = {
+  const std::tuple<const char*, std::int64_t, DateTime> cases[] = {
       {"UTC", 0, {1970, 1, 1, 0, 0, 0}},
       {"UTC", -1, {1969, 12, 31, 23, 59, 59}},
       {"UTC", -62135596800, {1, 1, 1, 0, 0, 0}},
@@ -45,10 +37,10 @@ TEST_F(CalendarTest, goesBothWays) {
       // Local mean time, before there were zones: 4 h 56 min 2 s behind.
       {"America/New_York", -62135579038, {1, 1, 1, 0, 0, 0}},
   };
-  for (const auto& now : cases) {
-    useZone(now.zone);
-    EXPECT_EQ(localDateTime(now.seconds), now.local) << now.zone;
-    EXPECT_EQ(secondsSince1970(now.local), static_cast<double>(now.seconds)) << now.zone;
+  for (const auto& [zone, seconds, local] : cases) {
+    useZone(zone);
+    EXPECT_EQ(localDateTime(seconds), local) << zone;
+    EXPECT_EQ(secondsSince1970(local), static_cast<double>(seconds)) << zone;
   }
 }
 
@@ -67,13 +59,7 @@ TEST_F(CalendarTest, carriesWhatIsOutOfRange) {
 }
 
 TEST_F(CalendarTest, decidesAtChangesOfTheOffset) {
-  struct Case {
-    const char* what;
-    const char* zone;
-    DateTime local;
-    std::int64_t seconds;
-  };
-  const Case cases[] = {
+  const std::tuple<const char*, const char*, DateTime, std::int64_t> cases[] = {
       {"in the gap", "America/New_York", {2024, 3, 10, 2, 30, 0}, 1710055800},  // 3:30
       {"first after the gap", "America/New_York", {2024, 3, 10, 3, 0, 0}, 1710054000},
       {"twice", "America/New_York", {2024, 11, 3, 1, 30, 0}, 1730611800},  // summer time
@@ -82,9 +68,9 @@ TEST_F(CalendarTest, decidesAtChangesOfTheOffset) {
       {"24:00 of the day before", "Europe/Paris", {2024, 3, 30, 24, 0, 0}, 1711839600},
       {"a day left out", "Pacific/Apia", {2011, 12, 30, 12, 0, 0}, 1325282400},  // the 31st
   };
-  for (const auto& now : cases) {
-    useZone(now.zone);
-    EXPECT_EQ(secondsSince1970(now.local), static_cast<double>(now.seconds)) << now.zone << ' ' << now.what;
+  for (const auto& [what, zone, local, seconds] : cases) {
+    useZone(zone);
+    EXPECT_EQ(secondsSince1970(local), static_cast<double>(seconds)) << zone << ' ' << what;
   }
 }
 

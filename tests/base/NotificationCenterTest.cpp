@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include "base/NotificationCenter.h"
 
@@ -10,8 +9,7 @@ namespace {
 
 using ::testing::ElementsAre;
 
-class NotificationCenterTest : public ::testing::Test {
- protected:
+struct NotificationCenterTest : ::testing::Test {
   NotificationCenter::Handler note(const std::string& who) {
     return [this, who](const Notification& notification) { told.push_back(who + " " + notification.name); };
   }

@@ -4,7 +4,7 @@
 
 #include <limits>
 
-#include "base/PropertyList.h"
+#include "base/Keys.h"
 
 namespace tavisk {
 namespace {
@@ -13,12 +13,6 @@ using Array = PropertyList::Array;
 using Data = PropertyList::Data;
 using Date = PropertyList::Date;
 using Dictionary = PropertyList::Dictionary;
-
-Dictionary dictionaryOf(std::initializer_list<Dictionary::Entry> entries) {
-  Dictionary dictionary;
-  for (const auto& [key, value] : entries) dictionary.set(key, value);
-  return dictionary;
-}
 
 std::string repeated(const std::string& text, int times) {
   std::string result;
@@ -36,26 +30,26 @@ std::string whyRefused(std::string_view xml, const PropertyListLimits& limits = 
 }
 
 TEST(PropertyListDictionary, keepsItsOrderAndItsIndexThroughChanges) {
-  auto dictionary = dictionaryOf({{"a", 1}, {"b", 2}, {"c", 3}, {"d", 4}});
+  auto dictionary = keys({{"a", 1}, {"b", 2}, {"c", 3}, {"d", 4}});
   dictionary.set("b", "two");
   dictionary.remove("a");
   dictionary.remove("nothing");
   dictionary.remove("d");
   dictionary.set("a", 5);
-  EXPECT_EQ(dictionary, dictionaryOf({{"b", "two"}, {"c", 3}, {"a", 5}}));
+  EXPECT_EQ(dictionary, keys({{"b", "two"}, {"c", 3}, {"a", 5}}));
   EXPECT_EQ(*dictionary.find("c"), PropertyList(3));
   EXPECT_EQ(*dictionary.find("a"), PropertyList(5));
   EXPECT_EQ(dictionary.find("d"), nullptr);
-  EXPECT_FALSE(dictionary == dictionaryOf({{"c", 3}, {"b", "two"}, {"a", 5}})) << "the order counts";
+  EXPECT_FALSE(dictionary == keys({{"c", 3}, {"b", "two"}, {"a", 5}})) << "the order counts";
 }
 
 TEST(PropertyList, copiesDeeply) {
-  PropertyList original = dictionaryOf({{"inner", dictionaryOf({{"k", Array{1, "x"}}})}});
+  PropertyList original = keys({{"inner", keys({{"k", Array{1, "x"}}})}});
   const PropertyList copy = original;
   original.asDictionary()->dictionary("inner").set("k", 2);
-  EXPECT_EQ(copy, PropertyList(dictionaryOf({{"inner", dictionaryOf({{"k", Array{1, "x"}}})}})));
+  EXPECT_EQ(copy, PropertyList(keys({{"inner", keys({{"k", Array{1, "x"}}})}})));
   original = *original.asDictionary()->find("inner");
-  EXPECT_EQ(original, PropertyList(dictionaryOf({{"k", 2}}))) << "a value may take the place of the one that holds it";
+  EXPECT_EQ(original, PropertyList(keys({{"k", 2}}))) << "a value may take the place of the one that holds it";
 }
 
 TEST(PropertyListXml, readsEveryKindOfValueAlsoAsItWroteIt) {
@@ -81,6 +75,7 @@ TEST(PropertyListXml, readsEveryKindOfValueAlsoAsItWroteIt) {
       {"<date>0001-01-01T00:00:00Z</date>", Date{-62135596800}},
       {"<data> AAEC\n\t/w== </data>", Data{0, 1, 2, 255}},
       {"<data/>", Data()},
+      {"<dict><key>&lt;&#13;</key><array><false/><dict/></array></dict>", keys({{"<\r", Array{false, Dictionary()}}})},
   };
   for (const auto& [xml, expected] : cases) {
     const auto read = parsePropertyList(xml, foreignFileLimits);
@@ -91,7 +86,7 @@ TEST(PropertyListXml, readsEveryKindOfValueAlsoAsItWroteIt) {
 }
 
 TEST(PropertyListXml, readsAFileWithAndWithoutItsFrame) {
-  const PropertyList expected = dictionaryOf({{"b", Array{1, "x"}}, {"a", dictionaryOf({{"", true}})}});
+  const PropertyList expected = keys({{"b", Array{1, "x"}}, {"a", keys({{"", true}})}});
   const std::string bare =
       "<dict> <key>b</key><array><integer>1</integer>\t<string>x</string></array>\n"
       "<key>a</key><!-- c --><dict><key/><true/></dict></dict>";
@@ -201,53 +196,16 @@ TEST(PropertyListXml, readsWhatItsEncodingSays) {
             "the encoding US-ASCII is declared, and the text is not in it");
 }
 
-TEST(PropertyListXml, takesTheFirstOfTwoKeysInFilesOfOthers) {
-  const auto read = parsePropertyList("<dict><key>a</key><true/><key>a</key><dict/></dict>", foreignFileLimits);
-  EXPECT_EQ(*read, PropertyList(dictionaryOf({{"a", true}})));
-}
-
 TEST(PropertyList, isPrintedAsPlainText) {
-  EXPECT_EQ(
-      plainText(dictionaryOf({{"a", Array{"x", -1, 10.5, true, false}}, {"b", Date{951868798}}, {"c", Data{0, 255}}})),
-      "{a = (x, -1, 10.5, 1, 0); b = 2000-02-29T23:59:58Z; c = <00ff>}");
-}
-
-TEST(PropertyListXml, writesAFile) {
-  const PropertyList value = dictionaryOf({{"a<", Array{"&\r", -1, 1.5, true, Date{-1}, Data{255, 1}}},
-                                           {"b", dictionaryOf({{"e", Dictionary()}, {"f", Array()}, {"g", false}})}});
-  const auto written = writePropertyList(value);
-  ASSERT_TRUE(written);
-  EXPECT_EQ(*written, R"(<?xml version="1.0" encoding="UTF-8"?>
-<plist version="1.0">
-<dict>
-	<key>a&lt;</key>
-	<array>
-		<string>&amp;&#13;</string>
-		<integer>-1</integer>
-		<real>1.5</real>
-		<true/>
-		<date>1969-12-31T23:59:59Z</date>
-		<data>/wE=</data>
-	</array>
-	<key>b</key>
-	<dict>
-		<key>e</key>
-		<dict/>
-		<key>f</key>
-		<array/>
-		<key>g</key>
-		<false/>
-	</dict>
-</dict>
-</plist>
-)");
+  EXPECT_EQ(plainText(keys({{"a", Array{"x", -1, 10.5, true, false}}, {"b", Date{951868798}}, {"c", Data{0, 255}}})),
+            "{a = (x, -1, 10.5, 1, 0); b = 2000-02-29T23:59:58Z; c = <00ff>}");
 }
 
 TEST(PropertyListXml, writesNothingThatXmlCannotHold) {
   const PropertyList cases[] = {"\x1B",
                                 "\xFF",
                                 std::string("\0", 1),
-                                dictionaryOf({{"\uFFFE", 1}}),
+                                keys({{"\uFFFE", 1}}),
                                 Array{Date{253402300800}},
                                 Date{-62135596801},
                                 Date{std::numeric_limits<std::int64_t>::min()}};

@@ -15,13 +15,11 @@ namespace {
 using namespace std::string_literals;
 
 TEST(Text, tellsUtf8FromOtherBytes) {
-  for (const char* text : {"", "a", "\x7F", "\u00E9", "\uD7FF", "\uE000", "\uFFFF", "\U00010000", "\U0010FFFF"}) {
+  for (const char* text : {"", "a", "\x7F", "\u00E9", "\uD7FF", "\uE000", "\uFFFF", "\U00010000", "\U0010FFFF"})
     EXPECT_TRUE(isUtf8(text)) << escaped(text);
-  }
   for (const char* text : {"\x80", "\xC1\xBF", "\xC3", "a\xC3(", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xF0\x8F\xBF\xBF",
-                           "\xF4\x90\x80\x80", "\xF5\x80\x80\x80", "\xFF", "\xE2\x82", "\xE2\x28\xA1"}) {
+                           "\xF4\x90\x80\x80", "\xF5\x80\x80\x80", "\xFF", "\xE2\x82", "\xE2\x28\xA1"})
     EXPECT_FALSE(isUtf8(text)) << escaped(text);
-  }
 }
 
 TEST(Text, writesEveryCodePointAsItIsRead) {

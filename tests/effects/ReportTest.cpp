@@ -15,8 +15,7 @@ namespace fs = std::filesystem;
 using ::testing::ElementsAre;
 using ::testing::HasSubstr;
 
-class ReportTest : public ::testing::Test {
- protected:
+struct ReportTest : ::testing::Test {
   /// The lines that a run adds to the report.
   std::vector<std::string> run(const std::vector<std::string>& words) {
     machine.set("Clock", "Time", 1173301503);

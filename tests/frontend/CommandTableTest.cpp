@@ -9,7 +9,6 @@
 #include "frontend/CommandTable.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/Help.h"
-#include "frontend/ServerCommands.h"
 
 namespace tavisk {
 namespace {

@@ -19,28 +19,20 @@ std::string tableOf(const std::string& selector, const std::string& count) {
 }
 
 TEST(Dispatch, takesAsManyArgumentsAsTheTableSays) {
-  struct Case {
-    const char* selector;
-    const char* count;
-    std::vector<std::string> words;
-    const char* output;
-  };
-  const Case cases[] = {
+  const std::string usage = "settime: Error, you must specify a valid time. Command usage: 'settime <hh:mm:ss>'\n";
+  const std::tuple<const char*, const char*, std::vector<std::string>, std::string> cases[] = {
       {"getTime", "0", {"word", "getdate"}, "Time: 21:05:03\nDate: 3/7/2007\n"},
       {"getTime", "1", {"word", "bogus", "getdate"}, "Time: 21:05:03\nDate: 3/7/2007\n"},
       {"setTime:", "2", {"word", "1:2:3", "bogus", "getdate"}, "Set Time: 01:02:03\nDate: 3/7/2007\n"},
       {"setTime:", "2", {"word", "1:2:3"}, "Set Time: 01:02:03\n"},
       {"setTime:", "1", {"word", "-f"}, "Set Time: 00:00:00\n"},
-      {"setTime:",
-       "0",
-       {"word"},
-       "settime: Error, you must specify a valid time. Command usage: 'settime <hh:mm:ss>'\n"},
+      {"setTime:", "0", {"word"}, usage},
   };
-  for (const auto& test : cases) {
-    SCOPED_TRACE(std::string(test.selector) + " " + test.count);
+  for (const auto& [selector, count, words, output] : cases) {
+    SCOPED_TRACE(std::string(selector) + " " + count);
     MachineInUtc machine;
-    const auto table = tableOf(test.selector, test.count);
-    EXPECT_EQ(runTool(machine, test.words, {.commandTable = table}).output, test.output);
+    const auto table = tableOf(selector, count);
+    EXPECT_EQ(runTool(machine, words, {.commandTable = table}).output, output);
   }
 }
 

@@ -10,8 +10,7 @@ namespace tavisk {
 
 /// `Machine` offers: service().
 template <typename Machine>
-class AdminAuthenticatorContract : public testing::Test {
- protected:
+struct AdminAuthenticatorContract : testing::Test {
   Machine machine;
 };
 

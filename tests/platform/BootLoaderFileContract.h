@@ -4,21 +4,16 @@
 
 #include <gtest/gtest.h>
 
+#include "base/Keys.h"
 #include "platform/BootLoaderFile.h"
 
 namespace tavisk {
 
 /// `Machine` offers: service(); put(path, contents) and file(path) of the machine's files.
 template <typename Machine>
-class BootLoaderFileContract : public testing::Test {
- protected:
-  static PropertyList::Dictionary contents() {
-    PropertyList::Dictionary dictionary;
-    dictionary.set("Timeout", 5);
-    dictionary.set(BootLoaderFile::architectureKey, "i386");
-    dictionary.set("Kernel", PropertyList::Data{0, 255});
-    return dictionary;
-  }
+struct BootLoaderFileContract : testing::Test {
+  const Keys contents =
+      keys({{"Timeout", 5}, {BootLoaderFile::architectureKey, "i386"}, {"Kernel", PropertyList::Data{0, 255}}});
   const std::string path = BootLoaderFile::path;
   Machine machine;
 };
@@ -28,8 +23,8 @@ TYPED_TEST_SUITE_P(BootLoaderFileContract);
 TYPED_TEST_P(BootLoaderFileContract, readsBackWhatWasWritten) {
   EXPECT_FALSE(this->machine.service().read());
   for (int times = 0; times < 2; ++times) {
-    EXPECT_TRUE(this->machine.service().write(this->contents()));
-    EXPECT_EQ(this->machine.service().read(), this->contents());
+    EXPECT_TRUE(this->machine.service().write(this->contents));
+    EXPECT_EQ(this->machine.service().read(), this->contents);
   }
 }
 
@@ -37,16 +32,16 @@ TYPED_TEST_P(BootLoaderFileContract, keepsBesideWhatItDoesNotUnderstand) {
   for (const char* damaged : {"<dict><key>", "<string>no dictionary</string>", ""}) {
     this->machine.put(this->path, damaged);
     EXPECT_FALSE(this->machine.service().read());
-    EXPECT_TRUE(this->machine.service().write(this->contents()));
-    EXPECT_EQ(this->machine.service().read(), this->contents());
+    EXPECT_TRUE(this->machine.service().write(this->contents));
+    EXPECT_EQ(this->machine.service().read(), this->contents);
     EXPECT_EQ(this->machine.file(this->path + ".damaged"), damaged);
   }
 }
 
 TYPED_TEST_P(BootLoaderFileContract, saysWhenItWasNotWritten) {
   this->machine.put("/Library/Preferences", "no folder");
-  EXPECT_FALSE(this->machine.service().write(this->contents()));
-  auto unwritable = this->contents();
+  EXPECT_FALSE(this->machine.service().write(this->contents));
+  auto unwritable = this->contents;
   unwritable.set("Name", std::string("\x01"));
   EXPECT_FALSE(this->machine.service().write(unwritable));
 }

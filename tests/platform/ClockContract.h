@@ -3,7 +3,6 @@
 #pragma once
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <chrono>
 #include <ostream>
@@ -23,8 +22,7 @@ inline void PrintTo(const ZoneName& zone, std::ostream* out) {
 /// `Machine` offers: service(); haveZones(zones), those that are installed or known; effects(); and `setsClock`, false
 /// where the clock is that of the machine that runs the tests.
 template <typename Machine>
-class ClockContract : public testing::Test {
- protected:
+struct ClockContract : testing::Test {
   ClockContract() { machine.haveZones(zones); }
 
   const ZoneName cairo{"Africa/Cairo"};

@@ -3,7 +3,6 @@
 #pragma once
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <chrono>
 #include <string>
@@ -79,8 +78,7 @@ class DiskListener {
 /// runLoop(); plug(label), a volume that is not mounted; mount(disk), which answers where; unmount, rename(disk,
 /// label), grow and pull.
 template <typename Machine>
-class DiskEventsContract : public testing::Test {
- protected:
+struct DiskEventsContract : testing::Test {
   template <typename Work>
   void run(const Work& work) {
     const auto why = Machine::run(work);

@@ -16,8 +16,7 @@ namespace tavisk {
 /// all that the firmware keeps; variable(name), of the tool's own; maySet, whether it is allowed here; and log, an
 /// EffectLog of what it tells.
 template <typename Machine>
-class DiskManagementContract : public testing::Test {
- protected:
+struct DiskManagementContract : testing::Test {
   Machine machine;
 };
 

@@ -10,8 +10,7 @@ namespace tavisk {
 
 /// `Machine` offers: configuration() and store(), where a name that is set is live at once.
 template <typename Machine>
-class HostNamesContract : public testing::Test {
- protected:
+struct HostNamesContract : testing::Test {
   Machine machine;
 };
 

@@ -11,8 +11,7 @@ namespace tavisk {
 /// `Machine` offers: service(); haveTree(property, value), a device tree whose root has one property; and
 /// haveInterface(name, path), a network interface that the device at this path carries.
 template <typename Machine>
-class IORegistryContract : public testing::Test {
- protected:
+struct IORegistryContract : testing::Test {
   Machine machine;
 };
 

@@ -3,7 +3,6 @@
 #pragma once
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include "platform/NetworkTimeService.h"
 
@@ -12,8 +11,7 @@ namespace tavisk {
 /// `Machine` offers: service(); launchesAtStartup(), as it is stored; and `takesAnyText`, false where only host names
 /// and addresses are stored.
 template <typename Machine>
-class NetworkTimeContract : public testing::Test {
- protected:
+struct NetworkTimeContract : testing::Test {
   Machine machine;
 };
 

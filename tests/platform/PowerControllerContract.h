@@ -6,6 +6,7 @@
 
 #include <cerrno>
 
+#include "base/Keys.h"
 #include "effects/EffectMatchers.h"
 #include "effects/SettingNames.h"
 #include "platform/PowerController.h"
@@ -20,10 +21,9 @@ inline std::optional<std::int64_t> delayOf(PowerController& controller) {
 
 /// Sets units of delay in a whole conversation; the first status that is not 0.
 inline ControllerStatus setDelay(PowerController& controller, std::uint8_t units) {
-  PropertyList::Dictionary properties;
-  properties.set("ServerID", PropertyList::Data{units});
   const auto [opened, connection] = controller.open(controller.serviceOfClass(controllerClass), 0x0101FACE);
-  const auto status = opened != 0 ? opened : controller.setProperties(connection, properties);
+  const auto status =
+      opened != 0 ? opened : controller.setProperties(connection, keys({{"ServerID", PropertyList::Data{units}}}));
   EXPECT_EQ(controller.close(connection), 0);
   return status;
 }
@@ -31,8 +31,7 @@ inline ControllerStatus setDelay(PowerController& controller, std::uint8_t units
 /// `Machine` offers: service(), of a machine whose controller has no delay; refuseDelays(), after which the controller
 /// refuses to be set; and effects().
 template <typename Machine>
-class PowerControllerContract : public testing::Test {
- protected:
+struct PowerControllerContract : testing::Test {
   Machine machine;
 };
 

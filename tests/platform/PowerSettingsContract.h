@@ -11,8 +11,7 @@ namespace tavisk {
 /// `Machine` offers: service(), of a machine that supports every switch, all off and all timers never; and lack(which),
 /// which takes the support of a switch away.
 template <typename Machine>
-class PowerSettingsContract : public testing::Test {
- protected:
+struct PowerSettingsContract : testing::Test {
   static constexpr SleepTimer timers[] = {SleepTimer::computer, SleepTimer::display, SleepTimer::hardDisk};
   static constexpr PowerSwitch switches[] = {PowerSwitch::wakeOnModem, PowerSwitch::wakeOnNetworkAccess,
                                              PowerSwitch::restartAfterPowerFailure, PowerSwitch::powerButtonSleep};

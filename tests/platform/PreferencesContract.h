@@ -11,8 +11,7 @@ namespace tavisk {
 
 /// `Machine` offers: preferences() and processes(); put(value) stores a value under the key by other means.
 template <typename Machine>
-class PreferencesContract : public testing::Test {
- protected:
+struct PreferencesContract : testing::Test {
   void set(bool value) {
     machine.processes().setMachineBoolean(key, value);
     machine.processes().writeMachinePreferences();

@@ -8,8 +8,7 @@ namespace tavisk {
 
 /// Of remote shell and remote events. `Machine` offers: service(), which is off at first.
 template <typename Machine>
-class RemoteAccessContract : public testing::Test {
- protected:
+struct RemoteAccessContract : testing::Test {
   Machine machine;
 };
 

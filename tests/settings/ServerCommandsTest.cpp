@@ -1,17 +1,15 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include "ToolRun.h"
-#include "base/Calendar.h"
+#include "base/Keys.h"
 
 namespace tavisk {
 namespace {
 
 /// The handlers that no command reaches, called as a coming command would.
-class ReservedCommands : public testing::Test {
- protected:
+struct ReservedCommands : testing::Test {
   ScratchMachine machine;
   Stream stream{std::tmpfile()};
   Output output{stream.get()};
@@ -41,11 +39,7 @@ TEST_F(ReservedCommands, leaveALineInTheSystemLogAtMost) {
 }
 
 TEST_F(ReservedCommands, signalTheWatchdogByItsFile) {
-  struct Case {
-    std::string contents;
-    int signalled;
-  };
-  const Case cases[] = {
+  const std::pair<std::string, int> cases[] = {
       {"", 0},
       {"0\n", 0},
       {"\n77\n", 0},
@@ -58,14 +52,11 @@ TEST_F(ReservedCommands, signalTheWatchdogByItsFile) {
   };
   commands.setWatchdogSignal();
   std::vector<PropertyList> expected;
-  for (const auto& test : cases) {
-    machine.writeFile("/var/run/watchdog.pid", test.contents);
+  for (const auto& [contents, signalled] : cases) {
+    machine.writeFile("/var/run/watchdog.pid", contents);
     commands.setWatchdogSignal();
-    if (test.signalled == 0) continue;
-    PropertyList::Dictionary sent;
-    sent.set("Process", test.signalled);
-    sent.set("Signal", 1);
-    expected.emplace_back(sent);
+    if (signalled == 0) continue;
+    expected.emplace_back(keys({{"Process", signalled}, {"Signal", 1}}));
   }
   EXPECT_EQ(*machine.description().find("Signals")->asArray(), expected);
   const auto told = machine.log.effects.size();
@@ -88,15 +79,6 @@ TEST_F(ReservedCommands, findTheServerOfRemoteLogin) {
   machine.set("Processes", "sshd", 4711);
   machine.set("Processes", "sshd-session", 4712);
   EXPECT_EQ(commands.remoteLoginPID(), 4711);
-}
-
-struct TimeZones : ReservedCommands {};
-
-TEST_F(TimeZones, areThoseOfTheRunAtOnce) {
-  for (const auto& [zone, hour] : {std::pair("Asia/Tokyo", 9), std::pair("UTC", 0)}) {
-    commands.setTimeZone(zone);
-    EXPECT_EQ(localDateTime(0).hour, hour);
-  }
 }
 
 struct MachineWithRemoteLogin : ScratchMachine {

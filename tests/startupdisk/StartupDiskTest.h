@@ -6,22 +6,14 @@
 #include <vector>
 
 #include "ScratchMachine.h"
+#include "base/Keys.h"
 #include "base/NotificationCenter.h"
 #include "startupdisk/SDController.h"
 
 namespace tavisk {
 
-using Keys = PropertyList::Dictionary;
-
-inline PropertyList::Dictionary keys(std::initializer_list<PropertyList::Dictionary::Entry> entries) {
-  Keys keys;
-  for (const auto& [key, value] : entries) keys.set(key, value);
-  return keys;
-}
-
 /// Hears from a searcher.
-class RecordingDelegate final : public SystemSearcherProtocol {
- public:
+struct RecordingDelegate final : SystemSearcherProtocol {
   void searchCompleted() override { ++completions; }
   void searchActivity() override { ++activities; }
   void foundSystemOnVolume(SDDiskRef system) override { found.push_back(std::move(system)); }
@@ -95,7 +87,10 @@ inline SDRecordRef image(const SDImage::Values& values) {
 class NotificationRecorder {
  public:
   explicit NotificationRecorder(NotificationCenter& center) : _center(center) {
-    _center.addObserver(this, "", [this](const Notification& notification) { note(notification); });
+    _center.addObserver(this, "", [this](const Notification& notification) {
+      const auto* record = std::any_cast<SDRecordRef>(&notification.object);
+      _lines.push_back(notification.name + (!record ? "" : " " + (*record)->description()));
+    });
   }
   ~NotificationRecorder() { _center.removeObserver(this); }
   NotificationRecorder(const NotificationRecorder&) = delete;
@@ -104,11 +99,6 @@ class NotificationRecorder {
   std::vector<std::string> take() { return std::exchange(_lines, {}); }
 
  private:
-  void note(const Notification& notification) {
-    const auto* record = std::any_cast<SDRecordRef>(&notification.object);
-    _lines.push_back(notification.name + (!record ? "" : " " + (*record)->description()));
-  }
-
   NotificationCenter& _center;
   std::vector<std::string> _lines;
 };

@@ -10,12 +10,7 @@ namespace {
 using Words = std::vector<std::string>;
 
 TEST(Candidates, completeAWordAsFarAsTheyAgree) {
-  struct Case {
-    const char* typed;
-    Words candidates;
-    const char* completed;
-  };
-  const Case cases[] = {
+  const std::tuple<const char*, Words, const char*> cases[] = {
       {"x", {}, ""},
       {"", {"quit"}, "quit "},
       {"GETDA", {"getdate"}, "getdate "},
@@ -31,12 +26,7 @@ TEST(Candidates, completeAWordAsFarAsTheyAgree) {
 }
 
 TEST(Candidates, standInAsManyColumnsAsFit) {
-  struct Case {
-    Words candidates;
-    std::size_t width;
-    const char* columns;
-  };
-  const Case cases[] = {
+  const std::tuple<Words, std::size_t, const char*> cases[] = {
       {{}, 80, ""},
       {{"a"}, 0, "a\n"},
       {{"a", "b", "c"}, 7, "a  b  c\n"},

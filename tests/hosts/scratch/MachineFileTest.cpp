@@ -12,6 +12,7 @@
 
 #include "OwnMounts.h"
 #include "ScratchMachine.h"
+#include "base/Keys.h"
 #include "base/Text.h"
 #include "effects/EffectMatchers.h"
 #include "hosts/scratch/KeyTable.h"
@@ -23,22 +24,6 @@ namespace {
 using namespace std::chrono_literals;
 using testing::ElementsAre;
 using testing::HasSubstr;
-using testing::IsEmpty;
-
-/// What an absent key reads as, as the services read it.
-std::string readAbsent(const KeyRow& row) {
-  const MachineSection absent(std::string(row.place), nullptr);
-  if (row.type == KeyType::boolean) return absent.boolean(row.key) ? "true" : "false";
-  if (row.type == KeyType::integer) return std::to_string(absent.integer(row.key));
-  return absent.text(row.key);
-}
-
-TEST(KeyTable, hasDefaultsOfTheTypesOfTheirKeys) {
-  for (const auto& row : keyTable()) {
-    if (!row.otherwise) continue;
-    EXPECT_EQ(readAbsent(row), *row.otherwise) << row.place << "/" << row.key;
-  }
-}
 
 TEST(KeyTable, hasEachKeyOnceInAPlaceThatItHasToo) {
   std::set<std::string> known{""};
@@ -50,8 +35,7 @@ TEST(KeyTable, hasEachKeyOnceInAPlaceThatItHasToo) {
   }
 }
 
-class MachineFileTest : public testing::Test {
- protected:
+struct MachineFileTest : testing::Test {
   std::unique_ptr<MachineFile> open() {
     auto file = MachineFile::open(machine.directory(), machine.effects);
     EXPECT_TRUE(file) << file.failure().why;
@@ -69,13 +53,6 @@ class MachineFileTest : public testing::Test {
     work();
     ::_exit(0);
   }
-  void inSmallFileSystem(const std::function<void()>& work) {
-    const bool ran = withOwnMounts([&] {
-      ASSERT_TRUE(mountMemory(machine.directory(), "64k"));
-      work();
-    });
-    if (!ran) GTEST_SKIP() << "may not have mounts of its own";
-  }
   std::vector<std::string> names() { return SystemRoot(machine.directory()).list("/").valueOr({}); }
 
   ScratchMachine machine;
@@ -89,12 +66,6 @@ MachineFile::Edit countTwice(int times = 1) {
       counts.set(key, (count ? *count->asInteger() : 0) + times);
     }
   };
-}
-
-PropertyList under(const std::string& key, PropertyList value) {
-  PropertyList::Dictionary dictionary;
-  dictionary.set(key, std::move(value));
-  return dictionary;
 }
 
 std::string plist(const std::string& inside) {
@@ -115,7 +86,7 @@ TEST_F(MachineFileTest, refusesValuesOfAWrongTypeByFileKeyAndExpectation) {
       {"Registry|Device Tree|/pci/eth|mac", "00", ": expected data"},
       {"Firmware|Boot Preference|Lumara 9", 9, ": expected a boolean"},
       {"Signals", mixed, ": expected an array of dictionaries"},
-      {"Signals", PropertyList::Array{under("Process", 1), under("Process", "sshd")},
+      {"Signals", PropertyList::Array{keys({{"Process", 1}}), keys({{"Process", "sshd"}})},
        " 2 \"Process\": expected an integer"},
       {"Registry|Services|BMC|ServerID", "x", nullptr},
       {"Unknown|Time", "noon", nullptr},
@@ -124,24 +95,22 @@ TEST_F(MachineFileTest, refusesValuesOfAWrongTypeByFileKeyAndExpectation) {
   for (const auto& [place, value, why] : cases) {
     auto list = value;
     std::string where;
-    const auto keys = split(place, "|");
-    for (const auto& key : keys) where += " \"" + key + "\"";
-    for (auto key = keys.rbegin(); key != keys.rend(); ++key) list = under(*key, list);
+    const auto names = split(place, "|");
+    for (const auto& key : names) where += " \"" + key + "\"";
+    for (auto key = names.rbegin(); key != names.rend(); ++key) list = keys({{*key, list}});
     machine.describe(*writePropertyList(list));
     EXPECT_EQ(whyNotOpened(), why ? path() + ":" + where + why : "opened");
   }
 }
 
-TEST_F(MachineFileTest, refusesWhatIsNoPropertyListOfADictionary) {
+TEST_F(MachineFileTest, refusesALinkThatLeadsNowhereAndWhatIsNoPropertyListOfADictionary) {
+  std::filesystem::create_symlink("../elsewhere", path());
+  EXPECT_EQ(whyNotOpened(), path() + ": No such file or directory");
+  std::filesystem::remove(path());
   for (const auto& text : {std::string(), std::string("<plist><dict>"), plist("<string>machine</string>")}) {
     machine.describe(text);
     EXPECT_THAT(whyNotOpened(), HasSubstr("/machine.plist: "));
   }
-}
-
-TEST_F(MachineFileTest, refusesALinkThatLeadsNowhere) {
-  std::filesystem::create_symlink("../elsewhere", path());
-  EXPECT_EQ(whyNotOpened(), path() + ": No such file or directory");
 }
 
 TEST_F(MachineFileTest, refusesWhatIsNoFolder) {
@@ -184,7 +153,7 @@ TEST_F(MachineFileTest, mayBeALinkInsideItsFolder) {
   EXPECT_THAT(names(), ElementsAre("machine.lock", "machine.plist", "real"));
 }
 
-TEST_F(MachineFileTest, standsAtTheLastGoodContentsAndSaysSoOnce) {
+TEST_F(MachineFileTest, standsAtTheLastGoodContentsSaysSoOnceAndIsNotReplaced) {
   machine.set("Clock", "Offset", 1);
   const auto file = open();
   machine.describe("<plist><dict>");
@@ -192,47 +161,27 @@ TEST_F(MachineFileTest, standsAtTheLastGoodContentsAndSaysSoOnce) {
   ASSERT_EQ(machine.log.effects.size(), 1U);
   EXPECT_EQ(machine.log.effects[0].failure->on, path());
   EXPECT_EQ(machine.log.effects[0].note, "the contents last read stand");
+  EXPECT_EQ(file->change(countTwice()).failure().on, path());
+  EXPECT_EQ(contentsOf(path()), "<plist><dict>");
   machine.describe(plist("<dict/>"));
   EXPECT_EQ(file->section("Clock").integer("Offset"), 0);
 }
 
-TEST_F(MachineFileTest, isNotReplacedWhileItCannotBeRead) {
+TEST_F(MachineFileTest, tellsAnObserverWhatChangedSinceItWasReadAndNothingOfOtherFilesNorAfterItsEnd) {
   const auto file = open();
-  machine.describe("<plist><dict>");
-  EXPECT_EQ(file->change(countTwice()).failure().on, path());
-  EXPECT_EQ(contentsOf(path()), "<plist><dict>");
-}
-
-/// What an observer is told: how many sections there were before and after each change.
-class ObservedMachineTest : public MachineFileTest {
- protected:
-  void observe() {
-    observation = file->observeChanges(machine.runLoop, told, [this](const auto& before, const auto& now) {
-      changes.emplace_back(before->size(), now->size());
-    });
-  }
-
-  std::unique_ptr<MachineFile> file = open();
-  MachineFile::Contents told = file->contents();
-  RunLoop::Registration observation;
-  std::vector<std::pair<std::size_t, std::size_t>> changes;
-};
-
-TEST_F(ObservedMachineTest, tellsWhatChangedBeforeTheObservationBegan) {
+  const auto told = file->contents();
   machine.set("Clock", "Time", 1);
-  observe();
+  std::vector<std::pair<std::size_t, std::size_t>> changes;
+  auto observation = file->observeChanges(machine.runLoop, told, [&](const auto& before, const auto& now) {
+    changes.emplace_back(before->size(), now->size());
+  });
   EXPECT_TRUE(machine.runLoop.runUntil(RunLoop::Clock::now() + 5s, [&] { return !changes.empty(); }));
-  EXPECT_THAT(changes, ElementsAre(std::pair(0, 1)));
-}
-
-TEST_F(ObservedMachineTest, tellsNothingOfOtherFilesNorAfterItsEnd) {
-  observe();
   machine.host().systemLog().write("no change of the machine");
   machine.runLoop.runPass();
   observation.cancel();
-  machine.set("Clock", "Time", 1);
+  machine.set("Network Time", "Running", true);
   machine.runLoop.runPass();
-  EXPECT_THAT(changes, IsEmpty());
+  EXPECT_THAT(changes, ElementsAre(std::pair(0, 1)));
 }
 
 TEST_F(MachineFileTest, losesNothingBetweenTwoProcesses) {
@@ -279,22 +228,14 @@ TEST_F(MachineFileTest, isNotWaitedForLongOnOtherThreads) {
   }).join();
 }
 
-TEST_F(MachineFileTest, saysWhenItMayNotBeWritten) {
-  inSmallFileSystem([&] {
-    machine.host();
-    ASSERT_EQ(::mount("", machine.directory().c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);
-    machine.host().networkTime().start();
-    EXPECT_EQ(machine.log.effects.back().failure->code, std::errc::read_only_file_system);
-    EXPECT_FALSE(machine.host().networkTime().isRunning());
-  });
-}
-
 TEST_F(MachineFileTest, leavesNoHalfLineInTheSystemLog) {
-  inSmallFileSystem([&] {
+  const bool ran = withOwnMounts([&] {
+    ASSERT_TRUE(mountMemory(machine.directory(), "64k"));
     for (const auto& message : {std::string("first"), std::string(70'000, 'x'), std::string("last")})
       machine.host().systemLog().write(message);
     EXPECT_THAT(machine.systemLog(), ElementsAre("first", "last"));
   });
+  if (!ran) GTEST_SKIP() << "may not have mounts of its own";
 }
 
 TEST_F(MachineFileTest, isNoEmptyMachineWhenItCannotBeLookedAt) {

@@ -6,6 +6,7 @@
 
 #include "ScratchMachine.h"
 #include "base/FileDescriptor.h"
+#include "base/Keys.h"
 #include "platform/AdminAuthenticatorContract.h"
 #include "platform/BootLoaderFileContract.h"
 #include "platform/ClockContract.h"
@@ -88,12 +89,6 @@ class ScratchDiskEvents {
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, DiskEventsContract, ScratchDiskEvents);
 
-PropertyList::Dictionary keys(std::initializer_list<PropertyList::Dictionary::Entry> entries) {
-  PropertyList::Dictionary keys;
-  for (const auto& [key, value] : entries) keys.set(key, value);
-  return keys;
-}
-
 struct ScratchDiskMachine : ScratchService<&Host::diskManagement> {
   static constexpr bool maySet = true;
   ScratchDiskMachine() {
@@ -155,13 +150,13 @@ struct ScratchPreferences {
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PreferencesContract, ScratchPreferences);
 
 struct ScratchPower : ScratchService<&Host::powerSettings> {
-  static constexpr const char* keys[] = {"Wake On Ring", "Wake On LAN", "Auto Restart", "Power Button Sleep"};
+  static constexpr const char* switches[] = {"Wake On Ring", "Wake On LAN", "Auto Restart", "Power Button Sleep"};
   ScratchPower() {
-    for (const char* key : keys) source.set(key, false);
+    for (const char* key : switches) source.set(key, false);
     machine.set("Power Sources", "AC Power", source);
   }
   void lack(PowerSwitch which) {
-    source.remove(keys[static_cast<int>(which)]);
+    source.remove(switches[static_cast<int>(which)]);
     machine.set("Power Sources", "AC Power", source);
   }
   PropertyList::Dictionary source;

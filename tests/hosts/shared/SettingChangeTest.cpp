@@ -1,9 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
-
-#include <cerrno>
 
 #include "effects/EffectLog.h"
 #include "hosts/shared/SettingChange.h"
@@ -15,8 +12,7 @@ using ::testing::ElementsAre;
 using ::testing::IsEmpty;
 
 /// A setting in memory. Each step can be made to fail, or to lie.
-class SettingChangeTest : public ::testing::Test {
- protected:
+struct SettingChangeTest : ::testing::Test {
   SettingChangeTest() {
     sink.addChannel(log);
     setting.name = "Sleep";
@@ -129,28 +125,20 @@ TEST_F(SettingChangeTest, writesNothingThatTheMachineCannotHave) {
 TEST_F(SettingChangeTest, tellsTheFirstFailureAndWhatIsThereNow) {
   const auto full = [](const char* step) { return Failure{step, "disk", "No space left on device"}; };
   const auto wrong = [](const char* where) { return Failure{"read back", where, "reads 5"}; };
-  struct Case {
-    const char* broken;
-    const char* ignored;
-    bool changed;
-    Text live, stored;
-    Failure failure;
-    std::vector<std::string> steps;
-  };
-  const Case cases[] = {
+  const std::tuple<const char*, const char*, bool, Text, Text, Failure, std::vector<std::string>> cases[] = {
       {"store", "", false, "5", "5", full("store"), {"store"}},
       {"apply", "", true, "5", "9", full("apply"), {"store", "apply"}},
       {"", "apply", true, "5", "9", wrong("Sleep"), {"store", "apply"}},
       {"", "store", true, "9", "5", wrong("/etc/sleep.conf"), {"store", "apply"}},
       {"stored", "", true, "9", {}, {"stored", "disk", "Input/output error"}, {"store", "apply"}},
   };
-  for (const auto& now : cases) {
+  for (const auto& [breaks, lies, changed, nowLive, nowStored, failure, made] : cases) {
     live = stored = "5";
     steps.clear();
-    broken = now.broken;
-    ignored = now.ignored;
-    EXPECT_EQ(change("9"), effectOf(Outcome::failed, now.changed, "5", now.live, now.stored, now.failure));
-    EXPECT_EQ(steps, now.steps);
+    broken = breaks;
+    ignored = lies;
+    EXPECT_EQ(change("9"), effectOf(Outcome::failed, changed, "5", nowLive, nowStored, failure));
+    EXPECT_EQ(steps, made);
   }
 }
 

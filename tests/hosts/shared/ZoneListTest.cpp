@@ -9,8 +9,7 @@ namespace tavisk {
 namespace {
 
 /// A machine with some compiled zones.
-class ZoneListTest : public testing::Test {
- protected:
+struct ZoneListTest : testing::Test {
   ZoneListTest() {
     for (const char* name : {"Africa/Algiers", "Africa/Cairo", "Africa/Tunis", "America/Argentina/Salta", "UTC"})
       write(name, "TZif2...");
