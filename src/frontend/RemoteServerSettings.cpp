@@ -5,6 +5,7 @@
 #include <cerrno>
 #include <exception>
 #include <system_error>
+#include <thread>
 
 #include "base/Process.h"
 
@@ -114,12 +115,15 @@ int RemoteServerSettings::statusSoFar() const {
 void RemoteServerSettings::endedBySignal(const std::string& signal) {
   _ended = true;
   _context.input.restoreTerminal();
+  // Beside the rest: a slow service must not keep what was printed, nor a full pipe the authorization.
+  std::jthread givingUp;
+  doStep([&] { givingUp = std::jthread([this] { doStep([this] { giveUpAuthorization(); }); }); });
   doStep([&] { _effects.interrupt("the run was ended by " + signal); });
   doStep([&] {
     if (_report) _report->runEndedBySignal(signal, hasFailed(), _context.output.takePrinted());
   });
   _context.output.finish();
-  doStep([this] { giveUpAuthorization(); });
+  if (!givingUp.joinable()) doStep([this] { giveUpAuthorization(); });
 }
 
 }  // namespace tavisk

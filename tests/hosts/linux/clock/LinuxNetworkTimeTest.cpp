@@ -75,7 +75,7 @@ TEST_F(ChronyTest, IsNotTurnedOnUntilTheNextStartOnlyByWhoIsNotRoot) {
   tree.write("/run/tavisk/lock", "");
   const AsMember member(tree);
   client.start();
-  EXPECT_THAT(tree.lastEffect(), FailedFor("start on chrony.service: needs root: sudo tavisk"));
+  EXPECT_THAT(tree.lastEffect(), FailedFor("enable on chrony.service: needs root: sudo tavisk"));
 }
 
 struct ServerFiles {
