@@ -15,7 +15,7 @@ namespace tavisk {
 class JsonObject {
  public:
   /// Written into the room of the text, which is dropped: no memory is asked for as long as that suffices.
-  explicit JsonObject(std::string room = {}) : _members(std::move(room)) { _members = '{'; }
+  explicit JsonObject(std::string room = {}) : _members(std::move(room)) { _members.assign(1, '{'); }
   JsonObject& text(std::string_view name, std::string_view value);
   JsonObject& integer(std::string_view name, std::int64_t value);
   JsonObject& boolean(std::string_view name, bool value);

@@ -48,7 +48,7 @@ Result<bool> namesHostKeys(const SystemRoot& root) {
 
 /// Whether the server is another than the one whose keys can be made, or has keys.
 Result<bool> needsNoHostKey(const SystemRoot& root) {
-  const auto isOpenSsh = root.isThere(sshProgram);
+  auto isOpenSsh = root.isThere(sshProgram);
   if (!isOpenSsh) return isOpenSsh;
   if (!*isOpenSsh) return true;
   auto has = hasHostKey(root);

@@ -78,7 +78,7 @@ Result<Authorization> check(Bus& bus, const char* action, bool asks) {
 }  // namespace
 
 Result<Authorization> checkAuthorization(Bus& bus, const char* action, const Asker& asker) {
-  const auto answer = check(bus, action, false);
+  auto answer = check(bus, action, false);
   if (!answer || answer->isGranted || !answer->isForTheAsking || !asker) return answer;
   if (const auto ready = asker(); !ready) return ready.failure();
   return check(bus, action, true);

@@ -143,7 +143,7 @@ Result<std::string> LinuxNetworkTimeService::serverInUse(const char* busService)
 
 NetworkTimeServer LinuxNetworkTimeService::server() {
   auto setting = serverSetting();
-  const auto inUse = serverInUseWithoutAny();
+  auto inUse = serverInUseWithoutAny();
   if (!inUse || !inUse->empty()) setting.live = [&inUse] { return inUse; };
   return {observe(setting, _machine.effects).value_or("")};
 }

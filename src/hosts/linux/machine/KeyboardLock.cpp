@@ -61,7 +61,7 @@ Result<bool> isOfController(const SystemRoot& root, const std::string& device) {
 }
 
 Result<bool> isKeyboard(const SystemRoot& root, const std::string& device) {
-  const auto letters = hasLetters(root, device);
+  auto letters = hasLetters(root, device);
   if (!letters || !*letters) return letters;
   const auto isPretended = isOfController(root, device);
   if (!isPretended) return isPretended.failure();

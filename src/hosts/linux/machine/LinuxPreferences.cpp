@@ -70,7 +70,7 @@ std::optional<PropertyList> LinuxUserDefaults::value(const std::string& key) con
 }
 
 std::vector<std::string> LinuxUserDefaults::strings(const std::string& key) {
-  const auto found = PropertyListDefaults::strings(key);
+  auto found = PropertyListDefaults::strings(key);
   if (!found.empty() || key != languages) return found;
   const auto language = machineLanguage();
   if (!language) _looks.tellDoubt(language.failure());
@@ -83,7 +83,7 @@ Result<std::string> LinuxUserDefaults::machineLanguage() const {
     const auto assigned = assignedValue(_root, place, "LANG");
     if (!assigned) return assigned.failure();
     const auto locale = assigned->value_or("");
-    const auto language = locale.substr(0, locale.find_first_of(".@"));
+    auto language = locale.substr(0, locale.find_first_of(".@"));
     if (!language.empty() && language != "C" && language != "POSIX") return language;
   }
   return "";

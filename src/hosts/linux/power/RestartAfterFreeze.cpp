@@ -136,7 +136,7 @@ Result<void> RestartAfterFreeze::setWatchdogTime(std::chrono::microseconds time)
 }
 
 Result<void> RestartAfterFreeze::apply(bool restarts) const {
-  const auto panic = writeKernelFile(_machine.root, panicFile, panicSecondsFor(restarts));
+  auto panic = writeKernelFile(_machine.root, panicFile, panicSecondsFor(restarts));
   if (!_machine.services.hasServiceManager()) return panic;
   const auto watchdog = restarts ? setWatchdogTime(watchdogTime) : turnWatchdogOff();
   return panic ? watchdog : panic;

@@ -56,7 +56,7 @@ Result<void> ask(const char* tried, const std::string& card, ethtool_wolinfo& mo
 
 /// Of a card on a USB or platform bus it is often the device above that wakes; of a PCI card it is the card.
 Result<bool> isKnownToWake(const SysDevice& device) {
-  const auto canWake = device.canWake();
+  auto canWake = device.canWake();
   if (!canWake || *canWake) return canWake;
   const auto subsystem = device.subsystem();
   if (!subsystem) return subsystem.failure();
