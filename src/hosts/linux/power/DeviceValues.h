@@ -19,7 +19,7 @@ namespace tavisk {
 /// Whether all of this is so, asked in order; what is not so, or cannot be looked at, ends it.
 inline Result<bool> allHold(std::initializer_list<std::function<Result<bool>()>> questions) {
   for (const auto& question : questions)
-    if (const auto answer = question(); !answer || !*answer) return answer;
+    if (auto answer = question(); !answer || !*answer) return answer;
   return true;
 }
 
