@@ -3,6 +3,8 @@
 #include <gmock/gmock.h>
 #include <systemd/sd-bus.h>
 
+#include <mutex>
+
 #include "hosts/linux/BusPeer.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/access/Polkit.h"
@@ -22,15 +24,23 @@ struct PolkitTree : LinuxTree {
     std::uint32_t mayAsk = 0;
     sd_bus_message_skip(call, "(sa{sv})sa{ss}");
     sd_bus_message_read_basic(call, 'u', &mayAsk);
-    calls.push_back(mayAsk);
+    {
+      const std::scoped_lock lock(mutex);
+      calls.push_back(mayAsk);
+    }
     if (answer == Answer::silence) return 1;
     const int grants = answer == Answer::granted || mayAsk != 0 ? 1 : 0;
     return sd_bus_reply_method_return(call, "(bba{ss})", grants, 1 - grants, 1, "polkit.temporary_authorization_id",
                                       grants != 0 ? "tmp7" : "");
   }
   Bus& bus() { return **services.systemBus(); }
+  std::vector<std::uint32_t> callsSoFar() {
+    const std::scoped_lock lock(mutex);
+    return calls;
+  }
 
   Answer answer = Answer::granted;
+  std::mutex mutex;  ///< guards the calls
   std::vector<std::uint32_t> calls;
   BusPeer peer{(write("/run/systemd/system/x", ""), at("/run/dbus/system_bus_socket")),
                {},
@@ -52,7 +62,7 @@ TEST(Polkit, AsksTheUserOnlyThroughAnAgent) {
     auto& bus = tree.bus();
     const auto limit = tree.runLoop.limitWaits(200ms);
     const auto found = checkAuthorization(bus, "org.tavisk.manage", asker);
-    EXPECT_EQ(tree.calls, calls) << outcome;
+    EXPECT_EQ(tree.callsSoFar(), calls) << outcome;
     EXPECT_THAT(found ? found->temporaryId : found.failure().why, HasSubstr(outcome));
     EXPECT_EQ(found && found->isGranted, outcome == std::string("tmp7"));
   }
