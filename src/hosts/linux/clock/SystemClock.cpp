@@ -15,6 +15,7 @@
 
 #include "base/Calendar.h"
 #include "base/Text.h"
+#include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
 namespace {
@@ -40,14 +41,6 @@ Result<bool> keepsLocalTime(const SystemRoot& root) {
   if (!text) return text.failure();
   const auto lines = split(*text, "\n");
   return lines.size() > 2 && lines[2] == "LOCAL";
-}
-
-/// A device that is not there, or goes away at the moment, is none.
-template <typename Value>
-Result<std::optional<Value>> ifDevice(Result<Value> found) {
-  const bool isGone = !found && (found.failure().code == std::errc::no_such_device ||
-                                 found.failure().code == std::errc::no_such_device_or_address);
-  return isGone ? Result<std::optional<Value>>(std::optional<Value>()) : orAbsent(std::move(found));
 }
 
 DateTime utcDateTime(std::int64_t secondsSince1970) {
@@ -99,7 +92,7 @@ Result<void> setSystemTime(std::int64_t secondsSince1970) {
 
 Result<std::optional<std::int64_t>> hardwareTime(const SystemRoot& root) {
   constexpr std::size_t limit = 64;
-  const auto text = ifDevice(root.read("/sys/class/rtc/rtc0/since_epoch", limit));
+  const auto text = orGone(root.read("/sys/class/rtc/rtc0/since_epoch", limit));
   if (!text) return text.failure();
   if (!*text) return std::optional<std::int64_t>();
   const auto seconds = leadingInteger(**text);
@@ -139,7 +132,7 @@ std::int64_t AskedTime::told(std::chrono::microseconds shown, std::chrono::secon
 }
 
 Result<std::optional<HardwareClock>> HardwareClock::open(const SystemRoot& root) {
-  auto device = ifDevice(root.open(hardwareClock, O_RDONLY | O_NONBLOCK));
+  auto device = orGone(root.open(hardwareClock, O_RDONLY | O_NONBLOCK));
   if (!device) return device.failure();
   if (!*device) return std::optional<HardwareClock>();
   const auto isLocal = keepsLocalTime(root);

@@ -4,14 +4,15 @@
 
 #include <algorithm>
 #include <array>
+#include <functional>
 #include <span>
 #include <string_view>
 #include <utility>
 
 #include "base/Path.h"
 #include "base/Text.h"
-#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/system/ConfigurationLines.h"
+#include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
 namespace {
@@ -259,61 +260,57 @@ bool DeviceLook::isInternal(const DiskName& disk) {
   return transport != transport::usb;
 }
 
+/// One question, and what came in its way.
+template <typename Question, typename... Asked>
+auto answer(const SystemRoot& root, Question question, const Asked&... asked) {
+  DeviceLook look(root);
+  return look.told(std::invoke(question, look, asked...));
+}
+
 }  // namespace
 
 Result<std::vector<DiskName>> BlockDevices::list() const {
-  DeviceLook look(_root);
-  return look.told(look.list());
+  return answer(_root, &DeviceLook::list);
 }
 
 Result<std::optional<BlockDevice>> BlockDevices::find(const DiskName& name) const {
-  DeviceLook look(_root);
-  return look.told(look.find(name));
+  return answer(_root, &DeviceLook::find, name);
 }
 
 Result<std::optional<BlockDevice>> BlockDevices::withNumber(DeviceNumber number) const {
-  DeviceLook look(_root);
-  return look.told(look.withNumber(number));
+  return answer(_root, &DeviceLook::withNumber, number);
 }
 
 Result<std::optional<BlockDevice>> BlockDevices::withNode(const std::string& node) const {
-  DeviceLook look(_root);
-  return look.told(look.withNode(node));
+  return answer(_root, &DeviceLook::withNode, node);
 }
 
 Result<DiskName> BlockDevices::wholeDisk(const DiskName& name) const {
-  DeviceLook look(_root);
-  return look.told(look.wholeDisk(name));
+  return answer(_root, &DeviceLook::wholeDisk, name);
 }
 
 Result<unsigned> BlockDevices::logicalBlockSize(const DiskName& disk) const {
-  DeviceLook look(_root);
-  return look.told(look.logicalBlockSize(disk));
+  return answer(_root, &DeviceLook::logicalBlockSize, disk);
 }
 
 Result<bool> BlockDevices::answersReads(const BlockDevice& device) const {
-  DeviceLook look(_root);
-  return look.told(look.answersReads(device));
+  return answer(_root, &DeviceLook::answersReads, device);
 }
 
 Result<bool> BlockDevices::isRemovable(const DiskName& disk) const {
-  DeviceLook look(_root);
-  return look.told(look.isRemovable(disk));
+  return answer(_root, &DeviceLook::isRemovable, disk);
 }
 
 Result<bool> BlockDevices::isOptical(const DiskName& disk) const {
-  DeviceLook look(_root);
-  return look.told(look.isOptical(disk));
+  return answer(_root, &DeviceLook::isOptical, disk);
 }
 
 Result<std::string> BlockDevices::transportOf(const DiskName& disk) const {
-  DeviceLook look(_root);
-  return look.told(look.transportOf(disk));
+  return answer(_root, &DeviceLook::transportOf, disk);
 }
 
 Result<bool> BlockDevices::isInternal(const DiskName& disk) const {
-  DeviceLook look(_root);
-  return look.told(look.isInternal(disk));
+  return answer(_root, &DeviceLook::isInternal, disk);
 }
 
 }  // namespace tavisk

@@ -7,7 +7,6 @@
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
-#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/shared/SettingChange.h"

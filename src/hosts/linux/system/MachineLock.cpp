@@ -41,8 +41,10 @@ Result<FileDescriptor> MachineLock::hold() const {
     error = ::flock(file->number(), LOCK_EX | LOCK_NB) == 0 ? 0 : errno;
     return error != EWOULDBLOCK && error != EINTR;
   };
-  const auto retry = _runLoop.every(betweenTries, [] {});
-  if (!isTaken() && !_runLoop.runUntil(RunLoop::Clock::now() + longestWait, isTaken)) return whoHolds(*file);
+  if (!isTaken()) {
+    const auto retry = _runLoop.every(betweenTries, [] {});
+    if (!_runLoop.runUntil(RunLoop::Clock::now() + longestWait, isTaken)) return whoHolds(*file);
+  }
   if (error != 0) return systemFailure("lock", ownfile::machineLock, error);
   writeOwnId(*file);
   return file;
