@@ -15,6 +15,12 @@ void addIfAny(JsonObject& object, std::string_view name, const std::string& valu
   if (!value.empty()) object.text(name, value);
 }
 
+void addFailure(JsonObject& object, const Failure& failure) {
+  addIfAny(object, "tried", failure.tried);
+  addIfAny(object, "on", failure.on);
+  addIfAny(object, "why", failure.why);
+}
+
 }  // namespace
 
 const char* nameOf(Outcome outcome) {
@@ -41,11 +47,7 @@ std::string toJson(const Effect& effect) {
   addIfAny(object, "where", effect.where);
   addIfAny(object, "undoneBy", effect.undoneBy);
   addIfAny(object, "note", effect.note);
-  if (effect.failure) {
-    addIfAny(object, "tried", effect.failure->tried);
-    addIfAny(object, "on", effect.failure->on);
-    addIfAny(object, "why", effect.failure->why);
-  }
+  if (effect.failure) addFailure(object, *effect.failure);
   return object.str();
 }
 
@@ -55,6 +57,10 @@ std::string toJson(const SettingValue& value) {
   addIfKnown(object, "live", value.live);
   addIfKnown(object, "stored", value.stored);
   addIfAny(object, "unit", value.unit);
+  if (value.unsupported) {
+    object.boolean("supported", false);
+    addFailure(object, *value.unsupported);
+  }
   return object.str();
 }
 

@@ -23,7 +23,7 @@ struct Effect {
   std::optional<std::string> asked = {};   ///< the value asked for; absent for a read
   std::optional<std::string> live = {};    ///< the live value, read back
   std::optional<std::string> stored = {};  ///< the stored value, read back
-  std::string where = {};                  ///< where it is stored, so that it survives a restart
+  std::string where = {};                  ///< the places that were written, in which it survives a restart
   std::string undoneBy = {};               ///< what else on this machine may undo it; empty: nothing known
   std::string note = {};                   ///< what an administrator should know besides
   std::optional<Failure> failure = {};     ///< set when failed or not supported
@@ -37,9 +37,10 @@ struct Effect {
 /// A setting as a getter found it.
 struct SettingValue {
   std::string setting = {};
-  std::optional<std::string> live = {};
-  std::optional<std::string> stored = {};
-  std::string unit = {};  ///< "minutes", "seconds since 1970"; empty for words and names
+  std::optional<std::string> live = {};     ///< what is in force
+  std::optional<std::string> stored = {};   ///< what will be after a restart
+  std::string unit = {};                    ///< "minutes", "seconds since 1970"; empty for words and names
+  std::optional<Failure> unsupported = {};  ///< why this machine cannot have the setting; absent: it can
 
   bool operator==(const SettingValue&) const = default;
 };

@@ -54,6 +54,11 @@ void EffectSink::observe(const SettingValue& value) {
   tellAll([&](EffectChannel& channel) { channel.observe(value); });
 }
 
+bool EffectSink::wantsValues() {
+  const std::scoped_lock lock(_mutex);
+  return std::ranges::any_of(_channels, &EffectChannel::wantsValues);
+}
+
 void EffectSink::interrupt(const std::string& why) {
   const auto lock = lockSoon(_mutex);
   if (!lock) return;

@@ -21,6 +21,8 @@ class EffectChannel {
   /// Follows record() of whatever has that name, unless that has thrown. Must not throw.
   virtual void changeEnds(const std::string& setting);
   virtual void observe(const SettingValue& value);
+  /// Whether it keeps what observe() tells: looks that only serve that are left out otherwise.
+  virtual bool wantsValues() const { return false; }
 };
 
 /// What is told of a change that has begun, and of whose end nothing is known.
@@ -43,6 +45,7 @@ class EffectSink {
   void recordUnsupported(const std::string& setting, const Failure& reason);
   /// A value that a getter read.
   void observe(const SettingValue& value);
+  bool wantsValues();
 
   /// Records every change that has begun and not ended as failed for this reason. Safe from any thread.
   void interrupt(const std::string& why);

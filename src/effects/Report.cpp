@@ -64,6 +64,11 @@ void Report::commandBegins(const std::string& command, std::span<const std::stri
   if (!arguments.empty()) _entry.argument = arguments.front();
 }
 
+void Report::argumentRefused(const std::string& expected) {
+  const std::scoped_lock lock(_mutex);
+  _entry.refused = expected;
+}
+
 void Report::commandEnds(bool failed, const std::string& output) {
   auto entry = takeEntry();
   if (entry.command) append(std::move(entry), failed, output);
@@ -72,6 +77,7 @@ void Report::commandEnds(bool failed, const std::string& output) {
 void Report::wordRefused(const std::string& word, bool failed, const std::string& output) {
   auto entry = takeEntry();
   entry.command = word;
+  entry.refused = "a command that -printcommands lists";
   entry.error = "not a valid command";
   append(std::move(entry), failed, output);
 }
@@ -132,6 +138,7 @@ std::string Report::toJson(std::string room, const Entry& entry, bool failed, co
   textIfPresent("command", entry.command);
   textIfPresent("argument", entry.argument);
   textIfPresent("handler", entry.handler);
+  textIfPresent("refused", entry.refused);
   textIfPresent("error", entry.error);
   textIfPresent("signal", entry.signal);
   object.boolean("failed", failed);

@@ -27,11 +27,13 @@ namespace tavisk {
 ///   command *  the word as it was typed
 ///   argument * the argument as it was typed, when the command takes one
 ///   handler *  the selector
+///   refused *  what was expected in place of the word or the argument, which was not taken: nothing was done
 ///   error *    why the word or the whole run was refused, or broken off ("out of memory")
 ///   signal *   the signal that ended the run ("SIGTERM"); command, argument and handler are those it interrupted
 ///   failed     the error flag afterwards; true when the run was refused
 ///   changed    whether the machine differs from before, or may differ
-///   values     array of what was read: setting, live, stored, unit
+///   values     array of what was read: setting, live, stored, unit; one that the machine cannot have says supported:
+///              false, and why
 ///   effects    array of what was changed, or could not be changed or read; see Effect. A failure between two commands
 ///              is told with the next one
 ///   output     the printed text, at most its first MiB
@@ -45,6 +47,8 @@ class Report final : public EffectChannel {
 
   /// From here to the end, effects and values belong to this command.
   void commandBegins(const std::string& command, std::span<const std::string> arguments, const std::string& handler);
+  /// That the command took no argument but what is `expected`; from the thread that runs it.
+  void argumentRefused(const std::string& expected);
   /// Does nothing when no command has begun.
   void commandEnds(bool failed, const std::string& output);
   void wordRefused(const std::string& word, bool failed, const std::string& output);
@@ -60,11 +64,12 @@ class Report final : public EffectChannel {
   void record(const Effect& effect) override;
   void changeEnds(const std::string& setting) override;
   void observe(const SettingValue& value) override;
+  bool wantsValues() const override { return true; }
 
  private:
   /// What is gathered for the next object. A text that is absent is left out.
   struct Entry {
-    std::optional<std::string> command, argument, handler, error, signal;
+    std::optional<std::string> command, argument, handler, refused, error, signal;
     bool changed = false;
     std::vector<std::string> values;      ///< JSON
     std::vector<std::string> effects;     ///< JSON

@@ -14,6 +14,7 @@ namespace tavisk {
 RemoteServerSettings::RemoteServerSettings(const CommandContext& context, EffectSink& effects, Report* report,
                                            std::string_view commandTable)
     : _context(context), _effects(effects), _report(report), _commandTable(commandTable) {
+  _context.report = report;
   if (_report) _context.output.keepPrinted();
 }
 

@@ -4,6 +4,7 @@
 
 #include <utility>
 
+#include "effects/Report.h"
 #include "frontend/RemotePrefsExtra.h"
 
 namespace tavisk {
@@ -13,10 +14,15 @@ ServerCommands::ServerCommands(std::shared_ptr<const CommandTable> commandDict, 
 
 ServerCommands::~ServerCommands() = default;
 
+void ServerCommands::refuse(const std::string& expected) {
+  if (_context.report) _context.report->argumentRefused(expected);
+}
+
 bool ServerCommands::checkForEmptyString(const std::string& value, const char* command, const char* withInfo,
                                          const char* andUseage) {
   if (!value.empty()) return false;
   _context.output.print("%s: Error, you must specify %s. Command usage: '%s'\n", command, withInfo, andUseage);
+  refuse(withInfo);
   setError(true);
   return true;
 }
@@ -25,6 +31,7 @@ std::optional<bool> ServerCommands::readOnOff(const std::string& value, const ch
   if (caseInsensitiveEqualTo(value, "On")) return true;
   if (caseInsensitiveEqualTo(value, "Off")) return false;
   _context.output.print("%s: Error, %s is not recognized, Use 'On' or 'Off'\n", command, value.c_str());
+  refuse("'On' or 'Off'");
   setError(true);
   return std::nullopt;
 }

@@ -18,6 +18,7 @@
 namespace tavisk {
 
 class RemoteServerSettings;
+class Report;
 class SpecialPMUSettings;
 class SDController;
 class StartupDisk;
@@ -30,6 +31,7 @@ struct CommandContext {
   Output& output;
   LineSource& input;
   RunLoop::Clock::duration longestCommand = std::chrono::seconds(15);  ///< with all its waits, questions excepted
+  Report* report = nullptr;                                            ///< absent: none is kept
 };
 
 /// Every command is a member function of this one object, reached by the name that the command table gives.
@@ -50,6 +52,8 @@ class ServerCommands final {
 
   /// The frame of the handlers
   const CommandContext& context() const { return _context; }
+  /// Tells the report that the argument is not taken, and what is expected in its place.
+  void refuse(const std::string& expected);
   /// True when the value is empty: then the usage was printed and the error flag set.
   bool checkForEmptyString(const std::string& value, const char* command, const char* withInfo, const char* andUseage);
   /// Whether the value is "On" or "Off"; absent when it is neither: then the error was printed and the error flag set.

@@ -49,6 +49,7 @@ void ServerCommands::setKernelBootArchitecture(const std::string& architecture) 
     chooseDefaultArchitecture(_context);
   } else {
     _context.output.putLine("Invalid argument. Valid arguments are i386, x86_64, or default.");
+    refuse("i386, x86_64 or default");
   }
 }
 

@@ -50,6 +50,7 @@ bool refuseWhileNetworkTimeRuns(ServerCommands& commands, const char* error) {
   if (!commands.context().host.networkTime().isRunning()) return false;
   commands.context().output.print("%s", error);
   commands.context().output.putLine("Use '-setusingnetworktime' to turn network time off.");
+  commands.refuse("a clock that network time does not set");
   commands.setError(true);
   return true;
 }
@@ -70,6 +71,7 @@ void ServerCommands::setDate(const std::string& date) {
   const auto [month, day, yearAsTyped] = readFields(date);
   if (!isDate(month, day, yearAsTyped)) {
     _context.output.print("setdate: Error: %s is invalid date format... use mm:dd:yy\n", date.c_str());
+    refuse("a date as mm:dd:yy");
     setError(true);
     return;
   }
@@ -92,6 +94,7 @@ void ServerCommands::setTime(const std::string& time) {
   const auto [hour, minute, second] = readFields(time);
   if (!isTime(hour, minute, second)) {
     _context.output.print("settime: Error, %s is invalid time format... use hh:mm:ss\n", time.c_str());
+    refuse("a time as hh:mm:ss");
     setError(true);
     return;
   }

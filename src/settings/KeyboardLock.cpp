@@ -34,7 +34,7 @@ void ServerCommands::setDisableKeyBoardWhenEnclosureLockIsEngaged(const std::str
   }
   // Any other word is passed over without a message.
   const auto isDisabled = readYesNo(yesNo);
-  if (!isDisabled) return;
+  if (!isDisabled) return refuse("'Yes' or 'No'");
   auto& utilities = _context.host.processes();
   utilities.setLockEnclosureState(*isDisabled);
   utilities.setMachineBoolean(DunmereLockEnclosureStateKey, *isDisabled);

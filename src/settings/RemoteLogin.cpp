@@ -50,7 +50,9 @@ void ServerCommands::setRemoteLogin(const std::string& onOff) {
   const auto isOn = readOnOff(onOff, "setremotelogin");
   if (!isOn) return;
   // Asked also when it is off already: the answer comes before the look at the state.
-  if (!*isOn && _parent && _parent->promptUser() && !promptForRemoteLogin()) return;
+  if (!*isOn && _parent && _parent->promptUser() && !promptForRemoteLogin()) {
+    return refuse("the answer yes to the question whether to lose this connection");
+  }
   if (*isOn == isEnabled) {
     _context.output.print("setremotelogin: remote login is already %s.\n", isEnabled ? "On" : "Off");
   } else {

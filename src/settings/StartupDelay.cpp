@@ -30,6 +30,7 @@ void ServerCommands::setWaitForStartupAfterPowerFailure(const std::string& secon
   setError(false);
   if (wait % secondsInUnit != 0) {
     _context.output.putLine("setwaitforstartupafterpowerfailure: Error, value must be divisible by 30.");
+    refuse("a number of seconds that is divisible by 30");
     return;
   }
   if (!sharedSpecialPMU().setTime(static_cast<std::int32_t>(wait / secondsInUnit))) return;

@@ -37,6 +37,7 @@ void ServerCommands::setTimeZone(const std::string& timeZone) {
     _context.output.print(
         "%s is not a valid timezone. The command 'listtimezones' will show a list of valid time zones.\n",
         timeZone.c_str());
+    refuse("a time zone that -listtimezones lists");
     setError(true);
     return;
   }

@@ -57,7 +57,8 @@ void setSwitch(ServerCommands& commands, const SourceSwitch& row, const std::str
   context.output.print("%s: %s\n", row.setter, wordFor(*isOn));
 }
 
-void allowPowerButton(const CommandContext& context, const std::string& onOff) {
+void allowPowerButton(ServerCommands& commands, const std::string& onOff) {
+  const auto& context = commands.context();
   const PowerSource source{ServerCommands::getPMKey()};
   auto& power = context.host.powerSettings();
   if (!power.canSet(PowerSwitch::powerButtonSleep, source)) {
@@ -66,7 +67,11 @@ void allowPowerButton(const CommandContext& context, const std::string& onOff) {
   }
   const auto isOff = caseInsensitiveEqualTo(onOff, "Off");
   // Any other word changes nothing, and is answered as "On" is.
-  if (isOff || caseInsensitiveEqualTo(onOff, "On")) power.setOn(PowerSwitch::powerButtonSleep, source, !isOff);
+  if (isOff || caseInsensitiveEqualTo(onOff, "On")) {
+    power.setOn(PowerSwitch::powerButtonSleep, source, !isOff);
+  } else {
+    commands.refuse(onOrOff);
+  }
   context.output.print("setallowpowerbuttontosleepcomputer: %s\n", wordFor(!isOff));
 }
 
@@ -118,7 +123,7 @@ void ServerCommands::getAllowPowerButtonToSleepComputer() {
 void ServerCommands::setAllowPowerButtonToSleepComputer(const std::string& onOff) {
   if (!checkForEmptyString(onOff, "setallowpowerbuttontosleepcomputer", onOrOff,
                            "setallowpowerbuttontosleepcomputer <on off>")) {
-    allowPowerButton(_context, onOff);
+    allowPowerButton(*this, onOff);
   }
   // Whatever happened, an empty word included.
   setError(false);

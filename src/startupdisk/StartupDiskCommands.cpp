@@ -73,7 +73,10 @@ void ServerCommands::setStartupDisk(const std::string& disk) {
     _context.output.print("Can't set startup disk to %s\n", folder.c_str());
     failed = true;
   }
-  if (!matched) _context.output.print("Not a System Folder: %s\n", folder.c_str());
+  if (!matched) {
+    _context.output.print("Not a System Folder: %s\n", folder.c_str());
+    refuse("a startup disk that -liststartupdisks lists");
+  }
   setError(failed || !matched);
 }
 

@@ -19,7 +19,8 @@ bool TerminalLog::wanted() {
 
 void TerminalLog::record(const Effect& effect) {
   if (!effect.failure) return;
-  _printAside([&] { complain(escaped(effect.setting) + ": " + describe(*effect.failure)); });
+  const auto undone = effect.undoneBy.empty() ? "" : "; may be undone by " + escaped(effect.undoneBy);
+  _printAside([&] { complain(escaped(effect.setting) + ": " + describe(*effect.failure) + undone); });
 }
 
 }  // namespace tavisk

@@ -30,10 +30,12 @@ class EffectLog final : public EffectChannel {
   }
   void record(const Effect& effect) override { effects.push_back(effect); }
   void observe(const SettingValue& value) override { values.push_back(value); }
+  bool wantsValues() const override { return wants; }
 
   std::vector<std::string> begun;  ///< "SETTING ASKED"
   std::vector<Effect> effects;
   std::vector<SettingValue> values;
+  bool wants = false;  ///< what wantsValues() says
 };
 
 }  // namespace tavisk

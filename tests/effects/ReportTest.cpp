@@ -37,18 +37,59 @@ TEST_F(ReportTest, tellsEachCommand) {
       run({"-f", "GETTIMEZONE", "-settime", "9:9\t", "-settime", "99", "-setnetworktimeserver", "a", "bogus\xff"}),
       ElementsAre(
           R"({"report":1,"command":"GETTIMEZONE","handler":"getTimeZone","failed":false,"changed":false,)"
-          R"("values":[{"setting":"Time Zone","live":"UTC"}],"effects":[],"output":"Time Zone: UTC\n"})",
+          R"("values":[{"setting":"Time Zone","live":"UTC","stored":"UTC"}],"effects":[],"output":"Time Zone: UTC\n"})",
           ::testing::AllOf(HasSubstr(R"({"report":1,"command":"-settime","argument":"9:9\t","handler":"setTime:",)"
                                      R"("failed":false,"changed":true,"values":[)"),
                            HasSubstr(R"("effects":[{"setting":"Time","outcome":"applied",)"),
                            HasSubstr(R"("output":"Set Time: 09:09:00\n"})")),
-          ::testing::AllOf(HasSubstr(R"("argument":"99","handler":"setTime:","failed":true,"changed":false)"),
-                           HasSubstr(R"("effects":[],"output":"settime: Error, 99 is)")),
+          ::testing::AllOf(
+              HasSubstr(R"("argument":"99","handler":"setTime:","refused":"a time as hh:mm:ss","failed":true,)"
+                        R"("changed":false)"),
+              HasSubstr(R"("effects":[],"output":"settime: Error, 99 is)")),
           ::testing::AllOf(HasSubstr(R"("failed":false,"changed":false,"values":[)"),
                            HasSubstr(R"("outcome":"failed")"), HasSubstr(R"("why":"no\nway")")),
-          "{\"report\":1,\"command\":\"bogus\xef\xbf\xbd\",\"error\":\"not a valid command\",\"failed\":false,"
+          "{\"report\":1,\"command\":\"bogus\xef\xbf\xbd\",\"refused\":\"a command that -printcommands "
+          "lists\",\"error\":\"not a valid command\",\"failed\":false,"
           "\"changed\":false,\"values\":[],\"effects\":[],"
           "\"output\":\"Error: bogus\xef\xbf\xbd is not a valid command\\n\"}"));
+}
+
+TEST_F(ReportTest, tellsEachArgumentThatIsNotTaken) {
+  const std::vector<std::string> words = {"-setdate",
+                                          "1",
+                                          "-settime",
+                                          "",
+                                          "-settimezone",
+                                          "Mars/Base",
+                                          "-setusingnetworktime",
+                                          "maybe",
+                                          "-setnetworktimeserver",
+                                          "",
+                                          "-setsleep",
+                                          "181",
+                                          "-setharddisksleep",
+                                          "never",
+                                          "-setrestartfreeze",
+                                          "1",
+                                          "-setwaitforstartupafterpowerfailure",
+                                          "45",
+                                          "-setremotelogin",
+                                          "yes",
+                                          "-setremotevelmarevents",
+                                          "",
+                                          "-setlocalsubnetname",
+                                          "db_4",
+                                          "-setkernelbootarchitecture",
+                                          "sparc",
+                                          "-setdisablekeyboardwhenenclosurelockisengaged",
+                                          "maybe",
+                                          "-setallowpowerbuttontosleepcomputer",
+                                          "",
+                                          "-setstartupdisk",
+                                          "None"};
+  const auto objects = run(words);
+  EXPECT_EQ(objects.size(), words.size() / 2);
+  EXPECT_THAT(objects, ::testing::Each(HasSubstr(R"(,"refused":")")));
 }
 
 TEST_F(ReportTest, tellsARefusalToRun) {

@@ -11,9 +11,6 @@ class Change {
   explicit Change(const Steps& steps) : _steps(steps) {
     _effect.setting = steps.name;
     _effect.asked = steps.asked;
-    _effect.where = steps.where;
-    if (steps.undoneBy) _effect.undoneBy = steps.undoneBy();
-    if (steps.note) _effect.note = steps.note();
   }
 
   const Effect& effect() const { return _effect; }
@@ -38,15 +35,30 @@ class Change {
   }
 
   void write(RunLoop& runLoop) {
-    if (!succeeds(_steps.store) || !succeeds(_steps.apply) || !_steps.settled) return;
-    if (runLoop.runUntil(RunLoop::Clock::now() + longestSettling, _steps.settled)) return;
-    fail({"change", _steps.name, "did not settle in time"});
+    const bool isStored = succeeds(_steps.store);
+    const bool isApplied = isStored && succeeds(_steps.apply);
+    if (isApplied && _steps.settled && !runLoop.runUntil(RunLoop::Clock::now() + longestSettling, _steps.settled))
+      fail({"change", _steps.name, "did not settle in time", std::make_error_code(std::errc::timed_out)});
+    const bool isAllWritten = _steps.store ? isStored : isApplied;
+    _effect.where = _steps.written ? _steps.written() : isAllWritten ? _steps.where : "";
   }
 
   void readBack() {
-    if (!isRead()) _effect.changed = _isWritten;
-    readBack(_steps.live, _live, _effect.live, _steps.name);
-    readBack(_steps.stored, _stored, _effect.stored, _steps.where.empty() ? _steps.name : _steps.where);
+    look();
+    if (_effect.outcome == Outcome::failed && hasEndedAfterAll()) {
+      _effect.outcome = Outcome::applied;
+      _effect.failure.reset();
+    }
+    if (_effect.outcome != Outcome::failed || !_isWritten || !_steps.takeBack) return;
+    const auto takenBack = _steps.takeBack();
+    if (takenBack) _effect.where.clear();
+    _effect.changed = false;
+    look();
+  }
+
+  void remark() {
+    if (_steps.undoneBy) _effect.undoneBy = _steps.undoneBy();
+    if (_steps.note && _effect.outcome != Outcome::failed) _effect.note = _steps.note();
   }
 
  private:
@@ -56,6 +68,19 @@ class Change {
   static constexpr std::chrono::seconds longestSettling{3};
 
   bool isRead() const { return _steps.live || _steps.stored; }
+
+  void look() {
+    if (!isRead()) _effect.changed = _isWritten;
+    _isAsAsked = isRead();
+    readBack(_steps.live, _live, _effect.live, _steps.name);
+    readBack(_steps.stored, _stored, _effect.stored, _steps.where.empty() ? _steps.name : _steps.where);
+  }
+
+  /// Whether what ran out of time has come about meanwhile.
+  bool hasEndedAfterAll() const {
+    return _effect.failure->code == std::errc::timed_out && _isAsAsked && (!_steps.settled || _steps.settled());
+  }
+
   static bool isAsked(const Before& sight) { return sight && sight->isAsked; }
 
   /// The first failure is the cause; what follows from it is not told.
@@ -86,6 +111,7 @@ class Change {
     text = seen ? seen->text : std::nullopt;
     const bool differs = before && seen ? before->text != seen->text : _isWritten;
     _effect.changed = _effect.changed || differs;
+    _isAsAsked = _isAsAsked && seen && seen->isAsked;
     if (!seen) return fail(seen.failure());
     if (!seen->isAsked) fail({"read back", place, text ? "reads " + *text : "reads nothing"});
   }
@@ -95,6 +121,7 @@ class Change {
   Before _live;
   Before _stored;
   bool _isWritten = false;  ///< a step that writes has succeeded
+  bool _isAsAsked = false;  ///< what was looked at last
 };
 
 }  // namespace
@@ -106,6 +133,7 @@ Effect carryOut(const Steps& steps, EffectSink& effects, RunLoop& runLoop) {
     change.write(runLoop);
     change.readBack();
   }
+  change.remark();
   effects.record(change.effect());
   return change.effect();
 }

@@ -60,14 +60,16 @@ struct Setting {
   using Found = Result<std::optional<Reading<Value>>>;  ///< absent: the setting has no value
   using Read = std::function<Found()>;
   using Write = std::function<Result<void>(const Value& value)>;
-  /// Asked for once when a change begins.
+  /// Asked for once when a change has ended.
   using Remark = std::function<std::string(const Value& asked)>;
 
   std::string name;   ///< one of effects/SettingNames.h
   std::string unit;   ///< see SettingValue
-  std::string where;  ///< see Effect
-  Remark undoneBy;    ///< see Effect
-  Remark note;        ///< see Effect
+  std::string where;  ///< the places in which it is stored, so that it survives a restart
+  /// Those of them that the last change has written; empty: all if storing succeeded, else none.
+  std::function<std::string()> written;
+  Remark undoneBy;  ///< see Effect
+  Remark note;      ///< see Effect; of a change that has not failed
   std::function<Support()> supported;
   Read live;
   Read stored;
@@ -77,6 +79,8 @@ struct Setting {
   std::function<Value(const Value& asked)> liveFor;
   /// Whether the live value has reached what was asked; asked again after each event, for at most 3 s.
   std::function<bool(const Value& value)> settled;
+  /// Puts back what store() has replaced, when the value has not become what was asked; empty: what is stored stays.
+  std::function<Result<void>()> takeBack;
   /// Write although live and stored already have the value (a machine that counts its operations).
   bool always = false;
 };
@@ -87,8 +91,9 @@ template <typename Value>
 Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, EffectSink& effects,
                 RunLoop& runLoop);
 
-/// Reads the live value (the stored one where there is no live one) and tells it to the sink; a read that fails is
-/// recorded as a failed effect and yields no value.
+/// Reads the live value (the stored one where there is no live one) and tells it to the sink, beside the stored one
+/// where somebody wants to know, or that the machine cannot have it. A read that fails is recorded as a failed effect
+/// and yields no value.
 template <typename Value>
 std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects);
 
@@ -105,6 +110,7 @@ struct Steps {
   std::string name;
   std::string where;
   std::string asked;
+  std::function<std::string()> written;
   std::function<std::string()> undoneBy;
   std::function<std::string()> note;
   std::function<Support()> supported;
@@ -113,6 +119,7 @@ struct Steps {
   std::function<Result<void>()> store;
   std::function<Result<void>()> apply;
   std::function<bool()> settled;
+  std::function<Result<void>()> takeBack;
   bool always = false;
 };
 
@@ -158,6 +165,7 @@ Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>
       .name = setting.name,
       .where = setting.where,
       .asked = textOf(asked),
+      .written = setting.written,
       .undoneBy = change::about(setting.undoneBy, asked),
       .note = change::about(setting.note, asked),
       .supported = setting.supported,
@@ -166,23 +174,41 @@ Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>
       .store = change::about(setting.store, asked),
       .apply = change::about(setting.apply, asked),
       .settled = change::about(setting.settled, asked),
+      .takeBack = setting.takeBack,
       .always = setting.always,
   };
   return change::carryOut(steps, effects, runLoop);
 }
 
+namespace change {
+
+/// The text of a value that was read; absent without one, and where the look failed, which is recorded.
+template <typename Value>
+std::optional<std::string> textOfFound(const typename Setting<Value>::Found& found, const Setting<Value>& setting,
+                                       EffectSink& effects) {
+  if (found) return *found ? std::optional(textOfReading(**found)) : std::nullopt;
+  effects.recordFailure(setting.name, found.failure());
+  return std::nullopt;
+}
+
+}  // namespace change
+
 template <typename Value>
 std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects) {
   const auto found = setting.live ? setting.live() : setting.stored();
-  if (!found) {
-    effects.record(
-        {.setting = setting.name, .outcome = Outcome::failed, .where = setting.where, .failure = found.failure()});
-    return std::nullopt;
+  const bool asksMore = !found || effects.wantsValues();
+  const auto support = asksMore && setting.supported ? setting.supported() : Support(std::nullopt);
+  SettingValue value{.setting = setting.name, .unit = setting.unit};
+  if (support && *support) {
+    value.unsupported = (*support)->reason;
+  } else {
+    (setting.live ? value.live : value.stored) = change::textOfFound<Value>(found, setting, effects);
+    if (setting.live && setting.stored && asksMore && found)
+      value.stored = change::textOfFound<Value>(setting.stored(), setting, effects);
+    if (!found) return std::nullopt;
   }
-  SettingValue value{setting.name, std::nullopt, std::nullopt, setting.unit};
-  if (*found) (setting.live ? value.live : value.stored) = change::textOfReading(**found);
   effects.observe(value);
-  return *found ? std::optional((*found)->value) : std::nullopt;
+  return found && *found ? std::optional((*found)->value) : std::nullopt;
 }
 
 }  // namespace tavisk

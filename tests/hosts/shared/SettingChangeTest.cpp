@@ -17,7 +17,7 @@ struct SettingChangeTest : ::testing::Test {
     sink.addChannel(log);
     setting.name = "Sleep";
     setting.unit = "minutes";
-    setting.where = "/etc/sleep.conf";
+    setting.where = place;
     setting.undoneBy = saying("a daemon");
     setting.live = [this] { return read("live", live); };
     setting.stored = [this] { return read("stored", stored); };
@@ -30,10 +30,10 @@ struct SettingChangeTest : ::testing::Test {
     return value;
   }
 
-  Result<void> write(const std::string& step, std::optional<std::string>& place, const std::string& value) {
+  Result<void> write(const std::string& step, std::optional<std::string>& target, const std::string& value) {
     steps.push_back(step);
     if (broken == step) return Failure{step, "disk", "No space left on device"};
-    if (ignored != step) place = value;
+    if (ignored != step) target = value;
     return {};
   }
 
@@ -44,8 +44,9 @@ struct SettingChangeTest : ::testing::Test {
   }
 
   using Text = std::optional<std::string>;
-  /// The effect of a change to "9", with what is the same in every case.
-  static Effect effectOf(Outcome outcome, bool changed, Text before, Text live, Text stored,
+  static constexpr const char* place = "/etc/sleep.conf";
+  /// The effect of a change to "9", with what is the same in every case; `where`: what was written.
+  static Effect effectOf(Outcome outcome, const char* where, bool changed, Text before, Text live, Text stored,
                          std::optional<Failure> failure = {}) {
     return {.setting = "Sleep",
             .outcome = outcome,
@@ -53,7 +54,7 @@ struct SettingChangeTest : ::testing::Test {
             .asked = "9",
             .live = std::move(live),
             .stored = std::move(stored),
-            .where = "/etc/sleep.conf",
+            .where = where,
             .undoneBy = "a daemon",
             .failure = std::move(failure),
             .changed = changed};
@@ -71,19 +72,18 @@ struct SettingChangeTest : ::testing::Test {
 };
 
 TEST_F(SettingChangeTest, storesThenAppliesThenReadsBack) {
-  EXPECT_EQ(change("9"), effectOf(Outcome::applied, true, "5", "9", "9"));
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, place, true, "5", "9", "9"));
   EXPECT_THAT(steps, ElementsAre("store", "apply"));
   EXPECT_THAT(log.begun, ElementsAre("Sleep 9"));
 }
 
 TEST_F(SettingChangeTest, writesNothingThatIsThereAlready) {
   live = stored = "9";
-  const auto unchanged = effectOf(Outcome::unchanged, false, "9", "9", "9");
-  EXPECT_EQ(change("9"), unchanged);
+  EXPECT_EQ(change("9"), effectOf(Outcome::unchanged, "", false, "9", "9", "9"));
   EXPECT_THAT(steps, IsEmpty());
   EXPECT_THAT(log.begun, IsEmpty());
   setting.always = true;
-  EXPECT_EQ(change("9"), unchanged);
+  EXPECT_EQ(change("9"), effectOf(Outcome::unchanged, place, false, "9", "9", "9"));
   EXPECT_THAT(steps, ElementsAre("store", "apply"));
 }
 
@@ -98,11 +98,11 @@ TEST_F(SettingChangeTest, writesWhenOnlyOneOfLiveAndStoredIsRight) {
 
 TEST_F(SettingChangeTest, takesAPartThatCannotBeReadForRightButAppliesWhereNoneCan) {
   setting.live = nullptr;
-  EXPECT_EQ(change("9"), effectOf(Outcome::applied, true, "5", {}, "9"));
-  EXPECT_EQ(change("9"), effectOf(Outcome::unchanged, false, "9", {}, "9"));
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, place, true, "5", {}, "9"));
+  EXPECT_EQ(change("9"), effectOf(Outcome::unchanged, "", false, "9", {}, "9"));
   setting.stored = nullptr;
   setting.apply = nullptr;
-  EXPECT_EQ(change("9"), effectOf(Outcome::applied, true, {}, {}, {}));
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, place, true, {}, {}, {}));
   EXPECT_THAT(steps, ElementsAre("store", "apply", "store"));
 }
 
@@ -116,9 +116,9 @@ TEST_F(SettingChangeTest, takesAbsentForEmpty) {
 TEST_F(SettingChangeTest, writesNothingThatTheMachineCannotHave) {
   const auto reason = systemFailure("find", "/sys/power", ENOENT);
   setting.supported = [&] { return std::optional(NotSupported{reason}); };
-  EXPECT_EQ(change("9"), effectOf(Outcome::notSupported, false, {}, {}, {}, reason));
+  EXPECT_EQ(change("9"), effectOf(Outcome::notSupported, "", false, {}, {}, {}, reason));
   setting.supported = [&] { return reason; };
-  EXPECT_EQ(change("9"), effectOf(Outcome::failed, false, {}, {}, {}, reason)) << "it could not be found out";
+  EXPECT_EQ(change("9"), effectOf(Outcome::failed, "", false, {}, {}, {}, reason)) << "it could not be found out";
   EXPECT_THAT(steps, IsEmpty());
 }
 
@@ -132,14 +132,46 @@ TEST_F(SettingChangeTest, tellsTheFirstFailureAndWhatIsThereNow) {
       {"", "store", true, "9", "5", wrong("/etc/sleep.conf"), {"store", "apply"}},
       {"stored", "", true, "9", {}, {"stored", "disk", "Input/output error"}, {"store", "apply"}},
   };
+  setting.note = saying("of what has happened");
   for (const auto& [breaks, lies, changed, nowLive, nowStored, failure, made] : cases) {
     live = stored = "5";
     steps.clear();
     broken = breaks;
     ignored = lies;
-    EXPECT_EQ(change("9"), effectOf(Outcome::failed, changed, "5", nowLive, nowStored, failure));
+    const auto* where = broken == "store" ? "" : place;
+    EXPECT_EQ(change("9"), effectOf(Outcome::failed, where, changed, "5", nowLive, nowStored, failure));
     EXPECT_EQ(steps, made);
   }
+}
+
+TEST_F(SettingChangeTest, tellsThePlacesThatWereWrittenOfSeveral) {
+  broken = "store";
+  setting.written = [] { return "/etc/first.conf"; };
+  EXPECT_EQ(change("9").where, "/etc/first.conf");
+}
+
+TEST_F(SettingChangeTest, takesBackWhatDoesNotComeAbout) {
+  setting.takeBack = [this] { return write("take back", stored, "5"); };
+  ignored = "apply";
+  EXPECT_EQ(change("9"), effectOf(Outcome::failed, "", false, "5", "5", "5", Failure{"read back", "Sleep", "reads 5"}));
+  EXPECT_EQ(steps.back(), "take back");
+  broken = "take back";
+  EXPECT_EQ(change("9"),
+            effectOf(Outcome::failed, place, true, "5", "5", "9", Failure{"read back", "Sleep", "reads 5"}));
+  broken = ignored = "";
+  EXPECT_EQ(change("9").outcome, Outcome::applied);
+}
+
+TEST_F(SettingChangeTest, looksOnceMoreAtWhatRanOutOfTime) {
+  const auto late = std::make_error_code(std::errc::timed_out);
+  bool comesAbout = true;
+  setting.apply = [&](const std::string& value) {
+    if (comesAbout) live = value;
+    return Failure{"wait", "daemon", "has not ended in time", late};
+  };
+  EXPECT_EQ(change("9"), effectOf(Outcome::applied, place, true, "5", "9", "9"));
+  comesAbout = false;
+  EXPECT_EQ(change("7").outcome, Outcome::failed);
 }
 
 TEST_F(SettingChangeTest, waitsByEventUntilItHasSettled) {
@@ -157,8 +189,8 @@ TEST_F(SettingChangeTest, waitsByEventUntilItHasSettled) {
 TEST_F(SettingChangeTest, givesUpWaitingAfterThreeSeconds) {
   setting.settled = [](const std::string& /*value*/) { return false; };
   const auto begin = RunLoop::Clock::now();
-  const Failure unsettled{"change", "Sleep", "did not settle in time"};
-  EXPECT_EQ(change("9"), effectOf(Outcome::failed, true, "5", "9", "9", unsettled));
+  const Failure unsettled{"change", "Sleep", "did not settle in time", std::make_error_code(std::errc::timed_out)};
+  EXPECT_EQ(change("9"), effectOf(Outcome::failed, place, true, "5", "9", "9", unsettled));
   EXPECT_GE(RunLoop::Clock::now() - begin, std::chrono::seconds(3));
 }
 
@@ -173,8 +205,26 @@ TEST_F(SettingChangeTest, observesTheLiveValueOrElseTheStoredOne) {
                                       SettingValue{.setting = "Sleep", .stored = "5", .unit = "minutes"}));
   EXPECT_THAT(log.effects, ElementsAre(Effect{.setting = "Sleep",
                                               .outcome = Outcome::failed,
-                                              .where = "/etc/sleep.conf",
                                               .failure = Failure{"stored", "disk", "Input/output error"}}));
+}
+
+TEST_F(SettingChangeTest, observesMoreForWhoWantsToKnow) {
+  live = "7";
+  log.wants = true;
+  EXPECT_EQ(observe(setting, sink), "7");
+  broken = "stored";
+  EXPECT_EQ(observe(setting, sink), "7");
+  const Failure reason{"find", "/sys/power", "none here"};
+  setting.supported = [&] { return std::optional(NotSupported{reason}); };
+  EXPECT_EQ(observe(setting, sink), "7");
+  log.wants = false;
+  broken = "live";
+  EXPECT_EQ(observe(setting, sink), std::nullopt) << "what cannot be had cannot be read either";
+  const SettingValue unsupported{.setting = "Sleep", .unit = "minutes", .unsupported = reason};
+  EXPECT_THAT(log.values,
+              ElementsAre(SettingValue{.setting = "Sleep", .live = "7", .stored = "5", .unit = "minutes"},
+                          SettingValue{.setting = "Sleep", .live = "7", .unit = "minutes"}, unsupported, unsupported));
+  EXPECT_THAT(log.effects, ElementsAre(::testing::Field(&Effect::outcome, Outcome::failed)));
 }
 
 }  // namespace

@@ -5,14 +5,6 @@
 namespace tavisk {
 namespace {
 
-/// Reads the value in force. That it cannot be read is no fault of the place where another one is stored, which is left
-/// out of the effect then.
-template <typename Value>
-std::optional<Value> read(Setting<Value> setting, EffectSink& effects) {
-  if (setting.live && setting.stored) setting.where.clear();
-  return observe(setting, effects);
-}
-
 /// A look that fails is told as such: nobody knows then whether the machine can have the setting.
 Support supportOf(const Setting<bool>& setting, EffectSink& effects) {
   auto support = setting.supported ? setting.supported() : Support(std::nullopt);
@@ -64,7 +56,7 @@ Setting<bool> LinuxPowerSettingsService::settingOf(PowerSwitch which) {
 }
 
 Minutes LinuxPowerSettingsService::untilSleep(SleepTimer timer, const PowerSource& /*source*/) {
-  return read(settingOf(timer), _machine.effects).value_or(Minutes{});
+  return observe(settingOf(timer), _machine.effects).value_or(Minutes{});
 }
 
 void LinuxPowerSettingsService::setUntilSleep(SleepTimer timer, const PowerSource& /*source*/, Minutes minutes) {
@@ -84,7 +76,7 @@ bool LinuxPowerSettingsService::canSet(PowerSwitch which, const PowerSource& /*s
 
 bool LinuxPowerSettingsService::isOn(PowerSwitch which, const PowerSource& /*source*/) {
   const auto setting = settingOf(which);
-  return isSupported(setting, _machine.effects) && read(setting, _machine.effects).value_or(false);
+  return isSupported(setting, _machine.effects) && observe(setting, _machine.effects).value_or(false);
 }
 
 void LinuxPowerSettingsService::setOn(PowerSwitch which, const PowerSource& /*source*/, bool on) {
@@ -92,7 +84,7 @@ void LinuxPowerSettingsService::setOn(PowerSwitch which, const PowerSource& /*so
 }
 
 bool LinuxPowerSettingsService::restartsAfterFreeze() {
-  return read(_restartAfterFreeze.restartAfterFreeze(), _machine.effects).value_or(false);
+  return observe(_restartAfterFreeze.restartAfterFreeze(), _machine.effects).value_or(false);
 }
 
 void LinuxPowerSettingsService::setRestartsAfterFreeze(bool restarts) {

@@ -26,11 +26,7 @@ template <typename Value>
 Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, const LinuxMachine& machine) {
   const auto lock = MachineLock(machine.root, machine.runLoop).hold();
   if (lock) return carryOut(setting, asked, machine.effects, machine.runLoop);
-  Effect effect{.setting = setting.name,
-                .outcome = Outcome::failed,
-                .asked = textOf(asked),
-                .where = setting.where,
-                .failure = lock.failure()};
+  Effect effect{.setting = setting.name, .outcome = Outcome::failed, .asked = textOf(asked), .failure = lock.failure()};
   machine.effects.record(effect);
   return effect;
 }

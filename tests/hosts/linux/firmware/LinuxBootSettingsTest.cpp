@@ -83,7 +83,7 @@ class LinuxBootSettingsTest : public testing::Test {
             .before = before,
             .asked = after,
             .stored = after,
-            .where = BootTree::pathOf("BootOrder"),
+            .where = outcome == Outcome::applied ? BootTree::pathOf("BootOrder") : "",
             .changed = outcome == Outcome::applied};
   }
 
