@@ -55,40 +55,28 @@ TEST_F(ReportTest, tellsEachCommand) {
 }
 
 TEST_F(ReportTest, tellsEachArgumentThatIsNotTaken) {
-  const std::vector<std::string> words = {"-setdate",
-                                          "1",
-                                          "-settime",
-                                          "",
-                                          "-settimezone",
-                                          "Mars/Base",
-                                          "-setusingnetworktime",
-                                          "maybe",
-                                          "-setnetworktimeserver",
-                                          "",
-                                          "-setsleep",
-                                          "181",
-                                          "-setharddisksleep",
-                                          "never",
-                                          "-setrestartfreeze",
-                                          "1",
-                                          "-setwaitforstartupafterpowerfailure",
-                                          "45",
-                                          "-setremotelogin",
-                                          "yes",
-                                          "-setremotevelmarevents",
-                                          "",
-                                          "-setlocalsubnetname",
-                                          "db_4",
-                                          "-setkernelbootarchitecture",
-                                          "sparc",
-                                          "-setdisablekeyboardwhenenclosurelockisengaged",
-                                          "maybe",
-                                          "-setallowpowerbuttontosleepcomputer",
-                                          "",
-                                          "-setstartupdisk",
-                                          "None"};
+  static constexpr std::pair<const char*, const char*> refused[] = {
+      {"-setdate", "1"},
+      {"-settime", ""},
+      {"-settimezone", "Mars/Base"},
+      {"-setusingnetworktime", "maybe"},
+      {"-setnetworktimeserver", ""},
+      {"-setsleep", "181"},
+      {"-setharddisksleep", "-1"},
+      {"-setrestartfreeze", "1"},
+      {"-setwaitforstartupafterpowerfailure", "45"},
+      {"-setremotelogin", "yes"},
+      {"-setremotevelmarevents", ""},
+      {"-setlocalsubnetname", "db_4"},
+      {"-setkernelbootarchitecture", "sparc"},
+      {"-setdisablekeyboardwhenenclosurelockisengaged", "maybe"},
+      {"-setallowpowerbuttontosleepcomputer", ""},
+      {"-setstartupdisk", "None"},
+  };
+  std::vector<std::string> words;
+  for (const auto& [command, value] : refused) words.insert(words.end(), {command, value});
   const auto objects = run(words);
-  EXPECT_EQ(objects.size(), words.size() / 2);
+  EXPECT_EQ(objects.size(), std::size(refused));
   EXPECT_THAT(objects, ::testing::Each(HasSubstr(R"(,"refused":")")));
 }
 
