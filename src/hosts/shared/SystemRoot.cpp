@@ -98,10 +98,6 @@ Result<bool> SystemRoot::isThere(const std::string& path) const {
   return found->has_value();
 }
 
-bool SystemRoot::exists(const std::string& path) const {
-  return static_cast<bool>(open(path, O_PATH));
-}
-
 std::optional<FileStamp> SystemRoot::stamp(const std::string& path) const {
   struct stat status {};
   if (::lstat((_prefix + path).c_str(), &status) != 0) return std::nullopt;
