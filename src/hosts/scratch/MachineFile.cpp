@@ -3,6 +3,7 @@
 #include "hosts/scratch/MachineFile.h"
 
 #include <fcntl.h>
+#include <sys/file.h>
 #include <sys/inotify.h>
 #include <unistd.h>
 
@@ -11,11 +12,11 @@
 #include <chrono>
 #include <cstdlib>
 #include <stdexcept>
+#include <thread>
 #include <utility>
 
 #include "base/FileDescriptor.h"
 #include "base/Text.h"
-#include "hosts/scratch/FileLock.h"
 #include "hosts/scratch/KeyTable.h"
 
 namespace tavisk {
@@ -29,6 +30,7 @@ constexpr const char* rehearsal = "rehearse";
 constexpr const char* settingName = "Machine";
 constexpr std::chrono::milliseconds longestWait = 5s;  // for another run's lock
 constexpr std::chrono::milliseconds longestWaitOfOtherThreads = 50ms;
+constexpr std::chrono::milliseconds betweenTries = 1ms;
 
 const KeyRow& rowOf(const std::string& place, std::string_view key) {
   const auto* row = findKey(place, key);
@@ -42,6 +44,19 @@ bool tellsVersions(const std::optional<FileStamp>& stamp) {
   constexpr std::int64_t step = 20'000'000;  // nanoseconds; 10 ms at the slowest kernel clock
   const auto now = std::chrono::nanoseconds(std::chrono::system_clock::now().time_since_epoch()).count();
   return !stamp || std::abs(now - stamp->changed) > step;
+}
+
+/// Locks a file against other runs (flock(2)) until the descriptor is closed; it is made when it is missing.
+Result<FileDescriptor> lockFile(const SystemRoot& root, const std::string& path, std::chrono::milliseconds patience) {
+  auto file = root.open(path, O_RDONLY | O_CREAT | O_NOFOLLOW | O_NONBLOCK, 0644);
+  if (!file) return file;
+  const auto deadline = std::chrono::steady_clock::now() + patience;
+  while (::flock(file->number(), LOCK_EX | LOCK_NB) != 0) {
+    if (errno != EWOULDBLOCK && errno != EINTR) return systemFailure("lock", path, errno);
+    if (std::chrono::steady_clock::now() > deadline) return Failure{"lock", path, "another run keeps it locked"};
+    std::this_thread::sleep_for(betweenTries);
+  }
+  return file;
 }
 
 void drain(const FileDescriptor& events) {

@@ -74,6 +74,8 @@ class MachineFile {
   /// Locks, reads again, edits, and replaces the file (SystemRoot::write). What another run changed meanwhile is kept.
   /// A lock that another run holds is waited for 5 s, and 50 ms on any thread but the one that opened the file.
   Result<void> change(const Edit& edit);
+  /// What change() locks, for a change of the machine's other files: until the descriptor is closed.
+  Result<FileDescriptor> lock() const;
 
   /// Tells, from the run loop, when the contents are others than those last told; `told` are the first.
   [[nodiscard]] RunLoop::Registration observeChanges(RunLoop& runLoop, Contents told, Observer observer);
@@ -96,7 +98,6 @@ class MachineFile {
   void keepWritten(std::string text, Dictionary machine);
   /// Takes over what was read; a failure that is to be told comes back.
   std::optional<Failure> keep(const std::optional<FileStamp>& stamp, const Result<VersionRef>& version);
-  Result<FileDescriptor> lock() const;
   Failure inFolder(const Failure& failure) const;
   void recordFailure(const Failure& failure, const std::string& note);
 

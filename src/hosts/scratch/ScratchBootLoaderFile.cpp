@@ -13,7 +13,12 @@ std::optional<PropertyList::Dictionary> ScratchBootLoaderFile::read() {
 }
 
 bool ScratchBootLoaderFile::write(const PropertyList::Dictionary& contents) {
-  const auto effect = _settings.carryOut(kernelArchitecture(_file, contents), architectureIn(contents));
+  auto setting = kernelArchitecture(_file, contents);
+  setting.store = [this, write = setting.store](const std::string& architecture) -> Result<void> {
+    const auto held = _machine.lock();
+    return held ? write(architecture) : held.failure();
+  };
+  const auto effect = _settings.carryOut(setting, architectureIn(contents));
   return effect.outcome != Outcome::failed;
 }
 

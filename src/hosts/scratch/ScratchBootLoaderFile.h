@@ -11,13 +11,15 @@ namespace tavisk {
 /// The file among the machine's files.
 class ScratchBootLoaderFile final : public BootLoaderFile {
  public:
-  ScratchBootLoaderFile(const SystemRoot& root, MachineSettings& settings) : _file(root, path), _settings(settings) {}
+  ScratchBootLoaderFile(const SystemRoot& root, const MachineFile& machine, MachineSettings& settings)
+      : _file(root, path), _machine(machine), _settings(settings) {}
 
   std::optional<PropertyList::Dictionary> read() override;
   bool write(const PropertyList::Dictionary& contents) override;
 
  private:
   PropertyListFile _file;
+  const MachineFile& _machine;
   MachineSettings& _settings;
 };
 

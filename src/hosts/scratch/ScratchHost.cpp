@@ -34,7 +34,7 @@ ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFi
       _remoteEvents(_settings, setting::remoteEvents, "Remote Events"),
       _hostConfiguration(_settings),
       _dynamicStore(_settings),
-      _bootLoaderFile(_root, _settings),
+      _bootLoaderFile(_root, *_machine, _settings),
       _preferences(_settings),
       _processes(_settings, _preferences),
       _disks(*_machine),

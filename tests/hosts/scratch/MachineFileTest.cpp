@@ -185,19 +185,22 @@ TEST_F(MachineFileTest, tellsAnObserverWhatChangedSinceItWasReadAndNothingOfOthe
 
 TEST_F(MachineFileTest, losesNothingBetweenTwoProcesses) {
   constexpr int changes = 60;
-  auto work = [&] {
+  auto work = [&](const std::string& name) {
     auto file = open();
+    auto& bootLoader = machine.host().bootLoaderFile();
     for (int times = 0; times < changes; ++times) {
       if (!file->change(countTwice())) ::_exit(1);
+      if (!bootLoader.write(keys({{name + std::to_string(times), true}}))) ::_exit(2);
     }
   };
-  auto children = {inAnotherProcess(work), inAnotherProcess(work)};
+  auto children = {inAnotherProcess([&] { work("one"); }), inAnotherProcess([&] { work("other"); })};
   for (auto child : children) {
     int status = 0;
     ::waitpid(child, &status, 0);
     EXPECT_EQ(status, 0);
   }
   EXPECT_EQ(machine.get("Counts", "One"), PropertyList(2 * changes));
+  EXPECT_EQ(machine.host().bootLoaderFile().read()->size(), 2U * changes);
 }
 
 TEST_F(MachineFileTest, isWholeWheneverItsWriterIsKilled) {
