@@ -20,12 +20,17 @@ std::string_view withoutDash(std::string_view word) {
   return word.starts_with('-') ? word.substr(1) : word;
 }
 
-const HelpEntry* findHelp(std::string_view word) {
-  const auto isMeant = [word](const HelpEntry& entry) {
-    return compareIgnoringCase(withoutDash(entry.word), withoutDash(word)) == 0;
+const std::vector<ListedCommand>& commands() {
+  static const auto listed = listCommands();
+  return listed;
+}
+
+const ListedCommand* findCommand(std::string_view word) {
+  const auto isMeant = [word](const ListedCommand& command) {
+    return compareIgnoringCase(withoutDash(command.word), withoutDash(word)) == 0;
   };
-  const auto entry = std::ranges::find_if(helpEntries(), isMeant);
-  return entry == helpEntries().end() ? nullptr : &*entry;
+  const auto command = std::ranges::find_if(commands(), isMeant);
+  return command == commands().end() ? nullptr : &*command;
 }
 
 /// What the words before are waiting for: ArgumentKind::none is the next command. Absent when they hold a word that is
@@ -38,9 +43,9 @@ std::optional<ArgumentKind> expectedAfter(std::span<const std::string> words) {
       expected = ArgumentKind::none;
       continue;
     }
-    const auto* command = findHelp(word);
+    const auto* command = findCommand(word);
     if (!command) return std::nullopt;
-    expected = argumentKind(*command);
+    expected = command->argument;
   }
   return expected;
 }
@@ -48,7 +53,7 @@ std::optional<ArgumentKind> expectedAfter(std::span<const std::string> words) {
 Words commandWords(const std::string& typed, bool isFirst) {
   const bool isDashed = typed.empty() || typed.starts_with('-');
   Words words;
-  for (const auto& entry : helpEntries()) words.emplace_back(isDashed ? entry.word : withoutDash(entry.word));
+  for (const auto& command : commands()) words.emplace_back(isDashed ? command.word : withoutDash(command.word));
   if (isFirst) words.insert(words.end(), std::begin(endingWords), std::end(endingWords));
   return words;
 }

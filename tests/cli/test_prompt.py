@@ -91,6 +91,7 @@ class AtThePrompt(Prompt):
             ("-setwakeonmodem of\t-gettimez\t", "Time Zone: UTC"),
             ("gettimezone qui\t", "Time Zone: UTC\r\nError: qui is not a valid command"),
             ("settimezone as\t\t", "Set TimeZone: Asia/Tokyo"),
+            ("setkernelbootarchi\tx8\t", "setting kernel architecture to: x86_64\r\nchanges to kernel architecture have been saved."),
             ("setdate -gettimez\t", "setdate: Error: -gettimez is invalid date format... use mm:dd:yy"),
             ("-bogus getda\t", "Error: -bogus is not a valid command"),
         )))
