@@ -8,6 +8,7 @@
 //   @command   for each command: word, kind, placeholder, summary
 //   @kind      for each kind of argument that has words: kind, words
 //   @key       for each key of a machine file: path, type, default, meaning; all for roff
+//   @setting   for each setting that a machine can refuse: name, for roff
 // {newline} ends a line of a mark's.
 #include <algorithm>
 #include <cstdlib>
@@ -20,6 +21,7 @@
 #include "base/Text.h"
 #include "frontend/CommandList.h"
 #include "hosts/scratch/KeyTable.h"
+#include "hosts/scratch/Misspellings.h"
 
 namespace tavisk {
 namespace {
@@ -137,6 +139,13 @@ std::vector<Row> keyRows() {
   return rows;
 }
 
+std::vector<Row> settingRows() {
+  std::vector<Row> rows;
+  for (const std::string_view name : refusableSettings())
+    rows.push_back({{"{name}", roff(name.ends_with(' ') ? std::string(name) + "NAME" : name)}});
+  return rows;
+}
+
 void repeat(const std::string& pattern, const std::vector<Row>& rows, std::ostream& document) {
   for (const Row& row : rows) {
     std::string line = pattern;
@@ -148,7 +157,7 @@ void repeat(const std::string& pattern, const std::vector<Row>& rows, std::ostre
 
 void fill(const std::string& line, std::ostream& document) {
   static const std::pair<std::string, std::vector<Row> (*)()> marks[] = {
-      {"@command ", commandRows}, {"@kind ", kindRows}, {"@key ", keyRows}};
+      {"@command ", commandRows}, {"@kind ", kindRows}, {"@key ", keyRows}, {"@setting ", settingRows}};
   for (const auto& [mark, rows] : marks)
     if (line.starts_with(mark)) return repeat(line.substr(mark.size()), rows(), document);
   document << line << '\n';

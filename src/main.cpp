@@ -41,9 +41,12 @@ std::optional<std::string> environmentVariable(const char* name) {
 }
 
 Result<std::unique_ptr<Host>> openScratchHost(const std::string& directory, EffectSink& effects, RunLoop& runLoop) {
-  if (isatty(STDERR_FILENO) != 0) complain("rehearsing on " + escaped(directory));
+  const bool isTold = isatty(STDERR_FILENO) != 0;
+  if (isTold) complain("rehearsing on " + escaped(directory));
   auto host = ScratchHost::open(directory, effects, runLoop);
   if (!host) return host.failure();
+  if (const auto names = isTold ? (*host)->misspellings() : ""; !names.empty())
+    complain("machine.plist has names that mean nothing: " + escaped(names));
   return std::unique_ptr<Host>(std::move(host).value());
 }
 

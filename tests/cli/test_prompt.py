@@ -197,10 +197,12 @@ class WithoutEditing(Prompt):
         self.assertEqual([listed() for _ in range(3)], [["Backup"]] * 3)
         self.assertEqual(len(self.machine.effects()), 1)
 
-    def test_a_failure_is_told_in_one_line(self):
-        self.machine.change({"Refusals": {"Time": "sealed\x85 off"}})
+    def test_a_failure_and_names_that_are_misspelt_are_told_in_one_line_each(self):
+        self.machine.change({"Refusals": {"Time": "sealed\x85 off", "\x85": ""}, "Clock": {"time zone": "UTC"}})
         shown = self.start(["-settime", "1:2:3"]).wait_for("Set Time: 01:02:03\r\n")
-        self.assertRegex(shown, rf"^tavisk: rehearsing on {self.machine.directory}\ntavisk: Time: .*sealed\\u\{{0085}} off\n")
+        self.assertRegex(shown, rf"^tavisk: rehearsing on {self.machine.directory}\ntavisk: machine\.plist has [^\n]*: "
+                         r'"Clock" "time zone" \(is "Time Zone" meant\?\), "Refusals" "\\u\{0085}" \(no setting is called so\)\n'
+                         r"tavisk: Time: .*sealed\\u\{0085} off\n")
 
 
 if __name__ == "__main__":

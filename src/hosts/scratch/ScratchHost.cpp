@@ -3,6 +3,7 @@
 #include "hosts/scratch/ScratchHost.h"
 
 #include "effects/SettingNames.h"
+#include "hosts/scratch/Misspellings.h"
 
 namespace tavisk {
 
@@ -14,6 +15,12 @@ Result<std::unique_ptr<ScratchHost>> ScratchHost::open(const std::string& direct
   effects.addChannel(host->_effectsLog);
   if (const auto unusable = host->_effectsLog.whyUnusable()) effects.recordFailure("Effects Log", *unusable);
   return host;
+}
+
+std::string ScratchHost::misspellings() const {
+  std::string line;
+  for (const auto& name : misspeltNames(*_machine->contents())) line += (line.empty() ? "" : ", ") + name;
+  return line;
 }
 
 ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFile> machine, EffectSink& effects,

@@ -36,6 +36,9 @@ class ScratchHost final : public Host {
   /// the host must be alive whenever effects are told.
   static Result<std::unique_ptr<ScratchHost>> open(const std::string& directory, EffectSink& effects, RunLoop& runLoop);
 
+  /// In one line, the names in machine.plist that seem to be misspelt; empty when there is none.
+  std::string misspellings() const;
+
   UserDatabase& users() override { return _users; }
   AdminAuthenticator& authenticator() override { return _authenticator; }
   FileSystem& files() override { return _files; }

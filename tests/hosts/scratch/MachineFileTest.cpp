@@ -16,6 +16,7 @@
 #include "effects/EffectMatchers.h"
 #include "hosts/scratch/KeyTable.h"
 #include "hosts/scratch/MachineFile.h"
+#include "hosts/scratch/Misspellings.h"
 
 namespace tavisk {
 namespace {
@@ -32,6 +33,32 @@ TEST(KeyTable, hasEachKeyOnceInAPlaceThatItHasToo) {
     EXPECT_TRUE(known.insert(key).second) << key;
     if (row.type == KeyType::dictionaries) known.insert(key + "/*");
   }
+}
+
+TEST(Misspellings, areNamesThatAreLikeAKnownOneAndRefusalsOfNoSetting) {
+  const std::tuple<const char*, const char*> cases[] = {
+      {"Clock|TimeZone", R"-("Clock" "TimeZone" (is "Time Zone" meant?))-"},
+      {"clock|Time Zone", R"-("clock" (is "Clock" meant?))-"},
+      {"Power Sources|AC Power|Wake on Lan", R"-("Power Sources" "AC Power" "Wake on Lan" (is "Wake On LAN" meant?))-"},
+      {"Disks|disk0|Mountpoint", R"-("Disks" "disk0" "Mountpoint" (is "Mount Point" meant?))-"},
+      {"Disks|disk0|CDs", nullptr},
+      {"Clock|Remark", nullptr},
+      {"Preferences|Clocks", nullptr},
+      {"Refusals|Time zone", R"-("Refusals" "Time zone" (is "Time Zone" meant?))-"},
+      {"Refusals|Sleep (read)", R"-("Refusals" "Sleep (read)" (no setting is called so))-"},
+      {"Refusals|* (read)", nullptr},
+      {"Refusals|Time Zone (read)", nullptr},
+      {"Refusals|Firmware Variable boot-args", nullptr},
+  };
+  for (const auto& [place, told] : cases) {
+    auto machine = PropertyList("no");
+    const auto names = split(place, "|");
+    for (auto name = names.rbegin(); name != names.rend(); ++name) machine = keys({{*name, machine}});
+    EXPECT_EQ(misspeltNames(*machine.asDictionary()),
+              told ? std::vector<std::string>{told} : std::vector<std::string>{});
+  }
+  const auto signals = keys({{"Signals", PropertyList::Array{keys({{"Proces", 1}})}}});
+  EXPECT_THAT(misspeltNames(signals), ElementsAre(HasSubstr("\"Process\"")));
 }
 
 struct MachineFileTest : testing::Test {
