@@ -20,6 +20,8 @@ OWN = "216b9a59-f9b0-4992-b711-0922c3e0edf7"
 LEFT = ["/etc/localtime", "/etc/systemd/logind.conf.d/50-other.conf", "/etc/udev/rules.d/60-other.rules",
         "/etc/chrony/sources.d/other.sources", "/etc/systemd/network/99-default.link"]
 
+OTHERS = ["/etc", "/etc/systemd", "/etc/systemd/system.conf.d", "/etc/tmpfiles.d", "/run", "/var", "/var/lib"]
+
 
 def entry(description):
     return b"\7\0\0\0" + b"\1\0\0\0" + b"\4\0" + (description + "\0").encode("utf-16-le") + b"\x7f\xff\4\0"
@@ -36,6 +38,10 @@ class Purge(unittest.TestCase):
         self.root = pathlib.Path(self._folder.name)
         self.variables = self.root / "sys/firmware/efi/efivars"
         (self.root / "etc").mkdir()
+        # What other packages have.
+        self.file("/var/lib/dpkg/status", b"Package: other\nStatus: install ok installed\nVersion: 1\nArchitecture: all\n"
+                  b"Maintainer: o <o@example>\nDescription: o\n")
+        self.file("/var/lib/dpkg/info/other.list", "".join(f"{folder}\n" for folder in OTHERS).encode())
 
     def file(self, path, contents=b"x"):
         file = self.root / path.lstrip("/")
@@ -53,17 +59,21 @@ class Purge(unittest.TestCase):
         return result.stderr
 
     def files(self):
-        return sorted("/" + str(path.relative_to(self.root)) for path in self.root.rglob("*") if path.is_file())
+        return sorted("/" + str(path.relative_to(self.root)) for path in self.root.rglob("*")
+                      if path.is_file() and "dpkg" not in path.parts)
 
     def test_takes_every_file_of_its_own_and_no_other(self):
         for pattern in re.search(r"own_files='\n(.*?)\n'", SCRIPT.read_text(), re.DOTALL)[1].split():
             self.file(pattern.replace("*", "some") + ("" if "." in pattern else "/file"))
-        self.file("/etc/.tavisk-1234567")
+        for folder in ("/etc", "/Library/Preferences/SystemConfiguration"):
+            self.file(folder + "/.tavisk-1234567")
         for path in LEFT:
             self.file(path)
         self.assertEqual(self.purge(), "")
         self.assertEqual(self.files(), sorted(LEFT))
-        self.assertFalse((self.root / "Library").exists())
+        folders = {"/" + str(path.relative_to(self.root)) for path in self.root.rglob("*") if path.is_dir()}
+        kept = {str(parent) for path in LEFT for parent in pathlib.Path(path).parents}
+        self.assertEqual(folders - {"/var/lib/dpkg", "/var/lib/dpkg/info"}, {*kept, *OTHERS} - {"/"})
 
     def test_takes_its_boot_entries_out_of_the_order_first(self):
         self.variable("Boot0001", entry("debian"))
