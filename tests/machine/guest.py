@@ -22,7 +22,7 @@ exec sh /agent.sh /dev/ttyS1
 """
 FOLDERS = ["bin", "dev", "etc", "lib64", "proc", "run", "sys", "tmp", "usr/lib", "usr/sbin", "usr/share"]
 WHOLE = ["usr/share/zoneinfo"]
-PROGRAMS = ["usr/sbin/ethtool", "usr/sbin/tavisk"]
+PROGRAMS = ["usr/sbin/ethtool", "usr/bin/tavisk"]
 FILES = ["etc/group", "etc/passwd", *PROGRAMS]
 
 
