@@ -10,6 +10,7 @@ import sys
 import time
 import unittest
 
+import reports
 from machine import ScratchMachine, program_and_arguments
 
 AT_ONCE = 0.15  # seconds
@@ -49,6 +50,7 @@ class Ending(Run):
         for number in (signal.SIGINT, signal.SIGTERM, signal.SIGHUP):
             with self.subTest(number):
                 self.assertEqual(self.end([], number), 0)
+                self.assertEqual(reports.faults(self.report.read_text()), [])
                 last = json.loads(self.report.read_text().splitlines()[-1])
                 self.assertEqual((last["report"], last["signal"]), (1, number.name))
 

@@ -20,15 +20,19 @@ usage: transcript.py PROGRAM TRANSCRIPT
     !effects [["Time", "applied"]]     every effect, in order
     !log a line of system.log          every line, in order
 
+Each case is run twice, the second time with a report, whose lines have to be as its schema says.
 \\xNN is that byte, in quoted words, typed lines and expected lines; # begins a comment line before the first case.
 """
 
+import copy
 import difflib
 import json
 import re
 import shlex
 import sys
+import tempfile
 
+import reports
 from machine import ScratchMachine, merged, program_and_arguments
 
 
@@ -82,19 +86,26 @@ class Case:
     def machines(self, found):
         """The machine as it should be and as it is."""
         changes = value_of(*self.wanted["machine"])
-        expected = merged(self.description or {}, changes)
+        expected = merged(copy.deepcopy(self.description or {}), changes)
         if "Authorization" not in changes:
             found.pop("Authorization", None)
             expected.pop("Authorization", None)
         return expected, found
 
     def differences(self, program):
+        yield from self.differences_of_run(program, {})
+        with tempfile.NamedTemporaryFile("r", errors="replace") as report:
+            kept = {"TAVISK_REPORT": report.name}
+            yield from (f"{line} (with a report)" for line in self.differences_of_run(program, kept))
+            yield from (f"  report: {fault}" for fault in reports.faults(report.read()))
+
+    def differences_of_run(self, program, environment):
         with ScratchMachine(program, self.description) as machine:
             for path, content in self.files:
                 machine.file(path, content)
             for path, target in self.links:
                 machine.place(path).symlink_to(target)
-            output, errors, status = machine.run(self.words, self.typed, self.environment)
+            output, errors, status = machine.run(self.words, self.typed, {**environment, **self.environment})
             errors = errors.decode(errors="replace").replace(str(machine.directory), "DIR").splitlines()
             yield from compared("output", self.output, output)
             yield from compared("standard error", self.wanted["error"], errors)
@@ -103,6 +114,7 @@ class Case:
             yield from compared("machine", *self.machines(machine.read()))
             for path, _, content in (wanted.partition(" ") for wanted in self.wanted["plist"]):
                 yield from compared(path, value_of(content), machine.read(path))
+            yield from (f"  effects.log: {fault}" for fault in reports.faults_of_effects(machine.effects()))
             for wanted in self.wanted["effects"]:
                 found = [[effect["setting"], effect["outcome"]] for effect in machine.effects()]
                 yield from compared("effects", json.loads(wanted), found)

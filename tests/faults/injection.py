@@ -11,6 +11,10 @@ import pathlib
 import re
 import stat
 import subprocess
+import sys
+
+sys.path.append(str(pathlib.Path(__file__).parents[1] / "cli"))
+import reports  # noqa: E402
 
 KILL = "KILL"
 OPEN = "EIO ENOMEM EMFILE EACCES EROFS ENOSPC EINTR"
@@ -67,13 +71,10 @@ class Place:
         return self._at(self._work + "/trace").read_text(errors="replace")
 
     def report(self):
-        """The lines of the last run's report; None when one of them is not whole."""
+        """The lines of the last run's report; None when one of them is not whole, or not as its schema says."""
         file = self._at(self._work + "/report")
-        lines = file.read_bytes().split(b"\n") if file.exists() else [b""]
-        try:
-            return [json.loads(line) for line in lines[:-1]] if not lines[-1] else None
-        except ValueError:
-            return None
+        text = file.read_text(errors="replace") if file.exists() else ""
+        return None if reports.faults(text) else [json.loads(line) for line in text.split("\n")[:-1]]
 
     def run(self, words, *strace):
         self._at(self._work + "/report").unlink(missing_ok=True)
@@ -193,7 +194,7 @@ class Sweep:
     def _wrong_report(self, state, status):
         entries = self._place.report()
         if entries is None:
-            return [("half a line in the report", "")]
+            return [("a report that is not as its schema says", "")]
         effects = [effect for effect in self._effects() if effect["setting"] not in self._lacking]
         outcomes = {effect["outcome"] for effect in effects}
         isnt_new = not self._is(state, self._new)
