@@ -18,7 +18,7 @@ import server
 import startup
 import trees
 
-REMOTE = ["avahi-daemon", "iproute2", "openssh-server", "systemd-resolved"]
+REMOTE = ["avahi-daemon", "iproute2", "jq", "openssh-server", "sudo", "systemd-resolved"]
 KINDS = {
     "container": [lambda: faults.FewFaults("systemd-timesyncd", *REMOTE), lambda: container.Container("chrony"),
                   lambda: container.Container("ntpsec")],

@@ -5,6 +5,7 @@
 usage: test_documents.py PROGRAM FILLED-DOCUMENTS SOURCES
 """
 
+import json
 import os
 import pathlib
 import re
@@ -42,16 +43,6 @@ class Manual(unittest.TestCase):
         for word, argument in told:
             self.assertEqual(bool(argument), word.startswith("-set"), word)
 
-    def test_recipe_for_scripts_tells_success_from_failure(self):
-        recipe = re.search(r"^\.EX\n(.*?)\n\.EE", section("EXIT STATUS"), re.MULTILINE | re.DOTALL)[1]
-        refusing = "<dict><key>Refusals</key><dict><key>Network Time Server</key><string>no</string></dict></dict>"
-        for wanted, is_done in (("-settimezone Europe/Paris", True), ("-settimezone Europe/Pari", False),
-                                ("-settimezon Europe/Paris", False), ("", False),
-                                ("-setnetworktimeserver time.example", False), ("-setlocalsubnetname files", True)):
-            script = recipe.replace("-settimezone Europe/Paris", wanted)
-            printed = run(["sh", "-c", script], description=refusing).stdout
-            self.assertEqual(printed == "done\n", is_done, wanted)
-
     def test_lists_the_files_that_purging_removes(self):
         purged = re.search(r"own_files='\n(.*?)\n'", (SOURCES / "debian/tavisk.postrm").read_text(), re.DOTALL)[1]
         listed = re.findall(r"^\.I (/.*)$", section("FILES").split("Purging also")[0], re.MULTILINE)
@@ -64,6 +55,36 @@ class Manual(unittest.TestCase):
         self.assertTrue(written)
         for path in written:
             self.assertIn(path, section("FILES"))
+
+
+class Installed(unittest.TestCase):
+    def test_documents_name_what_is_there(self):
+        with tempfile.TemporaryDirectory() as tree:
+            subprocess.run(["cmake", "--install", DOCUMENTS.parent, "--prefix", "/usr"], env={**os.environ, "DESTDIR": tree},
+                           stdout=subprocess.DEVNULL, check=True)
+            top = pathlib.Path(tree)
+            self.assertEqual(os.readlink(top / "usr/sbin/tavisk"), "../bin/tavisk")
+            self.assertTrue(os.access(top / "usr/sbin/tavisk", os.X_OK))
+            folder = top / "usr/share/doc/tavisk"
+            self.assertEqual(sorted(path.name for path in folder.iterdir()), ["README.md", "SECURITY.md", "examples"])
+            for page in (*folder.glob("*.md"), *folder.glob("examples/*"), *(top / "usr/share/man").rglob("tavisk*")):
+                text = page.read_text().replace("\\-", "-") if page.is_file() else ""
+                for name in re.findall(r"/usr/share/(?:doc/)?tavisk/[\w./-]*\w", text):
+                    self.assertTrue((top / name[1:]).exists(), (page, name))
+                for name in re.findall(r"`([\w./-]+)`", text):
+                    self.assertTrue((folder / name).exists() or not (SOURCES / name).exists(), (page, name))
+
+    def test_manual_tells_each_member_of_the_report_and_each_setting(self):
+        def names(part):
+            own = list(part.get("properties", {})) if isinstance(part, dict) else []
+            return own + [name for below in part.values() for name in names(below)] if isinstance(part, dict) else own
+
+        schema = json.loads((SOURCES / "packaging/report.schema.json").read_text())
+        told = set(re.findall(r"\w+", section("REPORT")))
+        self.assertEqual(set(names(schema)) - told, set())
+        settings = re.findall(r'constexpr const char\* \w+ = "(.*)";', (SOURCES / "src/effects/SettingNames.h").read_text())
+        page = (DOCUMENTS / "share/man/man5/tavisk-machine.5").read_text().replace("\\-", "-").splitlines()
+        self.assertEqual({f"{name}NAME" if name.endswith(" ") else name for name in settings} - set(page), {"Files"})
 
 
 class ExampleMachines(unittest.TestCase):
