@@ -24,7 +24,7 @@ CHECKS = [
           needs=frozenset({"bus"})),
     Check("without rules for sudo the manual's recipe says nothing", needs=SUDO,
           do="rm -f /etc/sudoers.d/tavisk; " + by_alice(reports.recipe())),
-    Check("the example of rules for sudo is well-formed", needs=SUDO, do=RULES + "visudo -c -q"),
+    Check("the example of rules for sudo is well-formed", needs=SUDO, do=RULES + "visudo -c -q -f /etc/sudoers.d/tavisk"),
     Check("with them the recipe tells what was done", needs=SUDO,
           do=by_alice(reports.recipe("-settimezone Asia/Tokyo -settimezone Europe/Paris")), prints="done\n",
           then={"readlink -f /etc/localtime": "/usr/share/zoneinfo/Europe/Paris\n"}),
