@@ -6,7 +6,7 @@ import reports
 from check import Check
 
 SUDO = frozenset({"container", "sudo"})
-RULES = ("install -m 0440 /usr/share/doc/tavisk/examples/sudoers /etc/sudoers.d/tavisk; "
+RULES = ("install -m 0440 /usr/share/doc/tavisk/examples/sudoers /etc/sudoers.d/example; "
          "echo '%admin ALL = (root) NOPASSWD: /usr/bin/tavisk' >/etc/sudoers.d/test; ")
 
 
@@ -23,8 +23,8 @@ CHECKS = [
     Check("the package's own test passes", do="/root/smoke-test", prints="the installed tavisk works\n",
           needs=frozenset({"bus"})),
     Check("without rules for sudo the manual's recipe says nothing", needs=SUDO,
-          do="rm -f /etc/sudoers.d/tavisk; " + by_alice(reports.recipe())),
-    Check("the example of rules for sudo is well-formed", needs=SUDO, do=RULES + "visudo -c -q -f /etc/sudoers.d/tavisk"),
+          do="rm -f /etc/sudoers.d/example; " + by_alice(reports.recipe())),
+    Check("the example of rules for sudo is well-formed", needs=SUDO, do=RULES + "visudo -c -q -f /etc/sudoers.d/example"),
     Check("with them the recipe tells what was done", needs=SUDO,
           do=by_alice(reports.recipe("-settimezone Asia/Tokyo -settimezone Europe/Paris")), prints="done\n",
           then={"readlink -f /etc/localtime": "/usr/share/zoneinfo/Europe/Paris\n"}),
