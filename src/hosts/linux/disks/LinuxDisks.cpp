@@ -8,6 +8,7 @@
 #include <utility>
 
 #include "base/Text.h"
+#include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
 namespace {

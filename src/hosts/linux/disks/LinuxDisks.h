@@ -9,12 +9,13 @@
 #include <set>
 #include <string>
 
+#include "effects/SettingNames.h"
 #include "hosts/linux/disks/DeviceEvents.h"
 #include "hosts/linux/disks/DiskFacts.h"
-#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/disks/MountTable.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/DiskSnapshot.h"
+#include "hosts/shared/FailedLooks.h"
 #include "platform/DiskDescription.h"
 
 namespace tavisk {
@@ -27,7 +28,7 @@ class LinuxDisks {
   using Snapshot = std::shared_ptr<const DiskSnapshot>;
 
   explicit LinuxDisks(const LinuxMachine& machine)
-      : _machine(machine), _devices(machine.root), _looks(machine.effects) {}
+      : _machine(machine), _devices(machine.root), _looks(machine.effects, setting::startupDisk) {}
 
   const BlockDevices& devices() const { return _devices; }
   FailedLooks& looks() { return _looks; }

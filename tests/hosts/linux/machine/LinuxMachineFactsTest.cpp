@@ -80,7 +80,7 @@ TEST(LinuxKeyboard, HasTheNumberOfItsLayout) {
     LinuxTree machine;
     machine.write("/etc/default/keyboard", keyboard);
     machine.write("/etc/vconsole.conf", console);
-    EXPECT_EQ(machine.host().keyboardInput().currentLayoutNumber(), number) << keyboard << console;
+    EXPECT_EQ(*machine.host().keyboardInput().currentLayoutNumber(), number) << keyboard << console;
   }
 }
 
@@ -88,24 +88,24 @@ TEST(LinuxUserDefaults, AreTheAdministratorsAndLanguagesElseTheMachines) {
   LinuxTree machine;
   auto& defaults = machine.host().userDefaults();
   EXPECT_FALSE(defaults.boolean("StartupDiskDebug"));
-  EXPECT_THAT(defaults.strings("VelmarLanguages"), IsEmpty());
+  EXPECT_THAT(*defaults.strings("VelmarLanguages"), IsEmpty());
   const std::pair<const char*, std::vector<std::string>> locales[] = {
       {"LANG=\"pt_BR.UTF-8\"\n", {"pt_BR"}}, {"LANG=de_DE@euro\n", {"de_DE"}}, {"LANG=C.UTF-8\n", {}}};
   for (const auto& [contents, languages] : locales) {
     machine.write("/etc/default/locale", contents);
-    EXPECT_EQ(defaults.strings("VelmarLanguages"), languages) << contents;
+    EXPECT_EQ(*defaults.strings("VelmarLanguages"), languages) << contents;
   }
   machine.write(LinuxUserDefaults::file,
                 "<plist><dict><key>StartupDiskDebug</key><true/><key>SDWirestartScanInterval</key><integer>30</integer>"
                 "<key>VelmarLanguages</key><array><string>French</string></array></dict></plist>");
   EXPECT_TRUE(defaults.boolean("StartupDiskDebug"));
   EXPECT_EQ(defaults.number("SDWirestartScanInterval"), 30.0);
-  EXPECT_THAT(defaults.strings("VelmarLanguages"), ElementsAre("French"));
+  EXPECT_THAT(*defaults.strings("VelmarLanguages"), ElementsAre("French"));
   machine.write(LinuxUserDefaults::file, "damaged");
   EXPECT_FALSE(defaults.boolean("StartupDiskDebug"));
 }
 
-TEST(LinuxMachineFacts, TellWhatCouldNotBeLookedAtOnceForEachReason) {
+TEST(LinuxMachineFacts, TellWhatCouldNotBeLookedAtOnceACommandForEachReason) {
   LinuxTree machine;
   for (const char* file :
        {"/sys/class/dmi/id/product_name", "/proc/cmdline", "/sys/class/net/eth0", "/sys/class/block"})
@@ -115,6 +115,9 @@ TEST(LinuxMachineFacts, TellWhatCouldNotBeLookedAtOnceForEachReason) {
   EXPECT_FALSE(machine.host().registry().serviceNamed("eth0"));
   EXPECT_FALSE(machine.host().programs().run("/proc/cmdline", {}));
   EXPECT_THAT(machine.log.effects, ElementsAre(FailedFor("product_name")));
+  machine.effects.commandEnds();
+  for (int times = 0; times < 2; ++times) machine.host().kernel().networkStart();
+  EXPECT_THAT(machine.log.effects, ElementsAre(FailedFor("product_name"), FailedFor("cmdline")));
 }
 
 TEST(LinuxPrograms, AnswerWithAnyStatus) {
