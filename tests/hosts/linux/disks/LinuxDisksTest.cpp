@@ -228,6 +228,36 @@ TEST(LinuxDisks, StayAsTheyWereWhenTheyCannotBeLookedAt) {
   }
 }
 
+TEST(LinuxDisks, LookAgainAtWhatCouldNotBeLookedAt) {
+  ServerDisks tree;
+  tree.mount("0:40", "/dev/sda1", "/data", "btrfs");
+  tree.addImage("sda2", 2048);
+  if (!runTool("mkfs.ext4 -L Main " + tree.at("/dev/sda2").string())) GTEST_SKIP() << "mkfs.ext4 is missing";
+  const auto hide = [&](const std::string& path) {
+    std::filesystem::rename(tree.at(path), tree.at(path + ".kept"));
+    tree.makeUnreadable(path);
+  };
+  const auto show = [&](const std::string& path) {
+    std::filesystem::remove(tree.at(path));
+    std::filesystem::rename(tree.at(path + ".kept"), tree.at(path));
+  };
+  const std::string node = "/dev/sda2";
+  const std::string number = "/sys/class/block/sda1";
+  hide(node);
+  LinuxDisks disks(tree.machine);
+  EXPECT_FALSE(disks.find({"sda2"})->volumeName);
+  show(node);
+  disks.renew({});
+  EXPECT_EQ(disks.find({"sda2"})->volumeName, "Main") << "without an event";
+  for (const auto& path : {node, number}) {
+    hide(path);
+    disks.renew({{"sda2"}, false});
+    EXPECT_EQ(disks.find({"sda2"})->volumeName, "Main") << path;
+    EXPECT_EQ(disks.find({"sda1"})->volumePath, "/data") << path;
+    show(path);
+  }
+}
+
 TEST(LinuxDisks, TellOfAVolumeThatIsUnmountedAndLosesItsNodeAtOnce) {
   ServerDisks tree;
   LinuxDisks disks(tree.machine);
