@@ -105,7 +105,7 @@ TEST(LinuxUserDefaults, AreTheAdministratorsAndLanguagesElseTheMachines) {
   EXPECT_FALSE(defaults.boolean("StartupDiskDebug"));
 }
 
-TEST(LinuxMachineFacts, TellWhatCouldNotBeLookedAtOnceACommandForEachReason) {
+TEST(LinuxMachineFacts, TellWhatCouldNotBeLookedAtOnceForEachReason) {
   LinuxTree machine;
   for (const char* file :
        {"/sys/class/dmi/id/product_name", "/proc/cmdline", "/sys/class/net/eth0", "/sys/class/block"})
@@ -115,9 +115,6 @@ TEST(LinuxMachineFacts, TellWhatCouldNotBeLookedAtOnceACommandForEachReason) {
   EXPECT_FALSE(machine.host().registry().serviceNamed("eth0"));
   EXPECT_FALSE(machine.host().programs().run("/proc/cmdline", {}));
   EXPECT_THAT(machine.log.effects, ElementsAre(FailedFor("product_name")));
-  machine.effects.commandEnds();
-  for (int times = 0; times < 2; ++times) machine.host().kernel().networkStart();
-  EXPECT_THAT(machine.log.effects, ElementsAre(FailedFor("product_name"), FailedFor("cmdline")));
 }
 
 TEST(LinuxPrograms, AnswerWithAnyStatus) {
