@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <mutex>
 #include <optional>
 #include <string>
@@ -47,6 +48,11 @@ class EffectSink {
   void observe(const SettingValue& value);
   bool wantsValues();
 
+  /// What is told from here on belongs to the next command.
+  void commandEnds() { ++_endedCommands; }
+  /// How many have ended. From any thread.
+  unsigned endedCommands() const { return _endedCommands; }
+
   /// Records every change that has begun and not ended as failed for this reason. Safe from any thread.
   void interrupt(const std::string& why);
 
@@ -63,6 +69,7 @@ class EffectSink {
   std::mutex _mutex;
   std::vector<EffectChannel*> _channels;
   std::vector<OpenChange> _open;
+  std::atomic<unsigned> _endedCommands = 0;
 };
 
 }  // namespace tavisk

@@ -102,12 +102,14 @@ void RemoteServerSettings::callHandler(const std::string& word, const CommandTab
   const auto limit = _context.runLoop.limitWaits(_context.longestCommand);
   std::visit(Call{*_serverCommands, arguments}, handlerNamed(entry.selector));
   if (_report) _report->commandEnds(_serverCommands->error(), _context.output.takePrinted());
+  _effects.commandEnds();
 }
 
 void RemoteServerSettings::refuseWord(const std::string& word) {
   _context.output.takePrinted();
   _context.output.print("Error: %s is not a valid command\n", word.c_str());
   if (_report) _report->wordRefused(word, _serverCommands->error(), _context.output.takePrinted());
+  _effects.commandEnds();
 }
 
 }  // namespace tavisk

@@ -5,6 +5,7 @@
 #include <optional>
 #include <string>
 
+#include "base/Result.h"
 #include "platform/DiskDescription.h"
 
 namespace tavisk {
@@ -79,13 +80,14 @@ class BootSettings {
     bool operator==(const BootChoice&) const = default;
   };
 
-  /// One of `preboot`. From any thread.
+  /// One of `preboot`; what cannot be looked at is none known, and is told to the effects. From any thread.
   virtual int preBootEnvironment() = 0;
   virtual LegacyBootSupport legacyBootSupport() = 0;
   virtual BootPreference bootPreference() = 0;
   virtual NetworkBootPreference networkBootPreference() = 0;
   virtual ServiceStatus setBootPreference(const BootChoice& choice) = 0;
-  virtual ServiceStatus setFirmwareVariable(const std::string& name, const std::string& value) = 0;
+  /// A value that could not be found out is not written, and its failure is the reason.
+  virtual ServiceStatus setFirmwareVariable(const std::string& name, const Result<std::string>& value) = 0;
 };
 
 class DiskManagementService : public DiskQueries, public BootSettings {};

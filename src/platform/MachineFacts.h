@@ -7,6 +7,8 @@
 #include <string>
 #include <vector>
 
+#include "base/Result.h"
+
 namespace tavisk {
 
 /// What the kernel says of the machine.
@@ -27,7 +29,7 @@ class KeyboardInputService {
   virtual ~KeyboardInputService() = default;
 
   /// The layout number of the current keyboard input source; absent when there is no source or it has no number.
-  virtual std::optional<std::int64_t> currentLayoutNumber() = 0;
+  virtual Result<std::optional<std::int64_t>> currentLayoutNumber() = 0;
 };
 
 /// One address of a network interface; an interface with several addresses occurs several times.

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "base/PropertyList.h"
+#include "base/Result.h"
 
 namespace tavisk {
 
@@ -22,7 +23,8 @@ class PreferencesStore {
   virtual std::optional<PropertyList> value(const std::string& key) = 0;
 };
 
-/// The user's defaults, read afresh at each question. A value of another type reads as absent. From any thread.
+/// The user's defaults, read afresh at each question. A value of another type reads as absent, and so does what cannot
+/// be looked at, which is told to the effects. From any thread.
 class UserDefaults {
  public:
   virtual ~UserDefaults() = default;
@@ -30,8 +32,8 @@ class UserDefaults {
   /// False when absent.
   virtual bool boolean(const std::string& key) = 0;
   virtual std::optional<double> number(const std::string& key) = 0;
-  /// Empty when absent.
-  virtual std::vector<std::string> strings(const std::string& key) = 0;
+  /// Empty when absent; what cannot be looked at is a failure.
+  virtual Result<std::vector<std::string>> strings(const std::string& key) = 0;
 };
 
 }  // namespace tavisk

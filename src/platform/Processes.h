@@ -22,7 +22,8 @@ class ProcessUtilities {
   /// `signal` is a number of signal(7).
   virtual void sendSignal(int signal, ProcessId process) = 0;
 
-  /// Whether the keyboard is disabled while the enclosure lock is engaged, from now on until the machine restarts.
+  /// Whether the keyboard is disabled while the enclosure lock is engaged, from now on until the machine restarts. A
+  /// host may wait with it for writeMachinePreferences().
   virtual void setLockEnclosureState(bool disablesKeyboard) = 0;
   /// Sets a preference of any application, for any user, on this host.
   virtual void setMachineBoolean(const std::string& key, bool value) = 0;

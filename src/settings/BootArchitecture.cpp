@@ -22,12 +22,14 @@ void chooseArchitecture(const CommandContext& context, const std::string& archit
   tellWhetherSaved(context.output, file.write(settings));
 }
 
-void chooseDefaultArchitecture(const CommandContext& context) {
+/// Whether there was a file to take the architecture out of; none is made for that.
+bool chooseDefaultArchitecture(const CommandContext& context) {
   auto& file = context.host.bootLoaderFile();
   auto settings = file.read();
   if (settings) settings->remove(BootLoaderFile::architectureKey);
   context.output.putLine("setting kernel architecture to default");
   tellWhetherSaved(context.output, settings && file.write(*settings));
+  return settings.has_value();
 }
 
 }  // namespace
@@ -46,7 +48,7 @@ void ServerCommands::setKernelBootArchitecture(const std::string& architecture) 
   if (architecture == "i386" || architecture == "x86_64") {
     chooseArchitecture(_context, architecture);
   } else if (caseInsensitiveEqualTo(architecture, "default")) {
-    chooseDefaultArchitecture(_context);
+    if (!chooseDefaultArchitecture(_context)) refuse("i386 or x86_64, as there is no file that could be set back");
   } else {
     _context.output.putLine("Invalid argument. Valid arguments are i386, x86_64, or default.");
     refuse("i386, x86_64 or default");

@@ -118,7 +118,7 @@ class SDController : public SystemSearcherProtocol {
   SDRecordRef _selectedImageOn(const std::string& interface) const;
   bool _writeBootChoice(const SDDisk& system);
   void _logBootChoice(const SDDisk& system) const;
-  std::string _languageAndKeyboard() const;
+  Result<std::string> _languageAndKeyboard() const;
 
   /// Network boot images
   SDRecordRef _removeImage(const std::string& identifier);

@@ -149,11 +149,13 @@ void SDController::_logBootChoice(const SDDisk& system) const {
   log.debug("****** OF Device Path: %@", {system.deviceTreePath()});
 }
 
-std::string SDController::_languageAndKeyboard() const {
-  const auto layout = _environment.host.keyboardInput().currentLayoutNumber().value_or(0);
+Result<std::string> SDController::_languageAndKeyboard() const {
+  const auto layout = _environment.host.keyboardInput().currentLayoutNumber();
+  if (!layout) return layout.failure();
   const auto languages = _environment.host.userDefaults().strings("VelmarLanguages");
-  const auto language = canonicalLocaleIdentifier(languages.empty() ? "en" : languages.front());
-  return formatMessage("%@:%ld", {language, layout});
+  if (!languages) return languages.failure();
+  const auto language = canonicalLocaleIdentifier(languages->empty() ? "en" : languages->front());
+  return formatMessage("%@:%ld", {language, layout->value_or(0)});
 }
 
 ServiceStatus SDController::setTargetDiskMode() {

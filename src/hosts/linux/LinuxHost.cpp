@@ -31,12 +31,12 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _registry(_root, _disks.looks()),
       _networkInterfaces(effects),
       _kernel(_root, _disks.looks()),
-      _keyboardInput(_root, _disks.looks()),
+      _keyboardInput(_root),
       _userDefaults(_root, _disks.looks()),
       _programs(_machine),
       _processTermination(_machine),
-      _preferences(_machine),
-      _processes(_machine, _preferences, _controller) {
+      _preferences(_machine, _controller),
+      _processes(_machine, _preferences) {
   effects.addChannel(_journalLog);
 }
 

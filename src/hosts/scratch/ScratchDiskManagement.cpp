@@ -114,8 +114,9 @@ ServiceStatus ScratchDiskManagement::setBootPreference(const BootChoice& choice)
   return change(bootPreferenceSetting(), choice, "Set Boot Preference Status");
 }
 
-ServiceStatus ScratchDiskManagement::setFirmwareVariable(const std::string& name, const std::string& value) {
-  return change(variableNamed(name), value, "Set Variable Status");
+/// Whatever a value is made of is in this machine's file, and was read.
+ServiceStatus ScratchDiskManagement::setFirmwareVariable(const std::string& name, const Result<std::string>& value) {
+  return value ? change(variableNamed(name), *value, "Set Variable Status") : failed;
 }
 
 template <typename Value>

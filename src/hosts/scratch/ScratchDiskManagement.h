@@ -28,7 +28,7 @@ class ScratchDiskManagement final : public DiskManagementService {
   BootPreference bootPreference() override;
   NetworkBootPreference networkBootPreference() override;
   ServiceStatus setBootPreference(const BootChoice& choice) override;
-  ServiceStatus setFirmwareVariable(const std::string& name, const std::string& value) override;
+  ServiceStatus setFirmwareVariable(const std::string& name, const Result<std::string>& value) override;
 
  private:
   /// Makes the change unless the firmware answers it with the status under the key.

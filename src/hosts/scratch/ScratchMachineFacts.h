@@ -29,7 +29,7 @@ class ScratchKeyboardInputService final : public KeyboardInputService {
  public:
   explicit ScratchKeyboardInputService(MachineFile& machine) : _machine(machine) {}
 
-  std::optional<std::int64_t> currentLayoutNumber() override {
+  Result<std::optional<std::int64_t>> currentLayoutNumber() override {
     const auto section = _machine.section("Keyboard Input");
     const auto* number = section.find("Layout Number");
     return number ? std::optional(*number->asInteger()) : std::nullopt;

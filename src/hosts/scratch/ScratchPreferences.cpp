@@ -37,7 +37,7 @@ void ScratchPreferencesStore::writeOut() {
   _settings.change(countAt(setting::preferencesWrite, "", writes), "write");
 }
 
-std::optional<PropertyList> ScratchUserDefaults::value(const std::string& key) const {
+Result<std::optional<PropertyList>> ScratchUserDefaults::value(const std::string& key) const {
   const auto defaults = _machine.section("User Defaults");
   const auto* value = defaults.find(key);
   return value ? std::optional(*value) : std::nullopt;

@@ -28,7 +28,7 @@ class ScratchUserDefaults final : public PropertyListDefaults {
   explicit ScratchUserDefaults(MachineFile& machine) : _machine(machine) {}
 
  protected:
-  std::optional<PropertyList> value(const std::string& key) const override;
+  Result<std::optional<PropertyList>> value(const std::string& key) const override;
 
  private:
   MachineFile& _machine;

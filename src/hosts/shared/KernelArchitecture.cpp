@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/shared/KernelArchitecture.h"
 
+#include <memory>
 #include <utility>
 
 #include "effects/SettingNames.h"
@@ -44,10 +45,12 @@ Setting<std::string> kernelArchitecture(const PropertyListFile& file, const Prop
   setting.name = setting::kernelArchitecture;
   setting.where = file.path();
   setting.stored = [&file] { return architectureOf(file.read()); };
-  setting.store = [&file, &contents](const std::string&) -> Result<void> {
+  const auto places = std::make_shared<WrittenPlaces>();
+  setting.written = [places] { return places->text(); };
+  setting.store = [&file, &contents, places](const std::string&) -> Result<void> {
     auto present = file.readToChange();
     if (!present) return present.failure();
-    return file.write(changed(std::move(present).value(), contents));
+    return file.write(changed(std::move(present).value(), contents), *places);
   };
   // Also when nothing changes: whether the file can be written is what is asked for.
   setting.always = true;

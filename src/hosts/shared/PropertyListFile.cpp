@@ -39,20 +39,26 @@ Result<PropertyList::Dictionary> PropertyListFile::readToChange() const {
   return parsed || !isDamage(parsed.failure()) ? parsed : PropertyList::Dictionary();
 }
 
-Result<void> PropertyListFile::write(const PropertyList::Dictionary& contents) const {
-  const auto written = writePropertyList(contents);
-  if (!written) return retold(written.failure(), written.failure().tried, _path);
-  if (auto kept = keepDamaged(); !kept) return kept;
-  return _root.write(_path, *written);
+Result<void> PropertyListFile::write(const PropertyList::Dictionary& contents, WrittenPlaces& written) const {
+  const auto text = writePropertyList(contents);
+  if (!text) return retold(text.failure(), text.failure().tried, _path);
+  if (auto kept = keepDamaged(written); !kept) return kept;
+  return put(_path, *text, written);
 }
 
-Result<void> PropertyListFile::keepDamaged() const {
+Result<void> PropertyListFile::put(const std::string& path, const std::string& text, WrittenPlaces& written) const {
+  auto done = _root.write(path, text);
+  if (done) written.add(path);
+  return done;
+}
+
+Result<void> PropertyListFile::keepDamaged(WrittenPlaces& written) const {
   const auto old = text();
   if (!old) return old.failure();
   const auto parsed = *old ? parseDictionary(**old, _path) : PropertyList::Dictionary();
   if (parsed) return {};
   if (!isDamage(parsed.failure())) return parsed.failure();
-  return _root.write(_path + damagedSuffix, **old);
+  return put(_path + damagedSuffix, **old, written);
 }
 
 Result<std::optional<std::string>> PropertyListFile::text() const {

@@ -8,6 +8,7 @@
 #include "base/PropertyList.h"
 #include "base/Result.h"
 #include "hosts/shared/SystemRoot.h"
+#include "hosts/shared/WrittenPlaces.h"
 
 namespace tavisk {
 
@@ -24,13 +25,14 @@ class PropertyListFile {
   /// write() would keep it beside as damaged. A file that cannot be read is a failure, and must not be written.
   Result<PropertyList::Dictionary> readToChange() const;
   /// Replaces the file whole, or makes it and its folders. What read() cannot understand is kept beside it first, as
-  /// NAME.damaged.
-  Result<void> write(const PropertyList::Dictionary& contents) const;
+  /// NAME.damaged. The files that are written are added to `written`.
+  Result<void> write(const PropertyList::Dictionary& contents, WrittenPlaces& written) const;
 
  private:
   /// Absent when there is no file.
   Result<std::optional<std::string>> text() const;
-  Result<void> keepDamaged() const;
+  Result<void> keepDamaged(WrittenPlaces& written) const;
+  Result<void> put(const std::string& path, const std::string& text, WrittenPlaces& written) const;
 
   const SystemRoot& _root;
   std::string _path;

@@ -10,22 +10,24 @@ Reading<bool> switchIn(const PropertyList& preference) {
 }
 
 bool PropertyListDefaults::boolean(const std::string& key) {
-  const auto found = value(key);
+  const auto found = value(key).valueOr(std::nullopt);
   return found && found->asBoolean() && *found->asBoolean();
 }
 
 std::optional<double> PropertyListDefaults::number(const std::string& key) {
-  const auto found = value(key);
+  const auto found = value(key).valueOr(std::nullopt);
   if (!found) return std::nullopt;
   if (const auto* integer = found->asInteger()) return static_cast<double>(*integer);
   return found->asReal() ? std::optional(*found->asReal()) : std::nullopt;
 }
 
-std::vector<std::string> PropertyListDefaults::strings(const std::string& key) {
+Result<std::vector<std::string>> PropertyListDefaults::strings(const std::string& key) {
   const auto found = value(key);
+  if (!found) return found.failure();
   std::vector<std::string> strings;
-  if (!found || !found->asArray()) return strings;
-  for (const auto& member : *found->asArray())
+  const auto* members = *found ? (*found)->asArray() : nullptr;
+  if (!members) return strings;
+  for (const auto& member : *members)
     if (const auto* text = member.asString()) strings.push_back(*text);
   return strings;
 }

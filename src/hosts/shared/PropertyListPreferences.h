@@ -16,11 +16,11 @@ class PropertyListDefaults : public UserDefaults {
  public:
   bool boolean(const std::string& key) override;
   std::optional<double> number(const std::string& key) override;
-  std::vector<std::string> strings(const std::string& key) override;
+  Result<std::vector<std::string>> strings(const std::string& key) override;
 
  protected:
-  /// Absent when there is none, of any type.
-  virtual std::optional<PropertyList> value(const std::string& key) const = 0;
+  /// Of any type; absent when there is none. Tells the effects when it cannot be looked at.
+  virtual Result<std::optional<PropertyList>> value(const std::string& key) const = 0;
 };
 
 }  // namespace tavisk

@@ -3,7 +3,6 @@
 #include "hosts/shared/RootedFileSystem.h"
 
 #include "base/Text.h"
-#include "effects/SettingNames.h"
 
 namespace tavisk {
 namespace {
@@ -25,44 +24,29 @@ std::string standardizedInNothing(const std::string& path) {
 
 }  // namespace
 
+/// What was looked at, after it was told what else but absence kept it from that.
+template <typename Value>
+Result<Value> RootedFileSystem::told(Result<Value> looked) {
+  if (!looked && !isAbsent(looked.failure())) _looks.tell(looked.failure());
+  return looked;
+}
+
 bool RootedFileSystem::exists(const std::string& path) {
-  const auto there = _root.isThere(path);
-  if (!there) tell(path, there.failure());
-  return there && *there;
+  return told(_root.isThere(path)).valueOr(false);
 }
 
 Result<std::string> RootedFileSystem::read(const std::string& path, std::size_t limit) {
-  auto contents = _root.read(path, limit);
-  if (!contents) tell(path, contents.failure());
-  return contents;
+  return told(_root.read(path, limit));
 }
 
 Result<std::string> RootedFileSystem::readBeginning(const std::string& path, std::size_t length) {
-  auto beginning = _root.readBeginning(path, length);
-  if (!beginning) tell(path, beginning.failure());
-  return beginning;
+  return told(_root.readBeginning(path, length));
 }
 
 Result<std::string> RootedFileSystem::standardized(const std::string& path) {
-  auto found = _root.standardized(path);
-  if (found) return found;
-  if (isAbsent(found.failure())) return standardizedInNothing(path);
-  tell(path, found.failure());
+  auto found = told(_root.standardized(path));
+  if (!found && isAbsent(found.failure())) return standardizedInNothing(path);
   return found;
-}
-
-void RootedFileSystem::tell(const std::string& path, const Failure& failure) {
-  if (isAbsent(failure)) return;
-  const auto count = countIn(path);
-  if (!count) return;
-  const auto* note = count == mostTold ? "what else cannot be looked at is not told" : "";
-  _effects.record({.setting = setting::files, .outcome = Outcome::failed, .note = note, .failure = failure});
-}
-
-std::optional<std::size_t> RootedFileSystem::countIn(const std::string& path) {
-  const std::scoped_lock lock(_mutex);
-  if (_told.size() == mostTold || !_told.insert(path).second) return std::nullopt;
-  return _told.size();
 }
 
 }  // namespace tavisk

@@ -209,7 +209,7 @@ struct RootedFileSystemTest : SystemRootTest {
   RootedFileSystem files{root, effects};
 };
 
-TEST_F(RootedFileSystemTest, tellsWhatCannotBeLookedAtOnceAndTheFirstFew) {
+TEST_F(RootedFileSystemTest, tellsOnceForEachReasonWhatCannotBeLookedAt) {
   for (const char* path : {"/loop", "/loop/x", "/Volumes", "/none", "/Volumes/Backup/System/boot.efi/x"}) {
     files.exists(path);
     EXPECT_FALSE(files.read(path, 9));
@@ -219,12 +219,21 @@ TEST_F(RootedFileSystemTest, tellsWhatCannotBeLookedAtOnceAndTheFirstFew) {
   std::vector<std::string> told;
   for (const auto& effect : log.effects) told.push_back(effect.setting + " " + describe(*effect.failure));
   EXPECT_THAT(told, ElementsAre("Files look for on /loop: Too many levels of symbolic links",
-                                "Files look for on /loop/x: Too many levels of symbolic links",
-                                "Files read on /Volumes: not a regular file",
-                                "Files resolve on /loop/y: Too many levels of symbolic links"));
-  for (int number = 0; number < 1'000; ++number) files.exists("/loop/" + std::to_string(number));
-  EXPECT_EQ(log.effects.size(), RootedFileSystem::mostTold);
-  EXPECT_EQ(log.effects.back().note, "what else cannot be looked at is not told");
+                                "Files read on /Volumes: not a regular file"));
+}
+
+TEST(FailedLooks, AreToldOnceACommandForEachOfTheFirstFewReasons) {
+  EffectSink effects;
+  EffectLog log;
+  effects.addChannel(log);
+  FailedLooks looks(effects, "Files");
+  for (std::size_t command = 1; command <= 2; ++command) {
+    for (int number = 0; number < 1'000; ++number)
+      looks.tell({"read", "file " + std::to_string(number), "reason " + std::to_string(number / 2)});
+    EXPECT_EQ(log.effects.size(), command * FailedLooks::mostTold);
+    EXPECT_EQ(log.effects.back().note, "what else cannot be looked at is not told");
+    effects.commandEnds();
+  }
 }
 
 TEST_F(RootedFileSystemTest, hasNoFilesWithoutARoot) {

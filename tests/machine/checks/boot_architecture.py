@@ -10,6 +10,11 @@ SAVED = "changes to kernel architecture have been saved.\n"
 
 
 CHECKS = [
+    Check("what has no file to be set back in is told as refused", needs=CONTAINER,
+          do="rm -rf /Library; rm -f /run/report; TAVISK_REPORT=/run/report tavisk -setkernelbootarchitecture default; "
+             "grep -o '\"refused\":\"[a-z0-9]*' /run/report",
+          prints='setting kernel architecture to default\nchanges to kernel architecture failed to save!\n"refused":"i386\n',
+          then={"ls /Library 2>&1 | grep -c 'No such'": "1\n"}),
     Check("the boot loader's file is made with its folders", needs=CONTAINER,
           do="rm -rf /Library; tavisk -setkernelbootarchitecture i386",
           prints="setting kernel architecture to: i386\n" + SAVED,

@@ -23,10 +23,19 @@ def set_to(word, told):
 
 
 CHECKS = [
+    Check("without a lock the report says so, beside the preference", needs=CONTAINER,
+          do=f"rm -f /run/report; TAVISK_LOG=stderr TAVISK_REPORT=/run/report tavisk -get{SETTING}; "
+             "grep -o '\"setting\":\"Keyboard Lock\",\"supported\":false' /run/report; grep -c '\"effects\":\\[\\]' /run/report",
+          prints=re.compile(f'get{SETTING}: (Yes|No)\n"setting":"Keyboard Lock","supported":false\n1\n'), errors=""),
     Check("without a lock the preference is kept, and that is told", needs=CONTAINER,
           do=f"rm -rf /etc/tavisk/preferences; TAVISK_LOG=stderr tavisk -get{SETTING} -set{SETTING} yes",
           prints=f"get{SETTING}: No\nset{SETTING}: Yes\n", errors=re.compile(r"tavisk: Keyboard Lock: [^\n]*\n"),
           then={STORED: "<key>DunmereLockEnclosureState</key><true/>\n"}),
+    Check("what could not be written is not told as kept", needs=CONTAINER, status=0,
+          do=f"rm -rf /etc/tavisk/preferences; mkdir -p /etc/tavisk; touch /etc/tavisk/preferences; rm -f /run/report; TAVISK_REPORT=/run/report "
+             f"tavisk -set{SETTING} yes; rm /etc/tavisk/preferences; grep -o kept /run/report; "
+             "grep -o '\"outcome\":\"[a-z ]*\"' /run/report",
+          prints=f'set{SETTING}: Yes\n"outcome":"not supported"\n"outcome":"failed"\n'),
     Check("the preference is kept", needs=CONTAINER, kept=True, do=f"tavisk -set{SETTING} On",
           prints=f"set{SETTING}: Yes\n",
           then={f"tavisk -get{SETTING}": f"get{SETTING}: Yes\n", STORED: "<key>DunmereLockEnclosureState</key><true/>\n"}),

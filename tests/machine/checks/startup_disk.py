@@ -7,6 +7,7 @@ import re
 from check import Check
 
 NEEDS = frozenset({"startup"})
+CONTAINER = frozenset({"container"})
 CORE = "/System/Library/CoreServices"
 VOLUMES = ("Archive", "Backup", "Disc", "Projects", "Stick")
 VARIABLES = "/sys/firmware/efi/efivars"
@@ -24,6 +25,7 @@ umount /Volumes/Image
 rm -r /System /mach_kernel /run/image"""
 GET = "tavisk -getstartupdisk"
 ORDER = "efibootmgr | sed -n s/BootOrder:.//p"
+REPORT = "rm -f /run/report; TAVISK_REPORT=/run/report "
 # The line of the entry that comes first.
 FIRST = f"number=$({ORDER} | cut -d, -f1); efibootmgr -v | grep ^Boot$number"
 
@@ -51,14 +53,26 @@ def watched(command):
 
 
 CHECKS = [
+    Check("a machine without UEFI variables says that it cannot have the setting, and not that a read failed",
+          do=f"{REPORT}TAVISK_LOG=stderr tavisk -getstartupdisk; grep -o '\"setting\":\"[A-Za-z ]*\",\"supported\":false' /run/report | "
+             "sort; grep -c '\"effects\":\\[\\]' /run/report",
+          prints='"setting":"Network Startup Disk","supported":false\n"setting":"Startup Disk","supported":false\n1\n',
+          errors="", needs=CONTAINER,
+          then={"ls /var/lib/tavisk/previous-boot-order 2>&1 | grep -c 'No such'": "1\n"}),
     Check("lists exactly the startable volumes", do=LIST, needs=NEEDS,
           prints=f"{CORE}\n" + "".join(f"/Volumes/{volume}{CORE}\n" for volume in VOLUMES)),
     Check("sets a volume that firmware cannot read, by its file beside", do="tavisk -setstartupdisk Projects",
           prints=chosen("Projects"), needs=NEEDS,
           then={GET: f"/Volumes/Projects{CORE}\n",
                 FIRST: re.compile(r"Boot.*tavisk Projects\tHD\(1,GPT,.*\\EFI\\tavisk\\0f1e2d3c-.*\\boot\.efi\)\n")}),
-    Check("sets a volume of a USB disk", do=f"{ORDER} >/run/order; tavisk -setstartupdisk Stick",
-          prints=chosen("Stick"), needs=NEEDS,
+    Check("sets a volume of a USB disk, and names each place that was written, and its own entry when that was made",
+          do=f"{ORDER} >/run/order; ls {VARIABLES} >/run/names; {REPORT}tavisk -setstartupdisk Stick; "
+             f"ls {VARIABLES} | comm -13 /run/names - | grep ^Boot0 | while read entry; do "
+             "grep -c \"BootOrder-[^\\\"]*, [^\\\"]*$entry\\\"\" /run/report; done | sort -u; "
+             "grep -o '\"where\":\"/var/lib/tavisk/previous-boot-order, [^\",]*/BootOrder' /run/report",
+          prints=re.compile(re.escape(chosen("Stick")) + "(1\n)?" +
+                            re.escape(f'"where":"/var/lib/tavisk/previous-boot-order, {VARIABLES}/BootOrder\n')),
+          needs=NEEDS,
           then={GET: f"/Volumes/Stick{CORE}\n", "cmp /run/order /var/lib/tavisk/previous-boot-order": "",
                 FIRST: re.compile(r"Boot.*tavisk STICK\tHD\(1,GPT,.*\n")}),
     refused("Archive", watched("tavisk -setstartupdisk Archive"), "does not read ext4"),

@@ -12,8 +12,8 @@
 #include <string_view>
 
 #include "base/Text.h"
-#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/system/ConfigurationLines.h"
+#include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
 namespace {

@@ -8,6 +8,7 @@
 #include <utility>
 
 #include "base/Text.h"
+#include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
 namespace {
@@ -56,7 +57,7 @@ std::string folderBeneath(const Mount& overlay) {
 }
 
 /// Whether a disk is one that this system may not read, or has no node for; or one that would not answer.
-bool isOutOfReach(const Failure& failure) {
+bool isBeyondReach(const Failure& failure) {
   return !failure.code || isGone(failure) || failure.code == std::errc::permission_denied ||
          failure.code == std::errc::operation_not_permitted;
 }
@@ -116,23 +117,36 @@ void LinuxDisks::readMounts() {
   if (!mounts) return _looks.tell(mounts.failure());
   _mounts = std::move(mounts).value();
   _bySource.clear();
-  std::map<std::string, std::optional<BlockDevice>> known;
+  std::map<std::string, std::optional<DiskName>> sources;
   for (const auto& mount : _mounts.mounts()) {
     if (!mount.visible || !isNumberedApart(mount.type)) continue;
-    auto [entry, isNew] = known.try_emplace(mount.source);
-    if (isNew) entry->second = _looks.orTold(_devices.withNode(mount.source));
+    auto [entry, isNew] = sources.try_emplace(mount.source);
+    if (isNew) entry->second = diskOfSource(mount.source);
     if (!entry->second) continue;
-    auto& best = _bySource[entry->second->name.text];
+    auto& best = _bySource[entry->second->text];
     if (!best || (best->root != "/" && mount.root == "/")) best = &mount;
   }
+  _sources = std::move(sources);
+}
+
+/// The one that was known last where it cannot be looked at.
+std::optional<DiskName> LinuxDisks::diskOfSource(const std::string& source) {
+  const auto device = _devices.withNode(source);
+  if (device) return *device ? std::optional((*device)->name) : std::nullopt;
+  _looks.tell(device.failure());
+  const auto known = _sources.find(source);
+  return known == _sources.end() ? std::nullopt : known->second;
 }
 
 void LinuxDisks::readDevices(const ChangedDevices& changed) {
   auto names = changed.names;
-  if (changed.all) {
+  if (changed.all || _isListUnread) {
+    const auto all = _devices.list();
+    _isListUnread = !all;
     for (const auto& [name, facts] : _facts) names.insert(name);
-    for (const auto& name : _looks.orTold(_devices.list())) names.insert(name.text);
+    for (const auto& name : _looks.orTold(all)) names.insert(name.text);
   }
+  names.merge(std::exchange(_unread, {}));
   names.merge(newlyMounted());
   for (const auto& name : names) readDevice(name);
 }
@@ -156,18 +170,34 @@ std::set<std::string> LinuxDisks::newlyMounted() {
 
 void LinuxDisks::readDevice(const std::string& name) {
   const auto facts = factsOf(_machine.root, {name});
-  if (!facts) return _looks.tell(facts.failure());
+  if (const auto unread = whyUnread(facts)) {
+    _looks.tell(*unread);
+    _unread.insert(name);
+    if (!facts || isKnown((*facts)->device)) return;
+  }
   _facts.erase(name);
-  if (!*facts) return;
-  tellUnread(**facts);
-  _facts.emplace(name, **facts);
+  if (*facts) _facts.emplace(name, **facts);
+}
+
+/// Why a device is to be looked at again.
+std::optional<Failure> LinuxDisks::whyUnread(const Result<std::optional<DiskFacts>>& looked) const {
+  if (!looked) return looked.failure();
+  const auto& facts = *looked;
+  return facts && !isOutOfReach(*facts) ? facts->unread : std::nullopt;
 }
 
 /// In a container the machine's disks cannot be read, and are none of its business.
-void LinuxDisks::tellUnread(const DiskFacts& facts) {
-  if (!facts.unread) return;
+bool LinuxDisks::isOutOfReach(const DiskFacts& facts) const {
+  if (!facts.unread) return false;
   const auto* mount = mountOf(facts.device);
-  if ((mount && mount->root == "/") || !isOutOfReach(*facts.unread)) _looks.tell(*facts.unread);
+  return !(mount && mount->root == "/") && isBeyondReach(*facts.unread);
+}
+
+/// Whether what was read last is of the same device, with the same medium as far as that can be told.
+bool LinuxDisks::isKnown(const BlockDevice& device) const {
+  const auto known = _facts.find(device.name.text);
+  return known != _facts.end() && !known->second.unread && known->second.device.number == device.number &&
+         known->second.device.size == device.size;
 }
 
 LinuxDisks::Snapshot LinuxDisks::describe() const {

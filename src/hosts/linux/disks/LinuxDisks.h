@@ -9,25 +9,26 @@
 #include <set>
 #include <string>
 
+#include "effects/SettingNames.h"
 #include "hosts/linux/disks/DeviceEvents.h"
 #include "hosts/linux/disks/DiskFacts.h"
-#include "hosts/linux/disks/FailedLooks.h"
 #include "hosts/linux/disks/MountTable.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/DiskSnapshot.h"
+#include "hosts/shared/FailedLooks.h"
 #include "platform/DiskDescription.h"
 
 namespace tavisk {
 
 /// The disks of the machine as this run knows them: block devices with a medium, by name, then network volumes. They
-/// change only when the session says so, in a pass of the run loop. What cannot be looked at then stays as it was, and
-/// is told. From any thread.
+/// change only when the session says so, in a pass of the run loop. What cannot be looked at then stays as it was, is
+/// told, and is looked at again the next time. From any thread.
 class LinuxDisks {
  public:
   using Snapshot = std::shared_ptr<const DiskSnapshot>;
 
   explicit LinuxDisks(const LinuxMachine& machine)
-      : _machine(machine), _devices(machine.root), _looks(machine.effects) {}
+      : _machine(machine), _devices(machine.root), _looks(machine.effects, setting::startupDisk) {}
 
   const BlockDevices& devices() const { return _devices; }
   FailedLooks& looks() { return _looks; }
@@ -58,7 +59,10 @@ class LinuxDisks {
   void readDevices(const ChangedDevices& changed);
   std::set<std::string> newlyMounted();
   void readDevice(const std::string& name);
-  void tellUnread(const DiskFacts& facts);
+  std::optional<Failure> whyUnread(const Result<std::optional<DiskFacts>>& looked) const;
+  bool isOutOfReach(const DiskFacts& facts) const;
+  bool isKnown(const BlockDevice& device) const;
+  std::optional<DiskName> diskOfSource(const std::string& source);
   Snapshot describe() const;
   const Mount* mountOf(const BlockDevice& device) const;
   std::shared_ptr<DiskDescription> describe(const DiskFacts& facts) const;
@@ -70,9 +74,14 @@ class LinuxDisks {
   FailedLooks _looks;
   std::mutex _mutex;                        ///< of all that follows
   std::map<std::string, DiskFacts> _facts;  ///< by name
+  std::set<std::string> _unread;            ///< the devices of which the last look has failed
+  bool _isListUnread = false;               ///< so has that at all of them
   MountTable _mounts{""};
-  std::map<std::string, const Mount*> _bySource;  ///< the mounts of file systems that have no device number, by disk
-  Snapshot _current;                              ///< null until it is first asked for
+  /// Of file systems that have no device number: their disks by the sources that were mounted last, and the mounts by
+  /// disk.
+  std::map<std::string, std::optional<DiskName>> _sources;
+  std::map<std::string, const Mount*> _bySource;
+  Snapshot _current;  ///< null until it is first asked for
   Snapshot _old;
 };
 

@@ -85,35 +85,36 @@ Result<std::optional<BootEntry>> BootEntries::startingAs(const EfiLoadOption& op
   return std::nullopt;
 }
 
-Result<void> BootEntries::putFirst(const EfiLoadOption& option, const KeepOrder& keep) const {
+Result<void> BootEntries::putFirst(const EfiLoadOption& option, const KeepOrder& keep, WrittenPlaces& written) const {
   const auto known = startingAs(option);
   if (!known) return known.failure();
-  if (*known) return changeOrder((*known)->number, keep);
-  const auto made = make(option);
-  if (!made) return made.failure();
-  auto changed = changeOrder(*made, keep);
-  if (!changed) static_cast<void>(_variables.removeEntry({bootEntryName(*made)}, bytesOf(option)));
-  return changed;
+  if (*known) return changeOrder((*known)->number, keep, written);
+  const auto number = lowestFree();
+  if (!number) return number.failure();
+  const EfiVariableName entry{bootEntryName(*number)};
+  if (auto made = _variables.write(entry, bytesOf(option)); !made) return made;
+  auto done = readBack(entry, option);
+  if (done) done = changeOrder(*number, keep, written);
+  if (done || !_variables.removeEntry(entry, bytesOf(option))) written.add(EfiVariables::pathOf(entry));
+  return done;
 }
 
-Result<void> BootEntries::changeOrder(std::uint16_t first, const KeepOrder& keep) const {
+Result<void> BootEntries::changeOrder(std::uint16_t first, const KeepOrder& keep, WrittenPlaces& written) const {
   const auto before = order();
   if (!before) return before.failure();
   if (auto kept = keep(*before); !kept) return kept;
   std::string bytes;
   for (const auto number : withFirst(first, *before)) appendNumber(bytes, number, numberSize);
-  return _variables.write(orderVariable(), bytes);
+  auto changed = _variables.write(orderVariable(), bytes);
+  if (changed) written.add(EfiVariables::pathOf(orderVariable()));
+  return changed;
 }
 
-Result<std::uint16_t> BootEntries::make(const EfiLoadOption& option) const {
-  const auto number = lowestFree();
-  if (!number) return number.failure();
-  const EfiVariableName variable{bootEntryName(*number)};
-  if (const auto written = _variables.write(variable, bytesOf(option)); !written) return written.failure();
+Result<void> BootEntries::readBack(const EfiVariableName& variable, const EfiLoadOption& option) const {
   const auto made = _variables.read(variable);
   if (!made) return made.failure();
   if (*made != bytesOf(option)) return Failure{"read back", EfiVariables::pathOf(variable), "reads something else"};
-  return *number;
+  return {};
 }
 
 /// A number of which only an order knows is not free: what it means may come back.

@@ -11,6 +11,7 @@
 #include "base/Result.h"
 #include "hosts/linux/firmware/EfiLoadOption.h"
 #include "hosts/linux/firmware/EfiVariables.h"
+#include "hosts/shared/WrittenPlaces.h"
 
 namespace tavisk {
 
@@ -40,14 +41,15 @@ class BootEntries {
   using KeepOrder = std::function<Result<void>(const std::vector<std::uint16_t>& order)>;
   /// Puts an entry that starts the same at the front of the order; without one a new one is made first. All others keep
   /// their places. `keep` is handed the order before it is changed. A failure leaves the order as it was, and no new
-  /// entry; a run that is killed may leave an entry, which the next one uses.
-  Result<void> putFirst(const EfiLoadOption& option, const KeepOrder& keep) const;
+  /// entry; a run that is killed may leave an entry, which the next one uses. The variables that are written, and not
+  /// taken away again, are added to `written`, by their paths.
+  Result<void> putFirst(const EfiLoadOption& option, const KeepOrder& keep, WrittenPlaces& written) const;
 
  private:
   Result<std::optional<BootEntry>> read(std::uint16_t number) const;
   Result<std::optional<BootEntry>> startingAs(const EfiLoadOption& option) const;
-  Result<void> changeOrder(std::uint16_t first, const KeepOrder& keep) const;
-  Result<std::uint16_t> make(const EfiLoadOption& option) const;
+  Result<void> changeOrder(std::uint16_t first, const KeepOrder& keep, WrittenPlaces& written) const;
+  Result<void> readBack(const EfiVariableName& variable, const EfiLoadOption& option) const;
   Result<std::uint16_t> lowestFree() const;
 
   const EfiVariables& _variables;

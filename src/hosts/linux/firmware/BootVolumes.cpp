@@ -5,6 +5,7 @@
 #include <algorithm>
 
 #include "base/Text.h"
+#include "hosts/linux/system/KernelFile.h"
 
 namespace tavisk {
 namespace {

@@ -111,7 +111,7 @@ Support EfiVariables::support() const {
 }
 
 Result<std::vector<std::string>> EfiVariables::names(std::string_view vendor) const {
-  const auto all = _root.list(folder);
+  const auto all = orEmpty(_root.list(folder));
   if (!all) return all.failure();
   const auto ending = "-" + std::string(vendor);
   std::vector<std::string> names;

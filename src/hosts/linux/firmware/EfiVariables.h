@@ -42,6 +42,7 @@ class EfiVariables {
   /// Not supported when this machine has no variables, or hides them.
   Support support() const;
   /// The names of all that are this vendor's, sorted by bytes; also of those that a broken write left without a value.
+  /// None where no variables are shown.
   Result<std::vector<std::string>> names(std::string_view vendor) const;
   /// Without its attributes; absent when there is no such variable.
   Result<std::optional<std::string>> read(const EfiVariableName& variable) const;

@@ -26,6 +26,16 @@ std::string nameOf(const BootEntry& entry) {
   return bootEntryName(entry.number) + " (" + entry.option.description + ")";
 }
 
+Setting<std::string>::Found textOf(const Result<std::optional<DiskName>>& volume) {
+  if (!volume) return volume.failure();
+  return *volume ? std::optional(Reading((*volume)->text)) : std::nullopt;
+}
+
+Setting<std::string>::Found textOf(const Result<std::optional<BootSettings::NetworkBootPreference>>& network) {
+  if (!network) return network.failure();
+  return *network ? std::optional(Reading(*(*network)->interface)) : std::nullopt;
+}
+
 Result<bool> isOpenFirmware(const SystemRoot& root) {
   const auto properties = orEmpty(root.list(deviceTree));
   if (!properties) return properties.failure();
@@ -52,23 +62,15 @@ Result<int> LinuxBootSettings::environment() const {
 }
 
 int LinuxBootSettings::preBootEnvironment() {
-  const auto found = environment();
-  if (found) return *found;
-  _looks.tellDoubt(found.failure());
-  return preboot::noneKnown;
-}
-
-/// Whoever sets has asked for the environment, the keyboard or the language, and may have got a wrong answer.
-Support LinuxBootSettings::support() const {
-  if (const auto doubt = _looks.takeDoubt()) return *doubt;
-  return _variables.support();
+  return _looks.orTold(environment());
 }
 
 BootSettings::LegacyBootSupport LinuxBootSettings::legacyBootSupport() {
-  if (preBootEnvironment() != preboot::loadsBootEfi) return {0, true};
-  const auto entries = _entries.all();
+  const auto found = environment();
+  if (found && *found != preboot::loadsBootEfi) return {0, true};
+  const auto entries = found ? _entries.all() : Result<std::vector<BootEntry>>(found.failure());
   if (!entries) {
-    _machine.effects.recordFailure(setting::startupDisk, entries.failure());
+    _looks.tell(entries.failure());
     return {failed, false};
   }
   const bool supported = std::ranges::any_of(*entries, [](const auto& entry) {
@@ -87,8 +89,7 @@ Result<std::optional<BootEntry>> LinuxBootSettings::preferred() const {
   return !once || *once ? once : _entries.first();
 }
 
-Result<std::optional<DiskName>> LinuxBootSettings::preferredVolume() const {
-  const auto entry = preferred();
+Result<std::optional<DiskName>> LinuxBootSettings::volumeOf(const Preferred& entry) const {
   if (!entry) return entry.failure();
   if (!*entry) return Failure{"read", EfiVariables::pathOf(BootEntries::orderVariable()), "no entry is in the order"};
   const auto path = pathOf(**entry);
@@ -101,33 +102,39 @@ Result<std::optional<DiskName>> LinuxBootSettings::preferredVolume() const {
 }
 
 BootSettings::BootPreference LinuxBootSettings::bootPreference() {
-  const auto volume = preferredVolume();
-  if (!volume) {
-    _machine.effects.recordFailure(setting::startupDisk, volume.failure());
-    return {failed, std::nullopt};
-  }
-  if (*volume) _machine.effects.observe({setting::startupDisk, (*volume)->text, std::nullopt, ""});
-  return {0, *volume};
+  const auto volume = volumeOf(preferred());
+  tell(setting::startupDisk, textOf(volume), [this] { return textOf(volumeOf(_entries.first())); });
+  return volume ? BootPreference{0, *volume} : BootPreference{failed, std::nullopt};
 }
 
 /// Without firmware that keeps one there is no such preference, which is no failure.
 BootSettings::NetworkBootPreference LinuxBootSettings::networkBootPreference() {
   const auto support = _variables.support();
-  if (support && *support) return {};
-  const auto entry = support ? preferred() : support.failure();
-  if (!entry) return failedNetwork(entry.failure());
-  const auto path = *entry ? pathOf(**entry) : std::nullopt;
-  const auto network = path ? networkPathOf(*path) : std::nullopt;
-  if (!network) return {};
-  const auto interface = interfaceWith(network->hardwareAddress);
-  if (!interface) return failedNetwork(retold(interface.failure(), "find the interface of", nameOf(**entry)));
-  _machine.effects.observe({setting::networkStartupDisk, *interface, std::nullopt, ""});
-  return {0, network->uri, network->server, *interface};
+  const bool isUnsupported = support && *support;
+  const auto network = isUnsupported ? std::optional<NetworkBootPreference>() : networkOf(preferred());
+  tell(setting::networkStartupDisk, textOf(network), [this] { return textOf(networkOf(_entries.first())); });
+  return network ? network->value_or(NetworkBootPreference()) : NetworkBootPreference{failed, {}, {}, {}};
 }
 
-BootSettings::NetworkBootPreference LinuxBootSettings::failedNetwork(const Failure& failure) const {
-  _machine.effects.recordFailure(setting::networkStartupDisk, failure);
-  return {failed, {}, {}, {}};
+Result<std::optional<BootSettings::NetworkBootPreference>> LinuxBootSettings::networkOf(const Preferred& entry) const {
+  if (!entry) return entry.failure();
+  const auto path = *entry ? pathOf(**entry) : std::nullopt;
+  const auto network = path ? networkPathOf(*path) : std::nullopt;
+  if (!network) return std::nullopt;
+  const auto interface = interfaceWith(network->hardwareAddress);
+  if (!interface) return retold(interface.failure(), "find the interface of", nameOf(**entry));
+  return NetworkBootPreference{0, network->uri, network->server, *interface};
+}
+
+/// In force is what the next start is from; that may be another than the lasting one.
+void LinuxBootSettings::tell(const char* name, const Setting<std::string>::Found& next,
+                             const Setting<std::string>::Read& lasting) const {
+  Setting<std::string> reading;
+  reading.name = name;
+  reading.supported = [this] { return _variables.support(); };
+  reading.live = [&] { return next; };
+  reading.stored = lasting;
+  static_cast<void>(observe(reading, _machine.effects));
 }
 
 Result<std::string> LinuxBootSettings::interfaceWith(const std::string& hardwareAddress) const {
@@ -143,12 +150,14 @@ Result<std::string> LinuxBootSettings::interfaceWith(const std::string& hardware
 }
 
 ServiceStatus LinuxBootSettings::setBootPreference(const BootChoice& choice) {
-  const auto option = optionFor(choice);
+  const auto held = hold(_machine);
+  const auto option = held ? optionFor(choice) : Result<EfiLoadOption>(held.failure());
+  WrittenPlaces written;
   Setting<std::string> parts;
   parts.name = setting::startupDisk;
   parts.where = EfiVariables::pathOf(BootEntries::orderVariable());
+  parts.written = [&] { return written.text(); };
   parts.note = [this](const auto&) { return noteOnNextStart(); };
-  parts.supported = [this] { return support(); };
   parts.stored = [this]() -> Setting<std::string>::Found {
     const auto entry = _entries.first();
     if (!entry) return entry.failure();
@@ -157,9 +166,10 @@ ServiceStatus LinuxBootSettings::setBootPreference(const BootChoice& choice) {
   };
   parts.store = [&](const std::string&) -> Result<void> {
     if (!option) return option.failure();
-    return _entries.putFirst(*option, [this](const auto& order) { return keepOrder(order); });
+    return _entries.putFirst(
+        *option, [&](const auto& order) { return keepOrder(order, written); }, written);
   };
-  return change(std::move(parts), option ? targetText(*option) : choice.disk.text + " " + choice.systemFolder);
+  return change(std::move(parts), option ? targetText(*option) : choice.disk.text + " " + choice.systemFolder, held);
 }
 
 /// An entry for the volume's own boot file, if firmware would start it.
@@ -184,32 +194,40 @@ std::optional<Failure> LinuxBootSettings::whyRefused(const BootTarget& target) c
 }
 
 std::string LinuxBootSettings::noteOnNextStart() const {
-  const auto once = _entries.onlyNext().valueOr(std::nullopt);
-  return once ? "the next start alone is from " + nameOf(*once) + ", as BootNext says" : "";
+  const auto once = _entries.onlyNext();
+  if (!once) return "whether the next start alone is from elsewhere is not known: " + describe(once.failure());
+  return *once ? "the next start alone is from " + nameOf(**once) + ", as BootNext says" : "";
 }
 
-Result<void> LinuxBootSettings::keepOrder(const std::vector<std::uint16_t>& order) const {
-  return _machine.root.write(previousOrder, textOf(order) + "\n");
+Result<void> LinuxBootSettings::keepOrder(const std::vector<std::uint16_t>& order, WrittenPlaces& written) const {
+  auto kept = _machine.root.write(previousOrder, textOf(order) + "\n");
+  if (kept) written.add(previousOrder);
+  return kept;
 }
 
-ServiceStatus LinuxBootSettings::setFirmwareVariable(const std::string& name, const std::string& value) {
+ServiceStatus LinuxBootSettings::setFirmwareVariable(const std::string& name, const Result<std::string>& value) {
   const EfiVariableName variable{name, efiOwnVendor};
   Setting<std::string> parts;
   parts.name = setting::firmwareVariable + name;
+  if (!value) {
+    _machine.effects.recordFailure(parts.name, value.failure());
+    return failed;
+  }
   parts.where = EfiVariables::pathOf(variable);
-  parts.supported = [this] { return support(); };
   parts.stored = [this, variable] { return _variables.read(variable); };
   parts.store = [this, variable](const std::string& text) { return _variables.write(variable, text); };
-  return change(std::move(parts), value);
+  return change(std::move(parts), *value, hold(_machine));
 }
 
 /// Only root writes variables.
-ServiceStatus LinuxBootSettings::change(Setting<std::string> parts, const std::string& asked) const {
+ServiceStatus LinuxBootSettings::change(Setting<std::string> parts, const std::string& asked,
+                                        const MachineHold& held) const {
+  parts.supported = [this] { return _variables.support(); };
   parts.store = [where = parts.where, store = parts.store](const std::string& value) -> Result<void> {
     if (const auto failure = whyNeedsRoot("write", where)) return *failure;
     return store(value);
   };
-  const auto effect = carryOut(parts, asked, _machine);
+  const auto effect = carryOut(parts, asked, _machine, held);
   const bool isDone = effect.outcome == Outcome::applied || effect.outcome == Outcome::unchanged;
   return isDone ? 0 : failed;
 }

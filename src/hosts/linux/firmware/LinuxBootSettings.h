@@ -29,20 +29,22 @@ class LinuxBootSettings final : public BootSettings {
   BootPreference bootPreference() override;
   NetworkBootPreference networkBootPreference() override;
   ServiceStatus setBootPreference(const BootChoice& choice) override;
-  ServiceStatus setFirmwareVariable(const std::string& name, const std::string& value) override;
+  ServiceStatus setFirmwareVariable(const std::string& name, const Result<std::string>& value) override;
 
  private:
-  Result<std::optional<BootEntry>> preferred() const;
-  Result<std::optional<DiskName>> preferredVolume() const;
+  using Preferred = Result<std::optional<BootEntry>>;
+
+  Preferred preferred() const;
+  Result<std::optional<DiskName>> volumeOf(const Preferred& entry) const;
+  Result<std::optional<NetworkBootPreference>> networkOf(const Preferred& entry) const;
+  void tell(const char* name, const Setting<std::string>::Found& next, const Setting<std::string>::Read& lasting) const;
   Result<EfiLoadOption> optionFor(const BootChoice& choice) const;
   std::optional<Failure> whyRefused(const BootTarget& target) const;
   Result<int> environment() const;
-  Support support() const;
   Result<std::string> interfaceWith(const std::string& hardwareAddress) const;
-  NetworkBootPreference failedNetwork(const Failure& failure) const;
   std::string noteOnNextStart() const;
-  Result<void> keepOrder(const std::vector<std::uint16_t>& order) const;
-  ServiceStatus change(Setting<std::string> parts, const std::string& asked) const;
+  Result<void> keepOrder(const std::vector<std::uint16_t>& order, WrittenPlaces& written) const;
+  ServiceStatus change(Setting<std::string> parts, const std::string& asked, const MachineHold& held) const;
 
   LinuxMachine _machine;
   EfiVariables _variables;

@@ -24,7 +24,7 @@ class LinuxDiskManagementService final : public DiskManagementService {
   BootPreference bootPreference() override { return _boot.bootPreference(); }
   NetworkBootPreference networkBootPreference() override { return _boot.networkBootPreference(); }
   ServiceStatus setBootPreference(const BootChoice& choice) override { return _boot.setBootPreference(choice); }
-  ServiceStatus setFirmwareVariable(const std::string& name, const std::string& value) override {
+  ServiceStatus setFirmwareVariable(const std::string& name, const Result<std::string>& value) override {
     return _boot.setFirmwareVariable(name, value);
   }
 

@@ -86,7 +86,7 @@ Result<void> setAll(const SystemRoot& root, const std::vector<std::string>& keyb
 }
 
 std::string remarkOn(const Result<bool>& engaged) {
-  if (!engaged) return "the preference is kept";
+  if (!engaged) return "";
   return *engaged ? "the lock is engaged" : "the lock is open";
 }
 
@@ -95,12 +95,27 @@ bool isLockMissing(const Failure& failure) {
   return failure.code == std::errc::no_such_device || failure.code == std::errc::function_not_supported;
 }
 
+std::optional<Failure> whyNotSwitched() {
+  return whyNeedsRoot("disable keyboards", inputClass);
+}
+
+/// A lock that is out of reach may be so for whoever is not root alone.
 Support supportOf(const Result<bool>& engaged, const Result<std::vector<std::string>>& keyboards) {
-  if (!engaged && !isLockMissing(engaged.failure())) return engaged.failure();
+  if (!engaged && !isLockMissing(engaged.failure())) return whyNotSwitched().value_or(engaged.failure());
   if (!engaged) return NotSupported{engaged.failure()};
   if (!keyboards) return keyboards.failure();
   if (keyboards->empty()) return NotSupported{{"find a keyboard", inputClass, "there is none at this machine"}};
   return std::nullopt;
+}
+
+/// What is given must outlive the setting.
+Setting<KeyboardState> keyboardsUnder(const Result<bool>& engaged, const Result<std::vector<std::string>>& found,
+                                      const SystemRoot& root) {
+  Setting<KeyboardState> setting;
+  setting.name = setting::keyboardLock;
+  setting.supported = [&] { return supportOf(engaged, found); };
+  setting.live = [&] { return found ? stateOf(root, *found) : found.failure(); };
+  return setting;
 }
 
 }  // namespace
@@ -139,19 +154,24 @@ Result<bool> EnclosureLock::isEngaged() {
   return ((*status)[2] & frontPanelLockout) != 0;
 }
 
-void EnclosureLock::setDisablesKeyboard(bool disables) {
-  if (const auto failure = whyNeedsRoot("disable keyboards", inputClass))
-    return _machine.effects.recordFailure(setting::keyboardLock, *failure, textOf(disables));
+void EnclosureLock::setDisablesKeyboard(bool disables, const MachineHold& held) {
   const auto engaged = isEngaged();
   const auto found = keyboards(_machine.root);
   const auto asked = disables && engaged.valueOr(false) ? KeyboardState::disabled : KeyboardState::enabled;
-  Setting<KeyboardState> setting;
-  setting.name = setting::keyboardLock;
+  auto setting = keyboardsUnder(engaged, found, _machine.root);
   setting.note = saying(remarkOn(engaged));
-  setting.supported = [&] { return supportOf(engaged, found); };
-  setting.live = [&] { return stateOf(_machine.root, *found); };
-  setting.apply = [&](KeyboardState state) { return setAll(_machine.root, *found, state); };
-  carryOut(setting, asked, _machine);
+  setting.apply = [&](KeyboardState state) -> Result<void> {
+    if (const auto failure = whyNotSwitched()) return *failure;
+    return setAll(_machine.root, *found, state);
+  };
+  carryOut(setting, asked, _machine, held);
+}
+
+void EnclosureLock::tellKeyboards() {
+  if (!_machine.effects.wantsValues()) return;
+  const auto engaged = isEngaged();
+  const auto found = keyboards(_machine.root);
+  static_cast<void>(observe(keyboardsUnder(engaged, found, _machine.root), _machine.effects));
 }
 
 }  // namespace tavisk

@@ -4,6 +4,8 @@
 
 #include <utility>
 
+#include "hosts/linux/system/KernelFile.h"
+
 namespace tavisk {
 namespace {
 

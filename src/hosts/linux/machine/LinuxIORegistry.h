@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include "hosts/linux/disks/FailedLooks.h"
+#include "hosts/shared/FailedLooks.h"
 #include "hosts/shared/SystemRoot.h"
 #include "platform/IORegistry.h"
 

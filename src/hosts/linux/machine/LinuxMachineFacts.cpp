@@ -95,12 +95,9 @@ Result<std::string> LinuxKeyboardInputService::layout() const {
   return keymap->value_or("");
 }
 
-std::optional<std::int64_t> LinuxKeyboardInputService::currentLayoutNumber() {
+Result<std::optional<std::int64_t>> LinuxKeyboardInputService::currentLayoutNumber() {
   const auto current = layout();
-  if (!current) {
-    _looks.tellDoubt(current.failure());
-    return std::nullopt;
-  }
+  if (!current) return current.failure();
   const auto* known =
       std::ranges::find_if(countryCodes, [&](const auto& entry) { return entry.first == firstName(*current); });
   return known == countryCodes.end() ? std::nullopt : std::optional(known->second);

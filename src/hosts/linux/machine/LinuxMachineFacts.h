@@ -3,7 +3,7 @@
 #pragma once
 
 #include "effects/EffectSink.h"
-#include "hosts/linux/disks/FailedLooks.h"
+#include "hosts/shared/FailedLooks.h"
 #include "hosts/shared/SystemRoot.h"
 #include "platform/MachineFacts.h"
 
@@ -31,16 +31,15 @@ class LinuxKernelValues final : public KernelValues {
 /// the layout in the USB standard for such devices (HID 1.11, section 6.2.1); absent when the layout has none.
 class LinuxKeyboardInputService final : public KeyboardInputService {
  public:
-  /// Neither is owned.
-  LinuxKeyboardInputService(const SystemRoot& root, FailedLooks& looks) : _root(root), _looks(looks) {}
+  /// The root is not owned.
+  explicit LinuxKeyboardInputService(const SystemRoot& root) : _root(root) {}
 
-  std::optional<std::int64_t> currentLayoutNumber() override;
+  Result<std::optional<std::int64_t>> currentLayoutNumber() override;
 
  private:
   Result<std::string> layout() const;
 
   const SystemRoot& _root;
-  FailedLooks& _looks;
 };
 
 /// The interfaces of the kernel that runs the tool (getifaddrs(3)).

@@ -24,8 +24,8 @@ Setting<bool>::Found switchUnder(const std::string& key,
 
 }  // namespace
 
-LinuxPreferencesStore::LinuxPreferencesStore(const LinuxMachine& machine)
-    : _machine(machine), _file(machine.root, file) {}
+LinuxPreferencesStore::LinuxPreferencesStore(const LinuxMachine& machine, ManagementController& controller)
+    : _machine(machine), _file(machine.root, file), _lock(machine, controller) {}
 
 Setting<bool> LinuxPreferencesStore::preference(const std::string& key) {
   Setting<bool> setting;
@@ -36,6 +36,7 @@ Setting<bool> LinuxPreferencesStore::preference(const std::string& key) {
 }
 
 std::optional<PropertyList> LinuxPreferencesStore::value(const std::string& key) {
+  if (key == DunmereLockEnclosureStateKey) _lock.tellKeyboards();
   const auto preferences = _file.read();
   auto setting = preference(key);
   setting.stored = [&] { return switchUnder(key, preferences); };
@@ -43,38 +44,44 @@ std::optional<PropertyList> LinuxPreferencesStore::value(const std::string& key)
 }
 
 void LinuxPreferencesStore::writeOut() {
+  const auto held = hold(_machine);
+  if (const auto disables = std::exchange(_disablesKeyboard, std::nullopt)) _lock.setDisablesKeyboard(*disables, held);
   for (const auto& [key, value] : std::exchange(_pending, {})) {
+    WrittenPlaces written;
     auto setting = preference(key);
-    setting.store = [this, &key = key](bool isOn) { return store(key, isOn); };
-    carryOut(setting, value, _machine);
+    setting.written = [&] { return written.text(); };
+    setting.store = [this, &key = key, &written](bool isOn) { return store(key, isOn, written); };
+    carryOut(setting, value, _machine, held);
   }
 }
 
-Result<void> LinuxPreferencesStore::store(const std::string& key, bool value) {
+Result<void> LinuxPreferencesStore::store(const std::string& key, bool value, WrittenPlaces& written) {
   if (const auto failure = whyNeedsRoot("write", _file.path())) return *failure;
   if (auto made = _machine.root.makeFolders(folder); !made) return made;
   auto preferences = _file.readToChange();
   if (!preferences) return preferences.failure();
   auto changed = std::move(preferences).value();
   changed.set(key, value);
-  return _file.write(changed);
+  return _file.write(changed, written);
 }
 
 /// Read anew each time: a change counts at once.
-std::optional<PropertyList> LinuxUserDefaults::value(const std::string& key) const {
+Result<std::optional<PropertyList>> LinuxUserDefaults::value(const std::string& key) const {
   const auto defaults = PropertyListFile(_root, file).readToChange();
-  if (!defaults && key == languages) _looks.tellDoubt(defaults.failure());
-  if (!defaults) _looks.tell(defaults.failure());
-  const auto* value = defaults ? defaults->find(key) : nullptr;
+  if (!defaults) {
+    _looks.tell(defaults.failure());
+    return defaults.failure();
+  }
+  const auto* value = defaults->find(key);
   return value ? std::optional(*value) : std::nullopt;
 }
 
-std::vector<std::string> LinuxUserDefaults::strings(const std::string& key) {
+Result<std::vector<std::string>> LinuxUserDefaults::strings(const std::string& key) {
   auto found = PropertyListDefaults::strings(key);
-  if (!found.empty() || key != languages) return found;
+  if (!found || !found->empty() || key != languages) return found;
   const auto language = machineLanguage();
-  if (!language) _looks.tellDoubt(language.failure());
-  return language && !language->empty() ? std::vector{*language} : std::vector<std::string>();
+  if (!language) return language.failure();
+  return language->empty() ? std::vector<std::string>() : std::vector{*language};
 }
 
 /// "pt_BR" of "pt_BR.UTF-8@euro"; C and POSIX are no languages. Empty without one.

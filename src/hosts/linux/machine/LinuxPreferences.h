@@ -7,12 +7,14 @@
 #include <vector>
 
 #include "base/PropertyList.h"
-#include "hosts/linux/disks/FailedLooks.h"
+#include "hosts/linux/machine/KeyboardLock.h"
 #include "hosts/linux/services/LinuxMachine.h"
+#include "hosts/shared/FailedLooks.h"
 #include "hosts/shared/PropertyListFile.h"
 #include "hosts/shared/PropertyListPreferences.h"
 #include "hosts/shared/SettingChange.h"
 #include "hosts/shared/SystemRoot.h"
+#include "hosts/shared/WrittenPlaces.h"
 
 namespace tavisk {
 
@@ -20,20 +22,25 @@ namespace tavisk {
 /// understood reads as none, and is kept as NAME.damaged before it is written anew.
 class LinuxPreferencesStore final : public PreferencesStore {
  public:
-  explicit LinuxPreferencesStore(const LinuxMachine& machine);
+  /// The controller is not owned.
+  LinuxPreferencesStore(const LinuxMachine& machine, ManagementController& controller);
 
   std::optional<PropertyList> value(const std::string& key) override;
 
-  /// What was set is stored by writeOut(), together with what other runs have stored meanwhile.
+  /// What was set is done by writeOut() while no other run changes the machine: the keyboards and their preference
+  /// stay together, and beside what other runs have stored meanwhile.
+  void setDisablesKeyboard(bool disables) { _disablesKeyboard = disables; }
   void setBoolean(const std::string& key, bool value) { _pending.emplace_back(key, value); }
   void writeOut();
 
  private:
   Setting<bool> preference(const std::string& key);
-  Result<void> store(const std::string& key, bool value);
+  Result<void> store(const std::string& key, bool value, WrittenPlaces& written);
 
   LinuxMachine _machine;
   PropertyListFile _file;
+  EnclosureLock _lock;
+  std::optional<bool> _disablesKeyboard;
   std::vector<std::pair<std::string, bool>> _pending;
 };
 
@@ -46,10 +53,10 @@ class LinuxUserDefaults final : public PropertyListDefaults {
 
   static constexpr const char* file = "/etc/tavisk/preferences/tavisk.plist";
 
-  std::vector<std::string> strings(const std::string& key) override;
+  Result<std::vector<std::string>> strings(const std::string& key) override;
 
  protected:
-  std::optional<PropertyList> value(const std::string& key) const override;
+  Result<std::optional<PropertyList>> value(const std::string& key) const override;
 
  private:
   Result<std::string> machineLanguage() const;

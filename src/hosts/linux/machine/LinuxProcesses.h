@@ -3,26 +3,24 @@
 #pragma once
 
 #include "base/FileDescriptor.h"
-#include "hosts/linux/machine/KeyboardLock.h"
 #include "hosts/linux/machine/LinuxPreferences.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "platform/Processes.h"
 
 namespace tavisk {
 
-/// The processes in /proc, the keyboards and the lock of the enclosure.
+/// The processes in /proc; keyboards and preferences are changed through their store.
 class LinuxProcessUtilities final : public ProcessUtilities {
  public:
-  /// The last two must outlive the object.
-  LinuxProcessUtilities(const LinuxMachine& machine, LinuxPreferencesStore& preferences,
-                        ManagementController& controller)
-      : _machine(machine), _preferences(preferences), _lock(machine, controller) {}
+  /// The preferences must outlive the object.
+  LinuxProcessUtilities(const LinuxMachine& machine, LinuxPreferencesStore& preferences)
+      : _machine(machine), _preferences(preferences) {}
 
   /// The one with the smallest id.
   ProcessId processNamed(const std::string& name) override;
   /// Only to a process that has an id of its own, never to a group or to all.
   void sendSignal(int signal, ProcessId process) override;
-  void setLockEnclosureState(bool disablesKeyboard) override { _lock.setDisablesKeyboard(disablesKeyboard); }
+  void setLockEnclosureState(bool disablesKeyboard) override { _preferences.setDisablesKeyboard(disablesKeyboard); }
   void setMachineBoolean(const std::string& key, bool value) override { _preferences.setBoolean(key, value); }
   void writeMachinePreferences() override { _preferences.writeOut(); }
 
@@ -31,7 +29,6 @@ class LinuxProcessUtilities final : public ProcessUtilities {
 
   LinuxMachine _machine;
   LinuxPreferencesStore& _preferences;
-  EnclosureLock _lock;
 };
 
 /// Asks the service of logins to delay a shutdown (its Inhibit() call, org.freedesktop.login1(5)). Where there is no

@@ -21,14 +21,27 @@ struct LinuxMachine {
   ServiceAccess& services;
 };
 
+/// While it lives no other run changes this machine; or why that could not be had.
+using MachineHold = Result<FileDescriptor>;
+
+inline MachineHold hold(const LinuxMachine& machine) {
+  return MachineLock(machine.root, machine.runLoop).hold();
+}
+
+/// carryOut() as a part of what is done while the machine is held.
+template <typename Value>
+Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, const LinuxMachine& machine,
+                const MachineHold& held) {
+  if (held) return carryOut(setting, asked, machine.effects, machine.runLoop);
+  Effect effect{.setting = setting.name, .outcome = Outcome::failed, .asked = textOf(asked), .failure = held.failure()};
+  machine.effects.record(effect);
+  return effect;
+}
+
 /// carryOut() while no other run changes this machine.
 template <typename Value>
 Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, const LinuxMachine& machine) {
-  const auto lock = MachineLock(machine.root, machine.runLoop).hold();
-  if (lock) return carryOut(setting, asked, machine.effects, machine.runLoop);
-  Effect effect{.setting = setting.name, .outcome = Outcome::failed, .asked = textOf(asked), .failure = lock.failure()};
-  machine.effects.record(effect);
-  return effect;
+  return carryOut(setting, asked, machine, hold(machine));
 }
 
 }  // namespace tavisk

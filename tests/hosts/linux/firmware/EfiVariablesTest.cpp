@@ -89,10 +89,15 @@ TEST_F(EfiVariablesTest, PutAnEntryFirstAndKeepTheOthersInTheirPlaces) {
   const auto before = tree.allVariables();
   const BootEntries entries(variables);
   std::vector<std::uint16_t> kept;
-  ASSERT_TRUE(entries.putFirst(backup, [&](const auto& order) {
-    kept = order;
-    return Result<void>();
-  }));
+  WrittenPlaces written;
+  ASSERT_TRUE(entries.putFirst(
+      backup,
+      [&](const auto& order) {
+        kept = order;
+        return Result<void>();
+      },
+      written));
+  EXPECT_EQ(written.text(), tree.pathOf("BootOrder") + ", " + tree.pathOf("Boot0003"));
   EXPECT_THAT(kept, ElementsAre(2, 7, 1, 0, 0x1A));
   EXPECT_THAT(*entries.order(), ElementsAre(3, 2, 7, 1, 0, 0x1A)) << "3 is the lowest that nobody knows";
   EXPECT_EQ(bytesOf((**entries.first()).option), bytesOf(backup));
@@ -101,7 +106,7 @@ TEST_F(EfiVariablesTest, PutAnEntryFirstAndKeepTheOthersInTheirPlaces) {
   for (const auto& [name, contents] : before) EXPECT_TRUE(after[name] == contents || name.starts_with("BootOrder-"));
 
   tree.setOrder({2, 3, 0});
-  ASSERT_TRUE(entries.putFirst(backup, keepNothing));
+  ASSERT_TRUE(entries.putFirst(backup, keepNothing, written));
   EXPECT_THAT(*entries.order(), ElementsAre(3, 2, 0)) << "used again";
   EXPECT_EQ(tree.allVariables().size(), after.size());
 }
@@ -126,7 +131,8 @@ TEST_F(EfiVariablesTest, StayAsTheyAreWhenTheStoreIsFull) {
     tree.setOrder({1});
     tree.write(tree.pathOf("filler"), std::string(100'000, 'x'));
     const auto before = tree.allVariables();
-    EXPECT_FALSE(BootEntries(variables).putFirst(backup, keepNothing));
+    WrittenPlaces written;
+    EXPECT_FALSE(BootEntries(variables).putFirst(backup, keepNothing, written));
     EXPECT_EQ(tree.allVariables(), before);
   });
   if (!isProven) GTEST_SKIP() << "mounts of its own are not allowed here";
@@ -136,7 +142,9 @@ TEST_F(EfiVariablesTest, LoseTheNewEntryWhenTheOrderCannotBeKept) {
   tree.setOrder({1});
   const auto before = tree.allVariables();
   const auto refuse = [](const auto&) -> Result<void> { return Failure{"write", "the old order", "disk full"}; };
-  EXPECT_FALSE(BootEntries(variables).putFirst(backup, refuse));
+  WrittenPlaces written;
+  EXPECT_FALSE(BootEntries(variables).putFirst(backup, refuse, written));
+  EXPECT_EQ(written.text(), "");
   EXPECT_EQ(tree.allVariables(), before);
 }
 

@@ -76,14 +76,17 @@ class LinuxBootSettingsTest : public testing::Test {
     EXPECT_EQ(tree.allVariables(), before) << why;
     EXPECT_FALSE(tree.has(LinuxBootSettings::previousOrder)) << why;
   }
-  /// Of a set from one start to another, both as device paths.
-  static Effect effectOf(Outcome outcome, const std::string& before, const std::string& after) {
+  /// Of a set from one start to another, both as device paths, which made this entry.
+  static Effect effectOf(Outcome outcome, const std::string& before, const std::string& after,
+                         const std::string& made = "") {
+    const auto entry = made.empty() ? "" : ", " + BootTree::pathOf(made);
+    const auto where = std::string(LinuxBootSettings::previousOrder) + ", " + BootTree::pathOf("BootOrder") + entry;
     return {.setting = setting::startupDisk,
             .outcome = outcome,
             .before = before,
             .asked = after,
             .stored = after,
-            .where = outcome == Outcome::applied ? BootTree::pathOf("BootOrder") : "",
+            .where = outcome == Outcome::applied ? where : "",
             .changed = outcome == Outcome::applied};
   }
 
@@ -116,7 +119,7 @@ class LinuxBootSettingsTest : public testing::Test {
 
 TEST_F(LinuxBootSettingsTest, StartsTheVolumesOwnFile) {
   EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
-  EXPECT_EQ(tree.lastEffect(), effectOf(Outcome::applied, otherPath, backupPath));
+  EXPECT_EQ(tree.lastEffect(), effectOf(Outcome::applied, otherPath, backupPath, "Boot0001"));
   const EfiVariables variables(tree.root);
   const auto first = BootEntries(variables).first().valueOr(std::nullopt);
   ASSERT_TRUE(first);
@@ -128,6 +131,9 @@ TEST_F(LinuxBootSettingsTest, StartsTheVolumesOwnFile) {
   EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
   EXPECT_EQ(tree.lastEffect(), effectOf(Outcome::unchanged, backupPath, backupPath));
   EXPECT_EQ(tree.allVariables(), before);
+  tree.setOrder({0, 1});
+  EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
+  EXPECT_EQ(tree.lastEffect(), effectOf(Outcome::applied, otherPath, backupPath)) << "the entry was there";
 }
 
 TEST_F(LinuxBootSettingsTest, StartsAVolumeThatFirmwareCannotReadFromItsFileBeside) {
@@ -135,7 +141,7 @@ TEST_F(LinuxBootSettingsTest, StartsAVolumeThatFirmwareCannotReadFromItsFileBesi
   const auto path = R"(HD(1,GPT,6c8f1b52-0e5a-4e0c-9b66-0123456789ab,0x800,0x800)/File(\EFI\tavisk\)" +
                     std::string(mainUuid) + R"(\boot.efi))";
   EXPECT_EQ(set("sda2", ""), 0);
-  EXPECT_EQ(tree.lastEffect(), effectOf(Outcome::applied, otherPath, path));
+  EXPECT_EQ(tree.lastEffect(), effectOf(Outcome::applied, otherPath, path, "Boot0001"));
   EXPECT_EQ(preferredDisk(), "sda2") << "the volume it was made for, not the partition that has the file";
   tree.link("/dev/disk/by-uuid/" + std::string(mainUuid), "../../sdb1");
   EXPECT_EQ(preferredDisk(), "sda2") << "not a copy of it on another disk";
@@ -204,9 +210,13 @@ TEST_F(LinuxBootSettingsTest, TellsOfTheNextStartAlone) {
   tree.setVariable("BootNext", std::string("\5\0", 2));
   EXPECT_EQ(preferredDisk(), "") << "gone with its disk";
   EXPECT_EQ(set("sdb1", "/Volumes/Backup"), 0);
-  auto expected = effectOf(Outcome::applied, otherPath, backupPath);
+  auto expected = effectOf(Outcome::applied, otherPath, backupPath, "Boot0001");
   expected.note = "the next start alone is from Boot0005 (other), as BootNext says";
   EXPECT_EQ(tree.lastEffect(), expected);
+  tree.setEntry(5, {*partitionNode({"6c8f1b52-0e5a-4e0c-9b66-0123456789ab", 1, 1, 1})});
+  tree.log.wants = true;
+  EXPECT_EQ(preferredDisk(), "sda1");
+  EXPECT_THAT(tree.log.values, testing::ElementsAre(SettingValue{setting::startupDisk, "sda1", "sdb1"}));
 }
 
 TEST_F(LinuxBootSettingsTest, KnowsTheStartOverANetwork) {
@@ -227,6 +237,11 @@ TEST_F(LinuxBootSettingsTest, KnowsTheStartOverANetwork) {
 
 TEST_F(LinuxBootSettingsTest, HasNoChoiceUnderOtherFirmware) {
   EXPECT_FALSE(settings().legacyBootSupport().supported);
+  const auto shown = tree.at(BootTree::variables);
+  std::filesystem::rename(shown, tree.at("/hidden"));
+  EXPECT_EQ(settings().legacyBootSupport().status, 0);
+  EXPECT_THAT(tree.log.effects, testing::IsEmpty()) << "a machine that does not show its variables has none";
+  std::filesystem::rename(tree.at("/hidden"), shown);
   tree.setEntry(8, {{5, 1, fromHex("0200000048440000")}});
   EXPECT_TRUE(settings().legacyBootSupport().supported) << "by the old rules";
   std::filesystem::remove_all(tree.at("/sys/firmware/efi"));
@@ -234,7 +249,14 @@ TEST_F(LinuxBootSettingsTest, HasNoChoiceUnderOtherFirmware) {
   EXPECT_TRUE(settings().legacyBootSupport().supported);
   EXPECT_NE(set("sdb1", "/Volumes/Backup"), 0);
   EXPECT_THAT(tree.lastEffect(), UnsupportedFor("not started by UEFI"));
+  tree.log.effects.clear();
+  tree.log.wants = true;
   EXPECT_EQ(settings().networkBootPreference().status, 0);
+  EXPECT_EQ(preferredDisk(), "");
+  EXPECT_THAT(tree.log.effects, testing::IsEmpty()) << "a read has not failed";
+  const Failure why{"read", "the firmware's variables", "this machine was not started by UEFI firmware"};
+  EXPECT_THAT(tree.log.values, testing::ElementsAre(SettingValue{setting::networkStartupDisk, {}, {}, "", why},
+                                                    SettingValue{setting::startupDisk, {}, {}, "", why}));
   tree.write("/sys/firmware/devicetree/base/ibm,opal", "");
   EXPECT_EQ(settings().preBootEnvironment(), preboot::openFirmware);
 }
@@ -275,17 +297,17 @@ TEST_F(LinuxBootSettingsTest, LosesNothingAndTellsNothingUntrueWhicheverCallFail
 }
 
 TEST_F(LinuxBootSettingsTest, SetsNothingByWhatCouldNotBeLookedAt) {
-  const auto setLanguage = [&] { return tree.host().diskManagement().setFirmwareVariable("prev-lang:kbd", "en:0"); };
   for (const char* file : {"/etc/default/keyboard", "/etc/locale.conf", LinuxUserDefaults::file}) {
-    tree.link(file, "loop");
-    tree.link(std::filesystem::path(file).parent_path() / "loop", "loop");
-    tree.host().keyboardInput().currentLayoutNumber();
-    tree.host().userDefaults().strings("VelmarLanguages");
-    EXPECT_NE(setLanguage(), 0) << file;
+    tree.makeUnreadable(file);
+    const auto layout = tree.host().keyboardInput().currentLayoutNumber();
+    const auto languages = tree.host().userDefaults().strings("VelmarLanguages");
+    ASSERT_NE(static_cast<bool>(layout), static_cast<bool>(languages)) << file;
+    const auto& why = layout ? languages.failure() : layout.failure();
+    EXPECT_NE(settings().setFirmwareVariable("prev-lang:kbd", why), 0) << file;
     EXPECT_THAT(tree.lastEffect(), FailedFor(file));
     std::filesystem::remove(tree.at(file));
-    EXPECT_EQ(setLanguage(), 0) << file;
   }
+  EXPECT_FALSE(tree.has(EfiVariables::pathOf({"prev-lang:kbd", efiOwnVendor})));
   std::filesystem::remove_all(tree.at("/sys/firmware/efi"));
   tree.link("/sys/firmware/efi", "efi");
   EXPECT_EQ(settings().preBootEnvironment(), preboot::noneKnown);

@@ -8,7 +8,7 @@
 #include "effects/EffectMatchers.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/LinuxTree.h"
-#include "hosts/linux/machine/KeyboardLock.h"
+#include "hosts/linux/machine/LinuxPreferences.h"
 
 namespace tavisk {
 namespace {
@@ -54,7 +54,7 @@ class PanelTree : public LinuxTree {
   }
   void setDisablesKeyboard(bool disables) {
     ManagementController controller(panel);
-    EnclosureLock(machine, controller).setDisablesKeyboard(disables);
+    EnclosureLock(machine, controller).setDisablesKeyboard(disables, hold(machine));
   }
 
   Panel panel;
@@ -105,9 +105,28 @@ TEST(EnclosureLock, LeavesTheKeyboardsOfAMachineThatTellsOfNoLock) {
     tree.panel.state = lock;
     tree.setDisablesKeyboard(true);
     EXPECT_THAT(tree.lastEffect(), UnsupportedFor(why));
-    EXPECT_EQ(tree.lastEffect().note, "the preference is kept");
+    EXPECT_EQ(tree.lastEffect().note, "") << "what becomes of the preference is told of the preference";
     EXPECT_EQ(tree.inhibited("input1"), "0");
   }
+}
+
+TEST(EnclosureLock, TellsTheKeyboardsBesideTheirPreference) {
+  PanelTree tree;
+  tree.write("/sys/class/input/input1/inhibited", "1");
+  tree.write("/sys/class/input/input2/inhibited", "1");
+  ManagementController controller(tree.panel);
+  LinuxPreferencesStore preferences(tree.machine, controller);
+  tree.log.wants = true;
+  EXPECT_FALSE(preferences.value(DunmereLockEnclosureStateKey));
+  for (const char* keyboard : {"input1", "input2"})
+    tree.write(std::string("/sys/class/input/") + keyboard + "/name", "virtual");
+  EXPECT_FALSE(preferences.value(DunmereLockEnclosureStateKey));
+  const SettingValue preference{setting::keyboardLockPreference};
+  const Failure none{"find a keyboard", "/sys/class/input", "there is none at this machine"};
+  EXPECT_THAT(tree.log.values,
+              testing::ElementsAre(SettingValue{setting::keyboardLock, "keyboards disabled"}, preference,
+                                   SettingValue{setting::keyboardLock, {}, {}, "", none}, preference));
+  EXPECT_TRUE(tree.log.effects.empty());
 }
 
 TEST(EnclosureLock, SaysWhatCannotBeLookedAtOrDisabled) {

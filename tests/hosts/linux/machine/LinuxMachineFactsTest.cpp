@@ -80,7 +80,7 @@ TEST(LinuxKeyboard, HasTheNumberOfItsLayout) {
     LinuxTree machine;
     machine.write("/etc/default/keyboard", keyboard);
     machine.write("/etc/vconsole.conf", console);
-    EXPECT_EQ(machine.host().keyboardInput().currentLayoutNumber(), number) << keyboard << console;
+    EXPECT_EQ(*machine.host().keyboardInput().currentLayoutNumber(), number) << keyboard << console;
   }
 }
 
@@ -88,19 +88,19 @@ TEST(LinuxUserDefaults, AreTheAdministratorsAndLanguagesElseTheMachines) {
   LinuxTree machine;
   auto& defaults = machine.host().userDefaults();
   EXPECT_FALSE(defaults.boolean("StartupDiskDebug"));
-  EXPECT_THAT(defaults.strings("VelmarLanguages"), IsEmpty());
+  EXPECT_THAT(*defaults.strings("VelmarLanguages"), IsEmpty());
   const std::pair<const char*, std::vector<std::string>> locales[] = {
       {"LANG=\"pt_BR.UTF-8\"\n", {"pt_BR"}}, {"LANG=de_DE@euro\n", {"de_DE"}}, {"LANG=C.UTF-8\n", {}}};
   for (const auto& [contents, languages] : locales) {
     machine.write("/etc/default/locale", contents);
-    EXPECT_EQ(defaults.strings("VelmarLanguages"), languages) << contents;
+    EXPECT_EQ(*defaults.strings("VelmarLanguages"), languages) << contents;
   }
   machine.write(LinuxUserDefaults::file,
                 "<plist><dict><key>StartupDiskDebug</key><true/><key>SDWirestartScanInterval</key><integer>30</integer>"
                 "<key>VelmarLanguages</key><array><string>French</string></array></dict></plist>");
   EXPECT_TRUE(defaults.boolean("StartupDiskDebug"));
   EXPECT_EQ(defaults.number("SDWirestartScanInterval"), 30.0);
-  EXPECT_THAT(defaults.strings("VelmarLanguages"), ElementsAre("French"));
+  EXPECT_THAT(*defaults.strings("VelmarLanguages"), ElementsAre("French"));
   machine.write(LinuxUserDefaults::file, "damaged");
   EXPECT_FALSE(defaults.boolean("StartupDiskDebug"));
 }

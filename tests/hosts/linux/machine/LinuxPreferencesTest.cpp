@@ -45,12 +45,15 @@ TEST(LinuxPreferences, AreWrittenTogetherWithThoseOfOtherRuns) {
 TEST(LinuxPreferences, AreNotWrittenWhileAnotherRunChangesTheMachine) {
   LinuxTree tree;
   auto& processes = tree.host().processes();
+  processes.setLockEnclosureState(true);
   processes.setMachineBoolean("a", true);
+  EXPECT_TRUE(tree.log.effects.empty()) << "the keyboards wait for their preference";
   tree.write(preferencesFile, "<dict/>");
   const auto held = MachineLock(tree.root, tree.runLoop).hold();
   const auto limit = tree.runLoop.limitWaits(std::chrono::milliseconds(10));
   processes.writeMachinePreferences();
-  EXPECT_THAT(tree.lastEffect(), FailedFor("is changing a setting of this machine"));
+  EXPECT_THAT(tree.log.effects, testing::SizeIs(2));
+  EXPECT_THAT(tree.log.effects, testing::Each(FailedFor("is changing a setting of this machine")));
   EXPECT_EQ(tree.file(preferencesFile), "<dict/>");
 }
 
@@ -62,7 +65,9 @@ TEST(LinuxPreferences, ReadAsNoneOutOfADamagedFileAndAreKeptBesideIt) {
   tree.host().processes().setMachineBoolean("a", true);
   tree.host().processes().writeMachinePreferences();
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
-  EXPECT_EQ(tree.file(std::string(preferencesFile) + ".damaged"), "<dict>");
+  const auto damaged = std::string(preferencesFile) + ".damaged";
+  EXPECT_EQ(tree.file(damaged), "<dict>");
+  EXPECT_EQ(tree.lastEffect().where, damaged + ", " + preferencesFile);
 }
 
 /// What a signal to a process of this machine comes to. A whole host would tell the journal of the machine too.
@@ -74,10 +79,10 @@ Effect effectOf(int signal, ProcessId process) {
   const SystemRoot root("/");
   ServiceAccess services(root, runLoop);
   const LinuxMachine machine{root, effects, runLoop, services};
-  LinuxPreferencesStore preferences(machine);
   IpmiDevice link(root, runLoop);
   ManagementController controller(link);
-  LinuxProcessUtilities(machine, preferences, controller).sendSignal(signal, process);
+  LinuxPreferencesStore preferences(machine, controller);
+  LinuxProcessUtilities(machine, preferences).sendSignal(signal, process);
   return log.effects.back();
 }
 
