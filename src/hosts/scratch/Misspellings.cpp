@@ -81,6 +81,14 @@ bool isLike(std::string_view written, std::string_view name) {
          distanceBetween(letters, meant) <= std::min(mostSlips, meant.size() / lettersToOne);
 }
 
+/// Null when no key of that place is like the one that is written.
+const KeyRow* rowLike(std::string_view place, std::string_view written) {
+  const auto rows = keyTable();
+  const auto row = std::ranges::find_if(
+      rows, [&](const KeyRow& known) { return known.place == place && isLike(written, known.key); });
+  return row == rows.end() ? nullptr : &*row;
+}
+
 std::string quoted(std::string_view name) {
   return "\"" + std::string(name) + "\"";
 }
@@ -122,9 +130,7 @@ void addNamesAt(std::string_view place, const std::string& way, const PropertyLi
       addNamesInside(*row, way + quoted(key) + " ", value, names);
       continue;
     }
-    const auto meant =
-        std::ranges::find_if(keyTable(), [&](const KeyRow& row) { return row.place == place && isLike(key, row.key); });
-    if (meant != keyTable().end()) names.push_back(way + quoted(key) + isMeant(meant->key));
+    if (const auto* meant = rowLike(place, key)) names.push_back(way + quoted(key) + isMeant(meant->key));
   }
 }
 
