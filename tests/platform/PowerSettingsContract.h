@@ -51,6 +51,7 @@ TYPED_TEST_P(PowerSettingsContract, saysWhatTheMachineLacks) {
     EXPECT_TRUE(this->machine.service().supports(lacking, this->source));
     this->machine.lack(lacking);
     EXPECT_FALSE(this->machine.service().supports(lacking, this->source));
+    ASSERT_FALSE(this->machine.values().empty());
     EXPECT_EQ(this->machine.values().back().setting, nameOf(lacking));
     EXPECT_TRUE(this->machine.values().back().unsupported);
     EXPECT_TRUE(this->machine.effects().empty());
