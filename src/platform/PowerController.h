@@ -29,14 +29,20 @@ class PowerController {
 
   /// Whether the registry can be asked at all.
   virtual ControllerStatus masterPort() = 0;
-  /// The first service of the class; absent when there is none.
+  /// The first service of the class; absent when there is none, or that cannot be found out, which is told by what
+  /// follows: numberProperty() or open().
   virtual std::optional<Service> serviceOfClass(const std::string& className) = 0;
-  /// Absent when the service has no such number.
-  virtual std::optional<std::int64_t> numberProperty(const Service& service, const std::string& property) = 0;
+  /// Absent when the service has no such number. Without a service the machine cannot have it: that is told as the
+  /// value.
+  virtual std::optional<std::int64_t> numberProperty(const std::optional<Service>& service,
+                                                     const std::string& property) = 0;
   /// Without a service the answer is 19, no such device.
   virtual std::pair<ControllerStatus, Connection> open(const std::optional<Service>& service,
                                                        std::uint32_t connectionType) = 0;
-  virtual ControllerStatus setProperties(const Connection& connection, const PropertyList::Dictionary& properties) = 0;
+  /// `asked` is the number that they stand for. Where that is another one the effect has failed, as it is not kept, and
+  /// the status is that of the properties all the same.
+  virtual ControllerStatus setProperties(const Connection& connection, const PropertyList::Dictionary& properties,
+                                         std::int64_t asked) = 0;
   virtual ControllerStatus close(const Connection& connection) = 0;
 };
 

@@ -45,8 +45,9 @@ class PowerSwitchesService {
  public:
   virtual ~PowerSwitchesService() = default;
 
+  /// Of what is to be read: that the machine cannot have it is told as its value.
   virtual bool supports(PowerSwitch which, const PowerSource& source) = 0;
-  /// As supports(), of what is to be changed: the reason against it goes to the effects.
+  /// Of what is to be changed: that the machine cannot have it is told as an effect.
   virtual bool canSet(PowerSwitch which, const PowerSource& source) = 0;
   /// False when the machine does not support it.
   virtual bool isOn(PowerSwitch which, const PowerSource& source) = 0;

@@ -51,7 +51,7 @@ void setSleepTimers(ServerCommands& commands, const SleepTimerSetter& setter, co
     context.output.print(
         "%s: Error, %s is not a valid amount of time. The time specified must be between 0 and 180 minutes.\n",
         setter.command, value.c_str());
-    commands.refuse("a number of minutes from 0 to 180");
+    commands.refuse("a number of minutes from 0 to 180, 'Never' or 'Off'");
     commands.setError(true);
     return;
   }

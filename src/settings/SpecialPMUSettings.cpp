@@ -12,6 +12,10 @@ constexpr const char* controllerClasses[] = {"VelmarPMU", "VelmarSMU", "VelmarKC
 constexpr const char* serverID = "ServerID";
 constexpr std::uint32_t connectionType = 0x0101FACE;
 
+std::uint8_t lowByteOf(std::int64_t number) {
+  return static_cast<std::uint8_t>(number);
+}
+
 /// Absent when there is no memory for it.
 std::optional<PropertyList::Dictionary> dictionaryOf(std::uint8_t value) {
   try {
@@ -25,12 +29,15 @@ std::optional<PropertyList::Dictionary> dictionaryOf(std::uint8_t value) {
 
 }  // namespace
 
+bool SpecialPMUSettings::hasMasterPort() {
+  const auto status = _controller.masterPort();
+  if (status == 0) return true;
+  _output.print("waitForStartupAfterPowerFailure: Error, IOMasterPort() returned: %#lx; unable to process request\n",
+                status);
+  return false;
+}
+
 std::optional<PowerController::Service> SpecialPMUSettings::getServerIDInterface() {
-  if (const auto status = _controller.masterPort(); status != 0) {
-    _output.print("waitForStartupAfterPowerFailure: Error, IOMasterPort() returned: %#lx; unable to process request\n",
-                  status);
-    return std::nullopt;
-  }
   for (const char* name : controllerClasses) {
     if (auto service = _controller.serviceOfClass(name)) return service;
   }
@@ -38,30 +45,29 @@ std::optional<PowerController::Service> SpecialPMUSettings::getServerIDInterface
 }
 
 std::int64_t SpecialPMUSettings::getServerIDValue() {
-  const auto service = getServerIDInterface();
-  return service ? _controller.numberProperty(*service, serverID).value_or(0) : 0;
+  return hasMasterPort() ? _controller.numberProperty(getServerIDInterface(), serverID).value_or(0) : 0;
 }
 
-bool SpecialPMUSettings::setServerIDValue(std::uint8_t value) {
-  const auto service = getServerIDInterface();
-  _systemLog.write("Set time to " + std::to_string(value));
+bool SpecialPMUSettings::setServerIDValue(std::int64_t asked) {
+  const auto service = hasMasterPort() ? getServerIDInterface() : std::nullopt;
+  _systemLog.write("Set time to " + std::to_string(lowByteOf(asked)));
   const auto [status, connection] = _controller.open(service, connectionType);
   if (status != 0) {
     _output.print("setWaitForStartupAfterPowerFailure: Error, IOServiceOpen returned %#lx\n", status);
     return false;
   }
-  if (!writeServerID(connection, value)) return false;
+  if (!writeServerID(connection, asked)) return false;
   close(connection);
   return true;
 }
 
-bool SpecialPMUSettings::writeServerID(const Connection& connection, std::uint8_t value) {
-  const auto properties = dictionaryOf(value);
+bool SpecialPMUSettings::writeServerID(const Connection& connection, std::int64_t asked) {
+  const auto properties = dictionaryOf(lowByteOf(asked));
   if (!properties) {
     _output.putLine("setWaitForStartupAfterPowerFailure: Error,Internal CF Dictionary could not be created. ");
     return false;
   }
-  if (const auto status = _controller.setProperties(connection, *properties); status != 0) {
+  if (const auto status = _controller.setProperties(connection, *properties, asked); status != 0) {
     _output.print("setWaitForStartupAfterPowerFailure: Error, IOConnectSetCFProperties returned %#lx\n", status);
     return false;
   }

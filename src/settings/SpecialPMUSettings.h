@@ -21,17 +21,18 @@ class SpecialPMUSettings final {
 
   /// In units of 30 seconds; 0 when there is no controller or no value.
   std::int64_t getTime() { return getServerIDValue(); }
-  /// Only the low 8 bits count. Whether it was written.
-  bool setTime(std::int32_t units) { return setServerIDValue(static_cast<std::uint8_t>(units)); }
+  /// Only the low 8 bits count; the effect of a number that has more has failed. Whether it was written.
+  bool setTime(std::int64_t units) { return setServerIDValue(units); }
 
  private:
   using Connection = PowerController::Connection;
 
+  bool hasMasterPort();
   /// Absent when the machine has none of the known controllers.
   std::optional<PowerController::Service> getServerIDInterface();
   std::int64_t getServerIDValue();
-  bool setServerIDValue(std::uint8_t value);
-  bool writeServerID(const Connection& connection, std::uint8_t value);
+  bool setServerIDValue(std::int64_t asked);
+  bool writeServerID(const Connection& connection, std::int64_t asked);
   void close(const Connection& connection);
 
   PowerController& _controller;

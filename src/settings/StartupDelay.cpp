@@ -12,6 +12,7 @@ namespace tavisk {
 namespace {
 
 constexpr std::int64_t secondsInUnit = 30;
+constexpr const char* delays = "a number of seconds from 0 to 7650 that is divisible by 30";
 
 /// A controller may answer any 64-bit number: the product wraps.
 std::int64_t secondsOf(std::int64_t units) {
@@ -30,10 +31,12 @@ void ServerCommands::setWaitForStartupAfterPowerFailure(const std::string& secon
   setError(false);
   if (wait % secondsInUnit != 0) {
     _context.output.putLine("setwaitforstartupafterpowerfailure: Error, value must be divisible by 30.");
-    refuse("a number of seconds that is divisible by 30");
+    refuse(delays);
     return;
   }
-  if (!sharedSpecialPMU().setTime(static_cast<std::int32_t>(wait / secondsInUnit))) return;
+  // What is no number sets the delay to 0 all the same.
+  if (wait == 0 && seconds != "0") refuse(delays);
+  if (!sharedSpecialPMU().setTime(wait / secondsInUnit)) return;
   _context.output.print("setwaitforstartupafterpowerfailure: %ld seconds\n", wait);
 }
 

@@ -9,6 +9,7 @@
 
 #include "base/Process.h"
 #include "base/Text.h"
+#include "effects/Warning.h"
 
 namespace tavisk {
 
@@ -18,9 +19,11 @@ bool TerminalLog::wanted() {
 }
 
 void TerminalLog::record(const Effect& effect) {
-  if (!effect.failure) return;
+  const bool warns = effect.outcome == Outcome::applied && effect.note.starts_with(warningSign);
+  if (!effect.failure && !warns) return;
+  const auto said = effect.failure ? describe(*effect.failure) : escaped(effect.note);
   const auto undone = effect.undoneBy.empty() ? "" : "; may be undone by " + escaped(effect.undoneBy);
-  _printAside([&] { complain(escaped(effect.setting) + ": " + describe(*effect.failure) + undone); });
+  _printAside([&] { complain(escaped(effect.setting) + ": " + said + undone); });
 }
 
 }  // namespace tavisk

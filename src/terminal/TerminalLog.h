@@ -10,7 +10,7 @@
 namespace tavisk {
 
 /// Tells on standard error, in one line each, what failed and what this machine does not support: "tavisk: SETTING:
-/// what was tried on what: why".
+/// what was tried on what: why"; and a note that warns (Warning.h) of what was done.
 class TerminalLog final : public EffectChannel {
  public:
   /// When standard error is a terminal, or TAVISK_LOG is "stderr".

@@ -38,6 +38,7 @@ echo 'freeze mem' >power/state; echo '[s2idle] deep' >power/mem_sleep; echo 600 
 echo 0 >block/sda/removable; echo 1 >block/sda/queue/rotational; echo 1 >block/sda/device/scsi_disk/0:0:0:0/manage_start_stop
 echo on >block/sda/device/power/control; echo 0 >block/sda/device/power/autosuspend_delay_ms
 cd /; mount --rbind /run/sys /sys
+mkdir -p /run/udev; : >/run/udev/control
 : >/dev/tty1
 echo 0 >/run/panic; mount --bind /run/panic /proc/sys/kernel/panic
 systemctl restart systemd-logind

@@ -16,20 +16,22 @@ namespace tavisk {
 inline constexpr const char* controllerClass = "VelmarKCS";
 
 inline std::optional<std::int64_t> delayOf(PowerController& controller) {
-  return controller.numberProperty({controllerClass}, "ServerID");
+  return controller.numberProperty(PowerController::Service{controllerClass}, "ServerID");
 }
 
 /// Sets units of delay in a whole conversation; the first status that is not 0.
-inline ControllerStatus setDelay(PowerController& controller, std::uint8_t units) {
+inline ControllerStatus setDelay(PowerController& controller, std::int64_t asked) {
+  const auto units = static_cast<std::uint8_t>(asked);
   const auto [opened, connection] = controller.open(controller.serviceOfClass(controllerClass), 0x0101FACE);
   const auto status =
-      opened != 0 ? opened : controller.setProperties(connection, keys({{"ServerID", PropertyList::Data{units}}}));
+      opened != 0 ? opened
+                  : controller.setProperties(connection, keys({{"ServerID", PropertyList::Data{units}}}), asked);
   EXPECT_EQ(controller.close(connection), 0);
   return status;
 }
 
-/// `Machine` offers: service(), of a machine whose controller has no delay; refuseDelays(), after which the controller
-/// refuses to be set; and effects().
+/// `Machine` offers: service(), of a machine whose controller has no delay; lackController(), which takes it away;
+/// refuseDelays(), after which it refuses to be set; effects() and values().
 template <typename Machine>
 struct PowerControllerContract : testing::Test {
   Machine machine;
@@ -42,14 +44,31 @@ TYPED_TEST_P(PowerControllerContract, hasOneServiceWithOneNumber) {
   EXPECT_EQ(controller.masterPort(), 0);
   EXPECT_TRUE(controller.serviceOfClass(controllerClass));
   for (const char* other : {"", "VelmarPMU"}) EXPECT_FALSE(controller.serviceOfClass(other)) << other;
-  EXPECT_EQ(controller.numberProperty({controllerClass}, "Other"), std::nullopt);
+  EXPECT_EQ(controller.numberProperty(PowerController::Service{controllerClass}, "Other"), std::nullopt);
 }
 
-TYPED_TEST_P(PowerControllerContract, opensNothingWithoutAService) {
-  EXPECT_EQ(this->machine.service().open(std::nullopt, 0x0101FACE).first, ENODEV);
+TYPED_TEST_P(PowerControllerContract, saysThatAMachineWithoutOneCannotHaveIt) {
+  this->machine.lackController();
+  auto& controller = this->machine.service();
+  EXPECT_FALSE(controller.serviceOfClass(controllerClass));
+  EXPECT_EQ(controller.numberProperty(std::nullopt, "ServerID"), std::nullopt);
+  EXPECT_THAT(this->machine.effects(), testing::IsEmpty());
+  EXPECT_TRUE(this->machine.values().back().unsupported);
+  EXPECT_EQ(controller.open(std::nullopt, 0x0101FACE).first, ENODEV);
   ASSERT_EQ(this->machine.effects().size(), 1U);
   EXPECT_EQ(this->machine.effects()[0].setting, setting::startupDelay);
-  EXPECT_EQ(this->machine.effects()[0].outcome, Outcome::failed);
+  EXPECT_EQ(this->machine.effects()[0].outcome, Outcome::notSupported);
+}
+
+TYPED_TEST_P(PowerControllerContract, keepsOneByteAndSaysWhatIsNotKept) {
+  auto& controller = this->machine.service();
+  for (const std::int64_t asked : {33333, 33333, -1}) {
+    EXPECT_EQ(setDelay(controller, asked), 0);
+    const auto& told = this->machine.effects().back();
+    EXPECT_EQ(told.outcome, Outcome::failed);
+    EXPECT_EQ(told.asked, std::to_string(asked));
+    EXPECT_EQ(told.live, std::to_string(asked & 0xFF));
+  }
 }
 
 TYPED_TEST_P(PowerControllerContract, hasTheDelayThatWasSetLast) {
@@ -75,7 +94,7 @@ TYPED_TEST_P(PowerControllerContract, answersAndTellsARefusal) {
   EXPECT_EQ(delayOf(controller), 3);
 }
 
-REGISTER_TYPED_TEST_SUITE_P(PowerControllerContract, hasOneServiceWithOneNumber, opensNothingWithoutAService,
-                            hasTheDelayThatWasSetLast, answersAndTellsARefusal);
+REGISTER_TYPED_TEST_SUITE_P(PowerControllerContract, hasOneServiceWithOneNumber, saysThatAMachineWithoutOneCannotHaveIt,
+                            keepsOneByteAndSaysWhatIsNotKept, hasTheDelayThatWasSetLast, answersAndTellsARefusal);
 
 }  // namespace tavisk

@@ -9,7 +9,7 @@
 namespace tavisk {
 
 /// `Machine` offers: service(), of a machine that supports every switch, all off and all timers never; and lack(which),
-/// which takes the support of a switch away.
+/// which takes the support of a switch away; effects() and values().
 template <typename Machine>
 struct PowerSettingsContract : testing::Test {
   static constexpr SleepTimer timers[] = {SleepTimer::computer, SleepTimer::display, SleepTimer::hardDisk};
@@ -51,6 +51,10 @@ TYPED_TEST_P(PowerSettingsContract, saysWhatTheMachineLacks) {
     EXPECT_TRUE(this->machine.service().supports(lacking, this->source));
     this->machine.lack(lacking);
     EXPECT_FALSE(this->machine.service().supports(lacking, this->source));
+    ASSERT_FALSE(this->machine.values().empty());
+    EXPECT_EQ(this->machine.values().back().setting, nameOf(lacking));
+    EXPECT_TRUE(this->machine.values().back().unsupported);
+    EXPECT_TRUE(this->machine.effects().empty());
     EXPECT_FALSE(this->machine.service().isOn(lacking, this->source));
   }
 }

@@ -41,6 +41,10 @@ void MachineSettings::recordUnsupported(const std::string& setting) {
   _effects.recordUnsupported(setting, {"set", machineName, "it cannot have this setting"});
 }
 
+void MachineSettings::observeUnsupported(const std::string& setting) {
+  _effects.observe({.setting = setting, .unsupported = Failure{"read", machineName, "it cannot have this setting"}});
+}
+
 void MachineSettings::note(const MachineSetting<bool>& setting, bool asked) {
   const auto refusal = refused("set", refusalNamed(setting.name));
   const auto written = refusal ? *refusal : parts(setting).store(asked);

@@ -60,6 +60,8 @@ class MachineSettings {
   }
   /// That a setting was to be changed which the machine cannot have.
   void recordUnsupported(const std::string& setting);
+  /// The same of one that was to be read.
+  void observeUnsupported(const std::string& setting);
   /// Writes what is no setting of the machine but the run's own doing: only a failure is an effect, and "*" does not
   /// refuse it.
   void note(const MachineSetting<bool>& setting, bool asked);

@@ -44,24 +44,31 @@ std::optional<PowerController::Service> ScratchPowerController::serviceOfClass(c
   return known.find(className) ? std::optional(Service{className}) : std::nullopt;
 }
 
-std::optional<std::int64_t> ScratchPowerController::numberProperty(const Service& service,
+std::optional<std::int64_t> ScratchPowerController::numberProperty(const std::optional<Service>& service,
                                                                    const std::string& property) {
-  return _settings.read(delayOf(service, property));
+  if (service) return _settings.read(delayOf(*service, property));
+  _settings.observeUnsupported(setting::startupDelay);
+  return std::nullopt;
 }
 
 std::pair<ControllerStatus, PowerController::Connection> ScratchPowerController::open(
     const std::optional<Service>& service, std::uint32_t /*connectionType*/) {
-  if (!service) return {checked(noSuchDevice, "open", "the power controller"), {}};
+  if (!service) {
+    _settings.recordUnsupported(setting::startupDelay);
+    return {noSuchDevice, {}};
+  }
   return {checked(section(*service).integer("Open Status"), "open", service->name), {*service}};
 }
 
 ControllerStatus ScratchPowerController::setProperties(const Connection& connection,
-                                                       const PropertyList::Dictionary& properties) {
+                                                       const PropertyList::Dictionary& properties, std::int64_t asked) {
   const auto status = section(connection.service).integer("Set Status");
   if (status != 0) return checked(status, "set properties", connection.service.name);
   for (const auto& [property, value] : properties) {
     const auto setting = delayOf(connection.service, property, value);
-    if (_settings.change(setting, numberIn(value)).outcome == Outcome::failed) return refused;
+    const auto effect = _settings.change(setting, asked);
+    const bool isKept = !effect.where.empty() && effect.live == textOf(numberIn(value));
+    if (effect.outcome == Outcome::failed && !isKept) return refused;
   }
   return 0;
 }

@@ -15,10 +15,12 @@ class ScratchPowerController final : public PowerController {
 
   ControllerStatus masterPort() override;
   std::optional<Service> serviceOfClass(const std::string& className) override;
-  std::optional<std::int64_t> numberProperty(const Service& service, const std::string& property) override;
+  std::optional<std::int64_t> numberProperty(const std::optional<Service>& service,
+                                             const std::string& property) override;
   std::pair<ControllerStatus, Connection> open(const std::optional<Service>& service,
                                                std::uint32_t connectionType) override;
-  ControllerStatus setProperties(const Connection& connection, const PropertyList::Dictionary& properties) override;
+  ControllerStatus setProperties(const Connection& connection, const PropertyList::Dictionary& properties,
+                                 std::int64_t asked) override;
   ControllerStatus close(const Connection& connection) override;
 
  private:

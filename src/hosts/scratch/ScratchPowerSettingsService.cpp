@@ -82,18 +82,24 @@ void ScratchPowerSettingsService::setUntilSleep(SleepTimer timer, const PowerSou
   _settings.change(settingOf(timer, source), minutes);
 }
 
-bool ScratchPowerSettingsService::supports(PowerSwitch which, const PowerSource& source) {
+bool ScratchPowerSettingsService::has(PowerSwitch which, const PowerSource& source) {
   return _settings.section(sources).section(source.name).find(keyOf(which)) != nullptr;
 }
 
+bool ScratchPowerSettingsService::supports(PowerSwitch which, const PowerSource& source) {
+  if (has(which, source)) return true;
+  _settings.observeUnsupported(nameOf(which));
+  return false;
+}
+
 bool ScratchPowerSettingsService::canSet(PowerSwitch which, const PowerSource& source) {
-  if (supports(which, source)) return true;
+  if (has(which, source)) return true;
   _settings.recordUnsupported(nameOf(which));
   return false;
 }
 
 bool ScratchPowerSettingsService::isOn(PowerSwitch which, const PowerSource& source) {
-  return _settings.isOn(settingOf(which, source));
+  return has(which, source) && _settings.isOn(settingOf(which, source));
 }
 
 void ScratchPowerSettingsService::setOn(PowerSwitch which, const PowerSource& source, bool on) {

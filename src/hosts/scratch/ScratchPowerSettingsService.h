@@ -23,6 +23,8 @@ class ScratchPowerSettingsService final : public PowerSettingsService {
   void setRestartsAfterFreeze(bool restarts) override;
 
  private:
+  bool has(PowerSwitch which, const PowerSource& source);
+
   MachineSettings& _settings;
 };
 

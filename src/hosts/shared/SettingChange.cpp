@@ -58,7 +58,8 @@ class Change {
 
   void remark() {
     if (_steps.undoneBy) _effect.undoneBy = _steps.undoneBy();
-    if (_steps.note && _effect.outcome != Outcome::failed) _effect.note = _steps.note();
+    const bool isAsAsked = _effect.outcome == Outcome::applied || _effect.outcome == Outcome::unchanged;
+    if (_steps.note && isAsAsked) _effect.note = _steps.note();
   }
 
  private:

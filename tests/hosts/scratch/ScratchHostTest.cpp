@@ -30,6 +30,7 @@ template <auto Service>
 struct ScratchService {
   auto& service() { return (machine.host().*Service)(); }
   const std::vector<Effect>& effects() { return machine.log.effects; }
+  const std::vector<SettingValue>& values() { return machine.log.values; }
   ScratchMachine machine;
 };
 
@@ -166,6 +167,7 @@ INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PowerSettingsContract, ScratchPower);
 struct ScratchController : ScratchService<&Host::powerController> {
   static constexpr const char* className = "VelmarKCS";
   ScratchController() { machine.set("Registry", "Services", keys({{className, keys({{"ServerID", 0}})}})); }
+  void lackController() { machine.set("Registry", "Services", keys({})); }
   void refuseDelays() { machine.refuse(setting::startupDelay, "locked"); }
 };
 INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, PowerControllerContract, ScratchController);

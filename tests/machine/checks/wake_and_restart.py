@@ -3,7 +3,7 @@
 import re
 
 from check import Check
-from checks.sleep_timers import LOGIN, idle
+from checks.sleep_timers import LOGIN, idle, reported, reporting
 
 CONTAINER, GUEST, SERVER = frozenset({"container"}), frozenset({"guest"}), frozenset({"server"})
 NOT_HERE = "Not supported on this machine.\n"
@@ -11,6 +11,9 @@ NOT_HERE = "Not supported on this machine.\n"
 CARDS = "for card in /sys/class/net/eth*; do ethtool ${card##*/} | sed -n 's/^\\tWake-on: //p' | grep . || echo none; done"
 PORT = "cat /sys/class/tty/ttyS0/device/power/wakeup"
 KEPT = "controller tells"
+PANIC = "/etc/sysctl.d/60-tavisk.conf"
+ADMIN, LATER = "/etc/sysctl.d/50-admin.conf", "/etc/sysctl.d/70-other.conf"
+BUTTON = "/etc/systemd/logind.conf.d/70-other.conf"
 WATCHDOG = ("busctl get-property org.freedesktop.systemd1 /org/freedesktop/systemd1 org.freedesktop.systemd1.Manager "
             "RuntimeWatchdogUSec")
 
@@ -34,15 +37,38 @@ CHECKS = [
     Check("a machine without a controller says so", needs=CONTAINER, status=1,
           do="tavisk -getrestartpowerfailure -setrestartpowerfailure on",
           prints=2 * "Restart After Power Failure: Not supported on this machine.\n"),
-    Check("a machine that hangs stays so", needs=SERVER, do="tavisk -setrestartfreeze off -getrestartfreeze",
+    Check("a machine that hangs stays so", needs=SERVER,
+          do=f"rm -f {ADMIN}; tavisk -setrestartfreeze off -getrestartfreeze",
           prints="Restart After Freeze: Off\n", then=freeze(0, "inactive", 0)),
-    Check("a machine that hangs restarts", needs=SERVER, kept=True,
+    Check("a file that hides it leaves all as it was", needs=SERVER,
+          do=f"echo 'kernel.panic = 0' >{LATER}; {reporting('-setrestartfreeze on -getrestartfreeze')}; rm {LATER}",
+          prints="Restart After Freeze: Off\n",
+          errors=re.compile(f"tavisk: Restart After Freeze: write on {PANIC}: {LATER} says otherwise[^\\n]*\\n"),
+          then=freeze(0, "inactive", 0) | reported('"changed":false,"values":[],"effects":[{', f'"undoneBy":"{LATER}"') |
+               {f"test -e {PANIC} || echo gone": "gone\n"}),
+    Check("a machine that hangs restarts", needs=SERVER,
           do="TAVISK_LOG=stderr tavisk -setrestartfreeze on -getrestartfreeze", errors="",
           prints="Restart After Freeze: On\n",
           then=freeze(60, "active", 10) | {"tavisk -getrestartfreeze": "Restart After Freeze: On\n"}),
+    Check("an administrator's own kernel.panic stays", needs=SERVER, kept=True,
+          do=f"tavisk -setrestartfreeze off; echo 'kernel.panic = 5' >{ADMIN}; sysctl -q -p {ADMIN}; " +
+             reporting("-setrestartfreeze on -getrestartfreeze") + f"; grep -c {PANIC} /run/report", errors="",
+          prints="Restart After Freeze: On\n0\n",
+          then=freeze(60, "active", 5) | {f"test -e {PANIC} || echo gone": "gone\n",
+                                          "tavisk -getrestartfreeze": "Restart After Freeze: On\n"}),
     Check("without services a kernel that panics restarts", needs=GUEST,
           do="tavisk -setrestartfreeze on -getrestartfreeze", prints="Restart After Freeze: On\n",
           then={"cat /proc/sys/kernel/panic": "10\n"}),
+    Check("a power button that another file keeps off", needs=SERVER,
+          do=f"tavisk -setallowpowerbuttontosleepcomputer off; printf '[Login]\\nHandlePowerKey=ignore\\n' >{BUTTON}; " +
+             reporting("-setallowpowerbuttontosleepcomputer on") + f"; rm {BUTTON}",
+          prints="setallowpowerbuttontosleepcomputer: Off\nsetallowpowerbuttontosleepcomputer: On\n",
+          errors=re.compile(rf"tavisk: Power Button Sleep: write on [^\n]*: {BUTTON} says otherwise[^\n]*\n"),
+          then={LOGIN + "HandlePowerKey": 's "poweroff"\n'} | reported('"changed":false')),
+    Check("a login service that another run restarts is asked again", needs=SERVER,
+          do="(for minutes in 20 40 20 170; do systemctl reset-failed systemd-logind; tavisk -setcomputersleep $minutes; done) "
+             ">/dev/null & for word in off on off on off on; do TAVISK_LOG=stderr tavisk -setallowpowerbuttontosleepcomputer $word; "
+             "done >/dev/null; wait", errors=""),
     Check("the power button sleeps", needs=SERVER, kept=True,
           do="tavisk -setallowpowerbuttontosleepcomputer off -getallowpowerbuttontosleepcomputer "
              "-setallowpowerbuttontosleepcomputer on",
@@ -61,7 +87,10 @@ CHECKS = [
         ("wakeonmodem", "Wake On Modem", "off", PORT, "disabled\n"))
 ] + [
     Check(f"nothing wakes this {name}", needs=needs, status=1,
-          do="tavisk -getwakeonmodem -getwakeonnetworkaccess -setwakeonnetworkaccess on -setwakeonmodem on",
-          prints="Wake On Modem: " + NOT_HERE + 2 * ("Wake On Network Access: " + NOT_HERE) + "Wake On Modem: " + NOT_HERE)
+          do=reporting("-getwakeonmodem -getwakeonnetworkaccess -setwakeonnetworkaccess on -setwakeonmodem on"),
+          prints="Wake On Modem: " + NOT_HERE + 2 * ("Wake On Network Access: " + NOT_HERE) + "Wake On Modem: " + NOT_HERE,
+          errors=re.compile(r"tavisk: Wake On Network Access: [^\n]*\ntavisk: Wake On Modem: [^\n]*\n"),
+          then={"grep -c '\"supported\":false.*\"effects\":\\[\\]' /run/report": "2\n",
+                "grep -c '\"outcome\":\"not supported\"' /run/report": "2\n"})
     for name, needs in (("container", CONTAINER), ("server", SERVER))
 ]

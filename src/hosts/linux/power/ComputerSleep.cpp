@@ -7,10 +7,10 @@
 #include <memory>
 
 #include "effects/SettingNames.h"
+#include "effects/Warning.h"
 #include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/KernelFile.h"
-#include "hosts/linux/system/Rights.h"
 #include "hosts/linux/system/TimeSpan.h"
 
 namespace tavisk {
@@ -21,11 +21,29 @@ constexpr Daemon loginDaemon{"systemd-logind.service", "", "systemd-logind"};
 constexpr Daemon sleepTarget{"suspend.target", "", ""};
 constexpr const char* inputs = "/sys/class/input";
 constexpr const char* section = "Login";
+constexpr const char* action = "IdleAction";
+constexpr const char* actionTime = "IdleActionSec";
+constexpr const char* powerKey = "HandlePowerKey";
 constexpr std::chrono::milliseconds betweenQuestions{20};
+constexpr std::chrono::seconds longestRestart{3};
+constexpr std::chrono::minutes withoutTime{30};
 
-bool isSleep(const std::string& action) {
+bool isSleep(const std::string& word) {
   constexpr std::string_view words[] = {"sleep", "suspend", "hibernate", "hybrid-sleep", "suspend-then-hibernate"};
-  return std::ranges::find(words, action) != std::end(words);
+  return std::ranges::find(words, word) != std::end(words);
+}
+
+Minutes minutesOf(const std::string& word, const std::optional<std::string>& time) {
+  if (!isSleep(word)) return {};
+  return Minutes::covering(time ? timeSpan(*time).value_or(withoutTime) : withoutTime);
+}
+
+/// Whether the service was not there, or has gone away before it could answer (sd_bus_error_get_errno(3)): the errors
+/// NameHasNoOwner, Disconnected, NoReply. One that is only slow has the last code too, and is not asked twice by the
+/// bus.
+bool isAway(const Failure& failure) {
+  return failure.code == std::errc::no_such_device_or_address || failure.code == std::errc::connection_reset ||
+         failure.code == std::errc::timed_out;
 }
 
 Result<bool> hasPowerButton(const SystemRoot& root) {
@@ -43,43 +61,71 @@ Result<bool> hasPowerButton(const SystemRoot& root) {
 
 }  // namespace
 
+Result<BusMessage> ComputerSleep::ask(const Question& question) {
+  const auto askOnce = [&]() -> Result<BusMessage> {
+    const auto bus = _machine.services.systemBus();
+    return bus ? question(**bus) : bus.failure();
+  };
+  auto answer = askOnce();
+  if (answer || !isAway(answer.failure())) return answer;
+  const auto first = answer.failure();
+  const auto questions = _machine.runLoop.every(betweenQuestions, [] {});
+  const auto isBack = [&] {
+    answer = askOnce();
+    return answer || !isAway(answer.failure());
+  };
+  static_cast<void>(_machine.runLoop.runUntil(RunLoop::Clock::now() + longestRestart, isBack));
+  if (!answer) return first;
+  return answer;
+}
+
 Result<BusMessage> ComputerSleep::property(const char* name, const char* signature) {
-  const auto bus = _machine.services.systemBus();
-  if (!bus) return bus.failure();
-  return (*bus)->property(loginManager(), name, signature);
+  return ask([=](Bus& bus) { return bus.property(loginManager(), name, signature); });
 }
 
 Result<Minutes> ComputerSleep::liveMinutes() {
   // Without the service nothing lets an idle machine sleep.
   if (!_machine.services.hasServiceManager()) return Minutes{};
-  auto action = property("IdleAction", "s");
-  if (!action) return action.failure();
-  if (!isSleep(std::move(action).value().readText())) return Minutes{};
+  auto word = property(action, "s");
+  if (!word) return word.failure();
+  if (!isSleep(std::move(word).value().readText())) return Minutes{};
   auto time = property("IdleActionUSec", "t");
   if (!time) return time.failure();
   return Minutes::covering(std::chrono::microseconds(std::move(time).value().readUint64()));
 }
 
 Result<bool> ComputerSleep::liveButton() {
-  auto action = property("HandlePowerKey", "s");
-  if (!action) return action.failure();
-  return isSleep(std::move(action).value().readText());
+  auto word = property(powerKey, "s");
+  if (!word) return word.failure();
+  return isSleep(std::move(word).value().readText());
 }
 
 Result<Minutes> ComputerSleep::storedMinutes() const {
-  constexpr std::chrono::minutes withoutOne{30};
-  const auto action = _config.last(section, "IdleAction");
-  if (!action) return action.failure();
-  if (!*action || !isSleep((*action)->value)) return Minutes{};
-  const auto time = _config.last(section, "IdleActionSec");
+  const auto word = _config.last(section, action);
+  if (!word) return word.failure();
+  const auto time = _config.last(section, actionTime);
   if (!time) return time.failure();
-  return Minutes::covering(*time ? timeSpan((*time)->value).value_or(withoutOne) : withoutOne);
+  return minutesOf(*word ? (*word)->value : "", *time ? std::optional((*time)->value) : std::nullopt);
+}
+
+Result<std::optional<Minutes>> ComputerSleep::ownMinutes() const {
+  const auto word = _config.own(section, action);
+  if (!word) return word.failure();
+  const auto time = _config.own(section, actionTime);
+  if (!time) return time.failure();
+  return *word ? std::optional(minutesOf(**word, *time)) : std::nullopt;
 }
 
 Result<bool> ComputerSleep::storedButton() const {
-  const auto action = _config.last(section, "HandlePowerKey");
-  if (!action) return action.failure();
-  return *action && isSleep((*action)->value);
+  const auto word = _config.last(section, powerKey);
+  if (!word) return word.failure();
+  return *word && isSleep((*word)->value);
+}
+
+Result<std::optional<bool>> ComputerSleep::ownButton() const {
+  const auto word = _config.own(section, powerKey);
+  if (!word) return word.failure();
+  return *word ? std::optional(isSleep(**word)) : std::nullopt;
 }
 
 Support ComputerSleep::sleepSupported() {
@@ -89,7 +135,7 @@ Support ComputerSleep::sleepSupported() {
   const auto bus = _machine.services.systemBus();
   if (!bus && isAbsent(bus.failure())) return NotSupported{bus.failure()};
   if (!bus) return bus.failure();
-  auto answer = (*bus)->call(loginManager(), tried, "s");
+  auto answer = ask([](Bus& asked) { return asked.call(loginManager(), tried, "s"); });
   if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return NotSupported{answer.failure()};
   if (!answer) return answer.failure();
   if (std::move(answer).value().readText() == "na")
@@ -130,18 +176,40 @@ std::string ComputerSleep::whatBlocksSleep() {
   return names;
 }
 
-Result<void> ComputerSleep::store(const std::map<std::string, std::string>& values) {
-  if (auto failure = whyNeedsRoot("write", _config.ownDropIn())) return *failure;
-  return _config.setOwn(section, values);
+std::string ComputerSleep::whatHides(const std::vector<std::string>& keys) const {
+  return _config.whatHides(section, keys).valueOr("");
+}
+
+Result<void> ComputerSleep::store(const std::map<std::string, std::string>& values,
+                                  const std::function<Result<bool>()>& isHeeded) {
+  std::vector<std::string> keys;
+  for (const auto& [key, value] : values) keys.push_back(key);
+  return _ownFile.changeIfHeeded({.write = [&] { return _config.setOwn(section, values); },
+                                  .isHeeded = isHeeded,
+                                  .hidingFile = [&] { return whatHides(keys); }});
 }
 
 Result<void> ComputerSleep::storeMinutes(Minutes asked) {
-  if (asked.isNever()) return store({{"IdleAction", "ignore"}});
-  return store({{"IdleAction", "suspend"}, {"IdleActionSec", textOf(asked) + "min"}});
+  const auto isHeeded = [&]() -> Result<bool> {
+    const auto minutes = storedMinutes();
+    if (!minutes) return minutes.failure();
+    return *minutes == asked;
+  };
+  if (asked.isNever()) return store({{action, "ignore"}}, isHeeded);
+  return store({{action, "suspend"}, {actionTime, textOf(asked) + "min"}}, isHeeded);
+}
+
+Result<void> ComputerSleep::storeButton(bool sleeps) {
+  const auto isHeeded = [&]() -> Result<bool> {
+    const auto sleepsThen = storedButton();
+    if (!sleepsThen) return sleepsThen.failure();
+    return *sleepsThen == sleeps;
+  };
+  return store({{powerKey, sleeps ? "suspend" : "poweroff"}}, isHeeded);
 }
 
 std::string ComputerSleep::whoUndoesMinutes() {
-  const auto file = _config.whatHides(section, {"IdleAction", "IdleActionSec"}).valueOr("");
+  const auto file = whatHides({action, actionTime});
   return file.empty() ? whatBlocksSleep() : file;
 }
 
@@ -149,10 +217,10 @@ std::string ComputerSleep::whoUndoesMinutes() {
 /// go on by the old one. When it starts it takes a machine without users for idle since it was turned on, and would let
 /// it sleep at once, unless it is told that the machine is busy. Sessions live on.
 Result<void> ComputerSleep::restartService(Minutes asked) {
-  const auto bus = _machine.services.systemBus();
-  if (!bus) return bus.failure();
   // The reply holds the lock.
-  const auto busy = (*bus)->call(loginManager(), "Inhibit", "h", "idle", "tavisk", "sets the time of sleep", "block");
+  const auto busy = ask([](Bus& bus) {
+    return bus.call(loginManager(), "Inhibit", "h", "idle", "tavisk", "sets the time of sleep", "block");
+  });
   if (!busy) return busy.failure();
   const auto restarted = _machine.services.daemons().restart(loginDaemon);
   // An answer with the new value proves that it has started and looked at the time, however long its job takes.
@@ -195,11 +263,11 @@ Setting<Minutes> ComputerSleep::computerSleep() {
   setting.undoneBy = [this](Minutes) { return whoUndoesMinutes(); };
   setting.note = [](Minutes asked) -> std::string {
     if (asked.isNever()) return "";
-    return "a machine on which nobody is logged in counts as idle, however busy its services are";
+    return warning("a machine on which nobody is logged in counts as idle, however busy its services are");
   };
   setting.supported = [this] { return sleepSupported(); };
   setting.live = [this] { return liveMinutes(); };
-  setting.stored = [this] { return storedMinutes(); };
+  setting.stored = [this] { return besideOwn(storedMinutes(), ownMinutes(), _ownFile.path()); };
   setting.store = [this](Minutes asked) { return storeMinutes(asked); };
   setting.apply = [this](Minutes asked) { return restartService(asked); };
   return setting;
@@ -209,11 +277,11 @@ Setting<bool> ComputerSleep::powerButtonSleep() {
   Setting<bool> setting;
   setting.name = setting::powerButtonSleep;
   setting.where = _config.ownDropIn();
-  setting.undoneBy = [this](bool) { return _config.whatHides(section, {"HandlePowerKey"}).valueOr(""); };
+  setting.undoneBy = [this](bool) { return whatHides({powerKey}); };
   setting.supported = [this] { return buttonSupported(); };
   setting.live = [this] { return liveButton(); };
-  setting.stored = [this] { return storedButton(); };
-  setting.store = [this](bool sleeps) { return store({{"HandlePowerKey", sleeps ? "suspend" : "poweroff"}}); };
+  setting.stored = [this] { return besideOwn(storedButton(), ownButton(), _ownFile.path()); };
+  setting.store = [this](bool sleeps) { return storeButton(sleeps); };
   setting.apply = [this](bool) { return applyButton(); };
   setting.settled = onceButtonReads();
   return setting;

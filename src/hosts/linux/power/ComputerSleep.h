@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "hosts/linux/power/OwnFile.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/linux/system/SystemdConfig.h"
 #include "hosts/shared/SettingChange.h"
@@ -13,7 +14,8 @@ namespace tavisk {
 /// (systemd-logind.service(8)), and by the tool's drop-in for it (logind.conf(5)). Its settings refer to the object.
 class ComputerSleep {
  public:
-  explicit ComputerSleep(const LinuxMachine& machine) : _machine(machine), _config(machine.root, "logind.conf") {}
+  explicit ComputerSleep(const LinuxMachine& machine)
+      : _machine(machine), _config(machine.root, "logind.conf"), _ownFile(machine.root, _config.ownDropIn()) {}
 
   /// After how many minutes it sleeps when it is idle.
   Setting<Minutes> computerSleep();
@@ -21,16 +23,24 @@ class ComputerSleep {
   Setting<bool> powerButtonSleep();
 
  private:
+  using Question = std::function<Result<BusMessage>(Bus& bus)>;
+  /// Of the login service. Another run may just be restarting it: it is asked again until it is back.
+  Result<BusMessage> ask(const Question& question);
   Result<BusMessage> property(const char* name, const char* signature);
   Result<Minutes> liveMinutes();
   Result<bool> liveButton();
+  /// By all files, and by the tool's own alone, where it says something.
   Result<Minutes> storedMinutes() const;
+  Result<std::optional<Minutes>> ownMinutes() const;
   Result<bool> storedButton() const;
+  Result<std::optional<bool>> ownButton() const;
   Support sleepSupported();
   Support buttonSupported();
   std::string whatBlocksSleep();
-  Result<void> store(const std::map<std::string, std::string>& values);
+  std::string whatHides(const std::vector<std::string>& keys) const;
+  Result<void> store(const std::map<std::string, std::string>& values, const std::function<Result<bool>()>& isHeeded);
   Result<void> storeMinutes(Minutes asked);
+  Result<void> storeButton(bool sleeps);
   std::string whoUndoesMinutes();
   Result<void> restartService(Minutes asked);
   Result<void> applyButton();
@@ -39,6 +49,7 @@ class ComputerSleep {
 
   LinuxMachine _machine;
   SystemdConfig _config;
+  OwnFile _ownFile;
 };
 
 }  // namespace tavisk

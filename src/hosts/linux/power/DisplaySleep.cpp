@@ -6,7 +6,10 @@
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/power/KernelParameter.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
+#include "hosts/linux/system/SystemdConfig.h"
 
 namespace tavisk {
 namespace {
@@ -14,6 +17,7 @@ namespace {
 constexpr const char* terminal = "/dev/tty1";
 constexpr const char* secondsFile = "/sys/module/kernel/parameters/consoleblank";
 constexpr std::string_view lineStart = "w /dev/tty1 - - - - \\033[9;";
+constexpr std::string_view sequenceStart = "[9;";
 constexpr char lineEnd = ']';
 constexpr Minutes kernelLimit{60};
 
@@ -46,39 +50,86 @@ Setting<Minutes>::Found DisplaySleep::live() const {
   return Minutes::covering(std::chrono::seconds(leadingInteger(*seconds)));
 }
 
-Result<std::optional<Minutes>> DisplaySleep::stored() const {
+std::optional<DisplaySleep::Line> DisplaySleep::lineIn(const std::string& file, const std::string& text) {
+  for (const auto& line : configurationLines(text)) {
+    const auto words = split(line, " \t");
+    if (words.size() < 2 || !words[0].starts_with('w') || words[1] != terminal) continue;
+    const auto sequence = line.find(sequenceStart);
+    if (sequence == std::string::npos) return Line{file, std::nullopt};
+    const auto start = sequence + sequenceStart.size();
+    const auto minutes = parseNumber<unsigned long>(line.substr(start, line.find(lineEnd, start) - start));
+    return Line{file, minutes ? std::optional(Minutes{*minutes}) : std::nullopt};
+  }
+  return std::nullopt;
+}
+
+/// Of several lines about one path the first one counts, by the names of their files (tmpfiles.d(5)).
+Result<std::optional<DisplaySleep::Line>> DisplaySleep::firstLine() const {
+  const auto files = configurationFiles(
+      _machine.root, {"/etc/tmpfiles.d/", "/run/tmpfiles.d/", "/usr/local/lib/tmpfiles.d/", "/usr/lib/tmpfiles.d/"});
+  if (!files) return files.failure();
+  for (const auto& file : *files) {
+    const auto text = orEmpty(_machine.root.read(file, configurationLimit));
+    if (!text) return text.failure();
+    if (auto line = lineIn(file, *text)) return line;
+  }
+  return std::nullopt;
+}
+
+Result<Minutes> DisplaySleep::storedMinutes() const {
+  const auto line = firstLine();
+  if (!line) return line.failure();
+  if (*line && (*line)->minutes) return *(*line)->minutes;
+  const auto seconds = kernelParameter(_machine.root, "consoleblank");
+  if (!seconds) return seconds.failure();
+  return Minutes::covering(std::chrono::seconds(leadingInteger(seconds->value_or(""))));
+}
+
+Result<std::optional<Minutes>> DisplaySleep::ownMinutes() const {
   const auto text = _file.text();
   if (!text) return text.failure();
-  const auto line = text->find(lineStart);
-  if (line == std::string::npos) return std::nullopt;
-  const auto start = line + lineStart.size();
-  const auto minutes = parseNumber<unsigned long>(text->substr(start, text->find(lineEnd, start) - start));
-  return minutes ? std::optional(Minutes{*minutes}) : std::nullopt;
+  const auto line = lineIn(_file.path(), *text);
+  return line ? line->minutes : std::nullopt;
+}
+
+std::string DisplaySleep::whatHides() const {
+  const auto line = firstLine();
+  return line && *line && (*line)->file != _file.path() ? (*line)->file : "";
 }
 
 Result<void> DisplaySleep::store(Minutes asked) const {
-  return _file.replace(std::string(lineStart) + textOf(asked) + lineEnd + "\n");
+  const auto isHeeded = [&]() -> Result<bool> {
+    const auto minutes = storedMinutes();
+    if (!minutes) return minutes.failure();
+    return *minutes == asked;
+  };
+  return _file.changeIfHeeded(
+      {.write = [&] { return _file.replace(std::string(lineStart) + textOf(asked) + lineEnd + "\n"); },
+       .isHeeded = isHeeded,
+       .hidingFile = [this] { return whatHides(); }});
 }
 
 std::string DisplaySleep::noteOn(Minutes asked) const {
   std::string note;
   if (asked > kernelLimit) note = "the kernel blanks its console after 60 minutes at the latest";
   if (_machine.services.hasServiceManager()) return note;
-  return note + (note.empty() ? "" : "; ") + "nothing here reads the file: lasts until the restart";
+  return note + (note.empty() ? "" : "; ") + "nothing here reads a file of it: lasts until the restart";
 }
 
 Setting<Minutes> DisplaySleep::displaySleep() const {
   Setting<Minutes> setting;
   setting.name = setting::displaySleep;
   setting.unit = "minutes";
-  setting.where = _file.path();
+  setting.undoneBy = [this](Minutes) { return whatHides(); };
   setting.note = [this](Minutes asked) { return noteOn(asked); };
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
-  setting.stored = [this] { return stored(); };
-  setting.store = [this](Minutes asked) { return store(asked); };
   setting.apply = [this](Minutes asked) { return _console.write("\033[9;" + textOf(limited(asked)) + "]"); };
   setting.liveFor = limited;
+  if (!_machine.services.hasServiceManager()) return setting;
+  setting.where = _file.path();
+  setting.stored = [this] { return besideOwn(storedMinutes(), ownMinutes(), _file.path()); };
+  setting.store = [this](Minutes asked) { return store(asked); };
   return setting;
 }
 

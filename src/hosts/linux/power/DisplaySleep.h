@@ -40,7 +40,18 @@ class DisplaySleep {
  private:
   Support supported() const;
   Setting<Minutes>::Found live() const;
-  Result<std::optional<Minutes>> stored() const;
+
+  /// What the machine's files say of the console; without minutes: something that is not about blanking.
+  struct Line {
+    std::string file;
+    std::optional<Minutes> minutes;
+  };
+  static std::optional<Line> lineIn(const std::string& file, const std::string& text);
+  /// The one that counts; absent when none is about the console.
+  Result<std::optional<Line>> firstLine() const;
+  Result<Minutes> storedMinutes() const;
+  Result<std::optional<Minutes>> ownMinutes() const;
+  std::string whatHides() const;
   std::string noteOn(Minutes asked) const;
   Result<void> store(Minutes asked) const;
 

@@ -64,6 +64,9 @@ Result<bool> canStop(const SysDevice& disk) {
 
 }  // namespace
 
+HardDiskSleep::HardDiskSleep(const LinuxMachine& machine)
+    : _machine(machine), _rule(machine.root, "disk-sleep", ruleFor) {}
+
 Result<std::optional<HardDiskSleep::Disk>> HardDiskSleep::stoppableDisk(const std::string& name) const {
   if (!name.starts_with("sd")) return std::nullopt;
   const auto block = SysDevice::at(_machine.root, "/sys/block/" + name);
@@ -96,21 +99,21 @@ Result<void> HardDiskSleep::apply(Minutes asked) const {
   return setEach(disks(), [asked](const Disk& disk) { return setMinutes(disk.device, asked); });
 }
 
+std::string HardDiskSleep::whatUndoes() const {
+  auto owners = ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::laptopMode, OtherOwner::powertop,
+                                             OtherOwner::smartd, OtherOwner::hdIdle});
+  return owners.empty() ? laterRules(_machine.root, _rule.file(), {"\"block\"", R"(device/power/control}=")"}) : owners;
+}
+
 Setting<Minutes> HardDiskSleep::hardDiskSleep() const {
   Setting<Minutes> setting;
   setting.name = setting::hardDiskSleep;
   setting.unit = "minutes";
-  setting.where = _rule.file();
-  setting.note = [this](Minutes) { return whyNoRuleLasts(_machine.root); };
-  setting.undoneBy = [this](Minutes) {
-    return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::laptopMode, OtherOwner::powertop,
-                                        OtherOwner::smartd, OtherOwner::hdIdle});
-  };
+  setting.undoneBy = [this](Minutes) { return whatUndoes(); };
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
-  setting.stored = [this] { return _rule.value(); };
-  setting.store = [this](Minutes asked) { return _rule.write(asked, ruleFor(asked)); };
   setting.apply = [this](Minutes asked) { return apply(asked); };
+  keepBy(_rule, _machine.root, setting);
   return setting;
 }
 

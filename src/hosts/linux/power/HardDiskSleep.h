@@ -15,7 +15,7 @@ namespace tavisk {
 /// disks: Documentation/ABI/testing/sysfs-devices-power).
 class HardDiskSleep {
  public:
-  explicit HardDiskSleep(const LinuxMachine& machine) : _machine(machine), _rule(machine.root, "disk-sleep") {}
+  explicit HardDiskSleep(const LinuxMachine& machine);
 
   /// Refers to the object.
   Setting<Minutes> hardDiskSleep() const;
@@ -31,6 +31,7 @@ class HardDiskSleep {
   Support supported() const;
   Setting<Minutes>::Found live() const;
   Result<void> apply(Minutes asked) const;
+  std::string whatUndoes() const;
 
   LinuxMachine _machine;
   UdevRule<Minutes> _rule;

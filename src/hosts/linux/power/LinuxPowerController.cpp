@@ -31,9 +31,13 @@ ControllerStatus statusOf(const Failure& failure, int withoutCode) {
   return failure.code ? failure.code.value() : withoutCode;
 }
 
-/// A controller of another maker cannot have the setting; a file that cannot be read or understood says nothing of it.
-Support whyNotKnown(const Failure& failure) {
-  if (failure.code == std::errc::function_not_supported) return NotSupported{failure};
+/// Whether the machine has no controller with a start-up delay; what cannot be read or understood says nothing of it.
+bool cannotHave(const Failure& failure) {
+  return failure.code == std::errc::function_not_supported || failure.code == std::errc::no_such_device;
+}
+
+Support supportAfter(const Failure& failure) {
+  if (cannotHave(failure)) return NotSupported{failure};
   return failure;
 }
 
@@ -44,7 +48,10 @@ Failure invalid(const char* tried, const char* why) {
 }  // namespace
 
 ControllerStatus LinuxPowerController::recorded(const Failure& failure) {
-  _machine.effects.recordFailure(setting::startupDelay, failure);
+  if (cannotHave(failure))
+    _machine.effects.recordUnsupported(setting::startupDelay, failure);
+  else
+    _machine.effects.recordFailure(setting::startupDelay, failure);
   return statusOf(failure, EIO);
 }
 
@@ -54,17 +61,28 @@ ControllerStatus LinuxPowerController::masterPort() {
   return *there ? 0 : recorded(systemFailure("look at the devices", deviceClass, ENODEV));
 }
 
-std::optional<PowerController::Service> LinuxPowerController::serviceOfClass(const std::string& className) {
-  if (className != controllerClass) return std::nullopt;
+Result<void> LinuxPowerController::look() {
   // The driver is loaded by this, where it is not yet; whether it opens is not asked here.
   static_cast<void>(_controller.open());
   const auto typeOf = [this](const std::string& controller) {
     return orGone(readKernelFile(_machine.root, controllers + controller + "/device/type"));
   };
   const auto types = ofEachIn(_machine.root, controllers, typeOf);
-  if (!types) recorded(types.failure());
-  const bool hasOne = types && std::ranges::find(*types, "kcs") != types->end();
-  return hasOne ? std::optional(Service{className}) : std::nullopt;
+  if (!types) return types.failure();
+  if (std::ranges::find(*types, "kcs") != types->end()) return {};
+  return Failure{"find", managementController, "this machine has none, or no driver for it (ipmi_si, ipmi_devintf)",
+                 std::make_error_code(std::errc::no_such_device)};
+}
+
+std::optional<PowerController::Service> LinuxPowerController::serviceOfClass(const std::string& className) {
+  if (className != controllerClass) return std::nullopt;
+  return look() ? std::optional(Service{className}) : std::nullopt;
+}
+
+Result<StartupDelayRequests> LinuxPowerController::requests() {
+  if (const auto there = look(); !there) return there.failure();
+  const auto manufacturer = _controller.manufacturer();
+  return manufacturer ? startupDelayRequests(_machine.root, *manufacturer) : manufacturer.failure();
 }
 
 Result<std::int64_t> LinuxPowerController::askDelay(const StartupDelayRequests& requests) {
@@ -88,63 +106,64 @@ Result<void> LinuxPowerController::sendDelay(const StartupDelayRequests& request
   return answer ? Result<void>() : answer.failure();
 }
 
-Setting<std::int64_t> LinuxPowerController::delaySetting(const StartupDelayRequests& requests) {
+Setting<std::int64_t> LinuxPowerController::delaySetting(const Result<StartupDelayRequests>& requests) {
   Setting<std::int64_t> delay;
   delay.name = setting::startupDelay;
   delay.unit = "units of 30 seconds";
   delay.where = managementController;
-  if (requests.get) {
-    delay.live = [this, requests] { return askDelay(requests); };
-    return delay;
+  if (!requests) {
+    delay.supported = [why = requests.failure()] { return supportAfter(why); };
+    delay.live = [why = requests.failure()] { return why; };
+  } else if (requests->get) {
+    delay.live = [this, known = *requests] { return askDelay(known); };
+  } else {
+    delay.note = saying("this controller does not tell its delay: the wish is kept in " + std::string(wishFile));
+    delay.stored = [this] { return keptWish(); };
+    // What the controller has may have changed since.
+    delay.always = true;
   }
-  delay.note = saying("this controller does not tell its delay: the wish is kept in " + std::string(wishFile));
-  delay.stored = [this] { return keptWish(); };
-  // What the controller has may have changed since.
-  delay.always = true;
   return delay;
 }
 
-std::optional<std::int64_t> LinuxPowerController::numberProperty(const Service& /*service*/,
+std::optional<std::int64_t> LinuxPowerController::numberProperty(const std::optional<Service>& /*service*/,
                                                                  const std::string& property) {
   if (property != delayProperty) return std::nullopt;
-  const auto manufacturer = _controller.manufacturer();
-  const auto known = manufacturer ? startupDelayRequests(_machine.root, *manufacturer)
-                                  : Result<StartupDelayRequests>(manufacturer.failure());
-  if (known) return observe(delaySetting(*known), _machine.effects);
-  recorded(known.failure());
-  return std::nullopt;
+  return observe(delaySetting(requests()), _machine.effects);
 }
 
 std::pair<ControllerStatus, PowerController::Connection> LinuxPowerController::open(
     const std::optional<Service>& service, std::uint32_t /*connectionType*/) {
-  const auto opened = service ? _controller.open() : systemFailure("open", managementController, ENODEV);
-  return {opened ? 0 : recorded(opened.failure()), service ? Connection{*service} : Connection{}};
+  const auto there = look();
+  const auto opened = there ? _controller.open() : there;
+  if (service) return {opened ? 0 : recorded(opened.failure()), Connection{*service}};
+  recorded(there ? systemFailure("open", managementController, ENODEV) : there.failure());
+  return {ENODEV, {}};
 }
 
 ControllerStatus LinuxPowerController::setProperties(const Connection& /*connection*/,
-                                                     const PropertyList::Dictionary& properties) {
+                                                     const PropertyList::Dictionary& properties, std::int64_t asked) {
   const auto units = byteIn(properties);
-  if (!units || properties.size() != 1)
-    return recorded(invalid("set properties", "its one property is ServerID, one byte"));
-  const auto manufacturer = _controller.manufacturer();
-  return manufacturer ? setDelay(*manufacturer, *units) : recorded(manufacturer.failure());
+  if (units && properties.size() == 1) return setDelay(*units, asked);
+  return recorded(invalid("set properties", "its one property is ServerID, one byte"));
 }
 
-ControllerStatus LinuxPowerController::setDelay(std::uint32_t manufacturer, std::uint8_t units) {
-  const auto known = startupDelayRequests(_machine.root, manufacturer);
-  ControllerStatus status = 0;
-  auto delay = known ? delaySetting(*known) : Setting<std::int64_t>();
-  delay.name = setting::startupDelay;
-  if (!known) delay.supported = [&] { return whyNotKnown(known.failure()); };
-  delay.apply = [&](std::int64_t asked) -> Result<void> {
-    auto sent = sendDelay(*known, units);
-    if (!sent) status = statusOf(sent.failure(), EIO);
-    if (!sent || known->get) return sent;
-    return _machine.root.write(wishFile, textOf(asked) + "\n");
+ControllerStatus LinuxPowerController::setDelay(std::uint8_t units, std::int64_t asked) {
+  const auto known = requests();
+  Result<void> sent;
+  Result<void> kept;
+  auto delay = delaySetting(known);
+  delay.apply = [&](std::int64_t) {
+    sent = sendDelay(*known, units);
+    if (sent && !known->get) kept = _machine.root.write(wishFile, textOf(std::int64_t{units}) + "\n");
+    return sent ? kept : sent;
   };
-  const auto outcome = carryOut(delay, units, _machine).outcome;
+  if (known && !known->get)
+    delay.written = [&] { return !sent ? "" : managementController + (kept ? std::string(", ") + wishFile : ""); };
+  const auto effect = carryOut(delay, asked, _machine);
   if (!known) return statusOf(known.failure(), ENOSYS);
-  return outcome == Outcome::failed && status == 0 ? EIO : status;
+  if (!sent) return statusOf(sent.failure(), EIO);
+  const bool isKept = (delay.live ? effect.live : effect.stored) == textOf(std::int64_t{units});
+  return effect.outcome != Outcome::failed || isKept ? 0 : EIO;
 }
 
 ControllerStatus LinuxPowerController::close(const Connection& /*connection*/) {

@@ -20,18 +20,24 @@ class LinuxPowerController final : public PowerController {
 
   ControllerStatus masterPort() override;
   std::optional<Service> serviceOfClass(const std::string& className) override;
-  std::optional<std::int64_t> numberProperty(const Service& service, const std::string& property) override;
+  std::optional<std::int64_t> numberProperty(const std::optional<Service>& service,
+                                             const std::string& property) override;
   std::pair<ControllerStatus, Connection> open(const std::optional<Service>& service,
                                                std::uint32_t connectionType) override;
-  ControllerStatus setProperties(const Connection& connection, const PropertyList::Dictionary& properties) override;
+  ControllerStatus setProperties(const Connection& connection, const PropertyList::Dictionary& properties,
+                                 std::int64_t asked) override;
   ControllerStatus close(const Connection& connection) override;
 
  private:
-  Setting<std::int64_t> delaySetting(const StartupDelayRequests& requests);
+  /// Fails where the machine has no such controller, which cannotHave() tells, and where that cannot be found out.
+  Result<void> look();
+  /// How the machine's controller takes the delay; fails as look() does.
+  Result<StartupDelayRequests> requests();
+  Setting<std::int64_t> delaySetting(const Result<StartupDelayRequests>& requests);
   Result<std::int64_t> askDelay(const StartupDelayRequests& requests);
   Result<std::optional<std::int64_t>> keptWish() const;
   Result<void> sendDelay(const StartupDelayRequests& requests, std::uint32_t units);
-  ControllerStatus setDelay(std::uint32_t manufacturer, std::uint8_t units);
+  ControllerStatus setDelay(std::uint8_t units, std::int64_t asked);
   /// The failure goes to the effects; its code is the status.
   ControllerStatus recorded(const Failure& failure);
 

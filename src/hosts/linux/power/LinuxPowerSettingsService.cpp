@@ -64,7 +64,10 @@ void LinuxPowerSettingsService::setUntilSleep(SleepTimer timer, const PowerSourc
 }
 
 bool LinuxPowerSettingsService::supports(PowerSwitch which, const PowerSource& /*source*/) {
-  return isSupported(settingOf(which), _machine.effects);
+  const auto setting = settingOf(which);
+  const auto support = supportOf(setting, _machine.effects);
+  if (support && *support) _machine.effects.observe({.setting = setting.name, .unsupported = (*support)->reason});
+  return support && !*support;
 }
 
 bool LinuxPowerSettingsService::canSet(PowerSwitch which, const PowerSource& /*source*/) {

@@ -18,4 +18,31 @@ Result<void> OwnFile::replace(const std::string& lines) const {
   return _root.write(_path, ownfile::header + lines);
 }
 
+Result<std::optional<std::string>> OwnFile::contents() const {
+  return orAbsent(_root.read(_path, powerFileLimit));
+}
+
+Result<void> OwnFile::putBack(const std::optional<std::string>& contents) const {
+  return contents ? _root.write(_path, *contents) : _root.remove(_path);
+}
+
+Result<void> OwnFile::changeIfHeeded(const Change& change) const {
+  if (auto failure = whyNeedsRoot("write", _path)) return *failure;
+  const auto former = contents();
+  if (!former) return former.failure();
+  if (auto written = change.write(); !written) return written;
+  const auto heeded = change.isHeeded();
+  if (heeded && *heeded) return {};
+  const auto hiding = change.hidingFile();
+  if (const auto back = putBack(*former); !back) return retold(back.failure(), "put back", _path);
+  if (!heeded) return heeded.failure();
+  return Failure{"write", _path, (hiding.empty() ? "another file" : hiding) + " says otherwise: put back as it was"};
+}
+
+std::string placesIn(const std::vector<std::string>& files) {
+  std::string places;
+  for (const auto& file : files) places += (places.empty() ? "" : ", ") + file;
+  return places;
+}
+
 }  // namespace tavisk

@@ -2,8 +2,12 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
+#include <optional>
 #include <string>
+#include <vector>
 
+#include "hosts/shared/SettingChange.h"
 #include "hosts/shared/SystemRoot.h"
 
 namespace tavisk {
@@ -20,9 +24,43 @@ class OwnFile {
   /// Puts these lines in place of the old ones. A file that cannot be read stays as it is.
   Result<void> replace(const std::string& lines) const;
 
+  /// Absent when there is no such file.
+  Result<std::optional<std::string>> contents() const;
+  /// Makes the file what contents() said.
+  Result<void> putBack(const std::optional<std::string>& contents) const;
+
+  /// A change of the file, where other files have a say in the same matter.
+  struct Change {
+    std::function<Result<void>()> write;
+    std::function<Result<bool>()> isHeeded;   ///< asked of all files afterwards
+    std::function<std::string()> hidingFile;  ///< empty: it is not known
+  };
+  /// A change that another file hides is a failure, and the file is put back as it was.
+  Result<void> changeIfHeeded(const Change& change) const;
+
  private:
   const SystemRoot& _root;
   std::string _path;
 };
+
+/// Files as an effect names them: "/etc/one, /etc/two".
+std::string placesIn(const std::vector<std::string>& files);
+
+/// What is found while the tool's own file has another value, which waits for other files to go: this is told.
+template <typename Value>
+Reading<Value> whileWaits(const Reading<Value>& found, const Value& own, const std::string& ownFile) {
+  return {found.value, change::textOfReading(found) + ", while " + textOf(own) + " waits in " + ownFile};
+}
+
+/// What all files come to, a value or a reading of it, may be none, and whether the tool's own file has another one.
+template <typename Found, typename Value>
+Result<std::optional<Reading<Value>>> besideOwn(const Result<Found>& all, const Result<std::optional<Value>>& own,
+                                                const std::string& ownFile) {
+  if (!all) return all.failure();
+  if (!own) return own.failure();
+  const auto found = std::optional<Reading<Value>>(*all);
+  if (!found || !*own || **own == found->value) return found;
+  return whileWaits(*found, **own, ownFile);
+}
 
 }  // namespace tavisk

@@ -2,13 +2,17 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/power/RestartAfterFreeze.h"
 
+#include <algorithm>
+#include <memory>
+
 #include "base/Text.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/DeviceValues.h"
-#include "hosts/linux/power/PowerLimits.h"
+#include "hosts/linux/power/KernelParameter.h"
 #include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
+#include "hosts/linux/system/Rights.h"
 #include "hosts/linux/system/TimeSpan.h"
 
 namespace tavisk {
@@ -20,9 +24,9 @@ constexpr const char* watchdogFacts = "/sys/class/watchdog/watchdog0/";
 constexpr const char* panicFile = "/proc/sys/kernel/panic";
 constexpr std::chrono::seconds watchdogTime{60};
 
-const char* panicSecondsFor(bool restarts) {
-  return restarts ? "10" : "0";
-}
+constexpr const char* ownPanicSeconds = "10";
+/// Read last where no service manager does it (sysctl(8), --system).
+constexpr const char* mainPanicFile = "/etc/sysctl.conf";
 
 Reading<bool> together(bool byWatchdog, bool onPanic) {
   if (byWatchdog == onPanic) return onPanic;
@@ -35,11 +39,11 @@ bool isOnPanic(const std::string& seconds) {
 
 /// The value of kernel.panic in a file of sysctl.d(5).
 std::optional<std::string> panicIn(const std::string& text) {
+  constexpr std::string_view names[] = {"kernel.panic", "kernel/panic", "-kernel.panic", "-kernel/panic"};
   std::optional<std::string> value;
   for (const auto& line : configurationLines(text, "#;")) {
     const auto words = split(line, " \t=");
-    if (words.size() == 2 && (words[0] == "kernel.panic" || words[0] == "kernel/panic" || words[0] == "-kernel.panic"))
-      value = words[1];
+    if (words.size() == 2 && std::ranges::find(names, words[0]) != std::end(names)) value = words[1];
   }
   return value;
 }
@@ -84,32 +88,113 @@ Result<bool> RestartAfterFreeze::isWatchdog(const char* fact, const char* word) 
   return *said == word;
 }
 
-Result<bool> RestartAfterFreeze::isPanicStored() const {
-  const auto files = configurationFiles(
+Result<RestartAfterFreeze::StoredPanic> RestartAfterFreeze::storedPanic() const {
+  const auto parameter = kernelParameter(_machine.root, "panic");
+  if (!parameter) return parameter.failure();
+  auto files = configurationFiles(
       _machine.root, {"/etc/sysctl.d/", "/run/sysctl.d/", "/usr/local/lib/sysctl.d/", "/usr/lib/sysctl.d/"});
   if (!files) return files.failure();
-  std::string seconds;
-  for (const auto& file : *files) {
-    const auto text = orEmpty(_machine.root.read(file, powerFileLimit));
+  auto inOrder = std::move(files).value();
+  if (!_machine.services.hasServiceManager()) inOrder.emplace_back(mainPanicFile);
+  StoredPanic found;
+  if (*parameter) found = {**parameter, kernelCommandLine, std::nullopt, **parameter};
+  for (const auto& file : inOrder) {
+    const auto text = orEmpty(_machine.root.read(file, configurationLimit));
     if (!text) return text.failure();
-    seconds = panicIn(*text).value_or(seconds);
+    const auto value = panicIn(*text);
+    if (!value) continue;
+    found.seconds = *value;
+    found.from = file;
+    (file == _panicFile.path() ? found.own.emplace() : found.others) = *value;
   }
-  return isOnPanic(seconds);
+  return found;
+}
+
+Result<bool> RestartAfterFreeze::isPanicStored() const {
+  const auto panic = storedPanic();
+  if (!panic) return panic.failure();
+  return isOnPanic(panic->seconds);
+}
+
+Result<bool> RestartAfterFreeze::isWatchdogStored() const {
+  const auto time = _config.last(section, key);
+  if (!time) return time.failure();
+  return *time && isWatchdogTime((*time)->value);
+}
+
+Result<std::optional<bool>> RestartAfterFreeze::isWatchdogInOwn() const {
+  const auto time = _config.own(section, key);
+  if (!time) return time.failure();
+  return *time ? std::optional(isWatchdogTime(**time)) : std::nullopt;
 }
 
 Setting<bool>::Found RestartAfterFreeze::stored() const {
-  const auto onPanic = isPanicStored();
-  if (!onPanic) return onPanic.failure();
-  if (!_machine.services.hasServiceManager()) return *onPanic;
-  const auto watchdog = _config.last(section, key);
+  const auto panic = storedPanic();
+  if (!panic) return panic.failure();
+  const bool onPanic = isOnPanic(panic->seconds);
+  const bool isManaged = _machine.services.hasServiceManager();
+  const auto watchdog = isManaged ? isWatchdogStored() : onPanic;
   if (!watchdog) return watchdog.failure();
-  return together(*watchdog && isWatchdogTime((*watchdog)->value), *onPanic);
+  const auto ownWatchdog = isManaged ? isWatchdogInOwn() : std::nullopt;
+  if (!ownWatchdog) return ownWatchdog.failure();
+  auto found = together(*watchdog, onPanic);
+  if (panic->own && isOnPanic(*panic->own) != onPanic)
+    found = whileWaits(found, isOnPanic(*panic->own), _panicFile.path());
+  if (*ownWatchdog && **ownWatchdog != *watchdog) found = whileWaits(found, **ownWatchdog, _watchdogFile.path());
+  return found;
 }
 
-Result<void> RestartAfterFreeze::store(bool restarts) const {
-  const auto panic = std::string("kernel.panic = ") + panicSecondsFor(restarts) + "\n";
-  if (auto written = _panicFile.replace(panic); !written || !_machine.services.hasServiceManager()) return written;
-  return _config.setOwn(section, {{key, restarts ? std::to_string(watchdogTime.count()) : "off"}});
+/// Where others have a value to restart there is no need of the tool's own.
+Result<void> RestartAfterFreeze::storePanic(bool restarts) const {
+  const auto before = storedPanic();
+  if (!before) return before.failure();
+  if (!restarts || isOnPanic(before->others)) {
+    if (!before->own) return {};
+    if (auto failure = whyNeedsRoot("remove", _panicFile.path())) return *failure;
+    return _machine.root.remove(_panicFile.path());
+  }
+  const auto hidingFile = [&] {
+    const auto after = storedPanic();
+    return after ? after->from : "";
+  };
+  return _panicFile.changeIfHeeded(
+      {.write = [&] { return _panicFile.replace(std::string("kernel.panic = ") + ownPanicSeconds + "\n"); },
+       .isHeeded = [&] { return isPanicStored(); },
+       .hidingFile = hidingFile});
+}
+
+Result<void> RestartAfterFreeze::storeWatchdog(bool restarts) const {
+  const auto stored = isWatchdogStored();
+  if (!stored) return stored.failure();
+  const auto own = isWatchdogInOwn();
+  if (!own) return own.failure();
+  if (*stored == restarts && own->value_or(restarts) == restarts) return {};
+  const auto isHeeded = [&]() -> Result<bool> {
+    const auto then = isWatchdogStored();
+    if (!then) return then.failure();
+    return *then == restarts;
+  };
+  const auto time = restarts ? std::to_string(watchdogTime.count()) : "off";
+  return _watchdogFile.changeIfHeeded({.write =
+                                           [&] {
+                                             return _config.setOwn(section, {{key, time}});
+                                           },
+                                       .isHeeded = isHeeded,
+                                       .hidingFile = [&] { return _config.whatHides(section, {key}).valueOr(""); }});
+}
+
+/// Both files, or none of them.
+Result<void> RestartAfterFreeze::store(bool restarts, std::vector<std::string>& written) const {
+  const auto formerPanic = _panicFile.contents();
+  if (!formerPanic) return formerPanic.failure();
+  const auto formerWatchdog = _watchdogFile.contents();
+  if (!formerWatchdog) return formerWatchdog.failure();
+  const auto panic = storePanic(restarts);
+  const auto watchdog = panic && _machine.services.hasServiceManager() ? storeWatchdog(restarts) : Result<void>();
+  if (panic && !watchdog) static_cast<void>(_panicFile.putBack(*formerPanic));
+  for (const auto& [file, former] : {std::pair(&_watchdogFile, *formerWatchdog), {&_panicFile, *formerPanic}})
+    if (const auto now = file->contents(); !now || *now != former) written.push_back(file->path());
+  return panic ? watchdog : panic;
 }
 
 /// The manager does not take up the file over a value that was set, so it gets both. To set 0 is to go back to the file
@@ -135,27 +220,54 @@ Result<void> RestartAfterFreeze::setWatchdogTime(std::chrono::microseconds time)
   return set ? Result<void>() : retold(set.failure(), "set RuntimeWatchdogUSec", "the service manager");
 }
 
+Result<void> RestartAfterFreeze::turnWatchdogOn() const {
+  const auto isUsed = isWatchdogUsed();
+  if (!isUsed) return isUsed.failure();
+  const auto isIdle = isWatchdog("state", "inactive");
+  if (!isIdle) return isIdle.failure();
+  return *isUsed && !*isIdle ? Result<void>() : setWatchdogTime(watchdogTime);
+}
+
+Result<void> RestartAfterFreeze::applyPanic(bool restarts) const {
+  const auto seconds = readKernelFile(_machine.root, panicFile);
+  if (!seconds) return seconds.failure();
+  if (restarts && isOnPanic(*seconds)) return {};
+  const auto panic = storedPanic();
+  if (!panic) return panic.failure();
+  const auto wanted = isOnPanic(panic->others) ? panic->others : restarts ? ownPanicSeconds : "0";
+  return wanted == *seconds ? Result<void>() : writeKernelFile(_machine.root, panicFile, wanted);
+}
+
 Result<void> RestartAfterFreeze::apply(bool restarts) const {
-  auto panic = writeKernelFile(_machine.root, panicFile, panicSecondsFor(restarts));
+  auto panic = applyPanic(restarts);
   if (!_machine.services.hasServiceManager()) return panic;
-  const auto watchdog = restarts ? setWatchdogTime(watchdogTime) : turnWatchdogOff();
+  const auto watchdog = restarts ? turnWatchdogOn() : turnWatchdogOff();
   return panic ? watchdog : panic;
 }
 
+std::string RestartAfterFreeze::whatUndoes(bool restarts) const {
+  auto file = _config.whatHides(section, {key}).valueOr("");
+  if (!file.empty()) return file;
+  const auto panic = storedPanic();
+  return panic && panic->from != _panicFile.path() && isOnPanic(panic->seconds) != restarts ? panic->from : "";
+}
+
 Setting<bool> RestartAfterFreeze::restartAfterFreeze() const {
+  const auto written = std::make_shared<std::vector<std::string>>();
   Setting<bool> setting;
   setting.name = setting::restartAfterFreeze;
   setting.where = _panicFile.path();
   if (_machine.services.hasServiceManager()) setting.where = _config.ownDropIn() + ", " + setting.where;
-  setting.undoneBy = [this](bool) { return _config.whatHides(section, {key}).valueOr(""); };
-  setting.note = [this](bool) -> std::string {
-    return hasWatchdog().valueOr(true)
+  setting.written = [written] { return placesIn(*written); };
+  setting.undoneBy = [this](bool restarts) { return whatUndoes(restarts); };
+  setting.note = [this](bool restarts) -> std::string {
+    return !restarts || hasWatchdog().valueOr(true)
                ? ""
                : "no watchdog here: only a kernel that has panicked restarts, not one that hangs";
   };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };
-  setting.store = [this](bool restarts) { return store(restarts); };
+  setting.store = [this, written](bool restarts) { return store(restarts, *written); };
   setting.apply = [this](bool restarts) { return apply(restarts); };
   return setting;
 }

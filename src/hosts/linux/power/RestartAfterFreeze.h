@@ -12,11 +12,15 @@ namespace tavisk {
 
 /// Whether a machine that hangs restarts: the service manager keeps the watchdog's clock from running out
 /// (RuntimeWatchdogSec of systemd-system.conf(5)), and a kernel that has panicked restarts (kernel.panic). The parts
-/// may differ; the detail then says which one is on.
+/// may differ; the detail then says which one is on. An administrator's own kernel.panic stays as it is, on or off, and
+/// a watchdog that is in use already keeps its time.
 class RestartAfterFreeze {
  public:
   explicit RestartAfterFreeze(const LinuxMachine& machine)
-      : _machine(machine), _config(machine.root, "system.conf"), _panicFile(machine.root, ownfile::kernelPanic) {}
+      : _machine(machine),
+        _config(machine.root, "system.conf"),
+        _watchdogFile(machine.root, _config.ownDropIn()),
+        _panicFile(machine.root, ownfile::kernelPanic) {}
 
   /// Refers to the object.
   Setting<bool> restartAfterFreeze() const;
@@ -29,14 +33,34 @@ class RestartAfterFreeze {
   /// Whether the kernel says so of the watchdog; it need not tell.
   Result<bool> isWatchdog(const char* fact, const char* word) const;
   Setting<bool>::Found stored() const;
-  Result<void> store(bool restarts) const;
+  Result<bool> isWatchdogStored() const;
+  /// Absent when the tool's own drop-in does not say.
+  Result<std::optional<bool>> isWatchdogInOwn() const;
+
+  /// What is told the kernel about kernel.panic when it starts.
+  struct StoredPanic {
+    std::string seconds = "0";
+    std::string from;  ///< the file that has the last word; empty: none says anything
+    std::optional<std::string> own;
+    std::string others = "0";  ///< what it would be without the tool's own file
+  };
+  Result<StoredPanic> storedPanic() const;
+  Result<bool> isPanicStored() const;
+
+  /// The places that were written are added.
+  Result<void> store(bool restarts, std::vector<std::string>& written) const;
+  Result<void> storePanic(bool restarts) const;
+  Result<void> storeWatchdog(bool restarts) const;
   Result<void> apply(bool restarts) const;
+  Result<void> applyPanic(bool restarts) const;
+  Result<void> turnWatchdogOn() const;
   Result<void> turnWatchdogOff() const;
   Result<void> setWatchdogTime(std::chrono::microseconds time) const;
-  Result<bool> isPanicStored() const;
+  std::string whatUndoes(bool restarts) const;
 
   LinuxMachine _machine;
   SystemdConfig _config;
+  OwnFile _watchdogFile;
   OwnFile _panicFile;
 };
 

@@ -41,6 +41,9 @@ std::string ruleFor(bool wakes) {
 
 }  // namespace
 
+WakeOnModem::WakeOnModem(const LinuxMachine& machine)
+    : _machine(machine), _rule(machine.root, "wake-on-ring", ruleFor) {}
+
 Result<std::optional<WakeOnModem::Port>> WakeOnModem::wakingPort(const std::string& terminal) const {
   if (!terminal.starts_with("ttyS")) return std::nullopt;
   const auto device = SysDevice::at(_machine.root, (std::string(terminals) + "/").append(terminal).append("/device"));
@@ -69,13 +72,13 @@ Result<void> WakeOnModem::apply(bool wakes) const {
 Setting<bool> WakeOnModem::wakeOnModem() const {
   Setting<bool> setting;
   setting.name = setting::wakeOnModem;
-  setting.where = _rule.file();
-  setting.note = [this](bool) { return whyNoRuleLasts(_machine.root); };
+  setting.undoneBy = [this](bool) {
+    return laterRules(_machine.root, _rule.file(), {"\"pnp\"", R"(power/wakeup}=")"});
+  };
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
-  setting.stored = [this] { return _rule.value(); };
-  setting.store = [this](bool wakes) { return _rule.write(wakes, ruleFor(wakes)); };
   setting.apply = [this](bool wakes) { return apply(wakes); };
+  keepBy(_rule, _machine.root, setting);
   return setting;
 }
 

@@ -15,7 +15,7 @@ namespace tavisk {
 /// terminal of every port has a file power/wakeup, which proves nothing.
 class WakeOnModem {
  public:
-  explicit WakeOnModem(const LinuxMachine& machine) : _machine(machine), _rule(machine.root, "wake-on-ring") {}
+  explicit WakeOnModem(const LinuxMachine& machine);
 
   /// Refers to the object.
   Setting<bool> wakeOnModem() const;

@@ -9,6 +9,7 @@
 #include <sys/socket.h>
 
 #include <cerrno>
+#include <memory>
 #include <set>
 
 #include "base/FileDescriptor.h"
@@ -33,10 +34,15 @@ static_assert(magicPacket == WAKE_MAGIC);
 
 constexpr const char* cardFolder = "/sys/class/net/";
 constexpr const char* usualLinkFile = "99-default.link";
-constexpr const char* hidingLink = "/etc/systemd/network/99-default.link";
 constexpr const char* section = "Link";
 constexpr const char* key = "WakeOnLan";
 constexpr const char* never = "off";
+constexpr const char* magic = "magic";
+
+/// A link file and its drop-ins are found as other configurations of the service manager are (systemd.link(5)).
+SystemdConfig configOf(const SystemRoot& root, const std::string& linkFile) {
+  return {root, "network/" + linkFile};
+}
 
 Failure failureOf(const char* tried, const std::string& card, int error) {
   const auto forRoot = error == EPERM ? whyNeedsRoot(tried, card) : std::nullopt;
@@ -132,53 +138,105 @@ Result<std::string> WakeOnNetworkAccess::linkFileOf(const std::string& card) con
   return usualLinkFile;
 }
 
+Result<bool> WakeOnNetworkAccess::isMasked(const std::string& linkFile) const {
+  const auto target = _machine.root.standardized("/etc/systemd/network/" + linkFile);
+  if (!target) return target.failure();
+  return *target == "/dev/null";
+}
+
 /// The usual one as well, for cards that are still to come.
-Result<std::vector<std::string>> WakeOnNetworkAccess::dropIns() const {
+Result<std::vector<std::string>> WakeOnNetworkAccess::linkFiles() const {
   const auto cards = wakingCards();
   if (!cards) return cards.failure();
-  std::set<std::string> files{ownfile::linkDropIn(usualLinkFile)};
+  std::set<std::string> files{usualLinkFile};
   for (const auto& card : *cards) {
     const auto file = linkFileOf(card);
     if (!file) return file.failure();
-    files.insert(ownfile::linkDropIn(*file));
+    files.insert(*file);
   }
-  return std::vector(files.begin(), files.end());
+  return ofEach(files, [this](const std::string& file) -> Result<std::optional<std::string>> {
+    const auto masked = isMasked(file);
+    if (!masked) return masked.failure();
+    return *masked ? std::nullopt : std::optional(file);
+  });
 }
 
 Setting<bool>::Found WakeOnNetworkAccess::stored() const {
-  const auto valueOf = [this](const std::string& file) -> Result<std::optional<DeviceValue<bool>>> {
-    const auto text = OwnFile(_machine.root, file).text();
-    if (!text) return text.failure();
-    const auto words = assignments(*text, section, key);
-    return DeviceValue<bool>{file, words.empty() ? std::nullopt : std::optional(words.back() != never)};
-  };
-  return readingOfAll(ofEach(dropIns(), valueOf));
+  const auto files = linkFiles();
+  if (!files) return files.failure();
+  std::vector<DeviceValue<bool>> all;
+  std::vector<std::pair<std::string, bool>> waiting;
+  for (const auto& file : *files) {
+    const auto config = configOf(_machine.root, file);
+    const auto word = config.last(section, key);
+    if (!word) return word.failure();
+    const auto own = config.own(section, key);
+    if (!own) return own.failure();
+    const auto wakes = *word ? std::optional((*word)->value != never) : std::nullopt;
+    all.push_back({config.ownDropIn(), wakes});
+    if (*own && wakes != (**own != never)) waiting.emplace_back(config.ownDropIn(), **own != never);
+  }
+  auto found = readingOfAll<bool>(all);
+  if (!found || !*found) return found;
+  auto reading = **found;
+  for (const auto& [file, own] : waiting) reading = whileWaits(reading, own, file);
+  return reading;
 }
 
-Result<void> WakeOnNetworkAccess::store(bool wakes) const {
-  const auto lines = std::string("[Link]\nWakeOnLan=") + (wakes ? "magic" : never) + "\n";
-  return setEach(dropIns(), [&](const std::string& file) { return OwnFile(_machine.root, file).replace(lines); });
+Result<void> WakeOnNetworkAccess::storeIn(const std::string& linkFile, bool wakes) const {
+  const auto config = configOf(_machine.root, linkFile);
+  const auto isHeeded = [&]() -> Result<bool> {
+    const auto word = config.last(section, key);
+    if (!word) return word.failure();
+    return *word && ((*word)->value != never) == wakes;
+  };
+  return OwnFile(_machine.root, config.ownDropIn())
+      .changeIfHeeded({.write =
+                           [&] {
+                             return config.setOwn(section, {{key, wakes ? magic : never}});
+                           },
+                       .isHeeded = isHeeded,
+                       .hidingFile = [&] { return config.whatHides(section, {key}).valueOr(""); }});
+}
+
+Result<void> WakeOnNetworkAccess::store(bool wakes, std::vector<std::string>& written) const {
+  return setEach(linkFiles(), [&](const std::string& file) {
+    auto stored = storeIn(file, wakes);
+    if (stored) written.push_back(ownfile::linkDropIn(file));
+    return stored;
+  });
+}
+
+std::string WakeOnNetworkAccess::whatUndoes() const {
+  for (const auto& file : linkFiles().valueOr({}))
+    if (auto hiding = configOf(_machine.root, file).whatHides(section, {key}).valueOr(""); !hiding.empty())
+      return hiding;
+  return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::networkManager});
 }
 
 std::string WakeOnNetworkAccess::whyItDoesNotLast() const {
   auto reason = whyNoRuleLasts(_machine.root);
-  if (!reason.empty() || _machine.root.readLink(hidingLink).valueOr("") != "/dev/null") return reason;
-  return std::string(hidingLink) + " hides the file: lasts until the restart";
+  const auto files = linkFiles();
+  if (!reason.empty() || !files || !files->empty()) return reason;
+  return "/etc/systemd/network/" + std::string(usualLinkFile) + " is masked: lasts until the restart";
 }
 
 Setting<bool> WakeOnNetworkAccess::wakeOnNetworkAccess() const {
+  const auto written = std::make_shared<std::vector<std::string>>();
   Setting<bool> setting;
   setting.name = setting::wakeOnNetworkAccess;
-  setting.where = ownfile::linkDropIn(usualLinkFile);
-  setting.undoneBy = [this](bool) {
-    return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::networkManager});
-  };
-  setting.note = [this](bool) { return whyItDoesNotLast(); };
+  setting.undoneBy = [this](bool) { return whatUndoes(); };
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
-  setting.stored = [this] { return stored(); };
-  setting.store = [this](bool wakes) { return store(wakes); };
   setting.apply = [this](bool wakes) { return apply(wakes); };
+  if (const auto reason = whyItDoesNotLast(); !reason.empty()) {
+    setting.note = saying(reason);
+    return setting;
+  }
+  setting.where = ownfile::linkDropIn(usualLinkFile);
+  setting.written = [written] { return placesIn(*written); };
+  setting.stored = [this] { return stored(); };
+  setting.store = [this, written](bool wakes) { return store(wakes, *written); };
   return setting;
 }
 

@@ -59,10 +59,15 @@ class WakeOnNetworkAccess {
   Support supported() const;
   Setting<bool>::Found live() const;
   Setting<bool>::Found stored() const;
-  Result<void> store(bool wakes) const;
+  /// The places that were written are added.
+  Result<void> store(bool wakes, std::vector<std::string>& written) const;
   Result<void> apply(bool wakes) const;
-  Result<std::vector<std::string>> dropIns() const;
+  /// The link files by which the cards are set up, those that are masked left out.
+  Result<std::vector<std::string>> linkFiles() const;
+  Result<bool> isMasked(const std::string& linkFile) const;
   Result<std::string> linkFileOf(const std::string& card) const;
+  Result<void> storeIn(const std::string& linkFile, bool wakes) const;
+  std::string whatUndoes() const;
   std::string whyItDoesNotLast() const;
 
   LinuxMachine _machine;

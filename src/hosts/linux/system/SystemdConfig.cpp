@@ -45,13 +45,14 @@ std::vector<NamedValue> allAssignments(std::string_view text, std::string_view s
 
 }  // namespace
 
-Result<std::vector<std::string>> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders) {
+Result<std::vector<std::string>> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders,
+                                                    std::string_view ending) {
   std::map<std::string, std::string> byName;
   for (const auto& folder : folders) {
     const auto names = orEmpty(root.list(folder));
     if (!names) return names.failure();
     for (const auto& name : *names)
-      if (name.ends_with(".conf")) byName.emplace(name, folder + name);
+      if (name.ends_with(ending)) byName.emplace(name, folder + name);
   }
   std::vector<std::string> files;
   files.reserve(byName.size());
@@ -119,13 +120,20 @@ Result<std::optional<SystemdConfig::Assignment>> SystemdConfig::last(std::string
   return std::optional(assigned->back());
 }
 
+Result<std::optional<std::string>> SystemdConfig::own(std::string_view section, std::string_view key) const {
+  const auto text = orEmpty(_root.read(ownDropIn(), configurationLimit));
+  if (!text) return text.failure();
+  const auto values = assignments(*text, section, key);
+  return values.empty() || values.back().empty() ? std::nullopt : std::optional(values.back());
+}
+
 Result<std::string> SystemdConfig::whatHides(std::string_view section, const std::vector<std::string>& keys) const {
   const auto ownName = baseName(ownDropIn());
   for (const auto& key : keys) {
     const auto assigned = all(section, key);
     if (!assigned) return assigned.failure();
     for (const auto& [file, value] : *assigned)
-      if (file.find(".conf.d/") != std::string::npos && baseName(file) > ownName) return file;
+      if (file.find(".d/") != std::string::npos && baseName(file) > ownName) return file;
   }
   return std::string();
 }

@@ -29,6 +29,8 @@ class SystemdConfig {
   };
   /// The last assignment of a key that has one value; absent when there is none, or when it is empty.
   Result<std::optional<Assignment>> last(std::string_view section, std::string_view key) const;
+  /// The same in the own drop-in alone.
+  Result<std::optional<std::string>> own(std::string_view section, std::string_view key) const;
   /// The tool's own drop-in.
   std::string ownDropIn() const;
   /// The file that hides what the own drop-in says of these keys; empty when none does.
@@ -46,10 +48,11 @@ class SystemdConfig {
   std::string _file;
 };
 
-/// The files of these folders (each with "/" at its end) that end in ".conf", sorted by name; where two have the same
+/// The files of these folders (each with "/" at its end) that have this ending, sorted by name; where two have the same
 /// name, that of the earlier folder. A folder may be missing. A link to /dev/null is no file and hides the others of
 /// its name.
-Result<std::vector<std::string>> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders);
+Result<std::vector<std::string>> configurationFiles(const SystemRoot& root, const std::vector<std::string>& folders,
+                                                    std::string_view ending = ".conf");
 
 /// The values of a key in one file of such a kind, in order; later lines come later.
 std::vector<std::string> assignments(std::string_view text, std::string_view section, std::string_view key);

@@ -40,10 +40,16 @@ class FakePowerServices {
 
   std::atomic<const char*> canSuspend = "yes";
   std::atomic<const char*> sleepTarget = "loaded";
+  /// So many calls are answered as when the service ends before it answers.
+  std::atomic<int> answersMissing = 0;
 
  private:
   int answer(sd_bus_message* call, const std::string& member) {
     const std::scoped_lock lock(_mutex);
+    if (answersMissing > 0) {
+      --answersMissing;
+      return sd_bus_reply_method_errorf(call, "org.freedesktop.DBus.Error.NoReply", "it has left the bus");
+    }
     if (member == "Get") return answerGet(call);
     if (member == "Set") return answerSet(call);
     if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", canSuspend.load());
@@ -62,19 +68,22 @@ class FakePowerServices {
     return member == "KillUnit" ? sd_bus_reply_method_return(call, "") : answerRestart(call);
   }
 
-  /// The value of a key in the tool's own file of the folder; what it was before when the file does not have it.
+  /// The value of a key in the folder, in /etc or else in /run; what it was before when no file has it.
   void readKey(const char* folder, const std::string& key, std::string& value) const {
-    for (const auto& line : linesOf(_tree / folder / "60-tavisk.conf"))
-      if (line.starts_with(key + "=")) value = line.substr(key.size() + 1);
+    for (const auto* file : {"etc/60-tavisk.conf", "run/70-other.conf", "etc/70-other.conf"}) {
+      const auto path = std::filesystem::path(file);
+      for (const auto& line : linesOf(_tree / path.parent_path() / folder / path.filename()))
+        if (line.starts_with(key + "=")) value = line.substr(key.size() + 1);
+    }
   }
   void readLogin() {
-    readKey("etc/systemd/logind.conf.d", "IdleAction", _idleAction);
-    readKey("etc/systemd/logind.conf.d", "IdleActionSec", _idleMinutes);
-    readKey("etc/systemd/logind.conf.d", "HandlePowerKey", _powerKey);
+    readKey("systemd/logind.conf.d", "IdleAction", _idleAction);
+    readKey("systemd/logind.conf.d", "IdleActionSec", _idleMinutes);
+    readKey("systemd/logind.conf.d", "HandlePowerKey", _powerKey);
   }
   void readManager() {
     std::string seconds = "0";
-    readKey("etc/systemd/system.conf.d", "RuntimeWatchdogSec", seconds);
+    readKey("systemd/system.conf.d", "RuntimeWatchdogSec", seconds);
     _watchdogRead = seconds == "off" ? 0 : std::stoull(seconds) * 1'000'000;
   }
 
