@@ -192,6 +192,21 @@ TEST(ScratchHost, appendsToRegularFilesOnly) {
   for (const auto& reader : readers) EXPECT_EQ(::read(reader.number(), &byte, 1), 0);
 }
 
+TEST(ScratchHost, tellsWhatIsInForceApartFromWhatIsConfigured) {
+  ScratchMachine machine;
+  machine.set("Network Time", "Running", true);
+  machine.set("Dynamic Store", "Local Host Name", "now");
+  machine.set("Host Configuration", "Local Host Name", "later");
+  machine.set("Clock", "Known Time Zones", PropertyList::Array{"UTC"});
+  machine.log.wants = true;
+  machine.host().networkTime().isRunning();
+  machine.host().dynamicStore().open("test")->localHostName();
+  machine.host().clock().knownTimeZones();
+  EXPECT_THAT(machine.log.values, ElementsAre(SettingValue{setting::networkTime, "on", "off"},
+                                              SettingValue{setting::localSubnetName, "now", "later"},
+                                              SettingValue{setting::knownTimeZones, "UTC"}));
+}
+
 TEST(ScratchHost, writesOneLineAMessage) {
   ScratchMachine machine;
   for (const char* message : {"one\n", "two\nlines\n\n", "", "three"}) machine.host().systemLog().write(message);
