@@ -40,7 +40,7 @@ CHECKS = [
     Check("a name that nothing resolves is told", needs=REMOTE,
           do="echo '127.0.0.1 localhost' >/etc/hosts; cp /etc/nsswitch.conf /run/; echo 'hosts: files' >/etc/nsswitch.conf; "
              + REPORTED.format("-setlocalsubnetname nowhere") + " | grep -o 'does not resolve'; getent hosts nowhere || "
-             "echo none; cp /run/nsswitch.conf /etc/", prints="does not resolve\nnone\n"),
+             "echo none; cp /run/nsswitch.conf /etc/", prints="setlocalsubnetname: nowhere\ndoes not resolve\nnone\n"),
     Check("the computer name is set", needs=REMOTE, kept=True, do=f"tavisk -setcomputername {QUOTED} -getcomputername",
           prints=f"setcomputername: {COMPUTER}\nComputer Name: {COMPUTER}\n",
           then={"hostnamectl hostname --pretty": f"{COMPUTER}\n", "tavisk -getcomputername": f"Computer Name: {COMPUTER}\n"}),

@@ -36,7 +36,8 @@ CHECKS = [
     Check("the places are those that were written", needs=CONTAINER,
           do=REPORTED.format("-settimezone Europe/Paris -settimezone America/Lima -settimezone America/Lima") +
              """ | grep -o -e '"where":"[^"]*"' -e '"outcome":"unchanged"'""",
-          prints='"where":"/etc/localtime"\n"where":"/etc/localtime, /etc/timezone"\n"outcome":"unchanged"\n'),
+          prints='Set TimeZone: Europe/Paris\nSet TimeZone: America/Lima\nSet TimeZone: America/Lima\n'
+                 '"where":"/etc/localtime"\n"where":"/etc/localtime, /etc/timezone"\n"outcome":"unchanged"\n'),
     Check("a zone is set", do="tavisk -settimezone Asia/Kolkata -gettimezone",
           prints="Set TimeZone: Asia/Kolkata\nTime Zone: Asia/Kolkata\n", then=ZONE_LINK),
     Check("the zone is the machine's own, and is kept", needs=BUS, kept=True, do="tavisk -gettimezone",

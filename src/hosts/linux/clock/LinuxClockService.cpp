@@ -137,17 +137,12 @@ std::vector<ZoneName> LinuxClockService::knownTimeZones() {
   return {};
 }
 
-/// What the second copy of the name says is stored: tzdata makes the link anew from it.
 Setting<ZoneName> LinuxClockService::timeZoneSetting() const {
   Setting<ZoneName> zone;
   zone.name = setting::timeZone;
   zone.where = localTimeLink;
   zone.live = [this] { return timeZoneInForce(_machine.root); };
-  zone.stored = [&root = _machine.root]() -> Setting<ZoneName>::Found {
-    const auto second = timeZoneFileName(root);
-    if (second && !*second) return timeZoneInForce(root);
-    return second;
-  };
+  zone.stored = [this] { return storedTimeZone(_machine.root); };
   return zone;
 }
 

@@ -75,6 +75,19 @@ Result<Reading<ZoneName>> timeZoneInForce(const SystemRoot& root) {
   return *rules ? zoneWithRules(root, **rules) : Reading(utc());
 }
 
+Result<std::optional<Reading<ZoneName>>> storedTimeZone(const SystemRoot& root) {
+  const auto second = timeZoneFileName(root);
+  if (!second) return second.failure();
+  if (*second) return std::optional(Reading(**second));
+  const auto linked = linkedTimeZone(root);
+  if (!linked) return linked.failure();
+  if (*linked) return std::optional(Reading(**linked));
+  const auto there = root.isThere(localTimeLink);
+  if (!there) return there.failure();
+  if (*there) return timeZoneInForce(root);
+  return std::optional<Reading<ZoneName>>();
+}
+
 std::optional<Failure> whyNoZone(const SystemRoot& root, const ZoneName& zone) {
   const auto file = zone.file();
   if (!zone.isWellFormed()) return Failure{setZone, file, "there is no such zone"};

@@ -22,6 +22,10 @@ Result<std::optional<ZoneName>> linkedTimeZone(const SystemRoot& root);
 /// /etc/timezone names, and what is known is in the detail, as wherever the link does not lead to the zone's own file.
 Result<Reading<ZoneName>> timeZoneInForce(const SystemRoot& root);
 
+/// The zone that stays: what the second copy of the name says, tzdata makes the link anew from it; without that file
+/// what the link or the file in its place says; absent without either.
+Result<std::optional<Reading<ZoneName>>> storedTimeZone(const SystemRoot& root);
+
 /// Debian's second copy of the name, /etc/timezone, whatever it is made of; absent when there is no such file.
 Result<std::optional<ZoneName>> timeZoneFileName(const SystemRoot& root);
 
