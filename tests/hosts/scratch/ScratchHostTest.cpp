@@ -199,12 +199,14 @@ TEST(ScratchHost, tellsWhatIsInForceApartFromWhatIsConfigured) {
   machine.set("Host Configuration", "Local Host Name", "later");
   machine.set("Clock", "Known Time Zones", PropertyList::Array{"UTC"});
   machine.log.wants = true;
-  machine.host().networkTime().isRunning();
-  machine.host().dynamicStore().open("test")->localHostName();
-  machine.host().clock().knownTimeZones();
-  EXPECT_THAT(machine.log.values, ElementsAre(SettingValue{setting::networkTime, "on", "off"},
-                                              SettingValue{setting::localSubnetName, "now", "later"},
-                                              SettingValue{setting::knownTimeZones, "UTC"}));
+  auto& host = machine.host();
+  host.networkTime().isRunning();
+  host.dynamicStore().open("test")->localHostName();
+  host.clock().knownTimeZones();
+  const std::vector<SettingValue> told = {{setting::networkTime, "on", "off"},
+                                          {setting::localSubnetName, "now", "later"},
+                                          {setting::knownTimeZones, "UTC"}};
+  EXPECT_EQ(machine.log.values, told);
 }
 
 TEST(ScratchHost, writesOneLineAMessage) {

@@ -26,11 +26,6 @@ OTHERS = {
     "chrony": ("/etc/chrony/sources.d/50-test.sources", "server other.example", "behind it: .*other.example"),
     "ntpsec": ("/etc/ntpsec/ntp.d/50-test.conf", "server other.example", "behind it: .*other.example"),
 }
-PREFERRED = {
-    "systemd-timesyncd": {"timedatectl show-timesync --property SystemNTPServers --value": f"{SERVER}\n"},
-    "chrony": {"grep -h ^server /etc/chrony/sources.d/60-tavisk.sources": f"server {SERVER} iburst prefer\n"},
-    "ntpsec": {"grep -h ^server /etc/ntpsec/ntp.d/60-tavisk.conf": f"server {SERVER} iburst prefer\n"},
-}
 REPORTED = "rm -f /run/report; TAVISK_REPORT=/run/report tavisk {} >/dev/null; cat /run/report"
 
 
@@ -55,16 +50,6 @@ def where_it_may_not_run(daemon):
         Check(f"{daemon} is let run without a clock", needs=container,
               do=f"mkdir -p {drop_in}; printf '%s\\n' '" + "' '".join(WITHOUT_CLOCK[daemon]) +
                  f"' >{drop_in}/test.conf; systemctl daemon-reload"),
-    ]
-
-
-def where_others_are_configured(daemon, needs):
-    file, text, told = OTHERS[daemon]
-    return [
-        Check(f"{daemon}'s other servers are told, and ours is preferred", needs=needs,
-              do=f"mkdir -p {file.rpartition('/')[0]}; printf '{text}\\n' >{file}; "
-                 + REPORTED.format(f"-setnetworktimeserver {SERVER}") + f" | grep -c '{told}'; rm {file}",
-              prints="1\n", then=PREFERRED[daemon]),
     ]
 
 
@@ -103,7 +88,10 @@ def where_it_runs(daemon):
                                 r"type 'tavisk -setusingnetworktime off -setusingnetworktime on'\n"),
               then={at_startup: "disabled\n", running: "active\n",
                     "tavisk -setusingnetworktime off -setusingnetworktime on >/dev/null; " + at_startup: "enabled\n"}),
-        *where_others_are_configured(daemon, needs),
+        Check(f"{daemon}'s other servers are told", needs=needs,
+              do="printf '{1}\\n' >{0}; {3} | grep -c '{2}'; rm {0}".format(
+                  *OTHERS[daemon], REPORTED.format(f"-setnetworktimeserver {SERVER}")),
+              prints="1\n", then={in_use(daemon): "in use\n"}),
     ]
 
 

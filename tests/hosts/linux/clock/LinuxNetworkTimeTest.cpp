@@ -98,10 +98,9 @@ TEST(LinuxNetworkTime, GoesByTheStartOfAClientThatDoesNotTellItsServers) {
   client.setServer({"time.example"});
   client.start();
   tree.write("/run/ntpd.pid", "77");
-  const auto pidFile = tree.at("/run/ntpd.pid");
-  const auto now = std::filesystem::last_write_time(pidFile);
+  const auto now = std::filesystem::last_write_time(tree.at("/run/ntpd.pid"));
   for (const bool isRead : {true, false}) {
-    std::filesystem::last_write_time(pidFile, isRead ? now + aWhile : now - aWhile);
+    std::filesystem::last_write_time(tree.at("/run/ntpd.pid"), isRead ? now + aWhile : now - aWhile);
     client.setServer({"time.example"});
     client.restartAsynchronously();
     EXPECT_EQ(tree.lastEffect().outcome == Outcome::unchanged, isRead);
