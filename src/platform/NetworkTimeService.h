@@ -19,6 +19,9 @@ class NetworkTimeService {
   /// False also when the machine has no client.
   virtual bool isRunning() = 0;
   virtual void setLaunchAtStartup(bool launch) = 0;
+  /// Changes nothing. Where the client runs, or not, as it is to and will not do so after the next start of the
+  /// machine, a host on which that is a failure says so.
+  virtual void checkLaunchAtStartup(bool launch) = 0;
   virtual void start() = 0;
   virtual void stop() = 0;
 

@@ -47,7 +47,7 @@ void ServerCommands::setLocalSubnetName(const std::string& name) {
     _context.output.print("setlocalsubnetname: %s\n", name.c_str());
   } else {
     _context.output.print("setlocalsubnetname: Error, %s is not a valid name!\n", name.c_str());
-    refuse("a name of letters, digits and hyphens, in parts joined by dots");
+    refuse("a DNS name: parts of 1 to 63 letters, digits and inner hyphens, joined by dots, at most 253 in all");
   }
   setError(false);
 }

@@ -18,6 +18,7 @@ void ServerCommands::setUsingNetworkTime(const std::string& onOff) {
   auto& client = _context.host.networkTime();
   if (client.isRunning() == *isOn) {
     _context.output.putLine(*isOn ? "Network Time is already on." : "Network Time is already off.");
+    client.checkLaunchAtStartup(*isOn);
     return;
   }
   client.setLaunchAtStartup(*isOn);

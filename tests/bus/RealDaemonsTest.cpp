@@ -91,8 +91,15 @@ TEST(TimeSyncDaemon, TellsTheServerInUseWhereNoneIsConfigured) {
   tree.manager.set("systemd-timesyncd.service", {.active = "active"});
   EXPECT_EQ(tree.host().networkTime().server().address, "fallback.example");
   EXPECT_EQ(tree.log.values.back().live, "fallback.example");
-  tree.host().networkTime().setServer({"time.example"});
-  EXPECT_EQ(tree.host().networkTime().server().address, "time.example");
+  tree.log.wants = true;
+  for (const auto& [server, restarts] : {std::pair("time.example", 1U), {"time.example", 1U}, {"next.example", 2U}}) {
+    tree.host().networkTime().setServer({server});
+    tree.host().networkTime().restartAsynchronously();
+    EXPECT_EQ(std::ranges::count(tree.manager.calls(), "TryRestartUnit systemd-timesyncd.service"), restarts);
+    EXPECT_EQ(tree.host().networkTime().server().address, server);
+    EXPECT_EQ(tree.log.values.back().live, "fallback.example");
+    EXPECT_EQ(tree.log.values.back().stored, server);
+  }
 }
 
 TEST(ServiceManager, ThatEndedDuringACallIsNotTakenForSilent) {
@@ -110,7 +117,7 @@ TEST(NameDaemon, GivesTheMachineTheNameEverywhere) {
   tree.write("/etc/hosts", "127.0.1.1\tmachine\n");
   tree.host().hostConfiguration().setLocalNetworkName("mail-2.example");
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
-  EXPECT_EQ(tree.lastEffect().live, "mail-2.example");
+  EXPECT_EQ(tree.lastEffect().live, "mail-2");
   EXPECT_EQ(tree.file("/etc/hostname"), "mail-2.example\n");
   EXPECT_EQ(tree.file("/etc/hosts"), "127.0.1.1\tmail-2.example mail-2\n");
 }

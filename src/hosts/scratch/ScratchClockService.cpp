@@ -95,7 +95,9 @@ void ScratchClockService::setTime(std::int64_t secondsSince1970) {
 
 std::vector<ZoneName> ScratchClockService::knownTimeZones() {
   const MachineSetting<std::vector<ZoneName>> known{setting::knownTimeZones, "", knownZones, nullptr};
-  return _settings.read(known).value_or(std::vector<ZoneName>());
+  auto parts = _settings.parts(known);
+  parts.stored = nullptr;  // it says no more than the live list
+  return _settings.observe(parts).value_or(std::vector<ZoneName>());
 }
 
 ZoneName ScratchClockService::timeZone() {

@@ -32,14 +32,19 @@ class ScratchSession final : public DynamicStore::Session {
  public:
   explicit ScratchSession(MachineSettings& settings) : _settings(settings) {}
 
-  std::optional<std::string> computerName() override {
-    return _settings.read(textAt(setting::computerName, live, computerNameKey));
-  }
-  std::optional<std::string> localHostName() override {
-    return _settings.read(textAt(setting::localSubnetName, live, localHostNameKey));
-  }
+  std::optional<std::string> computerName() override { return look(setting::computerName, computerNameKey); }
+  std::optional<std::string> localHostName() override { return look(setting::localSubnetName, localHostNameKey); }
 
  private:
+  /// What is configured may not have become the live name yet.
+  std::optional<std::string> look(const char* name, const char* key) {
+    const auto now = textAt(name, live, key);
+    const auto configured = textAt(name, configuration, key);
+    auto parts = _settings.parts(now);
+    parts.stored = _settings.parts(configured).stored;
+    return _settings.observe(parts);
+  }
+
   MachineSettings& _settings;
 };
 

@@ -17,14 +17,22 @@ MachineSetting<std::string> address() {
   return textAt(setting::networkTimeServer, section, "Server");
 }
 
+MachineSetting<bool> atStartup() {
+  return switchAt(setting::networkTimeAtStartup, section, "Launch At Startup");
+}
+
 }  // namespace
 
 bool ScratchNetworkTimeService::isRunning() {
-  return _settings.isOn(running());
+  const auto now = running();
+  const auto afterRestart = atStartup();
+  auto parts = _settings.parts(now);
+  parts.stored = _settings.parts(afterRestart).stored;
+  return _settings.observe(parts).value_or(false);
 }
 
 void ScratchNetworkTimeService::setLaunchAtStartup(bool launch) {
-  _settings.change(switchAt(setting::networkTimeAtStartup, section, "Launch At Startup"), launch);
+  _settings.change(atStartup(), launch);
 }
 
 void ScratchNetworkTimeService::start() {

@@ -14,6 +14,8 @@ class ScratchNetworkTimeService final : public NetworkTimeService {
 
   bool isRunning() override;
   void setLaunchAtStartup(bool launch) override;
+  /// A rehearsed machine may have each of the two.
+  void checkLaunchAtStartup(bool /*launch*/) override {}
   void start() override;
   void stop() override;
   NetworkTimeServer server() override;

@@ -111,7 +111,9 @@ Result<Names> namesOfZones(const SystemRoot& root) {
 Result<std::vector<ZoneName>> installedZones(const SystemRoot& root) {
   const auto names = namesOfZones(root);
   if (!names) return names.failure();
-  if (names->empty()) return Failure{"list time zones", std::string(ZoneName::folder), "no time zones are installed"};
+  if (names->empty())
+    return Failure{"list time zones", std::string(ZoneName::folder), "no time zones are installed",
+                   std::make_error_code(std::errc::no_such_file_or_directory)};
   std::vector<ZoneName> zones;
   for (const auto& name : *names) zones.push_back({name});
   return zones;

@@ -116,6 +116,7 @@ int FakeServiceManager::answerProperty(sd_bus_message* message) {
   if (name == "LoadState") return sd_bus_reply_method_return(message, "v", "s", state.load.c_str());
   if (name == "ActiveState") return sd_bus_reply_method_return(message, "v", "s", state.active.c_str());
   if (name == "ServerName") return sd_bus_reply_method_return(message, "v", "s", "fallback.example");
+  if (name == "SystemNTPServers") return sd_bus_reply_method_return(message, "v", "as", 1, "time.example");
   if (name == "ConditionResult") return sd_bus_reply_method_return(message, "v", "b", state.conditionHolds ? 1 : 0);
   return sd_bus_reply_method_return(message, "v", "a(sbbsi)", 2, "ConditionCapability", 0, 0, "CAP_SYS_TIME", 1,
                                     "ConditionVirtualization", 0, 1, "container", -1);

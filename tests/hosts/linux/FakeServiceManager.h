@@ -27,7 +27,7 @@ struct FakeUnit {
 class FakeServiceManager {
  public:
   /// At a socket of its own, straight to each caller; or over the message bus whose socket it is, also as the
-  /// systemd-timesyncd that uses fallback.example.
+  /// systemd-timesyncd that has read time.example and uses fallback.example.
   enum class Reached { straight, overBus };
   explicit FakeServiceManager(const std::filesystem::path& socket, Reached reached = Reached::straight);
 

@@ -194,6 +194,23 @@ TEST(ScratchHost, appendsToRegularFilesOnly) {
   for (const auto& reader : readers) EXPECT_EQ(::read(reader.number(), &byte, 1), 0);
 }
 
+TEST(ScratchHost, tellsWhatIsInForceApartFromWhatIsConfigured) {
+  ScratchMachine machine;
+  machine.set("Network Time", "Running", true);
+  machine.set("Dynamic Store", "Local Host Name", "now");
+  machine.set("Host Configuration", "Local Host Name", "later");
+  machine.set("Clock", "Known Time Zones", PropertyList::Array{"UTC"});
+  machine.log.wants = true;
+  auto& host = machine.host();
+  host.networkTime().isRunning();
+  host.dynamicStore().open("test")->localHostName();
+  host.clock().knownTimeZones();
+  const std::vector<SettingValue> told = {{setting::networkTime, "on", "off"},
+                                          {setting::localSubnetName, "now", "later"},
+                                          {setting::knownTimeZones, "UTC"}};
+  EXPECT_EQ(machine.log.values, told);
+}
+
 TEST(ScratchHost, writesOneLineAMessage) {
   ScratchMachine machine;
   for (const char* message : {"one\n", "two\nlines\n\n", "", "three"}) machine.host().systemLog().write(message);

@@ -10,6 +10,7 @@ COMPUTER = r"""Mail "2" of $HOME \ Z""" + "\u00fc" + "rich"
 QUOTED = "'" + COMPUTER + "'"
 HOSTS = r"printf '127.0.0.1\tlocalhost\n127.0.1.1\t%s.lan %s # own\n' $(hostname) $(hostname) >/etc/hosts; "
 RESPONDER = "busctl call org.freedesktop.Avahi / org.freedesktop.Avahi.Server GetHostName"
+REPORTED = "rm -f /run/report; TAVISK_REPORT=/run/report tavisk {}; cat /run/report"
 
 
 def named(name):
@@ -28,6 +29,18 @@ CHECKS = [
              "TAVISK_LOG=stderr tavisk -setlocalsubnetname alone -getlocalsubnetname",
           prints="setlocalsubnetname: alone\nLocal Subnet Name: alone\n", errors="",
           then=named("alone") | {"systemctl is-active avahi-daemon": "inactive\n", "systemctl start avahi-daemon": ""}),
+    Check("the lines of the machine's own addresses follow", needs=REMOTE,
+          do="tavisk -setlocalsubnetname before >/dev/null; printf '127.0.0.1 localhost\\n127.0.0.2 before.lan before www\\n"
+             "192.0.2.1 before\\n' >/etc/hosts; " + REPORTED.format("-setlocalsubnetname after.example -getlocalsubnetname") +
+             """ | grep -o -e '^[a-zL].*' -e '"live":"[^"]*","stored":"[^"]*"' -e '"where":"[^"]*"'""",
+          prints='setlocalsubnetname: after.example\nLocal Subnet Name: after\n"live":"after","stored":"after.example"\n'
+                 '"where":"/etc/hosts, /etc/hostname"\n"live":"after","stored":"after.example"\n',
+          then={"cat /etc/hosts": "127.0.0.1 localhost\n127.0.0.2\tafter.example after www\n192.0.2.1 before\n",
+                "getent hosts after.example | cut -d' ' -f1": "127.0.0.2\n"}),
+    Check("a name that nothing resolves is told", needs=REMOTE,
+          do="echo '127.0.0.1 localhost' >/etc/hosts; cp /etc/nsswitch.conf /run/; echo 'hosts: files' >/etc/nsswitch.conf; "
+             + REPORTED.format("-setlocalsubnetname nowhere") + " | grep -o 'does not resolve'; getent hosts nowhere || "
+             "echo none; cp /run/nsswitch.conf /etc/", prints="setlocalsubnetname: nowhere\ndoes not resolve\nnone\n"),
     Check("the computer name is set", needs=REMOTE, kept=True, do=f"tavisk -setcomputername {QUOTED} -getcomputername",
           prints=f"setcomputername: {COMPUTER}\nComputer Name: {COMPUTER}\n",
           then={"hostnamectl hostname --pretty": f"{COMPUTER}\n", "tavisk -getcomputername": f"Computer Name: {COMPUTER}\n"}),

@@ -20,6 +20,13 @@ SERVERS_IN_USE = {
     "chrony": "chronyc -n sources",
     "ntpsec": "ntpq -np",
 }
+OTHERS = {
+    "systemd-timesyncd": ("/etc/systemd/timesyncd.conf.d/50-test.conf", r"[Time]\nNTP=other.example",
+                          "puts aside what is configured elsewhere: other.example"),
+    "chrony": ("/etc/chrony/sources.d/50-test.sources", "server other.example", "behind it: .*other.example"),
+    "ntpsec": ("/etc/ntpsec/ntp.d/50-test.conf", "server other.example", "behind it: .*other.example"),
+}
+REPORTED = "rm -f /run/report; TAVISK_REPORT=/run/report tavisk {} >/dev/null; cat /run/report"
 
 
 def in_use(daemon):
@@ -67,6 +74,24 @@ def where_it_runs(daemon):
               do=f"tavisk -setusingnetworktime on -setnetworktimeserver {SERVER}",
               prints=f"setUsingNetworkTime: On\nsetNetworkTimeServer: {SERVER}\n",
               then=server | {in_use(daemon): "in use\n", running: "active\n", at_startup: "enabled\n"}),
+        Check(f"{daemon} is left alone by what changes nothing", needs=needs,
+              do=f"start() {{ systemctl show -P ActiveEnterTimestampMonotonic {daemon}; }}; before=$(start); "
+                 + REPORTED.format(f"-setnetworktimeserver {SERVER} -setnetworktimeserver 'two words'") +
+                 """ | grep -o -e '"changed":[a-z]*,"values"' -e '"outcome":"[a-z]*"'; sleep 1; """
+                 """[ "$before" = "$(start)" ] && echo same start""",
+              prints='"changed":false,"values"\n"outcome":"unchanged"\n"outcome":"unchanged"\n'
+                     '"changed":false,"values"\n"outcome":"failed"\n"outcome":"unchanged"\nsame start\n'),
+        Check(f"{daemon} that runs until the next start only is told, with what to type", needs=needs,
+              do=f"systemctl disable --quiet {daemon} 2>&1; TAVISK_LOG=stderr tavisk -setusingnetworktime on",
+              prints="Network Time is already on.\n",
+              errors=re.compile(rf"tavisk: Network Time At Startup: enable on {daemon}.service: it runs already[^\n]*"
+                                r"type 'tavisk -setusingnetworktime off -setusingnetworktime on'\n"),
+              then={at_startup: "disabled\n", running: "active\n",
+                    "tavisk -setusingnetworktime off -setusingnetworktime on >/dev/null; " + at_startup: "enabled\n"}),
+        Check(f"{daemon}'s other servers are told", needs=needs,
+              do="printf '{1}\\n' >{0}; {3} | grep -c '{2}'; rm {0}".format(
+                  *OTHERS[daemon], REPORTED.format(f"-setnetworktimeserver {SERVER}")),
+              prints="1\n", then={in_use(daemon): "in use\n"}),
     ]
 
 

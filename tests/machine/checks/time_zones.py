@@ -11,6 +11,7 @@ WITHOUT_LINK = """(while :; do [ -L /etc/localtime ] || echo absent; done) >/run
 for zone in Europe/Paris America/Lima Europe/Paris America/Lima; do tavisk -settimezone $zone; done
 kill $watch
 cat /run/absent"""
+REPORTED = "rm -f /run/report; TAVISK_REPORT=/run/report tavisk {}; cat /run/report"
 
 CHECKS = [
     Check("the zones are those of timedatectl", needs=BUS,
@@ -22,6 +23,16 @@ CHECKS = [
           do="systemctl stop dbus.socket dbus; tavisk -settimezone Asia/Tokyo -gettimezone; systemctl start dbus.socket",
           prints="Set TimeZone: Asia/Tokyo\nTime Zone: Asia/Tokyo\n",
           then={"timedatectl show --property Timezone --value": "Asia/Tokyo\n"}),
+    Check("a copied zone is known by its rules", needs=CONTAINER,
+          do="rm /etc/localtime; cp /usr/share/zoneinfo/Asia/Tokyo /etc/localtime; echo Europe/Paris >/etc/timezone; "
+             + REPORTED.format("-gettimezone"),
+          prints=re.compile(r'Time Zone: Asia/Tokyo\n(?s:.*)"live":"Asia/Tokyo, by the rules in /etc/localtime",'
+                            r'"stored":"Europe/Paris"(?s:.*)'),
+          then={"date +%Z": "JST\n"}),
+    Check("without /etc/localtime it is UTC, whatever /etc/timezone says", needs=CONTAINER,
+          do="rm /etc/localtime; " + REPORTED.format("-gettimezone"),
+          prints=re.compile(r'Time Zone: UTC\n(?s:.*)"live":"UTC","stored":"Europe/Paris"(?s:.*)'),
+          then={"date +%Z": "UTC\n"}),
     Check("a zone is set", do="tavisk -settimezone Asia/Kolkata -gettimezone",
           prints="Set TimeZone: Asia/Kolkata\nTime Zone: Asia/Kolkata\n", then=ZONE_LINK),
     Check("the zone is the machine's own, and is kept", needs=BUS, kept=True, do="tavisk -gettimezone",

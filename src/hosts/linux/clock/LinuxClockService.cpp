@@ -11,6 +11,7 @@
 #include "hosts/linux/clock/LocalTime.h"
 #include "hosts/linux/clock/SystemClock.h"
 #include "hosts/linux/services/SystemServices.h"
+#include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/ProcessScan.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/shared/ZoneList.h"
@@ -46,10 +47,20 @@ Failure withAdvice(Failure failure) {
 
 }  // namespace
 
-std::int64_t LinuxClockService::now() {
-  const auto time = systemTime();
-  _machine.effects.observe({setting::time, textOf(time), std::nullopt, timeUnit});
+Setting<std::int64_t> LinuxClockService::timeSetting() const {
+  Setting<std::int64_t> time;
+  time.name = setting::time;
+  time.unit = timeUnit;
   return time;
+}
+
+std::int64_t LinuxClockService::now() {
+  const auto now = systemTime();
+  auto time = timeSetting();
+  time.live = [now] { return std::optional(Reading(now)); };
+  time.stored = [this] { return hardwareTime(_machine.root); };
+  static_cast<void>(observe(time, _machine.effects));
+  return now;
 }
 
 /// The clock of the machine that runs the tool is not that of any tree of files.
@@ -75,21 +86,26 @@ std::string LinuxClockService::whoCorrectsTheClock() {
 
 void LinuxClockService::setTime(std::int64_t secondsSince1970) {
   AskedTime asked(secondsSince1970);
-  Setting<std::int64_t> time;
-  time.name = setting::time;
-  time.unit = timeUnit;
+  bool isSet = false;
+  auto time = timeSetting();
   time.undoneBy = [this](const auto&) { return whoCorrectsTheClock(); };
   time.live = [&] { return asked.onSystemClock(); };
   const auto hardware = asked.onHardwareClock(_machine.root);
   if (!hardware || *hardware) {
     time.where = hardwareClock;
     time.stored = [&] { return asked.onHardwareClock(_machine.root); };
+    time.written = [&]() -> std::string {
+      const auto kept = asked.onHardwareClock(_machine.root);
+      return isSet && kept && *kept == asked.seconds() ? hardwareClock : "";
+    };
   } else {
     time.note = saying("without a hardware clock the machine forgets the time when it is off");
   }
   time.apply = [&](std::int64_t) {
     asked.isNow();
-    return changeTime(asked);
+    auto set = changeTime(asked);
+    isSet = static_cast<bool>(set);
+    return set;
   };
   carryOut(time, secondsSince1970, _machine);
 }
@@ -121,20 +137,12 @@ std::vector<ZoneName> LinuxClockService::knownTimeZones() {
   return {};
 }
 
-/// The link counts; a second copy of the name that says something else is told with it.
 Setting<ZoneName> LinuxClockService::timeZoneSetting() const {
   Setting<ZoneName> zone;
   zone.name = setting::timeZone;
-  zone.where = "/etc/localtime";
-  zone.live = [this]() -> Setting<ZoneName>::Found {
-    const auto linked = machineTimeZone(_machine.root);
-    if (!linked) return linked.failure();
-    return std::optional(Reading(linked->value_or(utc())));
-  };
-  zone.stored = [&root = _machine.root]() -> Setting<ZoneName>::Found {
-    auto second = timeZoneFileName(root);
-    return second && !*second ? machineTimeZone(root) : second;
-  };
+  zone.where = localTimeLink;
+  zone.live = [this] { return timeZoneInForce(_machine.root); };
+  zone.stored = [this] { return storedTimeZone(_machine.root); };
   return zone;
 }
 
@@ -155,26 +163,46 @@ Result<std::optional<ZoneName>> LinuxClockService::daemonsTimeZone() {
 
 void LinuxClockService::setTimeZone(const ZoneName& zone) {
   auto setting = timeZoneSetting();
-  setting.live = [this, ofLink = setting.live]() -> Setting<ZoneName>::Found {
-    auto linked = ofLink();
-    if (!linked) return linked;
+  setting.live = [this]() -> Setting<ZoneName>::Found {
+    const auto inForce = timeZoneInForce(_machine.root);
+    if (!inForce) return inForce.failure();
     const auto daemons = daemonsTimeZone();
     if (!daemons) return daemons.failure();
-    const auto name = (*linked)->value;
-    if (!*daemons || **daemons == name) return linked;
-    return std::optional(Reading(name, name.text + ", " + (*daemons)->text + " in " + timeDaemon().service));
+    if (!*daemons || **daemons == inForce->value) return inForce;
+    const auto daemonsName = (*daemons)->text.empty() ? "none" : (*daemons)->text;
+    const auto both = change::textOfReading(*inForce) + ", " + daemonsName + " in " + timeDaemon().service;
+    return std::optional(Reading(inForce->value, both));
   };
-  setting.store = [this](const ZoneName& asked) { return changeTimeZone(asked); };
+  Places written;
+  setting.written = [&] { return commaList(written); };
+  setting.store = [&](const ZoneName& asked) { return changeTimeZone(asked, written); };
   carryOut(setting, zoneOfPath(zone.file()).value_or(zone), _machine);
 }
 
 /// What needs root is asked before the daemon moves the link.
-Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone) {
+Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone, Places& written) {
   if (auto failure = whyNoZone(_machine.root, zone)) return *failure;
   if (auto failure = whyZoneNeedsRoot(_machine.root, zone)) return *failure;
-  const auto isSet = setZoneByDaemon(zone);
-  if (!isSet) return isSet.failure();
-  return *isSet ? updateTimeZoneFile(_machine.root, zone) : changeTimeZoneDirectly(zone);
+  const auto isThere = goesBy(zone);
+  if (!isThere) return isThere.failure();
+  if (!*isThere) {
+    if (auto linked = linkZone(zone); !linked) return linked;
+    written.emplace_back(localTimeLink);
+  }
+  const auto isUpdated = updateTimeZoneFile(_machine.root, zone);
+  if (!isUpdated) return isUpdated.failure();
+  if (*isUpdated) written.emplace_back(timeZoneFile);
+  return {};
+}
+
+/// Whether the link and the daemon have the zone.
+Result<bool> LinuxClockService::goesBy(const ZoneName& zone) {
+  const auto linked = linkedTimeZone(_machine.root);
+  if (!linked) return linked.failure();
+  if (*linked != zone) return false;
+  const auto daemons = daemonsTimeZone();
+  if (!daemons) return daemons.failure();
+  return daemons->value_or(zone) == zone;
 }
 
 /// False where it is left to the files: the daemon is not there, or does nothing for the zone that it found when it
@@ -185,15 +213,17 @@ Result<bool> LinuxClockService::setZoneByDaemon(const ZoneName& zone) {
   if (!*bus) return false;
   const auto set = (*bus)->call(timeDaemon(), "SetTimezone", "", zone.text, false);
   if (!set && !leavesItToOthers(set.failure())) return set.failure();
-  const auto linked = machineTimeZone(_machine.root);
+  const auto linked = linkedTimeZone(_machine.root);
   if (!linked) return linked.failure();
   return set && *linked == zone;
 }
 
-Result<void> LinuxClockService::changeTimeZoneDirectly(const ZoneName& zone) const {
-  if (const auto failure = whyNeedsRoot("set the time zone", "/etc/localtime")) return *failure;
-  if (auto linked = linkLocalTime(_machine.root, zone); !linked) return linked;
-  return updateTimeZoneFile(_machine.root, zone);
+Result<void> LinuxClockService::linkZone(const ZoneName& zone) {
+  const auto isSet = setZoneByDaemon(zone);
+  if (!isSet) return isSet.failure();
+  if (*isSet) return {};
+  if (const auto failure = whyNeedsRoot("set the time zone", localTimeLink)) return *failure;
+  return linkLocalTime(_machine.root, zone);
 }
 
 std::string LinuxClockService::rulesOf(const ZoneName& zone) {

@@ -24,13 +24,17 @@ class LinuxClockService final : public ClockService {
  private:
   Setting<ZoneName> timeZoneSetting() const;
   Result<std::optional<ZoneName>> daemonsTimeZone();
+  Setting<std::int64_t> timeSetting() const;
   std::optional<Failure> whyNoClock() const;
   std::string whoCorrectsTheClock();
   Result<void> changeTime(const AskedTime& asked);
   Result<void> changeTimeDirectly(std::int64_t secondsSince1970) const;
+  using Places = std::vector<std::string>;  ///< those that have been written
+
+  Result<bool> goesBy(const ZoneName& zone);
   Result<bool> setZoneByDaemon(const ZoneName& zone);
-  Result<void> changeTimeZone(const ZoneName& zone);
-  Result<void> changeTimeZoneDirectly(const ZoneName& zone) const;
+  Result<void> linkZone(const ZoneName& zone);
+  Result<void> changeTimeZone(const ZoneName& zone, Places& written);
 
   LinuxMachine _machine;
 };

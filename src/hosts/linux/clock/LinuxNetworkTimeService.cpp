@@ -2,21 +2,30 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/clock/LinuxNetworkTimeService.h"
 
+#include <algorithm>
+
 #include "base/DnsName.h"
 #include "effects/SettingNames.h"
-#include "hosts/linux/services/SystemServices.h"
+#include "hosts/linux/system/CommaList.h"
+#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
 namespace {
 
-using Value = std::optional<std::string>;
+constexpr const char* restart = "restart";
+constexpr const char* runsUntilRestart =
+    "it runs already, so nothing is changed, but it does not start with the machine: type 'tavisk "
+    "-setusingnetworktime off -setusingnetworktime on'";
+constexpr const char* restsUntilRestart =
+    "it is stopped already, so nothing is changed, but it starts with the machine: type 'tavisk "
+    "-setusingnetworktime on -setusingnetworktime off'";
 
 Failure noClient() {
-  std::string names;
-  for (const auto& daemon : timeDaemons()) names += (names.empty() ? "" : ", ") + std::string(daemon.daemon.unit);
-  return {"find a network-time client", names, "none of them is installed"};
+  std::vector<std::string> names;
+  for (const auto& daemon : timeDaemons()) names.emplace_back(daemon.daemon.unit);
+  return {"find a network-time client", commaList(names), "none of them is installed"};
 }
 
 }  // namespace
@@ -59,11 +68,6 @@ Setting<Value> LinuxNetworkTimeService::named(const char* name) {
   return setting;
 }
 
-template <typename Value>
-void LinuxNetworkTimeService::change(const Setting<Value>& setting, const std::type_identity_t<Value>& asked) {
-  carryOut(setting, asked, _machine);
-}
-
 Setting<bool> LinuxNetworkTimeService::runningSetting() {
   auto setting = named<bool>(setting::networkTime);
   setting.live = [this]() -> Result<bool> {
@@ -84,87 +88,135 @@ Result<void> LinuxNetworkTimeService::run(const Daemon& daemon, bool isOn) {
 }
 
 bool LinuxNetworkTimeService::isRunning() {
-  return observe(runningSetting(), _machine.effects).value_or(false);
+  auto setting = runningSetting();
+  setting.stored = [this] { return startsAtBoot(); };
+  return observe(setting, _machine.effects).value_or(false);
 }
 
 void LinuxNetworkTimeService::start() {
-  change(runningSetting(), true);
+  const bool hasStarted = carryOut(runningSetting(), true, _machine).outcome == Outcome::applied;
+  _isServerChanged = _isServerChanged && !hasStarted;
 }
 
 void LinuxNetworkTimeService::stop() {
-  change(runningSetting(), false);
+  carryOut(runningSetting(), false, _machine);
+}
+
+Result<bool> LinuxNetworkTimeService::startsAtBoot() {
+  return withClient<bool>([this](const TimeDaemon& client) { return daemons().startsAtBoot(client.daemon); });
 }
 
 void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
   auto setting = named<bool>(setting::networkTimeAtStartup);
-  setting.stored = [this] {
-    return withClient<bool>([this](const TimeDaemon& client) { return daemons().startsAtBoot(client.daemon); });
-  };
+  if (const auto found = client(); found && *found) setting.where = (*found)->daemon.unit;
+  setting.stored = [this] { return startsAtBoot(); };
   setting.store = [this](bool starts) {
     return withClient<void>(
         [&](const TimeDaemon& client) { return daemons().setStartAtBoot({client.daemon}, starts); });
   };
-  change(setting, launch);
+  carryOut(setting, launch, _machine);
+}
+
+void LinuxNetworkTimeService::checkLaunchAtStartup(bool launch) {
+  const auto found = client();
+  if (found && !*found) return;
+  const auto starts = startsAtBoot();
+  if (starts && *starts == launch) return;
+  Effect effect{.setting = setting::networkTimeAtStartup, .outcome = Outcome::failed, .asked = textOf(launch)};
+  if (starts) {
+    effect.before = effect.stored = textOf(*starts);
+    effect.failure = {launch ? "enable" : "disable", (*found)->daemon.unit,
+                      launch ? runsUntilRestart : restsUntilRestart};
+  } else {
+    effect.failure = starts.failure();
+  }
+  _machine.effects.record(effect);
 }
 
 Setting<std::string> LinuxNetworkTimeService::serverSetting() {
   auto setting = named<std::string>(setting::networkTimeServer);
-  setting.stored = [this]() -> Result<Value> {
-    const auto found = client();
-    if (!found) return found.failure();
-    if (!*found) return Value();
-    return (*found)->server(_machine.root);
-  };
+  setting.stored = [this] { return firstServer(); };
   return setting;
 }
 
-Result<std::string> LinuxNetworkTimeService::serverInUseWithoutAny() {
+Setting<std::string>::Found LinuxNetworkTimeService::firstServer() {
   const auto found = client();
   if (!found) return found.failure();
-  if (!*found || !(*found)->busService) return std::string();
-  const auto configured = (*found)->server(_machine.root);
-  if (!configured) return configured.failure();
-  const auto runs = configured->empty() ? daemons().isRunning((*found)->daemon) : Result<bool>(false);
+  if (!*found) return std::nullopt;
+  const auto servers = (*found)->servers(_machine.root);
+  if (!servers) return servers.failure();
+  return servers->empty() ? std::nullopt : std::optional(Reading(servers->front()));
+}
+
+/// The next one that is configured where the first does not answer; else what the network offered, or the client's own
+/// last resort.
+Setting<std::string>::Found LinuxNetworkTimeService::liveServer() {
+  const auto found = client();
+  if (!found) return found.failure();
+  if (!*found) return std::nullopt;
+  const auto runs = daemons().isRunning((*found)->daemon);
   if (!runs) return runs.failure();
-  return *runs ? serverInUse((*found)->busService) : std::string();
+  const auto server = *runs ? serverInUse(**found, _machine) : Result<std::string>(std::string());
+  if (!server) return server.failure();
+  return server->empty() ? std::nullopt : std::optional(Reading(*server));
 }
 
-/// A server that the network offered, or the daemon's own last resort.
-Result<std::string> LinuxNetworkTimeService::serverInUse(const char* busService) {
-  const auto bus = systemBusIfAny(_machine.services);
-  if (!bus) return bus.failure();
-  if (!*bus) return std::string();
-  const BusObject manager{busService, "/org/freedesktop/timesync1", "org.freedesktop.timesync1.Manager"};
-  auto name = (*bus)->property(manager, "ServerName", "s");
-  if (name) return std::move(name).value().readText();
-  if (name.failure().code == BusErrorCode::serviceUnknown) return std::string();
-  return name.failure();
-}
-
+/// What is configured is the answer as soon as it is, whichever server the client is at.
 NetworkTimeServer LinuxNetworkTimeService::server() {
   auto setting = serverSetting();
-  auto inUse = serverInUseWithoutAny();
-  if (!inUse || !inUse->empty()) setting.live = [&inUse] { return inUse; };
-  return {observe(setting, _machine.effects).value_or("")};
+  const auto configured = firstServer();
+  const bool isConfigured = configured && *configured;
+  const bool isLiveWanted = configured && (!isConfigured || _machine.effects.wantsValues());
+  if (isLiveWanted) setting.live = [this] { return liveServer(); };
+  const auto told = observe(setting, _machine.effects);
+  return {isConfigured ? (*configured)->value : told.value_or("")};
 }
 
-std::string LinuxNetworkTimeService::whatStaysInUse(const TimeDaemon& client) const {
-  const auto other = client.otherServer ? client.otherServer(_machine.root) : std::string();
-  return !other || other->empty() ? "" : "configured elsewhere, " + *other + " stays in use beside it";
+/// The server of the tool's own file, as long as that is written as it is now.
+Setting<std::string>::Found LinuxNetworkTimeService::storedServer(const TimeDaemon& client) const {
+  const auto servers = client.servers(_machine.root);
+  if (!servers) return servers.failure();
+  if (servers->empty()) return std::nullopt;
+  const auto own = orEmpty(_machine.root.read(client.serverFile, configurationLimit));
+  if (!own) return own.failure();
+  const auto& first = servers->front();
+  const bool isOurs = *own == client.serverLines(first);
+  return std::optional(Reading(first, isOurs ? "" : first + ", not as " + client.serverFile + " would have it"));
+}
+
+std::string LinuxNetworkTimeService::whatIsConfiguredElsewhere(const TimeDaemon& client,
+                                                               const std::string& address) const {
+  const auto others = client.otherServers(_machine.root);
+  const auto servers = client.servers(_machine.root);
+  if (!others || !servers) return {};
+  TimeServers aside;
+  TimeServers behind;
+  for (const auto& other : *others)
+    if (other != address) (std::ranges::find(*servers, other) == servers->end() ? aside : behind).push_back(other);
+  std::string note = aside.empty() ? "" : "puts aside what is configured elsewhere: " + commaList(aside);
+  if (!behind.empty())
+    note += (note.empty() ? "" : "; ") + ("configured elsewhere, stays in use behind it: " + commaList(behind));
+  return note;
 }
 
 void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
   auto setting = serverSetting();
+  std::optional<std::string> before;
   if (const auto found = client(); found && *found) {
-    setting.where = (*found)->serverFile;
-    setting.note = [this, client = *found](const auto&) { return whatStaysInUse(*client); };
-    if ((*found)->readsServerFile)
-      setting.supported = [this, client = *found] { return client->readsServerFile(_machine.root); };
+    const auto* client = *found;
+    setting.where = client->serverFile;
+    setting.note = [=, this](const auto& address) { return whatIsConfiguredElsewhere(*client, address); };
+    if (client->readsServerFile) setting.supported = [=, this] { return client->readsServerFile(_machine.root); };
+    setting.stored = [=, this] { return storedServer(*client); };
+    setting.takeBack = [=, this, &before] { return putBack(*client, before); };
+    setting.store = [=, this, &before](const std::string& address) -> Result<void> {
+      const auto lines = orAbsent(_machine.root.read(client->serverFile, configurationLimit));
+      if (!lines) return lines.failure();
+      before = *lines;
+      return storeServer(*client, address);
+    };
   }
-  setting.store = [this](const std::string& address) {
-    return withClient<void>([&](const TimeDaemon& client) { return storeServer(client, address); });
-  };
-  change(setting, server.address);
+  _isServerChanged = carryOut(setting, server.address, _machine).changed || _isServerChanged;
 }
 
 Result<void> LinuxNetworkTimeService::storeServer(const TimeDaemon& client, const std::string& address) {
@@ -175,12 +227,20 @@ Result<void> LinuxNetworkTimeService::storeServer(const TimeDaemon& client, cons
   return _machine.root.write(client.serverFile, client.serverLines(address));
 }
 
+Result<void> LinuxNetworkTimeService::putBack(const TimeDaemon& client, const std::optional<std::string>& lines) {
+  return lines ? _machine.root.write(client.serverFile, *lines) : _machine.root.remove(client.serverFile);
+}
+
+/// A client that has read its servers as they are goes on undisturbed.
 void LinuxNetworkTimeService::restartAsynchronously() {
   auto setting = named<std::string>(setting::networkTimeRestart);
   setting.apply = [this](const std::string&) {
     return withClient<void>([&](const TimeDaemon& client) { return reload(client); });
   };
-  change(setting, "restart");
+  const auto isRead = withClient<bool>([this](const TimeDaemon& client) { return hasReadServers(client, _machine); });
+  if (isRead && *isRead && !_isServerChanged)
+    return _machine.effects.record({.setting = setting.name, .outcome = Outcome::unchanged, .asked = restart});
+  _isServerChanged = carryOut(setting, restart, _machine).outcome != Outcome::applied;
 }
 
 Result<void> LinuxNetworkTimeService::reload(const TimeDaemon& client) {

@@ -4,7 +4,6 @@
 
 #include <optional>
 #include <string>
-#include <type_traits>
 
 #include "hosts/linux/clock/TimeDaemons.h"
 #include "hosts/linux/services/LinuxMachine.h"
@@ -20,6 +19,7 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
 
   bool isRunning() override;
   void setLaunchAtStartup(bool launch) override;
+  void checkLaunchAtStartup(bool launch) override;
   void start() override;
   void stop() override;
   NetworkTimeServer server() override;
@@ -38,18 +38,19 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   Result<void> run(const Daemon& daemon, bool isOn);
   template <typename Value>
   Setting<Value> named(const char* name);
-  template <typename Value>
-  void change(const Setting<Value>& setting, const std::type_identity_t<Value>& asked);
   Setting<bool> runningSetting();
+  Result<bool> startsAtBoot();
   Setting<std::string> serverSetting();
-  /// Empty when one is configured, or none is in use.
-  Result<std::string> serverInUseWithoutAny();
-  Result<std::string> serverInUse(const char* busService);
-  std::string whatStaysInUse(const TimeDaemon& client) const;
+  Setting<std::string>::Found firstServer();
+  Setting<std::string>::Found liveServer();
+  Setting<std::string>::Found storedServer(const TimeDaemon& client) const;
+  std::string whatIsConfiguredElsewhere(const TimeDaemon& client, const std::string& address) const;
   Result<void> storeServer(const TimeDaemon& client, const std::string& address);
+  Result<void> putBack(const TimeDaemon& client, const std::optional<std::string>& lines);
   Result<void> reload(const TimeDaemon& client);
 
   LinuxMachine _machine;
+  bool _isServerChanged = false;  ///< since the client was last told to read it
 };
 
 }  // namespace tavisk

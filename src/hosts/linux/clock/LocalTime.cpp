@@ -5,12 +5,11 @@
 #include "base/Text.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/Rights.h"
+#include "hosts/shared/ZoneList.h"
 
 namespace tavisk {
 namespace {
 
-constexpr const char* localTimeLink = "/etc/localtime";
-constexpr const char* timeZoneFile = "/etc/timezone";
 constexpr std::size_t timeZoneFileLimit = 4096;
 constexpr std::size_t largestZone = std::size_t{1} << 20U;
 constexpr const char* setZone = "set the time zone";
@@ -20,6 +19,34 @@ Result<std::optional<std::string>> localTimeTarget(const SystemRoot& root) {
   const auto target = root.readLink(localTimeLink);
   const bool isNoLink = !target && !target.failure().code;
   return isNoLink ? Result<std::optional<std::string>>(std::nullopt) : orAbsent(target);
+}
+
+Result<bool> hasRules(const SystemRoot& root, const ZoneName& zone, const std::string& rules) {
+  const auto its = orAbsent(root.read(zone.file(), largestZone));
+  if (!its) return its.failure();
+  return *its == rules;
+}
+
+/// As the second copy of the name says; UTC where that names none.
+Result<ZoneName> nameBeside(const SystemRoot& root) {
+  const auto named = timeZoneFileName(root);
+  if (!named) return named.failure();
+  return *named && (*named)->isWellFormed() ? **named : utc();
+}
+
+Result<Reading<ZoneName>> zoneWithRules(const SystemRoot& root, const std::string& rules) {
+  const auto named = nameBeside(root);
+  if (!named) return named.failure();
+  const auto installed = orEmpty(installedZones(root));
+  if (!installed) return installed.failure();
+  auto candidates = *installed;
+  candidates.insert(candidates.begin(), *named);
+  for (const auto& zone : candidates) {
+    const auto isIt = hasRules(root, zone, rules);
+    if (!isIt) return isIt.failure();
+    if (*isIt) return Reading(zone, zone.text + ", by the rules in " + localTimeLink);
+  }
+  return Reading(*named, std::string("rules of no known zone in ") + localTimeLink);
 }
 
 }  // namespace
@@ -32,13 +59,33 @@ Result<std::optional<ZoneName>> timeZoneFileName(const SystemRoot& root) {
   return std::optional(lines.empty() ? ZoneName() : ZoneName{split(lines.front(), " \t\r").front()});
 }
 
-Result<std::optional<ZoneName>> machineTimeZone(const SystemRoot& root) {
+Result<std::optional<ZoneName>> linkedTimeZone(const SystemRoot& root) {
   const auto target = localTimeTarget(root);
   if (!target) return target.failure();
-  if (auto zone = zoneOfPath(target->value_or(""))) return zone;
-  auto zone = timeZoneFileName(root);
-  if (zone && *zone && !(*zone)->isWellFormed()) return std::optional<ZoneName>();
-  return zone;
+  return zoneOfPath(target->value_or(""));
+}
+
+Result<Reading<ZoneName>> timeZoneInForce(const SystemRoot& root) {
+  const auto linked = linkedTimeZone(root);
+  if (!linked) return linked.failure();
+  const auto rules = orAbsent(root.read(localTimeLink, largestZone));
+  if (*linked && rules && !*rules) return Reading(**linked, "UTC, without " + (*linked)->file());
+  if (*linked) return Reading(**linked);
+  if (!rules) return rules.failure();
+  return *rules ? zoneWithRules(root, **rules) : Reading(utc());
+}
+
+Result<std::optional<Reading<ZoneName>>> storedTimeZone(const SystemRoot& root) {
+  const auto second = timeZoneFileName(root);
+  if (!second) return second.failure();
+  if (*second) return std::optional(Reading(**second));
+  const auto linked = linkedTimeZone(root);
+  if (!linked) return linked.failure();
+  if (*linked) return std::optional(Reading(**linked));
+  const auto there = root.isThere(localTimeLink);
+  if (!there) return there.failure();
+  if (*there) return timeZoneInForce(root);
+  return std::optional<Reading<ZoneName>>();
 }
 
 std::optional<Failure> whyNoZone(const SystemRoot& root, const ZoneName& zone) {
@@ -60,11 +107,13 @@ Result<void> linkLocalTime(const SystemRoot& root, const ZoneName& zone) {
   return root.writeLink(localTimeLink, ".." + zone.file());
 }
 
-Result<void> updateTimeZoneFile(const SystemRoot& root, const ZoneName& zone) {
+Result<bool> updateTimeZoneFile(const SystemRoot& root, const ZoneName& zone) {
   const auto named = timeZoneFileName(root);
   if (!named) return named.failure();
-  if (!*named || **named == zone) return {};
-  return root.write(timeZoneFile, zone.text + "\n");
+  if (!*named || **named == zone) return false;
+  const auto written = root.write(timeZoneFile, zone.text + "\n");
+  if (!written) return written.failure();
+  return true;
 }
 
 }  // namespace tavisk

@@ -5,13 +5,26 @@
 #include <optional>
 
 #include "base/Result.h"
+#include "hosts/shared/SettingChange.h"
 #include "hosts/shared/SystemRoot.h"
 #include "platform/ClockService.h"
 
 namespace tavisk {
 
-/// The machine's zone (localtime(5)): the link /etc/localtime, else /etc/timezone; absent when neither names one.
-Result<std::optional<ZoneName>> machineTimeZone(const SystemRoot& root);
+inline constexpr const char* localTimeLink = "/etc/localtime";
+inline constexpr const char* timeZoneFile = "/etc/timezone";
+
+/// The zone that the link /etc/localtime names; absent when it names none, or is no link.
+Result<std::optional<ZoneName>> linkedTimeZone(const SystemRoot& root);
+
+/// The zone in force (localtime(5)): the one that the link names; for a file in its place the one that has the same
+/// rules, the name in /etc/timezone before others; UTC without either. Where no zone has these rules it is the one that
+/// /etc/timezone names, and what is known is in the detail, as wherever the link does not lead to the zone's own file.
+Result<Reading<ZoneName>> timeZoneInForce(const SystemRoot& root);
+
+/// The zone that stays: what the second copy of the name says, tzdata makes the link anew from it; without that file
+/// what the link or the file in its place says; absent without either.
+Result<std::optional<Reading<ZoneName>>> storedTimeZone(const SystemRoot& root);
 
 /// Debian's second copy of the name, /etc/timezone, whatever it is made of; absent when there is no such file.
 Result<std::optional<ZoneName>> timeZoneFileName(const SystemRoot& root);
@@ -25,7 +38,7 @@ std::optional<Failure> whyZoneNeedsRoot(const SystemRoot& root, const ZoneName& 
 /// Points /etc/localtime at a zone. At no moment is the link absent.
 Result<void> linkLocalTime(const SystemRoot& root, const ZoneName& zone);
 
-/// Brings /etc/timezone into line; a machine that has no such file gets none.
-Result<void> updateTimeZoneFile(const SystemRoot& root, const ZoneName& zone);
+/// Brings /etc/timezone into line, and answers whether it was written; a machine that has no such file gets none.
+Result<bool> updateTimeZoneFile(const SystemRoot& root, const ZoneName& zone);
 
 }  // namespace tavisk

@@ -7,8 +7,10 @@
 #include <vector>
 
 #include "base/Text.h"
+#include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/OwnFiles.h"
+#include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/SystemdConfig.h"
 
 namespace tavisk {
@@ -18,10 +20,11 @@ constexpr const char* chronyConfig = "/etc/chrony/chrony.conf";
 constexpr const char* ntpsecConfig = "/etc/ntpsec/ntp.conf";
 constexpr const char* openntpdConfig = "/etc/openntpd/ntpd.conf";
 constexpr const char* chronyReload[] = {"/usr/bin/chronyc", "reload", "sources"};
+constexpr const char* chronySources[] = {"/usr/bin/chronyc", "-N", "-c", "sources", "-a"};
 constexpr std::string_view commentSigns = "#%;!";
 
 using Directives = std::vector<std::vector<std::string>>;
-using Server = Result<std::string>;
+using Servers = Result<TimeServers>;
 
 /// The lines of a file as words: chrony.conf(5) and ntp.conf(5) agree on comments and on one directive a line. Without
 /// the file there are none.
@@ -44,43 +47,52 @@ std::string serverOf(const std::vector<std::string>& directive) {
   return directive[1];
 }
 
-/// Whether a search is over: a server is found, or something cannot be looked at.
-bool isOver(const Server& server) {
-  return !server || !server->empty();
+void append(TimeServers& servers, const TimeServers& more) {
+  servers.insert(servers.end(), more.begin(), more.end());
 }
 
-Server firstServer(const SystemRoot& root, const std::string& file) {
+/// What is configured in one place and in the next.
+Servers both(Servers first, const Servers& second) {
+  if (!first || !second) return first ? second : first;
+  auto all = std::move(first).value();
+  append(all, *second);
+  return all;
+}
+
+Servers serversIn(const SystemRoot& root, const std::string& file) {
   const auto found = directives(root, file);
   if (!found) return found.failure();
+  TimeServers servers;
   for (const auto& directive : *found)
-    if (auto server = serverOf(directive); !server.empty()) return server;
-  return std::string();
+    if (auto server = serverOf(directive); !server.empty()) servers.push_back(std::move(server));
+  return servers;
 }
 
 /// The tool's own file aside.
-Server firstServerInFolder(const SystemRoot& root, const std::string& folder, std::string_view ending) {
+Servers serversInFolder(const SystemRoot& root, const std::string& folder, std::string_view ending) {
   const auto names = orEmpty(root.list(folder));
   if (!names) return names.failure();
-  for (const auto& name : *names) {
-    if (!name.ends_with(ending) || name.starts_with(std::string(ownfile::name) + ".")) continue;
-    if (auto server = firstServer(root, (folder + "/").append(name)); isOver(server)) return server;
-  }
-  return std::string();
+  Servers servers = TimeServers();
+  for (const auto& name : *names)
+    if (name.ends_with(ending) && !name.starts_with(std::string(ownfile::name) + "."))
+      servers = both(std::move(servers), serversIn(root, (folder + "/").append(name)));
+  return servers;
 }
 
 /// As chronyd reads its configuration: "confdir" and "sourcedir" lines take in the files of folders.
-Server chronyOtherServer(const SystemRoot& root) {
+Servers chronyOtherServers(const SystemRoot& root) {
   const auto found = directives(root, chronyConfig);
   if (!found) return found.failure();
+  Servers servers = TimeServers();
   for (const auto& directive : *found) {
-    Server server = serverOf(directive);
-    for (std::size_t i = 1; i < directive.size() && !isOver(server); ++i) {
-      if (directive[0] == "confdir") server = firstServerInFolder(root, directive[i], ".conf");
-      if (directive[0] == "sourcedir") server = firstServerInFolder(root, directive[i], ".sources");
+    if (auto server = serverOf(directive); !server.empty()) servers = both(std::move(servers), TimeServers{server});
+    for (std::size_t i = 1; i < directive.size(); ++i) {
+      if (directive[0] == "confdir") servers = both(std::move(servers), serversInFolder(root, directive[i], ".conf"));
+      if (directive[0] == "sourcedir")
+        servers = both(std::move(servers), serversInFolder(root, directive[i], ".sources"));
     }
-    if (isOver(server)) return server;
   }
-  return std::string();
+  return servers;
 }
 
 Support chronyReadsServerFile(const SystemRoot& root) {
@@ -95,25 +107,22 @@ Support chronyReadsServerFile(const SystemRoot& root) {
        "chronyd does not read it: " + std::string(chronyConfig) + " has no line \"sourcedir /etc/chrony/sources.d\""}});
 }
 
-Server ntpsecOtherServer(const SystemRoot& root) {
-  auto server = firstServer(root, ntpsecConfig);
-  return isOver(server) ? server : firstServerInFolder(root, "/etc/ntpsec/ntp.d", ".conf");
+Servers ntpsecOtherServers(const SystemRoot& root) {
+  return both(serversIn(root, ntpsecConfig), serversInFolder(root, "/etc/ntpsec/ntp.d", ".conf"));
 }
 
-Server chronyServer(const SystemRoot& root) {
+Servers chronyServers(const SystemRoot& root) {
   const auto reads = chronyReadsServerFile(root);
   if (!reads) return reads.failure();
-  auto own = *reads ? Server(std::string()) : firstServer(root, ownfile::chronyServer);
-  return isOver(own) ? own : chronyOtherServer(root);
+  return both(*reads ? Servers(TimeServers()) : serversIn(root, ownfile::chronyServer), chronyOtherServers(root));
 }
 
-Server ntpsecServer(const SystemRoot& root) {
-  auto own = firstServer(root, ownfile::ntpsecServer);
-  return isOver(own) ? own : ntpsecOtherServer(root);
+Servers ntpsecServers(const SystemRoot& root) {
+  return both(serversIn(root, ownfile::ntpsecServer), ntpsecOtherServers(root));
 }
 
-Server openntpdServer(const SystemRoot& root) {
-  return firstServer(root, openntpdConfig);
+Servers openntpdServers(const SystemRoot& root) {
+  return serversIn(root, openntpdConfig);
 }
 
 Support openntpdReadsServerFile(const SystemRoot&) {
@@ -121,14 +130,16 @@ Support openntpdReadsServerFile(const SystemRoot&) {
       NotSupported{{"set the server", openntpdConfig, "openntpd reads this file only, and it is the administrator's"}});
 }
 
-Server timesyncdServer(const SystemRoot& root) {
-  const auto servers = SystemdConfig(root, "timesyncd.conf").words("Time", "NTP");
-  if (!servers) return servers.failure();
-  return servers->empty() ? std::string() : servers->front();
+Servers timesyncdServers(const SystemRoot& root) {
+  return SystemdConfig(root, "timesyncd.conf").words("Time", "NTP");
+}
+
+Servers timesyncdOtherServers(const SystemRoot& root) {
+  return SystemdConfig(root, "timesyncd.conf").wordsBesideOwn("Time", "NTP");
 }
 
 std::string serverDirective(const std::string& server) {
-  return ownfile::header + ("server " + server) + " iburst\n";
+  return ownfile::header + ("server " + server) + " iburst prefer\n";
 }
 
 /// The empty assignment takes the place of servers in files before this one.
@@ -139,32 +150,90 @@ std::string timesyncdLines(const std::string& server) {
 constexpr TimeDaemon daemons[] = {
     {.daemon = {"chrony.service", "chrony", "chronyd"},
      .serverFile = ownfile::chronyServer,
-     .server = chronyServer,
-     .otherServer = chronyOtherServer,
+     .servers = chronyServers,
+     .otherServers = chronyOtherServers,
      .serverLines = serverDirective,
      .readsServerFile = chronyReadsServerFile,
-     .reload = chronyReload},
+     .reload = chronyReload,
+     .sources = chronySources},
     {.daemon = {"ntpsec.service", "ntpsec", "ntpd"},
      .serverFile = ownfile::ntpsecServer,
-     .server = ntpsecServer,
-     .otherServer = ntpsecOtherServer,
-     .serverLines = serverDirective},
+     .servers = ntpsecServers,
+     .otherServers = ntpsecOtherServers,
+     .serverLines = serverDirective,
+     .startFile = "/run/ntpd.pid"},
     {.daemon = {"openntpd.service", "openntpd", "ntpd"},
      .serverFile = openntpdConfig,
-     .server = openntpdServer,
+     .servers = openntpdServers,
+     .otherServers = openntpdServers,
      .serverLines = serverDirective,
      .readsServerFile = openntpdReadsServerFile},
     {.daemon = {"systemd-timesyncd.service", "", "systemd-timesyncd"},
      .serverFile = ownfile::timesyncdServer,
-     .server = timesyncdServer,
+     .servers = timesyncdServers,
+     .otherServers = timesyncdOtherServers,
      .serverLines = timesyncdLines,
      .busService = "org.freedesktop.timesync1"},
 };
+
+BusObject timeSyncManager(const char* busService) {
+  return {busService, "/org/freedesktop/timesync1", "org.freedesktop.timesync1.Manager"};
+}
+
+/// Against all servers: a file of the administrator's may have changed too.
+Result<bool> tellsItsServers(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  const auto configured = daemon.servers(machine.root);
+  if (!configured) return configured.failure();
+  const auto bus = machine.services.systemBus();
+  if (!bus) return bus.failure();
+  auto told = (*bus)->property(timeSyncManager(daemon.busService), "SystemNTPServers", "as");
+  if (!told) return told.failure();
+  return std::move(told).value().readTexts() == *configured;
+}
+
+Result<bool> printsItsServer(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  const auto own = serversIn(machine.root, daemon.serverFile);
+  if (!own) return own.failure();
+  const auto printed = runProgram(machine.root, {daemon.sources.begin(), daemon.sources.end()}, machine.runLoop);
+  if (!printed) return printed.failure();
+  TimeServers known;
+  for (const auto& line : split(*printed, "\n"))
+    if (const auto fields = split(line, ","); fields.size() > 2) known.push_back(fields[2]);
+  return std::ranges::all_of(
+      *own, [&](const std::string& server) { return std::ranges::find(known, server) != known.end(); });
+}
+
+Result<bool> hasStartedSince(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  const auto started = machine.root.stamp(daemon.startFile);
+  if (!started) return Failure{"look at", daemon.startFile, "it does not tell when the client started"};
+  const auto written = machine.root.stamp(daemon.serverFile);
+  return !written || written->changed < started->modified;
+}
 
 }  // namespace
 
 std::span<const TimeDaemon> timeDaemons() {
   return daemons;
+}
+
+Result<bool> hasReadServers(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  const auto reads = daemon.readsServerFile ? daemon.readsServerFile(machine.root) : Support(std::nullopt);
+  if (!reads) return reads.failure();
+  if (*reads) return true;
+  if (daemon.busService) return tellsItsServers(daemon, machine);
+  if (!daemon.sources.empty()) return printsItsServer(daemon, machine);
+  return hasStartedSince(daemon, machine);
+}
+
+Result<std::string> serverInUse(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  if (!daemon.busService) return std::string();
+  const auto bus = systemBusIfAny(machine.services);
+  if (!bus) return bus.failure();
+  if (!*bus) return std::string();
+  auto name = (*bus)->property(timeSyncManager(daemon.busService), "ServerName", "s");
+  if (name) return std::move(name).value().readText();
+  if (name.failure().code == BusErrorCode::serviceUnknown) return std::string();
+  return name.failure();
 }
 
 }  // namespace tavisk

@@ -23,7 +23,9 @@ constexpr std::size_t hostsLimit = std::size_t{4} << 20U;
 constexpr const char* prettyName = "PRETTY_HOSTNAME";
 constexpr const char* kernelNameFile = "/proc/sys/kernel/hostname";
 constexpr const char* kernelWithoutName = "(none)";
-constexpr std::string_view ownAddress = "127.0.1.1";
+constexpr const char* ownAddress = "127.0.1.1";
+constexpr const char* everyMachine = "localhost";
+constexpr const char* lookupConfig = "/etc/nsswitch.conf";
 constexpr const char* cloudConfig = "/etc/cloud/cloud.cfg";
 constexpr const char* cloudConfigFolder = "/etc/cloud/cloud.cfg.d";
 constexpr const char* responderConfig = "/etc/avahi/avahi-daemon.conf";
@@ -56,35 +58,39 @@ std::vector<std::string> namesAfter(const std::vector<std::string>& names, const
   return result;
 }
 
-/// A line of hosts(5): the names of our own address, and the comment behind them; another line has no names.
-struct OwnLine {
-  explicit OwnLine(const std::string& line) {
+/// A line of hosts(5): an address, its names, and the comment behind them.
+struct HostsLine {
+  explicit HostsLine(const std::string& line) {
     const auto end = std::min(line.find('#'), line.size());
     names = split(line.substr(0, end), " \t\r");
-    if (names.empty() || names.front() != ownAddress)
-      names.clear();
-    else
+    if (!names.empty()) {
+      address = names.front();
       names.erase(names.begin());
+    }
     comment = line.substr(end);
   }
+  bool isOf(const std::vector<std::string>& addresses) const {
+    return !names.empty() && std::ranges::find(addresses, address) != addresses.end();
+  }
   std::string text() const {
-    auto text = std::string(ownAddress);
+    auto text = address;
     for (const auto& name : names) text += (&name == &names.front() ? "\t" : " ") + name;
     return text + (comment.empty() ? "" : " " + comment);
   }
 
+  std::string address;
   std::vector<std::string> names;
   std::string comment;
 };
 
-/// The line with other names, where it has any.
+/// The line with other names, where it is one of these addresses.
 template <typename Rename>
-std::string renamed(const std::string& line, Rename rename) {
-  OwnLine own(line);
-  if (own.names.empty()) return line;
-  const auto before = own.names;
-  own.names = rename(before);
-  return own.names == before ? line : own.text();
+std::string renamed(const std::string& line, const std::vector<std::string>& addresses, Rename rename) {
+  HostsLine parts(line);
+  if (!parts.isOf(addresses)) return line;
+  const auto before = parts.names;
+  parts.names = rename(before);
+  return parts.names == before ? line : parts.text();
 }
 
 bool nameIt(const std::vector<std::string>& names, const std::string& machine) {
@@ -111,6 +117,28 @@ std::string changedLines(std::string_view text, Change change) {
     text.remove_prefix(std::min(end + 1, text.size()));
   }
   return changed;
+}
+
+std::vector<HostsLine> hostsLines(std::string_view text) {
+  std::vector<HostsLine> lines;
+  for (const auto& line : split(text, "\n")) lines.emplace_back(line);
+  return lines;
+}
+
+bool hasName(std::string_view hosts, const std::string& name) {
+  return std::ranges::any_of(hostsLines(hosts), [&](const HostsLine& line) {
+    return std::ranges::find(line.names, name) != line.names.end();
+  });
+}
+
+/// Whether a module is asked that knows the machine's own name (nss-myhostname(8), nss-resolve(8)).
+bool isAnsweredByItself(const std::string& lookups) {
+  for (const auto& line : configurationLines(lookups)) {
+    const auto words = split(line, " \t\r");
+    if (words[0] != "hosts:") continue;
+    return std::ranges::any_of(words, [](const auto& word) { return word == "myhostname" || word == "resolve"; });
+  }
+  return false;
 }
 
 /// As cloud-init reads them: a later file goes before an earlier one.
@@ -203,31 +231,49 @@ Result<std::string> hostsOf(const SystemRoot& root) {
 }
 
 bool hostsName(std::string_view hosts, const std::string& name) {
-  bool hasLine = false;
-  bool isNamed = false;
-  changedLines(hosts, [&](const std::string& line) {
-    const auto names = OwnLine(line).names;
-    hasLine = hasLine || !names.empty();
-    isNamed = isNamed || nameIt(names, name);
-    return line;
-  });
-  return isNamed || !hasLine;
+  return hasName(hosts, name) || std::ranges::any_of(hostsLines(hosts), [&](const HostsLine& line) {
+           return line.isOf({ownAddress}) && nameIt(line.names, name);
+         });
 }
 
-std::string hostsWithName(std::string_view hosts, const std::vector<std::string>& before, const std::string& now) {
+bool hostsNameTheMachine(std::string_view hosts) {
+  return std::ranges::any_of(hostsLines(hosts), [](const HostsLine& line) { return line.isOf({ownAddress}); });
+}
+
+std::vector<std::string> addressesNamed(std::string_view hosts, const std::vector<std::string>& names) {
+  std::vector<std::string> addresses;
+  for (const auto& line : hostsLines(hosts)) {
+    const bool isNamed = std::ranges::any_of(
+        names, [&](const std::string& name) { return !name.empty() && nameIt(line.names, firstLabel(name)); });
+    if (isNamed && !line.isOf(addresses)) addresses.push_back(line.address);
+  }
+  return addresses;
+}
+
+std::string hostsWithName(std::string_view hosts, const std::vector<std::string>& before, const std::string& now,
+                          const std::vector<std::string>& own) {
   std::string text(hosts);
+  auto addresses = own;
+  addresses.emplace_back(ownAddress);
   for (const auto& old : before) {
-    if (old.empty()) continue;
+    if (old.empty() || firstLabel(old) == everyMachine) continue;
     text = changedLines(text, [&](const std::string& line) {
-      return renamed(line, [&](const auto& names) { return namesAfter(names, old, now); });
+      return renamed(line, addresses, [&](const auto& names) { return namesAfter(names, old, now); });
     });
   }
   bool isDone = hostsName(text, now);
   return changedLines(text, [&](const std::string& line) {
-    if (isDone || OwnLine(line).names.empty()) return line;
+    if (isDone || !HostsLine(line).isOf({ownAddress})) return line;
     isDone = true;
-    return renamed(line, [&](const auto& names) { return namesWithOwn(names, now); });
+    return renamed(line, {ownAddress}, [&](const auto& names) { return namesWithOwn(names, now); });
   });
+}
+
+std::string whyNotResolved(const SystemRoot& root, const std::string& name) {
+  const auto hosts = hostsOf(root);
+  const auto config = readIfThere(root, lookupConfig);
+  if (!hosts || !config || hasName(*hosts, name) || isAnsweredByItself(*config)) return {};
+  return std::string("no line of ") + hostsFile + " has the name: unless a name server knows it, it does not resolve";
 }
 
 std::string whoUndoesHostName(const SystemRoot& root, const std::string& name) {

@@ -32,13 +32,21 @@ Result<void> setKernelHostName(const SystemRoot& root, const std::string& name);
 
 /// The text of hosts(5); empty where there is no such file.
 Result<std::string> hostsOf(const SystemRoot& root);
-/// Whether a line of the address 127.0.1.1, which is this machine's own, has this name; also where there is no such
-/// line.
+/// Whether a line has this name; on a line of 127.0.1.1 one of a single label may stand before a dot.
 bool hostsName(std::string_view hosts, const std::string& name);
-/// The text of hosts(5) with the machine's own name, on the line of the address 127.0.1.1, changed to `now`; what
-/// follows its first label there stays, and so do all other names. The line has one of the names `before`, or one that
-/// nobody knows any more.
-std::string hostsWithName(std::string_view hosts, const std::vector<std::string>& before, const std::string& now);
+/// Whether there is a line of the address 127.0.1.1, by which a machine calls itself that has no other.
+bool hostsNameTheMachine(std::string_view hosts);
+/// The addresses of the lines that have one of these names, once each.
+std::vector<std::string> addressesNamed(std::string_view hosts, const std::vector<std::string>& names);
+/// The text of hosts(5) with the machine's own name, on the lines of 127.0.1.1 and of the addresses `own`, changed to
+/// `now`; what follows its first label there stays, and so do all other names, "localhost" too. The lines have one of
+/// the names `before`; where none has `now` then, a line of 127.0.1.1 with one that nobody knows any more gets it.
+std::string hostsWithName(std::string_view hosts, const std::vector<std::string>& before, const std::string& now,
+                          const std::vector<std::string>& own);
+
+/// Why the machine's own name may lead to no address, for people: no line of hosts(5) has it, and nsswitch.conf(5) asks
+/// nobody who answers for it. Empty where it does, or where that cannot be looked at.
+std::string whyNotResolved(const SystemRoot& root, const std::string& name);
 
 /// What on this machine sets another host name when it starts the next time, for people; empty when nothing is known,
 /// also of what cannot be looked at.

@@ -8,7 +8,9 @@
 #include "effects/SettingNames.h"
 #include "hosts/linux/names/HostNameFiles.h"
 #include "hosts/linux/names/NameAnnouncer.h"
+#include "hosts/linux/names/OwnAddress.h"
 #include "hosts/linux/services/SystemServices.h"
+#include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/shared/SettingChange.h"
 
@@ -36,12 +38,27 @@ std::optional<Failure> whyNotStorable(const std::string& name) {
 
 using Value = std::optional<std::string>;
 
-Result<Value> computerNameOf(const SystemRoot& root) {
+Result<Value> storedComputerNameOf(const SystemRoot& root) {
   auto name = prettyHostName(root);
   if (!name || *name) return name;
-  name = staticHostName(root);
+  return staticHostName(root);
+}
+
+Result<Value> computerNameOf(const SystemRoot& root) {
+  auto name = storedComputerNameOf(root);
   if (!name || *name) return name;
   return kernelHostName(root);
+}
+
+/// Those of the lines with the machine's names that are its own.
+Result<std::vector<std::string>> ownAddresses(const std::string& hosts, const std::vector<std::string>& names) {
+  std::vector<std::string> own;
+  for (auto& address : addressesNamed(hosts, names)) {
+    const auto isOwn = isOwnAddress(address);
+    if (!isOwn) return isOwn.failure();
+    if (*isOwn) own.push_back(std::move(address));
+  }
+  return own;
 }
 
 Result<Value> localNameOf(const LinuxMachine& machine) {
@@ -57,17 +74,24 @@ class LinuxSession final : public DynamicStore::Session {
   explicit LinuxSession(const LinuxMachine& machine) : _machine(machine) {}
 
   Value computerName() override {
-    return look(setting::computerName, [this] { return computerNameOf(_machine.root); });
+    return look(
+        setting::computerName, [this] { return computerNameOf(_machine.root); },
+        [this] { return storedComputerNameOf(_machine.root); });
   }
   Value localHostName() override {
-    return look(setting::localSubnetName, [this] { return localNameOf(_machine); });
+    return look(
+        setting::localSubnetName, [this] { return localNameOf(_machine); },
+        [this] { return staticHostName(_machine.root); });
   }
 
  private:
-  Value look(const char* name, const Setting<std::string>::Read& read) {
+  using Read = Setting<std::string>::Read;
+
+  Value look(const char* name, const Read& live, const Read& stored) {
     Setting<std::string> setting;
     setting.name = name;
-    setting.live = read;
+    setting.live = live;
+    setting.stored = stored;
     return observe(setting, _machine.effects);
   }
 
@@ -121,21 +145,29 @@ void LinuxHostConfigService::setLocalNetworkName(const std::string& name) {
   setting.name = setting::localSubnetName;
   setting.where = staticNameFile;
   setting.undoneBy = [this](const auto& asked) { return whoUndoesHostName(_machine.root, asked); };
-  setting.live = [this] { return liveLocalName(); };
+  setting.note = [this](const auto& asked) { return whyNotResolved(_machine.root, asked); };
+  setting.live = [&] { return liveLocalName(name); };
+  setting.liveFor = firstLabel;
   setting.stored = [this] { return storedLocalName(); };
-  setting.store = [this](const std::string& value) { return storeLocalName(value); };
+  Places written;
+  setting.written = [&] { return commaList(written); };
+  setting.store = [&](const std::string& value) { return storeLocalName(value, written); };
   setting.apply = [this](const std::string& value) { return applyLocalName(value); };
   carryOut(setting, name, _machine);
 }
 
-/// The kernel's name, unless another one is announced than its first label.
-Result<LinuxHostConfigService::Value> LinuxHostConfigService::liveLocalName() {
-  auto announced = _announcer.respondersName();
-  if (!announced) return announced;
-  auto name = kernelHostName(_machine.root);
-  if (!name || !*announced) return name;
-  const auto label = firstLabel(name->value_or(""));
-  return compareIgnoringCase(**announced, label) == 0 ? name : announced;
+/// The first label, by which the network knows the machine, and the kernel's whole name where it is another one.
+Setting<std::string>::Found LinuxHostConfigService::liveLocalName(const std::string& asked) {
+  const auto announced = _announcer.respondersName();
+  if (!announced) return announced.failure();
+  const auto kernels = kernelHostName(_machine.root);
+  if (!kernels) return kernels.failure();
+  if (!*announced && !*kernels) return std::nullopt;
+  const auto name = kernels->value_or("");
+  const auto label = firstLabel(name);
+  const bool isAnnounced = !*announced || compareIgnoringCase(**announced, label) == 0;
+  if (isAnnounced) return std::optional(Reading(label, name == asked ? "" : name));
+  return std::optional(Reading(**announced, name == asked ? "" : **announced + ", " + name + " in the kernel"));
 }
 
 /// The name in its file, and with it that the machine's own line among the hosts has another one.
@@ -145,12 +177,13 @@ Setting<std::string>::Found LinuxHostConfigService::storedLocalName() {
   const auto hosts = hostsOf(_machine.root);
   if (!hosts) return hosts.failure();
   if (!*name) return std::nullopt;
-  const auto stale = hostsName(*hosts, **name) ? "" : **name + ", another one in " + hostsFile;
+  const bool isStale = hostsNameTheMachine(*hosts) && !hostsName(*hosts, **name);
+  const auto stale = isStale ? **name + ", another one in " + hostsFile : "";
   return std::optional(Reading(**name, stale));
 }
 
 /// The name is refused here before it reaches a service that would cut it off.
-Result<void> LinuxHostConfigService::storeLocalName(const std::string& name) {
+Result<void> LinuxHostConfigService::storeLocalName(const std::string& name, Places& written) {
   if (name.empty() || name.size() > longestKernelHostName)
     return Failure{setLocal, staticNameFile, "the kernel holds names of 1 to 64 bytes"};
   const auto stored = staticHostName(_machine.root);
@@ -160,20 +193,36 @@ Result<void> LinuxHostConfigService::storeLocalName(const std::string& name) {
   const auto hosts = hostsOf(_machine.root);
   if (!hosts) return hosts.failure();
   if (auto failure = whyAnnouncingNeedsRoot(name)) return *failure;
-  const auto renamed = hostsWithName(*hosts, {stored->value_or(""), kernels->value_or("")}, name);
-  if (renamed == *hosts) return storeStaticName(name);
+  const std::vector<std::string> before{stored->value_or(""), kernels->value_or("")};
+  const auto own = ownAddresses(*hosts, before);
+  if (!own) return own.failure();
   // Before the name itself: when a run ends in between, setting the name again completes the change.
-  if (auto failure = whyNeedsRoot(setLocal, hostsFile)) return *failure;
-  if (auto written = _machine.root.write(hostsFile, renamed); !written) return written;
-  auto set = storeStaticName(name);
-  return set ? set : putBackHosts(*hosts, name, set.failure());
+  const auto renamed = hostsWithName(*hosts, before, name, *own);
+  if (renamed != *hosts) {
+    if (auto failure = whyNeedsRoot(setLocal, hostsFile)) return *failure;
+    if (auto changed = _machine.root.write(hostsFile, renamed); !changed) return changed;
+    written.emplace_back(hostsFile);
+  }
+  if (*stored == name) return {};
+  const auto set = storeStaticName(name);
+  if (!set) return putBackHosts(*hosts, name, set.failure(), written);
+  written.emplace_back(staticNameFile);
+  return {};
 }
 
 /// Where the name was stored all the same it is right among the hosts too.
-Failure LinuxHostConfigService::putBackHosts(const std::string& hosts, const std::string& name, Failure cause) {
-  if (const auto stored = staticHostName(_machine.root); stored && *stored == name) return cause;
+Failure LinuxHostConfigService::putBackHosts(const std::string& hosts, const std::string& name, Failure cause,
+                                             Places& written) {
+  if (const auto stored = staticHostName(_machine.root); stored && *stored == name) {
+    written.emplace_back(staticNameFile);
+    return cause;
+  }
+  if (written.empty()) return cause;
   const auto restored = _machine.root.write(hostsFile, hosts);
-  if (!restored) cause.why += "; " + describe(restored.failure());
+  if (restored)
+    written.clear();
+  else
+    cause.why += "; " + describe(restored.failure());
   return cause;
 }
 

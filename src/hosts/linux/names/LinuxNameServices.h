@@ -4,6 +4,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "hosts/linux/names/NameAnnouncer.h"
 #include "hosts/linux/services/LinuxMachine.h"
@@ -29,10 +30,12 @@ class LinuxHostConfigService final : public HostConfigService {
   Result<bool> setByService(const char* member, const std::string& name);
   Result<Value> serviceComputerName();
   Result<void> storeComputerName(const std::string& name);
-  Result<Value> liveLocalName();
+  using Places = std::vector<std::string>;  ///< those that have been written
+
+  Setting<std::string>::Found liveLocalName(const std::string& asked);
   Setting<std::string>::Found storedLocalName();
-  Result<void> storeLocalName(const std::string& name);
-  Failure putBackHosts(const std::string& hosts, const std::string& name, Failure cause);
+  Result<void> storeLocalName(const std::string& name, Places& written);
+  Failure putBackHosts(const std::string& hosts, const std::string& name, Failure cause, Places& written);
   std::optional<Failure> whyAnnouncingNeedsRoot(const std::string& name);
   Result<void> storeStaticName(const std::string& name);
   Result<void> applyLocalName(const std::string& name);

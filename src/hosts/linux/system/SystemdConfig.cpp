@@ -100,16 +100,28 @@ Result<std::vector<SystemdConfig::Assignment>> SystemdConfig::all(std::string_vi
   return found;
 }
 
-Result<std::vector<std::string>> SystemdConfig::words(std::string_view section, std::string_view key) const {
-  const auto assigned = all(section, key);
-  if (!assigned) return assigned.failure();
+std::vector<std::string> SystemdConfig::wordsOf(const std::vector<Assignment>& assigned) {
   std::vector<std::string> words;
-  for (const auto& each : *assigned) {
+  for (const auto& each : assigned) {
     const auto added = split(each.value, " \t");
     if (added.empty()) words.clear();
     words.insert(words.end(), added.begin(), added.end());
   }
   return words;
+}
+
+Result<std::vector<std::string>> SystemdConfig::words(std::string_view section, std::string_view key) const {
+  const auto assigned = all(section, key);
+  if (!assigned) return assigned.failure();
+  return wordsOf(*assigned);
+}
+
+Result<std::vector<std::string>> SystemdConfig::wordsBesideOwn(std::string_view section, std::string_view key) const {
+  auto assigned = all(section, key);
+  if (!assigned) return assigned.failure();
+  auto others = std::move(assigned).value();
+  std::erase_if(others, [own = ownDropIn()](const Assignment& each) { return each.file == own; });
+  return wordsOf(others);
 }
 
 Result<std::optional<SystemdConfig::Assignment>> SystemdConfig::last(std::string_view section,

@@ -22,6 +22,8 @@ class SystemdConfig {
 
   /// The words of a key that collects values, such as "NTP": an empty assignment forgets the ones before it.
   Result<std::vector<std::string>> words(std::string_view section, std::string_view key) const;
+  /// What words() would be without the tool's own drop-in.
+  Result<std::vector<std::string>> wordsBesideOwn(std::string_view section, std::string_view key) const;
   /// A value and the file that it comes from.
   struct Assignment {
     std::string file;
@@ -41,6 +43,7 @@ class SystemdConfig {
 
  private:
   Result<std::vector<std::string>> files() const;
+  static std::vector<std::string> wordsOf(const std::vector<Assignment>& assigned);
   /// The values of a key in each of the files, in order.
   Result<std::vector<Assignment>> all(std::string_view section, std::string_view key) const;
 

@@ -48,6 +48,32 @@ TEST(LocalTime, ReadsTheNameFileWhereTheLinkSaysNothing) {
   }
 }
 
+TEST(LocalTime, TellsTheZoneInForceApartFromTheNameBeside) {
+  const std::tuple<std::string, const char*, const char*> cases[] = {
+      {"none", "UTC", "UTC"},
+      {"TZif Paris", "Europe/Paris", "Europe/Paris, by the rules in /etc/localtime"},
+      {"TZif Tokyo", "Asia/Tokyo", "Asia/Tokyo, by the rules in /etc/localtime"},
+      {"TZif Mars", "Europe/Paris", "rules of no known zone in /etc/localtime"},
+      {"/usr/share/zoneinfo/Asia/Tokyo", "Asia/Tokyo", "Asia/Tokyo"},
+      {"/usr/share/zoneinfo/No/Where", "No/Where", "UTC, without /usr/share/zoneinfo/No/Where"},
+  };
+  for (const auto& [text, zone, live] : cases) {
+    LinuxTree tree;
+    tree.log.wants = true;
+    tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif Paris");
+    tree.write("/usr/share/zoneinfo/Asia/Tokyo", "TZif Tokyo");
+    tree.write("/etc/timezone", "Europe/Paris");
+    if (text.starts_with('/')) tree.link("/etc/localtime", text);
+    if (text.starts_with("TZ")) tree.write("/etc/localtime", text);
+    EXPECT_EQ(tree.host().clock().timeZone().text, zone) << text;
+    EXPECT_EQ(tree.log.values.back(), (SettingValue{setting::timeZone, live, "Europe/Paris"})) << text;
+    tree.host().clock().setTimeZone({"Europe/Paris"});
+    EXPECT_EQ(tree.lastEffect().where, "/etc/localtime") << text;
+    EXPECT_TRUE(tree.lastEffect().changed) << text;
+    EXPECT_EQ(tree.lastEffect().live, "Europe/Paris") << text;
+  }
+}
+
 TEST(LocalTime, KeepsLinkAndNameFileInLine) {
   LinuxTree tree;
   const ZoneName paris{"Europe/Paris"};
@@ -56,12 +82,29 @@ TEST(LocalTime, KeepsLinkAndNameFileInLine) {
   tree.write("/etc/timezone", "Etc/UTC\n");
   tree.host().clock().setTimeZone(paris);
   EXPECT_EQ(tree.log.effects.back().outcome, Outcome::applied) << "one of the two was stale";
+  EXPECT_EQ(tree.lastEffect().where, "/etc/timezone");
   EXPECT_EQ(tree.file("/etc/timezone"), "Europe/Paris\n");
   const ZoneName olympus{"Mars/Olympus"};
   tree.host().clock().setTimeZone(olympus);
   EXPECT_EQ(tree.log.effects.back().failure, (Failure{"set the time zone", olympus.file(), "there is no such zone"}));
-  EXPECT_EQ(std::filesystem::read_symlink(tree.at("/etc/localtime")), "../usr/share/zoneinfo/Europe/Paris");
+  EXPECT_EQ(std::filesystem::read_symlink(tree.at("/etc/localtime")), paris.file()) << "it was right as it was";
   EXPECT_EQ(tree.file("/etc/timezone"), "Europe/Paris\n");
+}
+
+TEST(LocalTime, IsChangedWhereHalfOfItIs) {
+  LinuxTree tree;
+  tree.write("/run/systemd/system/x", "");
+  tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif2");
+  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+    if (member == "Get") return sd_bus_reply_method_return(call, "v", "s", "Europe/Paris");
+    tree.link("/etc/localtime", "../usr/share/zoneinfo/" + firstText(call));
+    tree.makeUnreadable("/etc/timezone");
+    return sd_bus_reply_method_return(call, "");
+  });
+  tree.host().clock().setTimeZone({"Europe/Paris"});
+  EXPECT_THAT(tree.lastEffect(), FailedFor("/etc/timezone"));
+  EXPECT_EQ(tree.lastEffect().where, "/etc/localtime");
+  EXPECT_TRUE(tree.lastEffect().changed);
 }
 
 /// Puts something in the place of a file that cannot be looked at, or that keeps a reader waiting.
@@ -123,6 +166,12 @@ TEST(LinuxClock, LeavesTheClockOfThisMachineAloneAndNamesWhatWouldSetItBack) {
   tree.host().clock().setTime(1'166'999'400);
   EXPECT_THAT(tree.lastEffect(), FailedFor("a tree of files has no clock"));
   EXPECT_EQ(tree.lastEffect().undoneBy, "VBoxService");
+  tree.write("/sys/class/rtc/rtc0/since_epoch", "1166999400\n");
+  tree.host().clock().setTime(1'166'999'400);
+  EXPECT_EQ(tree.lastEffect().where, "") << "the hardware clock has that time by chance";
+  tree.log.wants = true;
+  tree.host().clock().now();
+  EXPECT_EQ(tree.log.values.back().stored, "1166999400");
 }
 
 TEST(LocalTime, IsSetAnewWhereTheDaemonGoesByAnother) {

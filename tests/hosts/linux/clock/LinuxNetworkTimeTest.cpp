@@ -3,8 +3,10 @@
 #include <gmock/gmock.h>
 
 #include "effects/EffectMatchers.h"
+#include "hosts/linux/LinuxContractMachines.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/clock/TimeDaemons.h"
+#include "hosts/linux/system/CommaList.h"
 #include "platform/NetworkTimeContract.h"
 
 namespace tavisk {
@@ -18,7 +20,9 @@ struct ChronyTree : LinuxTree {
     write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\n");
     writeProgram("/usr/bin/chronyc", R"sh(#!/bin/sh
 root=${0%/usr/bin/chronyc}
+[ "$1" = reload ] || { cat "$root/known"; exit; }
 echo "$@" "$(env | grep -v -e ^PWD= -e ^SHLVL= -e ^_= | sort)" > "$root/reloaded"
+sed -n 's/^server \([^ ]*\).*/^,?,\1,0,6/p' "$root/etc/chrony/sources.d/60-tavisk.sources" > "$root/known"
 )sh");
   }
 };
@@ -39,13 +43,92 @@ struct ChronyTest : testing::Test {
 TEST_F(ChronyTest, WritesTheServerWhereTheClientReadsItAgain) {
   client.setServer({"time.example"});
   EXPECT_EQ(tree.file("/etc/chrony/sources.d/60-tavisk.sources"),
-            "# Written by tavisk. Changes made here are replaced.\nserver time.example iburst\n");
+            "# Written by tavisk. Changes made here are replaced.\nserver time.example iburst prefer\n");
   client.restartAsynchronously();
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_EQ(tree.file("/reloaded"), "reload sources LC_ALL=C\nPATH=/usr/sbin:/usr/bin:/sbin:/bin\n");
   tree.write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\npool pool.example iburst\n");
   client.setServer({"next.example"});
-  EXPECT_EQ(tree.lastEffect().note, "configured elsewhere, pool.example stays in use beside it");
+  EXPECT_EQ(tree.lastEffect().note, "configured elsewhere, stays in use behind it: pool.example");
+}
+
+TEST_F(ChronyTest, IsLeftAloneWhenItGoesByItsServerAlready) {
+  constexpr const char* own = "/etc/chrony/sources.d/60-tavisk.sources";
+  const auto isRestartedAfter = [&](const char* server) {
+    tree.write("/reloaded", "");
+    client.setServer({server});
+    client.restartAsynchronously();
+    EXPECT_EQ(tree.lastEffect().changed, tree.lastEffect().outcome == Outcome::applied);
+    return !tree.file("/reloaded").empty();
+  };
+  EXPECT_TRUE(isRestartedAfter("time.example"));
+  for (const char* same : {"time.example", "two words", ""}) EXPECT_FALSE(isRestartedAfter(same)) << same;
+  tree.write("/known", "^,?,other.example,0\n");
+  EXPECT_TRUE(isRestartedAfter("time.example")) << "a run was cut off before it";
+  tree.write(own, "server time.example iburst\n");
+  EXPECT_TRUE(isRestartedAfter("time.example")) << "chronyc does not show that it is preferred now";
+  std::filesystem::remove(tree.at("/known"));
+  EXPECT_TRUE(isRestartedAfter("time.example")) << "what it goes by is not known";
+  tree.write("/etc/chrony/chrony.conf", "pool pool.example iburst\n");
+  EXPECT_FALSE(isRestartedAfter("next.example")) << "it does not read the file";
+}
+
+TEST_F(ChronyTest, TellsWhatTheNextStartOfTheMachineWouldChange) {
+  for (const bool starts : {false, true}) {
+    client.setLaunchAtStartup(starts);
+    EXPECT_EQ(tree.lastEffect().where, starts ? "chrony.service" : "") << "it did not start before";
+    client.checkLaunchAtStartup(starts);
+    EXPECT_EQ(tree.log.effects.size(), starts ? 3 : 1);
+    client.checkLaunchAtStartup(!starts);
+    EXPECT_THAT(tree.lastEffect(),
+                FailedFor(starts ? "type 'tavisk -setusingnetworktime on -setusingnetworktime off'"
+                                 : "type 'tavisk -setusingnetworktime off -setusingnetworktime on'"));
+    tree.log.wants = true;
+    EXPECT_FALSE(client.isRunning());
+    EXPECT_EQ(tree.log.values.back().stored, starts ? "on" : "off");
+  }
+}
+
+TEST(LinuxNetworkTime, GoesByTheStartOfAClientThatDoesNotTellItsServers) {
+  constexpr std::chrono::hours aWhile{1};
+  LinuxTree tree;
+  tree.haveInitScript("ntpsec", "ntpd");
+  tree.write("/usr/sbin/ntpd", "");
+  auto& client = tree.host().networkTime();
+  client.setServer({"time.example"});
+  client.start();
+  tree.write("/run/ntpd.pid", "77");
+  const auto now = std::filesystem::last_write_time(tree.at("/run/ntpd.pid"));
+  for (const bool isRead : {true, false}) {
+    std::filesystem::last_write_time(tree.at("/run/ntpd.pid"), isRead ? now + aWhile : now - aWhile);
+    client.setServer({"time.example"});
+    client.restartAsynchronously();
+    EXPECT_EQ(tree.lastEffect().outcome == Outcome::unchanged, isRead);
+  }
+}
+
+TEST(LinuxNetworkTime, TakesBackAServerThatALaterFileHides) {
+  ManagedTree tree;
+  constexpr const char* own = "/etc/systemd/timesyncd.conf.d/60-tavisk.conf";
+  tree.manager.set("systemd-timesyncd.service", {});
+  tree.write("/etc/systemd/timesyncd.conf", "[Time]\nNTP=a.example time.example b.example\n");
+  tree.write("/etc/systemd/timesyncd.conf.d/70.conf", "[Time]\nNTP=c.example\n");
+  auto& client = tree.host().networkTime();
+  client.setServer({"time.example"});
+  EXPECT_EQ(tree.lastEffect().where, own);
+  EXPECT_EQ(tree.lastEffect().note,
+            "puts aside what is configured elsewhere: a.example, b.example; configured elsewhere, stays in use behind "
+            "it: c.example");
+  const auto before = tree.file(own);
+  tree.write("/etc/systemd/timesyncd.conf.d/70.conf", "[Time]\nNTP=\nNTP=c.example\n");
+  for (const auto& kept : {before, std::string()}) {
+    if (kept.empty()) std::filesystem::remove(tree.at(own));
+    client.setServer({"next.example"});
+    EXPECT_THAT(tree.lastEffect(), FailedFor("reads c.example, not as " + std::string(own)));
+    EXPECT_FALSE(tree.lastEffect().changed);
+    EXPECT_EQ(tree.lastEffect().where, "");
+    EXPECT_EQ(tree.has(own) ? tree.file(own) : "", kept);
+  }
 }
 
 TEST_F(ChronyTest, WritesNoServerThatTheClientDoesNotRead) {
@@ -80,33 +163,34 @@ TEST_F(ChronyTest, IsNotTurnedOnUntilTheNextStartOnlyByWhoIsNotRoot) {
 
 struct ServerFiles {
   std::vector<std::pair<const char*, const char*>> files;
-  const char* server;
+  const char* servers;
 };
 
-/// What the daemon that starts with this program answers as its first server.
-std::string firstServer(const char* program, const ServerFiles& configured) {
+/// What the daemon that starts with this program answers as its servers.
+std::string serversOf(const char* program, const ServerFiles& configured) {
   LinuxTree tree;
   for (const auto& [path, text] : configured.files) tree.write(path, text);
   for (const auto& client : timeDaemons())
-    if (std::string_view(client.daemon.program) == program) return *client.server(tree.root);
+    if (std::string_view(client.daemon.program) == program) return commaList(*client.servers(tree.root));
   return "no such program";
 }
 
 TEST(TimeDaemons, ReadServersAsChronydDoes) {
   constexpr const char* main = "/etc/chrony/chrony.conf";
   const ServerFiles cases[] = {
-      {{{main, "# server no.example\n! pool no.example\nPool  2.example iburst\nserver 3.example\n"}}, "2.example"},
+      {{{main, "# server no.example\n! pool no.example\nPool  2.example iburst\nserver 3.example\n"}},
+       "2.example, 3.example"},
       {{{main, "confdir /etc/chrony/conf.d\npool last.example"},
         {"/etc/chrony/conf.d/b.conf", "server b.example\n"},
         {"/etc/chrony/conf.d/a.txt", "server a.example\n"}},
-       "b.example"},
+       "b.example, last.example"},
       {{{main, "sourcedir /run/chrony-dhcp /etc/chrony/sources.d\n"},
         {"/etc/chrony/sources.d/20.sources", "server z.example\n"},
         {"/etc/chrony/sources.d/60-tavisk.sources", "server own.example iburst\n"}},
-       "own.example"},
+       "own.example, z.example"},
       {{{main, "server\n\n"}}, ""},
   };
-  for (const auto& each : cases) EXPECT_EQ(firstServer("chronyd", each), each.server) << each.files[0].second;
+  for (const auto& each : cases) EXPECT_EQ(serversOf("chronyd", each), each.servers) << each.files[0].second;
 }
 
 TEST(TimeDaemons, ReadServersAsTimesyncdDoes) {
@@ -114,7 +198,8 @@ TEST(TimeDaemons, ReadServersAsTimesyncdDoes) {
   constexpr const char* own = "/etc/systemd/timesyncd.conf.d/60-tavisk.conf";
   const ServerFiles cases[] = {
       {{{main, "[Time]\n#NTP=no.example\nFallbackNTP=no.example\n"}}, ""},
-      {{{main, "[Other]\nNTP=no.example\n[Time]\n NTP = a.example  b.example\nNTP=c.example\n"}}, "a.example"},
+      {{{main, "[Other]\nNTP=no.example\n[Time]\n NTP = a.example  b.example\nNTP=c.example\n"}},
+       "a.example, b.example, c.example"},
       {{{main, "[Time]\nNTP=a.example\n"}, {own, "[Time]\nNTP=\nNTP=own.example\n"}}, "own.example"},
       {{{main, "[Time]\nNTP=a.example\n"}, {"/run/systemd/timesyncd.conf.d/9.conf", "[Time]\nNTP=\n"}}, ""},
       {{{own, "[Time]\nNTP=own.example\n"}, {"/usr/lib/systemd/timesyncd.conf.d/60-tavisk.conf", "[Time]\nNTP=x\n"}},
@@ -124,19 +209,19 @@ TEST(TimeDaemons, ReadServersAsTimesyncdDoes) {
       {{{main, "[Time]\nNTP=\\\n; a comment between\na.example\n"}}, "a.example"},
       {{{"/usr/lib/systemd/timesyncd.conf", "[Time]\nNTP=vendor.example"}}, "vendor.example"},
   };
-  for (const auto& each : cases) EXPECT_EQ(firstServer("systemd-timesyncd", each), each.server) << each.files[0].second;
+  for (const auto& each : cases) EXPECT_EQ(serversOf("systemd-timesyncd", each), each.servers) << each.files[0].second;
 }
 
 TEST(TimeDaemons, ReadServersAsNtpdDoes) {
   constexpr const char* main = "/etc/ntpsec/ntp.conf";
   const ServerFiles cases[] = {
       {{{main, "driftfile /x\npool 0.example iburst\n"}, {"/etc/ntpsec/ntp.d/1.conf", "server 1.example\n"}},
-       "0.example"},
+       "0.example, 1.example"},
       {{{main, "tos maxclock 11\n"}, {"/etc/ntpsec/ntp.d/1.conf", "server 1.example\n"}}, "1.example"},
       {{{main, "pool 0.example\n"}, {"/etc/ntpsec/ntp.d/60-tavisk.conf", "server own.example iburst\n"}},
-       "own.example"},
+       "own.example, 0.example"},
   };
-  for (const auto& each : cases) EXPECT_EQ(firstServer("ntpd", each), each.server) << each.files[0].second;
+  for (const auto& each : cases) EXPECT_EQ(serversOf("ntpd", each), each.servers) << each.files[0].second;
 }
 
 TEST(LinuxNetworkTime, KnowsTheClientThatIsReallyThereAndLeavesItsFileAlone) {

@@ -50,8 +50,13 @@ TEST(HostNameFiles, RenameTheMachineInHostsAndNobodyElse) {
        {"old"},
        "new",
        "127.0.0.1 old\n#127.0.1.1 old\n192.0.2.1 old\n\n"},
+      {"192.0.2.7 old.lan www #\n192.0.2.8 old\n", {"old"}, "new", "192.0.2.7\tnew.lan www new #\n192.0.2.8 old\n"},
+      {"127.0.1.1 alias\n192.0.2.7 old\n", {"old"}, "new", "127.0.1.1 alias\n192.0.2.7\tnew\n"},
+      {"127.0.1.1 old\n192.0.2.8 new.example\n", {}, "new", "127.0.1.1\tnew old\n192.0.2.8 new.example\n"},
+      {"192.0.2.7 localhost\n", {"localhost"}, "new", "192.0.2.7 localhost\n"},
   };
-  for (const auto& [hosts, before, now, after] : cases) EXPECT_EQ(hostsWithName(hosts, before, now), after) << hosts;
+  for (const auto& [hosts, before, now, after] : cases)
+    EXPECT_EQ(hostsWithName(hosts, before, now, {"192.0.2.7"}), after) << hosts;
 }
 
 TEST_F(NamesTest, ChangesEveryPlaceOfTheHostName) {
@@ -60,15 +65,36 @@ TEST_F(NamesTest, ChangesEveryPlaceOfTheHostName) {
                                        .outcome = Outcome::applied,
                                        .before = "machine",
                                        .asked = "mail-2.example",
-                                       .live = "mail-2.example",
+                                       .live = "mail-2",
                                        .stored = "mail-2.example",
-                                       .where = "/etc/hostname",
+                                       .where = "/etc/hosts, /etc/hostname",
                                        .changed = true}));
   EXPECT_EQ(tree.file("/etc/hostname"), "mail-2.example\n");
   EXPECT_EQ(tree.file("/proc/sys/kernel/hostname"), "mail-2.example\n");
   EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost\n127.0.1.1\tmail-2.example mail-2\n");
+  tree.log.wants = true;
   EXPECT_EQ(tree.host().dynamicStore().open("test")->localHostName(), "mail-2");
+  EXPECT_EQ(tree.log.values.back(), (SettingValue{setting::localSubnetName, "mail-2", "mail-2.example"}));
+  names.setLocalNetworkName("mail-2.example");
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::unchanged);
   EXPECT_EQ(tree.host().dynamicStore().open("test")->computerName(), "mail-2.example") << "without one for people";
+}
+
+TEST_F(NamesTest, FollowOnTheLinesOfTheMachinesOwnAddresses) {
+  tree.write("/etc/hosts", "127.0.0.1 localhost machine\n::1 machine\n192.0.2.1 machine\n0.0.0.0 machine\n");
+  names.setLocalNetworkName("new");
+  EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost new\n::1\tnew\n192.0.2.1 machine\n0.0.0.0 machine\n");
+  EXPECT_EQ(tree.lastEffect().note, "");
+}
+
+TEST_F(NamesTest, TellWhenNothingOnTheMachineResolvesThem) {
+  tree.write("/etc/hosts", "127.0.0.1 localhost\n192.0.2.1 machine\n");
+  for (const auto& [lookups, resolves] : {std::pair("hosts: files dns\n#hosts: myhostname", false),
+                                          {"passwd: files\nhosts: files myhostname dns\n", true}}) {
+    tree.write("/etc/nsswitch.conf", lookups);
+    names.setLocalNetworkName("new");
+    EXPECT_EQ(tree.lastEffect().note.find("does not resolve") == std::string::npos, resolves) << lookups;
+  }
 }
 
 TEST_F(NamesTest, AreLeftToTheFilesOnABusWithoutTheirService) {
@@ -123,6 +149,7 @@ TEST_F(NamesTest, PutHostsBackWhenTheNameIsNotStored) {
   });
   names.setLocalNetworkName("new");
   EXPECT_THAT(tree.lastEffect(), FailedFor("ReadOnlyFilesystem"));
+  EXPECT_EQ(tree.lastEffect().where, "");
   EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost\n127.0.1.1\tmachine\n");
 }
 
