@@ -60,7 +60,7 @@ void LinuxAdminAuthenticator::noteRefusal() {
 }
 
 Result<void> LinuxAdminAuthenticator::authorizeChange() {
-  if (::geteuid() == 0) return {};
+  if (_user == 0) return {};
   return _decision ? *_decision : authorize();
 }
 

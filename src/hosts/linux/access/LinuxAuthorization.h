@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <unistd.h>
+
 #include <atomic>
 #include <mutex>
 #include <optional>
@@ -25,7 +27,9 @@ class LinuxUserDatabase final : public UserDatabase {
 /// root polkit is asked for the tool's own action, where there is polkit.
 class LinuxAdminAuthenticator final : public AdminAuthenticator {
  public:
-  explicit LinuxAdminAuthenticator(const LinuxMachine& machine) : _machine(machine) {}
+  /// `user` is the one whose rights this process has.
+  explicit LinuxAdminAuthenticator(const LinuxMachine& machine, UserId user = ::geteuid())
+      : _machine(machine), _user(user) {}
 
   void authenticate() override;
   bool isAuthenticated() override { return _isAuthenticated; }
@@ -42,6 +46,7 @@ class LinuxAdminAuthenticator final : public AdminAuthenticator {
   std::string takeTemporaryId();
 
   LinuxMachine _machine;
+  UserId _user;
   std::atomic<bool> _isAuthenticated = false;
   std::optional<Result<void>> _decision;  ///< polkit's
   std::mutex _mutex;
