@@ -26,6 +26,7 @@ bool RemoteServerSettings::myIsAuthenticatedAsAdministrator() {
 bool RemoteServerSettings::authenticate() {
   if (!myIsAuthenticatedAsAdministrator()) {
     _context.output.putLine("You need administrator access to run this tool... exiting!");
+    _context.host.authenticator().noteRefusal();
     if (_report) _report->runRefused("not an administrator", _context.output.takePrinted());
     return false;
   }

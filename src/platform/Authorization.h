@@ -28,13 +28,16 @@ class AdminAuthenticator {
  public:
   virtual ~AdminAuthenticator() = default;
 
-  /// Asks for authorization, once and at once; the host may ask the user for credentials. A refusal is recorded as an
-  /// effect.
+  /// Takes the authorization for a run of a user who is an administrator. A refusal is recorded as an effect. A host
+  /// may put off the question for the user's credentials until something is to be changed, so that who only reads is
+  /// not asked; a refusal is then a failure of that change.
   virtual void authenticate() = 0;
   /// This and deauthenticate are also called by the thread that ends the run.
   virtual bool isAuthenticated() = 0;
   /// Gives the authorization up.
   virtual void deauthenticate() = 0;
+  /// That this user is no administrator and the run ends here: for who watches over the machine.
+  virtual void noteRefusal() {}
 };
 
 }  // namespace tavisk

@@ -4,13 +4,25 @@
 
 namespace tavisk {
 
+/// Whether a service is on: now and after a restart of the machine, or neither now nor then. In between it is when the
+/// two differ, or only some of its parts are on; a machine that knows yes and no alone never says so.
+enum class RemoteAccessState { off, partly, on };
+
+/// Whether there is nothing left to do for who asks for `on`. In between that is never so, although a getter calls it
+/// on.
+inline bool isWholly(RemoteAccessState state, bool on) {
+  return state == (on ? RemoteAccessState::on : RemoteAccessState::off);
+}
+
 /// The SSH server.
 class RemoteShellService {
  public:
   virtual ~RemoteShellService() = default;
 
-  /// False also when the machine has none.
-  virtual bool isEnabled() = 0;
+  /// Off also when the machine has none, and when that cannot be found out.
+  virtual RemoteAccessState state() = 0;
+  /// In any way.
+  bool isEnabled() { return state() != RemoteAccessState::off; }
   /// Starts or stops it, now and with the machine. The result goes to the effects.
   virtual void setEnabled(bool enabled) = 0;
 };
@@ -20,8 +32,10 @@ class RemoteEventsService {
  public:
   virtual ~RemoteEventsService() = default;
 
-  /// False also when the machine cannot take any.
-  virtual bool isEnabled() = 0;
+  /// Off also when the machine cannot take any, and when that cannot be found out.
+  virtual RemoteAccessState state() = 0;
+  /// In any way.
+  bool isEnabled() { return state() != RemoteAccessState::off; }
   /// Now and after a restart. The result goes to the effects.
   virtual void setEnabled(bool enabled) = 0;
 };

@@ -12,15 +12,15 @@ void ServerCommands::getRemoteVelmarEvents() {
 
 void ServerCommands::setRemoteVelmarEvents(const std::string& onOff) {
   auto& remoteEvents = _context.host.remoteEvents();
-  const auto isEnabled = remoteEvents.isEnabled();
+  const auto state = remoteEvents.state();
   setError(false);
   if (checkForEmptyString(onOff, "setremotevelmarevents", "either 'On' or 'Off'", "setremotevelmarevents <on off>")) {
     return;
   }
   const auto isOn = readOnOff(onOff, "setremotevelmarevents");
   if (!isOn) return;
-  if (*isOn == isEnabled) {
-    _context.output.print("setremotevelmarevents: remote velmar events are already %s.\n", isEnabled ? "on" : "off");
+  if (isWholly(state, *isOn)) {
+    _context.output.print("setremotevelmarevents: remote velmar events are already %s.\n", *isOn ? "on" : "off");
     return;
   }
   remoteEvents.setEnabled(*isOn);

@@ -1,6 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <algorithm>
+#include <chrono>
 #include <cstddef>
 #include <limits>
 #include <optional>
@@ -18,6 +19,9 @@ constexpr const char* question =
     "Do you really want to turn remote login off? If you do, you will lose this connection and can only turn it back "
     "on locally at the server (yes/no)? ";
 constexpr std::size_t answerBufferSize = 1024;
+// Where nobody is left to answer, the question must not fill a disk.
+constexpr int endsWithoutBreath = 100;
+constexpr std::chrono::milliseconds breath{100};
 
 constexpr const char* watchdogFile = "/var/run/watchdog.pid";
 constexpr std::size_t longestWatchdogLine = 63;
@@ -44,7 +48,7 @@ void ServerCommands::getRemoteLogin() {
 
 void ServerCommands::setRemoteLogin(const std::string& onOff) {
   auto& remoteShell = _context.host.remoteShell();
-  const auto isEnabled = remoteShell.isEnabled();
+  const auto state = remoteShell.state();
   setError(false);
   if (checkForEmptyString(onOff, "setremotelogin", "either 'On' or 'Off'", "setremotelogin <on off>")) return;
   const auto isOn = readOnOff(onOff, "setremotelogin");
@@ -53,8 +57,8 @@ void ServerCommands::setRemoteLogin(const std::string& onOff) {
   if (!*isOn && _parent && _parent->promptUser() && !promptForRemoteLogin()) {
     return refuse("the answer yes to the question whether to lose this connection");
   }
-  if (*isOn == isEnabled) {
-    _context.output.print("setremotelogin: remote login is already %s.\n", isEnabled ? "On" : "Off");
+  if (isWholly(state, *isOn)) {
+    _context.output.print("setremotelogin: remote login is already %s.\n", *isOn ? "On" : "Off");
   } else {
     remoteShell.setEnabled(*isOn);
   }
@@ -63,10 +67,11 @@ void ServerCommands::setRemoteLogin(const std::string& onOff) {
 bool ServerCommands::promptForRemoteLogin() {
   const auto pause = _context.runLoop.pauseLimit();
   // The end of the input is no answer: the question goes on until a signal or a lost output ends the run.
-  while (true) {
+  for (int endsOfInput = 0;;) {
     const auto line = _context.input.readLine(question, answerBufferSize);
     const auto answer = line ? readYesNo(*line) : std::nullopt;
     if (answer) return *answer;
+    if (!line && ++endsOfInput >= endsWithoutBreath) _context.runLoop.runUntil(RunLoop::Clock::now() + breath);
   }
 }
 

@@ -74,6 +74,21 @@ TEST_F(ReservedCommands, askNobodyWithoutTheToolAroundThem) {
   EXPECT_EQ(machine.get("Remote Shell", "Enabled"), PropertyList(false));
 }
 
+TEST(RemoteLogin, TakesABreathWhereNobodyIsLeftToAnswer) {
+  struct EndedInput : LineSource {
+    std::optional<std::string> readLine(const std::string&, std::size_t) override {
+      return ++asked < 100'000 && !isDue ? std::nullopt : std::optional<std::string>("no\n");
+    }
+    void restoreTerminal() override {}
+    int asked = 0;
+    bool isDue = false;
+  } input;
+  ScratchMachine machine;
+  const auto due = machine.runLoop.after(std::chrono::milliseconds(250), [&] { input.isDue = true; });
+  runTool(machine, {"setremotelogin", "off"}, {.input = &input});
+  EXPECT_THAT(input.asked, testing::AllOf(testing::Gt(100), testing::Lt(105)));
+}
+
 TEST_F(ReservedCommands, findTheServerOfRemoteLogin) {
   EXPECT_EQ(commands.remoteLoginPID(), 0);
   machine.set("Processes", "sshd", 4711);

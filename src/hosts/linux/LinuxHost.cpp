@@ -8,7 +8,7 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
     : _root(root),
       _journalLog(_root),
       _services(_root, runLoop),
-      _machine{_root, effects, runLoop, _services},
+      _machine{_root, effects, runLoop, _services, [this] { return _authenticator.authorizeChange(); }},
       _authenticator(_machine),
       _files(_root, effects),
       _systemLog(_root),

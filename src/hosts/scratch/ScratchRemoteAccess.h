@@ -16,7 +16,9 @@ class ScratchRemoteAccess final : public Service {
   ScratchRemoteAccess(MachineSettings& settings, const char* name, const std::string& section)
       : _settings(settings), _enabled(switchAt(name, section, "Enabled")) {}
 
-  bool isEnabled() override { return _settings.isOn(_enabled); }
+  RemoteAccessState state() override {
+    return _settings.isOn(_enabled) ? RemoteAccessState::on : RemoteAccessState::off;
+  }
   void setEnabled(bool enabled) override { _settings.change(_enabled, enabled); }
 
  private:

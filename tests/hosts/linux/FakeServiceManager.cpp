@@ -128,8 +128,9 @@ int FakeServiceManager::answerFiles(sd_bus_message* message, const std::string& 
   _calls.push_back(member + " " + unit);
   const bool enables = member == "EnableUnitFiles";
   _units[unit].file = enables ? "enabled" : "disabled";
-  return enables ? sd_bus_reply_method_return(message, "ba(sss)", 1, 0)
-                 : sd_bus_reply_method_return(message, "a(sss)", 0);
+  const auto link = linkOf(unit);
+  return enables ? sd_bus_reply_method_return(message, "ba(sss)", 1, 2, "symlink", link.c_str(), "", "masked", "x", "")
+                 : sd_bus_reply_method_return(message, "a(sss)", 1, "unlink", link.c_str(), "");
 }
 
 int FakeServiceManager::answerJob(sd_bus_message* message, const std::string& member) {

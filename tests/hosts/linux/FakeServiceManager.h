@@ -31,6 +31,9 @@ class FakeServiceManager {
   enum class Reached { straight, overBus };
   explicit FakeServiceManager(const std::filesystem::path& socket, Reached reached = Reached::straight);
 
+  /// The link by which a unit starts with the machine.
+  static std::string linkOf(const std::string& unit) { return "/etc/systemd/system/default.target.wants/" + unit; }
+
   void set(const std::string& unit, const FakeUnit& state);
   FakeUnit get(const std::string& unit);
   /// The methods that change something, in the order of their calls: "StartUnit chrony.service".

@@ -18,6 +18,13 @@ CHECKS = [
           do=MAKE_UNITS + "systemctl enable --quiet --now events.socket; " + SET.format("off"),
           prints="setremotevelmarevents: Off\nRemote Velmar Events: Off\n", errors="",
           then={STATES: "inactive\ninactive\n", "systemctl is-enabled events.socket": "disabled\n", LISTENING: "0\n"}),
+    Check("remote events that are enabled and stopped are neither on nor off already", needs=CONTAINER,
+          do="systemctl enable --quiet events.socket; rm -f /run/report; TAVISK_REPORT=/run/report; export TAVISK_REPORT; "
+          "tavisk -getremotevelmarevents; " + SET.format("off"),
+          prints="Remote Velmar Events: On\nsetremotevelmarevents: Off\nRemote Velmar Events: Off\n", errors="",
+          then={"systemctl is-enabled events.socket": "disabled\n",
+                "grep -c '\"live\":\"off\",\"stored\":\"on\"' /run/report": "2\n",
+                "grep -c '\"where\":\"/etc/systemd/system/sockets.target.wants/events.socket\"' /run/report": "1\n"}),
     Check("remote events are turned on and stay so", needs=CONTAINER, kept=True, do=SET.format("on"),
           prints="setremotevelmarevents: On\nRemote Velmar Events: On\n", errors="",
           then={"systemctl is-active events.socket": "active\n", "systemctl is-enabled events.socket": "enabled\n",

@@ -30,7 +30,39 @@ timeout 10 sh -c 'until grep -q -s in /run/login; do sleep 0.1; done'
 """
 STAYS = {"systemctl is-active login; systemctl stop login; pkill -u alice sleep": "active\n"}
 
+# Enabled and stopped: off now, on after the next start of the machine.
+TO_STOPPED = TO_SERVICE + "systemctl enable --quiet ssh.service; "
+WANTED = "/etc/systemd/system/multi-user.target.wants/ssh.service"
+WITH_REPORT = "rm -f /run/report; TAVISK_REPORT=/run/report tavisk {} {}; "
+
+
+def told(text):
+    return {f"grep -c -F '{text}' /run/report": "1\n"}
+
+
 CHECKS = [
+    Check("a server that is enabled and stopped is off now and on later", needs=NEEDS,
+          do=TO_STOPPED + WITH_REPORT.format("", "-getremotelogin"), prints="Remote Login: On\n",
+          then={LISTENING: "0\n"} | told('"live":"off","stored":"on"')),
+    Check("a server that is enabled and stopped is not on already", needs=NEEDS,
+          do=TO_STOPPED + WITH_REPORT.format("", "-setremotelogin on") + "grep -c where /run/report",
+          prints="0\n", status=1, then=ON | told('"before":"off","asked":"on","live":"on","stored":"on"')),
+    Check("a server that is enabled and stopped is not off already", needs=NEEDS,
+          do=TO_STOPPED + WITH_REPORT.format("-f", "-setremotelogin off") + "grep -c note /run/report; "
+          "tavisk -f -setremotelogin off", prints="0\nsetremotelogin: remote login is already Off.\n",
+          then=OFF | told('"stored":"off"') | told(WANTED)),
+    Check("a server that runs until the next start is not on already", needs=NEEDS,
+          do=TO_SERVICE + "systemctl start ssh.service; " + WITH_REPORT.format("", "-setremotelogin on -setremotelogin on"),
+          prints="setremotelogin: remote login is already On.\n", then=ON | told(WANTED)),
+    Check("a server that is enabled until the next start is not on after it", needs=NEEDS,
+          do=TO_SERVICE + "systemctl enable --quiet --runtime --now ssh.service; " + WITH_REPORT.format("", "-getremotelogin"),
+          prints="Remote Login: On\n", then=told('"live":"on","stored":"off"') | {
+              "systemctl disable --quiet --runtime ssh.service": ""}),
+    Check("a socket that listens is on", needs=NEEDS, do=TO_SOCKET + WITH_REPORT.format("", "-getremotelogin") + "tavisk -setremotelogin on",
+          prints="Remote Login: On\nsetremotelogin: remote login is already On.\n",
+          then={ACTIVE: "inactive\nactive\n", **GREETING} | told('"live":"on","stored":"on"')),
+    Check("a question that nobody is left to answer fills no disk", needs=NEEDS,
+          do="timeout 2 tavisk -setremotelogin off </dev/null | wc -c | awk '{print ($1 > 0 && $1 < 30000)}'", prints="1\n"),
     Check("remote login is turned on", needs=NEEDS, do=TO_SERVICE + TURN_ON, prints="Remote Login: On\n", errors="",
           then=ON),
     Check("remote login is turned off after a question", needs=NEEDS, do="echo yes | tavisk -setremotelogin off",

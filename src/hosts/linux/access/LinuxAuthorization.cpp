@@ -8,8 +8,8 @@
 #include <cerrno>
 #include <utility>
 
-#include "effects/SettingNames.h"
 #include "hosts/linux/services/SystemServices.h"
+#include "hosts/linux/system/Journal.h"
 
 namespace tavisk {
 namespace {
@@ -17,6 +17,13 @@ namespace {
 // Groups with many thousands of members exist; beyond this the answer is not believed.
 constexpr std::size_t largestGroupEntry = std::size_t{64} << 20U;
 constexpr const char* action = "org.tavisk.manage";
+
+/// Polkit asks nobody outside a session of the login manager (loginctl(1)), at a terminal or not.
+Failure refusal(const Authorization& answer, bool isAtTerminal) {
+  if (!answer.isForTheAsking) return {"authorize", action, "polkit does not grant it to this user"};
+  const std::string missing = isAtTerminal ? "this is no login session" : "there is no terminal to ask at";
+  return {"authorize", action, "polkit asks for a password, and " + missing + ": sudo tavisk ..."};
+}
 
 }  // namespace
 
@@ -45,11 +52,19 @@ std::optional<GroupId> LinuxUserDatabase::groupNamed(const std::string& name) {
 }
 
 void LinuxAdminAuthenticator::authenticate() {
-  const auto authorized = ::getuid() == 0 ? Result<void>() : authorize();
-  _isAuthenticated = static_cast<bool>(authorized);
-  if (!authorized) _machine.effects.recordFailure(setting::authorization, authorized.failure());
+  _isAuthenticated = true;
 }
 
+void LinuxAdminAuthenticator::noteRefusal() {
+  JournalLog(_machine.root).noteRefusedUser();
+}
+
+Result<void> LinuxAdminAuthenticator::authorizeChange() {
+  if (_user == 0) return {};
+  return _decision ? *_decision : authorize();
+}
+
+/// What polkit could not be asked is not decided.
 Result<void> LinuxAdminAuthenticator::authorize() {
   const auto bus = systemBusIfAny(_machine.services);
   if (!bus) return bus.failure();
@@ -65,13 +80,9 @@ Result<void> LinuxAdminAuthenticator::authorize() {
   const auto answer = checkAuthorization(**bus, action, asker);
   if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return {};
   if (!answer) return answer.failure();
-  const std::scoped_lock lock(_mutex);
-  _temporaryId = answer->temporaryId;
-  if (answer->isGranted) return {};
-  const bool isUnasked = answer->isForTheAsking && !asker;
-  return Failure{"authorize", action,
-                 isUnasked ? "polkit asks for a password, and there is no terminal to ask at: sudo tavisk ..."
-                           : "polkit does not grant it to this user"};
+  if (answer->isGranted) keepTemporaryId(answer->temporaryId);
+  _decision = answer->isGranted ? Result<void>() : Result<void>(refusal(*answer, static_cast<bool>(asker)));
+  return *_decision;
 }
 
 /// Over a connection of its own: the main thread may be in the middle of a call on the usual one. What cannot be given
@@ -82,6 +93,11 @@ void LinuxAdminAuthenticator::deauthenticate() {
   if (id.empty()) return;
   const auto bus = _machine.services.openSystemBus();
   if (bus) static_cast<void>(revokeAuthorization(**bus, id));
+}
+
+void LinuxAdminAuthenticator::keepTemporaryId(const std::string& id) {
+  const std::scoped_lock lock(_mutex);
+  _temporaryId = id;
 }
 
 std::string LinuxAdminAuthenticator::takeTemporaryId() {

@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <unistd.h>
+
 #include <atomic>
 #include <mutex>
 #include <optional>
@@ -21,21 +23,32 @@ class LinuxUserDatabase final : public UserDatabase {
   std::optional<GroupId> groupNamed(const std::string& name) override;
 };
 
-/// Root is authorized as it is. Anyone else asks polkit for the tool's own action, where there is polkit.
+/// Root is authorized as it is, and so is every administrator who only reads. Before the first change of anyone but
+/// root polkit is asked for the tool's own action, where there is polkit.
 class LinuxAdminAuthenticator final : public AdminAuthenticator {
  public:
-  explicit LinuxAdminAuthenticator(const LinuxMachine& machine) : _machine(machine) {}
+  /// `user` is the one whose rights this process has.
+  explicit LinuxAdminAuthenticator(const LinuxMachine& machine, UserId user = ::geteuid())
+      : _machine(machine), _user(user) {}
 
   void authenticate() override;
   bool isAuthenticated() override { return _isAuthenticated; }
   void deauthenticate() override;
+  /// An entry in the system log.
+  void noteRefusal() override;
+
+  /// Whether the user may change this machine. Once polkit has answered, and the user with it, that counts for the run.
+  Result<void> authorizeChange();
 
  private:
   Result<void> authorize();
+  void keepTemporaryId(const std::string& id);
   std::string takeTemporaryId();
 
   LinuxMachine _machine;
+  UserId _user;
   std::atomic<bool> _isAuthenticated = false;
+  std::optional<Result<void>> _decision;  ///< polkit's
   std::mutex _mutex;
   std::string _temporaryId;  ///< guarded by the mutex
 };

@@ -3,6 +3,8 @@
 #include "hosts/linux/access/LinuxRemoteAccess.h"
 
 #include <algorithm>
+#include <iterator>
+#include <string_view>
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
@@ -20,6 +22,7 @@ constexpr const char* sshConfig = "/etc/ssh/sshd_config";
 // The sessions of the server are processes of the same name: its own is in the file.
 constexpr const char* sshProcessFile = "/run/sshd.pid";
 constexpr const char* keyMaker = "/usr/bin/ssh-keygen";
+constexpr const char* partlyOn = "partly on";
 
 std::vector<Daemon> openSshUnits() {
   return {{"ssh.service", "ssh", "sshd", sshProcessFile},
@@ -28,11 +31,13 @@ std::vector<Daemon> openSshUnits() {
           {"sshd.socket", "", ""}};
 }
 
-Result<bool> hasHostKey(const SystemRoot& root) {
-  const auto isKey = [](const std::string& name) { return name.starts_with("ssh_host_") && name.ends_with("_key"); };
+Result<std::vector<std::string>> hostKeys(const SystemRoot& root) {
   const auto names = orEmpty(root.list(sshFolder));
   if (!names) return names.failure();
-  return std::ranges::any_of(*names, isKey);
+  std::vector<std::string> keys;
+  for (const auto& name : *names)
+    if (name.starts_with("ssh_host_") && name.ends_with("_key")) keys.push_back(std::string(sshFolder) + "/" + name);
+  return keys;
 }
 
 /// Whether the administrator keeps the keys elsewhere (sshd_config(5)).
@@ -51,8 +56,57 @@ Result<bool> needsNoHostKey(const SystemRoot& root) {
   auto isOpenSsh = root.isThere(sshProgram);
   if (!isOpenSsh) return isOpenSsh;
   if (!*isOpenSsh) return true;
-  auto has = hasHostKey(root);
-  return has && !*has ? namesHostKeys(root) : has;
+  const auto keys = hostKeys(root);
+  if (!keys) return keys.failure();
+  return keys->empty() ? namesHostKeys(root) : true;
+}
+
+std::string listed(const std::vector<std::string>& names) {
+  std::string list;
+  for (const auto& name : names) list.append(list.empty() ? "" : ", ").append(name);
+  return list;
+}
+
+/// A change of what starts with the machine; the links that it has written are added to `written`.
+template <typename Change>
+Result<void> noting(std::vector<std::string>& written, Daemons& daemons, const Change& change) {
+  static_cast<void>(daemons.takeWritten());
+  auto changed = change();
+  std::ranges::copy(daemons.takeWritten(), std::back_inserter(written));
+  return changed;
+}
+
+using Found = Setting<bool>::Found;
+
+bool isJust(bool on, const Found& found) {
+  return found && *found && (*found)->value == on && (*found)->detail.empty();
+}
+
+/// Told to the sink as it is found, now and stored.
+RemoteAccessState observedState(Setting<bool> setting, EffectSink& effects) {
+  const auto live = setting.live();
+  const auto stored = setting.stored();
+  // What is off now may be on after a restart: without the one the other is no answer.
+  setting.live = [&] { return isJust(false, live) && !stored ? stored : live; };
+  setting.stored = [&] { return stored; };
+  if (!observe(setting, effects)) return RemoteAccessState::off;
+  if (isJust(true, live) && isJust(true, stored)) return RemoteAccessState::on;
+  return isJust(false, live) && isJust(false, stored) ? RemoteAccessState::off : RemoteAccessState::partly;
+}
+
+Result<bool> hasSettled(const DaemonGroup& daemons) {
+  const auto changing = daemons.isChanging();
+  if (!changing) return changing;
+  return !*changing;
+}
+
+/// A service that its socket starts, which listens.
+bool isWaiting(const Daemon& member, const std::vector<Daemon>& running) {
+  constexpr std::string_view ending = ".service";
+  const std::string_view name = member.unit;
+  if (!name.ends_with(ending)) return false;
+  const auto socket = std::string(name.substr(0, name.size() - ending.size())) + ".socket";
+  return std::ranges::any_of(running, [&](const Daemon& other) { return other.unit == socket; });
 }
 
 }  // namespace
@@ -85,32 +139,27 @@ Support LinuxRemoteShellService::supported() {
   return std::optional(NotSupported{{"find an SSH server", known->names(), "none of them is installed"}});
 }
 
-Result<bool> LinuxRemoteShellService::isOnInAnyWay() {
-  return withServer<bool>([](const DaemonGroup& server) -> Result<bool> {
-    const auto starting = server.startingAtBoot();
-    if (!starting) return starting.failure();
-    const auto running = server.running();
-    if (!running) return running.failure();
-    return !starting->empty() || !running->empty();
-  });
-}
-
-bool LinuxRemoteShellService::isEnabled() {
+Setting<bool> LinuxRemoteShellService::remoteLogin() {
   Setting<bool> setting;
   setting.name = setting::remoteLogin;
-  setting.live = [this] { return isOnInAnyWay(); };
-  return observe(setting, _machine.effects).value_or(false);
-}
-
-void LinuxRemoteShellService::setEnabled(bool enabled) {
-  Setting<bool> setting;
-  setting.name = setting::remoteLogin;
-  setting.note = [](bool on) { return on ? "" : "open sessions stay open"; };
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return hasAny(&DaemonGroup::running); };
   setting.stored = [this] { return hasAny(&DaemonGroup::startingAtBoot); };
-  setting.store = [this](bool on) { return store(on); };
-  setting.apply = [this](bool on) { return apply(on); };
+  return setting;
+}
+
+RemoteAccessState LinuxRemoteShellService::state() {
+  return observedState(remoteLogin(), _machine.effects);
+}
+
+void LinuxRemoteShellService::setEnabled(bool enabled) {
+  Trace trace;
+  auto setting = remoteLogin();
+  setting.note = [&](bool) { return trace.hasStopped ? "open sessions stay open" : ""; };
+  setting.written = [&] { return listed(trace.written); };
+  setting.store = [&](bool on) { return store(on, trace); };
+  setting.apply = [&](bool on) { return apply(on, trace); };
+  setting.settled = [this](bool) { return withServer<bool>(&hasSettled).valueOr(false); };
   carryOut(setting, enabled, _machine);
 }
 
@@ -122,23 +171,32 @@ Result<bool> LinuxRemoteShellService::hasAny(Result<std::vector<Daemon>> (Daemon
   });
 }
 
-Result<void> LinuxRemoteShellService::store(bool enabled) {
-  return withServer<void>([&](const DaemonGroup& server) -> Result<void> {
-    if (!enabled) return server.setAllStartAtBoot(false);
-    if (auto keys = ensureHostKeys(); !keys) return keys;
-    const auto starting = server.startingAtBoot();
-    if (!starting) return starting.failure();
-    if (!starting->empty()) return {};
-    return _machine.services.daemons().setStartAtBoot({server.members().front()}, true);
+Result<void> LinuxRemoteShellService::store(bool enabled, Trace& trace) {
+  if (enabled) {
+    const auto keys = ensureHostKeys();
+    if (!keys) return keys.failure();
+    trace.written = *keys;
+  }
+  return withServer<void>([&](const DaemonGroup& server) {
+    return noting(trace.written, _machine.services.daemons(),
+                  [&] { return enabled ? startAtBoot(server) : server.setAllStartAtBoot(false); });
   });
 }
 
+Result<void> LinuxRemoteShellService::startAtBoot(const DaemonGroup& server) {
+  const auto starting = server.startingAtBoot();
+  if (!starting) return starting.failure();
+  if (!starting->empty()) return {};
+  return _machine.services.daemons().setStartAtBoot({server.members().front()}, true);
+}
+
 /// Starts what will start with the machine too.
-Result<void> LinuxRemoteShellService::apply(bool enabled) {
+Result<void> LinuxRemoteShellService::apply(bool enabled, Trace& trace) {
   return withServer<void>([&](const DaemonGroup& server) -> Result<void> {
-    if (!enabled) return server.stopAll();
     const auto running = server.running();
     if (!running) return running.failure();
+    trace.hasStopped = !enabled && !running->empty();
+    if (!enabled) return server.stopAll();
     if (!running->empty()) return {};
     const auto starting = server.startingAtBoot();
     if (!starting) return starting.failure();
@@ -146,17 +204,16 @@ Result<void> LinuxRemoteShellService::apply(bool enabled) {
   });
 }
 
-Result<void> LinuxRemoteShellService::ensureHostKeys() {
+Result<std::vector<std::string>> LinuxRemoteShellService::ensureHostKeys() {
   constexpr const char* tried = "make host keys";
   const auto needsNone = needsNoHostKey(_machine.root);
   if (!needsNone) return needsNone.failure();
-  if (*needsNone) return {};
+  if (*needsNone) return std::vector<std::string>();
   if (auto failure = whyNeedsRoot(tried, sshFolder)) return *failure;
   const auto made = runProgram(_machine.root, {keyMaker, "-A"}, _machine.runLoop);
   if (!made) return made.failure();
-  const auto has = hasHostKey(_machine.root);
-  if (!has) return has.failure();
-  if (*has) return {};
+  auto keys = hostKeys(_machine.root);
+  if (!keys || !keys->empty()) return keys;
   return Failure{tried, keyMaker, "it reported success, but there is no key in /etc/ssh"};
 }
 
@@ -164,6 +221,13 @@ Result<DaemonGroup> LinuxRemoteEventsService::units() {
   auto units = configuredUnits(_machine.root, "remote-events");
   if (!units) return units.failure();
   return DaemonGroup(_machine.services.daemons(), std::move(units).value());
+}
+
+template <typename Answer, typename Use>
+Result<Answer> LinuxRemoteEventsService::withUnits(Use use) {
+  const auto named = units();
+  if (!named) return named.failure();
+  return use(*named);
 }
 
 Support LinuxRemoteEventsService::supported() {
@@ -184,49 +248,49 @@ Setting<bool>::Found LinuxRemoteEventsService::live() {
   const auto running = named->running();
   if (!running) return running.failure();
   if (running->empty()) return false;
-  const bool isPart = running->size() < named->members().size();
-  return Reading<bool>(true, isPart ? "partly on" : "");
+  const auto isOn = [&](const Daemon& member) {
+    const auto isSame = [&](const Daemon& other) { return other.unit == std::string_view(member.unit); };
+    return std::ranges::any_of(*running, isSame) || isWaiting(member, *running);
+  };
+  return Reading<bool>(true, std::ranges::all_of(named->members(), isOn) ? "" : partlyOn);
 }
 
-/// That of the first unit: a service that its socket starts is never enabled itself.
-Result<bool> LinuxRemoteEventsService::startsAtBoot() {
+Setting<bool>::Found LinuxRemoteEventsService::stored() {
   const auto named = units();
   if (!named) return named.failure();
-  if (named->members().empty()) return false;
-  return _machine.services.daemons().startsAtBoot(named->members().front());
+  const auto starting = named->startingAtBoot();
+  if (!starting) return starting.failure();
+  if (starting->empty()) return false;
+  const bool startsFirst = starting->front().unit == std::string_view(named->members().front().unit);
+  return Reading<bool>(true, startsFirst ? "" : partlyOn);
 }
 
-Result<bool> LinuxRemoteEventsService::isOnInAnyWay() {
-  auto starts = startsAtBoot();
-  if (!starts || *starts) return starts;
-  const auto named = units();
-  if (!named) return named.failure();
-  if (named->members().empty()) return false;
-  return _machine.services.daemons().isRunning(named->members().front());
-}
-
-bool LinuxRemoteEventsService::isEnabled() {
-  Setting<bool> setting;
-  setting.name = setting::remoteEvents;
-  setting.live = [this] { return isOnInAnyWay(); };
-  return observe(setting, _machine.effects).value_or(false);
-}
-
-void LinuxRemoteEventsService::setEnabled(bool enabled) {
+Setting<bool> LinuxRemoteEventsService::remoteEvents() {
   Setting<bool> setting;
   setting.name = setting::remoteEvents;
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
-  setting.stored = [this] { return startsAtBoot(); };
-  setting.store = [this](bool on) {
-    const auto named = units();
-    return named ? named->setAllStartAtBoot(on) : named.failure();
+  setting.stored = [this] { return stored(); };
+  return setting;
+}
+
+RemoteAccessState LinuxRemoteEventsService::state() {
+  return observedState(remoteEvents(), _machine.effects);
+}
+
+void LinuxRemoteEventsService::setEnabled(bool enabled) {
+  std::vector<std::string> written;
+  auto setting = remoteEvents();
+  setting.written = [&] { return listed(written); };
+  setting.store = [&](bool on) {
+    return withUnits<void>([&](const DaemonGroup& units) {
+      return noting(written, _machine.services.daemons(), [&] { return units.setAllStartAtBoot(on); });
+    });
   };
-  setting.apply = [this](bool on) -> Result<void> {
-    const auto named = units();
-    if (!named) return named.failure();
-    return on ? named->startAll() : named->stopAll();
+  setting.apply = [this](bool on) {
+    return withUnits<void>([on](const DaemonGroup& units) { return on ? units.startAll() : units.stopAll(); });
   };
+  setting.settled = [this](bool) { return withUnits<bool>(&hasSettled).valueOr(false); };
   carryOut(setting, enabled, _machine);
 }
 

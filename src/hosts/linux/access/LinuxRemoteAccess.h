@@ -13,15 +13,22 @@
 namespace tavisk {
 
 /// The SSH server's service and socket, under whichever of their names, or the units that the administrator names for
-/// "remote-shell". One of them is enough to be on; none of them is left when it is off. Open sessions stay.
+/// "remote-shell". One of them is enough to be on, as a socket that listens; none of them is left when it is off. Open
+/// sessions stay.
 class LinuxRemoteShellService final : public RemoteShellService {
  public:
   explicit LinuxRemoteShellService(const LinuxMachine& machine) : _machine(machine) {}
 
-  bool isEnabled() override;
+  RemoteAccessState state() override;
   void setEnabled(bool enabled) override;
 
  private:
+  /// What the last change has come to.
+  struct Trace {
+    std::vector<std::string> written;
+    bool hasStopped = false;
+  };
+  Setting<bool> remoteLogin();
   Result<DaemonGroup> knownServer();
   /// What this machine has of it.
   Result<DaemonGroup> server();
@@ -29,31 +36,35 @@ class LinuxRemoteShellService final : public RemoteShellService {
   Result<Answer> withServer(Use use);
   Support supported();
   Result<bool> hasAny(Result<std::vector<Daemon>> (DaemonGroup::*those)() const);
-  Result<bool> isOnInAnyWay();
-  Result<void> store(bool enabled);
-  Result<void> apply(bool enabled);
-  /// Where no host key is, a connection would be taken and dropped.
-  Result<void> ensureHostKeys();
+  Result<void> store(bool enabled, Trace& trace);
+  Result<void> startAtBoot(const DaemonGroup& server);
+  Result<void> apply(bool enabled, Trace& trace);
+  /// Where no host key is, a connection would be taken and dropped. The keys that were made.
+  Result<std::vector<std::string>> ensureHostKeys();
 
   LinuxMachine _machine;
 };
 
-/// The units that the administrator names for "remote-events"; without any there is nothing to switch. The first one
-/// decides whether it is on, all of them are switched.
+/// The units that the administrator names for "remote-events"; without any there is nothing to switch. All of them are
+/// switched. A service whose socket is among them may wait for that one to start it. Of the others after a restart
+/// nothing is asked where the first one starts: what it brings with it is not enabled itself.
 class LinuxRemoteEventsService final : public RemoteEventsService {
  public:
   explicit LinuxRemoteEventsService(const LinuxMachine& machine) : _machine(machine) {}
 
-  bool isEnabled() override;
+  RemoteAccessState state() override;
   void setEnabled(bool enabled) override;
 
  private:
+  Setting<bool> remoteEvents();
   Result<DaemonGroup> units();
+  template <typename Answer, typename Use>
+  Result<Answer> withUnits(Use use);
   Support supported();
   /// "partly on" when some run.
   Setting<bool>::Found live();
-  Result<bool> startsAtBoot();
-  Result<bool> isOnInAnyWay();
+  /// "partly on" when others than the first one will.
+  Setting<bool>::Found stored();
 
   LinuxMachine _machine;
 };

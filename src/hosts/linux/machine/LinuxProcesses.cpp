@@ -49,11 +49,20 @@ Result<void> LinuxProcessUtilities::signalProcess(int signal, ProcessId process)
 
 void LinuxProcessTermination::disable() {
   if (_holds++ > 0) return;
-  const auto bus = _machine.services.systemBus();
-  if (!bus) return;
+  auto hold = delayShutdown();
+  if (!hold) return _machine.effects.recordFailure(setting::startupDisk, hold.failure());
+  _hold = std::move(hold).value();
+}
+
+Result<FileDescriptor> LinuxProcessTermination::delayShutdown() {
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return retold(bus.failure(), "delay a shutdown", bus.failure().on);
+  if (!*bus) return FileDescriptor();
   auto hold =
       (*bus)->call(loginManager(), "Inhibit", "h", "shutdown", "tavisk", "The startup disk is being set", "delay");
-  if (hold) _hold = std::move(hold).value().readDescriptor();
+  if (hold) return std::move(hold).value().readDescriptor();
+  if (hold.failure().code == BusErrorCode::serviceUnknown) return FileDescriptor();
+  return hold.failure();
 }
 
 void LinuxProcessTermination::enable() {

@@ -32,7 +32,7 @@ class LinuxProcessUtilities final : public ProcessUtilities {
 };
 
 /// Asks the service of logins to delay a shutdown (its Inhibit() call, org.freedesktop.login1(5)). Where there is no
-/// such service nothing waits.
+/// such service nothing waits; a call that fails is recorded, and nothing waits either.
 class LinuxProcessTermination final : public ProcessTermination {
  public:
   explicit LinuxProcessTermination(const LinuxMachine& machine) : _machine(machine) {}
@@ -41,6 +41,9 @@ class LinuxProcessTermination final : public ProcessTermination {
   void enable() override;
 
  private:
+  /// For none where there is no such service.
+  Result<FileDescriptor> delayShutdown();
+
   LinuxMachine _machine;
   FileDescriptor _hold;  ///< the delay lasts as long as it is open
   int _holds = 0;

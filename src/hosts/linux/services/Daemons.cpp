@@ -54,12 +54,20 @@ Result<std::vector<Daemon>> DaemonGroup::startingAtBoot() const {
   return those(&Daemons::startsAtBoot);
 }
 
+Result<bool> DaemonGroup::isChanging() const {
+  const auto changing = those(&Daemons::isChanging);
+  if (!changing) return changing.failure();
+  return !changing->empty();
+}
+
 Result<void> DaemonGroup::setAllStartAtBoot(bool start) const {
   std::vector<Daemon> others;
   for (const auto& member : _members) {
     const auto starts = _daemons.startsAtBoot(member);
     if (!starts) return starts.failure();
-    if (*starts != start) others.push_back(member);
+    const auto isLinked = start || *starts ? starts : _daemons.startsUntilRestart(member);
+    if (!isLinked) return isLinked.failure();
+    if (*isLinked != start) others.push_back(member);
   }
   return others.empty() ? Result<void>() : _daemons.setStartAtBoot(others, start);
 }

@@ -4,6 +4,7 @@
 
 #include <memory>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "base/Result.h"
@@ -26,10 +27,18 @@ class Daemons {
   virtual ~Daemons() = default;
 
   virtual Result<Presence> presence(const Daemon& daemon) = 0;
+  /// Also while it starts.
   virtual Result<bool> isRunning(const Daemon& daemon) = 0;
+  /// Whether it starts or stops at this moment: isRunning() then tells what is to be rather than what is.
+  virtual Result<bool> isChanging(const Daemon& daemon) = 0;
+  /// Whether it will run after the machine has been started again.
   virtual Result<bool> startsAtBoot(const Daemon& daemon) = 0;
+  /// Whether the machine was told to start it until it is started again, and no longer.
+  virtual Result<bool> startsUntilRestart(const Daemon& daemon) = 0;
   /// One after the other; the first failure ends it. Only root may; whoever is not is refused before anything changes.
   virtual Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) = 0;
+  /// The links that setStartAtBoot() has made and removed since this was asked last.
+  std::vector<std::string> takeWritten() { return std::exchange(_written, {}); }
   /// Success means that the daemon runs: one that was started and ended at once, or never began, is a failure.
   virtual Result<void> start(const Daemon& daemon) = 0;
   virtual Result<void> stop(const Daemon& daemon) = 0;
@@ -41,6 +50,9 @@ class Daemons {
   /// Asked before a daemon is started or stopped that is to start at boot or no longer to: fails where setStartAtBoot()
   /// would have something to change and the caller is not root.
   Result<void> checkMayStartAtBoot(const Daemon& daemon, bool start);
+
+ protected:
+  std::vector<std::string> _written;  ///< see takeWritten()
 };
 
 /// Daemons that belong together, such as a service and the socket that starts it, the most important one first.
@@ -59,6 +71,9 @@ class DaemonGroup {
   Result<DaemonGroup> present() const;
   Result<std::vector<Daemon>> running() const;
   Result<std::vector<Daemon>> startingAtBoot() const;
+
+  /// Whether a member starts or stops at this moment.
+  Result<bool> isChanging() const;
 
   /// Each member that is not so already; the first failure ends it.
   Result<void> setAllStartAtBoot(bool start) const;

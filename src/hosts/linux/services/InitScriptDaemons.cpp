@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <chrono>
+#include <iterator>
 #include <string_view>
 #include <utility>
 
@@ -17,6 +18,7 @@ namespace {
 
 // Debian's run level of a started machine (init(8)).
 constexpr const char* levelFolder = "/etc/rc2.d";
+constexpr std::string_view runLevels = "0123456S";
 constexpr const char* linkTool = "/usr/sbin/update-rc.d";
 constexpr std::chrono::seconds longestStart{3};
 constexpr std::chrono::seconds longestStop{3};
@@ -25,6 +27,12 @@ constexpr std::size_t processFileLimit = 64;
 
 std::string scriptOf(const Daemon& daemon) {
   return std::string("/etc/init.d/") + daemon.script;
+}
+
+/// The program may still come to it.
+Failure outOfTime(const char* tried, const Daemon& daemon, const char* state) {
+  return {tried, scriptOf(daemon), std::string("it reported success, but ") + daemon.program + state,
+          std::make_error_code(std::errc::timed_out)};
 }
 
 /// "S01chrony": the kind, two digits, the script.
@@ -74,9 +82,27 @@ Result<bool> InitScriptDaemons::startsAtBoot(const Daemon& daemon) {
   return hasLink(daemon, "S");
 }
 
+Result<std::set<std::string>> InitScriptDaemons::linksTo(const Daemon& daemon) const {
+  std::set<std::string> links;
+  for (const char level : runLevels) {
+    const auto folder = std::string("/etc/rc") + level + ".d";
+    const auto names = orEmpty(_root.list(folder));
+    if (!names) return names.failure();
+    for (const auto& name : *names)
+      if (isLinkTo(daemon.script, "SK", name)) links.insert(folder + "/" + name);
+  }
+  return links;
+}
+
 Result<void> InitScriptDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
-  for (const auto& daemon : daemons)
-    if (auto turned = turnLinks(daemon, start); !turned) return turned;
+  for (const auto& daemon : daemons) {
+    const auto before = linksTo(daemon);
+    if (!before) return before.failure();
+    auto turned = turnLinks(daemon, start);
+    if (const auto after = linksTo(daemon))
+      std::ranges::set_symmetric_difference(*before, *after, std::back_inserter(_written));
+    if (!turned) return turned;
+  }
   return {};
 }
 
@@ -107,8 +133,7 @@ Result<void> InitScriptDaemons::awaitBeginning(const Daemon& daemon) {
   if (*daemon.processFile != '\0') static_cast<void>(_runLoop.runUntil(RunLoop::Clock::now() + longestStart, runs));
   if (!running) return running.failure();
   if (*running) return {};
-  return Failure{"start", scriptOf(daemon),
-                 "it reported success, but " + std::string(daemon.program) + " does not run"};
+  return outOfTime("start", daemon, " does not run");
 }
 
 /// The script may have sent a signal and not waited.
@@ -130,7 +155,7 @@ Result<void> InitScriptDaemons::awaitEnd(const Daemon& daemon) {
   static_cast<void>(_runLoop.runUntil(RunLoop::Clock::now() + longestStop, isGone));
   if (!running) return running.failure();
   if (!*running) return {};
-  return Failure{"stop", scriptOf(daemon), "it reported success, but " + std::string(daemon.program) + " still runs"};
+  return outOfTime("stop", daemon, " still runs");
 }
 
 Result<void> InitScriptDaemons::restart(const Daemon& daemon) {

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <set>
 #include <string>
 #include <vector>
 
@@ -21,7 +22,10 @@ class InitScriptDaemons final : public Daemons {
 
   Result<Presence> presence(const Daemon& daemon) override;
   Result<bool> isRunning(const Daemon& daemon) override;
+  /// Its script says nothing of that.
+  Result<bool> isChanging(const Daemon& /*daemon*/) override { return false; }
   Result<bool> startsAtBoot(const Daemon& daemon) override;
+  Result<bool> startsUntilRestart(const Daemon& /*daemon*/) override { return false; }
   Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) override;
   Result<void> start(const Daemon& daemon) override;
   Result<void> stop(const Daemon& daemon) override;
@@ -32,6 +36,8 @@ class InitScriptDaemons final : public Daemons {
   Result<bool> hasProgram(const Daemon& daemon) const;
   Result<std::vector<ProcessId>> processes(const Daemon& daemon) const;
   Result<bool> hasLink(const Daemon& daemon, const char* kinds) const;
+  /// Paths, in all run levels.
+  Result<std::set<std::string>> linksTo(const Daemon& daemon) const;
   Result<void> turnLinks(const Daemon& daemon, bool starts);
   Result<void> awaitBeginning(const Daemon& daemon);
   Result<void> awaitEnd(const Daemon& daemon);

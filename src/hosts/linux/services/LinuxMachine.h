@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <type_traits>
 
 #include "base/RunLoop.h"
@@ -19,16 +20,21 @@ struct LinuxMachine {
   EffectSink& effects;
   RunLoop& runLoop;
   ServiceAccess& services;
+  /// Whether this run's user may change something; asks the user if need be. Empty: yes.
+  std::function<Result<void>()> authorizeChange = {};
 };
 
-/// While it lives no other run changes this machine; or why that could not be had.
+/// While it lives this run may change the machine, and no other run does; or why that could not be had.
 using MachineHold = Result<FileDescriptor>;
 
+/// The user is asked before the lock is taken: an answer takes its time, and nobody else is to wait for it.
 inline MachineHold hold(const LinuxMachine& machine) {
+  const auto authorized = machine.authorizeChange ? machine.authorizeChange() : Result<void>();
+  if (!authorized) return authorized.failure();
   return MachineLock(machine.root, machine.runLoop).hold();
 }
 
-/// carryOut() as a part of what is done while the machine is held.
+/// carryOut() as a part of what is done while the machine is held. Without that it is failed, and nothing is looked at.
 template <typename Value>
 Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, const LinuxMachine& machine,
                 const MachineHold& held) {
@@ -38,7 +44,7 @@ Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>
   return effect;
 }
 
-/// carryOut() while no other run changes this machine.
+/// carryOut() by a user who may, while no other run changes this machine.
 template <typename Value>
 Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, const LinuxMachine& machine) {
   return carryOut(setting, asked, machine, hold(machine));

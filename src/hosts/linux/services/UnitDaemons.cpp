@@ -104,11 +104,22 @@ Result<Daemons::Presence> UnitDaemons::presence(const Daemon& daemon) {
   return word == "not-found" ? Presence::absent : Presence::installed;
 }
 
-Result<bool> UnitDaemons::isRunning(const Daemon& daemon) {
+Result<std::string> UnitDaemons::activeState(const Daemon& daemon) {
   auto state = unitProperty(daemon, "ActiveState", "s");
   if (!state) return state.failure();
-  const auto word = std::move(state).value().readText();
-  return word == "active" || word == "activating" || word == "reloading";
+  return std::move(state).value().readText();
+}
+
+Result<bool> UnitDaemons::isRunning(const Daemon& daemon) {
+  const auto state = activeState(daemon);
+  if (!state) return state.failure();
+  return *state == "active" || *state == "activating" || *state == "reloading";
+}
+
+Result<bool> UnitDaemons::isChanging(const Daemon& daemon) {
+  const auto state = activeState(daemon);
+  if (!state) return state.failure();
+  return *state == "activating" || *state == "deactivating";
 }
 
 Result<std::string> UnitDaemons::fileState(const Daemon& daemon) {
@@ -121,7 +132,13 @@ Result<std::string> UnitDaemons::fileState(const Daemon& daemon) {
 Result<bool> UnitDaemons::startsAtBoot(const Daemon& daemon) {
   const auto state = fileState(daemon);
   if (!state) return state.failure();
-  return *state == "enabled" || *state == enabledUntilRestart;
+  return *state == "enabled";
+}
+
+Result<bool> UnitDaemons::startsUntilRestart(const Daemon& daemon) {
+  const auto state = fileState(daemon);
+  if (!state) return state.failure();
+  return *state == enabledUntilRestart;
 }
 
 /// Reads the unit files once for all of them, also when one could not be changed.
@@ -147,10 +164,25 @@ Result<void> UnitDaemons::changeLinks(const Daemon& daemon, bool start) {
   const auto state = fileState(daemon);
   if (!state) return state.failure();
   const bool untilRestart = !start && *state == enabledUntilRestart;
-  const auto changed = start ? order(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
-                             : order(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
+  auto changed = start ? order(daemon, "EnableUnitFiles", "ba(sss)", files, untilRestart, replaceLinks)
+                       : order(daemon, "DisableUnitFiles", "a(sss)", files, untilRestart);
   if (!changed) return changed.failure();
+  auto changes = std::move(changed).value();
+  if (start) changes.readBoolean();
+  noteWritten(changes);
   return {};
+}
+
+/// (kind, link, what it leads to); of other kinds nothing was written.
+void UnitDaemons::noteWritten(BusMessage& changes) {
+  if (!changes.enter('a', "(sss)")) return;
+  while (changes.enter('r', "sss")) {
+    const auto kind = changes.readText();
+    const auto link = changes.readText();
+    changes.readText();
+    if (kind == "symlink" || kind == "unlink") _written.push_back(link);
+    changes.exit();
+  }
 }
 
 Result<void> UnitDaemons::runJob(const Daemon& daemon, const char* method) {
@@ -168,7 +200,7 @@ Result<void> UnitDaemons::runJob(const Daemon& daemon, const char* method) {
     return ended.resultOf(job) || !(*bus)->isOpen();
   };
   if (!_runLoop.runUntil(RunLoop::Clock::now() + longestJob, hasEnded))
-    return Failure{method, daemon.unit, "its job has not ended in time"};
+    return Failure{method, daemon.unit, "its job has not ended in time", std::make_error_code(std::errc::timed_out)};
   const auto* result = ended.resultOf(job);
   if (!result) return Failure{method, daemon.unit, "the connection to the service manager ended"};
   if (*result == "done") return {};

@@ -22,7 +22,9 @@ class UnitDaemons final : public Daemons {
 
   Result<Presence> presence(const Daemon& daemon) override;
   Result<bool> isRunning(const Daemon& daemon) override;
+  Result<bool> isChanging(const Daemon& daemon) override;
   Result<bool> startsAtBoot(const Daemon& daemon) override;
+  Result<bool> startsUntilRestart(const Daemon& daemon) override;
   Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) override;
   Result<void> start(const Daemon& daemon) override;
   Result<void> stop(const Daemon& daemon) override;
@@ -36,11 +38,15 @@ class UnitDaemons final : public Daemons {
   template <typename... Arguments>
   Result<BusMessage> order(const Daemon& daemon, const char* member, const char* replySignature,
                            const Arguments&... arguments);
+  /// A word such as "active", as systemctl(1) lists them.
+  Result<std::string> activeState(const Daemon& daemon);
   Result<BusMessage> unitProperty(const Daemon& daemon, const char* name, const char* signature);
   /// A word such as "enabled", as systemctl(1) lists them; empty when there is no such unit file.
   Result<std::string> fileState(const Daemon& daemon);
   /// The manager does not take them up before it is reloaded.
   Result<void> changeLinks(const Daemon& daemon, bool start);
+  /// Reads the manager's list of changes, at which the reply is.
+  void noteWritten(BusMessage& changes);
   /// Runs a job to its end.
   Result<void> runJob(const Daemon& daemon, const char* method);
   Failure whyNotRunning(const Daemon& daemon);

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/system/Journal.h"
 
+#include <pwd.h>
 #include <sys/socket.h>
 #include <syslog.h>
 #include <unistd.h>
@@ -9,9 +10,7 @@
 #include <algorithm>
 #include <array>
 #include <cstdlib>
-#include <ctime>
 
-#include "base/Calendar.h"
 #include "base/Text.h"
 #include "hosts/linux/system/LocalSocket.h"
 
@@ -52,21 +51,11 @@ std::string journalDatagram(const JournalEntry& entry) {
   return datagram;
 }
 
-/// "Jan  5 09:00:00", whatever the locale.
-std::string syslogTime(std::time_t time) {
-  constexpr std::array months{"Jan", "Feb", "Mar", "Apr", "May", "Jun", "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
-  if (!std::getenv("TZ")) setDefaultTimeZone("/etc/localtime");  // the library by itself would open it whatever it is
-  std::tm local{};
-  ::localtime_r(&time, &local);
-  std::array<char, 32> rest{};
-  const auto length = std::strftime(rest.data(), rest.size(), " %e %H:%M:%S", &local);
-  return months.at(static_cast<std::size_t>(local.tm_mon)) + std::string(rest.data(), length);
-}
-
-/// As syslog(3) writes it.
+/// As syslog(3) writes it, without the time: who receives it puts in its own (RFC 3164, 4.3.2), and the rules of a
+/// local time are not to be read by a thread that ends the run.
 std::string syslogDatagram(const JournalEntry& entry) {
-  return "<" + std::to_string(entry.facility | entry.priority) + ">" + syslogTime(std::time(nullptr)) + " " +
-         identifier + "[" + std::to_string(::getpid()) + "]: " + harmless(entry.message);
+  return "<" + std::to_string(entry.facility | entry.priority) + ">" + identifier + "[" + std::to_string(::getpid()) +
+         "]: " + harmless(entry.message);
 }
 
 bool sendTo(const SystemRoot& root, const char* path, const std::string& datagram) {
@@ -131,13 +120,25 @@ bool isUserId(const std::string& text) {
   return !text.empty() && text != unset && std::ranges::all_of(text, [](char c) { return c >= '0' && c <= '9'; });
 }
 
+/// Anyone can set the variable; of root it is believed.
+std::string sudoUser() {
+  const auto* sudo = ::getuid() == 0 ? std::getenv("SUDO_UID") : nullptr;
+  return sudo && isUserId(sudo) ? sudo : "";
+}
+
+/// Absent when the user database has none for the id, or cannot be asked.
+std::optional<std::string> ownName() {
+  passwd entry{};
+  passwd* found = nullptr;
+  std::array<char, 16384> texts{};
+  ::getpwuid_r(::getuid(), &entry, texts.data(), texts.size(), &found);
+  return found ? std::optional<std::string>(found->pw_name) : std::nullopt;
+}
+
 Fields whoAsks(const SystemRoot& root) {
   Fields who{{"TAVISK_UID", std::to_string(::getuid())}, {"TAVISK_TERMINAL", terminal()}};
   const auto login = root.read("/proc/self/loginuid", loginIdLimit);
   if (login && isUserId(*login)) who.emplace_back("TAVISK_LOGIN_UID", *login);
-  // Anyone can set the variable; of root it is believed.
-  const auto* sudo = ::getuid() == 0 ? std::getenv("SUDO_UID") : nullptr;  // NOLINT(concurrency-mt-unsafe)
-  if (sudo && isUserId(sudo)) who.emplace_back("TAVISK_SUDO_UID", sudo);
   return who;
 }
 
@@ -146,6 +147,8 @@ Fields whoAsks(const SystemRoot& root) {
 void Journal::send(const JournalEntry& entry) const {
   if (!sendTo(_root, journalSocket, journalDatagram(entry))) sendTo(_root, syslogSocket, syslogDatagram(entry));
 }
+
+JournalLog::JournalLog(const SystemRoot& root) : _root(root), _journal(root), _sudoUser(sudoUser()) {}
 
 void JournalLog::changeBegins(const std::string& setting, const std::string& asked) {
   send(LOG_DEBUG, setting + ": change begins, asked \"" + asked + "\"",
@@ -156,9 +159,18 @@ void JournalLog::record(const Effect& effect) {
   send(priorityOf(effect.outcome), messageOf(effect), fieldsOf(effect));
 }
 
+void JournalLog::noteRefusedUser() const {
+  const auto name = ownName();
+  Fields fields{{"TAVISK_OUTCOME", "refused"}};
+  if (name) fields.emplace_back("TAVISK_USER", *name);
+  const auto user = std::to_string(::getuid()) + (name ? " (" + *name + ")" : "");
+  send(LOG_WARNING, "refused: user " + user + " at " + terminal() + " is no administrator", std::move(fields));
+}
+
 void JournalLog::send(int priority, const std::string& message, Fields fields) const {
   const auto who = whoAsks(_root);
   fields.insert(fields.end(), who.begin(), who.end());
+  if (!_sudoUser.empty()) fields.emplace_back("TAVISK_SUDO_UID", _sudoUser);
   _journal.send({LOG_AUTHPRIV, priority, message, std::move(fields)});
 }
 

@@ -38,16 +38,19 @@ class Journal {
 /// asked, and at which terminal. The beginning of a change is an entry of debug priority.
 class JournalLog final : public EffectChannel {
  public:
-  /// The root must outlive the object.
-  explicit JournalLog(const SystemRoot& root) : _root(root), _journal(root) {}
+  /// The root must outlive the object. Made before there are threads that change the environment.
+  explicit JournalLog(const SystemRoot& root);
   void changeBegins(const std::string& setting, const std::string& asked) override;
   void record(const Effect& effect) override;
+  /// That the tool was not run for the user of this process: user id, name and terminal.
+  void noteRefusedUser() const;
 
  private:
   void send(int priority, const std::string& message, std::vector<std::pair<std::string, std::string>> fields) const;
 
   const SystemRoot& _root;
   Journal _journal;
+  std::string _sudoUser;  ///< empty: unknown
 };
 
 /// The system log: the journal, else syslog.

@@ -79,7 +79,7 @@ std::string howItEnded(int status) {
 }
 
 Failure outOfTime(const std::vector<std::string>& words) {
-  return {"run", words.front(), "it has not ended in time"};
+  return {"run", words.front(), "it has not ended in time", std::make_error_code(std::errc::timed_out)};
 }
 
 struct EndedProgram {

@@ -5,6 +5,7 @@
 
 #include <mutex>
 
+#include "effects/EffectMatchers.h"
 #include "hosts/linux/BusPeer.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/access/Polkit.h"
@@ -16,9 +17,9 @@ namespace {
 using testing::HasSubstr;
 using namespace std::chrono_literals;
 
-/// Grants everything at once, after a question, or never answers.
+/// Grants everything at once, after a question, not at all, or never answers.
 struct PolkitTree : LinuxTree {
-  enum class Answer { granted, question, silence };
+  enum class Answer { granted, question, refused, silence };
 
   int answerCall(sd_bus_message* call) {
     std::uint32_t mayAsk = 0;
@@ -29,9 +30,9 @@ struct PolkitTree : LinuxTree {
       calls.push_back(mayAsk);
     }
     if (answer == Answer::silence) return 1;
-    const int grants = answer == Answer::granted || mayAsk != 0 ? 1 : 0;
-    return sd_bus_reply_method_return(call, "(bba{ss})", grants, 1 - grants, 1, "polkit.temporary_authorization_id",
-                                      grants != 0 ? "tmp7" : "");
+    const int grants = answer == Answer::granted || (answer == Answer::question && mayAsk != 0) ? 1 : 0;
+    return sd_bus_reply_method_return(call, "(bba{ss})", grants, answer == Answer::question ? 1 - grants : 0, 1,
+                                      "polkit.temporary_authorization_id", grants != 0 ? "tmp7" : "");
   }
   Bus& bus() { return **services.systemBus(); }
   std::vector<std::uint32_t> callsSoFar() {
@@ -66,6 +67,56 @@ TEST(Polkit, AsksTheUserOnlyThroughAnAgent) {
     EXPECT_THAT(found ? found->temporaryId : found.failure().why, HasSubstr(outcome));
     EXPECT_EQ(found && found->isGranted, outcome == std::string("tmp7"));
   }
+}
+
+/// Changes by an administrator who is not root and has no terminal.
+struct ChangesByMember {
+  ChangesByMember() { EXPECT_NE(std::freopen("/dev/null", "r", stdin), nullptr); }
+  Effect change() {
+    const auto limit = tree.runLoop.limitWaits(100ms);
+    Setting<bool> setting;
+    setting.store = [this](bool) {
+      ++changes;
+      return Result<void>();
+    };
+    return carryOut(setting, true, machine);
+  }
+
+  PolkitTree tree;
+  LinuxAdminAuthenticator authenticator{tree.machine, 65534};
+  LinuxMachine machine{tree.root, tree.effects, tree.runLoop, tree.services,
+                       [this] { return authenticator.authorizeChange(); }};
+  int changes = 0;
+};
+
+TEST(LinuxAdminAuthenticator, AsksPolkitOnceAndOnlyForAChange) {
+  using Answer = PolkitTree::Answer;
+  const std::tuple<Answer, std::size_t, const char*> cases[] = {
+      {Answer::granted, 1, nullptr},
+      {Answer::question, 1, "there is no terminal to ask at: sudo tavisk"},
+      {Answer::refused, 1, "does not grant it to this user"},
+      {Answer::silence, 2, "timed out"},
+  };
+  for (const auto& [answer, asked, why] : cases) {
+    ChangesByMember member;
+    member.tree.answer = answer;
+    member.authenticator.authenticate();
+    EXPECT_TRUE(member.authenticator.isAuthenticated());
+    EXPECT_THAT(member.tree.callsSoFar(), testing::IsEmpty());
+    for (int changes = 1; changes <= 2; ++changes) {
+      const auto effect = member.change();
+      EXPECT_EQ(member.changes, why ? 0 : changes);
+      EXPECT_TRUE(!why || isBecauseOf(effect, Outcome::failed, why)) << toJson(effect);
+    }
+    EXPECT_EQ(member.tree.callsSoFar().size(), asked);
+  }
+}
+
+TEST(LinuxAdminAuthenticator, AsksBeforeTheMachineIsLocked) {
+  ChangesByMember member;
+  const auto held = MachineLock(member.tree.root, member.tree.runLoop).hold();
+  EXPECT_THAT(member.change(), FailedFor("is changing a setting"));
+  EXPECT_THAT(member.tree.callsSoFar(), testing::ElementsAre(0));
 }
 
 TEST(PolkitAgent, IsReadyOrToldToBeNone) {

@@ -50,27 +50,41 @@ struct RemoteEvents {
 using Machines = testing::Types<RemoteShellOf<ScriptedTree>, RemoteShellOf<SshUnits>, RemoteEvents>;
 INSTANTIATE_TYPED_TEST_SUITE_P(Linux, RemoteAccessContract, Machines);
 
+/// What the manager's answers to these calls name as written.
+std::string linksOf(const std::vector<std::string>& calls) {
+  std::string links;
+  for (const auto& call : calls)
+    if (const auto name = call.find("Files "); name != std::string::npos)
+      links.append(links.empty() ? "" : ", ").append(FakeServiceManager::linkOf(call.substr(name + 6)));
+  return links;
+}
+
 TEST(RemoteLogin, SwitchesServiceAndSocketTogether) {
+  using State = RemoteAccessState;
   struct Case {
     FakeUnit service, socket;
-    bool isOn;
+    State state;
     std::vector<std::string> off, on;
   };
   const FakeUnit none, enabled{.file = "enabled"}, active{.active = running}, absent{.load = "not-found"};
   const FakeUnit broken{.load = "bad-setting", .active = running};
   const FakeUnit runtime{.file = "enabled-runtime"}, both{.active = running, .file = "enabled"};
+  const FakeUnit forNow{.active = running, .file = "enabled-runtime"};
   const std::vector<std::string> enableAndStart = {"EnableUnitFiles ssh.service", "Reload", "StartUnit ssh.service"};
   const std::vector<std::string> disableSocket = {"DisableUnitFiles ssh.socket", "Reload"};
+  const std::vector<std::string> stopSocket = {disableSocket[0], "Reload", "StopUnit ssh.socket"};
   const std::vector<std::string> disableAndStop = {disableSocket[0], "Reload", "StopUnit ssh.socket",
                                                    "StopUnit ssh.service"};
   const Case cases[] = {
-      {none, none, false, {}, enableAndStart},
-      {none, absent, false, {}, enableAndStart},
-      {active, none, true, {"StopUnit ssh.service"}, {"EnableUnitFiles ssh.service", "Reload"}},
-      {broken, absent, true, {"StopUnit ssh.service"}, {"EnableUnitFiles ssh.service", "Reload"}},
-      {none, enabled, true, disableSocket, {"StartUnit ssh.socket"}},
-      {none, runtime, true, disableSocket, {"StartUnit ssh.socket"}},
-      {active, both, true, disableAndStop, {}},
+      {none, none, State::off, {}, enableAndStart},
+      {none, absent, State::off, {}, enableAndStart},
+      {active, none, State::partly, {"StopUnit ssh.service"}, {"EnableUnitFiles ssh.service", "Reload"}},
+      {broken, absent, State::partly, {"StopUnit ssh.service"}, {"EnableUnitFiles ssh.service", "Reload"}},
+      {none, enabled, State::partly, disableSocket, {"StartUnit ssh.socket"}},
+      {none, runtime, State::off, {}, enableAndStart},
+      {none, forNow, State::partly, stopSocket, {"EnableUnitFiles ssh.service", "Reload"}},
+      {none, both, State::on, stopSocket, {}},
+      {active, both, State::on, disableAndStop, {}},
   };
   for (const auto& test : cases) {
     for (bool on : {false, true}) {
@@ -78,11 +92,53 @@ TEST(RemoteLogin, SwitchesServiceAndSocketTogether) {
       tree.manager.set("ssh.service", test.service);
       tree.manager.set("ssh.socket", test.socket);
       auto& login = tree.host().remoteShell();
-      EXPECT_EQ(login.isEnabled(), test.isOn);
+      EXPECT_EQ(login.state(), test.state);
       login.setEnabled(on);
-      EXPECT_EQ(tree.manager.calls(), on ? test.on : test.off);
-      EXPECT_EQ(login.isEnabled(), on);
+      const auto& calls = on ? test.on : test.off;
+      EXPECT_EQ(tree.manager.calls(), calls);
+      EXPECT_EQ(tree.lastEffect().where, linksOf(calls));
+      EXPECT_EQ(!tree.lastEffect().note.empty(), !on && !calls.empty() && calls.back().starts_with("StopUnit"));
+      EXPECT_EQ(login.state(), on ? State::on : State::off);
     }
+  }
+}
+
+TEST(RemoteAccess, IsNeitherOnNorOffAlreadyWhereNowAndLaterDiffer) {
+  const FakeUnit stopped{.file = "enabled"}, forNow{.active = running};
+  const std::tuple<FakeUnit, const char*, const char*> halves[] = {{stopped, "off", "on"}, {forNow, "on", "off"}};
+  const std::pair<std::vector<std::string>, const char*> runs[] = {
+      {{"getremotelogin", "setremotelogin", "on", "setremotelogin", "on"},
+       "Remote Login: On\nsetremotelogin: remote login is already On.\n"},
+      {{"-f", "getremotelogin", "setremotelogin", "off", "setremotelogin", "off"},
+       "Remote Login: On\nsetremotelogin: remote login is already Off.\n"},
+      {{"getremotevelmarevents", "setremotevelmarevents", "on", "setremotevelmarevents", "on"},
+       "Remote Velmar Events: On\nsetremotevelmarevents: On\n"
+       "setremotevelmarevents: remote velmar events are already on.\n"},
+      {{"getremotevelmarevents", "setremotevelmarevents", "off", "setremotevelmarevents", "off"},
+       "Remote Velmar Events: On\nsetremotevelmarevents: Off\n"
+       "setremotevelmarevents: remote velmar events are already off.\n"},
+  };
+  for (const auto& [unit, live, stored] : halves) {
+    for (const auto& [words, output] : runs) {
+      SshUnits tree;
+      tree.log.wants = true;
+      for (const char* name : {"ssh.service", "events.socket"}) tree.manager.set(name, unit);
+      EXPECT_EQ(runTool(tree, words).output, output);
+      EXPECT_EQ(tree.log.values.front().live, live);
+      EXPECT_EQ(tree.log.values.front().stored, stored);
+    }
+  }
+}
+
+TEST(RemoteLogin, LooksOnceMoreWhenItsTimeIsUp) {
+  for (const auto& [state, why] : {std::pair{running, ""}, std::pair{"activating", "its job has not ended in time"}}) {
+    SshUnits tree;
+    tree.manager.set("ssh.service", {.jobResult = ""});
+    const FakeUnit late{.active = state, .file = "enabled", .jobResult = ""};
+    const auto begins = tree.runLoop.after(50ms, [&] { tree.manager.set("ssh.service", late); });
+    tree.host().remoteShell().setEnabled(true);
+    EXPECT_EQ(tree.lastEffect().failure ? tree.lastEffect().failure->why : "", why);
+    EXPECT_TRUE(tree.lastEffect().changed);
   }
 }
 
@@ -129,6 +185,8 @@ TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
     tree.writeProgram("/usr/bin/ssh-keygen", std::string("#!/bin/sh\nroot=${0%/usr/bin/ssh-keygen}\n") + maker);
     tree.host().remoteShell().setEnabled(true);
     EXPECT_EQ(tree.lastEffect().outcome, outcome) << maker << config;
+    const bool makesKey = tree.lastEffect().where.starts_with("/etc/ssh/ssh_host_ed25519_key, /etc/systemd/");
+    EXPECT_EQ(makesKey, std::string_view(maker).starts_with("touch"));
     EXPECT_EQ(tree.host().remoteShell().isEnabled(), outcome == Outcome::applied);
   }
 }
@@ -148,13 +206,16 @@ TEST(RemoteLogin, ChangesNothingAfterALookThatFailed) {
   }
 }
 
-TEST(RemoteEvents, SwitchAllUnitsAndAskTheFirst) {
+TEST(RemoteEvents, SwitchAllUnits) {
   SshUnits tree;
   auto& events = tree.host().remoteEvents();
   tree.manager.set("events.service", {.active = running, .file = "enabled"});
-  EXPECT_FALSE(events.isEnabled());
+  EXPECT_EQ(events.state(), RemoteAccessState::partly);
   events.setEnabled(true);
   EXPECT_EQ(tree.lastEffect().before, "partly on");
+  tree.manager.set("events.service", {});
+  EXPECT_EQ(events.state(), RemoteAccessState::on) << "its socket starts it";
+  tree.manager.set("events.service", {.active = running, .file = "enabled"});
   events.setEnabled(false);
   EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles events.socket", "Reload", "StartUnit events.socket",
                                                 "DisableUnitFiles events.socket", "DisableUnitFiles events.service",
@@ -169,7 +230,9 @@ TEST(RemoteEvents, AreNotSupportedWithoutAllOfTheirUnits) {
     EXPECT_THAT(tree.lastEffect(), UnsupportedFor(why));
     tree.write("/etc/tavisk/services.conf", "");
   }
+  tree.log.wants = true;
   EXPECT_FALSE(tree.host().remoteEvents().isEnabled());
+  EXPECT_TRUE(tree.log.values.front().unsupported);
 }
 
 TEST(RemoteAccess, HasOneTimeForAllWaitsOfACommandButForQuestions) {

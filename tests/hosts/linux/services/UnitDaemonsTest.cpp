@@ -57,6 +57,7 @@ TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
     tree.host().networkTime().start();
     EXPECT_THAT(tree.lastEffect(), FailedFor(why));
     EXPECT_EQ(tree.lastEffect().failure->tried, "StartUnit");
+    EXPECT_EQ(tree.lastEffect().failure->code == std::errc::timed_out, unit.jobResult.empty());
     EXPECT_FALSE(tree.host().networkTime().isRunning()) << "asked again, after a hang-up too";
   }
 }
