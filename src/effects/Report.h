@@ -27,7 +27,8 @@ namespace tavisk {
 ///   command *  the word as it was typed
 ///   argument * the argument as it was typed, when the command takes one
 ///   handler *  the selector
-///   refused *  what was expected in place of the word or the argument, which was not taken: nothing was done
+///   refused *  what was expected in place of the word or the argument: nothing was done, or what the contract makes of
+///              such a value
 ///   error *    why the word or the whole run was refused, or broken off ("out of memory")
 ///   signal *   the signal that ended the run ("SIGTERM"); command, argument and handler are those it interrupted
 ///   failed     the error flag afterwards; true when the run was refused
