@@ -39,8 +39,7 @@ class Change {
     const bool isApplied = isStored && succeeds(_steps.apply);
     if (isApplied && _steps.settled && !runLoop.runUntil(RunLoop::Clock::now() + longestSettling, _steps.settled))
       fail({"change", _steps.name, "did not settle in time", std::make_error_code(std::errc::timed_out)});
-    const bool isAllWritten = _steps.store ? isStored : isApplied;
-    _effect.where = _steps.written ? _steps.written() : isAllWritten ? _steps.where : "";
+    tellPlaces(_steps.store ? isStored : isApplied);
   }
 
   void readBack() {
@@ -48,12 +47,9 @@ class Change {
     if (_effect.outcome == Outcome::failed && hasEndedAfterAll()) {
       _effect.outcome = Outcome::applied;
       _effect.failure.reset();
+      tellPlaces(true);
     }
-    if (_effect.outcome != Outcome::failed || !_isWritten || !_steps.takeBack) return;
-    const auto takenBack = _steps.takeBack();
-    if (takenBack) _effect.where.clear();
-    _effect.changed = false;
-    look();
+    if (_effect.outcome == Outcome::failed && _isWritten && _steps.takeBack) takeBack();
   }
 
   void remark() {
@@ -70,8 +66,23 @@ class Change {
 
   bool isRead() const { return _steps.live || _steps.stored; }
 
+  void tellPlaces(bool areAllWritten) {
+    _effect.where = _steps.written ? _steps.written() : areAllWritten ? _steps.where : "";
+  }
+
+  void takeBack() {
+    const auto takenBack = _steps.takeBack();
+    if (takenBack) {
+      _effect.where.clear();
+    } else {
+      _effect.failure->why += "; what was stored is still there: " + describe(takenBack.failure());
+    }
+    _effect.changed = false;
+    look();
+  }
+
   void look() {
-    if (!isRead()) _effect.changed = _isWritten;
+    if (!isRead()) _effect.changed = _isWritten && !_steps.leavesNoTrace;
     _isAsAsked = isRead();
     readBack(_steps.live, _live, _effect.live, _steps.name);
     readBack(_steps.stored, _stored, _effect.stored, _steps.where.empty() ? _steps.name : _steps.where);

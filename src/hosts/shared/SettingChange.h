@@ -83,6 +83,8 @@ struct Setting {
   std::function<Result<void>()> takeBack;
   /// Write although live and stored already have the value (a machine that counts its operations).
   bool always = false;
+  /// Of what is not read: whatever is done, the machine is as before (a daemon that reads its files again).
+  bool leavesNoTrace = false;
 };
 
 /// The one order of a change: supported, read, return when live and stored both have the value, store, apply, wait
@@ -121,6 +123,7 @@ struct Steps {
   std::function<bool()> settled;
   std::function<Result<void>()> takeBack;
   bool always = false;
+  bool leavesNoTrace = false;
 };
 
 Effect carryOut(const Steps& steps, EffectSink& effects, RunLoop& runLoop);
@@ -176,6 +179,7 @@ Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>
       .settled = change::about(setting.settled, asked),
       .takeBack = setting.takeBack,
       .always = setting.always,
+      .leavesNoTrace = setting.leavesNoTrace,
   };
   return change::carryOut(steps, effects, runLoop);
 }
@@ -203,9 +207,9 @@ std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects)
     value.unsupported = (*support)->reason;
   } else {
     (setting.live ? value.live : value.stored) = change::textOfFound<Value>(found, setting, effects);
-    if (setting.live && setting.stored && asksMore && found)
+    if (setting.live && setting.stored && asksMore)
       value.stored = change::textOfFound<Value>(setting.stored(), setting, effects);
-    if (!found) return std::nullopt;
+    if (!found && !value.stored) return std::nullopt;
   }
   effects.observe(value);
   return found && *found ? std::optional((*found)->value) : std::nullopt;

@@ -157,7 +157,9 @@ TEST_F(SettingChangeTest, takesBackWhatDoesNotComeAbout) {
   EXPECT_EQ(steps.back(), "take back");
   broken = "take back";
   EXPECT_EQ(change("9"),
-            effectOf(Outcome::failed, place, true, "5", "5", "9", Failure{"read back", "Sleep", "reads 5"}));
+            effectOf(Outcome::failed, place, true, "5", "5", "9",
+                     Failure{"read back", "Sleep",
+                             "reads 5; what was stored is still there: take back on disk: No space left on device"}));
   broken = ignored = "";
   EXPECT_EQ(change("9").outcome, Outcome::applied);
 }
