@@ -12,7 +12,9 @@ sys.path.append(str(pathlib.Path(__file__).parents[1] / "cli"))
 import reports  # noqa: E402
 
 LONGEST_SHOWN = 500
-REPORTS = "/run/tavisk-reports"  # of each check's command; users who are not root are handed the descriptor
+REPORTS = "/run/tavisk-reports"
+# Before each check's command; users who are not root are handed the descriptor.
+REPORTING = f"exec 9>>{REPORTS}; export TAVISK_REPORT=fd:9; "
 ANYTHING = re.compile(".*", re.DOTALL)
 
 
@@ -57,7 +59,7 @@ def _difference(what, expected, got):
 
 
 def _do(machine, check):
-    answer = machine.run(f"exec 9>>{REPORTS}; export TAVISK_REPORT=fd:9; {check.do}")
+    answer = machine.run(REPORTING + check.do)
     problems = (_difference("output", check.prints, answer.output) + _difference("errors", check.errors, answer.errors) +
                 _difference("status", str(check.status), str(answer.status)))
     if problems and check.errors is ANYTHING:

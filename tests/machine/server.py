@@ -59,8 +59,9 @@ class Server(emulator.Emulated):
         """Puts into the tree what a machine of this kind has besides."""
 
     def run(self, command):
-        if command.startswith("controller "):
-            return check.Answer(0, self._controller.obey(command), "")
+        order = command.removeprefix(check.REPORTING)
+        if order.startswith("controller "):
+            return check.Answer(0, self._controller.obey(order), "")
         return super().run(command)
 
 
