@@ -17,7 +17,7 @@ CHECKS = [
     Check("the longest delay", needs=SERVER, do=f"tavisk -{SET} 7650", prints=f"{SET}: 7650 seconds\n", then=kept(7650)),
     Check("a delay that the controller cannot keep is a failure in the record", needs=SERVER, do=reporting(f"-{SET} 999990"),
           prints=f"{SET}: 999990 seconds\n",
-          errors="tavisk: Startup Delay: read back on the management controller: reads 53\n",
+          errors="tavisk: Startup Delay: read back on Startup Delay: reads 53\n",
           then=kept(1590) | reported('"outcome":"failed"', '"asked":"33333","live":"53"', '"changed":true')),
     Check("a delay that is no number is refused in the record, and none", needs=SERVER, do=reporting(f"-{SET} soon"),
           prints=f"{SET}: 0 seconds\n", errors="", then=kept(0) | reported('"refused":')),
