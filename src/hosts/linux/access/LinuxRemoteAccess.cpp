@@ -3,7 +3,6 @@
 #include "hosts/linux/access/LinuxRemoteAccess.h"
 
 #include <algorithm>
-#include <iterator>
 #include <string_view>
 
 #include "base/Text.h"
@@ -59,21 +58,6 @@ Result<bool> needsNoHostKey(const SystemRoot& root) {
   const auto keys = hostKeys(root);
   if (!keys) return keys.failure();
   return keys->empty() ? namesHostKeys(root) : true;
-}
-
-std::string listed(const std::vector<std::string>& names) {
-  std::string list;
-  for (const auto& name : names) list.append(list.empty() ? "" : ", ").append(name);
-  return list;
-}
-
-/// A change of what starts with the machine; the links that it has written are added to `written`.
-template <typename Change>
-Result<void> noting(std::vector<std::string>& written, Daemons& daemons, const Change& change) {
-  static_cast<void>(daemons.takeWritten());
-  auto changed = change();
-  std::ranges::copy(daemons.takeWritten(), std::back_inserter(written));
-  return changed;
 }
 
 using Found = Setting<bool>::Found;
@@ -156,7 +140,7 @@ void LinuxRemoteShellService::setEnabled(bool enabled) {
   Trace trace;
   auto setting = remoteLogin();
   setting.note = [&](bool) { return trace.hasStopped ? "open sessions stay open" : ""; };
-  setting.written = [&] { return listed(trace.written); };
+  setting.written = [&] { return trace.written.text(); };
   setting.store = [&](bool on) { return store(on, trace); };
   setting.apply = [&](bool on) { return apply(on, trace); };
   setting.settled = [this](bool) { return withServer<bool>(&hasSettled).valueOr(false); };
@@ -175,7 +159,7 @@ Result<void> LinuxRemoteShellService::store(bool enabled, Trace& trace) {
   if (enabled) {
     const auto keys = ensureHostKeys();
     if (!keys) return keys.failure();
-    trace.written = *keys;
+    for (const auto& key : *keys) trace.written.add(key);
   }
   return withServer<void>([&](const DaemonGroup& server) {
     return noting(trace.written, _machine.services.daemons(),
@@ -279,9 +263,9 @@ RemoteAccessState LinuxRemoteEventsService::state() {
 }
 
 void LinuxRemoteEventsService::setEnabled(bool enabled) {
-  std::vector<std::string> written;
+  WrittenPlaces written;
   auto setting = remoteEvents();
-  setting.written = [&] { return listed(written); };
+  setting.written = [&] { return written.text(); };
   setting.store = [&](bool on) {
     return withUnits<void>([&](const DaemonGroup& units) {
       return noting(written, _machine.services.daemons(), [&] { return units.setAllStartAtBoot(on); });

@@ -25,7 +25,7 @@ class LinuxRemoteShellService final : public RemoteShellService {
  private:
   /// What the last change has come to.
   struct Trace {
-    std::vector<std::string> written;
+    WrittenPlaces written;
     bool hasStopped = false;
   };
   Setting<bool> remoteLogin();

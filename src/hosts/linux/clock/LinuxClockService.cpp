@@ -11,7 +11,6 @@
 #include "hosts/linux/clock/LocalTime.h"
 #include "hosts/linux/clock/SystemClock.h"
 #include "hosts/linux/services/SystemServices.h"
-#include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/ProcessScan.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/shared/ZoneList.h"
@@ -37,6 +36,12 @@ Result<void> setByDaemon(Bus& bus, const AskedTime& asked) {
   const auto set = bus.call(timeDaemon(), "SetTime", "", asked.microsecondsAhead(), relative, false);
   if (!set) return set.failure();
   return {};
+}
+
+/// As far as that can be looked at.
+bool isLinkedTo(const SystemRoot& root, const ZoneName& zone) {
+  const auto linked = linkedTimeZone(root);
+  return linked && *linked == zone;
 }
 
 /// In a container the daemon has no more rights than this process.
@@ -173,26 +178,24 @@ void LinuxClockService::setTimeZone(const ZoneName& zone) {
     const auto both = change::textOfReading(*inForce) + ", " + daemonsName + " in " + timeDaemon().service;
     return std::optional(Reading(inForce->value, both));
   };
-  Places written;
-  setting.written = [&] { return commaList(written); };
+  WrittenPlaces written;
+  setting.written = [&] { return written.text(); };
   setting.store = [&](const ZoneName& asked) { return changeTimeZone(asked, written); };
   carryOut(setting, zoneOfPath(zone.file()).value_or(zone), _machine);
 }
 
-/// What needs root is asked before the daemon moves the link.
-Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone, Places& written) {
+/// What needs root is asked before the daemon moves the link. One that fails, or answers too late, may have moved it.
+Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone, WrittenPlaces& written) {
   if (auto failure = whyNoZone(_machine.root, zone)) return *failure;
   if (auto failure = whyZoneNeedsRoot(_machine.root, zone)) return *failure;
   const auto isThere = goesBy(zone);
   if (!isThere) return isThere.failure();
-  if (!*isThere) {
-    if (auto linked = linkZone(zone); !linked) return linked;
-    written.emplace_back(localTimeLink);
-  }
+  auto linked = *isThere ? Result<void>() : linkZone(zone, written);
+  if (!linked && !isLinkedTo(_machine.root, zone)) return linked;
   const auto isUpdated = updateTimeZoneFile(_machine.root, zone);
-  if (!isUpdated) return isUpdated.failure();
-  if (*isUpdated) written.emplace_back(timeZoneFile);
-  return {};
+  if (isUpdated && *isUpdated) written.add(timeZoneFile);
+  if (!linked || isUpdated) return linked;
+  return isUpdated.failure();
 }
 
 /// Whether the link and the daemon have the zone.
@@ -218,7 +221,14 @@ Result<bool> LinuxClockService::setZoneByDaemon(const ZoneName& zone) {
   return set && *linked == zone;
 }
 
-Result<void> LinuxClockService::linkZone(const ZoneName& zone) {
+Result<void> LinuxClockService::linkZone(const ZoneName& zone, WrittenPlaces& written) {
+  const bool wasLinked = isLinkedTo(_machine.root, zone);
+  auto moved = moveLink(zone);
+  if (moved || (!wasLinked && isLinkedTo(_machine.root, zone))) written.add(localTimeLink);
+  return moved;
+}
+
+Result<void> LinuxClockService::moveLink(const ZoneName& zone) {
   const auto isSet = setZoneByDaemon(zone);
   if (!isSet) return isSet.failure();
   if (*isSet) return {};

@@ -5,6 +5,7 @@
 #include "hosts/linux/clock/SystemClock.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/SettingChange.h"
+#include "hosts/shared/WrittenPlaces.h"
 #include "platform/ClockService.h"
 
 namespace tavisk {
@@ -29,12 +30,11 @@ class LinuxClockService final : public ClockService {
   std::string whoCorrectsTheClock();
   Result<void> changeTime(const AskedTime& asked);
   Result<void> changeTimeDirectly(std::int64_t secondsSince1970) const;
-  using Places = std::vector<std::string>;  ///< those that have been written
-
   Result<bool> goesBy(const ZoneName& zone);
   Result<bool> setZoneByDaemon(const ZoneName& zone);
-  Result<void> linkZone(const ZoneName& zone);
-  Result<void> changeTimeZone(const ZoneName& zone, Places& written);
+  Result<void> moveLink(const ZoneName& zone);
+  Result<void> linkZone(const ZoneName& zone, WrittenPlaces& written);
+  Result<void> changeTimeZone(const ZoneName& zone, WrittenPlaces& written);
 
   LinuxMachine _machine;
 };

@@ -78,6 +78,11 @@ Setting<bool> LinuxNetworkTimeService::runningSetting() {
   setting.apply = [this](bool isOn) {
     return withClient<void>([&](const TimeDaemon& client) { return run(client.daemon, isOn); });
   };
+  setting.settled = [this](bool) {
+    const auto isChanging =
+        withClient<bool>([this](const TimeDaemon& client) { return daemons().isChanging(client.daemon); });
+    return isChanging && !*isChanging;
+  };
   return setting;
 }
 
@@ -110,9 +115,12 @@ void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
   auto setting = named<bool>(setting::networkTimeAtStartup);
   if (const auto found = client(); found && *found) setting.where = (*found)->daemon.unit;
   setting.stored = [this] { return startsAtBoot(); };
-  setting.store = [this](bool starts) {
-    return withClient<void>(
-        [&](const TimeDaemon& client) { return daemons().setStartAtBoot({client.daemon}, starts); });
+  WrittenPlaces written;
+  setting.written = [&] { return written.text(); };
+  setting.store = [&, this](bool starts) {
+    return withClient<void>([&](const TimeDaemon& client) {
+      return noting(written, daemons(), [&] { return daemons().setStartAtBoot({client.daemon}, starts); });
+    });
   };
   carryOut(setting, launch, _machine);
 }
@@ -120,7 +128,7 @@ void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
 void LinuxNetworkTimeService::checkLaunchAtStartup(bool launch) {
   const auto found = client();
   if (found && !*found) return;
-  const auto starts = startsAtBoot();
+  const auto starts = found ? daemons().startsAtBoot((*found)->daemon) : found.failure();
   if (starts && *starts == launch) return;
   Effect effect{.setting = setting::networkTimeAtStartup, .outcome = Outcome::failed, .asked = textOf(launch)};
   if (starts) {
@@ -234,6 +242,7 @@ Result<void> LinuxNetworkTimeService::putBack(const TimeDaemon& client, const st
 /// A client that has read its servers as they are goes on undisturbed.
 void LinuxNetworkTimeService::restartAsynchronously() {
   auto setting = named<std::string>(setting::networkTimeRestart);
+  setting.leavesNoTrace = true;
   setting.apply = [this](const std::string&) {
     return withClient<void>([&](const TimeDaemon& client) { return reload(client); });
   };

@@ -75,13 +75,29 @@ Result<Reading<ZoneName>> timeZoneInForce(const SystemRoot& root) {
   return *rules ? zoneWithRules(root, **rules) : Reading(utc());
 }
 
+namespace {
+
+/// The zone of a link, which may name none, with the second copy of the name where that is another.
+Result<std::optional<Reading<ZoneName>>> linkedZoneBeside(const SystemRoot& root, const std::optional<ZoneName>& linked,
+                                                          const std::optional<ZoneName>& second) {
+  const auto found = linked ? Result<Reading<ZoneName>>(Reading(*linked)) : timeZoneInForce(root);
+  if (!found) return found.failure();
+  auto stored = *found;
+  if (second && *second != stored.value)
+    stored.detail =
+        change::textOfReading(stored) + ", " + (second->text.empty() ? "none" : second->text) + " in " + timeZoneFile;
+  return std::optional(std::move(stored));
+}
+
+}  // namespace
+
 Result<std::optional<Reading<ZoneName>>> storedTimeZone(const SystemRoot& root) {
+  const auto target = localTimeTarget(root);
+  if (!target) return target.failure();
   const auto second = timeZoneFileName(root);
   if (!second) return second.failure();
+  if (*target) return linkedZoneBeside(root, zoneOfPath(**target), *second);
   if (*second) return std::optional(Reading(**second));
-  const auto linked = linkedTimeZone(root);
-  if (!linked) return linked.failure();
-  if (*linked) return std::optional(Reading(**linked));
   const auto there = root.isThere(localTimeLink);
   if (!there) return there.failure();
   if (*there) return timeZoneInForce(root);

@@ -19,11 +19,12 @@ Result<std::optional<ZoneName>> linkedTimeZone(const SystemRoot& root);
 
 /// The zone in force (localtime(5)): the one that the link names; for a file in its place the one that has the same
 /// rules, the name in /etc/timezone before others; UTC without either. Where no zone has these rules it is the one that
-/// /etc/timezone names, and what is known is in the detail, as wherever the link does not lead to the zone's own file.
+/// /etc/timezone names, and what is known is in the detail, as where the link's zone has no file.
 Result<Reading<ZoneName>> timeZoneInForce(const SystemRoot& root);
 
-/// The zone that stays: what the second copy of the name says, tzdata makes the link anew from it; without that file
-/// what the link or the file in its place says; absent without either.
+/// The zone after a restart: what the link says, which the service manager reads and tzdata keeps; the second copy of
+/// the name is in the detail where it says another. Only without a link the second copy counts, and without that the
+/// file in the link's place; absent without any of them.
 Result<std::optional<Reading<ZoneName>>> storedTimeZone(const SystemRoot& root);
 
 /// Debian's second copy of the name, /etc/timezone, whatever it is made of; absent when there is no such file.

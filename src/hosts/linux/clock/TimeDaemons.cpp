@@ -180,6 +180,14 @@ BusObject timeSyncManager(const char* busService) {
   return {busService, "/org/freedesktop/timesync1", "org.freedesktop.timesync1.Manager"};
 }
 
+/// As the daemon that tells them keeps them.
+TimeServers onceEach(const TimeServers& servers) {
+  TimeServers kept;
+  for (const auto& server : servers)
+    if (std::ranges::find(kept, server) == kept.end()) kept.push_back(server);
+  return kept;
+}
+
 /// Against all servers: a file of the administrator's may have changed too.
 Result<bool> tellsItsServers(const TimeDaemon& daemon, const LinuxMachine& machine) {
   const auto configured = daemon.servers(machine.root);
@@ -188,19 +196,37 @@ Result<bool> tellsItsServers(const TimeDaemon& daemon, const LinuxMachine& machi
   if (!bus) return bus.failure();
   auto told = (*bus)->property(timeSyncManager(daemon.busService), "SystemNTPServers", "as");
   if (!told) return told.failure();
-  return std::move(told).value().readTexts() == *configured;
+  return std::move(told).value().readTexts() == onceEach(*configured);
+}
+
+using Fields = std::vector<std::string>;
+
+/// The printed lines that tell a server.
+Result<std::vector<Fields>> printedSources(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  const auto printed = runProgram(machine.root, {daemon.sources.begin(), daemon.sources.end()}, machine.runLoop);
+  if (!printed) return printed.failure();
+  std::vector<Fields> sources;
+  for (const auto& line : split(*printed, "\n"))
+    if (auto fields = split(line, ","); fields.size() > 2) sources.push_back(std::move(fields));
+  return sources;
 }
 
 Result<bool> printsItsServer(const TimeDaemon& daemon, const LinuxMachine& machine) {
   const auto own = serversIn(machine.root, daemon.serverFile);
   if (!own) return own.failure();
-  const auto printed = runProgram(machine.root, {daemon.sources.begin(), daemon.sources.end()}, machine.runLoop);
-  if (!printed) return printed.failure();
-  TimeServers known;
-  for (const auto& line : split(*printed, "\n"))
-    if (const auto fields = split(line, ","); fields.size() > 2) known.push_back(fields[2]);
-  return std::ranges::all_of(
-      *own, [&](const std::string& server) { return std::ranges::find(known, server) != known.end(); });
+  const auto sources = printedSources(daemon, machine);
+  if (!sources) return sources.failure();
+  const auto isKnown = [&](const std::string& server) {
+    return std::ranges::any_of(*sources, [&](const Fields& fields) { return fields[2] == server; });
+  };
+  return std::ranges::all_of(*own, isKnown);
+}
+
+Result<std::string> printedServerInUse(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  const auto sources = printedSources(daemon, machine);
+  if (!sources) return sources.failure();
+  const auto used = std::ranges::find_if(*sources, [](const Fields& fields) { return fields[1] == "*"; });
+  return used == sources->end() ? std::string() : (*used)[2];
 }
 
 Result<bool> hasStartedSince(const TimeDaemon& daemon, const LinuxMachine& machine) {
@@ -226,6 +252,7 @@ Result<bool> hasReadServers(const TimeDaemon& daemon, const LinuxMachine& machin
 }
 
 Result<std::string> serverInUse(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  if (!daemon.sources.empty()) return printedServerInUse(daemon, machine);
   if (!daemon.busService) return std::string();
   const auto bus = systemBusIfAny(machine.services);
   if (!bus) return bus.failure();

@@ -34,8 +34,8 @@ struct TimeDaemon {
   /// What tells whether the running daemon has read its servers since they were changed; of these a daemon has one.
   /// Where it tells its servers, and the one that it uses (org.freedesktop.timesync1(5)); null: nowhere.
   const char* busService = nullptr;
-  /// The program, with its arguments, that prints a line of comma-separated fields for each server, whose third is the
-  /// name as it was configured.
+  /// The program, with its arguments, that prints a line of comma-separated fields for each server: the second is "*"
+  /// for the one that it uses, the third the name as it was configured (chronyc(1)).
   std::span<const char* const> sources = {};
   /// The file that it writes each time it starts, before it reads its configuration; null: none.
   const char* startFile = nullptr;
@@ -45,7 +45,8 @@ struct TimeDaemon {
 /// tool's file. Fails where that cannot be found out.
 Result<bool> hasReadServers(const TimeDaemon& daemon, const LinuxMachine& machine);
 
-/// The server that the daemon uses at the moment: empty when it has found none yet, or does not tell.
+/// The server that a running daemon uses at the moment: empty when it has found none yet, or does not tell. ntpsec and
+/// openntpd are not asked.
 Result<std::string> serverInUse(const TimeDaemon& daemon, const LinuxMachine& machine);
 
 /// The daemons that this host knows, the preferred one first.

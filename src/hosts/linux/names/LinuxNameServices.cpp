@@ -10,7 +10,6 @@
 #include "hosts/linux/names/NameAnnouncer.h"
 #include "hosts/linux/names/OwnAddress.h"
 #include "hosts/linux/services/SystemServices.h"
-#include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/Rights.h"
 #include "hosts/shared/SettingChange.h"
 
@@ -149,10 +148,11 @@ void LinuxHostConfigService::setLocalNetworkName(const std::string& name) {
   setting.live = [&] { return liveLocalName(name); };
   setting.liveFor = firstLabel;
   setting.stored = [this] { return storedLocalName(); };
-  Places written;
-  setting.written = [&] { return commaList(written); };
+  WrittenPlaces written;
+  setting.written = [&] { return written.text(); };
   setting.store = [&](const std::string& value) { return storeLocalName(value, written); };
   setting.apply = [this](const std::string& value) { return applyLocalName(value); };
+  setting.settled = [this](const std::string&) { return _announcer.hasRegistered().valueOr(false); };
   carryOut(setting, name, _machine);
 }
 
@@ -183,7 +183,7 @@ Setting<std::string>::Found LinuxHostConfigService::storedLocalName() {
 }
 
 /// The name is refused here before it reaches a service that would cut it off.
-Result<void> LinuxHostConfigService::storeLocalName(const std::string& name, Places& written) {
+Result<void> LinuxHostConfigService::storeLocalName(const std::string& name, WrittenPlaces& written) {
   if (name.empty() || name.size() > longestKernelHostName)
     return Failure{setLocal, staticNameFile, "the kernel holds names of 1 to 64 bytes"};
   const auto stored = staticHostName(_machine.root);
@@ -201,26 +201,26 @@ Result<void> LinuxHostConfigService::storeLocalName(const std::string& name, Pla
   if (renamed != *hosts) {
     if (auto failure = whyNeedsRoot(setLocal, hostsFile)) return *failure;
     if (auto changed = _machine.root.write(hostsFile, renamed); !changed) return changed;
-    written.emplace_back(hostsFile);
+    written.add(hostsFile);
   }
   if (*stored == name) return {};
   const auto set = storeStaticName(name);
   if (!set) return putBackHosts(*hosts, name, set.failure(), written);
-  written.emplace_back(staticNameFile);
+  written.add(staticNameFile);
   return {};
 }
 
 /// Where the name was stored all the same it is right among the hosts too.
 Failure LinuxHostConfigService::putBackHosts(const std::string& hosts, const std::string& name, Failure cause,
-                                             Places& written) {
+                                             WrittenPlaces& written) {
   if (const auto stored = staticHostName(_machine.root); stored && *stored == name) {
-    written.emplace_back(staticNameFile);
+    written.add(staticNameFile);
     return cause;
   }
-  if (written.empty()) return cause;
+  if (written.text().empty()) return cause;
   const auto restored = _machine.root.write(hostsFile, hosts);
   if (restored)
-    written.clear();
+    written = {};
   else
     cause.why += "; " + describe(restored.failure());
   return cause;

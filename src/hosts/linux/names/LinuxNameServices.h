@@ -9,6 +9,7 @@
 #include "hosts/linux/names/NameAnnouncer.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/SettingChange.h"
+#include "hosts/shared/WrittenPlaces.h"
 #include "platform/NameServices.h"
 
 namespace tavisk {
@@ -30,12 +31,10 @@ class LinuxHostConfigService final : public HostConfigService {
   Result<bool> setByService(const char* member, const std::string& name);
   Result<Value> serviceComputerName();
   Result<void> storeComputerName(const std::string& name);
-  using Places = std::vector<std::string>;  ///< those that have been written
-
   Setting<std::string>::Found liveLocalName(const std::string& asked);
   Setting<std::string>::Found storedLocalName();
-  Result<void> storeLocalName(const std::string& name, Places& written);
-  Failure putBackHosts(const std::string& hosts, const std::string& name, Failure cause, Places& written);
+  Result<void> storeLocalName(const std::string& name, WrittenPlaces& written);
+  Failure putBackHosts(const std::string& hosts, const std::string& name, Failure cause, WrittenPlaces& written);
   std::optional<Failure> whyAnnouncingNeedsRoot(const std::string& name);
   Result<void> storeStaticName(const std::string& name);
   Result<void> applyLocalName(const std::string& name);

@@ -77,7 +77,17 @@ Result<void> NameAnnouncer::awaitRegistered(Bus& bus, const std::int32_t& state)
     return state > registering || !bus.isOpen();
   };
   if (_runLoop.runUntil(RunLoop::Clock::now() + longestRegistering, isRegistered)) return {};
-  return Failure{"SetHostName", responder().service, "the name is not registered in time"};
+  return Failure{"SetHostName", responder().service, "the name is not registered in time",
+                 std::make_error_code(std::errc::timed_out)};
+}
+
+Result<bool> NameAnnouncer::hasRegistered() {
+  const auto bus = busOf(responder().service);
+  if (!bus) return bus.failure();
+  if (!*bus) return true;
+  auto state = (*bus)->call(responder(), "GetState", "i");
+  if (!state) return state.failure();
+  return std::move(state).value().readInt32() > registering;
 }
 
 }  // namespace tavisk

@@ -29,6 +29,8 @@ class NameAnnouncer {
   /// Makes the responder announce a name of one label, until it or the machine restarts, and waits until the network
   /// has had its time to object. Nothing to do is a success.
   Result<void> announce(const std::string& label);
+  /// Whether that time is over; true where no responder runs.
+  Result<bool> hasRegistered();
 
  private:
   /// Null when the service does not run, or there is no bus at all.

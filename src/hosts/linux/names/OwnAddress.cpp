@@ -3,44 +3,55 @@
 #include "hosts/linux/names/OwnAddress.h"
 
 #include <arpa/inet.h>
+#include <ifaddrs.h>
 #include <netinet/in.h>
 #include <sys/socket.h>
 
-#include <algorithm>
 #include <cerrno>
-#include <cstring>
-
-#include "base/FileDescriptor.h"
+#include <memory>
+#include <optional>
 
 namespace tavisk {
 namespace {
 
-/// The wildcard address is everybody's.
+using Interfaces = std::unique_ptr<ifaddrs, decltype(&::freeifaddrs)>;
+
 template <typename Address>
-bool isOneIn(int family, const std::string& text, Address& address) {
-  const Address wildcard{};
-  return ::inet_pton(family, text.c_str(), &address) == 1 && std::memcmp(&address, &wildcard, sizeof address) != 0;
+std::optional<Address> addressOf(int family, const std::string& text) {
+  Address address{};
+  return ::inet_pton(family, text.c_str(), &address) == 1 ? std::optional(address) : std::nullopt;
 }
 
-template <typename SocketAddress>
-Result<bool> mayHave(int family, const std::string& text, const SocketAddress& address) {
-  const FileDescriptor socket(::socket(family, SOCK_DGRAM | SOCK_CLOEXEC, 0));
-  if (!socket && errno == EAFNOSUPPORT) return false;
-  if (!socket) return systemFailure("socket", text, errno);
-  if (::bind(socket.number(), reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0) return true;
-  if (errno == EADDRNOTAVAIL || errno == EINVAL) return false;  // the latter: a link-local one without its link
-  return systemFailure("bind", text, errno);
+bool isLoopback(in_addr address) {
+  return ntohl(address.s_addr) >> IN_CLASSA_NSHIFT == IN_LOOPBACKNET;
+}
+
+bool isSame(const sockaddr& has, in_addr address) {
+  return has.sa_family == AF_INET && reinterpret_cast<const sockaddr_in&>(has).sin_addr.s_addr == address.s_addr;
+}
+
+bool isSame(const sockaddr& has, const in6_addr& address) {
+  return has.sa_family == AF_INET6 &&
+         IN6_ARE_ADDR_EQUAL(&reinterpret_cast<const sockaddr_in6&>(has).sin6_addr, &address);
+}
+
+template <typename Address>
+Result<bool> hasInterface(const Address& address, const std::string& text) {
+  ifaddrs* list = nullptr;
+  if (::getifaddrs(&list) != 0) return systemFailure("getifaddrs", text, errno);
+  const Interfaces interfaces(list, &::freeifaddrs);
+  for (const auto* each = list; each; each = each->ifa_next)
+    if (each->ifa_addr && isSame(*each->ifa_addr, address)) return true;
+  return false;
 }
 
 }  // namespace
 
 Result<bool> isOwnAddress(const std::string& address) {
-  sockaddr_in four{};
-  four.sin_family = AF_INET;
-  if (isOneIn(AF_INET, address, four.sin_addr)) return mayHave(AF_INET, address, four);
-  sockaddr_in6 six{};
-  six.sin6_family = AF_INET6;
-  if (isOneIn(AF_INET6, address, six.sin6_addr)) return mayHave(AF_INET6, address, six);
+  if (const auto four = addressOf<in_addr>(AF_INET, address))
+    return isLoopback(*four) ? true : hasInterface(*four, address);
+  if (const auto six = addressOf<in6_addr>(AF_INET6, address))
+    return IN6_IS_ADDR_LOOPBACK(&*six) ? true : hasInterface(*six, address);
   return false;
 }
 

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "base/Result.h"
+#include "hosts/shared/WrittenPlaces.h"
 
 namespace tavisk {
 
@@ -54,6 +55,15 @@ class Daemons {
  protected:
   std::vector<std::string> _written;  ///< see takeWritten()
 };
+
+/// A change of what starts with the machine; the links that it has written are added to `written`.
+template <typename Change>
+Result<void> noting(WrittenPlaces& written, Daemons& daemons, const Change& change) {
+  static_cast<void>(daemons.takeWritten());
+  auto changed = change();
+  for (const auto& link : daemons.takeWritten()) written.add(link);
+  return changed;
+}
 
 /// Daemons that belong together, such as a service and the socket that starts it, the most important one first.
 class DaemonGroup {

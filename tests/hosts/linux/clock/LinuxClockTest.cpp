@@ -49,15 +49,18 @@ TEST(LocalTime, ReadsTheNameFileWhereTheLinkSaysNothing) {
 }
 
 TEST(LocalTime, TellsTheZoneInForceApartFromTheNameBeside) {
-  const std::tuple<std::string, const char*, const char*> cases[] = {
-      {"none", "UTC", "UTC"},
-      {"TZif Paris", "Europe/Paris", "Europe/Paris, by the rules in /etc/localtime"},
-      {"TZif Tokyo", "Asia/Tokyo", "Asia/Tokyo, by the rules in /etc/localtime"},
-      {"TZif Mars", "Europe/Paris", "rules of no known zone in /etc/localtime"},
-      {"/usr/share/zoneinfo/Asia/Tokyo", "Asia/Tokyo", "Asia/Tokyo"},
-      {"/usr/share/zoneinfo/No/Where", "No/Where", "UTC, without /usr/share/zoneinfo/No/Where"},
+  constexpr const char* paris = "Europe/Paris";
+  const std::tuple<std::string, const char*, const char*, const char*> cases[] = {
+      {"none", "UTC", "UTC", paris},
+      {"TZif Paris", paris, "Europe/Paris, by the rules in /etc/localtime", paris},
+      {"TZif Tokyo", "Asia/Tokyo", "Asia/Tokyo, by the rules in /etc/localtime", paris},
+      {"TZif Mars", paris, "rules of no known zone in /etc/localtime", paris},
+      {"/opt/clock", "UTC", "UTC", "UTC, Europe/Paris in /etc/timezone"},
+      {"/usr/share/zoneinfo/Asia/Tokyo", "Asia/Tokyo", "Asia/Tokyo", "Asia/Tokyo, Europe/Paris in /etc/timezone"},
+      {"/usr/share/zoneinfo/No/Where", "No/Where", "UTC, without /usr/share/zoneinfo/No/Where",
+       "No/Where, Europe/Paris in /etc/timezone"},
   };
-  for (const auto& [text, zone, live] : cases) {
+  for (const auto& [text, zone, live, stored] : cases) {
     LinuxTree tree;
     tree.log.wants = true;
     tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif Paris");
@@ -66,7 +69,7 @@ TEST(LocalTime, TellsTheZoneInForceApartFromTheNameBeside) {
     if (text.starts_with('/')) tree.link("/etc/localtime", text);
     if (text.starts_with("TZ")) tree.write("/etc/localtime", text);
     EXPECT_EQ(tree.host().clock().timeZone().text, zone) << text;
-    EXPECT_EQ(tree.log.values.back(), (SettingValue{setting::timeZone, live, "Europe/Paris"})) << text;
+    EXPECT_EQ(tree.log.values.back(), (SettingValue{setting::timeZone, live, stored})) << text;
     tree.host().clock().setTimeZone({"Europe/Paris"});
     EXPECT_EQ(tree.lastEffect().where, "/etc/localtime") << text;
     EXPECT_TRUE(tree.lastEffect().changed) << text;
@@ -105,6 +108,22 @@ TEST(LocalTime, IsChangedWhereHalfOfItIs) {
   EXPECT_THAT(tree.lastEffect(), FailedFor("/etc/timezone"));
   EXPECT_EQ(tree.lastEffect().where, "/etc/localtime");
   EXPECT_TRUE(tree.lastEffect().changed);
+}
+
+TEST(LocalTime, FollowsADaemonThatFailsWhenItHasMovedTheLink) {
+  LinuxTree tree;
+  tree.write("/run/systemd/system/x", "");
+  tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif2");
+  tree.write("/etc/timezone", "UTC\n");
+  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+    if (member == "Get") return sd_bus_reply_method_return(call, "v", "s", "UTC");
+    tree.link("/etc/localtime", "../usr/share/zoneinfo/" + firstText(call));
+    return sd_bus_reply_method_errorf(call, SD_BUS_ERROR_FAILED, "too late");
+  });
+  tree.host().clock().setTimeZone({"Europe/Paris"});
+  EXPECT_THAT(tree.lastEffect(), FailedFor("too late"));
+  EXPECT_EQ(tree.lastEffect().where, "/etc/localtime, /etc/timezone");
+  EXPECT_EQ(tree.file("/etc/timezone"), "Europe/Paris\n");
 }
 
 /// Puts something in the place of a file that cannot be looked at, or that keeps a reader waiting.

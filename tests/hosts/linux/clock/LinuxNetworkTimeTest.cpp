@@ -1,6 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
+#include <systemd/sd-bus.h>
 
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/LinuxContractMachines.h"
@@ -58,7 +59,7 @@ TEST_F(ChronyTest, IsLeftAloneWhenItGoesByItsServerAlready) {
     tree.write("/reloaded", "");
     client.setServer({server});
     client.restartAsynchronously();
-    EXPECT_EQ(tree.lastEffect().changed, tree.lastEffect().outcome == Outcome::applied);
+    EXPECT_FALSE(tree.lastEffect().changed);
     return !tree.file("/reloaded").empty();
   };
   EXPECT_TRUE(isRestartedAfter("time.example"));
@@ -76,7 +77,7 @@ TEST_F(ChronyTest, IsLeftAloneWhenItGoesByItsServerAlready) {
 TEST_F(ChronyTest, TellsWhatTheNextStartOfTheMachineWouldChange) {
   for (const bool starts : {false, true}) {
     client.setLaunchAtStartup(starts);
-    EXPECT_EQ(tree.lastEffect().where, starts ? "chrony.service" : "") << "it did not start before";
+    EXPECT_EQ(tree.lastEffect().where, starts ? "/etc/rc2.d/S01chrony" : "") << "it did not start before";
     client.checkLaunchAtStartup(starts);
     EXPECT_EQ(tree.log.effects.size(), starts ? 3 : 1);
     client.checkLaunchAtStartup(!starts);
@@ -87,6 +88,46 @@ TEST_F(ChronyTest, TellsWhatTheNextStartOfTheMachineWouldChange) {
     EXPECT_FALSE(client.isRunning());
     EXPECT_EQ(tree.log.values.back().stored, starts ? "on" : "off");
   }
+}
+
+TEST_F(ChronyTest, TellsTheServerThatItUses) {
+  client.setServer({"time.example"});
+  client.start();
+  tree.write("/known", "^,?,time.example,0\n^,*,used.example,2\n");
+  tree.log.wants = true;
+  EXPECT_EQ(client.server().address, "time.example");
+  EXPECT_EQ(tree.log.values.back().live, "used.example");
+}
+
+TEST(LinuxNetworkTime, HasNotChangedWhileTheClientStartsOrStops) {
+  for (const bool on : {true, false}) {
+    ManagedTree tree;
+    haveChrony(tree);
+    tree.manager.set(chrony, {.active = on ? "inactive" : "active", .jobResult = ""});
+    const FakeUnit late{.active = on ? "activating" : "deactivating", .jobResult = ""};
+    const auto begins = tree.runLoop.after(std::chrono::milliseconds(50), [&] { tree.manager.set(chrony, late); });
+    on ? tree.host().networkTime().start() : tree.host().networkTime().stop();
+    EXPECT_THAT(tree.lastEffect(), FailedFor("its job has not ended in time"));
+  }
+}
+
+TEST(LinuxNetworkTime, AsksForTheClientOnceWhenItLooksAtTheNextStart) {
+  ManagedTree tree;
+  haveChrony(tree);
+  tree.manager.breakNext("LoadUnit", FakeServiceManager::Fault::error);
+  tree.host().networkTime().checkLaunchAtStartup(true);
+  EXPECT_THAT(tree.lastEffect(), FailedFor("AccessDenied"));
+}
+
+TEST(LinuxNetworkTime, DoesNotRestartAClientThatDropsDoubleServers) {
+  ManagedTree tree;
+  tree.manager.set("systemd-timesyncd.service", {.active = "active"});
+  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [](sd_bus_message* call, const std::string&) {
+    return sd_bus_reply_method_return(call, "v", "as", 2, "a.example", "b.example");
+  });
+  tree.write("/etc/systemd/timesyncd.conf", "[Time]\nNTP=a.example b.example a.example\n");
+  tree.host().networkTime().restartAsynchronously();
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::unchanged);
 }
 
 TEST(LinuxNetworkTime, GoesByTheStartOfAClientThatDoesNotTellItsServers) {

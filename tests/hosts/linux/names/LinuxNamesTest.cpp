@@ -81,9 +81,13 @@ TEST_F(NamesTest, ChangesEveryPlaceOfTheHostName) {
 }
 
 TEST_F(NamesTest, FollowOnTheLinesOfTheMachinesOwnAddresses) {
-  tree.write("/etc/hosts", "127.0.0.1 localhost machine\n::1 machine\n192.0.2.1 machine\n0.0.0.0 machine\n");
+  // Some of them the kernel lets a socket have all the same.
+  const std::string others =
+      "192.0.2.1 machine.backup.example\n0.0.0.0 machine\n224.0.0.251 machine\n255.255.255.255 machine\nff02::1 "
+      "machine\n";
+  tree.write("/etc/hosts", "127.0.0.1 localhost machine\n::1 machine\n" + others);
   names.setLocalNetworkName("new");
-  EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost new\n::1\tnew\n192.0.2.1 machine\n0.0.0.0 machine\n");
+  EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost new\n::1\tnew\n" + others);
   EXPECT_EQ(tree.lastEffect().note, "");
 }
 
@@ -151,6 +155,26 @@ TEST_F(NamesTest, PutHostsBackWhenTheNameIsNotStored) {
   EXPECT_THAT(tree.lastEffect(), FailedFor("ReadOnlyFilesystem"));
   EXPECT_EQ(tree.lastEffect().where, "");
   EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost\n127.0.1.1\tmachine\n");
+}
+
+TEST(LinuxNames, LookOnceMoreWhenTheResponderIsLate) {
+  for (const int state : {1, 2}) {
+    NamedTree tree;
+    tree.write("/run/systemd/system/x", "");
+    std::string announced = "machine";
+    const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+      if (member == "NameHasOwner") return sd_bus_reply_method_return(call, "b", 1);
+      if (member == "GetHostName") return sd_bus_reply_method_return(call, "s", announced.c_str());
+      if (member == "GetState") return sd_bus_reply_method_return(call, "i", state);
+      if (member != "SetHostName")
+        return sd_bus_reply_method_errorf(call, SD_BUS_ERROR_SERVICE_UNKNOWN, "no such name");
+      announced = firstText(call);
+      return sd_bus_reply_method_return(call, "");
+    });
+    tree.host().hostConfiguration().setLocalNetworkName("new");
+    EXPECT_EQ(tree.lastEffect().failure ? tree.lastEffect().failure->why : "",
+              state == 1 ? "the name is not registered in time" : "");
+  }
 }
 
 TEST(LinuxNames, AreNotSetAfterALookThatFailed) {
