@@ -28,7 +28,7 @@ class LinuxClockService final : public ClockService {
   std::optional<Failure> whyNoClock() const;
   std::string whoCorrectsTheClock();
   Result<void> changeTime(const AskedTime& asked);
-  Result<void> changeTimeDirectly(std::int64_t secondsSince1970) const;
+  Result<void> changeTimeDirectly(const AskedTime& asked) const;
   using Places = std::vector<std::string>;  ///< those that have been written
 
   Result<bool> goesBy(const ZoneName& zone);
