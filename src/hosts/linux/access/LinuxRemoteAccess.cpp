@@ -89,9 +89,12 @@ RemoteAccessState observedState(Setting<bool> setting, EffectSink& effects) {
   // What is off now may be on after a restart: without the one the other is no answer.
   setting.live = [&] { return isJust(false, live) && !stored ? stored : live; };
   setting.stored = [&] { return stored; };
-  if (!observe(setting, effects)) return RemoteAccessState::off;
+  const auto observed = observe(setting, effects);
   if (isJust(true, live) && isJust(true, stored)) return RemoteAccessState::on;
-  return isJust(false, live) && isJust(false, stored) ? RemoteAccessState::off : RemoteAccessState::partly;
+  if (observed && !(isJust(false, live) && isJust(false, stored))) return RemoteAccessState::partly;
+  const auto support = setting.supported();
+  if (support && *support) return RemoteAccessState::unsupported;
+  return support && observed ? RemoteAccessState::off : RemoteAccessState::unknown;
 }
 
 Result<bool> hasSettled(const DaemonGroup& daemons) {

@@ -130,6 +130,26 @@ TEST(RemoteAccess, IsNeitherOnNorOffAlreadyWhereNowAndLaterDiffer) {
   }
 }
 
+TEST(RemoteAccess, IsOffAlreadyOnlyWhereThatIsSeen) {
+  const std::tuple<const char*, std::string, std::string> runs[] = {
+      {"setremotelogin", "", "setremotelogin: remote login is already Off.\n"},
+      {"setremotevelmarevents", "setremotevelmarevents: Off\n",
+       "setremotevelmarevents: remote velmar events are already off.\n"},
+  };
+  for (const auto& [word, tried, already] : runs) {
+    SshUnits tree;
+    tree.makeUnreadable("/etc/tavisk/services.conf");
+    EXPECT_EQ(runTool(tree, {"-f", word, "off"}).output, tried);
+    EXPECT_THAT(tree.lastEffect(), FailedFor("symbolic links"));
+    EXPECT_EQ(tree.lastEffect().asked, "off");
+    std::filesystem::remove(tree.at("/etc/tavisk/services.conf"));
+    for (const char* unit : {"ssh.service", "ssh.socket"}) tree.manager.set(unit, {.load = "not-found"});
+    for (const char* unit : {"sshd.service", "sshd.socket"}) tree.manager.set(unit, {.load = "not-found"});
+    EXPECT_EQ(runTool(tree, {"-f", word, "off"}).output, already);
+    EXPECT_THAT(tree.lastEffect(), UnsupportedFor("find "));
+  }
+}
+
 TEST(RemoteLogin, LooksOnceMoreWhenItsTimeIsUp) {
   for (const auto& [state, why] : {std::pair{running, ""}, std::pair{"activating", "its job has not ended in time"}}) {
     SshUnits tree;
