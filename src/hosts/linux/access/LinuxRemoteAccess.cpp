@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <iterator>
+#include <set>
 #include <string_view>
 
 #include "base/Text.h"
@@ -31,13 +32,20 @@ std::vector<Daemon> openSshUnits() {
           {"sshd.socket", "", ""}};
 }
 
-Result<std::vector<std::string>> hostKeys(const SystemRoot& root) {
+using Paths = std::set<std::string>;
+
+/// Private keys, public ones, and what an interrupted maker leaves behind.
+Result<Paths> hostKeyFiles(const SystemRoot& root) {
   const auto names = orEmpty(root.list(sshFolder));
   if (!names) return names.failure();
-  std::vector<std::string> keys;
+  Paths files;
   for (const auto& name : *names)
-    if (name.starts_with("ssh_host_") && name.ends_with("_key")) keys.push_back(std::string(sshFolder) + "/" + name);
-  return keys;
+    if (name.starts_with("ssh_host_")) files.insert(std::string(sshFolder) + "/" + name);
+  return files;
+}
+
+bool hasKey(const Paths& files) {
+  return std::ranges::any_of(files, [](const std::string& file) { return file.ends_with("_key"); });
 }
 
 /// Whether the administrator keeps the keys elsewhere (sshd_config(5)).
@@ -56,9 +64,9 @@ Result<bool> needsNoHostKey(const SystemRoot& root) {
   auto isOpenSsh = root.isThere(sshProgram);
   if (!isOpenSsh) return isOpenSsh;
   if (!*isOpenSsh) return true;
-  const auto keys = hostKeys(root);
-  if (!keys) return keys.failure();
-  return keys->empty() ? namesHostKeys(root) : true;
+  const auto files = hostKeyFiles(root);
+  if (!files) return files.failure();
+  return hasKey(*files) ? true : namesHostKeys(root);
 }
 
 std::string listed(const std::vector<std::string>& names) {
@@ -176,9 +184,7 @@ Result<bool> LinuxRemoteShellService::hasAny(Result<std::vector<Daemon>> (Daemon
 
 Result<void> LinuxRemoteShellService::store(bool enabled, Trace& trace) {
   if (enabled) {
-    const auto keys = ensureHostKeys();
-    if (!keys) return keys.failure();
-    trace.written = *keys;
+    if (auto keys = ensureHostKeys(trace); !keys) return keys;
   }
   return withServer<void>([&](const DaemonGroup& server) {
     return noting(trace.written, _machine.services.daemons(),
@@ -207,16 +213,20 @@ Result<void> LinuxRemoteShellService::apply(bool enabled, Trace& trace) {
   });
 }
 
-Result<std::vector<std::string>> LinuxRemoteShellService::ensureHostKeys() {
+Result<void> LinuxRemoteShellService::ensureHostKeys(Trace& trace) {
   constexpr const char* tried = "make host keys";
   const auto needsNone = needsNoHostKey(_machine.root);
   if (!needsNone) return needsNone.failure();
-  if (*needsNone) return std::vector<std::string>();
+  if (*needsNone) return {};
   if (auto failure = whyNeedsRoot(tried, sshFolder)) return *failure;
+  const auto before = hostKeyFiles(_machine.root);
+  if (!before) return before.failure();
   const auto made = runProgram(_machine.root, {keyMaker, "-A"}, _machine.runLoop);
+  const auto after = hostKeyFiles(_machine.root);
+  if (after) std::ranges::set_difference(*after, *before, std::back_inserter(trace.written));
   if (!made) return made.failure();
-  auto keys = hostKeys(_machine.root);
-  if (!keys || !keys->empty()) return keys;
+  if (!after) return after.failure();
+  if (hasKey(*after)) return {};
   return Failure{tried, keyMaker, "it reported success, but there is no key in /etc/ssh"};
 }
 

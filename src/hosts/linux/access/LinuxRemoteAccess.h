@@ -39,8 +39,8 @@ class LinuxRemoteShellService final : public RemoteShellService {
   Result<void> store(bool enabled, Trace& trace);
   Result<void> startAtBoot(const DaemonGroup& server);
   Result<void> apply(bool enabled, Trace& trace);
-  /// Where no host key is, a connection would be taken and dropped. The keys that were made.
-  Result<std::vector<std::string>> ensureHostKeys();
+  /// Where no host key is, a connection would be taken and dropped.
+  Result<void> ensureHostKeys(Trace& trace);
 
   LinuxMachine _machine;
 };

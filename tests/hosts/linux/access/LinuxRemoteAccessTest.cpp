@@ -191,8 +191,10 @@ TEST(RemoteLogin, SaysWhatStandsAgainstIt) {
 }
 
 TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
-  const std::tuple<const char*, const char*, Outcome> cases[] = {
-      {"touch $root/etc/ssh/ssh_host_ed25519_key", "", Outcome::applied},
+  const std::string makes = "touch $root/etc/ssh/ssh_host_ed25519_key $root/etc/ssh/ssh_host_ed25519_key.pub";
+  const std::tuple<std::string, const char*, Outcome> cases[] = {
+      {makes, "", Outcome::applied},
+      {makes + "; false", "", Outcome::failed},
       {"true", "", Outcome::failed},
       {"false", "", Outcome::failed},
       {"false", "Port 22\n hostkey /srv/key\n", Outcome::applied},
@@ -202,11 +204,13 @@ TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
     SshUnits tree;
     std::filesystem::remove(tree.at("/etc/ssh/ssh_host_rsa_key"));
     tree.write("/etc/ssh/sshd_config", config);
-    tree.writeProgram("/usr/bin/ssh-keygen", std::string("#!/bin/sh\nroot=${0%/usr/bin/ssh-keygen}\n") + maker);
+    tree.writeProgram("/usr/bin/ssh-keygen", "#!/bin/sh\nroot=${0%/usr/bin/ssh-keygen}\n" + maker);
     tree.host().remoteShell().setEnabled(true);
     EXPECT_EQ(tree.lastEffect().outcome, outcome) << maker << config;
-    const bool makesKey = tree.lastEffect().where.starts_with("/etc/ssh/ssh_host_ed25519_key, /etc/systemd/");
-    EXPECT_EQ(makesKey, std::string_view(maker).starts_with("touch"));
+    const std::string keys =
+        maker == "true" || maker == "false" ? "" : "/etc/ssh/ssh_host_ed25519_key, /etc/ssh/ssh_host_ed25519_key.pub";
+    const std::string links = outcome == Outcome::applied ? FakeServiceManager::linkOf("ssh.service") : "";
+    EXPECT_EQ(tree.lastEffect().where, keys + (keys.empty() || links.empty() ? "" : ", ") + links);
     EXPECT_EQ(tree.host().remoteShell().isEnabled(), outcome == Outcome::applied);
   }
 }
