@@ -111,15 +111,6 @@ Result<bool> hasSettled(const DaemonGroup& daemons) {
   return !*changing;
 }
 
-/// A service that its socket starts, which listens.
-bool isWaiting(const Daemon& member, const std::vector<Daemon>& running) {
-  constexpr std::string_view ending = ".service";
-  const std::string_view name = member.unit;
-  if (!name.ends_with(ending)) return false;
-  const auto socket = std::string(name.substr(0, name.size() - ending.size())) + ".socket";
-  return std::ranges::any_of(running, [&](const Daemon& other) { return other.unit == socket; });
-}
-
 }  // namespace
 
 Result<DaemonGroup> LinuxRemoteShellService::knownServer() {
@@ -258,14 +249,10 @@ Support LinuxRemoteEventsService::supported() {
 Setting<bool>::Found LinuxRemoteEventsService::live() {
   const auto named = units();
   if (!named) return named.failure();
-  const auto running = named->running();
-  if (!running) return running.failure();
-  if (running->empty()) return false;
-  const auto isOn = [&](const Daemon& member) {
-    const auto isSame = [&](const Daemon& other) { return other.unit == std::string_view(member.unit); };
-    return std::ranges::any_of(*running, isSame) || isWaiting(member, *running);
-  };
-  return Reading<bool>(true, std::ranges::all_of(named->members(), isOn) ? "" : partlyOn);
+  const auto ready = named->ready();
+  if (!ready) return ready.failure();
+  if (ready->empty()) return false;
+  return Reading<bool>(true, ready->size() == named->members().size() ? "" : partlyOn);
 }
 
 Setting<bool>::Found LinuxRemoteEventsService::stored() {
@@ -274,8 +261,10 @@ Setting<bool>::Found LinuxRemoteEventsService::stored() {
   const auto starting = named->startingAtBoot();
   if (!starting) return starting.failure();
   if (starting->empty()) return false;
+  const auto stayingOff = named->stayingOffAtBoot();
+  if (!stayingOff) return stayingOff.failure();
   const bool startsFirst = starting->front().unit == std::string_view(named->members().front().unit);
-  return Reading<bool>(true, startsFirst ? "" : partlyOn);
+  return Reading<bool>(true, startsFirst && stayingOff->empty() ? "" : partlyOn);
 }
 
 Setting<bool> LinuxRemoteEventsService::remoteEvents() {

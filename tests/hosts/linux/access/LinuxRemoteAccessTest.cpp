@@ -34,7 +34,8 @@ struct SshUnits : ManagedTree {
     write("/etc/ssh/ssh_host_rsa_key", "");
     write("/usr/sbin/sshd", "");
     write("/etc/tavisk/services.conf", "remote-events = events.socket events.service\n");
-    for (const char* unit : {"ssh.service", "ssh.socket", "events.socket", "events.service"}) manager.set(unit, {});
+    for (const char* unit : {"ssh.service", "ssh.socket", "events.socket"}) manager.set(unit, {});
+    manager.set("events.service", {.file = "static"});
   }
 };
 
@@ -238,12 +239,27 @@ TEST(RemoteEvents, SwitchAllUnits) {
   events.setEnabled(true);
   EXPECT_EQ(tree.lastEffect().before, "partly on");
   tree.manager.set("events.service", {});
+  EXPECT_EQ(events.state(), RemoteAccessState::partly) << "it could be enabled";
+  tree.manager.set("events.service", {.file = "static"});
   EXPECT_EQ(events.state(), RemoteAccessState::on) << "its socket starts it";
   tree.manager.set("events.service", {.active = running, .file = "enabled"});
   events.setEnabled(false);
   EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles events.socket", "Reload", "StartUnit events.socket",
                                                 "DisableUnitFiles events.socket", "DisableUnitFiles events.service",
-                                                "Reload", "StopUnit events.service", "StopUnit events.socket"));
+                                                "Reload", "StopUnit events.socket", "StopUnit events.service"));
+}
+
+TEST(RemoteEvents, LeaveAServiceToItsSocket) {
+  SshUnits tree;
+  tree.write("/etc/tavisk/services.conf", "remote-events = events.service events.socket\n");
+  tree.manager.set("events.service", {.file = "enabled"});
+  tree.host().remoteEvents().setEnabled(true);
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
+  tree.manager.set("events.service", {.active = running});
+  tree.host().remoteEvents().setEnabled(false);
+  EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles events.socket", "Reload", "StartUnit events.socket",
+                                                "DisableUnitFiles events.socket", "Reload", "StopUnit events.socket",
+                                                "StopUnit events.service"));
 }
 
 TEST(RemoteEvents, AreNotSupportedWithoutAllOfTheirUnits) {
