@@ -6,12 +6,24 @@ namespace tavisk {
 
 /// Whether a service is on: now and after a restart of the machine, or neither now nor then. In between it is when the
 /// two differ, or only some of its parts are on; a machine that knows yes and no alone never says so.
-enum class RemoteAccessState { off, partly, on };
+enum class RemoteAccessState {
+  off,
+  partly,
+  on,
+  unknown,      ///< that cannot be found out
+  unsupported,  ///< this machine cannot have it: it is off
+};
 
-/// Whether there is nothing left to do for who asks for `on`. In between that is never so, although a getter calls it
-/// on.
+/// Whether it is all that who asks for `on` wants. In between that is never so, although a getter calls it on, nor is
+/// it where nobody knows.
 inline bool isWholly(RemoteAccessState state, bool on) {
+  if (state == RemoteAccessState::unsupported) return !on;
   return state == (on ? RemoteAccessState::on : RemoteAccessState::off);
+}
+
+/// Whether it is on in any way.
+inline bool isOn(RemoteAccessState state) {
+  return state == RemoteAccessState::on || state == RemoteAccessState::partly;
 }
 
 /// The SSH server.
@@ -19,10 +31,8 @@ class RemoteShellService {
  public:
   virtual ~RemoteShellService() = default;
 
-  /// Off also when the machine has none, and when that cannot be found out.
   virtual RemoteAccessState state() = 0;
-  /// In any way.
-  bool isEnabled() { return state() != RemoteAccessState::off; }
+  bool isEnabled() { return isOn(state()); }
   /// Starts or stops it, now and with the machine. The result goes to the effects.
   virtual void setEnabled(bool enabled) = 0;
 };
@@ -32,10 +42,8 @@ class RemoteEventsService {
  public:
   virtual ~RemoteEventsService() = default;
 
-  /// Off also when the machine cannot take any, and when that cannot be found out.
   virtual RemoteAccessState state() = 0;
-  /// In any way.
-  bool isEnabled() { return state() != RemoteAccessState::off; }
+  bool isEnabled() { return isOn(state()); }
   /// Now and after a restart. The result goes to the effects.
   virtual void setEnabled(bool enabled) = 0;
 };

@@ -1,5 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
+#include <algorithm>
 #include <array>
 #include <cmath>
 #include <cstddef>
@@ -9,9 +10,13 @@
 #include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/ServerCommands.h"
+#include "settings/LeadingNumber.h"
 
 namespace tavisk {
 namespace {
+
+constexpr const char* dates = "a date as mm:dd:yy";
+constexpr const char* times = "a time as hh:mm:ss";
 
 /// The three numbers of "mm:dd:yy" or "hh:mm:ss"; what is missing or no number is 0.
 std::array<std::int64_t, 3> readFields(const std::string& text) {
@@ -19,6 +24,12 @@ std::array<std::int64_t, 3> readFields(const std::string& text) {
   std::array<std::int64_t, 3> numbers{};
   for (std::size_t i = 0; i < numbers.size() && i < fields.size(); ++i) numbers[i] = leadingInteger(fields[i]);
   return numbers;
+}
+
+/// What is missing is taken for 0, and so is what is no number.
+bool areNumbers(const std::string& text) {
+  const auto fields = split(text, "/:");
+  return !fields.empty() && std::ranges::all_of(fields, &beginsWithNumber);
 }
 
 /// Compared without a sign, so that no negative number is at most `limit`.
@@ -71,10 +82,11 @@ void ServerCommands::setDate(const std::string& date) {
   const auto [month, day, yearAsTyped] = readFields(date);
   if (!isDate(month, day, yearAsTyped)) {
     _context.output.print("setdate: Error: %s is invalid date format... use mm:dd:yy\n", date.c_str());
-    refuse("a date as mm:dd:yy");
+    refuse(dates);
     setError(true);
     return;
   }
+  if (!areNumbers(date)) refuse(dates);
   const std::int64_t year = yearAsTyped <= 99 ? yearAsTyped + 2000 : yearAsTyped;
   const auto now = localNow(*this);
   setClock(*this, {year, month, day, now.hour, now.minute, now.second});
@@ -94,10 +106,11 @@ void ServerCommands::setTime(const std::string& time) {
   const auto [hour, minute, second] = readFields(time);
   if (!isTime(hour, minute, second)) {
     _context.output.print("settime: Error, %s is invalid time format... use hh:mm:ss\n", time.c_str());
-    refuse("a time as hh:mm:ss");
+    refuse(times);
     setError(true);
     return;
   }
+  if (!areNumbers(time)) refuse(times);
   const auto now = localNow(*this);
   setClock(*this, {now.year, now.month, now.day, hour, minute, second});
   _context.output.print("Set Time: %02ld:%02ld:%02ld\n", hour, minute, second);

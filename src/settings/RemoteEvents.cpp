@@ -19,12 +19,14 @@ void ServerCommands::setRemoteVelmarEvents(const std::string& onOff) {
   }
   const auto isOn = readOnOff(onOff, "setremotevelmarevents");
   if (!isOn) return;
-  if (isWholly(state, *isOn)) {
+  const bool isThere = isWholly(state, *isOn);
+  // A machine that cannot have them says so.
+  if (!isThere || state == RemoteAccessState::unsupported) remoteEvents.setEnabled(*isOn);
+  if (isThere) {
     _context.output.print("setremotevelmarevents: remote velmar events are already %s.\n", *isOn ? "on" : "off");
-    return;
+  } else {
+    _context.output.print("setremotevelmarevents: %s\n", *isOn ? "On" : "Off");
   }
-  remoteEvents.setEnabled(*isOn);
-  _context.output.print("setremotevelmarevents: %s\n", *isOn ? "On" : "Off");
 }
 
 HandlerRows remoteEventsHandlers() {

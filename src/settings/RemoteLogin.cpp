@@ -57,11 +57,10 @@ void ServerCommands::setRemoteLogin(const std::string& onOff) {
   if (!*isOn && _parent && _parent->promptUser() && !promptForRemoteLogin()) {
     return refuse("the answer yes to the question whether to lose this connection");
   }
-  if (isWholly(state, *isOn)) {
-    _context.output.print("setremotelogin: remote login is already %s.\n", *isOn ? "On" : "Off");
-  } else {
-    remoteShell.setEnabled(*isOn);
-  }
+  const bool isThere = isWholly(state, *isOn);
+  if (isThere) _context.output.print("setremotelogin: remote login is already %s.\n", *isOn ? "On" : "Off");
+  // A machine that cannot have it says so.
+  if (!isThere || state == RemoteAccessState::unsupported) remoteShell.setEnabled(*isOn);
 }
 
 bool ServerCommands::promptForRemoteLogin() {

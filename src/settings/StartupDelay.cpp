@@ -6,6 +6,7 @@
 #include "base/Text.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/ServerCommands.h"
+#include "settings/LeadingNumber.h"
 #include "settings/SpecialPMUSettings.h"
 
 namespace tavisk {
@@ -35,7 +36,7 @@ void ServerCommands::setWaitForStartupAfterPowerFailure(const std::string& secon
     return;
   }
   // What is no number sets the delay to 0 all the same.
-  if (wait == 0 && seconds != "0") refuse(delays);
+  if (!beginsWithNumber(seconds)) refuse(delays);
   if (!sharedSpecialPMU().setTime(wait / secondsInUnit)) return;
   _context.output.print("setwaitforstartupafterpowerfailure: %ld seconds\n", wait);
 }

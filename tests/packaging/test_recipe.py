@@ -35,7 +35,7 @@ DONE = [
     "settimezone Asia/Tokyo", "-setusingnetworktime on", "-setusingnetworktime OFF", "-setnetworktimeserver time.example.org",
     "-setsleep 30", "-setsleep never", "-setcomputersleep 0", "-setdisplaysleep Off", "-setharddisksleep 180",
     *(f"-set{switch} on" for switch in SWITCHES), "-setwakeonmodem off", "-setrestartfreeze on", "-setrestartfreeze off",
-    "-setwaitforstartupafterpowerfailure 60", "-setremotelogin on", "-setremotelogin off", "-setremotevelmarevents on",
+    "-setwaitforstartupafterpowerfailure 60", "-setwaitforstartupafterpowerfailure ' +00'", "-settime 9:9", "-setremotelogin on", "-setremotelogin off", "-setremotevelmarevents on",
     "-setremotevelmarevents off", "-setcomputername 'File Server, Second Floor'", "-setcomputername ''", "-setlocalsubnetname files",
     "-setkernelbootarchitecture i386", "-setkernelbootarchitecture x86_64", "-setstartupdisk " + FOLDER,
     "-setdisablekeyboardwhenenclosurelockisengaged yes", "-settime 9:9:9 -setdate 1:1:20", "-setremotelogin on -setremotelogin on",
@@ -47,7 +47,8 @@ NOT_TAKEN = [
     "-setcomputersleep soon", "-setdisplaysleep -1", "-setharddisksleep ''", "-setwakeonmodem yes", "-setrestartfreeze 1",
     "-setwaitforstartupafterpowerfailure 45", "-setremotelogin perhaps", "-setlocalsubnetname db_4",
     "-setkernelbootarchitecture sparc", "-setdisablekeyboardwhenenclosurelockisengaged maybe", "-setstartupdisk Nowhere",
-    "-settimezone Mars/Base -settimezone Etc/UTC", "",
+    "-settimezone Mars/Base -settimezone Etc/UTC", "", "-settime abc", "-settime 9:x", "-setdate 1:1:x",
+    "-setwaitforstartupafterpowerfailure soon",
 ]
 WHERE_ALL_IS_REFUSED = [
     "-settime 9:9:9", reports.RECIPE_SETS, "-setusingnetworktime on", "-setnetworktimeserver time.example", "-setsleep 30", "-setrestartfreeze on",

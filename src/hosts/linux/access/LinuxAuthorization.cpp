@@ -20,6 +20,8 @@ constexpr const char* action = "org.tavisk.manage";
 
 /// Polkit asks nobody outside a session of the login manager (loginctl(1)), at a terminal or not.
 Failure refusal(const Authorization& answer, bool isAtTerminal) {
+  if (answer.wasAsked)
+    return {"authorize", action, "polkit did not accept the password, or the question was dismissed"};
   if (!answer.isForTheAsking) return {"authorize", action, "polkit does not grant it to this user"};
   const std::string missing = isAtTerminal ? "this is no login session" : "there is no terminal to ask at";
   return {"authorize", action, "polkit asks for a password, and " + missing + ": sudo tavisk ..."};
@@ -61,10 +63,10 @@ void LinuxAdminAuthenticator::noteRefusal() {
 
 Result<void> LinuxAdminAuthenticator::authorizeChange() {
   if (_user == 0) return {};
-  return _decision ? *_decision : authorize();
+  return _refusal ? *_refusal : authorize();
 }
 
-/// What polkit could not be asked is not decided.
+/// What polkit could not be asked is not decided, and what it grants it may grant for some minutes.
 Result<void> LinuxAdminAuthenticator::authorize() {
   const auto bus = systemBusIfAny(_machine.services);
   if (!bus) return bus.failure();
@@ -80,9 +82,12 @@ Result<void> LinuxAdminAuthenticator::authorize() {
   const auto answer = checkAuthorization(**bus, action, asker);
   if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return {};
   if (!answer) return answer.failure();
-  if (answer->isGranted) keepTemporaryId(answer->temporaryId);
-  _decision = answer->isGranted ? Result<void>() : Result<void>(refusal(*answer, static_cast<bool>(asker)));
-  return *_decision;
+  if (!answer->isGranted) {
+    _refusal = refusal(*answer, static_cast<bool>(asker));
+    return *_refusal;
+  }
+  if (!answer->temporaryId.empty()) keepTemporaryId(answer->temporaryId);
+  return {};
 }
 
 /// Over a connection of its own: the main thread may be in the middle of a call on the usual one. What cannot be given

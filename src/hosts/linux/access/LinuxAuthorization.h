@@ -23,8 +23,8 @@ class LinuxUserDatabase final : public UserDatabase {
   std::optional<GroupId> groupNamed(const std::string& name) override;
 };
 
-/// Root is authorized as it is, and so is every administrator who only reads. Before the first change of anyone but
-/// root polkit is asked for the tool's own action, where there is polkit.
+/// Root is authorized as it is, and so is every administrator who only reads. Before each change of anyone but root
+/// polkit is asked for the tool's own action, where there is polkit.
 class LinuxAdminAuthenticator final : public AdminAuthenticator {
  public:
   /// `user` is the one whose rights this process has.
@@ -37,7 +37,8 @@ class LinuxAdminAuthenticator final : public AdminAuthenticator {
   /// An entry in the system log.
   void noteRefusal() override;
 
-  /// Whether the user may change this machine. Once polkit has answered, and the user with it, that counts for the run.
+  /// Whether the user may change this machine. A refusal counts for the run; a grant as long as polkit says, which then
+  /// asks the user nothing.
   Result<void> authorizeChange();
 
  private:
@@ -48,7 +49,7 @@ class LinuxAdminAuthenticator final : public AdminAuthenticator {
   LinuxMachine _machine;
   UserId _user;
   std::atomic<bool> _isAuthenticated = false;
-  std::optional<Result<void>> _decision;  ///< polkit's
+  std::optional<Failure> _refusal;  ///< polkit's
   std::mutex _mutex;
   std::string _temporaryId;  ///< guarded by the mutex
 };

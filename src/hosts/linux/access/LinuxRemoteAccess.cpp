@@ -3,6 +3,7 @@
 #include "hosts/linux/access/LinuxRemoteAccess.h"
 
 #include <algorithm>
+#include <set>
 #include <string_view>
 
 #include "base/Text.h"
@@ -30,13 +31,20 @@ std::vector<Daemon> openSshUnits() {
           {"sshd.socket", "", ""}};
 }
 
-Result<std::vector<std::string>> hostKeys(const SystemRoot& root) {
+using Paths = std::set<std::string>;
+
+/// Private keys, public ones, and what an interrupted maker leaves behind.
+Result<Paths> hostKeyFiles(const SystemRoot& root) {
   const auto names = orEmpty(root.list(sshFolder));
   if (!names) return names.failure();
-  std::vector<std::string> keys;
+  Paths files;
   for (const auto& name : *names)
-    if (name.starts_with("ssh_host_") && name.ends_with("_key")) keys.push_back(std::string(sshFolder) + "/" + name);
-  return keys;
+    if (name.starts_with("ssh_host_")) files.insert(std::string(sshFolder) + "/" + name);
+  return files;
+}
+
+bool hasKey(const Paths& files) {
+  return std::ranges::any_of(files, [](const std::string& file) { return file.ends_with("_key"); });
 }
 
 /// Whether the administrator keeps the keys elsewhere (sshd_config(5)).
@@ -55,9 +63,9 @@ Result<bool> needsNoHostKey(const SystemRoot& root) {
   auto isOpenSsh = root.isThere(sshProgram);
   if (!isOpenSsh) return isOpenSsh;
   if (!*isOpenSsh) return true;
-  const auto keys = hostKeys(root);
-  if (!keys) return keys.failure();
-  return keys->empty() ? namesHostKeys(root) : true;
+  const auto files = hostKeyFiles(root);
+  if (!files) return files.failure();
+  return hasKey(*files) ? true : namesHostKeys(root);
 }
 
 using Found = Setting<bool>::Found;
@@ -73,24 +81,18 @@ RemoteAccessState observedState(Setting<bool> setting, EffectSink& effects) {
   // What is off now may be on after a restart: without the one the other is no answer.
   setting.live = [&] { return isJust(false, live) && !stored ? stored : live; };
   setting.stored = [&] { return stored; };
-  if (!observe(setting, effects)) return RemoteAccessState::off;
+  const auto observed = observe(setting, effects);
   if (isJust(true, live) && isJust(true, stored)) return RemoteAccessState::on;
-  return isJust(false, live) && isJust(false, stored) ? RemoteAccessState::off : RemoteAccessState::partly;
+  if (observed && !(isJust(false, live) && isJust(false, stored))) return RemoteAccessState::partly;
+  const auto support = setting.supported();
+  if (support && *support) return RemoteAccessState::unsupported;
+  return support && observed ? RemoteAccessState::off : RemoteAccessState::unknown;
 }
 
 Result<bool> hasSettled(const DaemonGroup& daemons) {
   const auto changing = daemons.isChanging();
   if (!changing) return changing;
   return !*changing;
-}
-
-/// A service that its socket starts, which listens.
-bool isWaiting(const Daemon& member, const std::vector<Daemon>& running) {
-  constexpr std::string_view ending = ".service";
-  const std::string_view name = member.unit;
-  if (!name.ends_with(ending)) return false;
-  const auto socket = std::string(name.substr(0, name.size() - ending.size())) + ".socket";
-  return std::ranges::any_of(running, [&](const Daemon& other) { return other.unit == socket; });
 }
 
 }  // namespace
@@ -157,9 +159,7 @@ Result<bool> LinuxRemoteShellService::hasAny(Result<std::vector<Daemon>> (Daemon
 
 Result<void> LinuxRemoteShellService::store(bool enabled, Trace& trace) {
   if (enabled) {
-    const auto keys = ensureHostKeys();
-    if (!keys) return keys.failure();
-    for (const auto& key : *keys) trace.written.add(key);
+    if (auto keys = ensureHostKeys(trace); !keys) return keys;
   }
   return withServer<void>([&](const DaemonGroup& server) {
     return noting(trace.written, _machine.services.daemons(),
@@ -188,16 +188,21 @@ Result<void> LinuxRemoteShellService::apply(bool enabled, Trace& trace) {
   });
 }
 
-Result<std::vector<std::string>> LinuxRemoteShellService::ensureHostKeys() {
+Result<void> LinuxRemoteShellService::ensureHostKeys(Trace& trace) {
   constexpr const char* tried = "make host keys";
   const auto needsNone = needsNoHostKey(_machine.root);
   if (!needsNone) return needsNone.failure();
-  if (*needsNone) return std::vector<std::string>();
+  if (*needsNone) return {};
   if (auto failure = whyNeedsRoot(tried, sshFolder)) return *failure;
+  const auto before = hostKeyFiles(_machine.root);
+  if (!before) return before.failure();
   const auto made = runProgram(_machine.root, {keyMaker, "-A"}, _machine.runLoop);
+  const auto after = hostKeyFiles(_machine.root);
+  for (const auto& file : after.valueOr({}))
+    if (!before->contains(file)) trace.written.add(file);
   if (!made) return made.failure();
-  auto keys = hostKeys(_machine.root);
-  if (!keys || !keys->empty()) return keys;
+  if (!after) return after.failure();
+  if (hasKey(*after)) return {};
   return Failure{tried, keyMaker, "it reported success, but there is no key in /etc/ssh"};
 }
 
@@ -229,14 +234,10 @@ Support LinuxRemoteEventsService::supported() {
 Setting<bool>::Found LinuxRemoteEventsService::live() {
   const auto named = units();
   if (!named) return named.failure();
-  const auto running = named->running();
-  if (!running) return running.failure();
-  if (running->empty()) return false;
-  const auto isOn = [&](const Daemon& member) {
-    const auto isSame = [&](const Daemon& other) { return other.unit == std::string_view(member.unit); };
-    return std::ranges::any_of(*running, isSame) || isWaiting(member, *running);
-  };
-  return Reading<bool>(true, std::ranges::all_of(named->members(), isOn) ? "" : partlyOn);
+  const auto ready = named->ready();
+  if (!ready) return ready.failure();
+  if (ready->empty()) return false;
+  return Reading<bool>(true, ready->size() == named->members().size() ? "" : partlyOn);
 }
 
 Setting<bool>::Found LinuxRemoteEventsService::stored() {
@@ -245,8 +246,10 @@ Setting<bool>::Found LinuxRemoteEventsService::stored() {
   const auto starting = named->startingAtBoot();
   if (!starting) return starting.failure();
   if (starting->empty()) return false;
+  const auto stayingOff = named->stayingOffAtBoot();
+  if (!stayingOff) return stayingOff.failure();
   const bool startsFirst = starting->front().unit == std::string_view(named->members().front().unit);
-  return Reading<bool>(true, startsFirst ? "" : partlyOn);
+  return Reading<bool>(true, startsFirst && stayingOff->empty() ? "" : partlyOn);
 }
 
 Setting<bool> LinuxRemoteEventsService::remoteEvents() {

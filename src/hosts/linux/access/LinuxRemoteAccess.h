@@ -39,15 +39,15 @@ class LinuxRemoteShellService final : public RemoteShellService {
   Result<void> store(bool enabled, Trace& trace);
   Result<void> startAtBoot(const DaemonGroup& server);
   Result<void> apply(bool enabled, Trace& trace);
-  /// Where no host key is, a connection would be taken and dropped. The keys that were made.
-  Result<std::vector<std::string>> ensureHostKeys();
+  /// Where no host key is, a connection would be taken and dropped.
+  Result<void> ensureHostKeys(Trace& trace);
 
   LinuxMachine _machine;
 };
 
 /// The units that the administrator names for "remote-events"; without any there is nothing to switch. All of them are
-/// switched. A service whose socket is among them may wait for that one to start it. Of the others after a restart
-/// nothing is asked where the first one starts: what it brings with it is not enabled itself.
+/// switched. A service whose socket is among them may wait for that one to start it. After a restart it is on when the
+/// first one starts with the machine, and each other that can be enabled: what the first brings with it cannot.
 class LinuxRemoteEventsService final : public RemoteEventsService {
  public:
   explicit LinuxRemoteEventsService(const LinuxMachine& machine) : _machine(machine) {}
@@ -63,7 +63,7 @@ class LinuxRemoteEventsService final : public RemoteEventsService {
   Support supported();
   /// "partly on" when some run.
   Setting<bool>::Found live();
-  /// "partly on" when others than the first one will.
+  /// "partly on" when the first one will not, or another that could be enabled.
   Setting<bool>::Found stored();
 
   LinuxMachine _machine;

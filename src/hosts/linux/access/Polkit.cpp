@@ -72,7 +72,9 @@ Result<Authorization> check(Bus& bus, const char* action, bool asks) {
   answer.enter('r', "bba{ss}");
   const bool isGranted = answer.readBoolean();
   const bool isForTheAsking = answer.readBoolean();
-  return Authorization{isGranted, isForTheAsking, detail(answer, temporaryIdKey)};
+  // Where polkit finds nobody to ask through, it is for the asking still.
+  const bool wasAsked = asks && !isGranted && !isForTheAsking;
+  return Authorization{isGranted, isForTheAsking, wasAsked, detail(answer, temporaryIdKey)};
 }
 
 }  // namespace

@@ -18,6 +18,7 @@ namespace tavisk {
 struct Authorization {
   bool isGranted;
   bool isForTheAsking;      ///< not granted: the user would have to authenticate first
+  bool wasAsked;            ///< not granted: the user was asked to authenticate
   std::string temporaryId;  ///< empty when nothing has to be given back
 };
 

@@ -107,8 +107,8 @@ void LinuxClockService::setTime(std::int64_t secondsSince1970) {
     time.note = saying("without a hardware clock the machine forgets the time when it is off");
   }
   time.apply = [&](std::int64_t) {
-    asked.isNow();
     auto set = changeTime(asked);
+    asked.isSet();
     isSet = static_cast<bool>(set);
     return set;
   };
@@ -124,15 +124,16 @@ Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
     if (set) return {};
     if (!leavesItToOthers(set.failure())) return withAdvice(set.failure());
   }
-  return changeTimeDirectly(asked.seconds());
+  return changeTimeDirectly(asked);
 }
 
-Result<void> LinuxClockService::changeTimeDirectly(std::int64_t secondsSince1970) const {
+Result<void> LinuxClockService::changeTimeDirectly(const AskedTime& asked) const {
   if (const auto failure = whyNoClock()) return *failure;
   const auto hardware = HardwareClock::open(_machine.root);
   if (!hardware) return hardware.failure();
-  if (auto set = setSystemTime(secondsSince1970); !set) return set;
-  return *hardware ? (*hardware)->set(secondsSince1970) : Result<void>();
+  if (auto set = setSystemTime(asked.now()); !set) return set;
+  const auto seconds = std::chrono::floor<std::chrono::seconds>(asked.now());
+  return *hardware ? (*hardware)->set(seconds.count()) : Result<void>();
 }
 
 std::vector<ZoneName> LinuxClockService::knownTimeZones() {

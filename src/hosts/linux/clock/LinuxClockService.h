@@ -29,7 +29,7 @@ class LinuxClockService final : public ClockService {
   std::optional<Failure> whyNoClock() const;
   std::string whoCorrectsTheClock();
   Result<void> changeTime(const AskedTime& asked);
-  Result<void> changeTimeDirectly(std::int64_t secondsSince1970) const;
+  Result<void> changeTimeDirectly(const AskedTime& asked) const;
   Result<bool> goesBy(const ZoneName& zone);
   Result<bool> setZoneByDaemon(const ZoneName& zone);
   Result<void> moveLink(const ZoneName& zone);

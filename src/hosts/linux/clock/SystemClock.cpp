@@ -83,9 +83,11 @@ bool maySetSystemTime() {
   return (sets[CAP_TO_INDEX(CAP_SYS_TIME)].effective & CAP_TO_MASK(CAP_SYS_TIME)) != 0;
 }
 
-Result<void> setSystemTime(std::int64_t secondsSince1970) {
+Result<void> setSystemTime(std::chrono::microseconds since1970) {
+  const auto whole = std::chrono::floor<std::chrono::seconds>(since1970);
   timespec time{};
-  time.tv_sec = secondsSince1970;
+  time.tv_sec = whole.count();
+  time.tv_nsec = std::chrono::nanoseconds(since1970 - whole).count();
   if (::clock_settime(CLOCK_REALTIME, &time) != 0) return systemFailure("clock_settime", clockName, errno);
   return {};
 }
@@ -103,12 +105,15 @@ Result<std::optional<std::int64_t>> hardwareTime(const SystemRoot& root) {
 }
 
 std::chrono::microseconds AskedTime::sinceThen() const {
-  if (!_moment) return {};
-  return std::chrono::duration_cast<std::chrono::microseconds>(std::chrono::steady_clock::now() - *_moment);
+  return std::chrono::duration_cast<std::chrono::microseconds>(std::chrono::steady_clock::now() - _moment);
+}
+
+std::chrono::microseconds AskedTime::now() const {
+  return std::chrono::seconds(_seconds) + sinceThen();
 }
 
 std::int64_t AskedTime::microsecondsAhead() const {
-  return (std::chrono::seconds(_seconds) + sinceThen() - systemMicroseconds()).count();
+  return (now() - systemMicroseconds()).count();
 }
 
 std::int64_t AskedTime::onSystemClock() {
@@ -123,12 +128,11 @@ Result<std::optional<std::int64_t>> AskedTime::onHardwareClock(const SystemRoot&
 
 std::int64_t AskedTime::told(std::chrono::microseconds shown, std::chrono::seconds near,
                              std::optional<Look>& first) const {
-  const Look look{shown, std::chrono::steady_clock::now()};
-  if (!first) first = look;
   const auto then = shown - sinceThen();
-  if (_moment && std::chrono::abs(then - std::chrono::seconds(_seconds)) <= near) return _seconds;
-  const bool hasGoneOn = std::chrono::abs((look.shown - first->shown) - (look.at - first->at)) <= near;
-  return std::chrono::floor<std::chrono::seconds>(_moment && hasGoneOn ? first->shown : then).count();
+  if (!first) first = then;
+  if (_isSet && std::chrono::abs(then - std::chrono::seconds(_seconds)) <= near) return _seconds;
+  const bool hasGoneOn = _isSet && std::chrono::abs(then - *first) <= near;
+  return std::chrono::floor<std::chrono::seconds>(hasGoneOn ? *first : then).count();
 }
 
 Result<std::optional<HardwareClock>> HardwareClock::open(const SystemRoot& root) {

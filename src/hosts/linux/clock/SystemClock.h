@@ -24,7 +24,7 @@ std::optional<Failure> whyOutOfClockRange(std::int64_t secondsSince1970);
 bool maySetSystemTime();
 
 /// Sets the kernel's clock, of the whole machine.
-Result<void> setSystemTime(std::int64_t secondsSince1970);
+Result<void> setSystemTime(std::chrono::microseconds since1970);
 
 /// Where the machine keeps the time while it is off.
 inline constexpr const char* hardwareClock = "/dev/rtc0";
@@ -32,15 +32,18 @@ inline constexpr const char* hardwareClock = "/dev/rtc0";
 /// What the hardware clock says, in seconds since 1970 UTC whichever time it keeps; absent when the machine has none.
 Result<std::optional<std::int64_t>> hardwareTime(const SystemRoot& root);
 
-/// A time to which the clocks are set, and what they said at the moment from which it counts, however much later they
-/// are read. Once there is such a moment, what is as near as a clock is set and read is the time itself, and a clock
-/// that has only gone on says what it said at the first look.
+/// A time to which the clocks are set, asked for at the moment in which this object is made; and what they said at that
+/// moment, however much later they are read. From isSet() on, what is as near as a clock is set and read is the time
+/// itself, and a clock that has only gone on says what it said at the first look.
 class AskedTime {
  public:
   explicit AskedTime(std::int64_t secondsSince1970) : _seconds(secondsSince1970) {}
-  void isNow() { _moment = std::chrono::steady_clock::now(); }
+  /// The clocks have been set, or could not be.
+  void isSet() { _isSet = true; }
 
   std::int64_t seconds() const { return _seconds; }
+  /// Since 1970: the time, and what has passed since it was asked for.
+  std::chrono::microseconds now() const;
   /// By how much the system clock has to be put forward, or back.
   std::int64_t microsecondsAhead() const;
   std::int64_t onSystemClock();
@@ -48,16 +51,13 @@ class AskedTime {
   Result<std::optional<std::int64_t>> onHardwareClock(const SystemRoot& root);
 
  private:
-  using Moment = std::chrono::steady_clock::time_point;
-  struct Look {
-    std::chrono::microseconds shown;
-    Moment at;
-  };
+  using Look = std::chrono::microseconds;
   std::chrono::microseconds sinceThen() const;
   std::int64_t told(std::chrono::microseconds shown, std::chrono::seconds near, std::optional<Look>& first) const;
 
   std::int64_t _seconds;
-  std::optional<Moment> _moment;
+  std::chrono::steady_clock::time_point _moment = std::chrono::steady_clock::now();
+  bool _isSet = false;
   std::optional<Look> _system;    ///< the first at that clock
   std::optional<Look> _hardware;  ///< the first at that clock
 };

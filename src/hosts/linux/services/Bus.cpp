@@ -94,8 +94,9 @@ Result<std::unique_ptr<Bus>> Bus::open(const SystemdLibrary& library, const Syst
   sd_bus* handle = nullptr;
   if (const int result = library.sd_bus_new(&handle); result < 0) return systemFailure("sd_bus_new", socket, -result);
   std::unique_ptr<Bus> bus(new Bus(library, handle, kind, runLoop));
-  if (const int result = bus->start(*connection); result < 0)
-    return systemFailure("start the connection", socket, -result);
+  const int result = bus->start(*connection);
+  if (result == -ETIMEDOUT) return Failure{"start the connection", socket, "timed out before anything was asked"};
+  if (result < 0) return systemFailure("start the connection", socket, -result);
   return bus;
 }
 
@@ -167,7 +168,7 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
   arguments(request);
   if (const auto error = request.error()) return systemFailure(member, object.path, error.value());
   const auto left = timeFor(longest);
-  if (left.count() == 0) return systemFailure(member, object.path, ETIMEDOUT);
+  if (left.count() == 0) return Failure{member, object.path, "timed out before it was sent"};
   const auto question = isQuestion && _runLoop ? _runLoop->pauseLimit() : RunLoop::Registration();
 
   BusError error(_library);

@@ -55,8 +55,8 @@ class Bus {
 
   using Writer = std::function<void(BusMessage&)>;
   /// Calls and waits for the reply. The user is asked nothing meanwhile: a service that wants a password first refuses
-  /// (interactionRequired). One that has not answered in time is not asked again for a while: calls to it fail at once,
-  /// without the code timed_out: nothing was sent.
+  /// (interactionRequired). One that has not answered in time (timed_out) is not asked again for a while: calls to it
+  /// fail at once. They, and calls for which no time is left, fail without that code: nothing was sent.
   Result<BusMessage> call(const BusObject& object, const char* member, const char* replySignature,
                           const Writer& arguments, std::chrono::seconds longest = usualTime);
   template <typename... Arguments>

@@ -2,9 +2,33 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/services/Daemons.h"
 
+#include <algorithm>
+#include <string_view>
+
 #include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
+namespace {
+
+constexpr std::string_view socketEnding = ".socket";
+
+bool isSocket(const Daemon& daemon) {
+  return std::string_view(daemon.unit).ends_with(socketEnding);
+}
+
+/// Whether the one is the socket of the other (systemd.socket(5)).
+bool isSocketOf(const Daemon& socket, const Daemon& service) {
+  if (!isSocket(socket)) return false;
+  const std::string_view name = socket.unit;
+  return std::string(name.substr(0, name.size() - socketEnding.size())) + ".service" == service.unit;
+}
+
+std::vector<Daemon> socketsFirst(std::vector<Daemon> daemons) {
+  std::ranges::stable_partition(daemons, &isSocket);
+  return daemons;
+}
+
+}  // namespace
 
 Result<void> Daemons::checkMayStartAtBoot(const Daemon& daemon, bool start) {
   const auto forRoot = whyNeedsRoot(start ? "enable" : "disable", daemon.unit);
@@ -54,6 +78,27 @@ Result<std::vector<Daemon>> DaemonGroup::startingAtBoot() const {
   return those(&Daemons::startsAtBoot);
 }
 
+Result<std::vector<Daemon>> DaemonGroup::stayingOffAtBoot() const {
+  return those(&Daemons::staysOffAtBoot);
+}
+
+Result<std::vector<Daemon>> DaemonGroup::ready() const {
+  std::vector<Daemon> found;
+  for (const auto& member : _members) {
+    const auto is = isReady(member);
+    if (!is) return is.failure();
+    if (*is) found.push_back(member);
+  }
+  return found;
+}
+
+Result<bool> DaemonGroup::isReady(const Daemon& member) const {
+  auto runs = _daemons.isRunning(member);
+  if (!runs || *runs) return runs;
+  const auto socket = std::ranges::find_if(_members, [&](const Daemon& other) { return isSocketOf(other, member); });
+  return socket == _members.end() ? std::move(runs) : _daemons.isRunning(*socket);
+}
+
 Result<bool> DaemonGroup::isChanging() const {
   const auto changing = those(&Daemons::isChanging);
   if (!changing) return changing.failure();
@@ -73,18 +118,17 @@ Result<void> DaemonGroup::setAllStartAtBoot(bool start) const {
 }
 
 Result<void> DaemonGroup::startAll() const {
-  for (const auto& member : _members) {
-    const auto runs = _daemons.isRunning(member);
-    if (!runs) return runs.failure();
-    if (*runs) continue;
+  for (const auto& member : socketsFirst(_members)) {
+    const auto is = isReady(member);
+    if (!is) return is.failure();
+    if (*is) continue;
     if (auto started = _daemons.start(member); !started) return started;
   }
   return {};
 }
 
 Result<void> DaemonGroup::stopAll() const {
-  const std::vector<Daemon> backwards(_members.rbegin(), _members.rend());
-  for (const auto& member : backwards) {
+  for (const auto& member : socketsFirst({_members.rbegin(), _members.rend()})) {
     const auto runs = _daemons.isRunning(member);
     if (!runs) return runs.failure();
     if (!*runs) continue;

@@ -36,6 +36,8 @@ class Daemons {
   virtual Result<bool> startsAtBoot(const Daemon& daemon) = 0;
   /// Whether the machine was told to start it until it is started again, and no longer.
   virtual Result<bool> startsUntilRestart(const Daemon& daemon) = 0;
+  /// Whether it does not start at boot and could: what cannot be enabled, as what another brings with it, does neither.
+  virtual Result<bool> staysOffAtBoot(const Daemon& daemon) = 0;
   /// One after the other; the first failure ends it. Only root may; whoever is not is refused before anything changes.
   virtual Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) = 0;
   /// The links that setStartAtBoot() has made and removed since this was asked last.
@@ -81,17 +83,22 @@ class DaemonGroup {
   Result<DaemonGroup> present() const;
   Result<std::vector<Daemon>> running() const;
   Result<std::vector<Daemon>> startingAtBoot() const;
+  Result<std::vector<Daemon>> stayingOffAtBoot() const;
+  /// Those that run, and services that wait for their socket, a member that listens, to start them.
+  Result<std::vector<Daemon>> ready() const;
 
   /// Whether a member starts or stops at this moment.
   Result<bool> isChanging() const;
 
   /// Each member that is not so already; the first failure ends it.
   Result<void> setAllStartAtBoot(bool start) const;
+  /// Those that are not ready, sockets first: a socket is not started beside its running service.
   Result<void> startAll() const;
-  /// The last one first: a socket does not start its service again.
+  /// Sockets first, so that none starts its service again, and the last one first.
   Result<void> stopAll() const;
 
  private:
+  Result<bool> isReady(const Daemon& member) const;
   Result<std::vector<Daemon>> those(Result<bool> (Daemons::*are)(const Daemon&)) const;
 
   Daemons& _daemons;

@@ -82,6 +82,12 @@ Result<bool> InitScriptDaemons::startsAtBoot(const Daemon& daemon) {
   return hasLink(daemon, "S");
 }
 
+Result<bool> InitScriptDaemons::staysOffAtBoot(const Daemon& daemon) {
+  const auto starts = startsAtBoot(daemon);
+  if (!starts) return starts;
+  return !*starts;
+}
+
 Result<std::set<std::string>> InitScriptDaemons::linksTo(const Daemon& daemon) const {
   std::set<std::string> links;
   for (const char level : runLevels) {

@@ -141,6 +141,12 @@ Result<bool> UnitDaemons::startsUntilRestart(const Daemon& daemon) {
   return *state == enabledUntilRestart;
 }
 
+Result<bool> UnitDaemons::staysOffAtBoot(const Daemon& daemon) {
+  const auto state = fileState(daemon);
+  if (!state) return state.failure();
+  return *state == "disabled" || *state == enabledUntilRestart;
+}
+
 /// Reads the unit files once for all of them, also when one could not be changed.
 Result<void> UnitDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
   // There is no leave for single units: who may change one unit file may change all of them.

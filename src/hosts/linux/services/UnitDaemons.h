@@ -25,6 +25,7 @@ class UnitDaemons final : public Daemons {
   Result<bool> isChanging(const Daemon& daemon) override;
   Result<bool> startsAtBoot(const Daemon& daemon) override;
   Result<bool> startsUntilRestart(const Daemon& daemon) override;
+  Result<bool> staysOffAtBoot(const Daemon& daemon) override;
   Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) override;
   Result<void> start(const Daemon& daemon) override;
   Result<void> stop(const Daemon& daemon) override;

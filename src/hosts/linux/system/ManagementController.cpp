@@ -148,9 +148,10 @@ Result<void> IpmiDevice::open() {
 }
 
 Result<std::vector<std::uint8_t>> IpmiDevice::exchange(const ControllerRequest& request) {
-  if (RunLoop::Clock::now() < _silentUntil) return linkFailure(ETIMEDOUT);
+  // Not ETIMEDOUT: nothing was sent.
+  if (RunLoop::Clock::now() < _silentUntil) return linkFailure(ETIME);
   if (const auto opened = open(); !opened) return opened.failure();
-  if (_runLoop.timeFor(longestAnswer).count() == 0) return linkFailure(ETIMEDOUT);
+  if (_runLoop.timeFor(longestAnswer).count() == 0) return linkFailure(ETIME);
   if (const auto sent = send(_device, request); !sent) return sent.failure();
   Result<std::vector<std::uint8_t>> reply = linkFailure(EAGAIN);
   const auto watching = _runLoop.watch(_device.number(), RunLoop::Readiness::readable, [] {});

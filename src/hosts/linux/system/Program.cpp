@@ -88,7 +88,7 @@ struct EndedProgram {
 };
 
 Result<EndedProgram> runToEnd(const SystemRoot& root, const std::vector<std::string>& words, RunLoop& runLoop) {
-  if (runLoop.timeFor(longestRun).count() == 0) return outOfTime(words);
+  if (runLoop.timeFor(longestRun).count() == 0) return Failure{"run", words.front(), "timed out before it was begun"};
   // A file in memory, not a pipe: a daemon that the program leaves behind may keep it open.
   const FileDescriptor output(::memfd_create("output", MFD_CLOEXEC));
   if (!output) return systemFailure("memfd_create", words.front(), errno);

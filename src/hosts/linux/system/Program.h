@@ -48,8 +48,9 @@ class RunningProgram {
 
 /// Runs one of the machine's programs to its end, without a shell: `words` is its absolute path and its arguments. It
 /// gets an environment of its own (PATH and LC_ALL), no input, and unblocked signals. The run loop runs meanwhile.
-/// Fails when it cannot be started, when it has not ended after 10 s (timed_out; it is killed), and when its status is
-/// not 0: the reason is then the status and the last line that it printed. On success the value is what it printed.
+/// Fails when it cannot be started, when it has not ended after 10 s (timed_out; it is killed; without that code where
+/// no time was left to begin), and when its status is not 0: the reason is then the status and the last line that it
+/// printed. On success the value is what it printed.
 Result<std::string> runProgram(const SystemRoot& root, const std::vector<std::string>& words, RunLoop& runLoop);
 
 /// As runProgram(), but any status is an answer; one that is ended by a signal fails.

@@ -1,5 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
+#include <fcntl.h>
 #include <gmock/gmock.h>
 #include <systemd/sd-bus.h>
 
@@ -17,9 +18,9 @@ namespace {
 using testing::HasSubstr;
 using namespace std::chrono_literals;
 
-/// Grants everything at once, after a question, not at all, or never answers.
+/// Grants everything at once, after a question, not even then, not at all, or never answers.
 struct PolkitTree : LinuxTree {
-  enum class Answer { granted, question, refused, silence };
+  enum class Answer { granted, question, dismissed, refused, silence };
 
   int answerCall(sd_bus_message* call) {
     std::uint32_t mayAsk = 0;
@@ -31,7 +32,8 @@ struct PolkitTree : LinuxTree {
     }
     if (answer == Answer::silence) return 1;
     const int grants = answer == Answer::granted || (answer == Answer::question && mayAsk != 0) ? 1 : 0;
-    return sd_bus_reply_method_return(call, "(bba{ss})", grants, answer == Answer::question ? 1 - grants : 0, 1,
+    const bool isForTheAsking = answer == Answer::question ? grants == 0 : answer == Answer::dismissed && mayAsk == 0;
+    return sd_bus_reply_method_return(call, "(bba{ss})", grants, isForTheAsking ? 1 : 0, 1,
                                       "polkit.temporary_authorization_id", grants != 0 ? "tmp7" : "");
   }
   Bus& bus() { return **services.systemBus(); }
@@ -72,8 +74,8 @@ TEST(Polkit, AsksTheUserOnlyThroughAnAgent) {
 /// Changes by an administrator who is not root and has no terminal.
 struct ChangesByMember {
   ChangesByMember() { EXPECT_NE(std::freopen("/dev/null", "r", stdin), nullptr); }
-  Effect change() {
-    const auto limit = tree.runLoop.limitWaits(100ms);
+  Effect change(std::chrono::milliseconds longest = 100ms) {
+    const auto limit = tree.runLoop.limitWaits(longest);
     Setting<bool> setting;
     setting.store = [this](bool) {
       ++changes;
@@ -89,10 +91,10 @@ struct ChangesByMember {
   int changes = 0;
 };
 
-TEST(LinuxAdminAuthenticator, AsksPolkitOnceAndOnlyForAChange) {
+TEST(LinuxAdminAuthenticator, AsksPolkitForAChangeOnlyAndOnceWhereItRefuses) {
   using Answer = PolkitTree::Answer;
   const std::tuple<Answer, std::size_t, const char*> cases[] = {
-      {Answer::granted, 1, nullptr},
+      {Answer::granted, 2, nullptr},
       {Answer::question, 1, "there is no terminal to ask at: sudo tavisk"},
       {Answer::refused, 1, "does not grant it to this user"},
       {Answer::silence, 2, "timed out"},
@@ -110,6 +112,15 @@ TEST(LinuxAdminAuthenticator, AsksPolkitOnceAndOnlyForAChange) {
     }
     EXPECT_EQ(member.tree.callsSoFar().size(), asked);
   }
+}
+
+TEST(LinuxAdminAuthenticator, TellsThatTheUserWasAsked) {
+  ChangesByMember member;
+  const FileDescriptor terminal(::posix_openpt(O_RDWR | O_NOCTTY));
+  ASSERT_EQ(::dup2(terminal.number(), STDIN_FILENO), STDIN_FILENO);
+  member.tree.writeProgram("/usr/bin/pkttyagent", "#!/bin/sh\nexec sleep 60 3>&-");
+  member.tree.answer = PolkitTree::Answer::dismissed;
+  EXPECT_THAT(member.change(3s), FailedFor("did not accept the password"));
 }
 
 TEST(LinuxAdminAuthenticator, AsksBeforeTheMachineIsLocked) {

@@ -34,7 +34,8 @@ struct SshUnits : ManagedTree {
     write("/etc/ssh/ssh_host_rsa_key", "");
     write("/usr/sbin/sshd", "");
     write("/etc/tavisk/services.conf", "remote-events = events.socket events.service\n");
-    for (const char* unit : {"ssh.service", "ssh.socket", "events.socket", "events.service"}) manager.set(unit, {});
+    for (const char* unit : {"ssh.service", "ssh.socket", "events.socket"}) manager.set(unit, {});
+    manager.set("events.service", {.file = "static"});
   }
 };
 
@@ -130,6 +131,26 @@ TEST(RemoteAccess, IsNeitherOnNorOffAlreadyWhereNowAndLaterDiffer) {
   }
 }
 
+TEST(RemoteAccess, IsOffAlreadyOnlyWhereThatIsSeen) {
+  const std::tuple<const char*, std::string, std::string> runs[] = {
+      {"setremotelogin", "", "setremotelogin: remote login is already Off.\n"},
+      {"setremotevelmarevents", "setremotevelmarevents: Off\n",
+       "setremotevelmarevents: remote velmar events are already off.\n"},
+  };
+  for (const auto& [word, tried, already] : runs) {
+    SshUnits tree;
+    tree.makeUnreadable("/etc/tavisk/services.conf");
+    EXPECT_EQ(runTool(tree, {"-f", word, "off"}).output, tried);
+    EXPECT_THAT(tree.lastEffect(), FailedFor("symbolic links"));
+    EXPECT_EQ(tree.lastEffect().asked, "off");
+    std::filesystem::remove(tree.at("/etc/tavisk/services.conf"));
+    for (const char* unit : {"ssh.service", "ssh.socket"}) tree.manager.set(unit, {.load = "not-found"});
+    for (const char* unit : {"sshd.service", "sshd.socket"}) tree.manager.set(unit, {.load = "not-found"});
+    EXPECT_EQ(runTool(tree, {"-f", word, "off"}).output, already);
+    EXPECT_THAT(tree.lastEffect(), UnsupportedFor("find "));
+  }
+}
+
 TEST(RemoteLogin, LooksOnceMoreWhenItsTimeIsUp) {
   for (const auto& [state, why] : {std::pair{running, ""}, std::pair{"activating", "its job has not ended in time"}}) {
     SshUnits tree;
@@ -171,8 +192,10 @@ TEST(RemoteLogin, SaysWhatStandsAgainstIt) {
 }
 
 TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
-  const std::tuple<const char*, const char*, Outcome> cases[] = {
-      {"touch $root/etc/ssh/ssh_host_ed25519_key", "", Outcome::applied},
+  const std::string makes = "touch $root/etc/ssh/ssh_host_ed25519_key $root/etc/ssh/ssh_host_ed25519_key.pub";
+  const std::tuple<std::string, const char*, Outcome> cases[] = {
+      {makes, "", Outcome::applied},
+      {makes + "; false", "", Outcome::failed},
       {"true", "", Outcome::failed},
       {"false", "", Outcome::failed},
       {"false", "Port 22\n hostkey /srv/key\n", Outcome::applied},
@@ -182,11 +205,13 @@ TEST(RemoteLogin, MakesHostKeysWhereThereAreNone) {
     SshUnits tree;
     std::filesystem::remove(tree.at("/etc/ssh/ssh_host_rsa_key"));
     tree.write("/etc/ssh/sshd_config", config);
-    tree.writeProgram("/usr/bin/ssh-keygen", std::string("#!/bin/sh\nroot=${0%/usr/bin/ssh-keygen}\n") + maker);
+    tree.writeProgram("/usr/bin/ssh-keygen", "#!/bin/sh\nroot=${0%/usr/bin/ssh-keygen}\n" + maker);
     tree.host().remoteShell().setEnabled(true);
     EXPECT_EQ(tree.lastEffect().outcome, outcome) << maker << config;
-    const bool makesKey = tree.lastEffect().where.starts_with("/etc/ssh/ssh_host_ed25519_key, /etc/systemd/");
-    EXPECT_EQ(makesKey, std::string_view(maker).starts_with("touch"));
+    const std::string keys =
+        maker == "true" || maker == "false" ? "" : "/etc/ssh/ssh_host_ed25519_key, /etc/ssh/ssh_host_ed25519_key.pub";
+    const std::string links = outcome == Outcome::applied ? FakeServiceManager::linkOf("ssh.service") : "";
+    EXPECT_EQ(tree.lastEffect().where, keys + (keys.empty() || links.empty() ? "" : ", ") + links);
     EXPECT_EQ(tree.host().remoteShell().isEnabled(), outcome == Outcome::applied);
   }
 }
@@ -214,12 +239,27 @@ TEST(RemoteEvents, SwitchAllUnits) {
   events.setEnabled(true);
   EXPECT_EQ(tree.lastEffect().before, "partly on");
   tree.manager.set("events.service", {});
+  EXPECT_EQ(events.state(), RemoteAccessState::partly) << "it could be enabled";
+  tree.manager.set("events.service", {.file = "static"});
   EXPECT_EQ(events.state(), RemoteAccessState::on) << "its socket starts it";
   tree.manager.set("events.service", {.active = running, .file = "enabled"});
   events.setEnabled(false);
   EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles events.socket", "Reload", "StartUnit events.socket",
                                                 "DisableUnitFiles events.socket", "DisableUnitFiles events.service",
-                                                "Reload", "StopUnit events.service", "StopUnit events.socket"));
+                                                "Reload", "StopUnit events.socket", "StopUnit events.service"));
+}
+
+TEST(RemoteEvents, LeaveAServiceToItsSocket) {
+  SshUnits tree;
+  tree.write("/etc/tavisk/services.conf", "remote-events = events.service events.socket\n");
+  tree.manager.set("events.service", {.file = "enabled"});
+  tree.host().remoteEvents().setEnabled(true);
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
+  tree.manager.set("events.service", {.active = running});
+  tree.host().remoteEvents().setEnabled(false);
+  EXPECT_THAT(tree.manager.calls(), ElementsAre("EnableUnitFiles events.socket", "Reload", "StartUnit events.socket",
+                                                "DisableUnitFiles events.socket", "Reload", "StopUnit events.socket",
+                                                "StopUnit events.service"));
 }
 
 TEST(RemoteEvents, AreNotSupportedWithoutAllOfTheirUnits) {

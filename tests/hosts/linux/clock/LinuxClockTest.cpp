@@ -5,11 +5,13 @@
 #include <systemd/sd-bus.h>
 
 #include <atomic>
+#include <thread>
 
 #include "base/Calendar.h"
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/BusPeer.h"
 #include "hosts/linux/LinuxContractMachines.h"
+#include "hosts/linux/clock/LinuxClockService.h"
 #include "hosts/linux/clock/LocalTime.h"
 #include "hosts/linux/clock/SystemClock.h"
 
@@ -226,6 +228,32 @@ TEST(LinuxClock, ReadsTheHardwareClockInTheTimeThatItKeeps) {
   EXPECT_FALSE(hardwareTime(tree.root));
 }
 
+TEST(LinuxClock, CountsFromTheMomentInWhichItIsAsked) {
+  using std::chrono::microseconds;
+  LinuxTree tree;
+  tree.write("/run/systemd/system/x", "");
+  std::atomic<std::int64_t> ahead = 0;
+  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+    if (member == "Get") return sd_bus_reply_method_return(call, "v", "b", 0);
+    std::int64_t number = 0;
+    sd_bus_message_read_basic(call, 'x', &number);
+    ahead = number;
+    return sd_bus_reply_method_return(call, "");
+  });
+  const auto answerLate = [] {
+    std::this_thread::sleep_for(std::chrono::milliseconds(500));
+    return Result<void>();
+  };
+  const LinuxMachine machine{tree.root, tree.effects, tree.runLoop, tree.services, answerLate};
+  const std::chrono::seconds asked(systemTime() + 1000);
+  const auto begun = std::chrono::system_clock::now().time_since_epoch();
+  LinuxClockService(machine).setTime(asked.count());
+  EXPECT_LT(std::chrono::abs(microseconds(ahead) - (asked - begun)), std::chrono::milliseconds(300));
+  AskedTime direct(asked.count());
+  EXPECT_TRUE(answerLate());
+  EXPECT_GE(direct.now() - asked, std::chrono::milliseconds(500));
+}
+
 TEST(AskedTime, IsWhatTheClocksSayWhenTheyAreNear) {
   LinuxTree tree;
   const auto now = systemTime();
@@ -233,7 +261,7 @@ TEST(AskedTime, IsWhatTheClocksSayWhenTheyAreNear) {
   EXPECT_NE(AskedTime(now - 1).onSystemClock(), now - 1) << "nothing was set yet";
   for (const auto& [ahead, system, hardware] : {std::tuple(0, true, true), {1, true, true}, {4, false, false}}) {
     AskedTime asked(now + ahead);
-    asked.isNow();
+    asked.isSet();
     EXPECT_EQ(asked.onSystemClock() == now + ahead, system) << ahead;
     EXPECT_EQ(*asked.onHardwareClock(tree.root) == now + ahead, hardware) << ahead;
   }

@@ -7,6 +7,7 @@
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/LinuxContractMachines.h"
 #include "hosts/linux/services/ServicesConfig.h"
+#include "hosts/linux/system/Program.h"
 
 namespace tavisk {
 namespace {
@@ -74,6 +75,16 @@ TEST_F(ManagedDaemons, HaveDoneAJobThatEndedSo) {
     const auto done = (daemons.*method)(daemon);
     ASSERT_FALSE(done);
     EXPECT_EQ(done.failure().why, "its job ended with: dependency");
+  }
+}
+
+TEST_F(ManagedDaemons, HaveNotBegunWhatNoTimeWasLeftFor) {
+  EXPECT_TRUE(daemons.isRunning(daemon)) << "connects";
+  const auto limit = tree.runLoop.limitWaits(std::chrono::milliseconds(0));
+  const auto run = runProgram(tree.root, {"/usr/bin/true"}, tree.runLoop);
+  for (const auto& failure : {daemons.start(daemon).failure(), run.failure()}) {
+    EXPECT_THAT(failure.why, HasSubstr("timed out before it was"));
+    EXPECT_FALSE(failure.code) << "nothing of it can come about";
   }
 }
 
