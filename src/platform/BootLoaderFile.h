@@ -5,6 +5,7 @@
 #include <optional>
 
 #include "base/PropertyList.h"
+#include "base/Result.h"
 
 namespace tavisk {
 
@@ -17,8 +18,9 @@ class BootLoaderFile {
   /// The processor architecture in which the kernel is started, a string; absent: as the system decides.
   static constexpr const char* architectureKey = "Kernel Architecture";
 
-  /// Absent when it is missing, cannot be read or is no property-list dictionary.
-  virtual std::optional<PropertyList::Dictionary> read() = 0;
+  /// Absent when it is missing; a failure, of which the effects know, when it cannot be read or is no property-list
+  /// dictionary.
+  virtual Result<std::optional<PropertyList::Dictionary>> read() = 0;
   /// Gives the file the architecture of the contents, or takes it out; what else the file holds at that moment stays,
   /// and what it lacks of the contents is added. The file is replaced whole, or made with its folders. One that read()
   /// cannot understand is kept beside it as NAME.damaged first; one that cannot be read is left alone. Whether it was

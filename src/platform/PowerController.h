@@ -27,7 +27,7 @@ class PowerController {
     Service service;
   };
 
-  /// Whether the registry can be asked at all.
+  /// Whether the registry can be asked at all. Why not is told by what follows without a service.
   virtual ControllerStatus masterPort() = 0;
   /// The first service of the class; absent when there is none, or that cannot be found out, which is told by what
   /// follows: numberProperty() or open().

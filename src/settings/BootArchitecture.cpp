@@ -16,26 +16,27 @@ void tellWhetherSaved(Output& output, bool isSaved) {
 
 void chooseArchitecture(const CommandContext& context, const std::string& architecture) {
   auto& file = context.host.bootLoaderFile();
-  auto settings = file.read().value_or(Properties());
+  auto settings = file.read().valueOr(std::nullopt).value_or(Properties());
   settings.set(BootLoaderFile::architectureKey, architecture);
   context.output.print("setting kernel architecture to: %s\n", architecture.c_str());
   tellWhetherSaved(context.output, file.write(settings));
 }
 
-/// Whether there was a file to take the architecture out of; none is made for that.
+/// False when there is no file to take the architecture out of; none is made for that.
 bool chooseDefaultArchitecture(const CommandContext& context) {
   auto& file = context.host.bootLoaderFile();
-  auto settings = file.read();
+  const auto found = file.read();
+  auto settings = found.valueOr(std::nullopt);
   if (settings) settings->remove(BootLoaderFile::architectureKey);
   context.output.putLine("setting kernel architecture to default");
   tellWhetherSaved(context.output, settings && file.write(*settings));
-  return settings.has_value();
+  return !found || *found;
 }
 
 }  // namespace
 
 void ServerCommands::getKernelBootArchitectureSetting() {
-  const auto settings = _context.host.bootLoaderFile().read();
+  const auto settings = _context.host.bootLoaderFile().read().valueOr(std::nullopt);
   const auto* value = settings ? settings->find(BootLoaderFile::architectureKey) : nullptr;
   if (value) {
     _context.output.print("kernel architecture is set to: %s\n", plainText(*value).c_str());

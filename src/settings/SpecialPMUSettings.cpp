@@ -45,7 +45,8 @@ std::optional<PowerController::Service> SpecialPMUSettings::getServerIDInterface
 }
 
 std::int64_t SpecialPMUSettings::getServerIDValue() {
-  return hasMasterPort() ? _controller.numberProperty(getServerIDInterface(), serverID).value_or(0) : 0;
+  const auto service = hasMasterPort() ? getServerIDInterface() : std::nullopt;
+  return _controller.numberProperty(service, serverID).value_or(0);
 }
 
 bool SpecialPMUSettings::setServerIDValue(std::int64_t asked) {

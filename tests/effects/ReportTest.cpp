@@ -7,6 +7,7 @@
 
 #include "ToolRun.h"
 #include "effects/Report.h"
+#include "platform/BootLoaderFile.h"
 
 namespace tavisk {
 namespace {
@@ -84,6 +85,12 @@ TEST_F(ReportTest, tellsEachArgumentThatIsNotTaken) {
   const auto objects = run(words);
   EXPECT_EQ(objects.size(), std::size(refused));
   EXPECT_THAT(objects, ::testing::Each(HasSubstr(R"(,"refused":")")));
+}
+
+TEST_F(ReportTest, tellsThatAFileCannotBeReadInsteadOfARefusal) {
+  machine.writeFile(BootLoaderFile::path, "damaged");
+  EXPECT_THAT(run({"-setkernelbootarchitecture", "default"}).back(),
+              ::testing::AllOf(HasSubstr(R"("outcome":"failed")"), ::testing::Not(HasSubstr("refused"))));
 }
 
 TEST_F(ReportTest, tellsARefusalToRun) {

@@ -21,10 +21,10 @@ struct BootLoaderFileContract : testing::Test {
 TYPED_TEST_SUITE_P(BootLoaderFileContract);
 
 TYPED_TEST_P(BootLoaderFileContract, readsBackWhatWasWritten) {
-  EXPECT_FALSE(this->machine.service().read());
+  EXPECT_EQ(*this->machine.service().read(), std::nullopt);
   for (int times = 0; times < 2; ++times) {
     EXPECT_TRUE(this->machine.service().write(this->contents));
-    EXPECT_EQ(this->machine.service().read(), this->contents);
+    EXPECT_EQ(*this->machine.service().read(), this->contents);
   }
 }
 
@@ -33,7 +33,7 @@ TYPED_TEST_P(BootLoaderFileContract, keepsBesideWhatItDoesNotUnderstand) {
     this->machine.put(this->path, damaged);
     EXPECT_FALSE(this->machine.service().read());
     EXPECT_TRUE(this->machine.service().write(this->contents));
-    EXPECT_EQ(this->machine.service().read(), this->contents);
+    EXPECT_EQ(*this->machine.service().read(), this->contents);
     EXPECT_EQ(this->machine.file(this->path + ".damaged"), damaged);
   }
 }

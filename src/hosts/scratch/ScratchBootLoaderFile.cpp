@@ -6,10 +6,11 @@
 
 namespace tavisk {
 
-std::optional<PropertyList::Dictionary> ScratchBootLoaderFile::read() {
-  const auto contents = _file.read();
-  if (!_settings.observe(kernelArchitecture(contents))) return std::nullopt;
-  return contents.valueOr(std::nullopt);
+Result<std::optional<PropertyList::Dictionary>> ScratchBootLoaderFile::read() {
+  auto contents = _file.read();
+  const bool isTold = _settings.observe(kernelArchitecture(contents)).has_value();
+  if (contents && !isTold) return Failure{"read", path, "the machine refuses it"};
+  return contents;
 }
 
 bool ScratchBootLoaderFile::write(const PropertyList::Dictionary& contents) {

@@ -14,7 +14,7 @@ class ScratchBootLoaderFile final : public BootLoaderFile {
   ScratchBootLoaderFile(const SystemRoot& root, const MachineFile& machine, MachineSettings& settings)
       : _file(root, path), _machine(machine), _settings(settings) {}
 
-  std::optional<PropertyList::Dictionary> read() override;
+  Result<std::optional<PropertyList::Dictionary>> read() override;
   bool write(const PropertyList::Dictionary& contents) override;
 
  private:

@@ -36,7 +36,11 @@ MachineSetting<std::int64_t> delayOf(const PowerController::Service& service, co
 }  // namespace
 
 ControllerStatus ScratchPowerController::masterPort() {
-  return checked(_settings.section(registry).integer("Master Port Status"), "open", "the device registry");
+  return _settings.section(registry).integer("Master Port Status");
+}
+
+bool ScratchPowerController::isRegistryOpen() {
+  return checked(masterPort(), "open", "the device registry") == 0;
 }
 
 std::optional<PowerController::Service> ScratchPowerController::serviceOfClass(const std::string& className) {
@@ -47,14 +51,14 @@ std::optional<PowerController::Service> ScratchPowerController::serviceOfClass(c
 std::optional<std::int64_t> ScratchPowerController::numberProperty(const std::optional<Service>& service,
                                                                    const std::string& property) {
   if (service) return _settings.read(delayOf(*service, property));
-  _settings.observeUnsupported(setting::startupDelay);
+  if (isRegistryOpen()) _settings.observeUnsupported(setting::startupDelay);
   return std::nullopt;
 }
 
 std::pair<ControllerStatus, PowerController::Connection> ScratchPowerController::open(
     const std::optional<Service>& service, std::uint32_t /*connectionType*/) {
   if (!service) {
-    _settings.recordUnsupported(setting::startupDelay);
+    if (isRegistryOpen()) _settings.recordUnsupported(setting::startupDelay);
     return {noSuchDevice, {}};
   }
   return {checked(section(*service).integer("Open Status"), "open", service->name), {*service}};

@@ -24,6 +24,8 @@ class ScratchPowerController final : public PowerController {
   ControllerStatus close(const Connection& connection) override;
 
  private:
+  /// A failure goes to the effects.
+  bool isRegistryOpen();
   MachineSection section(const Service& service);
   /// Tells the effects unless the status is success.
   ControllerStatus checked(ControllerStatus status, const char* tried, const std::string& on);

@@ -227,7 +227,7 @@ TEST_F(MachineFileTest, losesNothingBetweenTwoProcesses) {
     EXPECT_EQ(status, 0);
   }
   EXPECT_EQ(machine.get("Counts", "One"), PropertyList(2 * changes));
-  EXPECT_EQ(machine.host().bootLoaderFile().read()->size(), 2U * changes);
+  EXPECT_EQ((*machine.host().bootLoaderFile().read())->size(), 2U * changes);
 }
 
 TEST_F(MachineFileTest, isWholeWheneverItsWriterIsKilled) {

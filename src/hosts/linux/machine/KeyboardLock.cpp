@@ -155,7 +155,8 @@ Result<bool> EnclosureLock::isEngaged() {
 }
 
 void EnclosureLock::setDisablesKeyboard(bool disables, const MachineHold& held) {
-  const auto engaged = isEngaged();
+  // The controller may take seconds to answer.
+  const auto engaged = held ? isEngaged() : Result<bool>(held.failure());
   const auto found = keyboards(_machine.root);
   const auto asked = disables && engaged.valueOr(false) ? KeyboardState::disabled : KeyboardState::enabled;
   auto setting = keyboardsUnder(engaged, found, _machine.root);

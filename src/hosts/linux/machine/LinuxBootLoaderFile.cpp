@@ -7,10 +7,10 @@
 
 namespace tavisk {
 
-std::optional<PropertyList::Dictionary> LinuxBootLoaderFile::read() {
-  const auto contents = _file.read();
+Result<std::optional<PropertyList::Dictionary>> LinuxBootLoaderFile::read() {
+  auto contents = _file.read();
   static_cast<void>(observe(kernelArchitecture(contents), _machine.effects));
-  return contents.valueOr(std::nullopt);
+  return contents;
 }
 
 bool LinuxBootLoaderFile::write(const PropertyList::Dictionary& contents) {

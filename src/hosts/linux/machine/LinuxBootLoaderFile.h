@@ -13,7 +13,7 @@ class LinuxBootLoaderFile final : public BootLoaderFile {
  public:
   explicit LinuxBootLoaderFile(const LinuxMachine& machine) : _machine(machine), _file(machine.root, path) {}
 
-  std::optional<PropertyList::Dictionary> read() override;
+  Result<std::optional<PropertyList::Dictionary>> read() override;
   bool write(const PropertyList::Dictionary& contents) override;
 
  private:

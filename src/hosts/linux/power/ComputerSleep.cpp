@@ -26,16 +26,25 @@ constexpr const char* actionTime = "IdleActionSec";
 constexpr const char* powerKey = "HandlePowerKey";
 constexpr std::chrono::milliseconds betweenQuestions{20};
 constexpr std::chrono::seconds longestRestart{3};
-constexpr std::chrono::minutes withoutTime{30};
+constexpr std::optional<std::chrono::microseconds> withoutTime = std::chrono::minutes(30);
 
 bool isSleep(const std::string& word) {
   constexpr std::string_view words[] = {"sleep", "suspend", "hibernate", "hybrid-sleep", "suspend-then-hibernate"};
   return std::ranges::find(words, word) != std::end(words);
 }
 
-Minutes minutesOf(const std::string& word, const std::optional<std::string>& time) {
-  if (!isSleep(word)) return {};
-  return Minutes::covering(time ? timeSpan(*time).value_or(withoutTime) : withoutTime);
+/// Absent when it is no length of time.
+std::optional<Minutes> minutesIn(const std::string& time) {
+  const auto span = time.empty() ? withoutTime : timeSpan(time);
+  if (!span) return std::nullopt;
+  return *span == endlessTime ? Minutes{} : Minutes::covering(*span);
+}
+
+Result<Minutes> minutesOf(const std::string& word, const SystemdConfig::Assignment& time) {
+  if (!isSleep(word)) return Minutes{};
+  const auto minutes = minutesIn(time.value);
+  if (!minutes) return Failure{"read " + std::string(actionTime), time.file, "no length of time: " + time.value};
+  return *minutes;
 }
 
 /// Whether the service was not there, or has gone away before it could answer (sd_bus_error_get_errno(3)): the errors
@@ -75,7 +84,7 @@ Result<BusMessage> ComputerSleep::ask(const Question& question) {
     return answer || !isAway(answer.failure());
   };
   static_cast<void>(_machine.runLoop.runUntil(RunLoop::Clock::now() + longestRestart, isBack));
-  if (!answer) return first;
+  if (!answer && isAway(answer.failure())) return first;
   return answer;
 }
 
@@ -105,7 +114,7 @@ Result<Minutes> ComputerSleep::storedMinutes() const {
   if (!word) return word.failure();
   const auto time = _config.last(section, actionTime);
   if (!time) return time.failure();
-  return minutesOf(*word ? (*word)->value : "", *time ? std::optional((*time)->value) : std::nullopt);
+  return minutesOf(*word ? (*word)->value : "", time->value_or(SystemdConfig::Assignment{}));
 }
 
 Result<std::optional<Minutes>> ComputerSleep::ownMinutes() const {
@@ -113,7 +122,10 @@ Result<std::optional<Minutes>> ComputerSleep::ownMinutes() const {
   if (!word) return word.failure();
   const auto time = _config.own(section, actionTime);
   if (!time) return time.failure();
-  return *word ? std::optional(minutesOf(**word, *time)) : std::nullopt;
+  if (!*word) return std::nullopt;
+  const auto minutes = minutesOf(**word, {_ownFile.path(), time->value_or("")});
+  if (!minutes) return minutes.failure();
+  return std::optional(*minutes);
 }
 
 Result<bool> ComputerSleep::storedButton() const {
@@ -136,8 +148,7 @@ Support ComputerSleep::sleepSupported() {
   if (!bus && isAbsent(bus.failure())) return NotSupported{bus.failure()};
   if (!bus) return bus.failure();
   auto answer = ask([](Bus& asked) { return asked.call(loginManager(), tried, "s"); });
-  if (!answer && answer.failure().code == BusErrorCode::serviceUnknown) return NotSupported{answer.failure()};
-  if (!answer) return answer.failure();
+  if (!answer) return supportWithoutAnswer(answer.failure());
   if (std::move(answer).value().readText() == "na")
     return NotSupported{{tried, loginManager().service, "this machine cannot sleep"}};
   // The service would take the setting and refuse to act by it.
@@ -145,6 +156,14 @@ Support ComputerSleep::sleepSupported() {
   if (!presence) return presence.failure();
   if (*presence != Daemons::Presence::masked) return std::nullopt;
   return NotSupported{{tried, sleepTarget.unit, "it is masked: this machine is kept from sleeping"}};
+}
+
+/// A service that is masked never comes, which is asked only when it has not answered: it may run still.
+Support ComputerSleep::supportWithoutAnswer(const Failure& failure) {
+  if (failure.code == BusErrorCode::serviceUnknown) return NotSupported{failure};
+  const auto presence = _machine.services.daemons().presence(loginDaemon);
+  if (!presence || *presence != Daemons::Presence::masked) return failure;
+  return NotSupported{{failure.tried, loginDaemon.unit, "it is masked: nothing lets this machine sleep"}};
 }
 
 Support ComputerSleep::buttonSupported() {
@@ -176,17 +195,24 @@ std::string ComputerSleep::whatBlocksSleep() {
   return names;
 }
 
-std::string ComputerSleep::whatHides(const std::vector<std::string>& keys) const {
-  return _config.whatHides(section, keys).valueOr("");
+std::string ComputerSleep::whatHidesMinutes(Minutes asked) const {
+  const auto isAction = [asked](const std::string& word) { return isSleep(word) != asked.isNever(); };
+  auto file = _config.whatHides(section, action, isAction).valueOr("");
+  if (!file.empty() || asked.isNever()) return file;
+  return _config.whatHides(section, actionTime, [asked](const auto& time) { return minutesIn(time) == asked; })
+      .valueOr("");
+}
+
+std::string ComputerSleep::whatHidesButton(bool sleeps) const {
+  return _config.whatHides(section, powerKey, [sleeps](const auto& word) { return isSleep(word) == sleeps; })
+      .valueOr("");
 }
 
 Result<void> ComputerSleep::store(const std::map<std::string, std::string>& values,
-                                  const std::function<Result<bool>()>& isHeeded) {
-  std::vector<std::string> keys;
-  for (const auto& [key, value] : values) keys.push_back(key);
-  return _ownFile.changeIfHeeded({.write = [&] { return _config.setOwn(section, values); },
-                                  .isHeeded = isHeeded,
-                                  .hidingFile = [&] { return whatHides(keys); }});
+                                  const std::function<Result<bool>()>& isHeeded,
+                                  const std::function<std::string()>& hidingFile) {
+  return _ownFile.changeIfHeeded(
+      {.write = [&] { return _config.setOwn(section, values); }, .isHeeded = isHeeded, .hidingFile = hidingFile});
 }
 
 Result<void> ComputerSleep::storeMinutes(Minutes asked) {
@@ -195,8 +221,9 @@ Result<void> ComputerSleep::storeMinutes(Minutes asked) {
     if (!minutes) return minutes.failure();
     return *minutes == asked;
   };
-  if (asked.isNever()) return store({{action, "ignore"}}, isHeeded);
-  return store({{action, "suspend"}, {actionTime, textOf(asked) + "min"}}, isHeeded);
+  const auto hidingFile = [&] { return whatHidesMinutes(asked); };
+  if (asked.isNever()) return store({{action, "ignore"}}, isHeeded, hidingFile);
+  return store({{action, "suspend"}, {actionTime, textOf(asked) + "min"}}, isHeeded, hidingFile);
 }
 
 Result<void> ComputerSleep::storeButton(bool sleeps) {
@@ -205,12 +232,12 @@ Result<void> ComputerSleep::storeButton(bool sleeps) {
     if (!sleepsThen) return sleepsThen.failure();
     return *sleepsThen == sleeps;
   };
-  return store({{powerKey, sleeps ? "suspend" : "poweroff"}}, isHeeded);
+  return store({{powerKey, sleeps ? "suspend" : "poweroff"}}, isHeeded, [&] { return whatHidesButton(sleeps); });
 }
 
-std::string ComputerSleep::whoUndoesMinutes() {
-  const auto file = whatHides({action, actionTime});
-  return file.empty() ? whatBlocksSleep() : file;
+std::string ComputerSleep::whoUndoesMinutes(Minutes asked) {
+  const auto file = whatHidesMinutes(asked);
+  return file.empty() && !asked.isNever() ? whatBlocksSleep() : file;
 }
 
 /// The service looks at the time only when it starts: with its configuration read again it would tell the new value and
@@ -259,8 +286,7 @@ Setting<Minutes> ComputerSleep::computerSleep() {
   Setting<Minutes> setting;
   setting.name = setting::computerSleep;
   setting.unit = "minutes";
-  setting.where = _config.ownDropIn();
-  setting.undoneBy = [this](Minutes) { return whoUndoesMinutes(); };
+  setting.undoneBy = [this](Minutes asked) { return whoUndoesMinutes(asked); };
   setting.note = [](Minutes asked) -> std::string {
     if (asked.isNever()) return "";
     return warning("a machine on which nobody is logged in counts as idle, however busy its services are");
@@ -268,7 +294,7 @@ Setting<Minutes> ComputerSleep::computerSleep() {
   setting.supported = [this] { return sleepSupported(); };
   setting.live = [this] { return liveMinutes(); };
   setting.stored = [this] { return besideOwn(storedMinutes(), ownMinutes(), _ownFile.path()); };
-  setting.store = [this](Minutes asked) { return storeMinutes(asked); };
+  keepIn(_ownFile, setting, [this](Minutes asked) { return storeMinutes(asked); });
   setting.apply = [this](Minutes asked) { return restartService(asked); };
   return setting;
 }
@@ -276,12 +302,11 @@ Setting<Minutes> ComputerSleep::computerSleep() {
 Setting<bool> ComputerSleep::powerButtonSleep() {
   Setting<bool> setting;
   setting.name = setting::powerButtonSleep;
-  setting.where = _config.ownDropIn();
-  setting.undoneBy = [this](bool) { return whatHides({powerKey}); };
+  setting.undoneBy = [this](bool sleeps) { return whatHidesButton(sleeps); };
   setting.supported = [this] { return buttonSupported(); };
   setting.live = [this] { return liveButton(); };
   setting.stored = [this] { return besideOwn(storedButton(), ownButton(), _ownFile.path()); };
-  setting.store = [this](bool sleeps) { return storeButton(sleeps); };
+  keepIn(_ownFile, setting, [this](bool sleeps) { return storeButton(sleeps); });
   setting.apply = [this](bool) { return applyButton(); };
   setting.settled = onceButtonReads();
   return setting;

@@ -35,13 +35,17 @@ class ComputerSleep {
   Result<bool> storedButton() const;
   Result<std::optional<bool>> ownButton() const;
   Support sleepSupported();
+  Support supportWithoutAnswer(const Failure& failure);
   Support buttonSupported();
   std::string whatBlocksSleep();
-  std::string whatHides(const std::vector<std::string>& keys) const;
-  Result<void> store(const std::map<std::string, std::string>& values, const std::function<Result<bool>()>& isHeeded);
+  /// The file that says otherwise; empty: none does.
+  std::string whatHidesMinutes(Minutes asked) const;
+  std::string whatHidesButton(bool sleeps) const;
+  Result<void> store(const std::map<std::string, std::string>& values, const std::function<Result<bool>()>& isHeeded,
+                     const std::function<std::string()>& hidingFile);
   Result<void> storeMinutes(Minutes asked);
   Result<void> storeButton(bool sleeps);
-  std::string whoUndoesMinutes();
+  std::string whoUndoesMinutes(Minutes asked);
   Result<void> restartService(Minutes asked);
   Result<void> applyButton();
   Result<void> rereadConfiguration();

@@ -83,7 +83,7 @@ Result<std::optional<Reading<Value>>> readingOfAll(Result<std::vector<DeviceValu
   if (values.back().value == greatest) return greatest;
   std::string detail;
   for (const auto& [device, value] : values)
-    detail += (detail.empty() ? "" : ", ") + (value ? textOf(*value) : "") + " on " + device;
+    detail += (detail.empty() ? "" : ", ") + (value ? textOf(*value) : "nothing") + " on " + device;
   return Reading<Value>(greatest, std::move(detail));
 }
 

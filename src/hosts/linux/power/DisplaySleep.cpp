@@ -127,9 +127,8 @@ Setting<Minutes> DisplaySleep::displaySleep() const {
   setting.apply = [this](Minutes asked) { return _console.write("\033[9;" + textOf(limited(asked)) + "]"); };
   setting.liveFor = limited;
   if (!_machine.services.hasServiceManager()) return setting;
-  setting.where = _file.path();
   setting.stored = [this] { return besideOwn(storedMinutes(), ownMinutes(), _file.path()); };
-  setting.store = [this](Minutes asked) { return store(asked); };
+  keepIn(_file, setting, [this](Minutes asked) { return store(asked); });
   return setting;
 }
 

@@ -41,6 +41,12 @@ Support supportAfter(const Failure& failure) {
   return failure;
 }
 
+/// A board may lack a command of its maker. Of another failure it is not said whether it does.
+Support supportBy(const Result<std::int64_t>& delay) {
+  if (!delay && cannotHave(delay.failure())) return NotSupported{delay.failure()};
+  return std::nullopt;
+}
+
 Failure invalid(const char* tried, const char* why) {
   return {tried, managementController, why, std::make_error_code(std::errc::invalid_argument)};
 }
@@ -57,8 +63,8 @@ ControllerStatus LinuxPowerController::recorded(const Failure& failure) {
 
 ControllerStatus LinuxPowerController::masterPort() {
   const auto there = _machine.root.isThere(deviceClass);
-  if (!there) return recorded(there.failure());
-  return *there ? 0 : recorded(systemFailure("look at the devices", deviceClass, ENODEV));
+  if (!there) return statusOf(there.failure(), EIO);
+  return *there ? 0 : ENODEV;
 }
 
 Result<void> LinuxPowerController::look() {
@@ -115,6 +121,7 @@ Setting<std::int64_t> LinuxPowerController::delaySetting(const Result<StartupDel
     delay.supported = [why = requests.failure()] { return supportAfter(why); };
     delay.live = [why = requests.failure()] { return why; };
   } else if (requests->get) {
+    delay.supported = [this, known = *requests] { return supportBy(askDelay(known)); };
     delay.live = [this, known = *requests] { return askDelay(known); };
   } else {
     delay.note = saying("this controller does not tell its delay: the wish is kept in " + std::string(wishFile));
@@ -160,10 +167,12 @@ ControllerStatus LinuxPowerController::setDelay(std::uint8_t units, std::int64_t
   if (known && !known->get)
     delay.written = [&] { return !sent ? "" : managementController + (kept ? std::string(", ") + wishFile : ""); };
   const auto effect = carryOut(delay, asked, _machine);
+  if (effect.outcome == Outcome::applied || effect.outcome == Outcome::unchanged) return 0;
   if (!known) return statusOf(known.failure(), ENOSYS);
+  if (effect.outcome == Outcome::notSupported) return statusOf(*effect.failure, ENOSYS);
   if (!sent) return statusOf(sent.failure(), EIO);
   const bool isKept = (delay.live ? effect.live : effect.stored) == textOf(std::int64_t{units});
-  return effect.outcome != Outcome::failed || isKept ? 0 : EIO;
+  return isKept ? 0 : EIO;
 }
 
 ControllerStatus LinuxPowerController::close(const Connection& /*connection*/) {

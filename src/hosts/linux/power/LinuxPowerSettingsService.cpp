@@ -78,8 +78,10 @@ bool LinuxPowerSettingsService::canSet(PowerSwitch which, const PowerSource& /*s
 }
 
 bool LinuxPowerSettingsService::isOn(PowerSwitch which, const PowerSource& /*source*/) {
-  const auto setting = settingOf(which);
-  return isSupported(setting, _machine.effects) && observe(setting, _machine.effects).value_or(false);
+  auto setting = settingOf(which);
+  if (!isSupported(setting, _machine.effects)) return false;
+  setting.supported = nullptr;
+  return observe(setting, _machine.effects).value_or(false);
 }
 
 void LinuxPowerSettingsService::setOn(PowerSwitch which, const PowerSource& /*source*/, bool on) {

@@ -39,10 +39,12 @@ Result<void> OwnFile::changeIfHeeded(const Change& change) const {
   return Failure{"write", _path, (hiding.empty() ? "another file" : hiding) + " says otherwise: put back as it was"};
 }
 
-std::string placesIn(const std::vector<std::string>& files) {
-  std::string places;
-  for (const auto& file : files) places += (places.empty() ? "" : ", ") + file;
-  return places;
+Result<void> OwnFile::noting(WrittenPlaces& written, const std::function<Result<void>()>& step) const {
+  const auto former = contents();
+  auto done = step();
+  const auto now = contents();
+  if (done || (former && (!now || *now != *former))) written.add(_path);
+  return done;
 }
 
 }  // namespace tavisk

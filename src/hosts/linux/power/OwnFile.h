@@ -3,12 +3,13 @@
 #pragma once
 
 #include <functional>
+#include <memory>
 #include <optional>
 #include <string>
-#include <vector>
 
 #include "hosts/shared/SettingChange.h"
 #include "hosts/shared/SystemRoot.h"
+#include "hosts/shared/WrittenPlaces.h"
 
 namespace tavisk {
 
@@ -37,14 +38,24 @@ class OwnFile {
   };
   /// A change that another file hides is a failure, and the file is put back as it was.
   Result<void> changeIfHeeded(const Change& change) const;
+  /// Does this to the file, and adds it to the places when that was done, or has left other contents all the same.
+  Result<void> noting(WrittenPlaces& written, const std::function<Result<void>()>& step) const;
 
  private:
   const SystemRoot& _root;
   std::string _path;
 };
 
-/// Files as an effect names them: "/etc/one, /etc/two".
-std::string placesIn(const std::vector<std::string>& files);
+/// Has `store` keep the setting in the file, which must outlive it.
+template <typename Value>
+void keepIn(const OwnFile& file, Setting<Value>& setting, const typename Setting<Value>::Write& store) {
+  const auto written = std::make_shared<WrittenPlaces>();
+  setting.where = file.path();
+  setting.written = [written] { return written->text(); };
+  setting.store = [&file, written, store](const Value& asked) {
+    return file.noting(*written, [&] { return store(asked); });
+  };
+}
 
 /// What is found while the tool's own file has another value, which waits for other files to go: this is told.
 template <typename Value>

@@ -2,7 +2,11 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/power/RestartAfterFreeze.h"
 
+#include <fcntl.h>
+#include <sys/statvfs.h>
+
 #include <algorithm>
+#include <cerrno>
 #include <memory>
 
 #include "base/Text.h"
@@ -48,16 +52,36 @@ std::optional<std::string> panicIn(const std::string& text) {
   return value;
 }
 
-bool isWatchdogTime(const std::string& text) {
+/// Absent when it is no time.
+std::optional<bool> isWatchdogTime(const std::string& text) {
   if (text == "off" || text.empty()) return false;
-  const auto time = timeSpan(text);
-  return !time || time->count() != 0;
+  const auto time = text == "default" ? endlessTime : timeSpan(text);
+  return time ? std::optional(time->count() != 0) : std::nullopt;
+}
+
+Result<bool> usesWatchdog(const SystemdConfig::Assignment& time) {
+  const auto is = isWatchdogTime(time.value);
+  if (!is) return Failure{"read " + std::string(key), time.file, "no length of time: " + time.value};
+  return *is;
 }
 
 }  // namespace
 
 Result<bool> RestartAfterFreeze::hasWatchdog() const {
   return _machine.root.isThere("/dev/watchdog0");
+}
+
+/// A container shows its kernel's file to all and lets nobody write it.
+Support RestartAfterFreeze::supported() const {
+  const auto hasOne = hasWatchdog();
+  if (!hasOne) return hasOne.failure();
+  if (*hasOne) return std::nullopt;
+  const auto file = _machine.root.open(panicFile, O_RDONLY | O_NONBLOCK);
+  if (!file) return file.failure();
+  struct statvfs mounted {};
+  if (::fstatvfs(file->number(), &mounted) != 0) return systemFailure("look at", panicFile, errno);
+  if ((mounted.f_flag & ST_RDONLY) == 0) return std::nullopt;
+  return NotSupported{{"find", panicFile, "it is read-only here, and there is no watchdog"}};
 }
 
 Result<bool> RestartAfterFreeze::isWatchdogUsed() const {
@@ -119,13 +143,16 @@ Result<bool> RestartAfterFreeze::isPanicStored() const {
 Result<bool> RestartAfterFreeze::isWatchdogStored() const {
   const auto time = _config.last(section, key);
   if (!time) return time.failure();
-  return *time && isWatchdogTime((*time)->value);
+  return *time ? usesWatchdog(**time) : false;
 }
 
 Result<std::optional<bool>> RestartAfterFreeze::isWatchdogInOwn() const {
   const auto time = _config.own(section, key);
   if (!time) return time.failure();
-  return *time ? std::optional(isWatchdogTime(**time)) : std::nullopt;
+  if (!*time) return std::nullopt;
+  const auto uses = usesWatchdog({_watchdogFile.path(), **time});
+  if (!uses) return uses.failure();
+  return std::optional(*uses);
 }
 
 Setting<bool>::Found RestartAfterFreeze::stored() const {
@@ -180,11 +207,11 @@ Result<void> RestartAfterFreeze::storeWatchdog(bool restarts) const {
                                              return _config.setOwn(section, {{key, time}});
                                            },
                                        .isHeeded = isHeeded,
-                                       .hidingFile = [&] { return _config.whatHides(section, {key}).valueOr(""); }});
+                                       .hidingFile = [&] { return whatHidesWatchdog(restarts); }});
 }
 
 /// Both files, or none of them.
-Result<void> RestartAfterFreeze::store(bool restarts, std::vector<std::string>& written) const {
+Result<void> RestartAfterFreeze::store(bool restarts, WrittenPlaces& written) const {
   const auto formerPanic = _panicFile.contents();
   if (!formerPanic) return formerPanic.failure();
   const auto formerWatchdog = _watchdogFile.contents();
@@ -193,7 +220,7 @@ Result<void> RestartAfterFreeze::store(bool restarts, std::vector<std::string>& 
   const auto watchdog = panic && _machine.services.hasServiceManager() ? storeWatchdog(restarts) : Result<void>();
   if (panic && !watchdog) static_cast<void>(_panicFile.putBack(*formerPanic));
   for (const auto& [file, former] : {std::pair(&_watchdogFile, *formerWatchdog), {&_panicFile, *formerPanic}})
-    if (const auto now = file->contents(); !now || *now != former) written.push_back(file->path());
+    if (const auto now = file->contents(); !now || *now != former) written.add(file->path());
   return panic ? watchdog : panic;
 }
 
@@ -245,26 +272,32 @@ Result<void> RestartAfterFreeze::apply(bool restarts) const {
   return panic ? watchdog : panic;
 }
 
+std::string RestartAfterFreeze::whatHidesWatchdog(bool restarts) const {
+  const auto isAsAsked = [restarts](const std::string& time) { return isWatchdogTime(time) == restarts; };
+  return _config.whatHides(section, key, isAsAsked).valueOr("");
+}
+
 std::string RestartAfterFreeze::whatUndoes(bool restarts) const {
-  auto file = _config.whatHides(section, {key}).valueOr("");
+  auto file = whatHidesWatchdog(restarts);
   if (!file.empty()) return file;
   const auto panic = storedPanic();
   return panic && panic->from != _panicFile.path() && isOnPanic(panic->seconds) != restarts ? panic->from : "";
 }
 
 Setting<bool> RestartAfterFreeze::restartAfterFreeze() const {
-  const auto written = std::make_shared<std::vector<std::string>>();
+  const auto written = std::make_shared<WrittenPlaces>();
   Setting<bool> setting;
   setting.name = setting::restartAfterFreeze;
   setting.where = _panicFile.path();
   if (_machine.services.hasServiceManager()) setting.where = _config.ownDropIn() + ", " + setting.where;
-  setting.written = [written] { return placesIn(*written); };
+  setting.written = [written] { return written->text(); };
   setting.undoneBy = [this](bool restarts) { return whatUndoes(restarts); };
   setting.note = [this](bool restarts) -> std::string {
     return !restarts || hasWatchdog().valueOr(true)
                ? ""
                : "no watchdog here: only a kernel that has panicked restarts, not one that hangs";
   };
+  setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };
   setting.store = [this, written](bool restarts) { return store(restarts, *written); };

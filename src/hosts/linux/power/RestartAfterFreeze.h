@@ -27,6 +27,7 @@ class RestartAfterFreeze {
 
  private:
   Result<bool> hasWatchdog() const;
+  Support supported() const;
   Setting<bool>::Found live() const;
   /// What the service manager means to do; whether the watchdog runs is a fact of its own.
   Result<bool> isWatchdogUsed() const;
@@ -48,7 +49,7 @@ class RestartAfterFreeze {
   Result<bool> isPanicStored() const;
 
   /// The places that were written are added.
-  Result<void> store(bool restarts, std::vector<std::string>& written) const;
+  Result<void> store(bool restarts, WrittenPlaces& written) const;
   Result<void> storePanic(bool restarts) const;
   Result<void> storeWatchdog(bool restarts) const;
   Result<void> apply(bool restarts) const;
@@ -56,6 +57,7 @@ class RestartAfterFreeze {
   Result<void> turnWatchdogOn() const;
   Result<void> turnWatchdogOff() const;
   Result<void> setWatchdogTime(std::chrono::microseconds time) const;
+  std::string whatHidesWatchdog(bool restarts) const;
   std::string whatUndoes(bool restarts) const;
 
   LinuxMachine _machine;

@@ -173,7 +173,7 @@ Setting<bool>::Found WakeOnNetworkAccess::stored() const {
     const auto own = config.own(section, key);
     if (!own) return own.failure();
     const auto wakes = *word ? std::optional((*word)->value != never) : std::nullopt;
-    all.push_back({config.ownDropIn(), wakes});
+    all.push_back({file, wakes});
     if (*own && wakes != (**own != never)) waiting.emplace_back(config.ownDropIn(), **own != never);
   }
   auto found = readingOfAll<bool>(all);
@@ -183,34 +183,34 @@ Setting<bool>::Found WakeOnNetworkAccess::stored() const {
   return reading;
 }
 
-Result<void> WakeOnNetworkAccess::storeIn(const std::string& linkFile, bool wakes) const {
+std::string WakeOnNetworkAccess::whatHides(const std::string& linkFile, bool wakes) const {
+  const auto isAsAsked = [wakes](const std::string& word) { return (word != never) == wakes; };
+  return configOf(_machine.root, linkFile).whatHides(section, key, isAsAsked).valueOr("");
+}
+
+Result<void> WakeOnNetworkAccess::storeIn(const std::string& linkFile, bool wakes, WrittenPlaces& written) const {
   const auto config = configOf(_machine.root, linkFile);
   const auto isHeeded = [&]() -> Result<bool> {
     const auto word = config.last(section, key);
     if (!word) return word.failure();
     return *word && ((*word)->value != never) == wakes;
   };
-  return OwnFile(_machine.root, config.ownDropIn())
-      .changeIfHeeded({.write =
-                           [&] {
-                             return config.setOwn(section, {{key, wakes ? magic : never}});
-                           },
-                       .isHeeded = isHeeded,
-                       .hidingFile = [&] { return config.whatHides(section, {key}).valueOr(""); }});
-}
-
-Result<void> WakeOnNetworkAccess::store(bool wakes, std::vector<std::string>& written) const {
-  return setEach(linkFiles(), [&](const std::string& file) {
-    auto stored = storeIn(file, wakes);
-    if (stored) written.push_back(ownfile::linkDropIn(file));
-    return stored;
+  const std::map<std::string, std::string> values{{key, wakes ? magic : never}};
+  const OwnFile own(_machine.root, config.ownDropIn());
+  return own.noting(written, [&] {
+    return own.changeIfHeeded({.write = [&] { return config.setOwn(section, values); },
+                               .isHeeded = isHeeded,
+                               .hidingFile = [&] { return whatHides(linkFile, wakes); }});
   });
 }
 
-std::string WakeOnNetworkAccess::whatUndoes() const {
+Result<void> WakeOnNetworkAccess::store(bool wakes, WrittenPlaces& written) const {
+  return setEach(linkFiles(), [&](const std::string& file) { return storeIn(file, wakes, written); });
+}
+
+std::string WakeOnNetworkAccess::whatUndoes(bool wakes) const {
   for (const auto& file : linkFiles().valueOr({}))
-    if (auto hiding = configOf(_machine.root, file).whatHides(section, {key}).valueOr(""); !hiding.empty())
-      return hiding;
+    if (auto hiding = whatHides(file, wakes); !hiding.empty()) return hiding;
   return ownersAtWork(_machine.root, {OtherOwner::tlp, OtherOwner::networkManager});
 }
 
@@ -222,10 +222,10 @@ std::string WakeOnNetworkAccess::whyItDoesNotLast() const {
 }
 
 Setting<bool> WakeOnNetworkAccess::wakeOnNetworkAccess() const {
-  const auto written = std::make_shared<std::vector<std::string>>();
+  const auto written = std::make_shared<WrittenPlaces>();
   Setting<bool> setting;
   setting.name = setting::wakeOnNetworkAccess;
-  setting.undoneBy = [this](bool) { return whatUndoes(); };
+  setting.undoneBy = [this](bool wakes) { return whatUndoes(wakes); };
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.apply = [this](bool wakes) { return apply(wakes); };
@@ -234,7 +234,7 @@ Setting<bool> WakeOnNetworkAccess::wakeOnNetworkAccess() const {
     return setting;
   }
   setting.where = ownfile::linkDropIn(usualLinkFile);
-  setting.written = [written] { return placesIn(*written); };
+  setting.written = [written] { return written->text(); };
   setting.stored = [this] { return stored(); };
   setting.store = [this, written](bool wakes) { return store(wakes, *written); };
   return setting;

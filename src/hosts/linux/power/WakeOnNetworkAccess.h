@@ -9,6 +9,7 @@
 
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/SettingChange.h"
+#include "hosts/shared/WrittenPlaces.h"
 
 namespace tavisk {
 
@@ -60,14 +61,15 @@ class WakeOnNetworkAccess {
   Setting<bool>::Found live() const;
   Setting<bool>::Found stored() const;
   /// The places that were written are added.
-  Result<void> store(bool wakes, std::vector<std::string>& written) const;
+  Result<void> store(bool wakes, WrittenPlaces& written) const;
   Result<void> apply(bool wakes) const;
   /// The link files by which the cards are set up, those that are masked left out.
   Result<std::vector<std::string>> linkFiles() const;
   Result<bool> isMasked(const std::string& linkFile) const;
   Result<std::string> linkFileOf(const std::string& card) const;
-  Result<void> storeIn(const std::string& linkFile, bool wakes) const;
-  std::string whatUndoes() const;
+  Result<void> storeIn(const std::string& linkFile, bool wakes, WrittenPlaces& written) const;
+  std::string whatHides(const std::string& linkFile, bool wakes) const;
+  std::string whatUndoes(bool wakes) const;
   std::string whyItDoesNotLast() const;
 
   LinuxMachine _machine;

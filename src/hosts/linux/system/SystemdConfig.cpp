@@ -139,15 +139,14 @@ Result<std::optional<std::string>> SystemdConfig::own(std::string_view section, 
   return values.empty() || values.back().empty() ? std::nullopt : std::optional(values.back());
 }
 
-Result<std::string> SystemdConfig::whatHides(std::string_view section, const std::vector<std::string>& keys) const {
-  const auto ownName = baseName(ownDropIn());
-  for (const auto& key : keys) {
-    const auto assigned = all(section, key);
-    if (!assigned) return assigned.failure();
-    for (const auto& [file, value] : *assigned)
-      if (file.find(".d/") != std::string::npos && baseName(file) > ownName) return file;
-  }
-  return std::string();
+Result<std::string> SystemdConfig::whatHides(std::string_view section, std::string_view key,
+                                             const std::function<bool(const std::string& value)>& isAsAsked) const {
+  const auto assigned = all(section, key);
+  if (!assigned) return assigned.failure();
+  if (assigned->empty()) return "";
+  const auto& [file, value] = assigned->back();
+  const bool isLater = file.find(".d/") != std::string::npos && baseName(file) > baseName(ownDropIn());
+  return isLater && !isAsAsked(value) ? file : "";
 }
 
 Result<void> SystemdConfig::setOwn(const std::string& section, const std::map<std::string, std::string>& values) const {

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <map>
 #include <optional>
 #include <string>
@@ -35,8 +36,9 @@ class SystemdConfig {
   Result<std::optional<std::string>> own(std::string_view section, std::string_view key) const;
   /// The tool's own drop-in.
   std::string ownDropIn() const;
-  /// The file that hides what the own drop-in says of these keys; empty when none does.
-  Result<std::string> whatHides(std::string_view section, const std::vector<std::string>& keys) const;
+  /// The file that has the last word on a key instead of the own drop-in, unless its value is as asked; else empty.
+  Result<std::string> whatHides(std::string_view section, std::string_view key,
+                                const std::function<bool(const std::string& value)>& isAsAsked) const;
   /// Writes these keys into the own drop-in, which has this one section; its other keys stay. One that cannot
   /// be read is left as it is. Reads and writes: not to be called by two at once (MachineLock).
   Result<void> setOwn(const std::string& section, const std::map<std::string, std::string>& values) const;

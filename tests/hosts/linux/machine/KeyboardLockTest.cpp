@@ -19,11 +19,13 @@ constexpr std::uint8_t lock = 0x02;
 struct Panel final : ControllerLink {
   Result<void> open() override { return error == 0 ? Result<void>() : systemFailure("open", "the panel", error); }
   Result<std::vector<std::uint8_t>> exchange(const ControllerRequest& request) override {
+    ++questions;
     if (const auto opened = open(); !opened) return opened.failure();
     if (request.command == 0) return std::vector<std::uint8_t>{0, capabilities, 0x20, 0x20, 0x20, 0x20};
     return std::vector<std::uint8_t>{0, 0x61, 0, state};
   }
 
+  int questions = 0;
   int error = 0;
   std::uint8_t capabilities = lock;
   std::uint8_t state = 0;
@@ -108,6 +110,14 @@ TEST(EnclosureLock, LeavesTheKeyboardsOfAMachineThatTellsOfNoLock) {
     EXPECT_EQ(tree.lastEffect().note, "") << "what becomes of the preference is told of the preference";
     EXPECT_EQ(tree.inhibited("input1"), "0");
   }
+}
+
+TEST(EnclosureLock, IsNotLookedAtByWhoMayNotChangeTheMachine) {
+  PanelTree tree;
+  ManagementController controller(tree.panel);
+  EnclosureLock(tree.machine, controller).setDisablesKeyboard(true, Failure{"lock", "the machine", "held"});
+  EXPECT_THAT(tree.lastEffect(), FailedFor("held"));
+  EXPECT_EQ(tree.panel.questions, 0);
 }
 
 TEST(EnclosureLock, TellsTheKeyboardsBesideTheirPreference) {

@@ -38,8 +38,8 @@ class FakePowerServices {
     readManager();
   }
 
-  std::atomic<const char*> canSuspend = "yes";
-  std::atomic<const char*> sleepTarget = "loaded";
+  std::atomic<const char*> canSuspend = "yes";    ///< null: an error
+  std::atomic<const char*> unitState = "loaded";  ///< of whatever unit is asked for
   /// So many calls are answered as when the service ends before it answers.
   std::atomic<int> answersMissing = 0;
 
@@ -52,6 +52,8 @@ class FakePowerServices {
     }
     if (member == "Get") return answerGet(call);
     if (member == "Set") return answerSet(call);
+    if (member == "CanSuspend" && !canSuspend.load())
+      return sd_bus_reply_method_errorf(call, "org.freedesktop.DBus.Error.AccessDenied", "it is out of order");
     if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", canSuspend.load());
     if (member == "LoadUnit")
       return sd_bus_reply_method_return(call, "o", "/org/freedesktop/systemd1/unit/suspend_2etarget");
@@ -122,7 +124,7 @@ class FakePowerServices {
     constexpr std::uint64_t microseconds = 60'000'000;
     if (name == "IdleAction") return sd_bus_reply_method_return(call, "v", "s", _idleAction.c_str());
     if (name == "HandlePowerKey") return sd_bus_reply_method_return(call, "v", "s", _powerKey.c_str());
-    if (name == "LoadState") return sd_bus_reply_method_return(call, "v", "s", sleepTarget.load());
+    if (name == "LoadState") return sd_bus_reply_method_return(call, "v", "s", unitState.load());
     if (name == "IdleActionUSec")
       return sd_bus_reply_method_return(call, "v", "t", std::stoull(_idleMinutes) * microseconds);
     return sd_bus_reply_method_return(call, "v", "t", _watchdogSet != 0 ? _watchdogSet : _watchdogRead);

@@ -45,15 +45,39 @@ TEST_F(PowerTest, ComputerSleepIsInForceAndKept) {
 
 TEST(ComputerSleep, NeedsAMachineThatCanSleep) {
   PowerTree masked;
-  masked.bus.sleepTarget = "masked";
+  masked.bus.unitState = "masked";
   const auto effect = masked.set(SleepTimer::computer, {40});
   EXPECT_EQ(effect.outcome, Outcome::notSupported);
   EXPECT_EQ(effect.failure->on, "suspend.target");
+  masked.bus.canSuspend = nullptr;
+  EXPECT_THAT(masked.set(SleepTimer::computer, {40}), UnsupportedFor("systemd-logind.service: it is masked"));
 
   PowerTree sleepless;
   sleepless.bus.canSuspend = "na";
   EXPECT_EQ(sleepless.set(SleepTimer::computer, {40}).failure->why, "this machine cannot sleep");
   EXPECT_FALSE(sleepless.power().supports(PowerSwitch::powerButtonSleep, sleepless.mains));
+}
+
+TEST_F(PowerTest, ComputerSleepIsReadFromEveryLengthOfTime) {
+  tree.log.wants = true;
+  for (const auto& [time, minutes] : {std::pair("infinity", "0"),
+                                      {"", "30"},
+                                      {"90", "2"},
+                                      {"1.5h 30s", "91"},
+                                      {"2w", "20160"},
+                                      {"1month", "43830"},
+                                      {"1M 1m", "43831"},
+                                      {"1y", "525960"},
+                                      {"5\u00b5s", "1"}}) {
+    tree.write("/etc/systemd/logind.conf", std::string("[Login]\nIdleAction=suspend\nIdleActionSec=") + time + "\n");
+    tree.power().untilSleep(SleepTimer::computer, tree.mains);
+    EXPECT_EQ(tree.log.values.back().stored, minutes) << time;
+  }
+  for (const auto* time : {"soon", "5 parsecs", "1.5.5h", "-1"}) {
+    tree.write("/etc/systemd/logind.conf", std::string("[Login]\nIdleAction=suspend\nIdleActionSec=") + time + "\n");
+    tree.power().untilSleep(SleepTimer::computer, tree.mains);
+    EXPECT_THAT(tree.lastEffect(), FailedFor(std::string("no length of time: ") + time));
+  }
 }
 
 TEST_F(PowerTest, DisplaySleepAboveAnHourIsAWish) {
@@ -118,6 +142,14 @@ TEST_F(PowerTest, WakeOnNetworkAccessIsSetOnEveryCardThatCan) {
   for (const auto* file : {"99-default.link", "73-usb-net-by-mac.link"})
     EXPECT_THAT(tree.file(std::string("/etc/systemd/network/") + file + ".d/60-tavisk.conf"),
                 HasSubstr("[Link]\nWakeOnLan=magic\n"));
+}
+
+TEST_F(PowerTest, WakeOnNetworkAccessOfFilesThatDifferIsToldForEach) {
+  tree.write("/run/udev/data/n2", "E:ID_NET_LINK_FILE=/usr/lib/systemd/network/73-usb-net-by-mac.link\n");
+  tree.write("/etc/systemd/network/73-usb-net-by-mac.link", "[Link]\nWakeOnLan=magic\n");
+  tree.log.wants = true;
+  EXPECT_FALSE(tree.power().isOn(PowerSwitch::wakeOnNetworkAccess, tree.mains));
+  EXPECT_EQ(tree.log.values.back().stored, "on on 73-usb-net-by-mac.link, nothing on 99-default.link");
 }
 
 TEST_F(PowerTest, WakeOnNetworkAccessIsReadBackFromCardsThatIgnoreIt) {
@@ -249,17 +281,22 @@ TEST_F(PowerTest, ControllerStatusesTellOfTheControllerAndTheWayToIt) {
   tree.controllerLink.error = ETIMEDOUT;
   EXPECT_EQ(setDelay(tree.delays(), 3), ETIMEDOUT);
   tree.controllerLink.error = 0;
-  for (const auto& [code, status] : {std::pair(0xC0, EBUSY),
-                                     {0xC1, ENOSYS},
-                                     {0xC7, EINVAL},
-                                     {0xCC, EINVAL},
-                                     {0xD4, EACCES},
-                                     {0xC3, ETIMEDOUT},
-                                     {0xFF, EIO}}) {
+  for (const auto& [code, status] :
+       {std::pair(0xC0, EBUSY), {0xC7, EINVAL}, {0xCC, EINVAL}, {0xD4, EACCES}, {0xFF, EIO}}) {
     tree.controllerLink.delayRefusal = static_cast<std::uint8_t>(code);
     EXPECT_EQ(setDelay(tree.delays(), 3), status);
     EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
   }
+  const auto told = tree.log.effects.size();
+  tree.controllerLink.delayRefusal = 0xC1;
+  EXPECT_EQ(delayOf(tree.delays()), std::nullopt);
+  EXPECT_TRUE(tree.log.values.back().unsupported);
+  EXPECT_EQ(tree.log.effects.size(), told) << "no failure: it cannot have one";
+  EXPECT_EQ(setDelay(tree.delays(), 3), ENOSYS);
+  EXPECT_THAT(tree.lastEffect(), UnsupportedFor("does not know this request"));
+  tree.controllerLink.delayRefusal = TreeController::tooLate;
+  EXPECT_EQ(setDelay(tree.delays(), 7), 0);
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied) << "it has come about all the same";
   tree.makeUnreadable("/etc/tavisk/startup-delay.conf");
   EXPECT_EQ(setDelay(tree.delays(), 3), ELOOP);
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
@@ -268,6 +305,12 @@ TEST_F(PowerTest, ControllerStatusesTellOfTheControllerAndTheWayToIt) {
   EXPECT_THAT(tree.lastEffect(), FailedFor("symbolic links"));
   EXPECT_EQ(tree.delays().numberProperty(std::nullopt, "ServerID"), std::nullopt);
   EXPECT_THAT(tree.lastEffect(), FailedFor("symbolic links"));
+  tree.log.effects.clear();
+  tree.makeUnreadable("/sys/class");
+  EXPECT_EQ(tree.delays().masterPort(), ELOOP);
+  tree.remove("/sys/class");
+  EXPECT_EQ(tree.delays().masterPort(), ENODEV);
+  EXPECT_TRUE(tree.log.effects.empty()) << "told by what follows, once";
 }
 
 TEST_F(PowerTest, ControllerOfAnotherMakerTakesTheAdministratorsRequestsAndNoGuess) {

@@ -87,6 +87,36 @@ TEST_F(PowerConflicts, ServiceThatAnotherRunRestartsIsAskedAgain) {
   EXPECT_EQ(tree.turn(PowerSwitch::powerButtonSleep, true).outcome, Outcome::applied);
   tree.bus.answersMissing = 2;
   EXPECT_EQ(tree.set(SleepTimer::computer, {20}).outcome, Outcome::applied);
+  tree.bus.answersMissing = 2;
+  tree.bus.canSuspend = nullptr;
+  EXPECT_THAT(tree.set(SleepTimer::computer, {30}), FailedFor("it is out of order"));
+}
+
+TEST_F(PowerConflicts, FileWithTheLastWordIsNamedUnlessItSaysTheSame) {
+  constexpr const char* last = "/etc/systemd/logind.conf.d/70-other.conf";
+  tree.write("/etc/systemd/logind.conf.d/65-other.conf",
+             "[Login]\nIdleAction=ignore\nIdleActionSec=5min\nHandlePowerKey=ignore\n");
+  tree.write(last, "[Login]\nIdleAction=suspend\nIdleActionSec=20min\nHandlePowerKey=suspend\n");
+  EXPECT_EQ(tree.set(SleepTimer::computer, {20}).undoneBy, "nightly-backup");
+  EXPECT_EQ(tree.set(SleepTimer::computer, {30}).undoneBy, last);
+  EXPECT_EQ(tree.set(SleepTimer::computer, {}).undoneBy, last);
+  EXPECT_EQ(tree.turn(PowerSwitch::powerButtonSleep, true).undoneBy, "");
+  EXPECT_EQ(tree.turn(PowerSwitch::powerButtonSleep, false).undoneBy, last);
+  tree.write(last, "[Login]\nIdleAction=ignore\nIdleActionSec=20min\n");
+  EXPECT_EQ(tree.set(SleepTimer::computer, {}).undoneBy, "") << "it never sleeps, whatever the time";
+}
+
+TEST_F(PowerConflicts, OwnFileIsAPlaceThatWasWrittenWhateverItsChangeCameTo) {
+  const OwnFile file(tree.machine.root, loginFile);
+  for (const bool writes : {false, true}) {
+    Setting<bool> setting;
+    setting.name = "Any";
+    keepIn(file, setting, [&](bool) -> Result<void> {
+      if (writes) tree.write(loginFile, "half");
+      return Failure{"put back", loginFile, "disk full"};
+    });
+    EXPECT_EQ(carryOut(setting, true, tree.machine).where, writes ? loginFile : "");
+  }
 }
 
 TEST_F(PowerConflicts, RulesThatSomebodyChangesOrOverrulesAreSeen) {

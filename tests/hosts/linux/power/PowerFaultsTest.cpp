@@ -3,6 +3,7 @@
 #include <gmock/gmock.h>
 #include <sys/stat.h>
 
+#include "OwnMounts.h"
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/power/PowerTree.h"
 
@@ -72,6 +73,23 @@ TEST(PowerFaults, ComputerSleepThatIsHalfMadeIsCompleted) {
   tree.write("/etc/systemd/logind.conf.d/60-tavisk.conf", "[Login]\nIdleAction=suspend\nIdleActionSec=20min\n");
   tree.turn(PowerSwitch::powerButtonSleep, true);
   EXPECT_EQ(tree.bus.sleepsAfter(), "20min") << "the service tells this time, so it has to go by it";
+}
+
+TEST(PowerFaults, RestartAfterFreezeIsNothingThatAContainerCanHave) {
+  PowerTree tree;
+  const bool isProven = withOwnMounts([&tree] {
+    const auto panic = tree.at("/proc/sys/kernel/panic");
+    for (const auto more : {0UL, 0UL | MS_REMOUNT | MS_RDONLY})
+      ASSERT_EQ(::mount(panic.c_str(), panic.c_str(), nullptr, MS_BIND | more, nullptr), 0);
+    EXPECT_EQ(tree.setRestartsAfterFreeze(true).outcome, Outcome::failed) << "there is a watchdog";
+    tree.setRestartsAfterFreeze(false);
+    tree.remove("/dev/watchdog0");
+    const auto former = tree.file("/etc/systemd/system.conf.d/60-tavisk.conf");
+    EXPECT_THAT(tree.setRestartsAfterFreeze(true), UnsupportedFor("read-only"));
+    EXPECT_EQ(tree.file("/etc/systemd/system.conf.d/60-tavisk.conf"), former);
+    EXPECT_FALSE(tree.has("/etc/sysctl.d/60-tavisk.conf"));
+  });
+  if (!isProven) GTEST_SKIP() << "may not mount";
 }
 
 }  // namespace

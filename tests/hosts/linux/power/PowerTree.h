@@ -56,7 +56,8 @@ class TreeController final : public ControllerLink {
   std::uint8_t policy = 0;
   std::uint8_t maker = 0x57;  ///< the low byte of manufacturer 343
   std::vector<std::uint8_t> delay = {0, 0};
-  std::uint8_t delayRefusal = 0;  ///< a completion code; 0: the delay is taken
+  static constexpr std::uint8_t tooLate = 0xC3;  ///< a refusal of what is done all the same
+  std::uint8_t delayRefusal = 0;                 ///< a completion code; 0: the delay is taken
 
  private:
   std::vector<std::uint8_t> answerTo(const ControllerRequest& request) {
@@ -69,7 +70,7 @@ class TreeController final : public ControllerLink {
         if (request.data.at(0) < 3) policy = request.data[0];
         return {0, policies};
       case 0x3054:
-        if (delayRefusal == 0) delay = request.data;
+        if (delayRefusal == 0 || delayRefusal == tooLate) delay = request.data;
         return {delayRefusal};
       case 0x3055:
         return delayRefusal == 0xC1 ? std::vector{delayRefusal} : std::vector<std::uint8_t>{0, delay[0], delay[1]};
