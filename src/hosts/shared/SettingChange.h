@@ -207,8 +207,10 @@ std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects)
     value.unsupported = (*support)->reason;
   } else {
     (setting.live ? value.live : value.stored) = change::textOfFound<Value>(found, setting, effects);
-    if (setting.live && setting.stored && asksMore)
-      value.stored = change::textOfFound<Value>(setting.stored(), setting, effects);
+    const bool hasBoth = setting.live && setting.stored && effects.wantsValues();
+    const auto stored = hasBoth ? setting.stored() : typename Setting<Value>::Found(std::nullopt);
+    // What keeps both from being looked at is told once.
+    if (hasBoth && (found || stored)) value.stored = change::textOfFound<Value>(stored, setting, effects);
     if (!found && !value.stored) return std::nullopt;
   }
   effects.observe(value);

@@ -119,17 +119,6 @@ TEST(LinuxNetworkTime, AsksForTheClientOnceWhenItLooksAtTheNextStart) {
   EXPECT_THAT(tree.lastEffect(), FailedFor("AccessDenied"));
 }
 
-TEST(LinuxNetworkTime, DoesNotRestartAClientThatDropsDoubleServers) {
-  ManagedTree tree;
-  tree.manager.set("systemd-timesyncd.service", {.active = "active"});
-  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [](sd_bus_message* call, const std::string&) {
-    return sd_bus_reply_method_return(call, "v", "as", 2, "a.example", "b.example");
-  });
-  tree.write("/etc/systemd/timesyncd.conf", "[Time]\nNTP=a.example b.example a.example\n");
-  tree.host().networkTime().restartAsynchronously();
-  EXPECT_EQ(tree.lastEffect().outcome, Outcome::unchanged);
-}
-
 TEST(LinuxNetworkTime, GoesByTheStartOfAClientThatDoesNotTellItsServers) {
   constexpr std::chrono::hours aWhile{1};
   LinuxTree tree;
