@@ -77,7 +77,7 @@ bool isJust(bool on, const Found& found) {
 /// Told to the sink as it is found, now and stored.
 RemoteAccessState observedState(Setting<bool> setting, EffectSink& effects) {
   const auto live = setting.live();
-  const auto stored = setting.stored();
+  auto stored = setting.stored();
   // What is off now may be on after a restart: without the one the other is no answer.
   setting.live = [&] { return isJust(false, live) && !stored ? stored : live; };
   setting.stored = [&] { return stored; };
@@ -90,7 +90,7 @@ RemoteAccessState observedState(Setting<bool> setting, EffectSink& effects) {
 }
 
 Result<bool> hasSettled(const DaemonGroup& daemons) {
-  const auto changing = daemons.isChanging();
+  auto changing = daemons.isChanging();
   if (!changing) return changing;
   return !*changing;
 }

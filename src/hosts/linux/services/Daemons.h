@@ -55,7 +55,11 @@ class Daemons {
   Result<void> checkMayStartAtBoot(const Daemon& daemon, bool start);
 
  protected:
-  std::vector<std::string> _written;  ///< see takeWritten()
+  /// A link for takeWritten().
+  void addWritten(const std::string& link) { _written.push_back(link); }
+
+ private:
+  std::vector<std::string> _written;
 };
 
 /// A change of what starts with the machine; the links that it has written are added to `written`.

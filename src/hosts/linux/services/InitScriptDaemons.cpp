@@ -40,6 +40,12 @@ bool isLinkTo(std::string_view script, std::string_view kinds, std::string_view 
   return link.size() == script.size() + 3 && kinds.find(link[0]) != std::string_view::npos && link.ends_with(script);
 }
 
+std::vector<std::string> differing(const std::set<std::string>& before, const std::set<std::string>& after) {
+  std::vector<std::string> links;
+  std::ranges::set_symmetric_difference(before, after, std::back_inserter(links));
+  return links;
+}
+
 }  // namespace
 
 Result<Daemons::Presence> InitScriptDaemons::presence(const Daemon& daemon) {
@@ -105,8 +111,7 @@ Result<void> InitScriptDaemons::setStartAtBoot(const std::vector<Daemon>& daemon
     const auto before = linksTo(daemon);
     if (!before) return before.failure();
     auto turned = turnLinks(daemon, start);
-    if (const auto after = linksTo(daemon))
-      std::ranges::set_symmetric_difference(*before, *after, std::back_inserter(_written));
+    for (const auto& link : differing(*before, linksTo(daemon).valueOr(*before))) addWritten(link);
     if (!turned) return turned;
   }
   return {};

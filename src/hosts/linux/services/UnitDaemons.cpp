@@ -186,7 +186,7 @@ void UnitDaemons::noteWritten(BusMessage& changes) {
     const auto kind = changes.readText();
     const auto link = changes.readText();
     changes.readText();
-    if (kind == "symlink" || kind == "unlink") _written.push_back(link);
+    if (kind == "symlink" || kind == "unlink") addWritten(link);
     changes.exit();
   }
 }
