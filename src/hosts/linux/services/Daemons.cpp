@@ -24,7 +24,7 @@ bool isSocketOf(const Daemon& socket, const Daemon& service) {
 }
 
 std::vector<Daemon> socketsFirst(std::vector<Daemon> daemons) {
-  std::ranges::stable_partition(daemons, &isSocket);
+  std::stable_partition(daemons.begin(), daemons.end(), isSocket);
   return daemons;
 }
 
