@@ -74,7 +74,10 @@ def _see(machine, check):
 
 def _do_all(machine, checks, results, when=""):
     for check in checks:
-        results.add(f"{machine.name}{when}: {check.name}", _do(machine, check) + _see(machine, check))
+        problems = _do(machine, check) + _see(machine, check)
+        if problems:
+            problems += machine.run(f"grep -h '\"outcome\":\"failed\"' {REPORTS} | tail -n 3").output.splitlines()
+        results.add(f"{machine.name}{when}: {check.name}", problems)
     kept = machine.run(f"cat {REPORTS}; rm -f {REPORTS}").output
     results.add(f"{machine.name}{when}: every report is as its schema says", reports.faults(kept) if kept else ["there is none"])
 
