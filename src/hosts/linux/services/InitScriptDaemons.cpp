@@ -89,7 +89,7 @@ Result<bool> InitScriptDaemons::startsAtBoot(const Daemon& daemon) {
 }
 
 Result<bool> InitScriptDaemons::staysOffAtBoot(const Daemon& daemon) {
-  const auto starts = startsAtBoot(daemon);
+  auto starts = startsAtBoot(daemon);
   if (!starts) return starts;
   return !*starts;
 }
@@ -101,7 +101,7 @@ Result<std::set<std::string>> InitScriptDaemons::linksTo(const Daemon& daemon) c
     const auto names = orEmpty(_root.list(folder));
     if (!names) return names.failure();
     for (const auto& name : *names)
-      if (isLinkTo(daemon.script, "SK", name)) links.insert(folder + "/" + name);
+      if (isLinkTo(daemon.script, "SK", name)) links.insert(std::string(folder).append("/").append(name));
   }
   return links;
 }
