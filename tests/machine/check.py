@@ -76,7 +76,8 @@ def _do_all(machine, checks, results, when=""):
     for check in checks:
         problems = _do(machine, check) + _see(machine, check)
         if problems:
-            problems += machine.run(f"grep -h '\"outcome\":\"failed\"' {REPORTS} | tail -n 3").output.splitlines()
+            told = machine.run(f"grep -ho '\"effects\":.*\"failed\".*' {REPORTS} | tail -n 3").output
+            problems += [line[:LONGEST_SHOWN] for line in told.splitlines()]
         results.add(f"{machine.name}{when}: {check.name}", problems)
     kept = machine.run(f"cat {REPORTS}; rm -f {REPORTS}").output
     results.add(f"{machine.name}{when}: every report is as its schema says", reports.faults(kept) if kept else ["there is none"])
