@@ -11,7 +11,9 @@ IDLE_WARNING = re.compile(r"tavisk: Computer Sleep: warning: [^\n]* counts as id
 LOGIN = "busctl get-property org.freedesktop.login1 /org/freedesktop/login1 org.freedesktop.login1.Manager "
 BLANKING = "cat /sys/module/kernel/parameters/consoleblank"
 # The disk with a motor, then the one without.
-DISKS = "grep . /sys/block/sd[ab]/device/power/control | cut -d: -f2; cat /sys/block/sda/device/power/autosuspend_delay_ms"
+# The kernel names the two disks in the order in which they answer.
+MOTOR, OTHER = (f"$(grep -lx {turns} /sys/block/sd[ab]/queue/rotational | cut -d/ -f-4)" for turns in (1, 0))
+DISKS = f"cat {MOTOR}/device/power/control {OTHER}/device/power/control {MOTOR}/device/power/autosuspend_delay_ms"
 
 
 def idle(action, minutes):
@@ -81,9 +83,9 @@ CHECKS = [
               BLANKING: "1200\n", DISKS: "auto\non\n60000\n",
               "tavisk -getsleep": timers("after 170 minutes", "after 20 minutes", "after 1 minutes")}),
     Check("an idle disk stops", needs=SERVER,
-          do="timeout 100 sh -c 'until grep -q suspended /sys/block/sda/device/power/runtime_status; do sleep 1; done' && "
+          do=f"timeout 100 sh -c 'until grep -q suspended {MOTOR}/device/power/runtime_status; do sleep 1; done' && "
              "dmesg | grep -c 'sd .*Stopping disk' | sed 's/[1-9].*/stopped/'", prints="stopped\n"),
     Check("a disk that comes back gets its timer", needs=SERVER,
-          do="echo on >/sys/block/sda/device/power/control; udevadm trigger --settle --action=add /sys/block/sda",
+          do=f"echo on >{MOTOR}/device/power/control; udevadm trigger --settle --action=add {MOTOR}",
           then={DISKS: "auto\non\n60000\n"}),
 ]
