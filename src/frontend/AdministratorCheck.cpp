@@ -27,7 +27,7 @@ bool RemoteServerSettings::authenticate() {
   if (!myIsAuthenticatedAsAdministrator()) {
     _context.output.putLine("You need administrator access to run this tool... exiting!");
     _context.host.authenticator().noteRefusal();
-    if (_report) _report->runRefused("not an administrator", _context.output.takePrinted());
+    if (_context.report) _context.report->runRefused("not an administrator", _context.output.takePrinted());
     return false;
   }
   takeAuthorization();

@@ -95,20 +95,20 @@ const CommandTable::Entry* RemoteServerSettings::findCommand(const std::string& 
 
 void RemoteServerSettings::callHandler(const std::string& word, const CommandTable::Entry& entry,
                                        std::span<const std::string> arguments) {
-  if (_report) {
+  if (_context.report) {
     _context.output.takePrinted();
-    _report->commandBegins(word, arguments, entry.selector);
+    _context.report->commandBegins(word, arguments, entry.selector);
   }
   const auto limit = _context.runLoop.limitWaits(_context.longestCommand);
   std::visit(Call{*_serverCommands, arguments}, handlerNamed(entry.selector));
-  if (_report) _report->commandEnds(_serverCommands->error(), _context.output.takePrinted());
+  if (_context.report) _context.report->commandEnds(_serverCommands->error(), _context.output.takePrinted());
   _effects.commandEnds();
 }
 
 void RemoteServerSettings::refuseWord(const std::string& word) {
   _context.output.takePrinted();
   _context.output.print("Error: %s is not a valid command\n", word.c_str());
-  if (_report) _report->wordRefused(word, _serverCommands->error(), _context.output.takePrinted());
+  if (_context.report) _context.report->wordRefused(word, _serverCommands->error(), _context.output.takePrinted());
   _effects.commandEnds();
 }
 

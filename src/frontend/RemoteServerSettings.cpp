@@ -13,9 +13,9 @@ namespace tavisk {
 
 RemoteServerSettings::RemoteServerSettings(const CommandContext& context, EffectSink& effects, Report* report,
                                            std::string_view commandTable)
-    : _context(context), _effects(effects), _report(report), _commandTable(commandTable) {
+    : _context(context), _effects(effects), _commandTable(commandTable) {
   _context.report = report;
-  if (_report) _context.output.keepPrinted();
+  if (_context.report) _context.output.keepPrinted();
 }
 
 RemoteServerSettings::~RemoteServerSettings() {
@@ -66,7 +66,7 @@ void RemoteServerSettings::deauthenticate() {
 }
 
 void RemoteServerSettings::exit() {
-  if (_report) _report->commandEnds(hasFailed(), _context.output.takePrinted());
+  if (_context.report) _context.report->commandEnds(hasFailed(), _context.output.takePrinted());
   _exitStatus = statusSoFar();
   const auto lostBy = _context.output.finish();
   if (lostBy && *lostBy != EPIPE) {
@@ -96,7 +96,7 @@ void RemoteServerSettings::breakOff(std::string_view why) {
   doStep([this] { giveUpAuthorization(); });
   doStep([&] { _effects.interrupt(std::string(why)); });
   doStep([&] {
-    if (_report) _report->runRefused(std::string(why), _context.output.takePrinted());
+    if (_context.report) _context.report->runRefused(std::string(why), _context.output.takePrinted());
   });
   _context.output.finish();
   complain(why);
@@ -110,7 +110,7 @@ bool RemoteServerSettings::hasFailed() const {
 }
 
 int RemoteServerSettings::statusSoFar() const {
-  return hasFailed() || (_report && _report->isLost()) ? 1 : 0;
+  return hasFailed() || (_context.report && _context.report->isLost()) ? 1 : 0;
 }
 
 void RemoteServerSettings::endedBySignal(const std::string& signal) {
@@ -121,7 +121,7 @@ void RemoteServerSettings::endedBySignal(const std::string& signal) {
   doStep([&] { givingUp = std::jthread([this] { doStep([this] { giveUpAuthorization(); }); }); });
   doStep([&] { _effects.interrupt("the run was ended by " + signal); });
   doStep([&] {
-    if (_report) _report->runEndedBySignal(signal, hasFailed(), _context.output.takePrinted());
+    if (_context.report) _context.report->runEndedBySignal(signal, hasFailed(), _context.output.takePrinted());
   });
   _context.output.finish();
   if (!givingUp.joinable()) doStep([this] { giveUpAuthorization(); });

@@ -87,7 +87,6 @@ class RemoteServerSettings final {
 
   CommandContext _context;
   EffectSink& _effects;
-  Report* _report;
   std::string_view _commandTable;
 
   std::shared_ptr<const CommandTable> _commandDict;

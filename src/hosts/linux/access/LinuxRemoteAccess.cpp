@@ -71,7 +71,7 @@ Result<bool> needsNoHostKey(const SystemRoot& root) {
 using Found = Setting<bool>::Found;
 
 bool isJust(bool on, const Found& found) {
-  return found && *found && (*found)->value == on && (*found)->detail.empty();
+  return found && change::isJust(*found, on);
 }
 
 /// Told to the sink as it is found, now and stored.
@@ -162,16 +162,15 @@ Result<void> LinuxRemoteShellService::store(bool enabled, Trace& trace) {
     if (auto keys = ensureHostKeys(trace); !keys) return keys;
   }
   return withServer<void>([&](const DaemonGroup& server) {
-    return noting(trace.written, _machine.services.daemons(),
-                  [&] { return enabled ? startAtBoot(server) : server.setAllStartAtBoot(false); });
+    return enabled ? startAtBoot(server, trace.written) : server.setAllStartAtBoot(false, trace.written);
   });
 }
 
-Result<void> LinuxRemoteShellService::startAtBoot(const DaemonGroup& server) {
+Result<void> LinuxRemoteShellService::startAtBoot(const DaemonGroup& server, WrittenPlaces& written) {
   const auto starting = server.startingAtBoot();
   if (!starting) return starting.failure();
   if (!starting->empty()) return {};
-  return _machine.services.daemons().setStartAtBoot({server.members().front()}, true);
+  return _machine.services.daemons().setStartAtBoot({server.members().front()}, true, written);
 }
 
 /// Starts what will start with the machine too.
@@ -270,9 +269,7 @@ void LinuxRemoteEventsService::setEnabled(bool enabled) {
   auto setting = remoteEvents();
   setting.written = [&] { return written.text(); };
   setting.store = [&](bool on) {
-    return withUnits<void>([&](const DaemonGroup& units) {
-      return noting(written, _machine.services.daemons(), [&] { return units.setAllStartAtBoot(on); });
-    });
+    return withUnits<void>([&](const DaemonGroup& units) { return units.setAllStartAtBoot(on, written); });
   };
   setting.apply = [this](bool on) {
     return withUnits<void>([on](const DaemonGroup& units) { return on ? units.startAll() : units.stopAll(); });

@@ -37,7 +37,7 @@ class LinuxRemoteShellService final : public RemoteShellService {
   Support supported();
   Result<bool> hasAny(Result<std::vector<Daemon>> (DaemonGroup::*those)() const);
   Result<void> store(bool enabled, Trace& trace);
-  Result<void> startAtBoot(const DaemonGroup& server);
+  Result<void> startAtBoot(const DaemonGroup& server, WrittenPlaces& written);
   Result<void> apply(bool enabled, Trace& trace);
   /// Where no host key is, a connection would be taken and dropped.
   Result<void> ensureHostKeys(Trace& trace);

@@ -118,9 +118,8 @@ void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
   WrittenPlaces written;
   setting.written = [&] { return written.text(); };
   setting.store = [&, this](bool starts) {
-    return withClient<void>([&](const TimeDaemon& client) {
-      return noting(written, daemons(), [&] { return daemons().setStartAtBoot({client.daemon}, starts); });
-    });
+    return withClient<void>(
+        [&](const TimeDaemon& client) { return daemons().setStartAtBoot({client.daemon}, starts, written); });
   };
   carryOut(setting, launch, _machine);
 }
@@ -171,8 +170,9 @@ Setting<std::string>::Found LinuxNetworkTimeService::liveServer() {
 
 /// What is configured is the answer as soon as it is, whichever server the client is at.
 NetworkTimeServer LinuxNetworkTimeService::server() {
-  auto setting = serverSetting();
+  auto setting = named<std::string>(setting::networkTimeServer);
   const auto configured = firstServer();
+  setting.stored = [&] { return configured; };
   const bool isConfigured = configured && *configured;
   const bool isLiveWanted = configured && (!isConfigured || _machine.effects.wantsValues());
   if (isLiveWanted) setting.live = [this] { return liveServer(); };

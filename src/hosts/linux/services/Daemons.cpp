@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <string_view>
 
+#include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
@@ -44,9 +45,9 @@ DaemonGroup::DaemonGroup(Daemons& daemons, std::vector<std::string> units)
 }
 
 std::string DaemonGroup::names() const {
-  std::string names;
-  for (const auto& member : _members) names.append(names.empty() ? "" : ", ").append(member.unit);
-  return names;
+  std::vector<std::string> units;
+  for (const auto& member : _members) units.emplace_back(member.unit);
+  return commaList(units);
 }
 
 Result<DaemonGroup> DaemonGroup::present() const {
@@ -105,7 +106,7 @@ Result<bool> DaemonGroup::isChanging() const {
   return !changing->empty();
 }
 
-Result<void> DaemonGroup::setAllStartAtBoot(bool start) const {
+Result<void> DaemonGroup::setAllStartAtBoot(bool start, WrittenPlaces& written) const {
   std::vector<Daemon> others;
   for (const auto& member : _members) {
     const auto starts = _daemons.startsAtBoot(member);
@@ -114,7 +115,7 @@ Result<void> DaemonGroup::setAllStartAtBoot(bool start) const {
     if (!isLinked) return isLinked.failure();
     if (*isLinked != start) others.push_back(member);
   }
-  return others.empty() ? Result<void>() : _daemons.setStartAtBoot(others, start);
+  return others.empty() ? Result<void>() : _daemons.setStartAtBoot(others, start, written);
 }
 
 Result<void> DaemonGroup::startAll() const {

@@ -39,9 +39,8 @@ class Daemons {
   /// Whether it does not start at boot and could: what cannot be enabled, as what another brings with it, does neither.
   virtual Result<bool> staysOffAtBoot(const Daemon& daemon) = 0;
   /// One after the other; the first failure ends it. Only root may; whoever is not is refused before anything changes.
-  virtual Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) = 0;
-  /// The links that setStartAtBoot() has made and removed since this was asked last.
-  std::vector<std::string> takeWritten() { return std::exchange(_written, {}); }
+  /// The links that are made and removed are added to `written`.
+  virtual Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start, WrittenPlaces& written) = 0;
   /// Success means that the daemon runs: one that was started and ended at once, or never began, is a failure.
   virtual Result<void> start(const Daemon& daemon) = 0;
   virtual Result<void> stop(const Daemon& daemon) = 0;
@@ -53,23 +52,7 @@ class Daemons {
   /// Asked before a daemon is started or stopped that is to start at boot or no longer to: fails where setStartAtBoot()
   /// would have something to change and the caller is not root.
   Result<void> checkMayStartAtBoot(const Daemon& daemon, bool start);
-
- protected:
-  /// A link for takeWritten().
-  void addWritten(const std::string& link) { _written.push_back(link); }
-
- private:
-  std::vector<std::string> _written;
 };
-
-/// A change of what starts with the machine; the links that it has written are added to `written`.
-template <typename Change>
-Result<void> noting(WrittenPlaces& written, Daemons& daemons, const Change& change) {
-  static_cast<void>(daemons.takeWritten());
-  auto changed = change();
-  for (const auto& link : daemons.takeWritten()) written.add(link);
-  return changed;
-}
 
 /// Daemons that belong together, such as a service and the socket that starts it, the most important one first.
 class DaemonGroup {
@@ -95,7 +78,7 @@ class DaemonGroup {
   Result<bool> isChanging() const;
 
   /// Each member that is not so already; the first failure ends it.
-  Result<void> setAllStartAtBoot(bool start) const;
+  Result<void> setAllStartAtBoot(bool start, WrittenPlaces& written) const;
   /// Those that are not ready, sockets first: a socket is not started beside its running service.
   Result<void> startAll() const;
   /// Sockets first, so that none starts its service again, and the last one first.

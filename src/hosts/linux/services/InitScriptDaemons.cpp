@@ -106,12 +106,12 @@ Result<std::set<std::string>> InitScriptDaemons::linksTo(const Daemon& daemon) c
   return links;
 }
 
-Result<void> InitScriptDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
+Result<void> InitScriptDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start, WrittenPlaces& written) {
   for (const auto& daemon : daemons) {
     const auto before = linksTo(daemon);
     if (!before) return before.failure();
     auto turned = turnLinks(daemon, start);
-    for (const auto& link : differing(*before, linksTo(daemon).valueOr(*before))) addWritten(link);
+    for (const auto& link : differing(*before, linksTo(daemon).valueOr(*before))) written.add(link);
     if (!turned) return turned;
   }
   return {};

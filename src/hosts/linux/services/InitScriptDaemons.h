@@ -27,7 +27,7 @@ class InitScriptDaemons final : public Daemons {
   Result<bool> startsAtBoot(const Daemon& daemon) override;
   Result<bool> startsUntilRestart(const Daemon& /*daemon*/) override { return false; }
   Result<bool> staysOffAtBoot(const Daemon& daemon) override;
-  Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) override;
+  Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start, WrittenPlaces& written) override;
   Result<void> start(const Daemon& daemon) override;
   Result<void> stop(const Daemon& daemon) override;
   Result<void> restart(const Daemon& daemon) override;

@@ -65,6 +65,19 @@ class EndedJobs {
   std::unique_ptr<Bus::Subscription> _subscription;
 };
 
+/// Of the manager's list of changes, at which the reply is: (kind, link, what it leads to). Of other kinds nothing was
+/// written.
+void addLinks(BusMessage& changes, WrittenPlaces& written) {
+  if (!changes.enter('a', "(sss)")) return;
+  while (changes.enter('r', "sss")) {
+    const auto kind = changes.readText();
+    const auto link = changes.readText();
+    changes.readText();
+    if (kind == "symlink" || kind == "unlink") written.add(link);
+    changes.exit();
+  }
+}
+
 }  // namespace
 
 Result<BusMessage> UnitDaemons::ask(const Daemon& daemon, const char* member, const char* replySignature) {
@@ -148,14 +161,14 @@ Result<bool> UnitDaemons::staysOffAtBoot(const Daemon& daemon) {
 }
 
 /// Reads the unit files once for all of them, also when one could not be changed.
-Result<void> UnitDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
+Result<void> UnitDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, bool start, WrittenPlaces& written) {
   // There is no leave for single units: who may change one unit file may change all of them.
   if (const auto forRoot = whyNeedsRoot(start ? "enable" : "disable", daemons.empty() ? "" : daemons.front().unit))
     return *forRoot;
   Result<void> last;
   bool isAnyChanged = false;
   for (const auto& daemon : daemons) {
-    last = changeLinks(daemon, start);
+    last = changeLinks(daemon, start, written);
     if (!last) break;
     isAnyChanged = true;
   }
@@ -164,7 +177,7 @@ Result<void> UnitDaemons::setStartAtBoot(const std::vector<Daemon>& daemons, boo
   return last ? reloaded : last;
 }
 
-Result<void> UnitDaemons::changeLinks(const Daemon& daemon, bool start) {
+Result<void> UnitDaemons::changeLinks(const Daemon& daemon, bool start, WrittenPlaces& written) {
   const std::vector<std::string> files{daemon.unit};
   constexpr bool replaceLinks = false;
   const auto state = fileState(daemon);
@@ -175,20 +188,8 @@ Result<void> UnitDaemons::changeLinks(const Daemon& daemon, bool start) {
   if (!changed) return changed.failure();
   auto changes = std::move(changed).value();
   if (start) changes.readBoolean();
-  noteWritten(changes);
+  addLinks(changes, written);
   return {};
-}
-
-/// (kind, link, what it leads to); of other kinds nothing was written.
-void UnitDaemons::noteWritten(BusMessage& changes) {
-  if (!changes.enter('a', "(sss)")) return;
-  while (changes.enter('r', "sss")) {
-    const auto kind = changes.readText();
-    const auto link = changes.readText();
-    changes.readText();
-    if (kind == "symlink" || kind == "unlink") addWritten(link);
-    changes.exit();
-  }
 }
 
 Result<void> UnitDaemons::runJob(const Daemon& daemon, const char* method) {

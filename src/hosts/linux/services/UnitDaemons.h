@@ -26,7 +26,7 @@ class UnitDaemons final : public Daemons {
   Result<bool> startsAtBoot(const Daemon& daemon) override;
   Result<bool> startsUntilRestart(const Daemon& daemon) override;
   Result<bool> staysOffAtBoot(const Daemon& daemon) override;
-  Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start) override;
+  Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start, WrittenPlaces& written) override;
   Result<void> start(const Daemon& daemon) override;
   Result<void> stop(const Daemon& daemon) override;
   Result<void> restart(const Daemon& daemon) override;
@@ -45,9 +45,7 @@ class UnitDaemons final : public Daemons {
   /// A word such as "enabled", as systemctl(1) lists them; empty when there is no such unit file.
   Result<std::string> fileState(const Daemon& daemon);
   /// The manager does not take them up before it is reloaded.
-  Result<void> changeLinks(const Daemon& daemon, bool start);
-  /// Reads the manager's list of changes, at which the reply is.
-  void noteWritten(BusMessage& changes);
+  Result<void> changeLinks(const Daemon& daemon, bool start, WrittenPlaces& written);
   /// Runs a job to its end.
   Result<void> runJob(const Daemon& daemon, const char* method);
   Failure whyNotRunning(const Daemon& daemon);

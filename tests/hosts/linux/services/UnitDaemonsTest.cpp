@@ -95,7 +95,8 @@ TEST_F(ManagedDaemons, StartWithTheMachineByRootOnly) {
   // Of this thread alone; the manager's goes on.
   const auto become = [](uid_t user) { return ::syscall(SYS_setresuid, -1, user, -1); };
   if (become(65534) != 0) GTEST_SKIP() << "only root can be somebody else";
-  const auto disabled = daemons.setStartAtBoot({daemon}, false);
+  WrittenPlaces written;
+  const auto disabled = daemons.setStartAtBoot({daemon}, false, written);
   const auto mayDisable = daemons.checkMayStartAtBoot(daemon, false);
   const auto mayEnable = daemons.checkMayStartAtBoot(daemon, true);
   ASSERT_EQ(become(0), 0);
