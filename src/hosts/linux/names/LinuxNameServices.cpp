@@ -18,6 +18,7 @@ namespace {
 
 constexpr const char* setComputer = "set the computer name";
 constexpr const char* setLocal = "set the host name";
+constexpr std::chrono::milliseconds longestAfterLostAnswer{500};
 
 BusObject nameService() {
   return {"org.freedesktop.hostname1", "/org/freedesktop/hostname1", "org.freedesktop.hostname1"};
@@ -213,7 +214,7 @@ Result<void> LinuxHostConfigService::storeLocalName(const std::string& name, Wri
 /// Where the name was stored all the same it is right among the hosts too.
 Failure LinuxHostConfigService::putBackHosts(const std::string& hosts, const std::string& name, Failure cause,
                                              WrittenPlaces& written) {
-  if (const auto stored = staticHostName(_machine.root); stored && *stored == name) {
+  if (isStoredAfterAll(name, cause)) {
     written.add(staticNameFile);
     return cause;
   }
@@ -224,6 +225,14 @@ Failure LinuxHostConfigService::putBackHosts(const std::string& hosts, const std
   else
     cause.why += "; " + describe(restored.failure());
   return cause;
+}
+
+/// A service that was asked and whose answer was lost goes on with what it was asked for.
+bool LinuxHostConfigService::isStoredAfterAll(const std::string& name, const Failure& cause) const {
+  const auto isStored = [&] { return staticHostName(_machine.root).valueOr(std::nullopt) == name; };
+  if (cause.code == BusErrorCode::accessDenied || cause.code == BusErrorCode::interactionRequired) return isStored();
+  const auto looks = _machine.runLoop.every(std::chrono::milliseconds(20), [] {});
+  return _machine.runLoop.runUntil(RunLoop::Clock::now() + longestAfterLostAnswer, isStored);
 }
 
 /// The responder takes a name from root alone, and is told it last.

@@ -35,6 +35,7 @@ class LinuxHostConfigService final : public HostConfigService {
   Setting<std::string>::Found storedLocalName();
   Result<void> storeLocalName(const std::string& name, WrittenPlaces& written);
   Failure putBackHosts(const std::string& hosts, const std::string& name, Failure cause, WrittenPlaces& written);
+  bool isStoredAfterAll(const std::string& name, const Failure& cause) const;
   std::optional<Failure> whyAnnouncingNeedsRoot(const std::string& name);
   Result<void> storeStaticName(const std::string& name);
   Result<void> applyLocalName(const std::string& name);

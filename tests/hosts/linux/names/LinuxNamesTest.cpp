@@ -3,6 +3,9 @@
 #include <gmock/gmock.h>
 #include <systemd/sd-bus.h>
 
+#include <chrono>
+#include <thread>
+
 #include "effects/EffectMatchers.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/BusPeer.h"
@@ -155,6 +158,27 @@ TEST_F(NamesTest, PutHostsBackWhenTheNameIsNotStored) {
   EXPECT_THAT(tree.lastEffect(), FailedFor("ReadOnlyFilesystem"));
   EXPECT_EQ(tree.lastEffect().where, "");
   EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost\n127.0.1.1\tmachine\n");
+}
+
+TEST_F(NamesTest, KeepTheHostsOfANameThatIsStoredAfterItsAnswerWasLost) {
+  tree.write("/run/systemd/system/x", "");
+  std::thread storing;
+  BusPeer* service = nullptr;
+  BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+    if (member == "NameHasOwner") return sd_bus_reply_method_return(call, "b", 0);
+    service->hangUp();
+    storing = std::thread([&] {
+      std::this_thread::sleep_for(std::chrono::milliseconds(100));
+      tree.write("/etc/hostname", "new\n");
+    });
+    return 0;
+  });
+  service = &bus;
+  names.setLocalNetworkName("new");
+  storing.join();
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
+  EXPECT_EQ(tree.lastEffect().where, "/etc/hosts, /etc/hostname");
+  EXPECT_EQ(tree.file("/etc/hosts"), "127.0.0.1\tlocalhost\n127.0.1.1\tnew\n");
 }
 
 TEST(LinuxNames, LookOnceMoreWhenTheResponderIsLate) {
