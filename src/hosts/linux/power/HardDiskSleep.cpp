@@ -43,11 +43,14 @@ std::string ruleFor(Minutes minutes) {
 }
 
 /// The kernel answers EIO for a device that is not suspended after a while
-/// (Documentation/ABI/testing/sysfs-devices-power).
+/// (Documentation/ABI/testing/sysfs-devices-power), and does so again; an error that passes is no answer.
 Result<bool> canWait(const SysDevice& disk) {
-  const auto time = orGone(disk.read(delay));
-  if (time) return time->has_value();
-  return time.failure().code == std::errc::io_error ? Result<bool>(false) : time.failure();
+  auto time = orGone(disk.read(delay));
+  const auto isRefused = [&] { return !time && time.failure().code == std::errc::io_error; };
+  if (isRefused()) time = orGone(disk.read(delay));
+  if (isRefused()) return false;
+  if (!time) return time.failure();
+  return time->has_value();
 }
 
 /// Where the kernel does not stop the motor itself, a suspended disk goes on turning. One attribute was split in two in
