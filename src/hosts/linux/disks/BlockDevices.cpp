@@ -94,6 +94,8 @@ class DeviceLook {
   std::optional<BlockDevice> withNumber(DeviceNumber number);
   std::optional<BlockDevice> withNode(const std::string& node);
   DiskName wholeDisk(const DiskName& name);
+  std::optional<Mapping> mappingOf(const BlockDevice& device);
+  bool isCarrying(const BlockDevice& device);
   unsigned logicalBlockSize(const DiskName& disk);
   bool answersReads(const BlockDevice& device);
   bool isRemovable(const DiskName& disk);
@@ -197,6 +199,16 @@ DiskName DeviceLook::wholeDisk(const DiskName& name) {
   return disk;
 }
 
+std::optional<Mapping> DeviceLook::mappingOf(const BlockDevice& device) {
+  auto name = attribute(device.path, "dm/name");
+  if (name.empty()) return std::nullopt;
+  return Mapping{std::move(name), attribute(device.path, "dm/uuid")};
+}
+
+bool DeviceLook::isCarrying(const BlockDevice& device) {
+  return !seen(_root.list("/sys" + device.path + "/holders")).empty();
+}
+
 unsigned DeviceLook::logicalBlockSize(const DiskName& disk) {
   const auto size = count(pathOf(disk).value_or(""), "queue/logical_block_size");
   return size != 0 ? static_cast<unsigned>(size) : usualBlockSize;
@@ -287,6 +299,14 @@ Result<std::optional<BlockDevice>> BlockDevices::withNode(const std::string& nod
 
 Result<DiskName> BlockDevices::wholeDisk(const DiskName& name) const {
   return answer(_root, &DeviceLook::wholeDisk, name);
+}
+
+Result<std::optional<Mapping>> BlockDevices::mappingOf(const BlockDevice& device) const {
+  return answer(_root, &DeviceLook::mappingOf, device);
+}
+
+Result<bool> BlockDevices::isCarrying(const BlockDevice& device) const {
+  return answer(_root, &DeviceLook::isCarrying, device);
 }
 
 Result<unsigned> BlockDevices::logicalBlockSize(const DiskName& disk) const {

@@ -27,6 +27,12 @@ struct BlockDevice {
   bool writable = true;
 };
 
+/// By what the device mapper knows a mapped volume.
+struct Mapping {
+  std::string name;  ///< its node is "/dev/mapper/NAME"
+  std::string uuid;  ///< begins with what has made it: "LVM-", "CRYPT-"
+};
+
 /// What a connection to a disk is called: what protocolOf() of DiskQueries answers.
 namespace transport {
 inline constexpr const char* usb = "USB";
@@ -52,6 +58,11 @@ class BlockDevices {
   /// The hardware at the bottom: the disk of a partition; of a mapped volume or an array the first of the disks that
   /// it is on. A name that is not known is its own.
   Result<DiskName> wholeDisk(const DiskName& name) const;
+
+  /// Absent when it is no mapped volume.
+  Result<std::optional<Mapping>> mappingOf(const BlockDevice& device) const;
+  /// Whether mapped volumes or arrays are on it, which then have what it holds.
+  Result<bool> isCarrying(const BlockDevice& device) const;
 
   /// Of a whole disk, in bytes; 512 when it is not known.
   Result<unsigned> logicalBlockSize(const DiskName& disk) const;

@@ -117,6 +117,17 @@ VolumeFacts volumeFrom(const DeviceProperties& properties) {
           properties.findEscaped("ID_FS_UUID_ENC"), properties.findEscaped("ID_FS_BOOT_SYSTEM_ID")};
 }
 
+std::optional<PartitionFacts> partitionFrom(const DeviceProperties& properties, const BlockDevice& device) {
+  const auto number = parseNumber<int>(properties.find("ID_PART_ENTRY_NUMBER").value_or(""));
+  if (device.partition == 0 || number != device.partition) return std::nullopt;
+  return PartitionFacts{device.partition,
+                        device.start,
+                        device.size,
+                        properties.findEscaped("ID_PART_ENTRY_UUID").value_or(""),
+                        properties.find("ID_PART_ENTRY_TYPE").value_or(""),
+                        properties.findEscaped("ID_PART_ENTRY_NAME").value_or("")};
+}
+
 Result<void> readDisk(const SystemRoot& root, DiskFacts& facts) {
   const auto answers = BlockDevices(root).answersReads(facts.device);
   if (!answers) return answers.failure();
@@ -143,6 +154,7 @@ void readMedium(const SystemRoot& root, const DeviceProperties& properties, Disk
 void readContents(const SystemRoot& root, const DeviceProperties& properties, DiskFacts& facts) {
   facts.busPath = properties.find("ID_PATH").value_or(carrierOf(facts.device));
   facts.partitionType = properties.find("ID_PART_ENTRY_TYPE");
+  facts.partition = partitionFrom(properties, facts.device);
   if (properties.find("ID_FS_TYPE") || properties.find("ID_PART_TABLE_TYPE")) {
     facts.volume = volumeFrom(properties);
     facts.table.type = properties.find("ID_PART_TABLE_TYPE").value_or("");

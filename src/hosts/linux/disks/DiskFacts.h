@@ -20,6 +20,7 @@ struct DiskFacts {
   VolumeFacts volume;
   PartitionTable table;                      ///< of a whole disk; the device manager knows its type alone
   std::optional<std::string> partitionType;  ///< when the device manager knows it; else it stands in the disk's table
+  std::optional<PartitionFacts> partition;   ///< the same, of all that stands there
   std::string busPath;
   OpticalMedium medium = OpticalMedium::none;
   std::optional<Failure> unread;  ///< why the medium, the volume or the table is not known

@@ -13,6 +13,7 @@ void LinuxDiskEventSession::schedule(RunLoop& runLoop) {
   // What changes between this and the first report is told after it.
   watchDevices(runLoop);
   watchMounts(runLoop);
+  if (_watcher) _watcher->begin(runLoop, [this] { tell({}); });
   _firstReport = runLoop.after({}, [this] { tell({{}, true}); });
 }
 
@@ -21,7 +22,7 @@ void LinuxDiskEventSession::watchDevices(RunLoop& runLoop) {
   if (!events) return _disks.looks().tell(events.failure());
   _deviceEvents.emplace(std::move(events).value());
   _deviceChanges = runLoop.watch(_deviceEvents->descriptor(), RunLoop::Readiness::readable, [this] {
-    if (const auto changed = _deviceEvents->take(); changed.all || !changed.names.empty()) tell(changed);
+    if (const auto changed = _deviceEvents->take(); changed.all || !changed.names.empty()) tellNews(changed);
   });
 }
 
@@ -29,10 +30,11 @@ void LinuxDiskEventSession::watchMounts(RunLoop& runLoop) {
   auto mounts = _machine.root.open(MountTable::file, O_RDONLY);
   if (!mounts) return _disks.looks().tell(mounts.failure());
   _mounts = std::move(mounts).value();
-  _mountChanges = runLoop.watch(_mounts.number(), RunLoop::Readiness::priority, [this] { tell({}); });
+  _mountChanges = runLoop.watch(_mounts.number(), RunLoop::Readiness::priority, [this] { tellNews({}); });
 }
 
 void LinuxDiskEventSession::unschedule() {
+  if (_watcher) _watcher->end();
   _firstReport.cancel();
   _deviceChanges.cancel();
   _mountChanges.cancel();
@@ -46,8 +48,14 @@ void LinuxDiskEventSession::tell(const ChangedDevices& changed) {
   _disks.forgetOld();
 }
 
+void LinuxDiskEventSession::tellNews(const ChangedDevices& changed) {
+  tell(changed);
+  if (_watcher) _watcher->lookAgain();
+}
+
 std::optional<DiskName> LinuxDiskEventSession::diskOfPath(const std::string& path) {
   const auto place = _disks.looks().orTold(orEmpty(_machine.root.standardized(path)));
+  if (auto shown = _disks.shownAt(place)) return shown;
   if (place.empty() || (place != "/" && !_disks.looks().orTold(_machine.root.isThere(place)))) return std::nullopt;
   return _disks.holding(place);
 }

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <optional>
 
 #include "hosts/linux/disks/DeviceEvents.h"
@@ -12,10 +13,24 @@
 
 namespace tavisk {
 
+/// Who looks at the disks on his own while they are watched.
+class DiskWatcher {
+ public:
+  virtual ~DiskWatcher() = default;
+
+  /// `changed` is called, in passes of the loop, whenever the disks are to be told anew.
+  virtual void begin(RunLoop& runLoop, std::function<void()> changed) = 0;
+  /// Disks or mounts have changed.
+  virtual void lookAgain() = 0;
+  virtual void end() = 0;
+};
+
 /// The machine's disks as they come, go, change and are mounted.
 class LinuxDiskEventSession final : public DiskEventSession {
  public:
-  LinuxDiskEventSession(const LinuxMachine& machine, LinuxDisks& disks) : _machine(machine), _disks(disks) {}
+  /// The watcher may be null; nothing that is given is owned.
+  LinuxDiskEventSession(const LinuxMachine& machine, LinuxDisks& disks, DiskWatcher* watcher = nullptr)
+      : _machine(machine), _disks(disks), _watcher(watcher) {}
 
   void schedule(RunLoop& runLoop) override;
   void unschedule() override;
@@ -31,9 +46,11 @@ class LinuxDiskEventSession final : public DiskEventSession {
   void watchMounts(RunLoop& runLoop);
   /// Tells how the disks differ from those last told.
   void tell(const ChangedDevices& changed);
+  void tellNews(const ChangedDevices& changed);
 
   LinuxMachine _machine;
   LinuxDisks& _disks;
+  DiskWatcher* _watcher;
   DiskCallbacks _callbacks;
   LinuxDisks::Snapshot _told;
   std::optional<DeviceEvents> _deviceEvents;

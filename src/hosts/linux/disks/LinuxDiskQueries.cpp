@@ -7,14 +7,13 @@ namespace {
 
 constexpr ServiceStatus failed = 1;
 
-constexpr int masterBootRecord = 3;
 constexpr int otherMap = 4;
 
 int schemeOf(const std::string& table) {
   if (table.empty()) return partitionmap::noneKnown;
   if (table == "mac") return partitionmap::openFirmware;
   if (table == "gpt") return partitionmap::gpt;
-  return table == "dos" ? masterBootRecord : otherMap;
+  return table == "dos" ? LinuxDiskQueries::masterBootRecord : otherMap;
 }
 
 }  // namespace

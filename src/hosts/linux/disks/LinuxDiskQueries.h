@@ -10,6 +10,8 @@ namespace tavisk {
 /// Answers for a partition or a mapped volume are those of the hardware at its bottom.
 class LinuxDiskQueries final : public DiskQueries {
  public:
+  static constexpr int masterBootRecord = 3;  ///< what partitionScheme() answers for it
+
   explicit LinuxDiskQueries(LinuxDisks& disks) : _disks(disks) {}
 
   bool is(DiskTrait trait, const DiskName& disk) override;

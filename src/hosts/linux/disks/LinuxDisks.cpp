@@ -92,6 +92,29 @@ std::optional<DiskName> LinuxDisks::holding(const std::string& path) {
   return mount ? diskOf(*mount, 0) : std::nullopt;
 }
 
+bool LinuxDisks::show(std::map<std::string, Shown> volumes) {
+  const std::scoped_lock lock(_mutex);
+  return std::exchange(_shown, std::move(volumes)) != _shown;
+}
+
+std::optional<DiskName> LinuxDisks::shownAt(const std::string& path) {
+  const std::scoped_lock lock(_mutex);
+  const auto isAbove = [&](const auto& shown) {
+    return shown.second.point.size() > 1 && (path + "/").starts_with(shown.second.point + "/");
+  };
+  const auto found = std::ranges::find_if(_shown, isAbove);
+  return found == _shown.end() ? std::nullopt : std::optional(DiskName{found->first});
+}
+
+bool LinuxDisks::hasShown(const DiskName& disk) {
+  const auto whole = wholeDisk(disk);
+  const std::scoped_lock lock(_mutex);
+  return std::ranges::any_of(_shown, [&](const auto& shown) {
+    const auto itsDisk = _devices.wholeDisk({shown.first});
+    return itsDisk && *itsDisk == whole;
+  });
+}
+
 LinuxDisks::Snapshot LinuxDisks::renew(const ChangedDevices& changed) {
   const std::scoped_lock lock(_mutex);
   readMounts();
@@ -231,6 +254,11 @@ std::shared_ptr<DiskDescription> LinuxDisks::describe(const DiskFacts& facts) co
     disk->volumePath = mount->point;
     if (!disk->volumeKind) disk->volumeKind = kindOf(mount->type);
   }
+  const auto shown = _shown.find(facts.device.name.text);
+  if (shown == _shown.end()) return disk;
+  const auto& [name, point] = shown->second;
+  disk->volumeName = name;
+  disk->volumePath = point.empty() ? std::nullopt : std::optional(point);
   return disk;
 }
 

@@ -49,6 +49,19 @@ class LinuxDisks {
     return probePartitionTable(_machine.root, disk.node);
   }
 
+  /// How a volume is shown, whatever it is.
+  struct Shown {
+    std::string name;   ///< in the place of its label
+    std::string point;  ///< where it is mounted; empty: nowhere
+    bool operator==(const Shown&) const = default;
+  };
+  /// By the names of their devices. Whether one of them was shown otherwise before.
+  bool show(std::map<std::string, Shown> volumes);
+  /// The volume that is shown where a path is; absent when it is none of these.
+  std::optional<DiskName> shownAt(const std::string& path);
+  /// Whether a volume that is shown so is on the disk, which may be a partition of it too.
+  bool hasShown(const DiskName& disk);
+
   /// Looks at the mounts anew, at the devices that have changed, and at those that are mounted elsewhere than before.
   Snapshot renew(const ChangedDevices& changed);
   void forgetOld();
@@ -77,6 +90,7 @@ class LinuxDisks {
   std::set<std::string> _unread;            ///< the devices of which the last look has failed
   bool _isListUnread = false;               ///< so has that at all of them
   MountTable _mounts{""};
+  std::map<std::string, Shown> _shown;  ///< by the names of their devices
   /// Of file systems that have no device number: their disks by the sources that were mounted last, and the mounts by
   /// disk.
   std::map<std::string, std::optional<DiskName>> _sources;

@@ -1,0 +1,21 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/volumes/MountedVolume.h"
+
+namespace tavisk {
+
+Result<const Mount*> mountOf(const MountTable& mounts, const BlockDevices& devices, const BlockDevice& device,
+                             const std::string& type) {
+  const auto* best = mounts.mountOf(device.number);
+  if (best) return best;
+  for (const auto& mount : mounts.mounts()) {
+    const bool isBetter = !best || (best->root != "/" && mount.root == "/");
+    if (!mount.visible || mount.device.major != 0 || mount.type != type || !isBetter) continue;
+    const auto source = devices.withNode(mount.source);
+    if (!source) return source.failure();
+    if (*source && (*source)->number == device.number) best = &mount;
+  }
+  return best;
+}
+
+}  // namespace tavisk
