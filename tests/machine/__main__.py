@@ -16,6 +16,7 @@ import machine
 import purge
 import server
 import startup
+import systems
 import trees
 
 REMOTE = ["avahi-daemon", "iproute2", "jq", "openssh-server", "sudo", "systemd-resolved"]
@@ -25,14 +26,15 @@ KINDS = {
     "guest": [guest.Guest],
     "server": [server.Server],
     "startup": [startup.Startup],
+    "systems": [systems.Grub, systems.BootEntries, systems.SavedDefault],
     "sweep": [faults.Faults],
 }
-ALONE = "sweep"  # takes long, and is run only when it is asked for
+ALONE = ("systems", "sweep")  # take long, and are run only when they are asked for
 
 
 def arguments():
     parser = argparse.ArgumentParser(prog="test-machine")
-    parser.add_argument("kinds", nargs="*", metavar="KIND", help=f"{', '.join(KINDS)}; without any, all but {ALONE}")
+    parser.add_argument("kinds", nargs="*", metavar="KIND", help=f"{', '.join(KINDS)}; without any, all but {' and '.join(ALONE)}")
     parser.add_argument("--keep", action="store_true", help="ask for commands before a machine ends")
     chosen = parser.parse_args()
     if unknown := set(chosen.kinds) - set(KINDS):
@@ -53,7 +55,7 @@ def prove(make, results, keep):
     began = time.monotonic()
     try:
         tested.start()
-        check.prove(tested, results)
+        tested.prove(results)
         if "bus" in tested.has:
             purge.prove(tested, results)
         if keep:
@@ -68,7 +70,7 @@ def main():
     guard.refuse_unless_isolated()
     trees.prepare_work()
     results = check.Results()
-    for kind in chosen.kinds or [kind for kind in KINDS if kind != ALONE]:
+    for kind in chosen.kinds or [kind for kind in KINDS if kind not in ALONE]:
         for make in KINDS[kind]:
             try:
                 prove(make, results, chosen.keep)

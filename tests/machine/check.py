@@ -72,7 +72,7 @@ def _see(machine, check):
             for problem in _difference(command, expected, machine.run(command).output)]
 
 
-def _do_all(machine, checks, results, when=""):
+def do_all(machine, checks, results, when=""):
     for check in checks:
         problems = _do(machine, check) + _see(machine, check)
         if problems:
@@ -98,10 +98,10 @@ class Results:
 def prove(machine, results):
     """All checks of this machine, what is kept over a restart, and all checks again."""
     checks = [check for check in every() if machine.own <= check.needs <= machine.has]
-    _do_all(machine, checks, results)
+    do_all(machine, checks, results)
     machine.restart()
     for check in checks:
         if check.kept:
             results.add(f"{machine.name}, restarted: {check.name}", _see(machine, check))
-    _do_all(machine, checks, results, ", again")
+    do_all(machine, checks, results, ", again")
     machine.prove_more(results)

@@ -4,6 +4,8 @@
 
 import time
 
+import check
+
 
 class Trouble(Exception):
     """The machine itself, not a setting, went wrong."""
@@ -16,6 +18,10 @@ class Machine:
     has = frozenset()  # what checks may need
     own = frozenset()  # the words of which a check has to need all
     cannot = ""        # what cannot be proven on it, for people
+
+    def prove(self, results):
+        """Everything that is to hold on it."""
+        check.prove(self, results)
 
     def prove_more(self, results):
         """What no Check can say."""

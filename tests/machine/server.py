@@ -22,13 +22,14 @@ linux /vmlinuz
 initrd /initrd
 options root=PARTLABEL=root rw console=ttyS0 systemd.log_color=0
 """
+# The disks are found late.
+WAITS_FOR_DISKS = "ExecStartPre=-timeout 60 sh -c 'until [ -e /sys/block/sdb ]; do sleep 1; done; udevadm settle'\n"
 AGENT_UNIT = """[Unit]
 Description=Commands of the tests
 After=multi-user.target
 
 [Service]
-ExecStartPre=-timeout 60 sh -c 'until [ -e /sys/block/sdb ]; do sleep 1; done; udevadm settle'
-ExecStart=/bin/sh /usr/lib/agent.sh /dev/ttyS1
+{waits}ExecStart=/bin/sh /usr/lib/agent.sh /dev/ttyS1
 
 [Install]
 WantedBy=graphical.target
@@ -51,7 +52,7 @@ class Server(emulator.Emulated):
             *(devices or _power_devices())])
         self._controller = None if devices else controller.Controller(CONTROLLER)
         shutil.copy(FIRMWARE_VARIABLES, variables)
-        _add_agent(tree)
+        add_agent(tree, WAITS_FOR_DISKS)
         self.equip(tree)
         _make_disk(tree, disk)
 
@@ -77,9 +78,9 @@ def _power_devices():
     return devices
 
 
-def _add_agent(tree):
+def add_agent(tree, waits=""):
     shutil.copy(emulator.AGENT, tree / "usr/lib/agent.sh")
-    (tree / "etc/systemd/system/agent.service").write_text(AGENT_UNIT)
+    (tree / "etc/systemd/system/agent.service").write_text(AGENT_UNIT.format(waits=waits))
     trees.run("systemctl", f"--root={tree}", "enable", "agent.service")
 
 
