@@ -14,6 +14,9 @@ namespace tavisk {
 /// Whether engaging the enclosure lock disables the keyboard, a boolean.
 inline constexpr const char* DunmereLockEnclosureStateKey = "DunmereLockEnclosureState";
 
+/// The user default with which the search for startup disks tells the system log what it finds, a boolean.
+inline constexpr const char* startupDiskDebugKey = "StartupDiskDebug";
+
 /// The preferences of any application, for any user, on this host.
 class PreferencesStore {
  public:

@@ -58,7 +58,7 @@ std::string formatMessage(std::string_view format, std::initializer_list<Message
 }
 
 void SDLog::debug(std::string_view format, std::initializer_list<MessageValue> values) const {
-  if (_defaults.boolean("StartupDiskDebug")) always(format, values);
+  if (_defaults.boolean(startupDiskDebugKey)) always(format, values);
 }
 
 void SDLog::always(std::string_view format, std::initializer_list<MessageValue> values) const {

@@ -26,18 +26,25 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _powerController(_machine, _controller),
       _bootLoaderFile(_machine),
       _disks(_machine),
-      _diskEvents(_machine, _disks),
-      _diskManagement(_machine, _disks),
+      _userDefaults(_root, _disks.looks()),
+      _systems(_machine, _disks, [this](const auto& why) { explainToLog(why); }),
+      _systemFiles(_files, _systems),
+      _diskEvents(_machine, _disks, &_systems),
+      _diskManagement(_machine, _disks, _systems),
       _registry(_root, _disks.looks()),
       _networkInterfaces(effects),
       _kernel(_root, _disks.looks()),
       _keyboardInput(_root),
-      _userDefaults(_root, _disks.looks()),
       _programs(_machine),
       _processTermination(_machine),
       _preferences(_machine, _controller),
       _processes(_machine, _preferences) {
   effects.addChannel(_journalLog);
+}
+
+/// Why a system is not listed, as the search itself tells.
+void LinuxHost::explainToLog(const std::string& why) {
+  if (_userDefaults.boolean(startupDiskDebugKey)) _systemLog.write(why);
 }
 
 }  // namespace tavisk

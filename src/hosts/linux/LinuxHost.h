@@ -9,7 +9,8 @@
 #include "hosts/linux/clock/LinuxClockService.h"
 #include "hosts/linux/clock/LinuxNetworkTimeService.h"
 #include "hosts/linux/disks/LinuxDiskEventSession.h"
-#include "hosts/linux/firmware/LinuxDiskManagementService.h"
+#include "hosts/linux/systems/LinuxDiskManagementService.h"
+#include "hosts/linux/systems/SystemFiles.h"
 #include "hosts/linux/machine/LinuxBootLoaderFile.h"
 #include "hosts/linux/machine/LinuxIORegistry.h"
 #include "hosts/linux/machine/LinuxMachineFacts.h"
@@ -35,7 +36,7 @@ class LinuxHost final : public Host {
 
   UserDatabase& users() override { return _users; }
   AdminAuthenticator& authenticator() override { return _authenticator; }
-  FileSystem& files() override { return _files; }
+  FileSystem& files() override { return _systemFiles; }
   SystemLog& systemLog() override { return _systemLog; }
   ClockService& clock() override { return _clock; }
   NetworkTimeService& networkTime() override { return _networkTime; }
@@ -60,6 +61,8 @@ class LinuxHost final : public Host {
   ProcessTermination& processTermination() override { return _processTermination; }
 
  private:
+  void explainToLog(const std::string& why);
+
   SystemRoot _root;
   JournalLog _journalLog;
   ServiceAccess _services;
@@ -82,13 +85,15 @@ class LinuxHost final : public Host {
   LinuxPowerController _powerController;
   LinuxBootLoaderFile _bootLoaderFile;
   LinuxDisks _disks;
+  LinuxUserDefaults _userDefaults;
+  LinuxSystems _systems;
+  SystemFiles _systemFiles;
   LinuxDiskEventSession _diskEvents;
   LinuxDiskManagementService _diskManagement;
   LinuxIORegistry _registry;
   LinuxNetworkInterfaces _networkInterfaces;
   LinuxKernelValues _kernel;
   LinuxKeyboardInputService _keyboardInput;
-  LinuxUserDefaults _userDefaults;
   LinuxProgramRunner _programs;
   LinuxProcessTermination _processTermination;
   LinuxPreferencesStore _preferences;

@@ -5,6 +5,8 @@
 #include <algorithm>
 #include <unordered_map>
 
+#include "platform/Preferences.h"
+
 namespace tavisk {
 namespace {
 
@@ -89,7 +91,7 @@ constexpr KeyRow rows[] = {
     {"", "Preferences Writes", integer, "0", "how often preferences were written out"},
 
     {"", "User Defaults", dictionary, absent, "defaults of the user who runs the tool"},
-    {"User Defaults", "StartupDiskDebug", boolean, "false", "log the search for startup disks"},
+    {"User Defaults", startupDiskDebugKey, boolean, "false", "log the search for startup disks"},
     {"User Defaults", "VelmarLanguages", strings, absent, R"(preferred languages; absent or empty: "en")"},
     {"User Defaults", "SDWirestartScanInterval", number, absent, "seconds between two searches"},
 

@@ -69,7 +69,15 @@ Result<std::optional<BootEntry>> BootEntries::first() const {
 }
 
 Result<std::optional<BootEntry>> BootEntries::onlyNext() const {
-  const auto bytes = _variables.read({"BootNext"});
+  return namedBy("BootNext");
+}
+
+Result<std::optional<BootEntry>> BootEntries::current() const {
+  return namedBy("BootCurrent");
+}
+
+Result<std::optional<BootEntry>> BootEntries::namedBy(const char* variable) const {
+  const auto bytes = _variables.read({variable});
   if (!bytes) return bytes.failure();
   auto rest = *bytes ? **bytes : std::string_view();
   const auto number = takeNumber(rest, numberSize);

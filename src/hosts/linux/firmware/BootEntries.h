@@ -37,6 +37,8 @@ class BootEntries {
   Result<std::optional<BootEntry>> first() const;
   /// The entry for the next start alone.
   Result<std::optional<BootEntry>> onlyNext() const;
+  /// The entry that the machine was started by.
+  Result<std::optional<BootEntry>> current() const;
 
   using KeepOrder = std::function<Result<void>(const std::vector<std::uint16_t>& order)>;
   /// Puts an entry that starts the same at the front of the order; without one a new one is made first. All others keep
@@ -47,6 +49,7 @@ class BootEntries {
 
  private:
   Result<std::optional<BootEntry>> read(std::uint16_t number) const;
+  Result<std::optional<BootEntry>> namedBy(const char* variable) const;
   Result<std::optional<BootEntry>> startingAs(const EfiLoadOption& option) const;
   Result<void> changeOrder(std::uint16_t first, const KeepOrder& keep, WrittenPlaces& written) const;
   Result<void> readBack(const EfiVariableName& variable, const EfiLoadOption& option) const;

@@ -48,6 +48,12 @@ bool isAnswer(const Failure& failure) {
 
 }  // namespace
 
+bool BootVolumes::isBootFile(const std::string& file) {
+  constexpr std::string_view inSystemFolder = R"(\System\Library\CoreServices\boot.efi)";
+  const auto start = file.size() - std::min(file.size(), inSystemFolder.size());
+  return compareIgnoringCase(std::string_view(file).substr(start), inSystemFolder) == 0 || fileSystemOf(file);
+}
+
 Result<BootTarget> BootVolumes::targetOf(const DiskName& volume, const std::string& systemFolder) const {
   const auto device = deviceOf(volume);
   if (!device) return device.failure();

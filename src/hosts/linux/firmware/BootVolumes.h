@@ -33,14 +33,19 @@ class BootVolumes {
   /// find nothing, or could find something else. Mounts and disks are read as they are now.
   Result<BootTarget> targetOf(const DiskName& volume, const std::string& systemFolder) const;
 
-  /// The volume that is started by a file of a partition.
+  /// Whether a file is a volume's own, and no loader: it is in a system folder, or is kept for a volume.
+  static bool isBootFile(const std::string& file);
+
+  /// The volume that is started by such a file of a partition.
   Result<DiskName> volumeOf(const EfiPartition& partition, const std::string& file) const;
+
+  /// As firmware knows a partition; fails when it has no name, or not one alone.
+  Result<EfiPartition> identityOf(const BlockDevice& partition) const;
 
  private:
   Result<BootTarget> onVolume(const BlockDevice& volume, const std::string& systemFolder) const;
   Result<BootTarget> besideVolume(const BlockDevice& volume, const VolumeFacts& facts) const;
   Result<BootTarget> onSystemPartition(const DiskName& name, const std::string& file) const;
-  Result<EfiPartition> identityOf(const BlockDevice& partition) const;
   Result<std::vector<DiskName>> systemPartitionsOf(const DiskName& disk) const;
   Result<BlockDevice> deviceOf(const DiskName& name) const;
   Result<std::vector<BlockDevice>> allDevices() const;

@@ -34,6 +34,7 @@ bool isBootEntry(const EfiVariableName& variable) {
 
 bool mayBeWritten(const EfiVariableName& variable) {
   if (variable.vendor == efiOwnVendor) return std::ranges::find(ownNames, variable.name) != ownNames.end();
+  if (variable.vendor == efiLoaderVendor) return variable.name == "LoaderEntryDefault";
   return isBootEntry(variable) || (variable.vendor == efiGlobalVendor && variable.name == "BootOrder");
 }
 

@@ -14,8 +14,9 @@
 
 namespace tavisk {
 
-/// Whose variable it is: the firmware standard's, or this program's own.
+/// Whose variable it is: the firmware standard's, this program's own, or of loaders (The Boot Loader Interface).
 inline constexpr const char* efiGlobalVendor = "8be4df61-93ca-11d2-aa0d-00e098032b8c";
+inline constexpr const char* efiLoaderVendor = "4a67b082-0a4c-41cf-b6c7-440b29bb8c4f";
 inline constexpr const char* efiOwnVendor = "216b9a59-f9b0-4992-b711-0922c3e0edf7";
 
 struct EfiVariableName {
@@ -30,7 +31,8 @@ std::optional<std::uint16_t> bootEntryNumber(std::string_view name);
 
 /// The firmware's variables, as the kernel shows them in a file system (efivarfs in the kernel's documentation).
 ///
-/// Only BootOrder and this program's own variables are ever changed, and boot entries only made where none is.
+/// Only BootOrder, a loader's default and this program's own variables are ever changed, and boot entries only made
+/// where none is.
 class EfiVariables {
  public:
   /// The root is not owned.

@@ -4,7 +4,7 @@
 
 #include "hosts/linux/TracedRun.h"
 #include "hosts/linux/firmware/BootTree.h"
-#include "hosts/linux/firmware/LinuxBootSettings.h"
+#include "hosts/linux/systems/LinuxBootSettings.h"
 #include "platform/DiskManagementContract.h"
 
 namespace tavisk {
@@ -46,6 +46,7 @@ const std::string mainFile = systemFolder + std::string("/boot.efi");
 const std::string backupFile = "/Volumes/Backup" + mainFile;
 constexpr const char* mainUuid = "0f1e2d3c-4b5a-6978-8796-a5b4c3d2e1f0";
 constexpr const char* backupPath = R"(HD(1,MBR,11223344-01,0x800,0x800)/File(\System\Library\CoreServices\boot.efi))";
+constexpr const char* ownFile = R"(\System\Library\CoreServices\boot.efi)";
 constexpr const char* otherPath = R"(File(\EFI\debian\shimx64.efi))";
 
 /// Main (ext4, sda2) with its EFI system partition (sda1), and Backup (FAT, sdb1 of an MBR disk).
@@ -60,7 +61,7 @@ class LinuxBootSettingsTest : public testing::Test {
     tree.setOrder({0});
   }
 
-  LinuxBootSettings settings() { return LinuxBootSettings(tree.machine, _disks); }
+  LinuxBootSettings settings() { return LinuxBootSettings(tree.machine, _disks, _systems); }
   ServiceStatus set(const std::string& disk, const std::string& volume) {
     return settings().setBootPreference({{disk}, volume + systemFolder, false});
   }
@@ -115,6 +116,7 @@ class LinuxBootSettingsTest : public testing::Test {
 
   bool _hasTools = true;
   LinuxDisks _disks{tree.machine};
+  LinuxSystems _systems{tree.machine, _disks, [](const auto&) {}};
 };
 
 TEST_F(LinuxBootSettingsTest, StartsTheVolumesOwnFile) {
@@ -200,7 +202,7 @@ TEST_F(LinuxBootSettingsTest, StartsASignedFileUnderSecureBoot) {
 TEST_F(LinuxBootSettingsTest, KnowsAPartitionByItsIdentityAlone) {
   EXPECT_EQ(preferredDisk(), "");
   EXPECT_THAT(tree.lastEffect(), FailedFor("Boot0000 (other)"));
-  tree.setEntry(4, {*partitionNode({"6c8f1b52-0e5a-4e0c-9b66-0123456789ab", 9, 1, 1}), fileNode("a")});
+  tree.setEntry(4, {*partitionNode({"6c8f1b52-0e5a-4e0c-9b66-0123456789ab", 9, 1, 1}), fileNode(ownFile)});
   tree.setOrder({4, 0});
   EXPECT_EQ(preferredDisk(), "sda1");
 }
@@ -213,7 +215,7 @@ TEST_F(LinuxBootSettingsTest, TellsOfTheNextStartAlone) {
   auto expected = effectOf(Outcome::applied, otherPath, backupPath, "Boot0001");
   expected.note = "the next start alone is from Boot0005 (other), as BootNext says";
   EXPECT_EQ(tree.lastEffect(), expected);
-  tree.setEntry(5, {*partitionNode({"6c8f1b52-0e5a-4e0c-9b66-0123456789ab", 1, 1, 1})});
+  tree.setEntry(5, {*partitionNode({"6c8f1b52-0e5a-4e0c-9b66-0123456789ab", 1, 1, 1}), fileNode(ownFile)});
   tree.log.wants = true;
   EXPECT_EQ(preferredDisk(), "sda1");
   EXPECT_THAT(tree.log.values, testing::ElementsAre(SettingValue{setting::startupDisk, "sda1", "sdb1"}));
