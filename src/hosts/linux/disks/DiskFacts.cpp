@@ -20,20 +20,6 @@ namespace {
 
 constexpr std::size_t recordLimit = std::size_t{1} << 20U;
 
-/// Blanks and special characters are written as \x20.
-std::string unescaped(std::string_view text) {
-  constexpr std::string_view sign = "\\x";
-  constexpr std::size_t digitCount = 2;
-  std::string plain;
-  while (!text.empty()) {
-    const auto digits = text.starts_with(sign) ? text.substr(sign.size(), digitCount) : std::string_view();
-    const auto byte = digits.size() == digitCount ? parseNumber<unsigned char>(digits, 16) : std::nullopt;
-    plain += byte ? static_cast<char>(*byte) : text.front();
-    text.remove_prefix(byte ? sign.size() + digitCount : 1);
-  }
-  return plain;
-}
-
 /// What the device manager has found out about one device and keeps in /run/udev: its properties, by the names that
 /// `udevadm info` shows. Nothing where no device manager runs.
 class DeviceProperties {
@@ -51,7 +37,7 @@ class DeviceProperties {
   }
   std::optional<std::string> findEscaped(const std::string& name) const {
     const auto value = find(name);
-    return value ? std::optional(unescaped(*value)) : std::nullopt;
+    return value ? std::optional(withoutHexEscapes(*value)) : std::nullopt;
   }
   bool isSet(const std::string& name) const { return find(name) == "1"; }
   /// Whether one of those whose names begin so is.
@@ -164,6 +150,19 @@ void readContents(const SystemRoot& root, const DeviceProperties& properties, Di
 }
 
 }  // namespace
+
+std::string withoutHexEscapes(std::string_view text) {
+  constexpr std::string_view sign = "\\x";
+  constexpr std::size_t digitCount = 2;
+  std::string plain;
+  while (!text.empty()) {
+    const auto digits = text.starts_with(sign) ? text.substr(sign.size(), digitCount) : std::string_view();
+    const auto byte = digits.size() == digitCount ? parseNumber<unsigned char>(digits, 16) : std::nullopt;
+    plain += byte ? static_cast<char>(*byte) : text.front();
+    text.remove_prefix(byte ? sign.size() + digitCount : 1);
+  }
+  return plain;
+}
 
 Result<std::optional<DiskFacts>> factsOf(const SystemRoot& root, const DiskName& name) {
   const BlockDevices devices(root);

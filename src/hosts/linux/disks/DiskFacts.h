@@ -4,6 +4,7 @@
 
 #include <optional>
 #include <string>
+#include <string_view>
 
 #include "hosts/linux/disks/BlockDevices.h"
 #include "hosts/linux/disks/BlockProbe.h"
@@ -25,6 +26,9 @@ struct DiskFacts {
   OpticalMedium medium = OpticalMedium::none;
   std::optional<Failure> unread;  ///< why the medium, the volume or the table is not known
 };
+
+/// A text of the device manager's, who writes blanks and special characters as \x20, as it was.
+std::string withoutHexEscapes(std::string_view text);
 
 /// Asks the device manager's database, or reads the disk where that says nothing. Absent when there is no such device
 /// or nothing in it; a failure when that could not be found out.

@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "base/Text.h"
+#include "hosts/linux/disks/DiskFacts.h"
 
 namespace tavisk {
 namespace {
@@ -72,20 +73,6 @@ std::string withoutQuotes(std::string_view text) {
   return plain;
 }
 
-/// The device manager writes what no file name may have as \x20.
-std::string unescaped(std::string_view text) {
-  constexpr std::string_view sign = "\\x";
-  constexpr std::size_t digitCount = 2;
-  std::string plain;
-  while (!text.empty()) {
-    const auto digits = text.starts_with(sign) ? text.substr(sign.size(), digitCount) : std::string_view();
-    const auto byte = digits.size() == digitCount ? parseNumber<unsigned char>(digits, 16) : std::nullopt;
-    plain += byte ? static_cast<char>(*byte) : text.front();
-    text.remove_prefix(byte ? sign.size() + digitCount : 1);
-  }
-  return plain;
-}
-
 enum class Kind { uuid, label, partitionUuid, partitionLabel };
 
 struct Beginning {
@@ -148,7 +135,7 @@ Result<const Volume*> Volumes::ofRootArgument(std::string_view root) const {
     return Failure{"find", text, "the names of disks change from start to start"};
   }
   const auto given = text.substr(beginning->text.size());
-  const auto name = beginning->isFolder ? unescaped(given) : given;
+  const auto name = beginning->isFolder ? withoutHexEscapes(given) : given;
   switch (beginning->kind) {
     case Kind::uuid:
       return withUuid(name);
