@@ -224,14 +224,12 @@ Result<MachineFile::VersionRef> MachineFile::read() const {
 }
 
 Result<std::optional<std::string>> MachineFile::readText() const {
-  // A link that leads nowhere is a mistake, not a machine with nothing in it.
-  const auto there = _folder.isThere(fileName);
-  if (!there) return inFolder(there.failure());
-  if (!*there) {
-    const auto link = orAbsent(_folder.readLink(fileName));
-    if (!link) return inFolder(link.failure());
-    if (!*link) return std::optional<std::string>();
-  }
+  const auto found = orAbsent(_folder.read(fileName, ownFileLimits.bytes));
+  if (!found) return inFolder(found.failure());
+  if (*found) return *found;
+  const auto link = orAbsent(_folder.readLink(fileName));
+  if (link && !*link) return std::optional<std::string>();
+  // Another process has made it meanwhile; or it is a link that leads nowhere, which is no machine with nothing in it.
   auto text = _folder.read(fileName, ownFileLimits.bytes);
   if (!text) return inFolder(text.failure());
   return std::optional(std::move(text).value());

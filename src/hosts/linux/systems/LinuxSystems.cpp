@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/systems/LinuxSystems.h"
 
+#include <unistd.h>
+
 #include <algorithm>
 #include <utility>
 
@@ -50,10 +52,11 @@ Result<LoaderVariables> loaderVariables(const EfiVariables& variables) {
                          std::move(entryPreferred).value()};
 }
 
-/// In a container the machine's disks are none of its business.
+/// In a container the machine's disks are none of its business, not even root's.
 bool isOutOfReach(const Failure& failure) {
-  return isAbsent(failure) || failure.code == std::errc::permission_denied ||
-         failure.code == std::errc::operation_not_permitted || failure.code == std::errc::no_such_device_or_address;
+  const bool isForbidden =
+      failure.code == std::errc::permission_denied || failure.code == std::errc::operation_not_permitted;
+  return isAbsent(failure) || failure.code == std::errc::no_such_device_or_address || (isForbidden && ::geteuid() == 0);
 }
 
 /// Whether a mounted volume has a system folder of its own, with this boot file.
@@ -85,17 +88,23 @@ void LinuxSystems::lookAgain() {
   hearOfMore();
 }
 
-/// A volume that does not answer holds a thread for each look at it.
 void LinuxSystems::startLook() {
   letGo();
-  std::erase_if(_hanging, [](const auto& look) { return look.sight().unfinished.empty(); });
-  if (!_runLoop || _hanging.size() >= mostHanging) return;
+  if (!_runLoop) return;
   const auto machine = surroundings();
   if (!machine) return _disks.looks().tell(machine.failure());
-  auto look = LoaderLook::begin(*machine);
+  auto look = beginLook(*machine);
   if (!look) return _disks.looks().tell(look.failure());
   _surroundings = *machine;
   _look.emplace(std::move(look).value());
+}
+
+Result<LoaderLook> LinuxSystems::beginLook(const LoaderSurroundings& machine) const {
+  std::erase_if(_begun, [](const auto& look) { return look.sight().unfinished.empty(); });
+  if (_begun.size() >= mostHanging) return Failure{"look for", "systems", "a volume has not answered for long"};
+  auto look = LoaderLook::begin(machine);
+  if (look) _begun.push_back(*look);
+  return look;
 }
 
 void LinuxSystems::hearOfMore() {
@@ -151,7 +160,7 @@ std::optional<LoaderPlace> LinuxSystems::currentPlace(const LoaderSurroundings& 
 void LinuxSystems::take(const LoaderSight& sight) {
   const auto loaders = provenOf(sight, _surroundings.isUefi);
   const bool isDone = sight.unfinished.empty();
-  if (isDone) tellReasons(loaders, sight.failures);
+  if (isDone) tellReasons(sight, loaders);
   const auto mounts = _disks.mountsNow();
   if (!mounts) return _disks.looks().tell(mounts.failure());
   auto systems = systemsIn(loaders, *_surroundings.volumes, pointsOf(*mounts));
@@ -170,7 +179,6 @@ void LinuxSystems::keepShown(std::vector<ShownSystem>& systems) const {
 /// While a volume is open that was not mounted nobody can mount it for writing.
 void LinuxSystems::letGo() {
   _news.cancel();
-  if (_look && !_look->sight().unfinished.empty()) _hanging.push_back(*_look);
   _look.reset();
   _surroundings = {};
 }
@@ -226,12 +234,13 @@ void LinuxSystems::tellUnfinished() {
 }
 
 /// What a look failed for is a failure; what is not proven is told to the log of the search alone.
-void LinuxSystems::tellReasons(const std::vector<FoundLoader>& loaders, const std::vector<Failure>& failures) {
-  for (const auto& failure : failures) {
+void LinuxSystems::tellReasons(const LoaderSight& sight, const std::vector<FoundLoader>& proven) {
+  for (const auto& failure : sight.failures) {
     if (failure.code && !isOutOfReach(failure)) _disks.looks().tell(failure);
     explain(describe(failure));
   }
-  for (const auto& loader : loaders) {
+  for (const auto& loader : sight.loaders) tellReason(nameOf(loader.place), loader.reading);
+  for (const auto& loader : proven) {
     const auto name = nameOf(loader.place);
     tellReason(name, loader.reading);
     if (loader.reading) tellReason(name + ", its default", loader.reading->lasting);
@@ -242,7 +251,7 @@ void LinuxSystems::tellReasons(const std::vector<FoundLoader>& loaders, const st
 template <typename Value>
 void LinuxSystems::tellReason(const std::string& what, const Result<Value>& found) {
   if (found) return;
-  if (found.failure().code && !isAbsent(found.failure())) _disks.looks().tell(found.failure());
+  if (found.failure().code && !isOutOfReach(found.failure())) _disks.looks().tell(found.failure());
   explain(what + ": " + describe(found.failure()));
 }
 

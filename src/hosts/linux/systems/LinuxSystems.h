@@ -32,8 +32,6 @@ class LinuxSystems final : public DiskWatcher {
   /// How long the first report of the disks waits for what is found: cold disks take some seeks. What is not done by
   /// then is told as a failed look; it is shown when it is done.
   static constexpr std::chrono::milliseconds longestBefore{1000};
-  /// After so many looks that a volume does not answer there is no other until one has ended.
-  static constexpr std::size_t mostHanging = 4;
 
   void begin(RunLoop& runLoop, std::function<void()> changed) override;
   void lookAgain() override;
@@ -44,16 +42,21 @@ class LinuxSystems final : public DiskWatcher {
 
   /// The machine of this moment, for a look of one's own.
   Result<LoaderSurroundings> surroundings() const;
+  /// Fails also while several looks hang on a volume that does not answer: each holds a thread.
+  Result<LoaderLook> beginLook(const LoaderSurroundings& machine) const;
 
  private:
   std::optional<LoaderPlace> currentPlace(const LoaderSurroundings& machine) const;
+  /// After so many looks that a volume does not answer there is no other until one has ended.
+  static constexpr std::size_t mostHanging = 4;
+
   void startLook();
   void hearOfMore();
   void take(const LoaderSight& sight);
   void keepShown(std::vector<ShownSystem>& systems) const;
   void letGo();
   void tellUnfinished();
-  void tellReasons(const std::vector<FoundLoader>& loaders, const std::vector<Failure>& failures);
+  void tellReasons(const LoaderSight& sight, const std::vector<FoundLoader>& proven);
   template <typename Value>
   void tellReason(const std::string& what, const Result<Value>& found);
   void explain(const std::string& message) const;
@@ -70,8 +73,8 @@ class LinuxSystems final : public DiskWatcher {
   RunLoop* _runLoop = nullptr;
   std::function<void()> _changed;
   std::optional<LoaderLook> _look;
-  LoaderSurroundings _surroundings;  ///< of that look
-  std::vector<LoaderLook> _hanging;  ///< those before it that have not ended
+  LoaderSurroundings _surroundings;        ///< of that look
+  mutable std::vector<LoaderLook> _begun;  ///< those that had not ended lately
   mutable std::set<std::string> _explained;
   RunLoop::Registration _news;
   mutable std::mutex _mutex;  ///< of what is shown

@@ -179,7 +179,8 @@ std::vector<FoundLoader> provenOf(const LoaderSight& sight, bool isUefi) {
   const auto isOnFirstDisk = [&](const auto& loader) {
     return loader.place.volume.disk == loaders.front().place.volume.disk;
   };
-  const bool isKnown = sight.unfinished.empty() && std::ranges::all_of(loaders, isOnFirstDisk);
+  const bool isKnown =
+      sight.unfinished.empty() && sight.failures.empty() && std::ranges::all_of(loaders, isOnFirstDisk);
   std::erase_if(loaders, [](const auto& loader) { return loader.place.file.empty(); });
   if (isKnown && loaders.size() == 1) return loaders;
   for (auto& loader : loaders) {

@@ -89,6 +89,7 @@ Result<bool> startsCore(const DiskName& disk, const std::string& core, const Sys
 }  // namespace
 
 std::string nameOf(const LoaderPlace& place) {
+  if (place.file.empty()) return place.volume.device.name.text;
   auto file = place.file + " on " + place.volume.device.name.text;
   if (!place.entry) return file;
   return bootEntryName(place.entry->number) + " (" + place.entry->option.description + "), " + file;
@@ -143,8 +144,10 @@ Result<bool> hasBootCode(const DiskName& disk, const SystemRoot& root) {
   if (!file) return file.failure();
   const auto boot = bootSectorOf(*file, node);
   if (!boot) return boot.failure();
+  // A file system on the whole disk begins in the same sector, without the mark.
   constexpr std::size_t codeSize = 440;
-  return boot->find_first_not_of('\0') < codeSize;
+  constexpr std::string_view mark = "\x55\xaa";
+  return boot->size() == sectorSize && boot->ends_with(mark) && boot->find_first_not_of('\0') < codeSize;
 }
 
 bool namesWholeDisk(const BootEntry& entry) {

@@ -44,8 +44,8 @@ const SystemStart* startOn(const FoundLoader& loader, const DiskName& volume) {
   return found == loader.reading->starts.end() ? nullptr : &*found;
 }
 
-Result<LoaderSight> lookAt(const LoaderSurroundings& surroundings) {
-  const auto look = LoaderLook::begin(surroundings);
+Result<LoaderSight> lookAt(const LinuxSystems& systems, const LoaderSurroundings& surroundings) {
+  const auto look = systems.beginLook(surroundings);
   if (!look) return look.failure();
   return look->waitFor(longestLook);
 }
@@ -96,7 +96,7 @@ Result<StartedSystem> SystemChoice::startedBy(const BootEntry& entry, StartTime 
   auto surroundings = std::move(machine).value();
   surroundings.entries = {entry};
   surroundings.areOnlyEntries = true;
-  const auto sight = lookAt(surroundings);
+  const auto sight = lookAt(_systems, surroundings);
   if (!sight) return sight.failure();
   if (!sight->loaders.empty()) return startedOf(sight->loaders.front(), time);
   return whyUnknown(*sight).value_or(Failure{"look at", bootEntryName(entry.number), "it starts nothing"});
@@ -105,7 +105,7 @@ Result<StartedSystem> SystemChoice::startedBy(const BootEntry& entry, StartTime 
 Result<std::optional<StartedSystem>> SystemChoice::startedWithoutUefi(StartTime time) const {
   const auto surroundings = _systems.surroundings();
   if (!surroundings) return surroundings.failure();
-  const auto sight = lookAt(*surroundings);
+  const auto sight = lookAt(_systems, *surroundings);
   if (!sight) return sight.failure();
   const auto loaders = provenOf(*sight, false);
   if (loaders.empty()) {
@@ -120,7 +120,7 @@ Result<std::optional<StartedSystem>> SystemChoice::startedWithoutUefi(StartTime 
 Result<WayToSystem> SystemChoice::wayTo(const DiskName& volume) const {
   const auto surroundings = _systems.surroundings();
   if (!surroundings) return surroundings.failure();
-  const auto sight = lookAt(*surroundings);
+  const auto sight = lookAt(_systems, *surroundings);
   if (!sight) return sight.failure();
   const auto loaders = provenOf(*sight, surroundings->isUefi);
   const auto isIts = [&](const auto& loader) { return isDefault(loader, volume); };

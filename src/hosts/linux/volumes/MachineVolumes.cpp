@@ -107,7 +107,8 @@ std::optional<PartitionFacts> VolumeLook::partitionOf(const DiskFacts& facts) {
 std::vector<std::string> VolumeLook::mappedNodesOf(const BlockDevice& device) {
   const auto mapping = seen(_devices.mappingOf(device));
   if (!mapping) return {};
-  std::vector nodes = {"/dev/mapper/" + mapping->name};
+  std::vector nodes = {"/dev/mapper/" + mapping->name, "/dev/disk/by-id/dm-name-" + mapping->name};
+  if (!mapping->uuid.empty()) nodes.push_back("/dev/disk/by-id/dm-uuid-" + mapping->uuid);
   const bool isLogicalVolume = mapping->uuid.starts_with("LVM-");
   if (auto node = isLogicalVolume ? logicalVolumeNode(mapping->name) : std::nullopt) nodes.push_back(*std::move(node));
   return nodes;

@@ -55,7 +55,7 @@ class LoaderMachine {
     made.disk = {name.substr(0, 3)};
     made.facts = {type, "filesystem", "L-" + uuid, uuid, {}};
     if (name.starts_with("dm")) {
-      made.mappedNodes = {"/dev/mapper/vg-root", "/dev/vg/root"};
+      made.mappedNodes = {"/dev/mapper/vg-root", "/dev/vg/root", "/dev/disk/by-id/dm-uuid-LVM-aB12"};
     } else {
       made.partition = PartitionFacts{name.back() - '0', 0, 0, "part-" + name, partitionType, ""};
     }

@@ -92,7 +92,7 @@ class InstalledTree : public BootTree {
   void addCore(const std::string& disk, const std::string& point) {
     const auto core = std::string(512, 'd') + std::string(512, 'h') + "(,gpt2)/boot/grub of " + disk;
     std::string start(512, '\0');
-    if (disk == "sda") start[0x5C] = 3;
+    if (disk == "sda") start.replace(0x5C, 1, "\3").replace(510, 2, "\x55\xaa");
     write("/dev/" + disk, start + std::string(1024, '\0') + (disk == "sda" ? core : "") + std::string(512, '\0'));
     write((point == "/" ? "" : point) + "/boot/grub/i386-pc/core.img", core);
   }

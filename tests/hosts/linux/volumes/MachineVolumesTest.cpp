@@ -82,9 +82,12 @@ TEST(MachineVolumes, AreThoseOfItsOwnDisksAndWhatIsMountedOfOthers) {
   LinuxDisks disks(tree.machine);
   const auto found = machineVolumes(disks, tree.mounts());
   EXPECT_THAT(linesOf(*found),
-              ElementsAre("dm-0 sda ext4 /dev/mapper/luks-aa04",
-                          "dm-2 sda ext4 /dev/mapper/vg--a-ro--ot /dev/vg-a/ro-ot", "sda1 sda vfat aa01 EFI System",
-                          "sda2 sda btrfs aa02 ", "sdb2 sdb vfat", "sdc1 sdc xfs 11223344-01 "));
+              ElementsAre("dm-0 sda ext4 /dev/mapper/luks-aa04 /dev/disk/by-id/dm-name-luks-aa04 "
+                          "/dev/disk/by-id/dm-uuid-CRYPT-LUKS2-aa04",
+                          "dm-2 sda ext4 /dev/mapper/vg--a-ro--ot /dev/disk/by-id/dm-name-vg--a-ro--ot "
+                          "/dev/disk/by-id/dm-uuid-LVM-x /dev/vg-a/ro-ot",
+                          "sda1 sda vfat aa01 EFI System", "sda2 sda btrfs aa02 ", "sdb2 sdb vfat",
+                          "sdc1 sdc xfs 11223344-01 "));
   EXPECT_THAT(found->unseen, ElementsAre(Failure{"read", "sda3", "it is encrypted and locked"}));
   std::string others;
   for (const auto& [names, isUnseen] : found->others) others += names.device.name.text + (isUnseen ? "? " : " ");
