@@ -50,6 +50,9 @@ def kill_each(machine, command, state, restore, others, least=5):
     """The same for any command: `state()` is what it changes, `restore(state)` takes it back, `others()` is a command
     that prints what it leaves as it is. At least so many calls have to change something."""
     old = state()
+    # Once before: the first run after a start makes files that later ones find.
+    _run_in_time(machine, command, old, state)
+    restore(old)
     _run_in_time(machine, f"{STRACE} -o /run/trace {command}", old, state)
     traced = machine.run("cat /run/trace").output
     new = state()
