@@ -9,8 +9,6 @@
 #include "hosts/linux/clock/LinuxClockService.h"
 #include "hosts/linux/clock/LinuxNetworkTimeService.h"
 #include "hosts/linux/disks/LinuxDiskEventSession.h"
-#include "hosts/linux/systems/LinuxDiskManagementService.h"
-#include "hosts/linux/systems/SystemFiles.h"
 #include "hosts/linux/machine/LinuxBootLoaderFile.h"
 #include "hosts/linux/machine/LinuxIORegistry.h"
 #include "hosts/linux/machine/LinuxMachineFacts.h"
@@ -21,6 +19,8 @@
 #include "hosts/linux/power/LinuxPowerSettingsService.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/linux/system/Journal.h"
+#include "hosts/linux/systems/LinuxDiskManagementService.h"
+#include "hosts/linux/systems/SystemFiles.h"
 #include "hosts/shared/RootedFileSystem.h"
 #include "platform/Host.h"
 

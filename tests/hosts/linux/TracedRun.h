@@ -31,8 +31,8 @@ inline bool isOneOf(const __ptrace_syscall_info& call, std::initializer_list<std
 inline bool mayChangeFiles(pid_t process) {
   const auto call = callOf(process);
   if (isOneOf(call, {SYS_openat2})) return (::ptrace(PTRACE_PEEKDATA, process, call.entry.args[2], 0) & O_ACCMODE) != 0;
-  return isOneOf(
-      call, {SYS_write, SYS_pwrite64, SYS_unlinkat, SYS_renameat, SYS_renameat2, SYS_ftruncate, SYS_mkdirat, SYS_fsync, SYS_ioctl});
+  return isOneOf(call, {SYS_write, SYS_pwrite64, SYS_unlinkat, SYS_renameat, SYS_renameat2, SYS_ftruncate, SYS_mkdirat,
+                        SYS_fsync, SYS_ioctl});
 }
 
 /// Whether the call looks for a file or a folder, or may change one.
