@@ -21,8 +21,8 @@ bool isWordByte(char byte) {
 std::string_view takeSegment(std::string_view& text) {
   const auto isDigit = [](char byte) { return byte >= '0' && byte <= '9'; };
   const bool isNumber = isDigit(text.front());
-  const auto end =
-      std::ranges::find_if(text, [&](char byte) { return !isWordByte(byte) || isDigit(byte) != isNumber; });
+  const auto isOther = [&](char byte) { return !isWordByte(byte) || isDigit(byte) != isNumber; };
+  const auto* const end = std::ranges::find_if(text, isOther);
   const auto segment = text.substr(0, static_cast<std::size_t>(end - text.begin()));
   text.remove_prefix(segment.size());
   return segment;
