@@ -171,7 +171,7 @@ Setting<std::string>::Found LinuxNetworkTimeService::liveServer() {
 /// What is configured is the answer as soon as it is, whichever server the client is at.
 NetworkTimeServer LinuxNetworkTimeService::server() {
   auto setting = named<std::string>(setting::networkTimeServer);
-  const auto configured = firstServer();
+  auto configured = firstServer();
   setting.stored = [&] { return configured; };
   const bool isConfigured = configured && *configured;
   const bool isLiveWanted = configured && (!isConfigured || _machine.effects.wantsValues());
