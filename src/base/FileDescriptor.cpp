@@ -106,6 +106,21 @@ Result<std::string> readBeginning(const FileDescriptor& file, std::size_t length
   return beginning;
 }
 
+Result<std::string> readAt(const FileDescriptor& file, std::uint64_t place, std::size_t length,
+                           const std::string& path) {
+  std::string bytes(length, '\0');
+  std::size_t size = 0;
+  while (size < length) {
+    const auto count = ::pread(file.number(), &bytes[size], length - size, static_cast<off_t>(place + size));
+    if (count < 0 && errno == EINTR) continue;
+    if (count < 0) return systemFailure("read", path, errno);
+    if (count == 0) break;
+    size += static_cast<std::size_t>(count);
+  }
+  bytes.resize(size);
+  return bytes;
+}
+
 Result<void> writeAll(const FileDescriptor& file, std::string_view contents, const std::string& path) {
   const int error = writeFrom(contents, file);
   return error == 0 ? Result<void>() : systemFailure("write", path, error);

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -36,6 +37,10 @@ Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const
 
 /// The first bytes from the descriptor's place, at most `length`.
 Result<std::string> readBeginning(const FileDescriptor& file, std::size_t length, const std::string& path);
+
+/// So many bytes from a place of the file, or those that it has there; the descriptor's own place does not count.
+Result<std::string> readAt(const FileDescriptor& file, std::uint64_t place, std::size_t length,
+                           const std::string& path);
 
 /// Every byte, however many calls it takes.
 Result<void> writeAll(const FileDescriptor& file, std::string_view contents, const std::string& path);

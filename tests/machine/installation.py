@@ -209,7 +209,7 @@ def put_entry(disk, system):
     disk.copy(trees.boot_file(tree(), "vmlinuz-*"), to=f"{folder}/linux")
     disk.copy(trees.boot_file(tree(), "initrd.img-*"), to=f"{folder}/initrd.img-{kernel_version()}")
     entry = trees.WORK / "entry.conf"
-    entry.write_text(f"""# Boot Loader Specification type#1 entry
+    entry.write_text(f"""# Boot loader entry of type 1
 title      Debian GNU/Linux 12 (bookworm)
 version    {kernel_version()}
 machine-id {system.machine_id}

@@ -15,6 +15,10 @@ constexpr unsigned numbers = 0x10000;
 
 }  // namespace
 
+std::string nameOf(const BootEntry& entry) {
+  return bootEntryName(entry.number) + " (" + entry.option.description + ")";
+}
+
 std::vector<std::uint16_t> withFirst(std::uint16_t number, const std::vector<std::uint16_t>& order) {
   std::vector<std::uint16_t> changed{number};
   std::ranges::copy_if(order, std::back_inserter(changed), [=](auto each) { return each != number; });

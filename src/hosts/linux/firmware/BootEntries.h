@@ -21,6 +21,9 @@ struct BootEntry {
   EfiLoadOption option;
 };
 
+/// "Boot0003 (debian)"
+std::string nameOf(const BootEntry& entry);
+
 /// What the firmware can start, and in which order it tries (UEFI 2.10, section 3.1).
 class BootEntries {
  public:

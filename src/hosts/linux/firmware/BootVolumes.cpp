@@ -19,11 +19,6 @@ bool isReadByFirmware(const std::string& type) {
   return type == "vfat" || type == "msdos";
 }
 
-std::string withSeparators(std::string path, char from, char to) {
-  std::ranges::replace(path, from, to);
-  return path;
-}
-
 /// Where the boot file of a file system is on an EFI system partition; absent when its UUID is no name for a folder.
 std::optional<std::string> fileFor(const VolumeFacts& facts) {
   constexpr const char* letters = "0123456789abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ-";
@@ -111,7 +106,7 @@ Result<BootTarget> BootVolumes::onSystemPartition(const DiskName& name, const st
     return Failure{"look for " + file, "the EFI system partition " + name.text, "it is not mounted"};
   if (!isReadByFirmware(mount->type))
     return Failure{"look for " + file, "the EFI system partition " + name.text, "it holds " + mount->type};
-  const auto path = _root.standardized(mount->point + withSeparators(file, '\\', '/'));
+  const auto path = _root.standardized(mount->point + withSlashes(file));
   const auto isThere = path ? _root.isThere(*path) : path.failure();
   if (!isThere) return retold(isThere.failure(), "look for " + file, name.text);
   if (!*isThere)

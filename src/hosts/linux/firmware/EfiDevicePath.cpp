@@ -138,6 +138,11 @@ std::optional<EfiPathNode> partitionNode(const EfiPartition& partition) {
   return node;
 }
 
+std::string withSlashes(std::string file) {
+  std::ranges::replace(file, '\\', '/');
+  return file;
+}
+
 EfiPathNode fileNode(std::string_view path) {
   EfiPathNode node{filePath.type, filePath.subtype, toUtf16(path)};
   appendNumber(node.data, 0, 2);

@@ -40,6 +40,9 @@ std::optional<EfiPathNode> partitionNode(const EfiPartition& partition);
 /// A file by its full path, "\EFI\BOOT\BOOTX64.EFI".
 EfiPathNode fileNode(std::string_view path);
 
+/// The same path with slashes, as this system names it.
+std::string withSlashes(std::string file);
+
 /// What a path says; absent when it does not say it.
 std::optional<EfiPartition> partitionOf(const EfiDevicePath& path);
 std::optional<std::string> fileOf(const EfiDevicePath& path);

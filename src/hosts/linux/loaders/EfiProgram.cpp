@@ -4,7 +4,6 @@
 
 #include <fcntl.h>
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -77,7 +76,7 @@ class Reader {
     } else if (program.hasComponent("shim")) {
       readShim(program);
     }
-    if (_error != 0) return systemFailure("read", _path, _error);
+    if (_failure) return *_failure;
     if (!_contradiction.empty()) return Failure{tried, _path, _contradiction};
     return program;
   }
@@ -87,7 +86,7 @@ class Reader {
     const auto beginning = bytesAt({0, 64});
     const auto header = numberAt(beginning, 60, 4);
     const auto coff = bytesAt({header, coffSize + 2});
-    if (_error != 0) return systemFailure("read", _path, _error);
+    if (_failure) return *_failure;
     const auto count = numberAt(coff, 6, 2);
     if (!beginning.starts_with("MZ") || !coff.starts_with(std::string_view("PE\0\0", 4)) || count > mostSections)
       return Failure{tried, _path, "it is no program for UEFI",
@@ -110,18 +109,9 @@ class Reader {
 
   /// What the file has of it.
   std::string bytesAt(const Section& section) {
-    std::string bytes(section.size, '\0');
-    std::size_t done = 0;
-    while (done < bytes.size()) {
-      const auto offset = static_cast<off_t>(section.offset + done);
-      const auto count = ::pread(_file.number(), &bytes[done], bytes.size() - done, offset);
-      if (count < 0 && errno == EINTR) continue;
-      if (count < 0) _error = errno;
-      if (count <= 0) break;
-      done += static_cast<std::size_t>(count);
-    }
-    bytes.resize(done);
-    return bytes;
+    auto bytes = readAt(_file, section.offset, section.size, _path);
+    if (!bytes) _failure = bytes.failure();
+    return std::move(bytes).valueOr("");
   }
 
   std::string textIn(const std::string& name) {
@@ -174,7 +164,7 @@ class Reader {
   std::string _path;
   std::map<std::string, Section> _sections;
   bool _is32Bit = false;
-  int _error = 0;
+  std::optional<Failure> _failure;
   std::string _contradiction;
 };
 

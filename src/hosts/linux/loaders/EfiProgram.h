@@ -22,7 +22,7 @@ struct EfiProgram {
   std::string configuration;
   std::string prefix;  ///< "/EFI/debian", "(,gpt2)/boot/grub"
 
-  // Of a unified image (The UAPI Unified Kernel Image specification).
+  // Of a unified image (UAPI.5, unified kernel images).
   std::string commandLine;
   std::string osRelease;
   bool hasProfiles = false;  ///< it holds several command lines to choose from
@@ -30,8 +30,8 @@ struct EfiProgram {
   bool hasComponent(const std::string& name) const;
 };
 
-/// Reads headers and the sections of account, however large the file is. Fails when it is no program for UEFI (PE and
-/// COFF specification; isNoProgram() tells that), or when what it says of itself contradicts itself.
+/// Reads headers and the sections of account, however large the file is. Fails when it is no program for UEFI (the
+/// Portable Executable format; isNoProgram() tells that), or when what it says of itself contradicts itself.
 Result<EfiProgram> readEfiProgram(const SystemRoot& files, const std::string& path);
 bool isNoProgram(const Failure& failure);
 

@@ -31,10 +31,9 @@ std::string deviceOf(const Volume& volume) {
 }
 
 Result<const Volume*> VolumeFiles::withName(const std::string& name) const {
-  const auto& all = _volumes.all();
-  const auto found = std::ranges::find_if(all, [&](const auto& each) { return each.device.name.text == name; });
-  if (found == all.end()) return unknownDevice(name, "it is not there any more");
-  return &*found;
+  const auto* found = _volumes.named({name});
+  if (!found) return unknownDevice(name, "it is not there any more");
+  return found;
 }
 
 /// Null when no volume has it.

@@ -9,7 +9,7 @@
 
 namespace tavisk {
 
-/// What a loader that reads boot entries can start (The Boot Loader Specification; systemd-boot(7)).
+/// What a loader that reads boot entries can start (UAPI.1, boot loader entries; systemd-boot(7)).
 struct LoaderEntry {
   std::string id = {};  ///< the name of its file, with its ending
   std::string title = {};
@@ -42,7 +42,7 @@ void sortAsShown(std::vector<LoaderEntry>& entries);
 /// or else the first of all that has not failed. Null when there is none. Entries in the order in which they are shown.
 const LoaderEntry* startedOf(const std::vector<LoaderEntry>& entries, const std::vector<std::string>& patterns);
 
-/// Less than, equal to or greater than 0 (The UAPI Version Format Specification).
+/// Less than, equal to or greater than 0 (UAPI.10, the format of versions).
 int compareVersions(std::string_view left, std::string_view right);
 
 }  // namespace tavisk

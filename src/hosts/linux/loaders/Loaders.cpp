@@ -6,6 +6,7 @@
 
 #include "base/Text.h"
 #include "hosts/linux/firmware/EfiBytes.h"
+#include "hosts/linux/firmware/EfiDevicePath.h"
 #include "hosts/linux/loaders/EfiProgram.h"
 #include "hosts/linux/loaders/GrubLoader.h"
 #include "hosts/linux/loaders/SystemStarts.h"
@@ -26,8 +27,7 @@ std::string folderOf(const std::string& path) {
 
 /// From the top of the partition.
 Result<std::string> pathOf(const std::string& file) {
-  auto path = file;
-  std::ranges::replace(path, '\\', '/');
+  auto path = withSlashes(file);
   if (!path.starts_with('/')) path.insert(path.begin(), '/');
   const auto parts = split(path, "/");
   if (parts.empty() || std::ranges::find(parts, "..") != parts.end()) return notProven(file, "it is no path of a file");

@@ -20,8 +20,7 @@ struct Beginning;
 struct SystemStart {
   DiskName root;          ///< the volume that becomes "/"
   std::string subvolume;  ///< of btrfs, as "rootflags=subvol=" has it, without a slash in front: "@"; empty: as mounted
-  DiskName kernelVolume;  ///< where the kernel is read from: the same, or the system's separate /boot
-  std::string kernel;     ///< its path there
+  std::string kernel;     ///< its path on that volume or on the system's separate /boot
   std::string choice;     ///< by which the loader's default names it; empty: no name can choose it
 
   bool isSameSystem(const SystemStart& other) const { return root == other.root && subvolume == other.subvolume; }

@@ -76,7 +76,7 @@ Result<SystemStart> startOfKernel(const Volumes& volumes, const Volume& kernelVo
   if (isMappedName(argument->root))
     if (const auto isOwn = needsOwnWord(volumes, **root, argument->subvolume, kernelVolume); !isOwn)
       return isOwn.failure();
-  return SystemStart{(*root)->device.name, argument->subvolume, kernelVolume.device.name, kernel, ""};
+  return SystemStart{(*root)->device.name, argument->subvolume, kernel, ""};
 }
 
 }  // namespace tavisk

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "base/Text.h"
+#include "hosts/linux/firmware/EfiDevicePath.h"
 #include "hosts/linux/loaders/LoaderEntries.h"
 #include "hosts/linux/loaders/SystemStarts.h"
 
@@ -32,8 +33,7 @@ bool isMatch(const std::string& pattern, const std::string& id) {
 
 /// From the volume's top, in the usual writing; empty when it is no path of that kind.
 std::string pathOf(const std::string& program) {
-  auto path = program;
-  std::ranges::replace(path, '\\', '/');
+  auto path = withSlashes(program);
   const auto parts = split(path, "/");
   return path.starts_with('/') && std::ranges::find(parts, "..") == parts.end() ? path : "";
 }
@@ -187,8 +187,7 @@ class Menu {
   Result<SystemStart> startOf(const LoaderEntry& entry) const {
     const auto path = pathOf(entry.program);
     if (path.empty()) return notProven(entry.id, "its program has no absolute path");
-    const auto volume =
-        std::ranges::find(_volumes.all(), entry.volume, [](const auto& each) { return each.device.name.text; });
+    const auto* volume = _volumes.named({entry.volume});
     const auto files = _volumes.filesOf(*volume);
     if (!files) return files.failure();
     const auto program = readEfiProgram(*files, path);

@@ -10,7 +10,7 @@
 namespace tavisk {
 
 /// What systemd-boot starts that is on a partition: entries of both types there and on the XBOOTLDR partition of the
-/// same disk (The Boot Loader Specification; systemd-boot(7)).
+/// same disk (UAPI.1, boot loader entries; systemd-boot(7)).
 LoaderReading readSystemdBoot(const Volumes& volumes, const Volume& partition, const LoaderVariables& variables);
 
 /// What a unified image starts that is handed these options.

@@ -22,8 +22,12 @@ std::optional<EfiDevicePath> pathOf(const BootEntry& entry) {
   return parseDevicePath(entry.option.paths);
 }
 
-std::string nameOf(const BootEntry& entry) {
-  return bootEntryName(entry.number) + " (" + entry.option.description + ")";
+/// An entry as this program makes them.
+EfiLoadOption ownOption(const std::string& label, const EfiPartition& partition, const std::string& file) {
+  EfiLoadOption option;
+  option.description = "tavisk " + escaped(label);
+  option.paths = bytesOf({*partitionNode(partition), fileNode(file)});
+  return option;
 }
 
 Setting<std::string>::Found textOf(const Result<std::optional<StartedSystem>>& system) {
@@ -68,17 +72,14 @@ BootSettings::LegacyBootSupport LinuxBootSettings::legacyBootSupport() {
   return {0, supported};
 }
 
-/// What firmware starts at the next start.
-Result<std::optional<BootEntry>> LinuxBootSettings::preferred() const {
+/// What firmware starts, at the next start or by its order.
+LinuxBootSettings::Preferred LinuxBootSettings::preferred(StartTime time) const {
+  if (time == StartTime::lasting) return _entries.first();
   const auto support = _variables.support();
   if (!support) return support.failure();
   if (*support) return (*support)->reason;
   auto once = _entries.onlyNext();
   return !once || *once ? once : _entries.first();
-}
-
-LinuxBootSettings::Preferred LinuxBootSettings::preferred(StartTime time) const {
-  return time == StartTime::next ? preferred() : _entries.first();
 }
 
 LinuxBootSettings::Started LinuxBootSettings::started(StartTime time) const {
@@ -132,9 +133,9 @@ BootSettings::BootPreference LinuxBootSettings::bootPreference() {
 BootSettings::NetworkBootPreference LinuxBootSettings::networkBootPreference() {
   const auto support = _variables.support();
   const bool isUnsupported = support && *support;
-  const auto network = isUnsupported ? std::optional<NetworkBootPreference>() : networkOf(preferred());
+  const auto network = isUnsupported ? std::optional<NetworkBootPreference>() : networkOf(preferred(StartTime::next));
   tell(
-      setting::networkStartupDisk, textOf(network), [this] { return textOf(networkOf(_entries.first())); },
+      setting::networkStartupDisk, textOf(network), [this] { return textOf(networkOf(preferred(StartTime::lasting))); },
       [this] { return _variables.support(); });
   return network ? network->value_or(NetworkBootPreference()) : NetworkBootPreference{failed, {}, {}, {}};
 }
@@ -173,7 +174,8 @@ ServiceStatus LinuxBootSettings::setSystem(const BootChoice& choice) {
   WrittenPlaces written;
   Setting<std::string> parts;
   parts.name = setting::startupDisk;
-  parts.supported = [this] { return startSupport(); };
+  // Where there is a way, a loader is known.
+  parts.supported = [&] { return way ? Support(std::nullopt) : startSupport(); };
   parts.where = way && !way->machine.isUefi ? way->loader.reading->keeps.path
                                             : EfiVariables::pathOf(BootEntries::orderVariable());
   parts.written = [&] { return written.text(); };
@@ -224,25 +226,19 @@ Result<void> LinuxBootSettings::setDefault(const WayToSystem& way, WrittenPlaces
 Result<EfiLoadOption> LinuxBootSettings::optionFor(const LoaderPlace& place, const Volumes& volumes) const {
   const auto files = volumes.filesOf(place.volume);
   if (!files) return files.failure();
-  auto path = place.file;
-  std::ranges::replace(path, '\\', '/');
-  if (const auto refusal = whyRefused(*files, path)) return *refusal;
+  if (const auto refusal = whyRefused(*files, withSlashes(place.file))) return *refusal;
   if (place.entry) return place.entry->option;
   const auto partition = _volumes.identityOf(place.volume.device);
   if (!partition) return partition.failure();
-  EfiLoadOption option;
-  option.description = "tavisk " + escaped(tavisk::nameOf(place.volume));
-  option.paths = bytesOf({*partitionNode(*partition), fileNode(place.file)});
-  return option;
+  return ownOption(nameOf(place.volume), *partition, place.file);
 }
 
 std::string LinuxBootSettings::noteOn(const WayToSystem& way) const {
   const auto& loader = way.loader;
-  auto note = "by " + tavisk::nameOf(loader.place) + ", " + loader.reading->loader + ", root " + way.start.root.text;
+  auto note = "by " + nameOf(loader.place) + ", " + loader.reading->loader + ", root " + way.start.root.text;
   if (!way.start.subvolume.empty()) note += " (" + way.start.subvolume + ")";
   if (loader.reading->once) note += "; the loader's next start alone is " + *loader.reading->once;
-  const auto isUefi = preBootEnvironmentOf(_machine.root);
-  const auto next = isUefi && *isUefi == preboot::noneKnown ? "" : noteOnNextStart();
+  const auto next = way.machine.isUefi ? noteOnNextStart() : "";
   return next.empty() ? note : note + "; " + next;
 }
 
@@ -275,10 +271,7 @@ Result<EfiLoadOption> LinuxBootSettings::optionFor(const BootChoice& choice) con
   const auto target = _volumes.targetOf(choice.disk, choice.systemFolder);
   if (!target) return target.failure();
   if (const auto refusal = whyRefused(_machine.root, target->path)) return *refusal;
-  EfiLoadOption option;
-  option.description = "tavisk " + escaped(target->label);
-  option.paths = bytesOf({*partitionNode(target->partition), fileNode(target->file)});
-  return option;
+  return ownOption(target->label, target->partition, target->file);
 }
 
 std::optional<Failure> LinuxBootSettings::whyRefused(const SystemRoot& root, const std::string& path) const {

@@ -43,7 +43,6 @@ class LinuxBootSettings final : public BootSettings {
   using Preferred = Result<std::optional<BootEntry>>;
   using Started = Result<std::optional<StartedSystem>>;  ///< absent: from the network
 
-  Preferred preferred() const;
   Preferred preferred(StartTime time) const;
   Started started(StartTime time) const;
   Started startedBy(const Preferred& entry, StartTime time) const;

@@ -9,15 +9,14 @@
 
 #include "base/Path.h"
 #include "hosts/linux/firmware/EfiBytes.h"
+#include "hosts/linux/firmware/PreBootEnvironment.h"
 #include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/volumes/MachineVolumes.h"
 #include "hosts/linux/volumes/VolumeOpener.h"
+#include "platform/DiskManagementService.h"
 
 namespace tavisk {
 namespace {
-
-constexpr const char* volumesFolder = "/Volumes";
-constexpr const char* realSystem = "/System/Library/CoreServices/";
 
 /// As firmware tries them: those of the order, and only those that it starts unasked.
 Result<std::vector<BootEntry>> startedEntries(const BootEntries& entries) {
@@ -61,7 +60,8 @@ bool isOutOfReach(const Failure& failure) {
 
 /// Whether a mounted volume has a system folder of its own, with this boot file.
 Result<bool> hasOwnSystem(const SystemRoot& root, const std::string& point, const std::string& bootFile) {
-  return root.isThere((point == "/" ? "" : point) + realSystem + bootFile);
+  std::string path = point == "/" ? "" : point;
+  return root.isThere(path.append(systemFolder) + "/" + bootFile);
 }
 
 }  // namespace
@@ -121,9 +121,9 @@ void LinuxSystems::end() {
 Result<LoaderSurroundings> LinuxSystems::surroundings() const {
   LoaderSurroundings found;
   found.rootPrefix = _machine.root.prefix();
-  const auto isUefi = _machine.root.isThere("/sys/firmware/efi");
-  if (!isUefi) return isUefi.failure();
-  found.isUefi = *isUefi;
+  const auto environment = preBootEnvironmentOf(_machine.root);
+  if (!environment) return environment.failure();
+  found.isUefi = *environment == preboot::loadsBootEfi;
   auto entries = startedEntries(_entries);
   if (!entries) return entries.failure();
   found.entries = std::move(entries).value();

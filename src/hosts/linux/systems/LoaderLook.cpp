@@ -74,8 +74,7 @@ struct Task {
 std::vector<Task> tasksFor(const LoaderSurroundings& surroundings) {
   std::vector<Task> tasks;
   for (const auto& entry : surroundings.entries)
-    tasks.push_back({bootEntryName(entry.number) + " (" + entry.option.description + ")",
-                     [entry](const auto& machine) { return lookAtEntry(entry, machine); }});
+    tasks.push_back({nameOf(entry), [entry](const auto& machine) { return lookAtEntry(entry, machine); }});
   if (surroundings.areOnlyEntries) return tasks;
   for (const auto& volume : surroundings.volumes->all()) {
     if (surroundings.isUefi && !isSystemPartition(volume)) continue;
@@ -200,9 +199,7 @@ FoundLoader readLoaderAt(const LoaderPlace& place, const LoaderSurroundings& sur
   auto starts = found.reading->starts;
   if (found.reading->lasting) starts.insert(starts.begin(), *found.reading->lasting);
   for (const auto& start : starts) {
-    const auto isRoot = [&](const auto& volume) { return volume.device.name == start.root; };
-    const auto root = std::ranges::find_if(volumes.all(), isRoot);
-    if (root != volumes.all().end())
+    if (const auto* root = volumes.named(start.root))
       found.systems.try_emplace(start.root.text, osReleaseOf(volumes, *root, start.subvolume));
   }
   return found;

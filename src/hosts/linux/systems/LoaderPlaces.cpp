@@ -3,11 +3,9 @@
 #include "hosts/linux/systems/LoaderPlaces.h"
 
 #include <fcntl.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <array>
-#include <cerrno>
 
 #include "base/Text.h"
 #include "hosts/linux/firmware/EfiBytes.h"
@@ -54,16 +52,6 @@ Result<std::optional<LoaderPlace>> loaderIn(const std::string& folder, const Vol
   return std::nullopt;
 }
 
-Result<std::string> readAt(const FileDescriptor& disk, std::uint64_t place, std::size_t size, const std::string& node) {
-  std::string bytes(size, '\0');
-  ssize_t count = 0;
-  do count = ::pread(disk.number(), bytes.data(), bytes.size(), static_cast<off_t>(place));
-  while (count < 0 && errno == EINTR);
-  if (count < 0) return systemFailure("read", node, errno);
-  bytes.resize(static_cast<std::size_t>(count));
-  return bytes;
-}
-
 Result<std::string> bootSectorOf(const FileDescriptor& disk, const std::string& node) {
   return readAt(disk, 0, sectorSize, node);
 }
@@ -92,7 +80,7 @@ std::string nameOf(const LoaderPlace& place) {
   if (place.file.empty()) return place.volume.device.name.text;
   auto file = place.file + " on " + place.volume.device.name.text;
   if (!place.entry) return file;
-  return bootEntryName(place.entry->number) + " (" + place.entry->option.description + "), " + file;
+  return nameOf(*place.entry) + ", " + file;
 }
 
 std::string fallbackFile() {
@@ -106,9 +94,7 @@ std::string fallbackFile() {
 Result<LoaderPlace> placeOf(const BootEntry& entry, const Volumes& volumes) {
   const auto path = parseDevicePath(entry.option.paths);
   const auto partition = path ? partitionOf(*path) : std::nullopt;
-  if (!partition)
-    return Failure{"find the volume of", bootEntryName(entry.number) + " (" + entry.option.description + ")",
-                   "the entry names no partition"};
+  if (!partition) return Failure{"find the volume of", nameOf(entry), "the entry names no partition"};
   const auto volume = volumes.withPartitionUuid(partition->uuid);
   if (!volume) return volume.failure();
   return LoaderPlace{entry, **volume, fileOf(*path).value_or(fallbackFile())};

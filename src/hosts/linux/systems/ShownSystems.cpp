@@ -11,13 +11,15 @@
 namespace tavisk {
 namespace {
 
-constexpr std::string_view volumesFolder = "/Volumes/";
-constexpr std::string_view systemFolder = "/System/Library/CoreServices";
 constexpr std::string_view kernel = "/mach_kernel";
 constexpr std::string_view versionFile = "/SystemVersion.plist";
 constexpr char replacement = '-';
 constexpr unsigned char firstPrintable = 0x20;
 constexpr unsigned char deleteByte = 0x7F;
+
+std::string pointNamed(const std::string& name) {
+  return std::string(volumesFolder) + "/" + name;
+}
 
 bool isAllowed(char byte) {
   const auto code = static_cast<unsigned char>(byte);
@@ -79,11 +81,11 @@ std::vector<ShownSystem> systemsIn(const std::vector<FoundLoader>& loaders, cons
       auto name = plainName;
       const auto isTaken = [&] {
         return std::ranges::find(shown, name, &ShownSystem::name) != shown.end() ||
-               (!isRunning && !isFree(std::string(volumesFolder) + name, device, points));
+               (!isRunning && !isFree(pointNamed(name), device, points));
       };
       if (devices.size() > 1 || isTaken()) name += replacement + device;
       while (isTaken()) name += replacement + device;
-      const auto point = isRunning ? "/" : std::string(volumesFolder) + name;
+      const auto point = isRunning ? "/" : pointNamed(name);
       shown.push_back({{device}, name, point, systems.at(device)});
     }
   }

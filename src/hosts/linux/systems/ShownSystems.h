@@ -14,6 +14,10 @@
 
 namespace tavisk {
 
+/// Where the search looks for systems: folders with mounted volumes, and on each volume this one.
+inline constexpr std::string_view volumesFolder = "/Volumes";
+inline constexpr std::string_view systemFolder = "/System/Library/CoreServices";
+
 /// A Linux system as the search for startup disks sees it: a system folder with a boot file, a kernel and a version
 /// file, of which nothing is on the volume.
 struct ShownSystem {

@@ -111,6 +111,11 @@ auto askFiles(const Result<SystemRoot>& files, const Volume& volume, const Ask& 
 
 }  // namespace
 
+const Volume* Volumes::named(const DiskName& name) const {
+  const auto found = std::ranges::find(_all, name, [](const auto& volume) { return volume.device.name; });
+  return found == _all.end() ? nullptr : &*found;
+}
+
 Result<const Volume*> Volumes::withUuid(std::string_view uuid) const {
   return theOne(*this, "UUID=" + std::string(uuid),
                 [&](const Volume& volume) { return isNamed(volume.facts.uuid, uuid); });

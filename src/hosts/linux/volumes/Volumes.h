@@ -43,6 +43,8 @@ class Volumes {
 
   const std::vector<Volume>& all() const { return _all; }
   const std::vector<OtherDevice>& others() const { return _others; }
+  /// By the name of its device; null when there is none. Pointers hold as long as this.
+  const Volume* named(const DiskName& name) const;
   /// Fails, with the reason for people, when no volume or more than one has the name. Pointers hold as long as this.
   Result<const Volume*> withUuid(std::string_view uuid) const;
   Result<const Volume*> withLabel(std::string_view label) const;

@@ -47,8 +47,8 @@ class InstalledTree : public BootTree {
     const auto preference = host().diskManagement().bootPreference();
     return preference.disk ? preference.disk->text : "status " + std::to_string(preference.status);
   }
-  ServiceStatus choose(const std::string& volume, const std::string& systemFolder) {
-    return host().diskManagement().setBootPreference({{volume}, systemFolder, false});
+  ServiceStatus choose(const std::string& volume, const std::string& system) {
+    return host().diskManagement().setBootPreference({{volume}, system, false});
   }
 
  private:
