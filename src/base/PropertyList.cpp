@@ -2,11 +2,22 @@
 // SPDX-License-Identifier: MIT
 #include "base/PropertyList.h"
 
+#include <algorithm>
 #include <type_traits>
 
 namespace tavisk {
 
+namespace {
+
+constexpr std::size_t fewEntries = 8;  // are compared sooner than looked up
+
+}  // namespace
+
 const PropertyList* PropertyList::Dictionary::find(std::string_view key) const {
+  if (_places.empty()) {
+    const auto entry = std::ranges::find(_entries, key, &Entry::first);
+    return entry == _entries.end() ? nullptr : &entry->second;
+  }
   const auto place = _places.find(std::string(key));
   return place == _places.end() ? nullptr : &_entries[place->second].second;
 }
@@ -16,18 +27,19 @@ PropertyList* PropertyList::Dictionary::find(std::string_view key) {
 }
 
 PropertyList& PropertyList::Dictionary::set(std::string_view key, PropertyList value) {
-  const auto [place, isNew] = _places.try_emplace(std::string(key), _entries.size());
-  if (isNew) return _entries.emplace_back(key, std::move(value)).second;
-  return _entries[place->second].second = std::move(value);
+  if (auto* present = find(key)) return *present = std::move(value);
+  _entries.emplace_back(key, std::move(value));
+  if (_entries.size() > fewEntries || !_places.empty())
+    for (auto place = _places.size(); place < _entries.size(); ++place) _places.emplace(_entries[place].first, place);
+  return _entries.back().second;
 }
 
 void PropertyList::Dictionary::remove(std::string_view key) {
-  const auto found = _places.find(std::string(key));
-  if (found == _places.end()) return;
-  const auto removed = found->second;
-  _places.erase(found);
-  _entries.erase(_entries.begin() + static_cast<std::ptrdiff_t>(removed));
-  if (removed == _entries.size()) return;
+  const auto entry = std::ranges::find(_entries, key, &Entry::first);
+  if (entry == _entries.end()) return;
+  const auto removed = static_cast<std::size_t>(entry - _entries.begin());
+  _entries.erase(entry);
+  _places.erase(std::string(key));
   for (auto& [name, place] : _places) {
     if (place > removed) --place;
   }

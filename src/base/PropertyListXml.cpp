@@ -60,11 +60,14 @@ char32_t referencedCharacter(std::string_view name) {
   return 0;
 }
 
-/// The text of one node, with line ends as XML wants them (its section 2.11) and references replaced.
-std::string characters(pugi::xml_node node) {
+/// Appends the text of one node, with line ends as XML wants them (its section 2.11) and references replaced.
+void appendCharacters(std::string& text, pugi::xml_node node) {
   const bool hasReferences = node.type() == pugi::node_pcdata;
   const std::string_view raw = node.value();
-  std::string text;
+  if (raw.find('\r') == std::string_view::npos && (!hasReferences || raw.find('&') == std::string_view::npos)) {
+    text += raw;
+    return;
+  }
   for (std::size_t place = 0; place < raw.size(); ++place) {
     if (raw[place] == '\r') {
       if (!raw.substr(place + 1).starts_with('\n')) text += '\n';
@@ -81,14 +84,13 @@ std::string characters(pugi::xml_node node) {
       text += raw[place];
     }
   }
-  return text;
 }
 
 std::string textOf(pugi::xml_node element) {
   std::string text;
-  for (const auto child : element.children()) {
+  for (auto child = element.first_child(); child; child = child.next_sibling()) {
     if (!isText(child)) throw malformed(child, "text");
-    text += characters(child);
+    appendCharacters(text, child);
   }
   return text;
 }
