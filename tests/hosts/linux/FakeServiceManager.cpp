@@ -84,11 +84,8 @@ int FakeServiceManager::answerFault(sd_bus_message* message, Fault fault) {
 int FakeServiceManager::answer(sd_bus_message* message, const std::string& member) {
   if (member == "Get") return answerProperty(message);
   if (member == "GetAll") return answerAllProperties(message);
-  if (member == "LoadUnit") {
-    const auto unit = firstText(message);
-    if (const auto known = _units.find(unit); known != _units.end()) std::this_thread::sleep_for(known->second.delay);
-    return sd_bus_reply_method_return(message, "o", pathOf(unit).c_str());
-  }
+  if (member == "ListUnitsByNames") return answerUnits(message);
+  if (member == "LoadUnit") return sd_bus_reply_method_return(message, "o", pathOf(firstText(message)).c_str());
   if (member == "GetUnitFileState")
     return sd_bus_reply_method_return(message, "s", _units[firstText(message)].file.c_str());
   if (member == "Reload") {
@@ -96,6 +93,25 @@ int FakeServiceManager::answer(sd_bus_message* message, const std::string& membe
     return sd_bus_reply_method_return(message, "");
   }
   return member.ends_with("Files") ? answerFiles(message, member) : answerJob(message, member);
+}
+
+int FakeServiceManager::answerUnits(sd_bus_message* message) {
+  sd_bus_message* reply = nullptr;
+  sd_bus_message_new_method_return(message, &reply);
+  sd_bus_message_open_container(reply, 'a', "(ssssssouso)");
+  sd_bus_message_enter_container(message, 'a', "s");
+  const char* unit = nullptr;
+  while (sd_bus_message_read_basic(message, 's', &unit) > 0) {
+    const auto known = _units.find(unit);
+    const auto state = known == _units.end() ? FakeUnit{"not-found"} : known->second;
+    std::this_thread::sleep_for(state.delay);
+    sd_bus_message_append(reply, "(ssssssouso)", unit, "", state.load.c_str(), state.active.c_str(), "", "",
+                          pathOf(unit).c_str(), 0U, "", "/");
+  }
+  sd_bus_message_close_container(reply);
+  const int sent = sd_bus_send(nullptr, reply, nullptr);
+  sd_bus_message_unref(reply);
+  return sent < 0 ? sent : 1;
 }
 
 FakeUnit FakeServiceManager::unitOf(sd_bus_message* message) {
@@ -113,8 +129,6 @@ int FakeServiceManager::answerProperty(sd_bus_message* message) {
   const auto state = unitOf(message);
   firstText(message);
   const auto name = firstText(message);
-  if (name == "LoadState") return sd_bus_reply_method_return(message, "v", "s", state.load.c_str());
-  if (name == "ActiveState") return sd_bus_reply_method_return(message, "v", "s", state.active.c_str());
   if (name == "ServerName") return sd_bus_reply_method_return(message, "v", "s", "fallback.example");
   if (name == "SystemNTPServers") return sd_bus_reply_method_return(message, "v", "as", 1, "time.example");
   if (name == "ConditionResult") return sd_bus_reply_method_return(message, "v", "b", state.conditionHolds ? 1 : 0);

@@ -20,7 +20,7 @@ struct FakeUnit {
   std::string file = "disabled";
   std::string jobResult = "done";        ///< empty: the job never ends
   bool conditionHolds = true;            ///< else a job is done and the unit stays as it is
-  std::chrono::milliseconds delay = {};  ///< of the answer to LoadUnit
+  std::chrono::milliseconds delay = {};  ///< of each answer about its state
 };
 
 /// Serves the interface of the service manager from a thread of its own.
@@ -47,6 +47,7 @@ class FakeServiceManager {
   int receive(sd_bus_message* message, const std::string& member);
   int answer(sd_bus_message* message, const std::string& member);
   int answerFault(sd_bus_message* message, Fault fault);
+  int answerUnits(sd_bus_message* message);
   int answerProperty(sd_bus_message* message);
   int answerAllProperties(sd_bus_message* message);
   FakeUnit unitOf(sd_bus_message* message);

@@ -3,6 +3,7 @@
 #include "hosts/linux/access/LinuxRemoteAccess.h"
 
 #include <algorithm>
+#include <functional>
 #include <set>
 #include <string_view>
 
@@ -89,6 +90,12 @@ RemoteAccessState observedState(Setting<bool> setting, EffectSink& effects) {
   return support && observed ? RemoteAccessState::off : RemoteAccessState::unknown;
 }
 
+template <typename Answer, typename Use>
+Result<Answer> ask(const Result<DaemonGroup>& daemons, Use use) {
+  if (!daemons) return daemons.failure();
+  return std::invoke(use, *daemons);
+}
+
 Result<bool> hasSettled(const DaemonGroup& daemons) {
   auto changing = daemons.isChanging();
   if (!changing) return changing;
@@ -111,9 +118,7 @@ Result<DaemonGroup> LinuxRemoteShellService::server() {
 
 template <typename Answer, typename Use>
 Result<Answer> LinuxRemoteShellService::withServer(Use use) {
-  const auto found = server();
-  if (!found) return found.failure();
-  return use(*found);
+  return ask<Answer>(server(), use);
 }
 
 Support LinuxRemoteShellService::supported() {
@@ -129,13 +134,17 @@ Setting<bool> LinuxRemoteShellService::remoteLogin() {
   Setting<bool> setting;
   setting.name = setting::remoteLogin;
   setting.supported = [this] { return supported(); };
-  setting.live = [this] { return hasAny(&DaemonGroup::running); };
-  setting.stored = [this] { return hasAny(&DaemonGroup::startingAtBoot); };
+  setting.live = [this] { return withServer<bool>(&DaemonGroup::isAnyRunning); };
+  setting.stored = [this] { return withServer<bool>(&DaemonGroup::isAnyStartingAtBoot); };
   return setting;
 }
 
 RemoteAccessState LinuxRemoteShellService::state() {
-  return observedState(remoteLogin(), _machine.effects);
+  const auto found = server();
+  auto setting = remoteLogin();
+  setting.live = [&] { return ask<bool>(found, &DaemonGroup::isAnyRunning); };
+  setting.stored = [&] { return ask<bool>(found, &DaemonGroup::isAnyStartingAtBoot); };
+  return observedState(std::move(setting), _machine.effects);
 }
 
 void LinuxRemoteShellService::setEnabled(bool enabled) {
@@ -147,14 +156,6 @@ void LinuxRemoteShellService::setEnabled(bool enabled) {
   setting.apply = [&](bool on) { return apply(on, trace); };
   setting.settled = [this](bool) { return withServer<bool>(&hasSettled).valueOr(false); };
   carryOut(setting, enabled, _machine);
-}
-
-Result<bool> LinuxRemoteShellService::hasAny(Result<std::vector<Daemon>> (DaemonGroup::*those)() const) {
-  return withServer<bool>([those](const DaemonGroup& server) -> Result<bool> {
-    const auto found = (server.*those)();
-    if (!found) return found.failure();
-    return !found->empty();
-  });
 }
 
 Result<void> LinuxRemoteShellService::store(bool enabled, Trace& trace) {

@@ -35,7 +35,6 @@ class LinuxRemoteShellService final : public RemoteShellService {
   template <typename Answer, typename Use>
   Result<Answer> withServer(Use use);
   Support supported();
-  Result<bool> hasAny(Result<std::vector<Daemon>> (DaemonGroup::*those)() const);
   Result<void> store(bool enabled, Trace& trace);
   Result<void> startAtBoot(const DaemonGroup& server, WrittenPlaces& written);
   Result<void> apply(bool enabled, Trace& trace);

@@ -35,14 +35,15 @@ Daemons& LinuxNetworkTimeService::daemons() {
 }
 
 Result<const TimeDaemon*> LinuxNetworkTimeService::client() {
-  const TimeDaemon* masked = nullptr;
-  for (const auto& candidate : timeDaemons()) {
-    const auto presence = daemons().presence(candidate.daemon);
-    if (!presence) return presence.failure();
-    if (*presence == Daemons::Presence::installed) return &candidate;
-    if (*presence == Daemons::Presence::masked && !masked) masked = &candidate;
+  std::vector<Daemon> candidates;
+  for (const auto& candidate : timeDaemons()) candidates.push_back(candidate.daemon);
+  const auto presences = daemons().presences(candidates);
+  if (!presences) return presences.failure();
+  for (const auto wanted : {Daemons::Presence::installed, Daemons::Presence::masked}) {
+    const auto first = std::ranges::find(*presences, wanted);
+    if (first != presences->end()) return &timeDaemons()[static_cast<std::size_t>(first - presences->begin())];
   }
-  return masked;
+  return nullptr;
 }
 
 template <typename Answer, typename Use>
@@ -70,11 +71,7 @@ Setting<Value> LinuxNetworkTimeService::named(const char* name) {
 
 Setting<bool> LinuxNetworkTimeService::runningSetting() {
   auto setting = named<bool>(setting::networkTime);
-  setting.live = [this]() -> Result<bool> {
-    const auto found = client();
-    if (!found) return found.failure();
-    return *found ? daemons().isRunning((*found)->daemon) : Result<bool>(false);
-  };
+  setting.live = [this] { return runs(client()); };
   setting.apply = [this](bool isOn) {
     return withClient<void>([&](const TimeDaemon& client) { return run(client.daemon, isOn); });
   };
@@ -93,8 +90,10 @@ Result<void> LinuxNetworkTimeService::run(const Daemon& daemon, bool isOn) {
 }
 
 bool LinuxNetworkTimeService::isRunning() {
+  const auto found = client();
   auto setting = runningSetting();
-  setting.stored = [this] { return startsAtBoot(); };
+  setting.live = [&] { return runs(found); };
+  setting.stored = [&] { return startsAtBoot(found); };
   return observe(setting, _machine.effects).value_or(false);
 }
 
@@ -107,14 +106,20 @@ void LinuxNetworkTimeService::stop() {
   carryOut(runningSetting(), false, _machine);
 }
 
-Result<bool> LinuxNetworkTimeService::startsAtBoot() {
-  return withClient<bool>([this](const TimeDaemon& client) { return daemons().startsAtBoot(client.daemon); });
+Result<bool> LinuxNetworkTimeService::runs(const Result<const TimeDaemon*>& client) {
+  if (!client) return client.failure();
+  return *client ? daemons().isRunning((*client)->daemon) : Result<bool>(false);
+}
+
+Result<bool> LinuxNetworkTimeService::startsAtBoot(const Result<const TimeDaemon*>& client) {
+  if (!client) return client.failure();
+  return *client ? daemons().startsAtBoot((*client)->daemon) : Result<bool>(noClient());
 }
 
 void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
   auto setting = named<bool>(setting::networkTimeAtStartup);
   if (const auto found = client(); found && *found) setting.where = (*found)->daemon.unit;
-  setting.stored = [this] { return startsAtBoot(); };
+  setting.stored = [this] { return startsAtBoot(client()); };
   WrittenPlaces written;
   setting.written = [&] { return written.text(); };
   setting.store = [&, this](bool starts) {

@@ -39,7 +39,8 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   template <typename Value>
   Setting<Value> named(const char* name);
   Setting<bool> runningSetting();
-  Result<bool> startsAtBoot();
+  Result<bool> runs(const Result<const TimeDaemon*>& client);
+  Result<bool> startsAtBoot(const Result<const TimeDaemon*>& client);
   Setting<std::string> serverSetting();
   Setting<std::string>::Found firstServer();
   Setting<std::string>::Found liveServer();

@@ -31,6 +31,18 @@ std::vector<Daemon> socketsFirst(std::vector<Daemon> daemons) {
 
 }  // namespace
 
+Result<Daemons::Presence> Daemons::presence(const Daemon& daemon) {
+  const auto found = presences({daemon});
+  if (!found) return found.failure();
+  return found->front();
+}
+
+Result<bool> Daemons::isRunning(const Daemon& daemon) {
+  const auto found = areRunning({daemon});
+  if (!found) return found.failure();
+  return found->front();
+}
+
 Result<void> Daemons::checkMayStartAtBoot(const Daemon& daemon, bool start) {
   const auto forRoot = whyNeedsRoot(start ? "enable" : "disable", daemon.unit);
   if (!forRoot) return {};
@@ -51,13 +63,12 @@ std::string DaemonGroup::names() const {
 }
 
 Result<DaemonGroup> DaemonGroup::present() const {
+  const auto presences = _daemons.presences(_members);
+  if (!presences) return presences.failure();
   auto found = *this;
   found._members.clear();
-  for (const auto& member : _members) {
-    const auto presence = _daemons.presence(member);
-    if (!presence) return presence.failure();
-    if (*presence != Daemons::Presence::absent) found._members.push_back(member);
-  }
+  for (std::size_t index = 0; index < _members.size(); ++index)
+    if ((*presences)[index] != Daemons::Presence::absent) found._members.push_back(_members[index]);
   return found;
 }
 
@@ -72,7 +83,26 @@ Result<std::vector<Daemon>> DaemonGroup::those(Result<bool> (Daemons::*are)(cons
 }
 
 Result<std::vector<Daemon>> DaemonGroup::running() const {
-  return those(&Daemons::isRunning);
+  const auto running = _daemons.areRunning(_members);
+  if (!running) return running.failure();
+  std::vector<Daemon> found;
+  for (std::size_t index = 0; index < _members.size(); ++index)
+    if ((*running)[index]) found.push_back(_members[index]);
+  return found;
+}
+
+Result<bool> DaemonGroup::isAnyRunning() const {
+  const auto found = running();
+  if (!found) return found.failure();
+  return !found->empty();
+}
+
+Result<bool> DaemonGroup::isAnyStartingAtBoot() const {
+  for (const auto& member : _members) {
+    auto starts = _daemons.startsAtBoot(member);
+    if (!starts || *starts) return starts;
+  }
+  return false;
 }
 
 Result<std::vector<Daemon>> DaemonGroup::startingAtBoot() const {

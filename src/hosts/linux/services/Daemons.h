@@ -27,9 +27,12 @@ class Daemons {
   enum class Presence { absent, masked, installed };
   virtual ~Daemons() = default;
 
-  virtual Result<Presence> presence(const Daemon& daemon) = 0;
-  /// Also while it starts.
-  virtual Result<bool> isRunning(const Daemon& daemon) = 0;
+  /// Of each, in the same order; one that cannot be told is a failure of all.
+  virtual Result<std::vector<Presence>> presences(const std::vector<Daemon>& daemons) = 0;
+  Result<Presence> presence(const Daemon& daemon);
+  /// As presences(): also while it starts.
+  virtual Result<std::vector<bool>> areRunning(const std::vector<Daemon>& daemons) = 0;
+  Result<bool> isRunning(const Daemon& daemon);
   /// Whether it starts or stops at this moment: isRunning() then tells what is to be rather than what is.
   virtual Result<bool> isChanging(const Daemon& daemon) = 0;
   /// Whether it will run after the machine has been started again.
@@ -70,6 +73,9 @@ class DaemonGroup {
   Result<DaemonGroup> present() const;
   Result<std::vector<Daemon>> running() const;
   Result<std::vector<Daemon>> startingAtBoot() const;
+  Result<bool> isAnyRunning() const;
+  /// The others are not asked about after the first that does.
+  Result<bool> isAnyStartingAtBoot() const;
   Result<std::vector<Daemon>> stayingOffAtBoot() const;
   /// Those that run, and services that wait for their socket, a member that listens, to start them.
   Result<std::vector<Daemon>> ready() const;

@@ -48,11 +48,15 @@ std::vector<std::string> differing(const std::set<std::string>& before, const st
 
 }  // namespace
 
-Result<Daemons::Presence> InitScriptDaemons::presence(const Daemon& daemon) {
-  const auto hasScript = *daemon.script == '\0' ? Result<bool>(false) : _root.isThere(scriptOf(daemon));
-  const auto isInstalled = hasScript && *hasScript ? hasProgram(daemon) : hasScript;
-  if (!isInstalled) return isInstalled.failure();
-  return *isInstalled ? Presence::installed : Presence::absent;
+Result<std::vector<Daemons::Presence>> InitScriptDaemons::presences(const std::vector<Daemon>& daemons) {
+  std::vector<Presence> found;
+  for (const auto& daemon : daemons) {
+    const auto hasScript = *daemon.script == '\0' ? Result<bool>(false) : _root.isThere(scriptOf(daemon));
+    const auto isInstalled = hasScript && *hasScript ? hasProgram(daemon) : hasScript;
+    if (!isInstalled) return isInstalled.failure();
+    found.push_back(*isInstalled ? Presence::installed : Presence::absent);
+  }
+  return found;
 }
 
 /// A package that was removed, but not purged, leaves its script behind.
@@ -72,10 +76,14 @@ Result<std::vector<ProcessId>> InitScriptDaemons::processes(const Daemon& daemon
   return own;
 }
 
-Result<bool> InitScriptDaemons::isRunning(const Daemon& daemon) {
-  const auto found = processes(daemon);
-  if (!found) return found.failure();
-  return !found->empty();
+Result<std::vector<bool>> InitScriptDaemons::areRunning(const std::vector<Daemon>& daemons) {
+  std::vector<bool> are;
+  for (const auto& daemon : daemons) {
+    const auto found = processes(daemon);
+    if (!found) return found.failure();
+    are.push_back(!found->empty());
+  }
+  return are;
 }
 
 Result<bool> InitScriptDaemons::hasLink(const Daemon& daemon, const char* kinds) const {

@@ -20,8 +20,8 @@ class InitScriptDaemons final : public Daemons {
   /// Both must outlive the object.
   InitScriptDaemons(const SystemRoot& root, RunLoop& runLoop) : _root(root), _runLoop(runLoop) {}
 
-  Result<Presence> presence(const Daemon& daemon) override;
-  Result<bool> isRunning(const Daemon& daemon) override;
+  Result<std::vector<Presence>> presences(const std::vector<Daemon>& daemons) override;
+  Result<std::vector<bool>> areRunning(const std::vector<Daemon>& daemons) override;
   /// Its script says nothing of that.
   Result<bool> isChanging(const Daemon& /*daemon*/) override { return false; }
   Result<bool> startsAtBoot(const Daemon& daemon) override;

@@ -55,7 +55,7 @@ class ServiceAccess {
   Connection _manager{"/run/systemd/private", Bus::Kind::straightToService};
   std::optional<Failure> _lookFailure;
   RunLoop::Clock::time_point _lookedAt;
-  UnitDaemons _units{*this, _runLoop};
+  UnitDaemons _units{*this, _root, _runLoop};
   InitScriptDaemons _scripts{_root, _runLoop};
 };
 

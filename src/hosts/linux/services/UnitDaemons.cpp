@@ -8,6 +8,8 @@
 
 #include "hosts/linux/services/ServiceAccess.h"
 #include "hosts/linux/services/SystemServices.h"
+#include "hosts/linux/services/UnitFiles.h"
+#include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
@@ -78,6 +80,19 @@ void addLinks(BusMessage& changes, WrittenPlaces& written) {
   }
 }
 
+/// One unit of the manager's list: name, description, both states, more of both, and the job that it has.
+UnitState takeState(BusMessage& list) {
+  list.readText();
+  list.readText();
+  UnitState state{list.readText(), list.readText()};
+  for (int more = 0; more < 3; ++more) list.readText();
+  list.readUint32();
+  list.readText();
+  list.readText();
+  list.exit();
+  return state;
+}
+
 }  // namespace
 
 Result<BusMessage> UnitDaemons::ask(const Daemon& daemon, const char* member, const char* replySignature) {
@@ -108,31 +123,49 @@ Result<BusMessage> UnitDaemons::unitProperty(const Daemon& daemon, const char* n
   return value;
 }
 
+/// Loads what is not loaded yet, as any question about a unit does.
+Result<std::vector<UnitState>> UnitDaemons::states(const std::vector<Daemon>& daemons) {
+  constexpr const char* member = "ListUnitsByNames";
+  std::vector<std::string> units;
+  for (const auto& daemon : daemons) units.emplace_back(daemon.unit);
+  const auto bus = _services.serviceManager();
+  if (!bus) return bus.failure();
+  auto reply = (*bus)->call(serviceManager(), member, "a(ssssssouso)", units);
+  if (!reply) return retold(reply.failure(), member, commaList(units));
+  auto list = std::move(reply).value();
+  std::vector<UnitState> states;
+  list.enter('a', "(ssssssouso)");
+  while (list.enter('r', "ssssssouso")) states.push_back(takeState(list));
+  if (states.size() != units.size()) return Failure{member, commaList(units), "it does not tell of each of them"};
+  return states;
+}
+
 /// A unit whose file can no longer be understood is there: it may run still, and be enabled.
-Result<Daemons::Presence> UnitDaemons::presence(const Daemon& daemon) {
-  auto state = unitProperty(daemon, "LoadState", "s");
-  if (!state) return state.failure();
-  const auto word = std::move(state).value().readText();
-  if (word == "masked") return Presence::masked;
-  return word == "not-found" ? Presence::absent : Presence::installed;
+Result<std::vector<Daemons::Presence>> UnitDaemons::presences(const std::vector<Daemon>& daemons) {
+  const auto found = states(daemons);
+  if (!found) return found.failure();
+  std::vector<Presence> presences;
+  for (const auto& state : *found)
+    presences.push_back(state.load == "masked"      ? Presence::masked
+                        : state.load == "not-found" ? Presence::absent
+                                                    : Presence::installed);
+  return presences;
 }
 
-Result<std::string> UnitDaemons::activeState(const Daemon& daemon) {
-  auto state = unitProperty(daemon, "ActiveState", "s");
-  if (!state) return state.failure();
-  return std::move(state).value().readText();
-}
-
-Result<bool> UnitDaemons::isRunning(const Daemon& daemon) {
-  const auto state = activeState(daemon);
-  if (!state) return state.failure();
-  return *state == "active" || *state == "activating" || *state == "reloading";
+Result<std::vector<bool>> UnitDaemons::areRunning(const std::vector<Daemon>& daemons) {
+  const auto found = states(daemons);
+  if (!found) return found.failure();
+  std::vector<bool> are;
+  for (const auto& [load, active] : *found)
+    are.push_back(active == "active" || active == "activating" || active == "reloading");
+  return are;
 }
 
 Result<bool> UnitDaemons::isChanging(const Daemon& daemon) {
-  const auto state = activeState(daemon);
-  if (!state) return state.failure();
-  return *state == "activating" || *state == "deactivating";
+  const auto found = states({daemon});
+  if (!found) return found.failure();
+  const auto& active = found->front().active;
+  return active == "activating" || active == "deactivating";
 }
 
 Result<std::string> UnitDaemons::fileState(const Daemon& daemon) {
@@ -143,6 +176,7 @@ Result<std::string> UnitDaemons::fileState(const Daemon& daemon) {
 }
 
 Result<bool> UnitDaemons::startsAtBoot(const Daemon& daemon) {
+  if (isEnabledBeyondDoubt(_root, daemon.unit)) return true;
   const auto state = fileState(daemon);
   if (!state) return state.failure();
   return *state == "enabled";

@@ -4,24 +4,33 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "base/RunLoop.h"
 #include "hosts/linux/services/Bus.h"
 #include "hosts/linux/services/Daemons.h"
+#include "hosts/shared/SystemRoot.h"
 
 namespace tavisk {
 
 class ServiceAccess;
 
+/// A unit as systemctl(1) lists it, in words such as "loaded" and "active".
+struct UnitState {
+  std::string load;
+  std::string active;
+};
+
 /// Daemons of a machine with the service manager: its units, and the links by which they start
 /// (org.freedesktop.systemd1, see org.freedesktop.systemd1(5)).
 class UnitDaemons final : public Daemons {
  public:
-  /// Both must outlive the object.
-  UnitDaemons(ServiceAccess& services, RunLoop& runLoop) : _services(services), _runLoop(runLoop) {}
+  /// All must outlive the object.
+  UnitDaemons(ServiceAccess& services, const SystemRoot& root, RunLoop& runLoop)
+      : _services(services), _root(root), _runLoop(runLoop) {}
 
-  Result<Presence> presence(const Daemon& daemon) override;
-  Result<bool> isRunning(const Daemon& daemon) override;
+  Result<std::vector<Presence>> presences(const std::vector<Daemon>& daemons) override;
+  Result<std::vector<bool>> areRunning(const std::vector<Daemon>& daemons) override;
   Result<bool> isChanging(const Daemon& daemon) override;
   Result<bool> startsAtBoot(const Daemon& daemon) override;
   Result<bool> startsUntilRestart(const Daemon& daemon) override;
@@ -39,8 +48,8 @@ class UnitDaemons final : public Daemons {
   template <typename... Arguments>
   Result<BusMessage> order(const Daemon& daemon, const char* member, const char* replySignature,
                            const Arguments&... arguments);
-  /// A word such as "active", as systemctl(1) lists them.
-  Result<std::string> activeState(const Daemon& daemon);
+  /// Of each unit, in the same order.
+  Result<std::vector<UnitState>> states(const std::vector<Daemon>& daemons);
   Result<BusMessage> unitProperty(const Daemon& daemon, const char* name, const char* signature);
   /// A word such as "enabled", as systemctl(1) lists them; empty when there is no such unit file.
   Result<std::string> fileState(const Daemon& daemon);
@@ -53,6 +62,7 @@ class UnitDaemons final : public Daemons {
   std::optional<std::string> unmetCondition(const Daemon& daemon);
 
   ServiceAccess& _services;
+  const SystemRoot& _root;
   RunLoop& _runLoop;
 };
 

@@ -114,7 +114,7 @@ TEST(LinuxNetworkTime, HasNotChangedWhileTheClientStartsOrStops) {
 TEST(LinuxNetworkTime, AsksForTheClientOnceWhenItLooksAtTheNextStart) {
   ManagedTree tree;
   haveChrony(tree);
-  tree.manager.breakNext("LoadUnit", FakeServiceManager::Fault::error);
+  tree.manager.breakNext("ListUnitsByNames", FakeServiceManager::Fault::error);
   tree.host().networkTime().checkLaunchAtStartup(true);
   EXPECT_THAT(tree.lastEffect(), FailedFor("AccessDenied"));
 }

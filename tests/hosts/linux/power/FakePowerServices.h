@@ -55,8 +55,9 @@ class FakePowerServices {
     if (member == "CanSuspend" && !canSuspend.load())
       return sd_bus_reply_method_errorf(call, "org.freedesktop.DBus.Error.AccessDenied", "it is out of order");
     if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", canSuspend.load());
-    if (member == "LoadUnit")
-      return sd_bus_reply_method_return(call, "o", "/org/freedesktop/systemd1/unit/suspend_2etarget");
+    if (member == "ListUnitsByNames")
+      return sd_bus_reply_method_return(call, "a(ssssssouso)", 1, "", "", unitState.load(), "inactive", "", "", "/", 0U,
+                                        "", "/");
     if (member == "Reload") {
       readManager();
       return sd_bus_reply_method_return(call, "");
@@ -124,7 +125,6 @@ class FakePowerServices {
     constexpr std::uint64_t microseconds = 60'000'000;
     if (name == "IdleAction") return sd_bus_reply_method_return(call, "v", "s", _idleAction.c_str());
     if (name == "HandlePowerKey") return sd_bus_reply_method_return(call, "v", "s", _powerKey.c_str());
-    if (name == "LoadState") return sd_bus_reply_method_return(call, "v", "s", unitState.load());
     if (name == "IdleActionUSec")
       return sd_bus_reply_method_return(call, "v", "t", std::stoull(_idleMinutes) * microseconds);
     return sd_bus_reply_method_return(call, "v", "t", _watchdogSet != 0 ? _watchdogSet : _watchdogRead);

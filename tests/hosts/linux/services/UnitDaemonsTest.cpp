@@ -7,6 +7,7 @@
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/LinuxContractMachines.h"
 #include "hosts/linux/services/ServicesConfig.h"
+#include "hosts/linux/services/UnitFiles.h"
 #include "hosts/linux/system/Program.h"
 
 namespace tavisk {
@@ -107,6 +108,30 @@ TEST_F(ManagedDaemons, StartWithTheMachineByRootOnly) {
   EXPECT_THAT(tree.manager.calls(), IsEmpty());
 }
 
+TEST(UnitFiles, ShowWhatIsEnabledWhereNothingStandsInTheWay) {
+  const std::string package = "/usr/lib/systemd/system/a.service";
+  const std::string wanted = "/etc/systemd/system/default.target.wants/a.service";
+  const std::tuple<const char*, const char*, bool> spoils[] = {
+      {"", "", true},
+      {"/etc/systemd/system/a.service", "/dev/null", false},
+      {"/run/systemd/system/a.service", "/dev/null", false},
+      {"/usr/local/lib/systemd/system/a.service", nullptr, false},
+      {package.c_str(), "b.service", false},
+      {wanted.c_str(), nullptr, false},
+  };
+  for (const auto& [path, target, isEnabled] : spoils) {
+    LinuxTree files;
+    EXPECT_FALSE(isEnabledBeyondDoubt(files.root, "a.service")) << "without files";
+    files.write(package, "[Unit]\n");
+    files.write("/etc/systemd/system/default.target.d/a.service", "");
+    EXPECT_FALSE(isEnabledBeyondDoubt(files.root, "a.service")) << "without a link";
+    files.link(wanted, package);
+    if (*path != '\0') std::filesystem::remove(files.at(path));
+    if (*path != '\0') target ? files.link(path, target) : files.write(path, "");
+    EXPECT_EQ(isEnabledBeyondDoubt(files.root, "a.service"), isEnabled) << path;
+  }
+}
+
 TEST_F(ManagedDaemons, HaveTheUserAskedNothing) {
   tree.manager.breakNext("StartUnit", Fault::question);
   const auto started = daemons.start(daemon);
@@ -120,7 +145,7 @@ TEST_F(UnitDaemonsTest, TellOfAManagerThatRefusesAndWaitOnceForOneThatIsSilent) 
   EXPECT_THAT(tree.lastEffect(), FailedFor("EnableUnitFiles on chrony.service"));
   EXPECT_EQ(tree.lastEffect().failure->code, BusErrorCode::accessDenied);
   const auto began = RunLoop::Clock::now();
-  tree.manager.breakNext("LoadUnit", Fault::silence);
+  tree.manager.breakNext("ListUnitsByNames", Fault::silence);
   client.start();
   EXPECT_THAT(tree.lastEffect(), FailedFor("timed out"));
   EXPECT_LT(RunLoop::Clock::now() - began, Bus::usualTime + std::chrono::milliseconds(500));

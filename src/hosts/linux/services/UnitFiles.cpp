@@ -1,0 +1,52 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/linux/services/UnitFiles.h"
+
+#include <algorithm>
+#include <vector>
+
+namespace tavisk {
+namespace {
+
+constexpr const char* administratorFolder = "/etc/systemd/system";
+constexpr const char* packageFolder = "/usr/lib/systemd/system";
+// Where a file, or a link that masks the unit, would count before that of the package (systemd.unit(5)).
+constexpr const char* foldersBefore[] = {administratorFolder,
+                                         "/etc/systemd/system.control",
+                                         "/etc/systemd/system.attached",
+                                         "/run/systemd/system",
+                                         "/run/systemd/system.control",
+                                         "/run/systemd/system.attached",
+                                         "/run/systemd/transient",
+                                         "/run/systemd/generator",
+                                         "/run/systemd/generator.early",
+                                         "/usr/local/lib/systemd/system"};
+
+bool mayHave(const SystemRoot& root, const std::string& folder, const std::string& name) {
+  const auto names = orEmpty(root.list(folder));
+  return !names || std::ranges::find(*names, name) != names->end();
+}
+
+bool isLink(const SystemRoot& root, const std::string& path) {
+  return root.readLink(path).operator bool();
+}
+
+/// Whether what is in the folder is started with the unit that the folder is named after.
+bool holdsLinks(const std::string& folder) {
+  return folder.ends_with(".wants") || folder.ends_with(".requires");
+}
+
+}  // namespace
+
+bool isEnabledBeyondDoubt(const SystemRoot& root, const std::string& unit) {
+  for (const char* folder : foldersBefore)
+    if (mayHave(root, folder, unit)) return false;
+  if (isLink(root, std::string(packageFolder) + "/" + unit)) return false;
+  if (!root.isThere(std::string(packageFolder) + "/" + unit).valueOr(false)) return false;
+  const auto names = root.list(administratorFolder).valueOr({});
+  return std::ranges::any_of(names, [&](const std::string& name) {
+    return holdsLinks(name) && isLink(root, std::string(administratorFolder).append("/").append(name + "/" + unit));
+  });
+}
+
+}  // namespace tavisk
