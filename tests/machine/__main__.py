@@ -7,6 +7,7 @@ import subprocess
 import sys
 import time
 
+import bench
 import check
 import container
 import faults
@@ -28,8 +29,9 @@ KINDS = {
     "startup": [startup.Startup],
     "systems": [systems.Grub, systems.BootEntries, systems.SavedDefault],
     "sweep": [faults.Faults],
+    "bench": [lambda: bench.Bench(*REMOTE)],
 }
-ALONE = ("systems", "sweep")  # take long, and are run only when they are asked for
+ALONE = ("systems", "sweep", "bench")  # take long, and are run only when they are asked for
 
 
 def arguments():
