@@ -135,7 +135,10 @@ Setting<bool> LinuxRemoteShellService::remoteLogin() {
 }
 
 RemoteAccessState LinuxRemoteShellService::state() {
-  return observedState(remoteLogin(), _machine.effects);
+  auto setting = remoteLogin();
+  const auto units = _machine.effects.wantsPlaces() ? server() : Failure{};
+  if (units) setting.where = units->names();
+  return observedState(std::move(setting), _machine.effects);
 }
 
 void LinuxRemoteShellService::setEnabled(bool enabled) {
@@ -261,7 +264,10 @@ Setting<bool> LinuxRemoteEventsService::remoteEvents() {
 }
 
 RemoteAccessState LinuxRemoteEventsService::state() {
-  return observedState(remoteEvents(), _machine.effects);
+  auto setting = remoteEvents();
+  const auto named = _machine.effects.wantsPlaces() ? units() : Failure{};
+  if (named) setting.where = named->names();
+  return observedState(std::move(setting), _machine.effects);
 }
 
 void LinuxRemoteEventsService::setEnabled(bool enabled) {

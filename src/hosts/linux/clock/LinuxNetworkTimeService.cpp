@@ -6,6 +6,7 @@
 
 #include "base/DnsName.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/clock/SystemClock.h"
 #include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/Program.h"
@@ -26,6 +27,15 @@ Failure noClient() {
   std::vector<std::string> names;
   for (const auto& daemon : timeDaemons()) names.emplace_back(daemon.daemon.unit);
   return {"find a network-time client", commaList(names), "none of them is installed"};
+}
+
+/// The kernel's own account, which every client keeps.
+Facts clockFacts() {
+  const auto discipline = clockDiscipline();
+  if (!discipline) return {{"synchronized", "not known: " + describe(discipline.failure())}};
+  if (!*discipline) return {{"synchronized", "no"}};
+  const auto milliseconds = std::chrono::ceil<std::chrono::milliseconds>((*discipline)->largestError);
+  return {{"synchronized", "yes"}, {"milliseconds off at most", std::to_string(milliseconds.count())}};
 }
 
 }  // namespace
@@ -95,6 +105,8 @@ Result<void> LinuxNetworkTimeService::run(const Daemon& daemon, bool isOn) {
 bool LinuxNetworkTimeService::isRunning() {
   auto setting = runningSetting();
   setting.stored = [this] { return startsAtBoot(); };
+  if (_machine.effects.wantsPlaces()) setting.where = unit();
+  if (_machine.root.prefix() == "/") setting.facts = clockFacts;
   return observe(setting, _machine.effects).value_or(false);
 }
 
@@ -107,13 +119,19 @@ void LinuxNetworkTimeService::stop() {
   carryOut(runningSetting(), false, _machine);
 }
 
+/// Of the client; empty where there is none.
+std::string LinuxNetworkTimeService::unit() {
+  const auto found = client();
+  return found && *found ? (*found)->daemon.unit : "";
+}
+
 Result<bool> LinuxNetworkTimeService::startsAtBoot() {
   return withClient<bool>([this](const TimeDaemon& client) { return daemons().startsAtBoot(client.daemon); });
 }
 
 void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
   auto setting = named<bool>(setting::networkTimeAtStartup);
-  if (const auto found = client(); found && *found) setting.where = (*found)->daemon.unit;
+  setting.where = unit();
   setting.stored = [this] { return startsAtBoot(); };
   WrittenPlaces written;
   setting.written = [&] { return written.text(); };

@@ -39,6 +39,7 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   template <typename Value>
   Setting<Value> named(const char* name);
   Setting<bool> runningSetting();
+  std::string unit();
   Result<bool> startsAtBoot();
   Setting<std::string> serverSetting();
   Setting<std::string>::Found firstServer();
