@@ -167,7 +167,9 @@ TEST_F(PowerTest, WakeOnNetworkAccessIsReadBackFromCardsThatIgnoreIt) {
 TEST_F(PowerTest, WakeOnModemSetsThePlaceOfThePortNotItsTerminal) {
   tree.addPort("ttyS1", "00:05");
   tree.remove("/sys/devices/pnp0/00:05/power");
+  tree.addPort("ttyS2", "00:06", "/00:06:0/00:06:0.0");
   const auto effect = tree.turn(PowerSwitch::wakeOnModem, true);
+  EXPECT_EQ(tree.file("/sys/devices/pnp0/00:06/power/wakeup"), "enabled");
   EXPECT_EQ(tree.file("/sys/devices/pnp0/00:04/power/wakeup"), "enabled");
   EXPECT_EQ(tree.file("/sys/class/tty/ttyS0/power/wakeup"), "disabled\n");
   EXPECT_EQ(effect.where, "/etc/udev/rules.d/60-tavisk-wake-on-ring.rules");
