@@ -55,7 +55,7 @@ class FakePowerServices {
     if (member == "Set") return answerSet(call);
     if (member == "CanSuspend" && !canSuspend.load())
       return sd_bus_reply_method_errorf(call, "org.freedesktop.DBus.Error.AccessDenied", "it is out of order");
-    if (member == "CanSuspend" && std::strchr(canSuspend, '.') != nullptr)
+    if (member == "CanSuspend" && std::strchr(canSuspend, '.'))
       return sd_bus_reply_method_errorf(call, canSuspend, "No such file or directory");
     if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", canSuspend.load());
     if (member == "LoadUnit")
