@@ -18,6 +18,7 @@ import server
 import startup
 import systems
 import trees
+import upgrade
 
 REMOTE = ["avahi-daemon", "iproute2", "jq", "openssh-server", "sudo", "systemd-resolved"]
 KINDS = {
@@ -27,9 +28,10 @@ KINDS = {
     "server": [server.Server],
     "startup": [startup.Startup],
     "systems": [systems.Grub, systems.BootEntries, systems.SavedDefault],
+    "upgrade": [lambda: upgrade.Upgrade("systemd-timesyncd", *REMOTE)],
     "sweep": [faults.Faults],
 }
-ALONE = ("systems", "sweep")  # take long, and are run only when they are asked for
+ALONE = ("systems", "upgrade", "sweep")  # take long, and are run only when they are asked for
 
 
 def arguments():
