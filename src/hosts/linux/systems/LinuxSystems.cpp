@@ -196,7 +196,7 @@ NamedPoints LinuxSystems::pointsOf(const MountTable& mounts) const {
 bool LinuxSystems::hasSystemOfItsOwn(const DiskName& volume, const MountTable& mounts) {
   const auto* known = _surroundings.volumes->named(volume);
   if (!known) return false;
-  const auto mount =
+  const auto* const mount =
       _disks.looks().orTold(mountOf(mounts, _disks.devices(), known->device, known->facts.type.value_or("")));
   return mount && _disks.looks().orTold(hasOwnSystem(_machine.root, mount->point, bootFile()));
 }
