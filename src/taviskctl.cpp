@@ -31,25 +31,31 @@ Status afterOutput(Output& output, Status status) {
   return Status::incomplete;
 }
 
-Status start(const std::vector<std::string>& words) {
-  Output output(stdout);
+Status runOn(Output& output, const std::vector<std::string>& words) {
   const HostRemark remark = isatty(STDERR_FILENO) != 0 ? complainOfControl : HostRemark();
   const auto openHost = [&](EffectSink& effects, RunLoop& runLoop) { return openChosenHost(effects, runLoop, remark); };
-  auto status = Status::incomplete;
   try {
-    status = control::run(words, {openHost, output, complainOfControl});
+    return control::run(words, {openHost, output, complainOfControl});
   } catch (const Output::Lost&) {
-    // Told below.
-  } catch (const std::exception& error) {
-    complainOfControl(reasonOf(error));
+    return Status::incomplete;  // afterOutput() says why
   }
-  return afterOutput(output, status);
+}
+
+Status start(int argc, char** argv) {
+  Output output(stdout);
+  return afterOutput(output, runOn(output, {argv + (argc > 0 ? 1 : 0), argv + argc}));
 }
 
 }  // namespace
 }  // namespace tavisk
 
 int main(int argc, char** argv) {
-  if (!tavisk::prepareProcess()) return static_cast<int>(tavisk::Status::incomplete);
-  return static_cast<int>(tavisk::start({argv + (argc > 0 ? 1 : 0), argv + argc}));
+  using tavisk::Status;
+  if (!tavisk::prepareProcess()) return static_cast<int>(Status::incomplete);
+  try {
+    return static_cast<int>(tavisk::start(argc, argv));
+  } catch (const std::exception& error) {
+    tavisk::complainOfControl(tavisk::reasonOf(error));
+    return static_cast<int>(Status::incomplete);
+  }
 }

@@ -16,11 +16,11 @@ namespace {
 
 using Settings = std::vector<const ManagedSetting*>;
 
-Settings settingsWithout(bool searched) {
-  Settings chosen;
+Settings managed(bool withSearched) {
+  Settings managed;
   for (const auto& setting : managedSettings())
-    if (!(searched && setting.isSearched)) chosen.push_back(&setting);
-  return chosen;
+    if (withSearched || !setting.isSearched) managed.push_back(&setting);
+  return managed;
 }
 
 /// Without names all of them, but those that are searched for.
@@ -31,7 +31,7 @@ Result<Settings> chosenSettings(const std::vector<std::string>& names, bool areA
     if (!setting) return Failure{"there is no setting " + name, "", "'taviskctl status --all' shows the names"};
     if (std::ranges::find(chosen, setting) == chosen.end()) chosen.push_back(setting);
   }
-  return names.empty() || areAllWanted ? settingsWithout(!areAllWanted) : chosen;
+  return names.empty() || areAllWanted ? managed(areAllWanted) : chosen;
 }
 
 bool isWholly(const SettingState& state) {
@@ -45,15 +45,15 @@ Status showStatus(const Invocation& invocation, const Tools& tools) {
     return Status::misused;
   }
   EffectSink effects;
+  StatusReader reader;
+  effects.addChannel(reader);
   RunLoop runLoop;
   const auto host = tools.openHost(effects, runLoop);
   if (!host) {
     tools.complain(describe(host.failure()));
     return Status::incomplete;
   }
-  StatusReader reader(**host, runLoop);
-  effects.addChannel(reader);
-  const auto states = reader.read(*settings);
+  const auto states = reader.read(*settings, **host, runLoop);
   tools.output.print("%s",
                      invocation.has("--json") ? (statusJson(states) + '\n').c_str() : statusTable(states).c_str());
   return std::ranges::all_of(states, isWholly) ? Status::done : Status::incomplete;

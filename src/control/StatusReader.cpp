@@ -9,6 +9,7 @@
 #include <cstdio>
 #include <memory>
 #include <stdexcept>
+#include <utility>
 #include <variant>
 
 #include "base/NotificationCenter.h"
@@ -62,7 +63,8 @@ bool isManaged(const std::string& name) {
 
 }  // namespace
 
-std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSetting*>& settings) {
+std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSetting*>& settings, Host& host,
+                                             RunLoop& runLoop) {
   auto table = CommandTable::parse(CommandTable::text());
   if (!table) throw std::logic_error(describe(table.failure()));
   const auto words = std::make_shared<const CommandTable>(std::move(table).value());
@@ -70,15 +72,16 @@ std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSett
   Output output(stream.get());
   NoInput input;
   NotificationCenter notifications;
-  const CommandContext context{_host, _runLoop, notifications, output, input};
+  const CommandContext context{host, runLoop, notifications, output, input};
   ServerCommands commands(words, context);
   for (const auto* setting : settings) {
     _current = setting;
     stateOf(std::string(setting->name));
-    const auto limit = _runLoop.limitWaits(context.longestCommand);
+    const auto limit = runLoop.limitWaits(context.longestCommand);
     get(commands, *words, setting->getter);
   }
-  return std::move(_states);
+  _current = nullptr;
+  return std::exchange(_states, {});
 }
 
 SettingState& StatusReader::stateOf(const std::string& setting) {
@@ -90,8 +93,9 @@ SettingState& StatusReader::stateOf(const std::string& setting) {
 /// A getter looks at other settings too, which have their own.
 void StatusReader::observe(const SettingValue& value) {
   if (!_current || (value.setting != _current->name && isManaged(value.setting))) return;
-  auto& told = stateOf(value.setting).value = value;
-  told.where = existing(told.where);
+  auto told = value;
+  told.where = existing(value.where);
+  stateOf(value.setting).value = std::move(told);
 }
 
 void StatusReader::record(const Effect& effect) {

@@ -22,11 +22,9 @@ struct SettingState {
 /// Reads settings by their getters, and keeps what those tell instead of what they print.
 class StatusReader final : public EffectChannel {
  public:
-  /// Nothing is owned. The host tells its effects to the sink, to which this has to be a channel.
-  StatusReader(Host& host, RunLoop& runLoop) : _host(host), _runLoop(runLoop) {}
-
   /// For each of the settings its own state, then those that its getter told besides and that no setting is named for.
-  std::vector<SettingState> read(const std::vector<const ManagedSetting*>& settings);
+  /// The host tells its effects to a sink of which this is a channel.
+  std::vector<SettingState> read(const std::vector<const ManagedSetting*>& settings, Host& host, RunLoop& runLoop);
 
   void record(const Effect& effect) override;
   void observe(const SettingValue& value) override;
@@ -36,9 +34,7 @@ class StatusReader final : public EffectChannel {
  private:
   SettingState& stateOf(const std::string& setting);
 
-  Host& _host;
-  RunLoop& _runLoop;
-  const ManagedSetting* _current = nullptr;
+  const ManagedSetting* _current = nullptr;  ///< whose getter is called
   std::vector<SettingState> _states;
 };
 
