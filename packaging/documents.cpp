@@ -9,6 +9,10 @@
 //   @kind      for each kind of argument that has words: kind, words
 //   @key       for each key of a machine file: path, type, default, meaning; all for roff
 //   @setting   for each setting that a machine can refuse: name, for roff
+//   @control   for each command of taviskctl: name, summary, options (its own)
+//   @option    for each option of such a command: command, name, long (without hyphens), summary
+//   @common    for each option that all of them have: name, long, summary
+//   @managed   for each setting that taviskctl shows: name, word (as it is typed)
 // {newline} ends a line of a mark's.
 #include <algorithm>
 #include <cstdlib>
@@ -19,6 +23,8 @@
 #include <vector>
 
 #include "base/Text.h"
+#include "control/CommandLine.h"
+#include "control/ManagedSettings.h"
 #include "frontend/CommandList.h"
 #include "hosts/scratch/KeyTable.h"
 #include "hosts/scratch/Misspellings.h"
@@ -146,6 +152,47 @@ std::vector<Row> settingRows() {
   return rows;
 }
 
+Row optionRow(const control::OptionRow& option) {
+  return {{"{name}", std::string(option.name)},
+          {"{long}", std::string(option.name.substr(option.name.find_first_not_of('-')))},
+          {"{summary}", std::string(option.summary)}};
+}
+
+std::vector<Row> commonRows() {
+  std::vector<Row> rows;
+  for (const auto& option : control::commonOptions()) rows.push_back(optionRow(option));
+  return rows;
+}
+
+std::vector<Row> optionRows() {
+  std::vector<Row> rows;
+  for (const auto& command : control::commandRows())
+    for (const auto& option : command.options)
+      rows.emplace_back(optionRow(option)).emplace_back("{command}", std::string(command.name));
+  return rows;
+}
+
+std::vector<Row> controlRows() {
+  std::vector<Row> rows;
+  for (const auto& command : control::commandRows()) {
+    std::string options;
+    for (const auto& option : command.options) options.append(options.empty() ? "" : " ").append(option.name);
+    rows.push_back(
+        {{"{name}", std::string(command.name)}, {"{summary}", std::string(command.summary)}, {"{options}", options}});
+  }
+  return rows;
+}
+
+std::vector<Row> managedRows() {
+  std::vector<Row> rows;
+  for (const auto& setting : control::managedSettings()) {
+    std::string word = lowerCased(setting.name);
+    std::ranges::replace(word, ' ', '-');
+    rows.push_back({{"{name}", std::string(setting.name)}, {"{word}", word}});
+  }
+  return rows;
+}
+
 void repeat(const std::string& pattern, const std::vector<Row>& rows, std::ostream& document) {
   for (const Row& row : rows) {
     std::string line = pattern;
@@ -157,7 +204,8 @@ void repeat(const std::string& pattern, const std::vector<Row>& rows, std::ostre
 
 void fill(const std::string& line, std::ostream& document) {
   static const std::pair<std::string, std::vector<Row> (*)()> marks[] = {
-      {"@command ", commandRows}, {"@kind ", kindRows}, {"@key ", keyRows}, {"@setting ", settingRows}};
+      {"@command ", commandRows}, {"@kind ", kindRows},     {"@key ", keyRows},       {"@setting ", settingRows},
+      {"@control ", controlRows}, {"@option ", optionRows}, {"@common ", commonRows}, {"@managed ", managedRows}};
   for (const auto& [mark, rows] : marks)
     if (line.starts_with(mark)) return repeat(line.substr(mark.size()), rows(), document);
   document << line << '\n';

@@ -12,11 +12,9 @@
 #include <thread>
 
 #include "base/Process.h"
-#include "base/Text.h"
 #include "effects/Report.h"
 #include "frontend/RemoteServerSettings.h"
-#include "hosts/linux/LinuxHost.h"
-#include "hosts/scratch/ScratchHost.h"
+#include "hosts/ChosenHost.h"
 #include "terminal/TerminalLineSource.h"
 #include "terminal/TerminalLog.h"
 
@@ -24,7 +22,6 @@ namespace tavisk {
 namespace {
 
 constexpr int refusedStatus = 1;
-constexpr std::string_view scratchPrefix = "scratch:";
 
 /// A run that cannot start says why on standard error and in the report.
 int refuse(std::string_view why, Report* report) {
@@ -38,23 +35,6 @@ int refuse(std::string_view why, Report* report) {
 std::optional<std::string> environmentVariable(const char* name) {
   const auto* value = std::getenv(name);
   return value ? std::optional<std::string>(value) : std::nullopt;
-}
-
-Result<std::unique_ptr<Host>> openScratchHost(const std::string& directory, EffectSink& effects, RunLoop& runLoop) {
-  const bool isTold = isatty(STDERR_FILENO) != 0;
-  if (isTold) complain("rehearsing on " + escaped(directory));
-  auto host = ScratchHost::open(directory, effects, runLoop);
-  if (!host) return host.failure();
-  if (const auto names = isTold ? (*host)->misspellings() : ""; !names.empty())
-    complain("machine.plist has names that mean nothing: " + escaped(names));
-  return std::unique_ptr<Host>(std::move(host).value());
-}
-
-Result<std::unique_ptr<Host>> chooseHost(EffectSink& effects, RunLoop& runLoop) {
-  const auto name = environmentVariable("TAVISK_HOST");
-  if (!name) return std::unique_ptr<Host>(std::make_unique<LinuxHost>(effects, runLoop));
-  if (name->starts_with(scratchPrefix)) return openScratchHost(name->substr(scratchPrefix.size()), effects, runLoop);
-  return Failure{"use TAVISK_HOST=" + *name, "", "unset or scratch:DIR is expected"};
 }
 
 int run(Report* report, int argc, char** argv) {
@@ -71,7 +51,7 @@ int run(Report* report, int argc, char** argv) {
     if (std::this_thread::get_id() == own) return input.printAside(print);
     print();
   });
-  const auto host = chooseHost(effects, runLoop);
+  const auto host = openChosenHost(effects, runLoop, isatty(STDERR_FILENO) != 0 ? complain : HostRemark());
   if (!host) return refuse(describe(host.failure()), report);
 
   NotificationCenter notifications;

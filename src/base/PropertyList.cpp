@@ -6,7 +6,6 @@
 #include <type_traits>
 
 namespace tavisk {
-
 namespace {
 
 constexpr std::size_t fewEntries = 8;  // are compared sooner than looked up

@@ -4,6 +4,8 @@
 
 #include <optional>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "base/Result.h"
 
@@ -34,6 +36,9 @@ struct Effect {
   bool operator==(const Effect&) const = default;
 };
 
+/// Texts by name.
+using Facts = std::vector<std::pair<std::string, std::string>>;
+
 /// A setting as a getter found it.
 struct SettingValue {
   std::string setting = {};
@@ -41,6 +46,10 @@ struct SettingValue {
   std::optional<std::string> stored = {};   ///< what will be after a restart
   std::string unit = {};                    ///< "minutes", "seconds since 1970"; empty for words and names
   std::optional<Failure> unsupported = {};  ///< why this machine cannot have the setting; absent: it can
+  // Only for who wants places (EffectChannel).
+  std::string where = {};     ///< the places in which the stored value is kept
+  std::string undoneBy = {};  ///< what else on this machine may undo that value; empty: nothing known
+  Facts facts = {};           ///< what an administrator asks next, by name
 
   bool operator==(const SettingValue&) const = default;
 };

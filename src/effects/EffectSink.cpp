@@ -59,6 +59,11 @@ bool EffectSink::wantsValues() {
   return std::ranges::any_of(_channels, &EffectChannel::wantsValues);
 }
 
+bool EffectSink::wantsPlaces() {
+  const std::scoped_lock lock(_mutex);
+  return std::ranges::any_of(_channels, &EffectChannel::wantsPlaces);
+}
+
 void EffectSink::interrupt(const std::string& why) {
   const auto lock = lockSoon(_mutex);
   if (!lock) return;

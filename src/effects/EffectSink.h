@@ -24,6 +24,8 @@ class EffectChannel {
   virtual void observe(const SettingValue& value);
   /// Whether it keeps what observe() tells: looks that only serve that are left out otherwise.
   virtual bool wantsValues() const { return false; }
+  /// Whether it keeps where a value is stored and what may undo it. Who does wants values too.
+  virtual bool wantsPlaces() const { return false; }
 };
 
 /// What is told of a change that has begun, and of whose end nothing is known.
@@ -47,6 +49,7 @@ class EffectSink {
   /// A value that a getter read.
   void observe(const SettingValue& value);
   bool wantsValues();
+  bool wantsPlaces();
 
   /// What is told from here on belongs to the next command.
   void commandEnds() { ++_endedCommands; }

@@ -99,7 +99,7 @@ void ServerCommands::printCommands() {
 }
 
 void ServerCommands::getVersion() {
-  _context.output.putLine("tavisk, Version 1.4a1");
+  _context.output.print("tavisk, Version %s\n", versionText);
   _context.output.putLine("Copyright 2026 The tavisk developers");
 }
 

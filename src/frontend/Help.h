@@ -6,6 +6,9 @@
 
 namespace tavisk {
 
+/// Of the programs, as they print it.
+inline constexpr const char* versionText = "1.4a1";
+
 /// What users are told of one command.
 struct HelpEntry {
   const char* word;         ///< "-setdate", as users are shown it

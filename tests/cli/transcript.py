@@ -9,9 +9,11 @@ usage: transcript.py PROGRAM TRANSCRIPT
     file /etc/motd some text           a file of the machine; \\n is a newline
     link /Backup /Volumes/Backup       a symbolic link of the machine
     environment TAVISK_LOG=stderr
-    $ tavisk -getdate -gettime         the words, quoted as in a shell; starts the run
+    $ tavisk -getdate -gettime         the program, which lies beside PROGRAM, and its words, quoted as in a shell;
+                                       starts the run
     < -getdate                         a typed line, in order; `<|` types the text without a newline at the end
-    Date: 1/1/1970                     the expected standard output, line by line; `|` at the end: no newline follows
+    Date: 1/1/1970                     the expected standard output, line by line; `|` at the end: no newline follows.
+                                       DIR is the folder of the machine's files
     !error tavisk: what standard error says
     !status 1                          0 when not given
     !machine {"Clock": {"Time": 5}}    what has changed in the machine, and nothing else; null: what is gone. The
@@ -27,6 +29,7 @@ Each case is run twice, the second time with a report, whose lines have to be as
 import copy
 import difflib
 import json
+import os
 import re
 import shlex
 import sys
@@ -49,7 +52,7 @@ def value_of(text):
 class Case:
     def __init__(self, title):
         self.title = title
-        self.description = self.words = None
+        self.description = self.program = self.words = None
         self.files, self.links, self.environment = [], [], {}
         self.typed, self.output = b"", b""
         self.wanted = {"error": [], "log": [], "plist": [], "status": ["0"], "machine": ["{}"], "effects": []}
@@ -67,7 +70,8 @@ class Case:
             name, _, value = rest.partition("=")
             self.environment[name] = value
         elif keyword == "$":
-            self.words = [bytes_of(word) for word in shlex.split(rest)[1:]]
+            self.program, *words = shlex.split(rest)
+            self.words = [bytes_of(word) for word in words]
         elif line:
             raise ValueError(f"{self.title}: {line}")
 
@@ -100,12 +104,13 @@ class Case:
             yield from (f"  report: {fault}" for fault in reports.faults(report.read()))
 
     def differences_of_run(self, program, environment):
-        with ScratchMachine(program, self.description) as machine:
+        with ScratchMachine(os.path.join(os.path.dirname(program), self.program), self.description) as machine:
             for path, content in self.files:
                 machine.file(path, content)
             for path, target in self.links:
                 machine.place(path).symlink_to(target)
             output, errors, status = machine.run(self.words, self.typed, {**environment, **self.environment})
+            output = output.replace(bytes(machine.directory), b"DIR")
             errors = errors.decode(errors="replace").replace(str(machine.directory), "DIR").splitlines()
             yield from compared("output", self.output, output)
             yield from compared("standard error", self.wanted["error"], errors)

@@ -19,6 +19,7 @@ import server
 import startup
 import systems
 import trees
+import upgrade
 
 REMOTE = ["avahi-daemon", "iproute2", "jq", "openssh-server", "sudo", "systemd-resolved"]
 KINDS = {
@@ -28,10 +29,11 @@ KINDS = {
     "server": [server.Server],
     "startup": [startup.Startup],
     "systems": [systems.Grub, systems.BootEntries, systems.SavedDefault],
+    "upgrade": [lambda: upgrade.Upgrade("systemd-timesyncd", *REMOTE)],
     "sweep": [faults.Faults],
     "bench": [lambda: bench.Bench(*REMOTE)],
 }
-ALONE = ("systems", "sweep", "bench")  # take long, and are run only when they are asked for
+ALONE = ("systems", "upgrade", "sweep", "bench")  # take long, and are run only when they are asked for
 
 
 def arguments():

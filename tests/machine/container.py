@@ -16,10 +16,10 @@ import trees
 class Container(machine.Machine):
     cannot = "set a clock, let a time daemon correct one, reach firmware or devices"
 
-    def __init__(self, time_daemon, *packages):
+    def __init__(self, time_daemon, *packages, release=trees.RELEASE):
         self.name = f"container with {time_daemon}"
         self.has = frozenset({"bus", "container", time_daemon, *packages})
-        self._tree = trees.layered(f"container-{time_daemon}", [time_daemon, *packages])
+        self._tree = trees.layered(f"container-{time_daemon}", [time_daemon, *packages], release)
         self._log = trees.WORK / f"container-{time_daemon}.log"
         self._manager = None
         self._first_process = None
@@ -38,10 +38,15 @@ class Container(machine.Machine):
     def run(self, command):
         # A name of its own: those that systemd-run makes up come again when the bus is started anew.
         unit = f"--unit=check-{next(self._commands)}"
-        result = subprocess.run(
-            ["nsenter", "--target", self._first_process, "--all",
-             "systemd-run", "--quiet", "--pipe", "--wait", "--collect", unit, "sh", "-c", command],
-            stdin=subprocess.DEVNULL, capture_output=True, text=True, errors="replace", timeout=120)
+        return self._answer(["systemd-run", "--quiet", "--pipe", "--wait", "--collect", unit, "sh", "-c", command], 120)
+
+    def run_beside(self, command, seconds):
+        """Without the service manager's help, for what renews that."""
+        return self._answer(["env", "-i", "PATH=/usr/sbin:/usr/bin:/sbin:/bin", "sh", "-c", command], seconds)
+
+    def _answer(self, words, seconds):
+        result = subprocess.run(["nsenter", "--target", self._first_process, "--all", *words], stdin=subprocess.DEVNULL,
+                                capture_output=True, text=True, errors="replace", timeout=seconds)
         return check.Answer(result.returncode, result.stdout, result.stderr)
 
     def restart(self):

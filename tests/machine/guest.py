@@ -48,6 +48,7 @@ def _make_root(tree, root):
     for file in FILES + _libraries(tree) + _modules(tree):
         (root / file).parent.mkdir(parents=True, exist_ok=True)
         shutil.copy2(tree / file, root / file)
+    _unpack_modules(root)
     shutil.copy2(tree / "bin/busybox", root / "bin/busybox")
     shutil.copy2(emulator.AGENT, root / "agent.sh")
     (root / "init").write_text(INIT)
@@ -68,10 +69,18 @@ def _libraries(tree):
 def _modules(tree):
     """The cards' drivers, what they need, and the list that says so."""
     (needs,) = tree.glob("lib/modules/*/modules.dep")
-    drivers = tuple(f"/{driver}.ko" for driver in CARDS.values())
+    drivers = tuple(f"/{driver}.ko{packed}" for driver in CARDS.values() for packed in ("", ".xz"))
     lines = [line.split() for line in needs.read_text().splitlines() if line.split(":")[0].endswith(drivers)]
     files = {needs.parent / word.rstrip(":") for line in lines for word in line}
     return [str(file.relative_to(tree)) for file in (needs, *sorted(files))]
+
+
+def _unpack_modules(root):
+    """As they are packed since Debian 13, neither the kernel nor busybox reads them."""
+    for module in root.glob("lib/modules/**/*.xz"):
+        trees.run("xz", "--decompress", module)
+    (needs,) = root.glob("lib/modules/*/modules.dep")
+    needs.write_text(needs.read_text().replace(".ko.xz", ".ko"))
 
 
 def _pack(root, archive):

@@ -2,14 +2,14 @@
 # SPDX-License-Identifier: MIT
 """Debian trees: made once for a list of packages, cached, and laid under a layer of its own for each run."""
 
-import hashlib
 import os
 import pathlib
-import re
+import platform
 import shutil
 import subprocess
 
-SUITE = "bookworm"
+RELEASE = os.environ["TAVISK_RELEASE"]
+OWN_RELEASE = platform.freedesktop_os_release()["VERSION_CODENAME"]
 COMMON = ["dbus", "libblkid1", "libedit2", "libpam-systemd", "login", "polkitd", "procps", "systemd",
           "systemd-sysv", "tzdata"]
 SERVER = ["busybox-static", "ethtool", "initramfs-tools", "kmod", "linux-image-amd64", "systemd-boot-efi", "systemd-timesyncd",
@@ -31,46 +31,34 @@ def prepare_work():
     run("mount", "-t", "tmpfs", "-o", "mode=700", "tmpfs", WORK)
 
 
-def _apt_sources():
-    """Where this machine has its own Debian packages from."""
-    named = re.compile(rf"(^|\s){SUITE}(\s|$)", re.MULTILINE)
-    files = [pathlib.Path("/etc/apt/sources.list"), *sorted(pathlib.Path("/etc/apt/sources.list.d").glob("*"))]
-    return [file for file in files if file.suffix in (".list", ".sources") and file.exists()
-            and named.search(file.read_text())]
+def _cached(release, packages):
+    """The clean tree with these packages; where it is made, that is told."""
+    made = subprocess.run(["script/tree", "--hook", HOOK, release, "amd64", *COMMON, *packages], check=True, text=True,
+                          stdin=subprocess.DEVNULL, stdout=subprocess.PIPE)
+    return pathlib.Path(made.stdout.strip())
 
 
-def _cached(packages):
-    """The clean tree with these packages."""
-    words = sorted(COMMON + packages)
-    key = hashlib.sha256(" ".join([SUITE, *words, HOOK.read_text()]).encode()).hexdigest()[:16]
-    tree = CACHE / f"tree-{key}"
-    if not tree.exists():
-        print(f"making a tree with {' '.join(packages)}", flush=True)
-        unfinished = CACHE / f"unfinished-{key}"
-        shutil.rmtree(unfinished, ignore_errors=True)
-        run("mmdebstrap", "--variant=minbase", "--mode=root", "--include=" + ",".join(words), "--format=directory",
-            f'--essential-hook={HOOK} essential "$1"', f'--customize-hook={HOOK} customize "$1"', SUITE, unfinished,
-            *_apt_sources())
-        unfinished.rename(tree)
-    return tree
-
-
-def layered(name, packages):
+def layered(name, packages, release=RELEASE):
     """A tree with these packages and the program installed, to be changed at will."""
-    clean = _cached(packages)
+    clean = _cached(release, packages)
     layer = WORK / name
     for part in ("upper", "work", "tree"):
         (layer / part).mkdir(parents=True)
     run("mount", "-t", "overlay", "-o", f"lowerdir={clean},upperdir={layer}/upper,workdir={layer}/work", "overlay",
         layer / "tree")
-    install_package(layer / "tree")
+    install_package(layer / "tree", release)
     return layer / "tree"
 
 
-def install_package(tree):
+def package(release=RELEASE):
+    """The file, which script/test-machine has made."""
+    (package,) = pathlib.Path("dist" if release == OWN_RELEASE else f"dist/{release}").glob("tavisk_*.deb")
+    return package
+
+
+def install_package(tree, release):
     """And beside it the test that comes with the package's sources."""
-    (package,) = pathlib.Path("dist").glob("tavisk_*.deb")
-    shutil.copy(package, tree / "root/tavisk.deb")
+    shutil.copy(package(release), tree / "root/tavisk.deb")
     shutil.copy("debian/tests/smoke", tree / "root/smoke-test")
     run("chroot", tree, "dpkg", "--install", "/root/tavisk.deb",
         env={**os.environ, "PATH": "/usr/sbin:/usr/bin:/sbin:/bin"})

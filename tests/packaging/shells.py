@@ -20,7 +20,7 @@ while IFS=$'\t' read -r line words; do
   IFS=$'\037' read -ra COMP_WORDS <<<"$words"
   [[ $line == *' ' ]] && COMP_WORDS+=('')
   COMP_LINE=$line COMP_POINT=${#line} COMP_CWORD=$((${#COMP_WORDS[@]} - 1))
-  _tavisk tavisk "${COMP_WORDS[-1]}" "${COMP_WORDS[-2]}"
+  "_$2" "$2" "${COMP_WORDS[-1]}" "${COMP_WORDS[-2]}"
   for offer in "${COMPREPLY[@]}"; do echo "$offer"; done
   echo next line
 done
@@ -81,19 +81,19 @@ def _run(command, typed, environment):
     return _offers(result.stdout)
 
 
-def bash(share, lines, environment):
+def bash(share, program, lines, environment):
     # bash divides a line into words at colons too.
     typed = "".join(line + "\t" + "\037".join(re.findall(r":+|[^\s:]+", line)) + "\n" for line in lines)
-    completion = share / "bash-completion/completions/tavisk"
-    return _run(["bash", "--norc", "-c", BASH, "bash", completion], typed, environment)
+    completion = share / "bash-completion/completions" / program
+    return _run(["bash", "--norc", "-c", BASH, "bash", completion, program], typed, environment)
 
 
-def fish(share, lines, environment):
-    completion = share / "fish/vendor_completions.d/tavisk.fish"
+def fish(share, program, lines, environment):
+    completion = share / f"fish/vendor_completions.d/{program}.fish"
     return _run(["fish", "--no-config", "-c", FISH, completion], "".join(line + "\0" for line in lines), environment)
 
 
-def zsh(share, lines, environment):
+def zsh(share, _, lines, environment):
     with tempfile.TemporaryDirectory() as folder:
         files = {name: pathlib.Path(folder, name) for name in ("setup", "lines", "offers")}
         files["setup"].write_text(ZSH)

@@ -39,11 +39,27 @@ CASES = [
     ("-setcomputername -getdate -gettimez", ["-gettimezone"]),
     ("-setstartupdisk /Volumes/S", [SYSTEM_OF_EXAMPLE] if os.geteuid() == 0 else []),
 ]
+# The same of taviskctl.
+CONTROL_CASES = [
+    ("s", ["status"]),
+    ("--v", ["--version"]),
+    ("status --", ["--all", "--help", "--json", "--version"]),
+    ("status --all tim", ["time", "time-zone"]),
+]
 
 
 def command_words(environment):
     printed = subprocess.run(["tavisk", "-printcommands"], env=environment, capture_output=True, text=True, check=True)
     return [line.split()[1].lower() for line in printed.stdout.splitlines()]
+
+
+def wrong_offers(name, cases, documents, environment):
+    lines = [f"{name} {typed}" for typed, _ in cases]
+    for shell, complete in shells.SHELLS.items():
+        offered = complete(pathlib.Path(documents, "share"), name, lines, environment)
+        for (typed, expected), offers in zip(cases, offered, strict=True):
+            if sorted(offers) != sorted(expected):
+                yield f"{shell}: {name} {typed}: expected {expected}, offered {offers}"
 
 
 def main(program, documents, sources):
@@ -55,11 +71,8 @@ def main(program, documents, sources):
         machine = shutil.copytree(pathlib.Path(sources, "packaging/machines/two-systems"), pathlib.Path(folder, "m"))
         environment = {**os.environ, "PATH": f"{pathlib.Path(program).parent}:{os.environ['PATH']}", "TERM": "dumb",
                        "TAVISK_HOST": f"scratch:{machine}"}
-        cases = [*CASES, ("-", command_words(environment) + NOT_IN_HELP)]
-        lines = ["tavisk " + typed for typed, _ in cases]
-        wrong = [f"{shell}: tavisk {typed}: expected {expected}, offered {offers}" for shell, complete in shells.SHELLS.items()
-                 for (typed, expected), offers in zip(cases, complete(pathlib.Path(documents, "share"), lines, environment), strict=True)
-                 if sorted(offers) != sorted(expected)]
+        wrong = [*wrong_offers("tavisk", [*CASES, ("-", command_words(environment) + NOT_IN_HELP)], documents, environment),
+                 *wrong_offers("taviskctl", CONTROL_CASES, documents, environment)]
     print("\n".join(wrong) or "every offer is as expected")
     return 1 if wrong else 0
 

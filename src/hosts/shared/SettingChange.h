@@ -68,8 +68,9 @@ struct Setting {
   std::string where;  ///< the places in which it is stored, so that it survives a restart
   /// Those of them that the last change has written; empty: all if storing succeeded, else none.
   std::function<std::string()> written;
-  Remark undoneBy;  ///< see Effect
-  Remark note;      ///< see Effect; of a change that has not failed
+  Remark undoneBy;               ///< see Effect
+  Remark note;                   ///< see Effect; of a change that has not failed
+  std::function<Facts()> facts;  ///< see SettingValue
   std::function<Support()> supported;
   Read live;
   Read stored;
@@ -94,8 +95,8 @@ Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>
                 RunLoop& runLoop);
 
 /// Reads the live value (the stored one where there is no live one) and tells it to the sink, beside the stored one
-/// where somebody wants to know, or that the machine cannot have it. A read that fails is recorded as a failed effect
-/// and yields no value.
+/// and the places where somebody wants to know, or that the machine cannot have it. A read that fails is recorded as a
+/// failed effect and yields no value.
 template <typename Value>
 std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects);
 
@@ -195,6 +196,16 @@ std::optional<std::string> textOfFound(const typename Setting<Value>::Found& fou
   return std::nullopt;
 }
 
+/// What has no stored value is not kept anywhere.
+template <typename Value>
+void addPlaces(SettingValue& value, const Setting<Value>& setting, const typename Setting<Value>::Found& found,
+               const typename Setting<Value>::Found& stored) {
+  if (value.stored) value.where = setting.where;
+  const auto& lasting = stored && *stored ? stored : found;
+  if (setting.facts) value.facts = setting.facts();
+  if (setting.undoneBy && lasting && *lasting) value.undoneBy = setting.undoneBy((*lasting)->value);
+}
+
 }  // namespace change
 
 template <typename Value>
@@ -212,6 +223,7 @@ std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects)
     // What keeps both from being looked at is told once.
     if (hasBoth && (found || stored)) value.stored = change::textOfFound<Value>(stored, setting, effects);
     if (!found && !value.stored) return std::nullopt;
+    if (effects.wantsPlaces()) change::addPlaces<Value>(value, setting, found, stored);
   }
   effects.observe(value);
   return found && *found ? std::optional((*found)->value) : std::nullopt;

@@ -42,7 +42,9 @@ class SystemRoot {
   /// Absent when there is no such file or it cannot be looked at. Links among the folders of the path are followed out
   /// of the prefix too: this only tells whether to read again, and is asked often.
   std::optional<FileStamp> stamp(const std::string& path) const;
-  /// A regular file of at most `limit` bytes. Nothing else is opened: no FIFO, no device, no socket.
+  /// A regular file, to be read. Nothing else is opened: no FIFO, no device, no socket.
+  Result<FileDescriptor> openRegular(const std::string& path) const;
+  /// Such a file of at most `limit` bytes.
   Result<std::string> read(const std::string& path, std::size_t limit) const;
   /// The first `length` bytes of such a file, however large it is, or all where it has no more.
   Result<std::string> readBeginning(const std::string& path, std::size_t length) const;
@@ -65,7 +67,6 @@ class SystemRoot {
   Result<void> makeFolders(const std::string& path) const;
 
  private:
-  Result<FileDescriptor> openRegular(const std::string& path) const;
   Result<FileDescriptor> openPrefix(const std::string& path) const;
   Result<FileDescriptor> makeFolder(const std::string& path) const;
   Result<void> makePrefix(const std::string& path) const;

@@ -7,7 +7,7 @@ from check import Check
 
 SUDO = frozenset({"container", "sudo"})
 RULES = ("install -m 0440 /usr/share/doc/tavisk/examples/sudoers /etc/sudoers.d/example; "
-         "echo '%admin ALL = (root) NOPASSWD: /usr/bin/tavisk' >/etc/sudoers.d/test; ")
+         "echo '%admin ALL = (root) NOPASSWD: TAVISK' >/etc/sudoers.d/test; ")
 
 
 def by_alice(script):

@@ -2,7 +2,7 @@
 # SPDX-License-Identifier: MIT
 import re
 
-from check import Check
+from check import Check, WITHOUT_BUS
 
 BUS = frozenset({"bus"})
 CONTAINER = frozenset({"container"})
@@ -20,7 +20,7 @@ CHECKS = [
     Check("/etc/localtime is never absent while zones change", needs=CONTAINER, do=WITHOUT_LINK,
           prints="".join(f"Set TimeZone: {zone}\n" for zone in 2 * ["Europe/Paris", "America/Lima"])),
     Check("a zone is set while the bus is away", needs=CONTAINER,
-          do="systemctl stop dbus.socket dbus; tavisk -settimezone Asia/Tokyo -gettimezone; systemctl start dbus.socket",
+          do=WITHOUT_BUS.format("tavisk -settimezone Asia/Tokyo -gettimezone"),
           prints="Set TimeZone: Asia/Tokyo\nTime Zone: Asia/Tokyo\n",
           then={"timedatectl show --property Timezone --value": "Asia/Tokyo\n"}),
     Check("a copied zone is known by its rules", needs=CONTAINER,
@@ -38,5 +38,6 @@ CHECKS = [
     Check("the zone is the machine's own, and is kept", needs=BUS, kept=True, do="tavisk -gettimezone",
           prints="Time Zone: Asia/Kolkata\n",
           then=ZONE_LINK | {"timedatectl show --property Timezone --value": "Asia/Kolkata\n",
-                            "cat /etc/timezone": "Asia/Kolkata\n", "tavisk -gettimezone": "Time Zone: Asia/Kolkata\n"}),
+                            "cat /etc/timezone 2>/dev/null || echo none": re.compile("(Asia/Kolkata|none)\n"),
+                            "tavisk -gettimezone": "Time Zone: Asia/Kolkata\n"}),
 ]

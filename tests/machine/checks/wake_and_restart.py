@@ -9,7 +9,9 @@ CONTAINER, GUEST, SERVER = frozenset({"container"}), frozenset({"guest"}), froze
 NOT_HERE = "Not supported on this machine.\n"
 # What wakes each card: "g" is a magic packet, "d" nothing.
 CARDS = "for card in /sys/class/net/eth*; do ethtool ${card##*/} | sed -n 's/^\\tWake-on: //p' | grep . || echo none; done"
-PORT = "cat /sys/class/tty/ttyS0/device/power/wakeup"
+# Since Linux 6.6 there are two more devices between the port and its place on the board.
+PORT = ("cd -P /sys/class/tty/ttyS0/device; until [ $(basename $(readlink subsystem)) = pnp ]; do cd ..; done; "
+        "cat power/wakeup")
 KEPT = "controller tells"
 PANIC = "/etc/sysctl.d/60-tavisk.conf"
 ADMIN, LATER = "/etc/sysctl.d/50-admin.conf", "/etc/sysctl.d/70-other.conf"

@@ -144,6 +144,7 @@ RemoteAccessState LinuxRemoteShellService::state() {
   auto setting = remoteLogin();
   setting.live = [&] { return ask<bool>(found, &DaemonGroup::isAnyRunning); };
   setting.stored = [&] { return ask<bool>(found, &DaemonGroup::isAnyStartingAtBoot); };
+  if (found && _machine.effects.wantsPlaces()) setting.where = found->names();
   return observedState(std::move(setting), _machine.effects);
 }
 
@@ -262,7 +263,10 @@ Setting<bool> LinuxRemoteEventsService::remoteEvents() {
 }
 
 RemoteAccessState LinuxRemoteEventsService::state() {
-  return observedState(remoteEvents(), _machine.effects);
+  auto setting = remoteEvents();
+  const auto named = _machine.effects.wantsPlaces() ? units() : Failure{};
+  if (named) setting.where = named->names();
+  return observedState(std::move(setting), _machine.effects);
 }
 
 void LinuxRemoteEventsService::setEnabled(bool enabled) {

@@ -64,6 +64,8 @@ std::int64_t LinuxClockService::now() {
   auto time = timeSetting();
   time.live = [now] { return std::optional(Reading(now)); };
   time.stored = [this] { return hardwareTime(_machine.root); };
+  time.where = hardwareClock;
+  time.undoneBy = [this](const auto&) { return whoCorrectsTheClock(); };
   static_cast<void>(observe(time, _machine.effects));
   return now;
 }

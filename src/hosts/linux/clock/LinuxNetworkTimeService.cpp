@@ -6,6 +6,7 @@
 
 #include "base/DnsName.h"
 #include "effects/SettingNames.h"
+#include "hosts/linux/clock/SystemClock.h"
 #include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/Program.h"
@@ -26,6 +27,20 @@ Failure noClient() {
   std::vector<std::string> names;
   for (const auto& daemon : timeDaemons()) names.emplace_back(daemon.daemon.unit);
   return {"find a network-time client", commaList(names), "none of them is installed"};
+}
+
+/// Empty where there is no client.
+std::string unitOf(const Result<const TimeDaemon*>& client) {
+  return client && *client ? (*client)->daemon.unit : "";
+}
+
+/// The kernel's own account, which every client keeps.
+Facts clockFacts() {
+  const auto discipline = clockDiscipline();
+  if (!discipline) return {{"synchronized", "not known: " + describe(discipline.failure())}};
+  if (!*discipline) return {{"synchronized", "no"}};
+  const auto milliseconds = std::chrono::ceil<std::chrono::milliseconds>((*discipline)->largestError);
+  return {{"synchronized", "yes"}, {"milliseconds off at most", std::to_string(milliseconds.count())}};
 }
 
 }  // namespace
@@ -94,6 +109,8 @@ bool LinuxNetworkTimeService::isRunning() {
   auto setting = runningSetting();
   setting.live = [&] { return runs(found); };
   setting.stored = [&] { return startsAtBoot(found); };
+  if (_machine.effects.wantsPlaces()) setting.where = unitOf(found);
+  if (_machine.root.prefix() == "/") setting.facts = clockFacts;
   return observe(setting, _machine.effects).value_or(false);
 }
 
@@ -118,7 +135,7 @@ Result<bool> LinuxNetworkTimeService::startsAtBoot(const Result<const TimeDaemon
 
 void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
   auto setting = named<bool>(setting::networkTimeAtStartup);
-  if (const auto found = client(); found && *found) setting.where = (*found)->daemon.unit;
+  setting.where = unitOf(client());
   setting.stored = [this] { return startsAtBoot(client()); };
   WrittenPlaces written;
   setting.written = [&] { return written.text(); };

@@ -7,6 +7,7 @@
 #include <linux/rtc.h>
 #include <sys/ioctl.h>
 #include <sys/syscall.h>
+#include <sys/timex.h>
 #include <unistd.h>
 
 #include <array>
@@ -90,6 +91,13 @@ Result<void> setSystemTime(std::chrono::microseconds since1970) {
   time.tv_nsec = std::chrono::nanoseconds(since1970 - whole).count();
   if (::clock_settime(CLOCK_REALTIME, &time) != 0) return systemFailure("clock_settime", clockName, errno);
   return {};
+}
+
+Result<std::optional<ClockDiscipline>> clockDiscipline() {
+  timex kernels{};
+  if (::adjtimex(&kernels) < 0) return systemFailure("adjtimex", clockName, errno);
+  if ((static_cast<unsigned>(kernels.status) & static_cast<unsigned>(STA_UNSYNC)) != 0) return std::nullopt;
+  return std::optional(ClockDiscipline{std::chrono::microseconds(kernels.maxerror)});
 }
 
 Result<std::optional<std::int64_t>> hardwareTime(const SystemRoot& root) {

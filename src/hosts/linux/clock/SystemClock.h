@@ -26,6 +26,14 @@ bool maySetSystemTime();
 /// Sets the kernel's clock, of the whole machine.
 Result<void> setSystemTime(std::chrono::microseconds since1970);
 
+/// What the kernel knows of a clock that is kept right (adjtimex(2)).
+struct ClockDiscipline {
+  std::chrono::microseconds largestError;  ///< by which it may be off
+};
+
+/// Absent while nothing keeps the clock right.
+Result<std::optional<ClockDiscipline>> clockDiscipline();
+
 /// Where the machine keeps the time while it is off.
 inline constexpr const char* hardwareClock = "/dev/rtc0";
 

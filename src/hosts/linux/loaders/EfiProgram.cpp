@@ -2,11 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/loaders/EfiProgram.h"
 
-#include <fcntl.h>
-#include <sys/stat.h>
-
 #include <algorithm>
-#include <cerrno>
 #include <map>
 #include <string_view>
 #include <system_error>
@@ -180,13 +176,7 @@ bool isNoProgram(const Failure& failure) {
 }
 
 Result<EfiProgram> readEfiProgram(const SystemRoot& files, const std::string& path) {
-  // Only looked at so far: to open a device may already do something.
-  const auto seen = files.open(path, O_PATH);
-  if (!seen) return seen.failure();
-  struct stat status {};
-  if (::fstat(seen->number(), &status) != 0) return systemFailure("look at", path, errno);
-  if (!S_ISREG(status.st_mode)) return Failure{tried, path, "it is no regular file"};
-  auto file = files.open(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
+  auto file = files.openRegular(path);
   if (!file) return file.failure();
   return Reader(std::move(file).value(), path).program();
 }

@@ -78,6 +78,24 @@ bool isMeaningful(char byte) {
   return isDigit(byte) || isLetter(byte) || std::string_view("~-^.").find(byte) != std::string_view::npos;
 }
 
+void skipMeaningless(std::string_view& text) {
+  text.remove_prefix(static_cast<std::size_t>(std::ranges::find_if(text, isMeaningful) - text.begin()));
+}
+
+/// Of two texts that begin with things of the same rank; takes what it compares: a separator, a number or a word.
+int compareFirstParts(std::string_view& left, std::string_view& right) {
+  if (!isDigit(left.front()) && !isLetter(left.front())) {
+    left.remove_prefix(1);
+    right.remove_prefix(1);
+    return 0;
+  }
+  const bool areNumbers = isDigit(left.front()) || isDigit(right.front());
+  const auto one = takeWhile(left, areNumbers ? isDigit : isLetter);
+  const auto other = takeWhile(right, areNumbers ? isDigit : isLetter);
+  if (one.empty() != other.empty()) return one.empty() ? -1 : 1;
+  return areNumbers ? compareNumbers(one, other) : one.compare(other);
+}
+
 /// Which of two comes first in a menu.
 bool isShownBefore(const LoaderEntry& left, const LoaderEntry& right) {
   if (left.hasFailed != right.hasFailed) return right.hasFailed;
@@ -94,21 +112,11 @@ bool isShownBefore(const LoaderEntry& left, const LoaderEntry& right) {
 
 int compareVersions(std::string_view left, std::string_view right) {
   while (true) {
-    left.remove_prefix(static_cast<std::size_t>(std::ranges::find_if(left, isMeaningful) - left.begin()));
-    right.remove_prefix(static_cast<std::size_t>(std::ranges::find_if(right, isMeaningful) - right.begin()));
+    skipMeaningless(left);
+    skipMeaningless(right);
     if (left.empty() && right.empty()) return 0;
     if (rankOf(left) != rankOf(right)) return rankOf(left) < rankOf(right) ? -1 : 1;
-    if (!isDigit(left.front()) && !isLetter(left.front())) {
-      left.remove_prefix(1);
-      right.remove_prefix(1);
-      continue;
-    }
-    const bool areNumbers = isDigit(left.front()) || isDigit(right.front());
-    const auto one = takeWhile(left, areNumbers ? isDigit : isLetter);
-    const auto other = takeWhile(right, areNumbers ? isDigit : isLetter);
-    if (one.empty() != other.empty()) return one.empty() ? -1 : 1;
-    const auto order = areNumbers ? compareNumbers(one, other) : one.compare(other);
-    if (order != 0) return order;
+    if (const auto order = compareFirstParts(left, right); order != 0) return order;
   }
 }
 

@@ -12,6 +12,7 @@
 #include "hosts/linux/firmware/EfiDevicePath.h"
 #include "hosts/linux/loaders/LoaderEntries.h"
 #include "hosts/linux/loaders/SystemStarts.h"
+#include "hosts/linux/system/ShellAssignments.h"
 
 namespace tavisk {
 namespace {
@@ -38,26 +39,13 @@ std::string pathOf(const std::string& program) {
   return path.starts_with('/') && std::ranges::find(parts, "..") == parts.end() ? path : "";
 }
 
-/// A value of os-release, without its quotes; of several names the first that is there.
-std::string valueIn(const std::string& osRelease, const std::vector<std::string>& names) {
-  const auto lines = split(osRelease, "\n");
-  for (const auto& name : names) {
-    const auto found = std::ranges::find_if(lines, [&](const auto& line) { return line.starts_with(name + "="); });
-    if (found == lines.end()) continue;
-    auto value = found->substr(name.size() + 1);
-    std::erase_if(value, [](char byte) { return byte == '"' || byte == '\''; });
-    return value;
-  }
-  return {};
-}
-
 /// An entry of type 2: named and sorted by what its image tells of the system.
 LoaderEntry entryOf(const std::string& name, const EfiProgram& image) {
   LoaderEntry entry;
   entry.id = name;
-  entry.title = valueIn(image.osRelease, {"PRETTY_NAME", "IMAGE_ID", "NAME", "ID"});
-  entry.sortKey = valueIn(image.osRelease, {"IMAGE_ID", "ID"});
-  entry.version = valueIn(image.osRelease, {"IMAGE_VERSION", "VERSION", "VERSION_ID", "BUILD_ID"});
+  entry.title = firstAssignedValue(image.osRelease, {"PRETTY_NAME", "IMAGE_ID", "NAME", "ID"});
+  entry.sortKey = firstAssignedValue(image.osRelease, {"IMAGE_ID", "ID"});
+  entry.version = firstAssignedValue(image.osRelease, {"IMAGE_VERSION", "VERSION", "VERSION_ID", "BUILD_ID"});
   entry.program = std::string(imagesFolder) + "/" + name;
   // As of an entry of type 1: used-up tries stand in the name.
   entry.hasFailed = parseLoaderEntry(name, "efi " + entry.program, Quotes::removed)->hasFailed;

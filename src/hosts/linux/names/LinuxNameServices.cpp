@@ -74,27 +74,24 @@ class LinuxSession final : public DynamicStore::Session {
   explicit LinuxSession(const LinuxMachine& machine) : _machine(machine) {}
 
   Value computerName() override {
-    return look(
-        setting::computerName, [this] { return computerNameOf(_machine.root); },
-        [this] { return storedComputerNameOf(_machine.root); });
+    Setting<std::string> setting;
+    setting.name = setting::computerName;
+    setting.where = prettyNameFile;
+    setting.live = [this] { return computerNameOf(_machine.root); };
+    setting.stored = [this] { return storedComputerNameOf(_machine.root); };
+    return observe(setting, _machine.effects);
   }
   Value localHostName() override {
-    return look(
-        setting::localSubnetName, [this] { return localNameOf(_machine); },
-        [this] { return staticHostName(_machine.root); });
-  }
-
- private:
-  using Read = Setting<std::string>::Read;
-
-  Value look(const char* name, const Read& live, const Read& stored) {
     Setting<std::string> setting;
-    setting.name = name;
-    setting.live = live;
-    setting.stored = stored;
+    setting.name = setting::localSubnetName;
+    setting.where = staticNameFile;
+    setting.undoneBy = [this](const auto& stored) { return whoUndoesHostName(_machine.root, stored); };
+    setting.live = [this] { return localNameOf(_machine); };
+    setting.stored = [this] { return staticHostName(_machine.root); };
     return observe(setting, _machine.effects);
   }
 
+ private:
   LinuxMachine _machine;
 };
 

@@ -148,8 +148,10 @@ Support ComputerSleep::sleepSupported() {
   if (!bus && isAbsent(bus.failure())) return NotSupported{bus.failure()};
   if (!bus) return bus.failure();
   auto answer = ask([](Bus& asked) { return asked.call(loginManager(), tried, "s"); });
-  if (!answer) return supportWithoutAnswer(answer.failure());
-  if (std::move(answer).value().readText() == "na")
+  // Since version 257 that is what the service says where the kernel has no files for it, as in containers.
+  const bool hasNoFiles = !answer && answer.failure().code == BusErrorCode::fileNotFound;
+  if (!answer && !hasNoFiles) return supportWithoutAnswer(answer.failure());
+  if (hasNoFiles || std::move(answer).value().readText() == "na")
     return NotSupported{{tried, loginManager().service, "this machine cannot sleep"}};
   // The service would take the setting and refuse to act by it.
   const auto presence = _machine.services.daemons().presence(sleepTarget);

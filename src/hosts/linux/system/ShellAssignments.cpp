@@ -70,6 +70,12 @@ Result<std::optional<std::string>> assignedValue(const SystemRoot& root, const s
   return assignedValue(*text, variable);
 }
 
+std::string firstAssignedValue(std::string_view text, std::initializer_list<std::string_view> variables) {
+  for (const auto variable : variables)
+    if (auto value = assignedValue(text, variable); value && !value->empty()) return *std::move(value);
+  return {};
+}
+
 std::string withAssignment(std::string_view text, std::string_view variable, std::string_view value) {
   std::string changed;
   bool isPending = !value.empty();

@@ -12,6 +12,7 @@
 #include "hosts/linux/firmware/PreBootEnvironment.h"
 #include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/volumes/MachineVolumes.h"
+#include "hosts/linux/volumes/MountedVolume.h"
 #include "hosts/linux/volumes/VolumeOpener.h"
 #include "platform/DiskManagementService.h"
 
@@ -193,8 +194,10 @@ NamedPoints LinuxSystems::pointsOf(const MountTable& mounts) const {
 }
 
 bool LinuxSystems::hasSystemOfItsOwn(const DiskName& volume, const MountTable& mounts) {
-  const auto device = _disks.devices().find(volume);
-  const auto* mount = device && *device ? mounts.mountOf((*device)->number) : nullptr;
+  const auto* known = _surroundings.volumes->named(volume);
+  if (!known) return false;
+  const auto* const mount =
+      _disks.looks().orTold(mountOf(mounts, _disks.devices(), known->device, known->facts.type.value_or("")));
   return mount && _disks.looks().orTold(hasOwnSystem(_machine.root, mount->point, bootFile()));
 }
 

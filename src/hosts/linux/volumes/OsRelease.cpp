@@ -4,21 +4,12 @@
 
 #include <fcntl.h>
 
-#include <initializer_list>
-
 #include "hosts/linux/system/ShellAssignments.h"
 
 namespace tavisk {
 namespace {
 
 constexpr std::size_t fileLimit = 65536;
-
-/// The value of the first variable that has one, else what stands for it.
-std::string firstOf(const std::string& text, std::initializer_list<const char*> variables, std::string otherwise) {
-  for (const auto* variable : variables)
-    if (auto value = assignedValue(text, variable); value && !value->empty()) return *std::move(value);
-  return otherwise;
-}
 
 Result<std::string> textIn(const SystemRoot& system) {
   auto text = system.read("/etc/os-release", fileLimit);
@@ -35,8 +26,9 @@ Result<OsRelease> osReleaseOf(const Volumes& volumes, const Volume& root, const 
   const auto top = files->open("/" + subvolume, O_PATH | O_DIRECTORY);
   const auto text = top ? textIn(SystemRoot("/proc/self/fd/" + std::to_string(top->number()))) : top.failure();
   if (!text) return retold(text.failure(), text.failure().tried, text.failure().on + " on " + root.device.name.text);
-  return OsRelease{firstOf(*text, {"NAME"}, "Linux"), firstOf(*text, {"VERSION_ID", "VERSION"}, ""),
-                   firstOf(*text, {"BUILD_ID", "VERSION_CODENAME"}, ""), firstOf(*text, {"ID"}, "linux")};
+  const auto name = firstAssignedValue(*text, {"NAME"});
+  return OsRelease{name.empty() ? "Linux" : name, firstAssignedValue(*text, {"VERSION_ID", "VERSION"}),
+                   firstAssignedValue(*text, {"BUILD_ID", "VERSION_CODENAME"})};
 }
 
 }  // namespace tavisk

@@ -14,7 +14,6 @@ struct OsRelease {
   std::string name;     ///< "Debian GNU/Linux"; "Linux" when it says none
   std::string version;  ///< "12"
   std::string build;    ///< "20261101.1", else the release's code name
-  std::string id;       ///< "debian"; "linux" when it says none
 };
 
 /// Of the system whose "/" a volume is, or its subvolume. isAbsent() when it has none, which is no system.

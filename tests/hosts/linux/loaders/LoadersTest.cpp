@@ -309,7 +309,7 @@ TEST(LoadersTest, IsNotMisledByWhatAVolumeHolds) {
   expectAll({
       {"no program", debian, signedUp("#!/bin/sh\n"), "no program for UEFI"},
       {"nothing", debian, signedUp(""), "no program for UEFI"},
-      {"a folder", "sda1:\\EFI\\debian", grubWith(""), "no regular file"},
+      {"a folder", "sda1:\\EFI\\debian", grubWith(""), "not a regular file"},
       {"not there", "sda1:\\EFI\\gone.efi", {}, "No such file"},
       {"out of the partition", "sda1:\\EFI\\..\\..\\x.efi", {}, "no path of a file"},
       {"modules that end early", debian, signedUp(cut), "its modules cannot be read"},

@@ -8,6 +8,7 @@
 
 #include <atomic>
 #include <cerrno>
+#include <cstring>
 #include <mutex>
 
 #include "TemporaryFolder.h"
@@ -38,7 +39,7 @@ class FakePowerServices {
     readManager();
   }
 
-  std::atomic<const char*> canSuspend = "yes";    ///< null: an error
+  std::atomic<const char*> canSuspend = "yes";    ///< null, or with a dot: an error
   std::atomic<const char*> unitState = "loaded";  ///< of whatever unit is asked for
   /// So many calls are answered as when the service ends before it answers.
   std::atomic<int> answersMissing = 0;
@@ -54,6 +55,8 @@ class FakePowerServices {
     if (member == "Set") return answerSet(call);
     if (member == "CanSuspend" && !canSuspend.load())
       return sd_bus_reply_method_errorf(call, "org.freedesktop.DBus.Error.AccessDenied", "it is out of order");
+    if (member == "CanSuspend" && std::strchr(canSuspend, '.'))
+      return sd_bus_reply_method_errorf(call, canSuspend, "No such file or directory");
     if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", canSuspend.load());
     if (member == "ListUnitsByNames")
       return sd_bus_reply_method_return(call, "a(ssssssouso)", 1, "", "", unitState.load(), "inactive", "", "", "/", 0U,

@@ -119,10 +119,16 @@ class PowerTree : public LinuxTree {
     return file("/sys/devices/pci0000:00/0000:00:1f.2/" + disk + "-port/0:0:0:0/" + name);
   }
   /// The port's terminal has a file power/wakeup, as on every machine.
-  void addPort(const std::string& terminal, const std::string& place) {
-    const auto device = "/sys/devices/pnp0/" + place;
-    write(device + "/power/wakeup", "disabled\n");
-    link(device + "/subsystem", "../../../bus/pnp");
+  /// Since Linux 6.6 two devices are between the place and the terminal.
+  void addPort(const std::string& terminal, const std::string& place, const std::string& between = "") {
+    const auto board = "/sys/devices/pnp0/" + place;
+    write(board + "/power/wakeup", "disabled\n");
+    link(board + "/subsystem", "../../../bus/pnp");
+    const auto device = board + between;
+    if (!between.empty()) {
+      write(device + "/power/wakeup", "disabled\n");
+      link(device + "/subsystem", "../../../../../bus/serial-base");
+    }
     write(device + "/tty/" + terminal + "/power/wakeup", "disabled\n");
     link(device + "/tty/" + terminal + "/device", "../..");
     link("/sys/class/tty/" + terminal, "../.." + device.substr(4) + "/tty/" + terminal);

@@ -51,6 +51,17 @@ class InstalledTree : public BootTree {
     return host().diskManagement().setBootPreference({{volume}, system, false});
   }
 
+  /// A file system whose mounts have a number of their own instead of their device's.
+  void makeBtrfs(const std::string& number) {
+    auto& facts = _facts[number];
+    facts.replace(facts.find("=ext4"), 5, "=btrfs");
+    setLabel(number, "Second");
+    auto mounts = file("/proc/thread-self/mountinfo");
+    mounts.replace(mounts.find(" " + number + " "), number.size() + 2, " 0:40 ");
+    mounts.replace(mounts.find("- ext4", mounts.find(" 0:40 ")), 6, "- btrfs");
+    setMounts(mounts);
+  }
+
  private:
   std::string factsOf(const std::string& number, const std::string& label) {
     return _facts[number] + "E:ID_FS_LABEL_ENC=" + label + "\n";

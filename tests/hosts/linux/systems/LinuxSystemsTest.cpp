@@ -72,6 +72,11 @@ TEST(LinuxSystems, AreNamedByTheirLabelsAndToldApart) {
       {"Second", "/Volumes/Second-sdb2", [](auto& tree) { tree.mount("8:99", "/dev/sdz", "/Volumes/Second", "ext4"); }},
       {"Second", "/mnt/second",
        [](auto& tree) { tree.write("/mnt/second/System/Library/CoreServices/boot.efi", "its own"); }},
+      {"Second", "/mnt/second",
+       [](auto& tree) {
+         tree.write("/mnt/second/System/Library/CoreServices/boot.efi", "its own, on a file system of many devices");
+         tree.makeBtrfs("8:18");
+       }},
       {"Second", "/mnt/second", [](auto& tree) { tree.write("/mnt/second/boot/grub/grub.cfg", "if $x; then y"); }},
       {"Second", "/mnt/second", [](auto& tree) { std::filesystem::remove(tree.at("/mnt/second/etc/os-release")); }},
       {"Second", "/mnt/second", [](auto& tree) { std::filesystem::remove(tree.at("/mnt/second/boot/vmlinuz")); }},

@@ -1,0 +1,112 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "control/CommandLine.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <iterator>
+
+namespace tavisk::control {
+namespace {
+
+constexpr OptionRow common[] = {
+    {"--help", "Print this help."},
+    {"--version", "Print the version."},
+};
+
+constexpr OptionRow statusOptions[] = {
+    {"--all", "Show the startup disk too, for which every disk is looked at."},
+    {"--json", "Print one JSON object instead of a table."},
+};
+
+constexpr CommandRow commands[] = {
+    {"status", "[SETTING...]", OperandKind::settings,
+     "Show settings: what is in force, what will be after a restart, where it is kept and what may undo it.",
+     statusOptions},
+};
+
+const OptionRow* findOption(std::span<const OptionRow> options, std::string_view name) {
+  const auto found = std::ranges::find(options, name, &OptionRow::name);
+  return found == options.end() ? nullptr : &*found;
+}
+
+const OptionRow* findOption(const CommandRow* command, std::string_view name) {
+  const auto* own = command ? findOption(command->options, name) : nullptr;
+  return own ? own : findOption(common, name);
+}
+
+Failure misused(const std::string& what, const CommandRow* command) {
+  const std::string name = command ? std::string(command->name) + " " : "";
+  return {what, "", "type 'taviskctl " + name + "--help'"};
+}
+
+std::string optionLines(std::span<const OptionRow> options) {
+  constexpr std::size_t column = 14;
+  std::string lines;
+  for (const auto& option : options) {
+    const std::size_t gap = column - std::min(column - 2, option.name.size());
+    lines.append("  ").append(option.name).append(gap, ' ').append(option.summary).append("\n");
+  }
+  return lines;
+}
+
+std::string commandLines() {
+  std::string lines;
+  for (const auto& command : commands)
+    lines.append("  ")
+        .append(command.name)
+        .append(" ")
+        .append(command.operands)
+        .append("\n      ")
+        .append(command.summary)
+        .append("\n");
+  return lines;
+}
+
+}  // namespace
+
+std::span<const CommandRow> commandRows() {
+  return commands;
+}
+
+std::span<const OptionRow> commonOptions() {
+  return common;
+}
+
+bool Invocation::has(std::string_view option) const {
+  return std::ranges::find(options, option) != options.end();
+}
+
+Result<Invocation> readCommandLine(std::span<const std::string> words) {
+  Invocation invocation;
+  bool areOptionsOver = false;
+  for (const auto& word : words) {
+    if (!areOptionsOver && word == "--") {
+      areOptionsOver = true;
+    } else if (!areOptionsOver && word.starts_with('-')) {
+      const auto* option = findOption(invocation.command, word);
+      if (!option) return misused("there is no option " + word, invocation.command);
+      invocation.options.push_back(option->name);
+    } else if (!invocation.command) {
+      const auto* const found = std::ranges::find(commands, word, &CommandRow::name);
+      if (found == std::end(commands)) return misused("there is no command " + word, nullptr);
+      invocation.command = found;
+    } else {
+      invocation.operands.push_back(word);
+    }
+  }
+  if (!invocation.command && invocation.options.empty()) return misused("a command is missing", nullptr);
+  return invocation;
+}
+
+std::string helpText(const CommandRow* command) {
+  std::string text = "usage: taviskctl ";
+  if (!command)
+    return text + "COMMAND [OPTION...]\n\n" + commandLines() + "\n" + optionLines(common) +
+           "\nThe manual is taviskctl(8).\n";
+  text.append(command->name).append(" [OPTION...] ").append(command->operands).append("\n\n");
+  text.append(command->summary).append("\n\n").append(optionLines(command->options)).append(optionLines(common));
+  return text;
+}
+
+}  // namespace tavisk::control

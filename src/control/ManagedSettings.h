@@ -1,0 +1,26 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <span>
+#include <string_view>
+
+namespace tavisk::control {
+
+/// A setting as the words of tavisk reach it.
+struct ManagedSetting {
+  std::string_view name;    ///< as effects and reports call it
+  std::string_view getter;  ///< a word of the command table, "-gettimezone"
+  std::string_view setter;
+  /// Its getter looks at every disk, which takes seconds: only when it is asked for.
+  bool isSearched = false;
+};
+
+/// Every setting, in the order in which they are shown.
+std::span<const ManagedSetting> managedSettings();
+
+/// The setting that a user means: by its name, or by what follows "get" in its word; without regard to case, spaces,
+/// hyphens and underscores. Null when there is none.
+const ManagedSetting* settingMeantBy(std::string_view text);
+
+}  // namespace tavisk::control

@@ -1,0 +1,107 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "control/StatusReader.h"
+
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstdio>
+#include <memory>
+#include <stdexcept>
+#include <utility>
+#include <variant>
+
+#include "base/NotificationCenter.h"
+#include "base/Text.h"
+#include "frontend/HandlerRegistry.h"
+#include "frontend/ServerCommands.h"
+
+namespace tavisk::control {
+namespace {
+
+/// Getters ask nobody.
+class NoInput final : public LineSource {
+ public:
+  std::optional<std::string> readLine(const std::string& /*prompt*/, std::size_t /*room*/) override {
+    return std::nullopt;
+  }
+  void restoreTerminal() override {}
+};
+
+struct CloseStream {
+  void operator()(std::FILE* stream) const { static_cast<void>(std::fclose(stream)); }
+};
+using Stream = std::unique_ptr<std::FILE, CloseStream>;
+
+Stream nowhere() {
+  Stream stream(std::fopen("/dev/null", "we"));
+  if (!stream) throw std::runtime_error("/dev/null cannot be opened");
+  return stream;
+}
+
+void get(ServerCommands& commands, const CommandTable& table, std::string_view getter) {
+  const auto* entry = table.find(std::string(getter));
+  if (!entry) throw std::logic_error("no command is called " + std::string(getter));
+  (commands.*std::get<void (ServerCommands::*)()>(handlerNamed(entry->selector)))();
+}
+
+/// A file in which a set would store the value, and that is not there, keeps nothing: the value is the machine's own.
+std::string existing(const std::string& places) {
+  std::string kept;
+  for (const auto& place : split(places, ",")) {
+    const std::string name(trimmed(place));
+    const bool isMissing = name.starts_with('/') && ::access(name.c_str(), F_OK) != 0 && errno == ENOENT;
+    if (!isMissing) kept.append(kept.empty() ? "" : ", ").append(name);
+  }
+  return kept;
+}
+
+bool isManaged(const std::string& name) {
+  return std::ranges::find(managedSettings(), name, &ManagedSetting::name) != managedSettings().end();
+}
+
+}  // namespace
+
+std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSetting*>& settings, Host& host,
+                                             RunLoop& runLoop) {
+  auto table = CommandTable::parse(CommandTable::text());
+  if (!table) throw std::logic_error(describe(table.failure()));
+  const auto words = std::make_shared<const CommandTable>(std::move(table).value());
+  const auto stream = nowhere();
+  Output output(stream.get());
+  NoInput input;
+  NotificationCenter notifications;
+  const CommandContext context{host, runLoop, notifications, output, input};
+  ServerCommands commands(words, context);
+  for (const auto* setting : settings) {
+    _current = setting;
+    stateOf(std::string(setting->name));
+    const auto limit = runLoop.limitWaits(context.longestCommand);
+    get(commands, *words, setting->getter);
+  }
+  _current = nullptr;
+  return std::exchange(_states, {});
+}
+
+SettingState& StatusReader::stateOf(const std::string& setting) {
+  const auto known = std::ranges::find(_states, setting, [](const auto& state) { return state.value.setting; });
+  if (known != _states.end()) return *known;
+  return _states.emplace_back(SettingState{.value = {.setting = setting}, .failures = {}});
+}
+
+/// A getter looks at other settings too, which have their own.
+void StatusReader::observe(const SettingValue& value) {
+  if (!_current || (value.setting != _current->name && isManaged(value.setting))) return;
+  auto told = value;
+  told.where = existing(value.where);
+  stateOf(value.setting).value = std::move(told);
+}
+
+void StatusReader::record(const Effect& effect) {
+  if (!_current || !effect.failure || (effect.setting != _current->name && isManaged(effect.setting))) return;
+  auto& failures = stateOf(effect.setting).failures;
+  if (std::ranges::find(failures, *effect.failure) == failures.end()) failures.push_back(*effect.failure);
+}
+
+}  // namespace tavisk::control

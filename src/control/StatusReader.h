@@ -1,0 +1,41 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "base/Result.h"
+#include "base/RunLoop.h"
+#include "control/ManagedSettings.h"
+#include "effects/EffectSink.h"
+#include "platform/Host.h"
+
+namespace tavisk::control {
+
+/// What a getter found out of one setting.
+struct SettingState {
+  SettingValue value;
+  std::vector<Failure> failures;  ///< of its reads
+};
+
+/// Reads settings by their getters, and keeps what those tell instead of what they print.
+class StatusReader final : public EffectChannel {
+ public:
+  /// For each of the settings its own state, then those that its getter told besides and that no setting is named for.
+  /// The host tells its effects to a sink of which this is a channel.
+  std::vector<SettingState> read(const std::vector<const ManagedSetting*>& settings, Host& host, RunLoop& runLoop);
+
+  void record(const Effect& effect) override;
+  void observe(const SettingValue& value) override;
+  bool wantsValues() const override { return true; }
+  bool wantsPlaces() const override { return true; }
+
+ private:
+  SettingState& stateOf(const std::string& setting);
+
+  const ManagedSetting* _current = nullptr;  ///< whose getter is called
+  std::vector<SettingState> _states;
+};
+
+}  // namespace tavisk::control

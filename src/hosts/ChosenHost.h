@@ -1,0 +1,22 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+#include <memory>
+#include <string_view>
+
+#include "base/Result.h"
+#include "base/RunLoop.h"
+#include "effects/EffectSink.h"
+#include "platform/Host.h"
+
+namespace tavisk {
+
+/// What a user is told of the host that was chosen, a line at a time; empty: nobody watches.
+using HostRemark = std::function<void(std::string_view line)>;
+
+/// The host that TAVISK_HOST names: unset is the machine that the program runs on, "scratch:DIR" one of files.
+Result<std::unique_ptr<Host>> openChosenHost(EffectSink& effects, RunLoop& runLoop, const HostRemark& remark);
+
+}  // namespace tavisk

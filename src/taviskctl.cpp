@@ -1,0 +1,61 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <exception>
+#include <string>
+#include <string_view>
+#include <system_error>
+#include <vector>
+
+#include "base/Process.h"
+#include "control/Run.h"
+#include "hosts/ChosenHost.h"
+
+namespace tavisk {
+namespace {
+
+using control::Status;
+
+void complainOfControl(std::string_view text) {
+  static_cast<void>(std::fprintf(stderr, "taviskctl: %.*s\n", static_cast<int>(text.size()), text.data()));
+}
+
+/// Who closes the pipe early has seen enough, and is not told.
+Status afterOutput(Output& output, Status status) {
+  const auto lostBy = output.finish();
+  if (!lostBy) return status;
+  if (*lostBy != EPIPE) complainOfControl("standard output: " + std::generic_category().message(*lostBy));
+  return Status::incomplete;
+}
+
+Status runOn(Output& output, const std::vector<std::string>& words) {
+  const HostRemark remark = isatty(STDERR_FILENO) != 0 ? complainOfControl : HostRemark();
+  const auto openHost = [&](EffectSink& effects, RunLoop& runLoop) { return openChosenHost(effects, runLoop, remark); };
+  try {
+    return control::run(words, {openHost, output, complainOfControl});
+  } catch (const Output::Lost&) {
+    return Status::incomplete;  // afterOutput() says why
+  }
+}
+
+Status start(int argc, char** argv) {
+  Output output(stdout);
+  return afterOutput(output, runOn(output, {argv + (argc > 0 ? 1 : 0), argv + argc}));
+}
+
+}  // namespace
+}  // namespace tavisk
+
+int main(int argc, char** argv) {
+  using tavisk::Status;
+  if (!tavisk::prepareProcess()) return static_cast<int>(Status::incomplete);
+  try {
+    return static_cast<int>(tavisk::start(argc, argv));
+  } catch (const std::exception& error) {
+    tavisk::complainOfControl(tavisk::reasonOf(error));
+    return static_cast<int>(Status::incomplete);
+  }
+}
