@@ -68,7 +68,7 @@ def kill_each(machine, command, state, restore, others, least=5):
         killed = _run_in_time(machine, f"{STRACE} -o /dev/null {kill} {command}", old, state)
         point = f"{name} {count}"
         if killed.status != 137:
-            problems.append(f"{point}: not killed but {killed.status}")
+            problems.append(f"{point}: not killed but {killed.status}: {machine.run('cat /run/look').output}")
         if (left := state()) not in (old, new):
             problems.append(f"{point}: left {left}, neither {old} nor {new}")
         if machine.run(look).output != before:
