@@ -15,8 +15,9 @@ LONGEST_SHOWN = 500
 REPORTS = "/run/tavisk-reports"
 # Before each check's command; users who are not root are handed the descriptor.
 REPORTING = f"exec 9>>{REPORTS}; export TAVISK_REPORT=fd:9; "
+STOP_BUS = "systemctl stop dbus.socket dbus"
 # These daemons do not find back by themselves to a bus that was started anew.
-WITHOUT_BUS = ("systemctl stop dbus.socket dbus systemd-hostnamed systemd-timedated; {}; "
+WITHOUT_BUS = (STOP_BUS + " systemd-hostnamed systemd-timedated; {}; "
                "systemctl start dbus.socket; systemctl restart systemd-logind; ")
 ANYTHING = re.compile(".*", re.DOTALL)
 
