@@ -2,7 +2,9 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/services/UnitDaemons.h"
 
+#include <algorithm>
 #include <chrono>
+#include <iterator>
 #include <map>
 #include <vector>
 
@@ -127,7 +129,7 @@ Result<BusMessage> UnitDaemons::unitProperty(const Daemon& daemon, const char* n
 Result<std::vector<UnitState>> UnitDaemons::states(const std::vector<Daemon>& daemons) {
   constexpr const char* member = "ListUnitsByNames";
   std::vector<std::string> units;
-  for (const auto& daemon : daemons) units.emplace_back(daemon.unit);
+  std::ranges::transform(daemons, std::back_inserter(units), &Daemon::unit);
   const auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
   auto reply = (*bus)->call(serviceManager(), member, "a(ssssssouso)", units);
