@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cstddef>
 #include <iterator>
+#include <utility>
 
 namespace tavisk::control {
 namespace {
@@ -35,17 +36,31 @@ const OptionRow* findOption(const CommandRow* command, std::string_view name) {
   return own ? own : findOption(common, name);
 }
 
+bool takesWords(const CommandRow* command) {
+  return command && command->kind == OperandKind::words;
+}
+
+/// The words of tavisk may begin with one hyphen.
+bool isOption(std::string_view word, const CommandRow* command) {
+  return word.starts_with(takesWords(command) ? "--" : "-");
+}
+
 Failure misused(const std::string& what, const CommandRow* command) {
   const std::string name = command ? std::string(command->name) + " " : "";
   return {what, "", "type 'taviskctl " + name + "--help'"};
 }
 
+std::string typed(const OptionRow& option) {
+  return std::string(option.name) + (option.value.empty() ? "" : " ") + std::string(option.value);
+}
+
 std::string optionLines(std::span<const OptionRow> options) {
-  constexpr std::size_t column = 14;
+  constexpr std::size_t column = 20;
   std::string lines;
   for (const auto& option : options) {
-    const std::size_t gap = column - std::min(column - 2, option.name.size());
-    lines.append("  ").append(option.name).append(gap, ' ').append(option.summary).append("\n");
+    const auto words = typed(option);
+    const std::size_t gap = column - std::min(column - 2, words.size());
+    lines.append("  ").append(words).append(gap, ' ').append(option.summary).append("\n");
   }
   return lines;
 }
@@ -73,28 +88,32 @@ std::span<const OptionRow> commonOptions() {
   return common;
 }
 
-bool Invocation::has(std::string_view option) const {
-  return std::ranges::find(options, option) != options.end();
-}
-
 Result<Invocation> readCommandLine(std::span<const std::string> words) {
   Invocation invocation;
   bool areOptionsOver = false;
+  const OptionRow* valued = nullptr;  // the option whose value is next
   for (const auto& word : words) {
-    if (!areOptionsOver && word == "--") {
+    if (valued) {
+      invocation.options[std::exchange(valued, nullptr)->name] = word;
+    } else if (!areOptionsOver && word == "--") {
       areOptionsOver = true;
-    } else if (!areOptionsOver && word.starts_with('-')) {
+    } else if (!areOptionsOver && isOption(word, invocation.command)) {
       const auto* option = findOption(invocation.command, word);
       if (!option) return misused("there is no option " + word, invocation.command);
-      invocation.options.push_back(option->name);
+      if (option->value.empty())
+        invocation.options.try_emplace(option->name);
+      else
+        valued = option;
     } else if (!invocation.command) {
       const auto* const found = std::ranges::find(commands, word, &CommandRow::name);
       if (found == std::end(commands)) return misused("there is no command " + word, nullptr);
       invocation.command = found;
     } else {
+      areOptionsOver = areOptionsOver || takesWords(invocation.command);
       invocation.operands.push_back(word);
     }
   }
+  if (valued) return misused(typed(*valued) + ": the value is missing", invocation.command);
   if (!invocation.command && invocation.options.empty()) return misused("a command is missing", nullptr);
   return invocation;
 }

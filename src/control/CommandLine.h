@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <map>
 #include <span>
 #include <string>
 #include <string_view>
@@ -11,14 +12,18 @@
 
 namespace tavisk::control {
 
-/// An option of a command, without a value.
+/// An option of a command. Its value is the word after it.
 struct OptionRow {
   std::string_view name;  ///< "--json"
   std::string_view summary;
+  std::string_view value = "";  ///< how the help names its value, "FILE"; empty: it has none
 };
 
-/// What may stand in the place of a command's operands, as completions know it.
-enum class OperandKind { settings };
+/// What stands in the place of a command's operands.
+enum class OperandKind {
+  settings,  ///< names of settings
+  words,  ///< words of tavisk and their values: from the first that does not begin with two hyphens, all are operands
+};
 
 /// A command of taviskctl.
 struct CommandRow {
@@ -37,10 +42,11 @@ std::span<const OptionRow> commonOptions();
 /// A command line of which nothing is to be asked any more but whether the operands make sense.
 struct Invocation {
   const CommandRow* command = nullptr;  ///< null: only a common option was given
-  std::vector<std::string_view> options = {};
+  /// By name, with their values: empty for those that have none. What is given twice counts as given last.
+  std::map<std::string_view, std::string> options = {};
   std::vector<std::string> operands = {};
 
-  bool has(std::string_view option) const;
+  bool has(std::string_view option) const { return options.contains(option); }
 };
 
 /// The words after the program's name. Options may stand anywhere before "--". The failure says what is wrong with

@@ -3,60 +3,24 @@
 #include "control/Run.h"
 
 #include <algorithm>
-#include <iterator>
+#include <utility>
 
 #include "base/Text.h"
-#include "control/ManagedSettings.h"
-#include "control/StatusReader.h"
-#include "control/StatusText.h"
+#include "control/CommandLine.h"
+#include "control/Commands.h"
 #include "frontend/Help.h"
 
 namespace tavisk::control {
 namespace {
 
-using Settings = std::vector<const ManagedSetting*>;
+using Command = Status (*)(const Invocation&, const Tools&);
 
-Settings managed(bool withSearched) {
-  Settings managed;
-  for (const auto& setting : managedSettings())
-    if (withSearched || !setting.isSearched) managed.push_back(&setting);
-  return managed;
-}
+constexpr std::pair<std::string_view, Command> commands[] = {
+    {"status", showStatus},
+};
 
-/// Without names all of them, but those that are searched for.
-Result<Settings> chosenSettings(const std::vector<std::string>& names, bool areAllWanted) {
-  Settings chosen;
-  for (const auto& name : names) {
-    const auto* setting = settingMeantBy(name);
-    if (!setting) return Failure{"there is no setting " + name, "", "'taviskctl status --all' shows the names"};
-    if (std::ranges::find(chosen, setting) == chosen.end()) chosen.push_back(setting);
-  }
-  return names.empty() || areAllWanted ? managed(areAllWanted) : chosen;
-}
-
-bool isWholly(const SettingState& state) {
-  return state.failures.empty();
-}
-
-Status showStatus(const Invocation& invocation, const Tools& tools) {
-  const auto settings = chosenSettings(invocation.operands, invocation.has("--all"));
-  if (!settings) {
-    tools.complain(describe(settings.failure()));
-    return Status::misused;
-  }
-  EffectSink effects;
-  StatusReader reader;
-  effects.addChannel(reader);
-  RunLoop runLoop;
-  const auto host = tools.openHost(effects, runLoop);
-  if (!host) {
-    tools.complain(describe(host.failure()));
-    return Status::incomplete;
-  }
-  const auto states = reader.read(*settings, **host, runLoop);
-  tools.output.print("%s",
-                     invocation.has("--json") ? (statusJson(states) + '\n').c_str() : statusTable(states).c_str());
-  return std::ranges::all_of(states, isWholly) ? Status::done : Status::incomplete;
+Command commandNamed(std::string_view name) {
+  return std::ranges::find(commands, name, &std::pair<std::string_view, Command>::first)->second;
 }
 
 }  // namespace
@@ -75,7 +39,7 @@ Status run(std::span<const std::string> words, const Tools& tools) {
     tools.output.print("taviskctl, Version %s\n", versionText);
     return Status::done;
   }
-  return showStatus(*invocation, tools);
+  return commandNamed(invocation->command->name)(*invocation, tools);
 }
 
 }  // namespace tavisk::control

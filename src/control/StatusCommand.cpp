@@ -1,0 +1,60 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <algorithm>
+
+#include "control/Commands.h"
+#include "control/ManagedSettings.h"
+#include "control/StatusReader.h"
+#include "control/StatusText.h"
+
+namespace tavisk::control {
+namespace {
+
+using Settings = std::vector<const ManagedSetting*>;
+
+Settings managed(bool withSearched) {
+  Settings managed;
+  for (const auto& setting : managedSettings())
+    if (withSearched || !setting.isSearched) managed.push_back(&setting);
+  return managed;
+}
+
+/// Without names all of them, but those that are searched for.
+Result<Settings> chosenSettings(const std::vector<std::string>& names, bool areAllWanted) {
+  Settings chosen;
+  for (const auto& name : names) {
+    const auto* setting = settingMeantBy(name);
+    if (!setting) return Failure{"there is no setting " + name, "", "'taviskctl status --all' shows the names"};
+    if (std::ranges::find(chosen, setting) == chosen.end()) chosen.push_back(setting);
+  }
+  return names.empty() || areAllWanted ? managed(areAllWanted) : chosen;
+}
+
+bool isWholly(const SettingState& state) {
+  return state.failures.empty();
+}
+
+}  // namespace
+
+Status showStatus(const Invocation& invocation, const Tools& tools) {
+  const auto settings = chosenSettings(invocation.operands, invocation.has("--all"));
+  if (!settings) {
+    tools.complain(describe(settings.failure()));
+    return Status::misused;
+  }
+  EffectSink effects;
+  StatusReader reader;
+  effects.addChannel(reader);
+  RunLoop runLoop;
+  const auto host = tools.openHost(effects, runLoop);
+  if (!host) {
+    tools.complain(describe(host.failure()));
+    return Status::incomplete;
+  }
+  const auto states = reader.read(*settings, **host, runLoop);
+  tools.output.print("%s",
+                     invocation.has("--json") ? (statusJson(states) + '\n').c_str() : statusTable(states).c_str());
+  return std::ranges::all_of(states, isWholly) ? Status::done : Status::incomplete;
+}
+
+}  // namespace tavisk::control
