@@ -77,7 +77,7 @@ void Report::commandEnds(bool failed, const std::string& output) {
 void Report::wordRefused(const std::string& word, bool failed, const std::string& output) {
   auto entry = takeEntry();
   entry.command = word;
-  entry.refused = "a command that -printcommands lists";
+  entry.refused = wordExpected;
   entry.error = "not a valid command";
   append(std::move(entry), failed, output);
 }
