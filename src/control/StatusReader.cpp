@@ -47,11 +47,17 @@ std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSett
   const auto words = std::make_shared<const CommandTable>(productTable());
   SilentFrame frame(host, runLoop);
   ServerCommands commands(words, frame.context());
+  return read(settings, [&](const ManagedSetting& setting) {
+    const auto limit = runLoop.limitWaits(frame.context().longestCommand);
+    get(commands, *words, setting.getter);
+  });
+}
+
+std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSetting*>& settings, const Get& get) {
   for (const auto* setting : settings) {
     _current = setting;
     stateOf(std::string(setting->name));
-    const auto limit = runLoop.limitWaits(frame.context().longestCommand);
-    get(commands, *words, setting->getter);
+    get(*setting);
   }
   _current = nullptr;
   return std::exchange(_states, {});
