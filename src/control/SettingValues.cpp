@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <array>
 #include <cstdio>
+#include <utility>
 
 #include "base/Calendar.h"
 #include "base/Text.h"
@@ -174,11 +175,13 @@ bool isChangedBy(const ManagedSetting& setting, std::string_view word) {
          std::ranges::find(otherWords, std::pair(word, setting.setter)) != std::end(otherWords);
 }
 
-/// A number is told to the words in other units than to files, and a clock goes on.
+/// Only of an argument as the words are given it here: what else they take, and what they refuse, is theirs to say.
 Value askedOf(const ManagedSetting& setting, const std::string& argument) {
   if (setting.kind == ValueKind::moment || setting.kind == ValueKind::startupDisk || argument.empty())
     return std::nullopt;
-  return meantBy(setting.kind, argument, "");
+  auto value = meantBy(setting.kind, argument, "");
+  const bool isPlain = value && compareIgnoringCase(argumentOf(setting.kind, *value), argument) == 0;
+  return isPlain ? std::move(value) : std::nullopt;
 }
 
 }  // namespace
@@ -191,8 +194,10 @@ Result<std::string> valueMeantBy(const ManagedSetting& setting, const WrittenVal
 
 bool isSameValue(const ManagedSetting& setting, const std::string& left, const std::string& right) {
   if (setting.kind != ValueKind::moment) return left == right;
+  constexpr std::int64_t whileReading = 2;
   const auto one = secondsMeantBy(left);
-  return one && one == secondsMeantBy(right);
+  const auto other = secondsMeantBy(right);
+  return one && other && *one - *other <= whileReading && *other - *one <= whileReading;
 }
 
 std::vector<std::vector<std::string>> setterWords(const ManagedSetting& setting, const std::string& value) {

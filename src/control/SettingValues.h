@@ -23,7 +23,8 @@ using WrittenValue = std::variant<bool, std::int64_t, std::string>;
 Result<std::string> valueMeantBy(const ManagedSetting& setting, const WrittenValue& written,
                                  const std::string& unit = "");
 
-/// Whether both texts are one value of the setting. Dates and times of day are those of the process's zone.
+/// Whether both texts are one value of the setting. Of moments those are that lie at most two seconds apart, as they
+/// pass while they are read; dates and times of day are those of the process's zone.
 bool isSameValue(const ManagedSetting& setting, const std::string& left, const std::string& right);
 
 /// The words of tavisk that give the setting a value, each with its argument; none when it has no such form. A moment

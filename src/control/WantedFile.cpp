@@ -72,17 +72,27 @@ bool isReading(const Json& value) {
   return value.is_object() && value.contains("supported");
 }
 
+const Json* memberOf(const Json& object, const char* name) {
+  const auto found = object.find(name);
+  return found == object.end() ? nullptr : &*found;
+}
+
 /// Of a reading, what is in force, else what is stored.
 const Json* valueIn(const Json& member) {
   if (!member.is_object()) return &member;
-  for (const char* name : {"live", "stored"})
-    if (const auto found = member.find(name); found != member.end()) return &*found;
-  return nullptr;
+  const auto* live = memberOf(member, "live");
+  return live ? live : memberOf(member, "stored");
+}
+
+/// Both are there, and only one of them can be wanted.
+bool isTwofold(const Json& member) {
+  const auto* stored = member.is_object() ? memberOf(member, "stored") : nullptr;
+  return stored && *valueIn(member) != *stored;
 }
 
 std::string unitOf(const Json& member) {
-  const auto unit = member.is_object() ? member.find("unit") : member.end();
-  return unit != member.end() && unit->is_string() ? unit->get<std::string>() : "";
+  const auto* unit = member.is_object() ? memberOf(member, "unit") : nullptr;
+  return unit && unit->is_string() ? unit->get<std::string>() : "";
 }
 
 bool isLeftOut(const ManagedSetting* setting, const Json& member) {
@@ -113,6 +123,7 @@ Result<std::vector<WantedSetting>> wantedIn(std::string_view text, const std::st
     if (!setting) return Failure{task, name, "there is no setting " + key};
     if (std::ranges::find(wanted, setting, &WantedSetting::setting) != wanted.end())
       return Failure{task, name, std::string(setting->name) + " stands there twice"};
+    if (isTwofold(member)) return Failure{task, name, key + ": live and stored differ; leave out what is not wanted"};
     auto found = wantedBy(*setting, member);
     if (!found) return Failure{task, name, key + ": " + found.failure().why};
     wanted.push_back(std::move(found).value());

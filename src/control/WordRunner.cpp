@@ -55,7 +55,7 @@ std::string reasonOf(const WordResult& result) {
   if (verdict < Verdict::notSupported) return {};
   const auto worst = std::ranges::find_if(
       result.effects, [&](const Effect& effect) { return verdictOf(effect) == verdict && effect.failure; });
-  return worst != result.effects.end() ? describe(*worst->failure) : std::string(trimmed(result.printed));
+  return worst != result.effects.end() ? describe(*worst->failure) : escaped(trimmed(result.printed));
 }
 
 bool lasts(const std::optional<std::string>& live, const std::optional<std::string>& stored,
@@ -76,7 +76,7 @@ WordRunner::~WordRunner() {
 Result<void> WordRunner::start() {
   if (_settings.startWithoutLoop()) return {};
   const auto result = _gatherer.take();
-  return Failure{"start", "the run", result.brokenOffBy.value_or(std::string(trimmed(result.printed)))};
+  return Failure{"run words of tavisk", "", result.brokenOffBy.value_or(std::string(trimmed(result.printed)))};
 }
 
 WordResult WordRunner::run(std::span<const std::string> words) {
