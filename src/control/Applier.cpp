@@ -76,16 +76,28 @@ void addTold(AppliedSetting& applied, const Results& results) {
   }
 }
 
-/// Of words that told nothing, what can be seen.
-void judgeBySight(AppliedSetting& applied, const SettingState& after) {
-  const bool isOther =
-      applied.wanted && applied.after && !isSameValue(*applied.setting, *applied.after, *applied.wanted);
-  if (after.value.unsupported) {
+/// What the host has taken for the value asked for, which may be less: a name without its domain.
+std::optional<std::string> expectedOf(const AppliedSetting& applied, const Results& results) {
+  auto expected = applied.wanted;
+  for (const auto& result : results)
+    for (const auto& effect : result.effects)
+      if (effect.setting == applied.setting->name && effect.live) expected = effect.live;
+  return expected;
+}
+
+/// Granted is what is seen afterwards. Of a startup disk effects tell another text.
+void checkBySight(AppliedSetting& applied, const SettingState& after, const Results& results) {
+  const auto expected = expectedOf(applied, results);
+  const bool isComparable = applied.setting->kind != ValueKind::startupDisk && expected && applied.after;
+  const bool isTold = std::ranges::any_of(results, [](const auto& result) { return !result.effects.empty(); });
+  if (!after.failures.empty()) {
+    fail(applied, describe(after.failures.front()));
+  } else if (after.value.unsupported) {
     applied.verdict = Verdict::notSupported;
     applied.reason = describe(*after.value.unsupported);
-  } else if (isOther && applied.setting->kind != ValueKind::startupDisk) {
-    fail(applied, "nothing came of it");
-  } else if (applied.before != applied.after) {
+  } else if (isComparable && !isSameValue(*applied.setting, *applied.after, *expected)) {
+    fail(applied, describe({"read back", std::string(applied.setting->name), "reads " + *applied.after}));
+  } else if (!isTold && applied.before != applied.after) {
     applied.verdict = Verdict::applied;
   }
 }
@@ -94,9 +106,8 @@ AppliedSetting judged(const AskedValue& asked, const SettingState& before, const
                       const Results& results) {
   auto applied = seen(asked, before, after);
   addTold(applied, results);
-  const bool isTold = std::ranges::any_of(results, [](const auto& result) { return !result.effects.empty(); });
-  if (applied.verdict == Verdict::unchanged && !isTold) judgeBySight(applied, after);
-  if (applied.verdict <= Verdict::applied && !after.failures.empty()) fail(applied, describe(after.failures.front()));
+  if (applied.verdict <= Verdict::applied) checkBySight(applied, after, results);
+  applied.isChanged = applied.isChanged || applied.verdict == Verdict::applied;
   applied.lasts = isLasting(applied);
   return applied;
 }
