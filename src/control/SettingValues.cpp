@@ -14,8 +14,7 @@ namespace tavisk::control {
 namespace {
 
 constexpr std::int64_t secondsInUnit = 30;
-constexpr std::int64_t longestDelay = 255 * secondsInUnit;
-constexpr std::int64_t secondsInMinute = 60;
+constexpr std::int64_t longestDelay = 255;  // units
 constexpr const char* units = "units of 30 seconds";
 
 using Value = std::optional<std::string>;
@@ -51,9 +50,9 @@ Value minutesMeantBy(const WrittenValue& written) {
 
 Value delayMeantBy(const WrittenValue& written, const std::string& unit) {
   const auto count = countMeantBy(written, {"seconds"});
-  if (!count || *count < 0 || *count > longestDelay) return std::nullopt;
-  if (unit == units) return std::to_string(*count);
-  return *count % secondsInUnit == 0 ? Value(std::to_string(*count / secondsInUnit)) : std::nullopt;
+  const auto each = unit == units ? 1 : secondsInUnit;
+  const bool isOne = count && *count >= 0 && *count % each == 0 && *count / each <= longestDelay;
+  return isOne ? Value(std::to_string(*count / each)) : std::nullopt;
 }
 
 /// "YYYY-MM-DD hh:mm:ss".
