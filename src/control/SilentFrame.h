@@ -23,8 +23,6 @@ class SilentFrame final {
  public:
   /// Neither is owned.
   SilentFrame(Host& host, RunLoop& runLoop);
-  SilentFrame(const SilentFrame&) = delete;
-  SilentFrame& operator=(const SilentFrame&) = delete;
 
   const CommandContext& context() const { return _context; }
 
