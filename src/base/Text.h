@@ -43,6 +43,9 @@ bool isControl(char32_t codePoint);
 /// are not UTF-8 become \xNN or \u{NNNN}, a backslash is doubled. No control byte leaves it.
 std::string escaped(std::string_view text);
 
+/// Between quotation marks, as it is.
+std::string quoted(std::string_view text);
+
 /// ASCII letters in lower or capital letters; all other bytes stay.
 std::string lowerCased(std::string_view text);
 std::string upperCased(std::string_view text);

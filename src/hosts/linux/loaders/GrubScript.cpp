@@ -11,7 +11,7 @@ namespace {
 
 constexpr std::string_view blanks = " \t\r";
 constexpr std::string_view reserved = "|&<>";
-constexpr int deepest = 32;
+constexpr int deepestNesting = 32;
 constexpr std::size_t mostPieces = 100000;  // tokens count too
 
 struct Token {
@@ -193,7 +193,7 @@ class Parser {
 
   Block list() {
     Block block;
-    if (++_depth > deepest) _isBroken = true;
+    if (++_depth > deepestNesting) _isBroken = true;
     for (skipSeparators(); !isAtBlockEnd(); skipSeparators()) block.push_back(statement());
     --_depth;
     return block;

@@ -33,7 +33,7 @@ bool isMatch(const std::string& pattern, const std::string& id) {
 }
 
 /// From the volume's top, in the usual writing; empty when it is no path of that kind.
-std::string pathOf(const std::string& program) {
+std::string programPath(const std::string& program) {
   auto path = withSlashes(program);
   const auto parts = split(path, "/");
   return path.starts_with('/') && std::ranges::find(parts, "..") == parts.end() ? path : "";
@@ -137,7 +137,7 @@ class Menu {
       if (!text) return text.failure();
       auto entry = parseLoaderEntry(name, *text, Quotes::removed);
       if (!entry || isOfAnotherMachine(*entry)) continue;
-      const auto path = pathOf(entry->program);
+      const auto path = programPath(entry->program);
       // It shows no entry whose program is not there.
       const auto isThere = path.empty() ? Result<bool>(true) : _volumes.isThere(volume, path);
       if (!isThere) return isThere.failure();
@@ -173,7 +173,7 @@ class Menu {
   }
 
   Result<SystemStart> startOf(const LoaderEntry& entry) const {
-    const auto path = pathOf(entry.program);
+    const auto path = programPath(entry.program);
     if (path.empty()) return notProven(entry.id, "its program has no absolute path");
     const auto* volume = _volumes.named({entry.volume});
     const auto files = _volumes.filesOf(*volume);
