@@ -14,8 +14,9 @@ if(TAVISK_WERROR)
 endif()
 
 if(CMAKE_UNITY_BUILD)
-  # Every source is an included file then, whose classes the compiler would not let have members from an unnamed namespace.
-  add_compile_options(-Wno-subobject-linkage)
+  # Every source is an included file then: names of others are hidden in it, and its classes have members whose types are
+  # from an unnamed namespace.
+  add_compile_options(-Wno-shadow -Wno-subobject-linkage)
 endif()
 
 # The same sources give the same bytes, whichever folder they are built in.

@@ -42,10 +42,6 @@ bool isNamed(const Entry& entry, const std::string& name) {
   return entry.title == name || (!entry.id.empty() && entry.id == name);
 }
 
-bool isDigit(char byte) {
-  return byte >= '0' && byte <= '9';
-}
-
 bool mayBeNumber(std::string_view name) {
   name = trimmed(name);
   return !name.empty() && isDigit(name.front());

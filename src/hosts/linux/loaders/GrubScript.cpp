@@ -6,6 +6,8 @@
 #include <optional>
 #include <utility>
 
+#include "base/Text.h"
+
 namespace tavisk::grub {
 namespace {
 
@@ -27,7 +29,7 @@ struct Token {
 };
 
 bool isNameByte(char byte) {
-  return (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z') || (byte >= '0' && byte <= '9') || byte == '_';
+  return isLetterOrDigit(byte) || byte == '_';
 }
 
 class Lexer {
