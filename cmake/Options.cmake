@@ -13,6 +13,12 @@ if(TAVISK_WERROR)
   add_compile_options(-Werror)
 endif()
 
+if(CMAKE_UNITY_BUILD)
+  # Every source is an included file then: names of others are hidden in it, and its classes have members whose types are
+  # from an unnamed namespace.
+  add_compile_options(-Wno-shadow -Wno-subobject-linkage)
+endif()
+
 # The same sources give the same bytes, whichever folder they are built in.
 add_compile_options(-ffile-prefix-map=${PROJECT_SOURCE_DIR}=. -Wdate-time)
 

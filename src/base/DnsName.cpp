@@ -6,15 +6,13 @@
 
 #include <algorithm>
 
+#include "base/Text.h"
+
 namespace tavisk {
 namespace {
 
 constexpr std::size_t longestName = 253;
 constexpr std::size_t longestLabel = 63;
-
-bool isLetterOrDigit(char c) {
-  return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9');
-}
 
 /// `alsoAllowed` stands for what a label may have besides letters and digits.
 bool isLabel(std::string_view label, std::string_view alsoAllowed) {

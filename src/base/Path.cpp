@@ -8,6 +8,10 @@ std::string baseName(const std::string& path) {
   return path.substr(path.rfind('/') + 1);
 }
 
+std::string folderOf(const std::string& path) {
+  return path.substr(0, path.rfind('/'));
+}
+
 std::string parentFolder(const std::string& path) {
   const auto slash = path.rfind('/');
   return slash == 0 ? "/" : path.substr(0, slash);

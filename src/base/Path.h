@@ -10,6 +10,10 @@ namespace tavisk {
 std::string baseName(const std::string& path);
 
 /// "/Volumes" of "/Volumes/A", "/" of "/Volumes" and of "/" itself. `path` is absolute.
+/// For names to be appended after a slash: empty for what is at the top.
+std::string folderOf(const std::string& path);
+
+/// "/" for what is at the top.
 std::string parentFolder(const std::string& path);
 
 }  // namespace tavisk

@@ -8,6 +8,7 @@
 #include <stdexcept>
 
 #include "base/PropertyList.h"
+#include "base/Text.h"
 #include "base/XmlEncoding.h"
 #include "base/XmlText.h"
 
@@ -119,11 +120,7 @@ double realOf(pugi::xml_node element) {
   return value;
 }
 
-bool isDigit(char character) {
-  return character >= '0' && character <= '9';
-}
-
-PropertyList::Date dateOf(pugi::xml_node element) {
+PropertyList::Date dateIn(pugi::xml_node element) {
   constexpr std::string_view form = "0000-00-00T00:00:00Z";
   const auto content = textOf(element);
   const auto text = trimmed(content);
@@ -207,7 +204,7 @@ class Reader {
     if (name == "integer") return integerOf(element);
     if (name == "real") return realOf(element);
     if (name == "true" || name == "false") return boolean(element);
-    if (name == "date") return dateOf(element);
+    if (name == "date") return dateIn(element);
     if (name == "data") return dataOf(element);
     throw malformed(element, "a property list value");
   }

@@ -80,7 +80,7 @@ void appendEscapedControl(std::string& text, char32_t control) {
   text += "\\u{" + upperCased(hexDigits(control, 4)) + "}";
 }
 
-char lowerCased(char letter) {
+char smallLetter(char letter) {
   return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter - 'A' + 'a') : letter;
 }
 
@@ -188,9 +188,13 @@ std::string upperCased(std::string_view text) {
   return result;
 }
 
+std::string quoted(std::string_view text) {
+  return "\"" + std::string(text) + "\"";
+}
+
 std::string lowerCased(std::string_view text) {
   std::string result(text);
-  std::ranges::transform(result, result.begin(), [](char letter) { return lowerCased(letter); });
+  std::ranges::transform(result, result.begin(), [](char letter) { return smallLetter(letter); });
   return result;
 }
 

@@ -43,7 +43,21 @@ bool isControl(char32_t codePoint);
 /// are not UTF-8 become \xNN or \u{NNNN}, a backslash is doubled. No control byte leaves it.
 std::string escaped(std::string_view text);
 
-/// ASCII letters in lower or capital letters; all other bytes stay.
+/// Of ASCII, as all below.
+constexpr bool isDigit(char byte) {
+  return byte >= '0' && byte <= '9';
+}
+constexpr bool isLetter(char byte) {
+  return (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z');
+}
+constexpr bool isLetterOrDigit(char byte) {
+  return isLetter(byte) || isDigit(byte);
+}
+
+/// Between quotation marks, as it is.
+std::string quoted(std::string_view text);
+
+/// Letters in lower or capital letters; all other bytes stay.
 std::string lowerCased(std::string_view text);
 std::string upperCased(std::string_view text);
 

@@ -47,10 +47,7 @@ std::optional<std::string_view> declaredEncoding(std::string_view xml) {
 }
 
 bool isEncodingName(std::string_view name) {
-  const auto isPart = [](char c) {
-    return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') || c == '.' || c == '_' ||
-           c == '-';
-  };
+  const auto isPart = [](char c) { return isLetterOrDigit(c) || c == '.' || c == '_' || c == '-'; };
   return !name.empty() && std::ranges::all_of(name, isPart);
 }
 

@@ -15,13 +15,13 @@ namespace {
 
 using Command = Status (*)(const Invocation&, const Tools&);
 
-constexpr std::pair<std::string_view, Command> commands[] = {
+constexpr std::pair<std::string_view, Command> functions[] = {
     {"status", showStatus},
     {"apply", applySettings},
 };
 
 Command commandNamed(std::string_view name) {
-  return std::ranges::find(commands, name, &std::pair<std::string_view, Command>::first)->second;
+  return std::ranges::find(functions, name, &std::pair<std::string_view, Command>::first)->second;
 }
 
 }  // namespace

@@ -4,12 +4,13 @@
 
 #include <algorithm>
 
+#include "base/Text.h"
+
 namespace tavisk {
 namespace {
 
 bool isZoneCharacter(char c) {
-  return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') ||
-         std::string_view("+-_/").find(c) != std::string_view::npos;
+  return isLetterOrDigit(c) || std::string_view("+-_/").find(c) != std::string_view::npos;
 }
 
 }  // namespace

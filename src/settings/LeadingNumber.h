@@ -12,7 +12,7 @@ namespace tavisk {
 inline bool beginsWithNumber(std::string_view text) {
   text = trimmed(text);
   if (text.starts_with('+') || text.starts_with('-')) text.remove_prefix(1);
-  return !text.empty() && text.front() >= '0' && text.front() <= '9';
+  return !text.empty() && isDigit(text.front());
 }
 
 }  // namespace tavisk

@@ -28,7 +28,7 @@ constexpr std::size_t longestWatchdogLine = 63;
 constexpr int hangUp = 1;
 
 /// Only how the line begins counts: "yesterday" is a yes. Absent when it is neither.
-std::optional<bool> readYesNo(std::string_view line) {
+std::optional<bool> answerIn(std::string_view line) {
   if (beginsIgnoringCase(line, "YES")) return true;
   if (beginsIgnoringCase(line, "NO")) return false;
   return std::nullopt;
@@ -68,7 +68,7 @@ bool ServerCommands::promptForRemoteLogin() {
   // The end of the input is no answer: the question goes on until a signal or a lost output ends the run.
   for (int endsOfInput = 0;;) {
     const auto line = _context.input.readLine(question, answerBufferSize);
-    const auto answer = line ? readYesNo(*line) : std::nullopt;
+    const auto answer = line ? answerIn(*line) : std::nullopt;
     if (answer) return *answer;
     if (!line && ++endsOfInput >= endsWithoutBreath) _context.runLoop.runUntil(RunLoop::Clock::now() + breath);
   }

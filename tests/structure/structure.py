@@ -17,6 +17,7 @@ import sys
 CORE = r"src/(frontend|settings|startupdisk)/"
 CODE = r"src/.*\.(cpp|h)$"
 ANY_CODE = r"(src|tests|packaging)/.*\.(cpp|h)$"
+SOURCE = r"(src/[^/]+|tests)/.*\.cpp$"
 LONGEST_SOURCE = 360
 FULLEST_FOLDER = 42
 
@@ -126,6 +127,24 @@ def folder_faults(paths):
             yield f"{folder}: {folders.count(folder)} files; at most {FULLEST_FOLDER}"
 
 
+def own_names_of(text):
+    """What a source declares in unnamed namespaces, for itself alone."""
+    own = "".join(re.findall(r"^namespace \{$(.*?)^\}  // namespace$", text, re.M | re.S))
+    pattern = r"^(?:struct|class|enum class) (\w+)|^using (\w+) =|^\w[\w:<>,&* ]*[ &*](\w+)(?:\(|\[\]|\{| = )"
+    return {"".join(names) for names in re.findall(pattern, own, re.M)}
+
+
+def name_faults(texts):
+    """The sources of a folder may be compiled as one: a name that two of them have for themselves might be the other's."""
+    known = {}
+    for path, text in texts.items():
+        if re.match(SOURCE, path):
+            for name in sorted(own_names_of(text)):
+                first = known.setdefault((os.path.dirname(path), name), path)
+                if first != path:
+                    yield f"{path}: {first} has its own {name} too"
+
+
 def main(tree):
     texts = {}
     for path in files_of(tree):
@@ -136,7 +155,7 @@ def main(tree):
     reach = reach_of(arrows)
     faults = [fault for path, text in texts.items() for fault in rule_faults(path, text.splitlines())]
     faults += [fault for path, text in texts.items() if re.match(ANY_CODE, path) for fault in form_faults(path, text)]
-    faults += [*arrow_faults(code, arrows, reach), *circle_faults(code), *folder_faults(texts)]
+    faults += [*arrow_faults(code, arrows, reach), *circle_faults(code), *folder_faults(texts), *name_faults(texts)]
     print("\n".join(faults) if faults else "structure: in order")
     return 1 if faults else 0
 

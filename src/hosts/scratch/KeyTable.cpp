@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <unordered_map>
 
+#include "base/Text.h"
 #include "platform/Preferences.h"
 
 namespace tavisk {
@@ -204,10 +205,6 @@ Shape shapeOf(KeyType type) {
       break;
   }
   return {};
-}
-
-std::string quoted(const std::string& key) {
-  return "\"" + key + "\"";
 }
 
 bool isArrayOf(const PropertyList& value, Type type) {

@@ -89,10 +89,6 @@ const KeyRow* rowLike(std::string_view place, std::string_view written) {
   return row == rows.end() ? nullptr : &*row;
 }
 
-std::string quoted(std::string_view name) {
-  return "\"" + std::string(name) + "\"";
-}
-
 std::string isMeant(std::string_view name) {
   return " (is " + quoted(name) + " meant?)";
 }

@@ -9,7 +9,7 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* section = "Authorization";
+constexpr const char* authorizationSection = "Authorization";
 constexpr const char* adminGroup = "admin";
 constexpr GroupId adminId = 80;
 
@@ -20,7 +20,7 @@ unsigned idOf(std::int64_t number) {
 }
 
 MachineSetting<bool> authenticated() {
-  return switchAt(setting::authorization, section, "Authenticated");
+  return switchAt(setting::authorization, authorizationSection, "Authenticated");
 }
 
 }  // namespace
@@ -59,7 +59,7 @@ void ScratchAdminAuthenticator::deauthenticate() {
   auto counted = authenticated();
   counted.write = [store = counted.write](MachineFile::Dictionary& machine, bool isAuthenticated) {
     store(machine, isAuthenticated);
-    countUp(machine.dictionary(section), "Deauthentications");
+    countUp(machine.dictionary(authorizationSection), "Deauthentications");
   };
   _settings.note(counted, false);
 }

@@ -11,7 +11,7 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* section = "Clock";
+constexpr const char* clockSection = "Clock";
 constexpr const char* timeKey = "Time";
 constexpr const char* offsetKey = "Offset";
 constexpr std::int64_t longestChange = 10;  // seconds: waiting for the lock and writing
@@ -28,13 +28,13 @@ std::int64_t saturatingSum(std::int64_t left, std::int64_t right) {
 }
 
 std::int64_t timeOf(MachineFile& machine) {
-  const auto clock = machine.section(section);
+  const auto clock = machine.section(clockSection);
   if (const auto* still = clock.find(timeKey)) return *still->asInteger();
   return saturatingSum(realTime(), clock.integer(offsetKey));
 }
 
 void storeTime(MachineFile::Dictionary& machine, std::int64_t time) {
-  auto& clock = machine.dictionary(section);
+  auto& clock = machine.dictionary(clockSection);
   if (clock.find(timeKey))
     clock.set(timeKey, time);
   else
@@ -47,9 +47,9 @@ MachineSetting<std::int64_t> timeSetting() {
 
 MachineSetting<ZoneName> zoneSetting() {
   return {setting::timeZone, "",
-          [](MachineFile& machine) { return ZoneName{machine.section(section).text("Time Zone")}; },
+          [](MachineFile& machine) { return ZoneName{machine.section(clockSection).text("Time Zone")}; },
           [](MachineFile::Dictionary& machine, const ZoneName& zone) {
-            auto& clock = machine.dictionary(section);
+            auto& clock = machine.dictionary(clockSection);
             clock.set("Time Zone", zone.text);
             clock.set("Time Zone File", zone.file());
           }};
@@ -63,7 +63,7 @@ std::vector<ZoneName> zonesNamedIn(const PropertyList::Array& texts) {
 }
 
 MachineSetting<std::vector<ZoneName>>::Found knownZones(MachineFile& machine) {
-  const auto clock = machine.section(section);
+  const auto clock = machine.section(clockSection);
   if (const auto* known = clock.find("Known Time Zones")) return zonesNamedIn(*known->asArray());
   const auto installed = installedZones(SystemRoot("/"));
   if (!installed) return installed.failure();

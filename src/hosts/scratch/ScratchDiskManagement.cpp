@@ -7,14 +7,14 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* section = "Firmware";
+constexpr const char* firmwareSection = "Firmware";
 constexpr const char* preferenceKey = "Boot Preference";
 constexpr const char* networkKey = "Network Preference";
 constexpr const char* variablesKey = "Variables";
 constexpr ServiceStatus failed = 1;
 
 MachineSetting<BootSettings::BootChoice>::Found readBootPreference(MachineFile& machine) {
-  const auto preference = machine.section(section).section(preferenceKey);
+  const auto preference = machine.section(firmwareSection).section(preferenceKey);
   const auto disk = preference.optionalText("Disk");
   if (!disk) return std::nullopt;
   return BootSettings::BootChoice{
@@ -22,7 +22,7 @@ MachineSetting<BootSettings::BootChoice>::Found readBootPreference(MachineFile& 
 }
 
 void storeBootPreference(MachineFile::Dictionary& machine, const BootSettings::BootChoice& choice) {
-  auto& preference = machine.dictionary(section).dictionary(preferenceKey);
+  auto& preference = machine.dictionary(firmwareSection).dictionary(preferenceKey);
   preference.set("Disk", choice.disk.text);
   preference.set("Folder", choice.systemFolder);
   preference.set("Lumara 9", choice.lumara9);
@@ -33,11 +33,12 @@ MachineSetting<BootSettings::BootChoice> bootPreferenceSetting() {
 }
 
 MachineSetting<std::string> variableNamed(const std::string& name) {
-  return {setting::firmwareVariable + name, "",
-          [=](MachineFile& machine) { return machine.section(section).section(variablesKey).optionalText(name); },
-          [=](MachineFile::Dictionary& machine, const std::string& value) {
-            machine.dictionary(section).dictionary(variablesKey).set(name, value);
-          }};
+  return {
+      setting::firmwareVariable + name, "",
+      [=](MachineFile& machine) { return machine.section(firmwareSection).section(variablesKey).optionalText(name); },
+      [=](MachineFile::Dictionary& machine, const std::string& value) {
+        machine.dictionary(firmwareSection).dictionary(variablesKey).set(name, value);
+      }};
 }
 
 }  // namespace
@@ -85,11 +86,11 @@ DiskQueries::OpticalBootability ScratchDiskManagement::opticalBootability(const 
 }
 
 int ScratchDiskManagement::preBootEnvironment() {
-  return static_cast<int>(_machine.section(section).integer("Pre-Boot Environment"));
+  return static_cast<int>(_machine.section(firmwareSection).integer("Pre-Boot Environment"));
 }
 
 BootSettings::LegacyBootSupport ScratchDiskManagement::legacyBootSupport() {
-  const auto firmware = _machine.section(section);
+  const auto firmware = _machine.section(firmwareSection);
   return {static_cast<ServiceStatus>(firmware.integer("Legacy Boot Status")), firmware.boolean("Legacy Boot")};
 }
 
@@ -101,12 +102,12 @@ BootSettings::BootPreference ScratchDiskManagement::bootPreference() {
 
 BootSettings::NetworkBootPreference ScratchDiskManagement::networkBootPreference() {
   const auto readInterface = [](MachineFile& machine) {
-    return machine.section(section).section(networkKey).optionalText("Interface");
+    return machine.section(firmwareSection).section(networkKey).optionalText("Interface");
   };
   const auto interface =
       _settings.read(MachineSetting<std::string>{setting::networkStartupDisk, "", readInterface, nullptr});
   if (!interface) return {failed, {}, {}, {}};
-  const auto preference = _machine.section(section).section(networkKey);
+  const auto preference = _machine.section(firmwareSection).section(networkKey);
   return {0, preference.optionalText("Value"), preference.optionalText("Server"), interface};
 }
 
@@ -125,7 +126,7 @@ ServiceStatus ScratchDiskManagement::change(const MachineSetting<Value>& setting
   auto status = failed;  // what a refusal leaves
   auto parts = _settings.parts(setting);
   parts.store = [&, write = parts.store](const Value& value) -> Result<void> {
-    const auto answer = static_cast<ServiceStatus>(_machine.section(section).integer(statusKey));
+    const auto answer = static_cast<ServiceStatus>(_machine.section(firmwareSection).integer(statusKey));
     if (answer != 0) {
       status = answer;
       return Failure{"set", "the rehearsed firmware", "status " + std::to_string(answer)};

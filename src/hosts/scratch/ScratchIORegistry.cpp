@@ -5,26 +5,26 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* section = "Registry";
+constexpr const char* registrySection = "Registry";
 constexpr std::string_view deviceTree = "IODeviceTree:";
 constexpr RegistryStatus noSuchEntry = 2;
 
 }  // namespace
 
 RegistryStatus ScratchIORegistry::masterPort() {
-  return static_cast<RegistryStatus>(_machine.section(section).integer("Master Port Status"));
+  return static_cast<RegistryStatus>(_machine.section(registrySection).integer("Master Port Status"));
 }
 
 std::optional<RegistryEntry> ScratchIORegistry::entryAtPath(const std::string& path) {
   if (!path.starts_with(deviceTree)) return std::nullopt;
   const auto inTree = path.substr(deviceTree.size());
-  if (!_machine.section(section).section("Device Tree").find(inTree)) return std::nullopt;
+  if (!_machine.section(registrySection).section("Device Tree").find(inTree)) return std::nullopt;
   return RegistryEntry{inTree};
 }
 
 std::optional<IORegistry::Data> ScratchIORegistry::dataProperty(const RegistryEntry& entry,
                                                                 const std::string& property) {
-  const auto properties = _machine.section(section).section("Device Tree").section(entry.name);
+  const auto properties = _machine.section(registrySection).section("Device Tree").section(entry.name);
   const auto* value = properties.find(property);
   return value ? std::optional(*value->asData()) : std::nullopt;
 }
@@ -47,7 +47,7 @@ std::pair<RegistryStatus, std::string> ScratchIORegistry::path(const RegistryEnt
 }
 
 MachineSection ScratchIORegistry::interface(const RegistryEntry& entry) {
-  return _machine.section(section).section("Interfaces").section(entry.name);
+  return _machine.section(registrySection).section("Interfaces").section(entry.name);
 }
 
 }  // namespace tavisk

@@ -7,18 +7,18 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* section = "Network Time";
+constexpr const char* networkTimeSection = "Network Time";
 
 MachineSetting<bool> running() {
-  return switchAt(setting::networkTime, section, "Running");
+  return switchAt(setting::networkTime, networkTimeSection, "Running");
 }
 
 MachineSetting<std::string> address() {
-  return textAt(setting::networkTimeServer, section, "Server");
+  return textAt(setting::networkTimeServer, networkTimeSection, "Server");
 }
 
 MachineSetting<bool> atStartup() {
-  return switchAt(setting::networkTimeAtStartup, section, "Launch At Startup");
+  return switchAt(setting::networkTimeAtStartup, networkTimeSection, "Launch At Startup");
 }
 
 }  // namespace
@@ -52,7 +52,7 @@ void ScratchNetworkTimeService::setServer(const NetworkTimeServer& server) {
 }
 
 void ScratchNetworkTimeService::restartAsynchronously() {
-  _settings.change(countAt(setting::networkTimeRestart, section, "Restarts"), "restart");
+  _settings.change(countAt(setting::networkTimeRestart, networkTimeSection, "Restarts"), "restart");
 }
 
 }  // namespace tavisk

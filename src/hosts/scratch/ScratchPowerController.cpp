@@ -9,7 +9,7 @@ namespace {
 
 constexpr const char* registry = "Registry";
 constexpr const char* services = "Services";
-constexpr ControllerStatus refused = 1;
+constexpr ControllerStatus refusedStatus = 1;
 constexpr ControllerStatus noSuchDevice = 19;
 
 /// Of a number or of one byte of data; any other value reads as 0.
@@ -72,7 +72,7 @@ ControllerStatus ScratchPowerController::setProperties(const Connection& connect
     const auto setting = delayOf(connection.service, property, value);
     const auto effect = _settings.change(setting, asked);
     const bool isKept = !effect.where.empty() && effect.live == textOf(numberIn(value));
-    if (effect.outcome == Outcome::failed && !isKept) return refused;
+    if (effect.outcome == Outcome::failed && !isKept) return refusedStatus;
   }
   return 0;
 }

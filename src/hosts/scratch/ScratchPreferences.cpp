@@ -7,24 +7,24 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* section = "Preferences";
+constexpr const char* preferencesSection = "Preferences";
 constexpr const char* writes = "Preferences Writes";
 
 MachineSetting<bool> preference(const std::string& key) {
   return {setting::keyboardLockPreference, "",
           [=](MachineFile& machine) {
-            const auto preferences = machine.section(section);
+            const auto preferences = machine.section(preferencesSection);
             const auto* value = preferences.find(key);
             return value ? std::optional(switchIn(*value)) : std::nullopt;
           },
-          [=](MachineFile::Dictionary& machine, bool isOn) { machine.dictionary(section).set(key, isOn); }};
+          [=](MachineFile::Dictionary& machine, bool isOn) { machine.dictionary(preferencesSection).set(key, isOn); }};
 }
 
 }  // namespace
 
 std::optional<PropertyList> ScratchPreferencesStore::value(const std::string& key) {
   if (!_settings.read(preference(key))) return std::nullopt;
-  const auto preferences = _settings.section(section);
+  const auto preferences = _settings.section(preferencesSection);
   const auto* value = preferences.find(key);
   return value ? std::optional(*value) : std::nullopt;
 }

@@ -16,7 +16,7 @@ namespace tavisk {
 namespace {
 
 // The kernel answers EAGAIN when something was renamed or mounted while it resolved a "..".
-constexpr int enoughTries = 256;
+constexpr int enoughLookups = 256;
 
 Failure openFailure(const std::string& path, int error) {
   auto failure = systemFailure("open", path, error);
@@ -32,7 +32,7 @@ Result<FileDescriptor> openHow(const FileDescriptor& root, const std::string& pa
   for (int tries = 0;; ++tries) {
     const auto number = static_cast<int>(::syscall(SYS_openat2, root.number(), path.c_str(), &how, sizeof how));
     if (number >= 0) return FileDescriptor(number);
-    const bool isTriedAgain = (errno == EINTR || errno == EAGAIN) && tries < enoughTries;
+    const bool isTriedAgain = (errno == EINTR || errno == EAGAIN) && tries < enoughLookups;
     if (!isTriedAgain) return openFailure(path, errno);
   }
 }

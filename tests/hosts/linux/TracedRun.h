@@ -2,9 +2,11 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <elf.h>
 #include <fcntl.h>
 #include <sys/ptrace.h>
 #include <sys/syscall.h>
+#include <sys/uio.h>
 #include <sys/user.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -40,6 +42,52 @@ inline bool opensOrChangesFiles(pid_t process) {
   return mayChangeFiles(process) || isOneOf(callOf(process), {SYS_openat2});
 }
 
+inline user_regs_struct registersOf(pid_t process) {
+  user_regs_struct registers{};
+  iovec area{&registers, sizeof registers};
+  ::ptrace(PTRACE_GETREGSET, process, NT_PRSTATUS, &area);
+  return registers;
+}
+
+inline void setRegisters(pid_t process, user_regs_struct registers) {
+  iovec area{&registers, sizeof registers};
+  ::ptrace(PTRACE_SETREGSET, process, NT_PRSTATUS, &area);
+}
+
+#if defined(__x86_64__)
+inline void setCall(pid_t process, int number) {
+  auto registers = registersOf(process);
+  registers.orig_rax = static_cast<unsigned long long>(number);
+  setRegisters(process, registers);
+}
+
+inline void setAnswer(pid_t process, int answer) {
+  auto registers = registersOf(process);
+  registers.rax = static_cast<unsigned long long>(answer);
+  setRegisters(process, registers);
+}
+#elif defined(__aarch64__)
+inline void setCall(pid_t process, int number) {
+  iovec area{&number, sizeof number};
+  ::ptrace(PTRACE_SETREGSET, process, NT_ARM_SYSTEM_CALL, &area);
+}
+
+inline void setAnswer(pid_t process, int answer) {
+  auto registers = registersOf(process);
+  registers.regs[0] = static_cast<unsigned long long>(answer);
+  setRegisters(process, registers);
+}
+#endif
+
+/// Whether this machine has calls traced: one that is emulated has not.
+inline bool canTraceCalls() {
+  const auto child = ::fork();
+  if (child == 0) ::_exit(::ptrace(PTRACE_TRACEME, 0, nullptr, nullptr) == 0 ? 0 : 1);
+  int status = 0;
+  ::waitpid(child, &status, 0);
+  return WIFEXITED(status) && WEXITSTATUS(status) == 0;
+}
+
 /// A run in a process of its own in which one call went wrong.
 struct TracedRun {
   bool wentWrong = false;  ///< false: there were not so many calls
@@ -67,13 +115,9 @@ inline TracedRun runWithFault(int number, int error, bool (*isChosen)(pid_t), co
     ::kill(child, SIGKILL);
     ::waitpid(child, &status, 0);
   } else if (wentWrong) {
-    user_regs_struct registers{};
-    ::ptrace(PTRACE_GETREGS, child, nullptr, &registers);
-    registers.orig_rax = static_cast<unsigned long long>(-1);  // no call
-    ::ptrace(PTRACE_SETREGS, child, nullptr, &registers);
+    setCall(child, -1);  // none
     resume(PTRACE_SYSCALL);
-    registers.rax = static_cast<unsigned long long>(-error);
-    ::ptrace(PTRACE_SETREGS, child, nullptr, &registers);
+    setAnswer(child, -error);
     resume(PTRACE_CONT);
   }
   return {wentWrong, WIFEXITED(status) ? WEXITSTATUS(status) : -1};

@@ -276,7 +276,7 @@ bool DeviceLook::isInternal(const DiskName& disk) {
 template <typename Question, typename... Asked>
 auto answer(const SystemRoot& root, Question question, const Asked&... asked) {
   DeviceLook look(root);
-  return look.told(std::invoke(question, look, asked...));
+  return look.told((look.*question)(asked...));
 }
 
 }  // namespace

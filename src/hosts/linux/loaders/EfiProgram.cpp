@@ -18,7 +18,7 @@ constexpr const char* tried = "understand";
 constexpr std::size_t coffSize = 24;  // with the signature in front
 constexpr std::size_t sectionSize = 40;
 constexpr std::size_t mostSections = 96;
-constexpr std::size_t longestText = 65536;
+constexpr std::size_t longestSectionText = 65536;
 constexpr std::size_t longestData = 4194304;
 constexpr std::size_t mostModules = 4096;
 
@@ -34,7 +34,7 @@ std::uint64_t numberAt(std::string_view bytes, std::size_t offset, std::size_t w
 }
 
 /// Without the zeros that fill it up.
-std::string textOf(std::string_view bytes) {
+std::string untilZero(std::string_view bytes) {
   return std::string(bytes.substr(0, bytes.find('\0')));
 }
 
@@ -98,7 +98,7 @@ class Reader {
     const auto virtualSize = numberAt(entry, 8, 4);
     const auto fileSize = numberAt(entry, 16, 4);
     const Section section{numberAt(entry, 20, 4), virtualSize == 0 ? fileSize : std::min(virtualSize, fileSize)};
-    const auto name = textOf(entry.substr(0, 8));
+    const auto name = untilZero(entry.substr(0, 8));
     if (!_sections.emplace(name, section).second && (name == ".cmdline" || name == "mods"))
       _contradiction = "it has several sections " + name;
   }
@@ -116,7 +116,7 @@ class Reader {
   }
 
   std::string limitedText(const Section& section) {
-    if (section.size <= longestText) return textOf(bytesAt(section));
+    if (section.size <= longestSectionText) return untilZero(bytesAt(section));
     _contradiction = "a text in it is too long";
     return {};
   }

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 
+#include "base/Path.h"
 #include "base/Text.h"
 #include "hosts/linux/loaders/GrubFiles.h"
 #include "hosts/linux/loaders/GrubLoader.h"
@@ -27,10 +28,6 @@ else
   configfile $cmdpath/grub.cfg
 fi
 )";
-
-std::string folderOf(const std::string& path) {
-  return path.substr(0, path.rfind('/'));
-}
 
 /// The number in ",gpt2", which is on the disk that the loader is on.
 std::optional<int> partitionIn(std::string_view device) {
@@ -94,7 +91,7 @@ Variables variablesWith(const std::string& platform, const std::string& device, 
           {"lang", std::nullopt}};
 }
 
-std::string textOf(const FilePlace& place) {
+std::string asGrubWritesIt(const FilePlace& place) {
   return "(" + place.device + ")" + place.path;
 }
 
@@ -105,8 +102,8 @@ Result<Beginning> beginningOf(const EfiProgram& program, const Volumes& volumes,
   const auto prefix = prefixOf(program, volumes, partition, path);
   if (!prefix) return prefix.failure();
   const FilePlace beside{deviceOf(partition), folderOf(path)};
-  Beginning beginning{program.configuration, {}, variablesWith("efi", prefix->device, textOf(*prefix))};
-  beginning.variables["cmdpath"] = textOf(beside);
+  Beginning beginning{program.configuration, {}, variablesWith("efi", prefix->device, asGrubWritesIt(*prefix))};
+  beginning.variables["cmdpath"] = asGrubWritesIt(beside);
   const bool isDistributors = program.hasComponent("grub.debian") || program.hasComponent("grub.ubuntu");
   if (isDistributors && trimmed(beginning.text) == distributorsText) beginning.text = distributorsFile;
   if (!beginning.text.empty()) return beginning;
@@ -118,7 +115,7 @@ Result<Beginning> beginningOf(const EfiProgram& program, const Volumes& volumes,
 
 Beginning beginningIn(const Volume& volume, const std::string& folder) {
   const FilePlace prefix{deviceOf(volume), folder};
-  return {"", {prefix.device, folder + "/grub.cfg"}, variablesWith("pc", prefix.device, textOf(prefix))};
+  return {"", {prefix.device, folder + "/grub.cfg"}, variablesWith("pc", prefix.device, asGrubWritesIt(prefix))};
 }
 
 }  // namespace tavisk::grub

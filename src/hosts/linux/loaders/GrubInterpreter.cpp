@@ -7,6 +7,7 @@
 #include <iterator>
 #include <utility>
 
+#include "base/Path.h"
 #include "base/Text.h"
 
 namespace tavisk::grub {
@@ -91,7 +92,7 @@ void Interpreter::runFile(const FilePlace& place) {
   const auto outerFolder = valueOf("config_directory");
   const std::string device = "(" + place.device + ")";
   setTo("config_file", device + place.path);
-  setTo("config_directory", device + place.path.substr(0, place.path.rfind('/')));
+  setTo("config_directory", device + folderOf(place.path));
   ++_openFiles;
   runDeeper(*script);
   --_openFiles;

@@ -4,6 +4,7 @@
 
 #include <utility>
 
+#include "base/Path.h"
 #include "hosts/linux/loaders/GrubFiles.h"
 #include "hosts/linux/loaders/GrubMenu.h"
 #include "hosts/linux/loaders/SystemStarts.h"
@@ -19,7 +20,7 @@ Failure cannotChoose(std::string on, std::string why) {
   return {"choose by GRUB's saved entry", std::move(on), std::move(why)};
 }
 
-std::string valueIn(const Environment& environment, const char* name) {
+std::string valueOrEmpty(const Environment& environment, const char* name) {
   const auto found = environment.find(name);
   return found == environment.end() ? "" : found->second;
 }
@@ -27,7 +28,7 @@ std::string valueIn(const Environment& environment, const char* name) {
 /// What the environment block says when what is for once is done.
 Environment afterOnce(const Environment& environment) {
   Environment replaced{{once, ""}};
-  const auto before = valueIn(environment, savedBefore);
+  const auto before = valueOrEmpty(environment, savedBefore);
   if (!before.empty()) replaced.insert({{saved, before}, {savedBefore, ""}});
   return replaced;
 }
@@ -85,7 +86,7 @@ class Menus {
   /// Where its tools keep the environment block, whether it is loaded or not.
   Result<bool> hasBlock(const Menu& menu) const {
     auto place = menu.configuration;
-    place.path = place.path.substr(0, place.path.rfind('/')) + "/grubenv";
+    place.path = folderOf(place.path) + "/grubenv";
     return _files.isThere(place);
   }
 
@@ -115,7 +116,7 @@ std::optional<Failure> whyNotWritten(const Volumes& volumes, const LoaderDefault
     if (!block && isAbsent(block.failure())) return noBlock(placeText(volume, keeps.path));
     if (!block) return block.failure();
     const auto environment = environmentIn(*block);
-    if (environment && !valueIn(*environment, savedBefore).empty())
+    if (environment && !valueOrEmpty(*environment, savedBefore).empty())
       return cannotChoose(placeText(volume, keeps.path), "another entry is for once, and the one before comes back");
     const auto written = withVariable(*block, saved, choice);
     return written ? std::nullopt : std::optional(written.failure());
@@ -137,7 +138,7 @@ LoaderReading readMenu(const Volumes& volumes, const Beginning& beginning) {
   reading.configuration = menus.text(menu->configuration);
   reading.keeps = menus.defaultOf(*menu);
   const auto environment = menus.environmentOf(*menu);
-  if (const auto entry = valueIn(environment, once); !entry.empty()) reading.once = entry;
+  if (const auto entry = valueOrEmpty(environment, once); !entry.empty()) reading.once = entry;
   const auto lasting = menus.menu(afterOnce(environment));
   reading.lasting = menus.systemOfDefault(lasting);
   if (lasting) reading.starts = menus.systemsOf(*lasting);

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 
+#include "base/Text.h"
 #include "hosts/linux/loaders/GrubInterpreter.h"
 #include "hosts/linux/loaders/LoaderEntries.h"
 
@@ -14,14 +15,9 @@ constexpr std::size_t mostLoaderEntries = 200;
 constexpr std::string_view ending = ".conf";
 constexpr const char* usualFolder = "/loader/entries";
 
-bool isWordByte(char byte) {
-  return (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z') || (byte >= '0' && byte <= '9');
-}
-
 std::string_view takeSegment(std::string_view& text) {
-  const auto isDigit = [](char byte) { return byte >= '0' && byte <= '9'; };
   const bool isNumber = isDigit(text.front());
-  const auto isOther = [&](char byte) { return !isWordByte(byte) || isDigit(byte) != isNumber; };
+  const auto isOther = [&](char byte) { return !isLetterOrDigit(byte) || isDigit(byte) != isNumber; };
   const auto* const end = std::ranges::find_if(text, isOther);
   const auto segment = text.substr(0, static_cast<std::size_t>(end - text.begin()));
   text.remove_prefix(segment.size());
@@ -43,7 +39,7 @@ bool startsWithMark(std::string_view text) {
 }
 
 /// "~" comes before the end, "^" behind it, and both before everything else.
-int rankOf(std::string_view text) {
+int rankInGrub(std::string_view text) {
   if (text.starts_with('~')) return 0;
   if (text.empty()) return 1;
   return text.starts_with('^') ? 2 : 3;
@@ -52,7 +48,7 @@ int rankOf(std::string_view text) {
 /// As packages are compared there (rpmvercmp): segment by segment, a number is more than letters.
 int comparePackageVersions(std::string_view left, std::string_view right) {
   const auto skip = [](std::string_view& text) {
-    const auto counts = [](char byte) { return isWordByte(byte) || byte == '~' || byte == '^'; };
+    const auto counts = [](char byte) { return isLetterOrDigit(byte) || byte == '~' || byte == '^'; };
     text.remove_prefix(static_cast<std::size_t>(std::ranges::find_if(text, counts) - text.begin()));
   };
   if (left == right) return 0;
@@ -60,7 +56,7 @@ int comparePackageVersions(std::string_view left, std::string_view right) {
     skip(left);
     skip(right);
     if (startsWithMark(left) || startsWithMark(right)) {
-      if (rankOf(left) != rankOf(right)) return rankOf(left) < rankOf(right) ? -1 : 1;
+      if (rankInGrub(left) != rankInGrub(right)) return rankInGrub(left) < rankInGrub(right) ? -1 : 1;
       left.remove_prefix(1);
       right.remove_prefix(1);
       continue;

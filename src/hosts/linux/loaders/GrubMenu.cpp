@@ -9,7 +9,7 @@
 namespace tavisk::grub {
 namespace {
 
-constexpr int mostEntries = 100;  // of which it is worked out what they start
+constexpr int mostLookedInto = 100;  // of which it is worked out what they start
 constexpr const char* chosenEntry = "default";
 constexpr int deepestSubmenu = 16;
 constexpr char below = '>';  // between the names of a submenu and of its entry
@@ -40,10 +40,6 @@ Result<State> certain(const Interpreter& interpreter) {
 
 bool isNamed(const Entry& entry, const std::string& name) {
   return entry.title == name || (!entry.id.empty() && entry.id == name);
-}
-
-bool isDigit(char byte) {
-  return byte >= '0' && byte <= '9';
 }
 
 bool mayBeNumber(std::string_view name) {
@@ -167,7 +163,7 @@ Result<Menu> MenuReader::submenuOf(const Entry& entry, const Menu& menu) const {
 
 std::vector<NamedStart> MenuReader::startsOf(const Menu& menu) const {
   std::vector<NamedStart> starts;
-  int left = mostEntries;
+  int left = mostLookedInto;
   addStarts(menu, "", left, starts);
   return starts;
 }

@@ -6,12 +6,14 @@
 #include <optional>
 #include <utility>
 
+#include "base/Text.h"
+
 namespace tavisk::grub {
 namespace {
 
 constexpr std::string_view blanks = " \t\r";
 constexpr std::string_view reserved = "|&<>";
-constexpr int deepest = 32;
+constexpr int deepestNesting = 32;
 constexpr std::size_t mostPieces = 100000;  // tokens count too
 
 struct Token {
@@ -27,7 +29,7 @@ struct Token {
 };
 
 bool isNameByte(char byte) {
-  return (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z') || (byte >= '0' && byte <= '9') || byte == '_';
+  return isLetterOrDigit(byte) || byte == '_';
 }
 
 class Lexer {
@@ -193,7 +195,7 @@ class Parser {
 
   Block list() {
     Block block;
-    if (++_depth > deepest) _isBroken = true;
+    if (++_depth > deepestNesting) _isBroken = true;
     for (skipSeparators(); !isAtBlockEnd(); skipSeparators()) block.push_back(statement());
     --_depth;
     return block;

@@ -13,14 +13,6 @@
 namespace tavisk {
 namespace {
 
-bool isDigit(char byte) {
-  return byte >= '0' && byte <= '9';
-}
-
-bool isLetter(char byte) {
-  return (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z');
-}
-
 /// Key and value of a line; a key alone has an empty value, a remark no key.
 std::pair<std::string, std::string> keyAndValue(std::string_view line) {
   line = trimmed(line);
@@ -35,7 +27,7 @@ std::string unquoted(const std::string& value) {
 }
 
 /// Of the last line with the key; empty: there is none.
-std::string valueIn(std::string_view configuration, std::string_view wanted) {
+std::string lastValueOf(std::string_view configuration, std::string_view wanted) {
   std::string found;
   for (const auto& line : split(configuration, "\n"))
     if (const auto [key, value] = keyAndValue(line); key == wanted) found = unquoted(value);
@@ -75,7 +67,7 @@ int rankOf(std::string_view text) {
 }
 
 bool isMeaningful(char byte) {
-  return isDigit(byte) || isLetter(byte) || std::string_view("~-^.").find(byte) != std::string_view::npos;
+  return isLetterOrDigit(byte) || std::string_view("~-^.").find(byte) != std::string_view::npos;
 }
 
 void skipMeaningless(std::string_view& text) {
@@ -84,7 +76,7 @@ void skipMeaningless(std::string_view& text) {
 
 /// Of two texts that begin with things of the same rank; takes what it compares: a separator, a number or a word.
 int compareFirstParts(std::string_view& left, std::string_view& right) {
-  if (!isDigit(left.front()) && !isLetter(left.front())) {
+  if (!isLetterOrDigit(left.front())) {
     left.remove_prefix(1);
     right.remove_prefix(1);
     return 0;
@@ -148,11 +140,11 @@ std::optional<LoaderEntry> parseLoaderEntry(std::string id, std::string_view tex
 }
 
 std::string defaultEntryIn(std::string_view loaderConfiguration) {
-  return valueIn(loaderConfiguration, "default");
+  return lastValueOf(loaderConfiguration, "default");
 }
 
 bool hasPreferredEntry(std::string_view loaderConfiguration) {
-  return !valueIn(loaderConfiguration, "preferred").empty();
+  return !lastValueOf(loaderConfiguration, "preferred").empty();
 }
 
 void sortAsShown(std::vector<LoaderEntry>& entries) {

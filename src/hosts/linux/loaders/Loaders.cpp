@@ -4,6 +4,7 @@
 
 #include <algorithm>
 
+#include "base/Path.h"
 #include "base/Text.h"
 #include "hosts/linux/firmware/EfiBytes.h"
 #include "hosts/linux/firmware/EfiDevicePath.h"
@@ -21,10 +22,6 @@ struct Target {
   std::string options;
 };
 
-std::string folderOf(const std::string& path) {
-  return path.substr(0, path.rfind('/'));
-}
-
 /// From the top of the partition.
 Result<std::string> pathOf(const std::string& file) {
   auto path = withSlashes(file);
@@ -35,7 +32,7 @@ Result<std::string> pathOf(const std::string& file) {
 }
 
 /// Options as they are stored, in UTF-16, or as text.
-std::string textOf(const std::string& options) {
+std::string textOfOptions(const std::string& options) {
   const bool isWide = options.size() > 1 && options[1] == '\0';
   auto text = isWide ? fromUtf16(options) : options;
   std::erase(text, '\0');
@@ -44,7 +41,7 @@ std::string textOf(const std::string& options) {
 
 /// What a shim starts: the file that its options name first (README of shim), else the loader beside it.
 Result<Target> nextOf(const EfiProgram& shim, const Target& target) {
-  auto words = split(textOf(target.options), " \t");
+  auto words = split(textOfOptions(target.options), " \t");
   if (words.empty()) return Target{folderOf(target.path) + "/" + shim.nextLoader, ""};
   const auto first = words.front();
   if (!lowerCased(first).ends_with(".efi")) return notProven(target.path, "the options of shim name no loader");
@@ -83,7 +80,7 @@ LoaderReading readUnifiedImage(const Volumes& volumes, const Volume& partition, 
                                const EfiProgram& program) {
   LoaderReading reading;
   reading.loader = "unified image";
-  reading.next = startOfUnifiedImage(volumes, partition, target.path, program, textOf(target.options));
+  reading.next = startOfUnifiedImage(volumes, partition, target.path, program, textOfOptions(target.options));
   reading.lasting = reading.next;
   if (reading.next) reading.starts.push_back(*reading.next);
   return reading;

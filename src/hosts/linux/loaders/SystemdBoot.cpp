@@ -21,8 +21,8 @@ constexpr const char* extendedBootPartition = "bc13c2ff-59e6-4262-a352-b275fd6f7
 constexpr const char* configurationPath = "/loader/loader.conf";
 constexpr const char* entriesFolder = "/loader/entries";
 constexpr const char* imagesFolder = "/EFI/Linux";
-constexpr std::size_t longestFile = 65536;
-constexpr std::size_t mostEntries = 200;
+constexpr std::size_t longestEntry = 65536;
+constexpr std::size_t mostEntriesRead = 200;
 
 bool endsIgnoringCase(const std::string& text, std::string_view ending) {
   return text.size() > ending.size() && lowerCased(text).ends_with(ending);
@@ -33,7 +33,7 @@ bool isMatch(const std::string& pattern, const std::string& id) {
 }
 
 /// From the volume's top, in the usual writing; empty when it is no path of that kind.
-std::string pathOf(const std::string& program) {
+std::string programPath(const std::string& program) {
   auto path = withSlashes(program);
   const auto parts = split(path, "/");
   return path.starts_with('/') && std::ranges::find(parts, "..") == parts.end() ? path : "";
@@ -98,7 +98,7 @@ class Menu {
       if (const auto isRead = readImages(*volume); !isRead) return isRead.failure();
     }
     sortAsShown(_entries);
-    const auto configuration = orEmpty(_volumes.read(_partition, configurationPath, longestFile));
+    const auto configuration = orEmpty(_volumes.read(_partition, configurationPath, longestEntry));
     if (!configuration) return configuration.failure();
     if (hasPreferredEntry(*configuration)) return notProven(configurationPath, "it prefers an entry by assessment");
     _pattern = defaultEntryIn(*configuration);
@@ -133,11 +133,11 @@ class Menu {
     if (!names) return names.failure();
     for (const auto& name : *names) {
       if (!endsIgnoringCase(name, ".conf") || beginsIgnoringCase(name, "auto-") || name.starts_with('.')) continue;
-      const auto text = _volumes.read(volume, std::string(entriesFolder) + "/" + name, longestFile);
+      const auto text = _volumes.read(volume, std::string(entriesFolder) + "/" + name, longestEntry);
       if (!text) return text.failure();
       auto entry = parseLoaderEntry(name, *text, Quotes::removed);
       if (!entry || isOfAnotherMachine(*entry)) continue;
-      const auto path = pathOf(entry->program);
+      const auto path = programPath(entry->program);
       // It shows no entry whose program is not there.
       const auto isThere = path.empty() ? Result<bool>(true) : _volumes.isThere(volume, path);
       if (!isThere) return isThere.failure();
@@ -149,7 +149,7 @@ class Menu {
   Result<void> readImages(const Volume& volume) {
     const auto names = orEmpty(_volumes.list(volume, imagesFolder));
     if (!names) return names.failure();
-    if (names->size() > mostEntries) return notProven(imagesFolder, "there are too many files");
+    if (names->size() > mostEntriesRead) return notProven(imagesFolder, "there are too many files");
     const auto files = _volumes.filesOf(volume);
     if (!files) return files.failure();
     for (const auto& name : *names) {
@@ -168,12 +168,12 @@ class Menu {
   }
 
   Result<void> roomLeft() const {
-    if (_entries.size() > mostEntries) return notProven(entriesFolder, "there are too many entries");
+    if (_entries.size() > mostEntriesRead) return notProven(entriesFolder, "there are too many entries");
     return {};
   }
 
   Result<SystemStart> startOf(const LoaderEntry& entry) const {
-    const auto path = pathOf(entry.program);
+    const auto path = programPath(entry.program);
     if (path.empty()) return notProven(entry.id, "its program has no absolute path");
     const auto* volume = _volumes.named({entry.volume});
     const auto files = _volumes.filesOf(*volume);

@@ -12,7 +12,7 @@ namespace {
 constexpr std::string_view deviceTree = "IODeviceTree:";
 constexpr std::string_view servicePlane = "IOService:";
 constexpr const char* firmwareTree = "/sys/firmware/devicetree/base";
-constexpr const char* devices = "/sys/devices";
+constexpr const char* allDevices = "/sys/devices";
 constexpr std::string_view sysfs = "/sys";
 constexpr std::size_t longestProperty = 4096;
 
@@ -47,8 +47,8 @@ std::optional<RegistryEntry> LinuxIORegistry::serviceNamed(const std::string& bs
 std::pair<RegistryStatus, RegistryEntry> LinuxIORegistry::parent(const RegistryEntry& entry, RegistryPlane /*plane*/) {
   auto above = entry.name;
   do above.resize(std::min(above.rfind('/'), above.size()));
-  while (above.size() > std::string_view(devices).size() && !isDevice(above));
-  return {0, {above.starts_with(devices) ? above : devices}};
+  while (above.size() > std::string_view(allDevices).size() && !isDevice(above));
+  return {0, {above.starts_with(allDevices) ? above : allDevices}};
 }
 
 std::pair<RegistryStatus, std::string> LinuxIORegistry::path(const RegistryEntry& entry, RegistryPlane plane) {

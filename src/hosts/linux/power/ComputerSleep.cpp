@@ -20,7 +20,7 @@ constexpr Daemon loginDaemon{"systemd-logind.service", "", "systemd-logind"};
 /// What the service starts to let the machine sleep.
 constexpr Daemon sleepTarget{"suspend.target", "", ""};
 constexpr const char* inputs = "/sys/class/input";
-constexpr const char* section = "Login";
+constexpr const char* loginSection = "Login";
 constexpr const char* action = "IdleAction";
 constexpr const char* actionTime = "IdleActionSec";
 constexpr const char* powerKey = "HandlePowerKey";
@@ -110,17 +110,17 @@ Result<bool> ComputerSleep::liveButton() {
 }
 
 Result<Minutes> ComputerSleep::storedMinutes() const {
-  const auto word = _config.last(section, action);
+  const auto word = _config.last(loginSection, action);
   if (!word) return word.failure();
-  const auto time = _config.last(section, actionTime);
+  const auto time = _config.last(loginSection, actionTime);
   if (!time) return time.failure();
   return minutesOf(*word ? (*word)->value : "", time->value_or(SystemdConfig::Assignment{}));
 }
 
 Result<std::optional<Minutes>> ComputerSleep::ownMinutes() const {
-  const auto word = _config.own(section, action);
+  const auto word = _config.own(loginSection, action);
   if (!word) return word.failure();
-  const auto time = _config.own(section, actionTime);
+  const auto time = _config.own(loginSection, actionTime);
   if (!time) return time.failure();
   if (!*word) return std::nullopt;
   const auto minutes = minutesOf(**word, {_ownFile.path(), time->value_or("")});
@@ -129,13 +129,13 @@ Result<std::optional<Minutes>> ComputerSleep::ownMinutes() const {
 }
 
 Result<bool> ComputerSleep::storedButton() const {
-  const auto word = _config.last(section, powerKey);
+  const auto word = _config.last(loginSection, powerKey);
   if (!word) return word.failure();
   return *word && isSleep((*word)->value);
 }
 
 Result<std::optional<bool>> ComputerSleep::ownButton() const {
-  const auto word = _config.own(section, powerKey);
+  const auto word = _config.own(loginSection, powerKey);
   if (!word) return word.failure();
   return *word ? std::optional(isSleep(**word)) : std::nullopt;
 }
@@ -199,14 +199,14 @@ std::string ComputerSleep::whatBlocksSleep() {
 
 std::string ComputerSleep::whatHidesMinutes(Minutes asked) const {
   const auto isAction = [asked](const std::string& word) { return isSleep(word) != asked.isNever(); };
-  auto file = _config.whatHides(section, action, isAction).valueOr("");
+  auto file = _config.whatHides(loginSection, action, isAction).valueOr("");
   if (!file.empty() || asked.isNever()) return file;
-  return _config.whatHides(section, actionTime, [asked](const auto& time) { return minutesIn(time) == asked; })
+  return _config.whatHides(loginSection, actionTime, [asked](const auto& time) { return minutesIn(time) == asked; })
       .valueOr("");
 }
 
 std::string ComputerSleep::whatHidesButton(bool sleeps) const {
-  return _config.whatHides(section, powerKey, [sleeps](const auto& word) { return isSleep(word) == sleeps; })
+  return _config.whatHides(loginSection, powerKey, [sleeps](const auto& word) { return isSleep(word) == sleeps; })
       .valueOr("");
 }
 
@@ -214,7 +214,7 @@ Result<void> ComputerSleep::store(const std::map<std::string, std::string>& valu
                                   const std::function<Result<bool>()>& isHeeded,
                                   const std::function<std::string()>& hidingFile) {
   return _ownFile.changeIfHeeded(
-      {.write = [&] { return _config.setOwn(section, values); }, .isHeeded = isHeeded, .hidingFile = hidingFile});
+      {.write = [&] { return _config.setOwn(loginSection, values); }, .isHeeded = isHeeded, .hidingFile = hidingFile});
 }
 
 Result<void> ComputerSleep::storeMinutes(Minutes asked) {

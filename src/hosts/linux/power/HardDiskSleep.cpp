@@ -18,7 +18,7 @@ std::string milliseconds(Minutes minutes) {
   return std::to_string(std::chrono::milliseconds(minutes.duration()).count());
 }
 
-Result<std::optional<Minutes>> minutesOf(const SysDevice& disk) {
+Result<std::optional<Minutes>> timerOf(const SysDevice& disk) {
   const auto mode = orGone(disk.read(control));
   if (!mode) return mode.failure();
   const auto time = orGone(disk.read(delay));
@@ -33,7 +33,7 @@ Result<void> setMinutes(const SysDevice& disk, Minutes minutes) {
   return disk.write(control, "auto");
 }
 
-std::string ruleFor(Minutes minutes) {
+std::string diskRule(Minutes minutes) {
   const std::string disks =
       R"(ACTION=="add|change", SUBSYSTEM=="block", KERNEL=="sd*", ENV{DEVTYPE}=="disk", ATTR{removable}=="0", )"
       R"(ATTR{queue/rotational}=="1", )";
@@ -68,7 +68,7 @@ Result<bool> canStop(const SysDevice& disk) {
 }  // namespace
 
 HardDiskSleep::HardDiskSleep(const LinuxMachine& machine)
-    : _machine(machine), _rule(machine.root, "disk-sleep", ruleFor) {}
+    : _machine(machine), _rule(machine.root, "disk-sleep", diskRule) {}
 
 Result<std::optional<HardDiskSleep::Disk>> HardDiskSleep::stoppableDisk(const std::string& name) const {
   if (!name.starts_with("sd")) return std::nullopt;
@@ -93,7 +93,7 @@ Support HardDiskSleep::supported() const {
 
 Setting<Minutes>::Found HardDiskSleep::live() const {
   const auto found =
-      readingOfAll(ofEach(disks(), [](const Disk& disk) { return on(disk.name, minutesOf(disk.device)); }));
+      readingOfAll(ofEach(disks(), [](const Disk& disk) { return on(disk.name, timerOf(disk.device)); }));
   if (!found) return found.failure();
   return found->value_or(Minutes{});
 }

@@ -22,8 +22,8 @@
 namespace tavisk {
 namespace {
 
-constexpr const char* section = "Manager";
-constexpr const char* key = "RuntimeWatchdogSec";
+constexpr const char* managerSection = "Manager";
+constexpr const char* watchdogKey = "RuntimeWatchdogSec";
 constexpr const char* watchdogFacts = "/sys/class/watchdog/watchdog0/";
 constexpr const char* panicFile = "/proc/sys/kernel/panic";
 constexpr std::chrono::seconds watchdogTime{60};
@@ -61,7 +61,7 @@ std::optional<bool> isWatchdogTime(const std::string& text) {
 
 Result<bool> usesWatchdog(const SystemdConfig::Assignment& time) {
   const auto is = isWatchdogTime(time.value);
-  if (!is) return Failure{"read " + std::string(key), time.file, "no length of time: " + time.value};
+  if (!is) return Failure{"read " + std::string(watchdogKey), time.file, "no length of time: " + time.value};
   return *is;
 }
 
@@ -141,13 +141,13 @@ Result<bool> RestartAfterFreeze::isPanicStored() const {
 }
 
 Result<bool> RestartAfterFreeze::isWatchdogStored() const {
-  const auto time = _config.last(section, key);
+  const auto time = _config.last(managerSection, watchdogKey);
   if (!time) return time.failure();
   return *time ? usesWatchdog(**time) : false;
 }
 
 Result<std::optional<bool>> RestartAfterFreeze::isWatchdogInOwn() const {
-  const auto time = _config.own(section, key);
+  const auto time = _config.own(managerSection, watchdogKey);
   if (!time) return time.failure();
   if (!*time) return std::nullopt;
   const auto uses = usesWatchdog({_watchdogFile.path(), **time});
@@ -204,7 +204,7 @@ Result<void> RestartAfterFreeze::storeWatchdog(bool restarts) const {
   const auto time = restarts ? std::to_string(watchdogTime.count()) : "off";
   return _watchdogFile.changeIfHeeded({.write =
                                            [&] {
-                                             return _config.setOwn(section, {{key, time}});
+                                             return _config.setOwn(managerSection, {{watchdogKey, time}});
                                            },
                                        .isHeeded = isHeeded,
                                        .hidingFile = [&] { return whatHidesWatchdog(restarts); }});
@@ -274,7 +274,7 @@ Result<void> RestartAfterFreeze::apply(bool restarts) const {
 
 std::string RestartAfterFreeze::whatHidesWatchdog(bool restarts) const {
   const auto isAsAsked = [restarts](const std::string& time) { return isWatchdogTime(time) == restarts; };
-  return _config.whatHides(section, key, isAsAsked).valueOr("");
+  return _config.whatHides(managerSection, watchdogKey, isAsAsked).valueOr("");
 }
 
 std::string RestartAfterFreeze::whatUndoes(bool restarts) const {

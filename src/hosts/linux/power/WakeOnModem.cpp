@@ -34,7 +34,7 @@ Result<std::optional<bool>> wakes(const SysDevice& place) {
   return *word ? std::optional(**word == enabled) : std::nullopt;
 }
 
-std::string ruleFor(bool wakes) {
+std::string serialPortRule(bool wakes) {
   return R"(ACTION!="remove", SUBSYSTEM=="pnp", DRIVER=="serial", TEST=="power/wakeup", ATTR{power/wakeup}=")" +
          std::string(wordFor(wakes)) + "\"";
 }
@@ -42,7 +42,7 @@ std::string ruleFor(bool wakes) {
 }  // namespace
 
 WakeOnModem::WakeOnModem(const LinuxMachine& machine)
-    : _machine(machine), _rule(machine.root, "wake-on-ring", ruleFor) {}
+    : _machine(machine), _rule(machine.root, "wake-on-ring", serialPortRule) {}
 
 Result<std::optional<WakeOnModem::Port>> WakeOnModem::wakingPort(const std::string& terminal) const {
   if (!terminal.starts_with("ttyS")) return std::nullopt;

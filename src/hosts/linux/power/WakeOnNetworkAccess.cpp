@@ -34,8 +34,8 @@ static_assert(magicPacket == WAKE_MAGIC);
 
 constexpr const char* cardFolder = "/sys/class/net/";
 constexpr const char* usualLinkFile = "99-default.link";
-constexpr const char* section = "Link";
-constexpr const char* key = "WakeOnLan";
+constexpr const char* linkSection = "Link";
+constexpr const char* wakeKey = "WakeOnLan";
 constexpr const char* never = "off";
 constexpr const char* magic = "magic";
 
@@ -168,9 +168,9 @@ Setting<bool>::Found WakeOnNetworkAccess::stored() const {
   std::vector<std::pair<std::string, bool>> waiting;
   for (const auto& file : *files) {
     const auto config = configOf(_machine.root, file);
-    const auto word = config.last(section, key);
+    const auto word = config.last(linkSection, wakeKey);
     if (!word) return word.failure();
-    const auto own = config.own(section, key);
+    const auto own = config.own(linkSection, wakeKey);
     if (!own) return own.failure();
     const auto wakes = *word ? std::optional((*word)->value != never) : std::nullopt;
     all.push_back({file, wakes});
@@ -185,20 +185,20 @@ Setting<bool>::Found WakeOnNetworkAccess::stored() const {
 
 std::string WakeOnNetworkAccess::whatHides(const std::string& linkFile, bool wakes) const {
   const auto isAsAsked = [wakes](const std::string& word) { return (word != never) == wakes; };
-  return configOf(_machine.root, linkFile).whatHides(section, key, isAsAsked).valueOr("");
+  return configOf(_machine.root, linkFile).whatHides(linkSection, wakeKey, isAsAsked).valueOr("");
 }
 
 Result<void> WakeOnNetworkAccess::storeIn(const std::string& linkFile, bool wakes, WrittenPlaces& written) const {
   const auto config = configOf(_machine.root, linkFile);
   const auto isHeeded = [&]() -> Result<bool> {
-    const auto word = config.last(section, key);
+    const auto word = config.last(linkSection, wakeKey);
     if (!word) return word.failure();
     return *word && ((*word)->value != never) == wakes;
   };
-  const std::map<std::string, std::string> values{{key, wakes ? magic : never}};
+  const std::map<std::string, std::string> values{{wakeKey, wakes ? magic : never}};
   const OwnFile own(_machine.root, config.ownDropIn());
   return own.noting(written, [&] {
-    return own.changeIfHeeded({.write = [&] { return config.setOwn(section, values); },
+    return own.changeIfHeeded({.write = [&] { return config.setOwn(linkSection, values); },
                                .isHeeded = isHeeded,
                                .hidingFile = [&] { return whatHides(linkFile, wakes); }});
   });

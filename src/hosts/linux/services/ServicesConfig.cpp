@@ -23,8 +23,7 @@ constexpr std::string_view criticalTargets[] = {
 constexpr std::string_view criticalPrefixes[] = {"systemd-", "dbus.", "dbus-", "user@", "init."};
 
 bool isUnitCharacter(char c) {
-  return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') ||
-         std::string_view("@:._-").find(c) != std::string_view::npos;
+  return isLetterOrDigit(c) || std::string_view("@:._-").find(c) != std::string_view::npos;
 }
 
 bool isUnitName(const std::string& unit) {

@@ -117,7 +117,7 @@ std::string terminal() {
 
 bool isUserId(const std::string& text) {
   constexpr const char* unset = "4294967295";
-  return !text.empty() && text != unset && std::ranges::all_of(text, [](char c) { return c >= '0' && c <= '9'; });
+  return !text.empty() && text != unset && std::ranges::all_of(text, isDigit);
 }
 
 /// Anyone can set the variable; of root it is believed.

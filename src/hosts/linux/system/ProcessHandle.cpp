@@ -11,7 +11,7 @@
 namespace tavisk {
 namespace {
 
-Failure failureOf(const char* tried, ProcessId process, int error) {
+Failure processFailure(const char* tried, ProcessId process, int error) {
   return systemFailure(tried, "process " + std::to_string(process), error);
 }
 
@@ -19,13 +19,13 @@ Failure failureOf(const char* tried, ProcessId process, int error) {
 
 Result<ProcessHandle> ProcessHandle::of(ProcessId process) {
   FileDescriptor file(static_cast<int>(::syscall(SYS_pidfd_open, process, 0)));
-  if (!file) return failureOf("pidfd_open", process, errno);
+  if (!file) return processFailure("pidfd_open", process, errno);
   return ProcessHandle(process, std::move(file));
 }
 
 Result<void> ProcessHandle::send(int signal) const {
   if (::syscall(SYS_pidfd_send_signal, _file.number(), signal, nullptr, 0) == 0) return {};
-  return failureOf("pidfd_send_signal", _process, errno);
+  return processFailure("pidfd_send_signal", _process, errno);
 }
 
 }  // namespace tavisk

@@ -107,7 +107,7 @@ struct LoaderLook::Shared {
   void tell(std::size_t index, Findings findings) {
     const std::scoped_lock lock(mutex);
     parts[index].findings = std::move(findings);
-    static_cast<void>(::write(told.number(), "", 1));
+    static_cast<void>(!::write(told.number(), "", 1));
   }
 
   LoaderSurroundings surroundings;

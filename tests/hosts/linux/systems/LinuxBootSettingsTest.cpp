@@ -264,6 +264,7 @@ TEST_F(LinuxBootSettingsTest, HasNoChoiceUnderOtherFirmware) {
 }
 
 TEST_F(LinuxBootSettingsTest, LosesNothingAndTellsNothingUntrueWhicheverCallFailsOrIsItsLast) {
+  if (!canTraceCalls()) GTEST_SKIP() << "calls cannot be traced here";
   tree.setOrder({0, 7});
   const auto before = tree.allVariables();
   const auto order = std::string("BootOrder-") + efiGlobalVendor;

@@ -1,0 +1,11 @@
+# Gives a target the sources of the folders. In a unity build those of one folder are compiled as one.
+function(tavisk_add_folders target)
+  file(GLOB sources CONFIGURE_DEPENDS RELATIVE ${CMAKE_CURRENT_SOURCE_DIR} ${ARGN})
+  foreach(source IN LISTS sources)
+    cmake_path(GET source PARENT_PATH folder)
+    string(MAKE_C_IDENTIFIER ${folder} group)
+    set_source_files_properties(${source} PROPERTIES UNITY_GROUP ${group})
+  endforeach()
+  target_sources(${target} PRIVATE ${sources})
+  set_target_properties(${target} PROPERTIES UNITY_BUILD_MODE GROUP)
+endfunction()
