@@ -11,7 +11,7 @@
 namespace tavisk::control {
 namespace {
 
-constexpr const char* task = "read the words of tavisk";
+constexpr const char* readWords = "read the words of tavisk";
 
 /// Where a wish stands among the others; those of one rank keep the order in which settings are shown.
 int rankOf(const ManagedSetting& setting, const std::string& value) {
@@ -40,12 +40,12 @@ Result<std::vector<Step>> stepsOf(std::span<const std::string> words) {
     const auto& word = words.front();
     const auto* entry = table.findTyped(word);
     const auto taken = entry ? static_cast<std::size_t>(1 + entry->arguments) : 1;
-    if (!entry) return Failure{task, word, "there is no such word"};
-    if (words.size() < taken) return Failure{task, word, "its value is missing"};
+    if (!entry) return Failure{readWords, word, "there is no such word"};
+    if (words.size() < taken) return Failure{readWords, word, "its value is missing"};
     const auto own = words.first(taken);
-    if (!std::ranges::all_of(own, isUtf8)) return Failure{task, word, "its value is no text in UTF-8"};
+    if (!std::ranges::all_of(own, isUtf8)) return Failure{readWords, word, "its value is no text in UTF-8"};
     const auto asked = taken > 1 ? askedBy(word, own.back()) : std::vector<AskedValue>();
-    if (asked.empty()) return Failure{task, word, "it sets nothing"};
+    if (asked.empty()) return Failure{readWords, word, "it sets nothing"};
     steps.push_back({asked, {own.begin(), own.end()}});
     words = words.subspan(taken);
   }

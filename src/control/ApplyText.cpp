@@ -18,7 +18,7 @@ std::string outcomeOf(const AppliedSetting& applied) {
   return applied.reason.empty() ? name : name + ": " + applied.reason;
 }
 
-void add(TextTable& table, const AppliedSetting& applied) {
+void addApplied(TextTable& table, const AppliedSetting& applied) {
   table.addRow({escaped(applied.setting->name), shownAny(applied.before, applied.unit),
                 shownAny(applied.after, applied.unit), outcomeOf(applied)});
   for (const auto& note : applied.notes) table.addRemark(escaped(note));
@@ -29,29 +29,21 @@ void add(TextTable& table, const AppliedSetting& applied) {
     table.addRemark("may be undone by " + escaped(applied.undoneBy));
 }
 
-void addIfKnown(JsonObject& object, std::string_view name, const std::optional<std::string>& value) {
-  if (value) object.text(name, *value);
-}
-
-void addIfAny(JsonObject& object, std::string_view name, const std::string& value) {
-  if (!value.empty()) object.text(name, value);
-}
-
-std::string toJson(const AppliedSetting& applied) {
+std::string jsonOf(const AppliedSetting& applied) {
   JsonObject object;
   object.text("setting", applied.setting->name);
-  addIfKnown(object, "wanted", applied.wanted);
-  addIfKnown(object, "before", applied.before);
-  addIfKnown(object, "after", applied.after);
-  addIfKnown(object, "stored", applied.stored);
-  addIfAny(object, "unit", applied.unit);
+  object.textIfKnown("wanted", applied.wanted);
+  object.textIfKnown("before", applied.before);
+  object.textIfKnown("after", applied.after);
+  object.textIfKnown("stored", applied.stored);
+  object.textUnlessEmpty("unit", applied.unit);
   object.text("outcome", nameOf(applied.verdict));
-  addIfAny(object, "reason", applied.reason);
+  object.textUnlessEmpty("reason", applied.reason);
   object.boolean("changed", applied.isChanged).boolean("lasts", applied.lasts);
-  addIfAny(object, "undoneBy", applied.undoneBy);
+  object.textUnlessEmpty("undoneBy", applied.undoneBy);
   std::string notes;
   for (const auto& note : applied.notes) notes.append(notes.empty() ? "" : "; ").append(note);
-  addIfAny(object, "note", notes);
+  object.textUnlessEmpty("note", notes);
   return object.str();
 }
 
@@ -60,13 +52,13 @@ std::string toJson(const AppliedSetting& applied) {
 std::string appliedTable(std::span<const AppliedSetting> settings) {
   TextTable table;
   table.addRow({"Setting", "Was", "Is", "Outcome"});
-  for (const auto& applied : settings) add(table, applied);
+  for (const auto& applied : settings) addApplied(table, applied);
   return table.str();
 }
 
 std::string appliedJson(std::span<const AppliedSetting> settings, bool isDone) {
   std::vector<std::string> outcomes;
-  std::ranges::transform(settings, std::back_inserter(outcomes), toJson);
+  std::ranges::transform(settings, std::back_inserter(outcomes), jsonOf);
   JsonObject object;
   object.integer("apply", 1).boolean("done", isDone);
   object.boolean("changed", std::ranges::any_of(settings, &AppliedSetting::isChanged));

@@ -113,7 +113,7 @@ Value meantBy(ValueKind kind, const WrittenValue& written, const std::string& un
   return textMeantBy(written);
 }
 
-const char* expectedOf(ValueKind kind) {
+const char* expectation(ValueKind kind) {
   switch (kind) {
     case ValueKind::moment:
       return "a number of seconds since 1970, or a text such as \"2026-11-22 16:30:00\", is expected";
@@ -187,7 +187,7 @@ Value askedOf(const ManagedSetting& setting, const std::string& argument) {
 
 Result<std::string> valueMeantBy(const ManagedSetting& setting, const WrittenValue& written, const std::string& unit) {
   auto value = meantBy(setting.kind, written, unit);
-  if (!value) return Failure{"read", std::string(setting.name), expectedOf(setting.kind)};
+  if (!value) return Failure{"read", std::string(setting.name), expectation(setting.kind)};
   return std::move(*value);
 }
 

@@ -47,15 +47,11 @@ void add(TextTable& table, const SettingState& state) {
   for (const auto& failure : state.failures) table.addRemark("failed: " + describe(failure));
 }
 
-void addIfAny(JsonObject& object, std::string_view name, const std::string& value) {
-  if (!value.empty()) object.text(name, value);
-}
-
 std::string toJson(const Failure& failure) {
   JsonObject object;
-  addIfAny(object, "tried", failure.tried);
-  addIfAny(object, "on", failure.on);
-  addIfAny(object, "why", failure.why);
+  object.textUnlessEmpty("tried", failure.tried);
+  object.textUnlessEmpty("on", failure.on);
+  object.textUnlessEmpty("why", failure.why);
   return object.str();
 }
 
@@ -71,9 +67,9 @@ std::string toJson(const SettingState& state) {
   object.boolean("supported", !value.unsupported);
   if (value.live) object.text("live", *value.live);
   if (value.stored) object.text("stored", *value.stored);
-  addIfAny(object, "unit", value.unit);
-  addIfAny(object, "where", value.where);
-  addIfAny(object, "undoneBy", value.undoneBy);
+  object.textUnlessEmpty("unit", value.unit);
+  object.textUnlessEmpty("where", value.where);
+  object.textUnlessEmpty("undoneBy", value.undoneBy);
   if (!value.facts.empty()) object.json("facts", toJson(value.facts));
   if (value.unsupported) object.json("unsupported", toJson(*value.unsupported));
   std::vector<std::string> failures;

@@ -20,7 +20,7 @@ namespace {
 using Json = nlohmann::ordered_json;
 
 constexpr std::size_t largestFile = 1U << 20U;
-constexpr const char* task = "read what is wanted";
+constexpr const char* readWanted = "read what is wanted";
 
 /// The names of each object that is open while a text is read.
 class NamesOnce {
@@ -51,11 +51,11 @@ Result<Json> parsed(std::string_view text, const std::string& name) {
   NamesOnce names;
   try {
     auto json = Json::parse(text, std::ref(names), true, true);
-    if (names.twice()) return Failure{task, name, *names.twice() + " stands there twice"};
-    if (!json.is_object()) return Failure{task, name, "an object of settings and their values is expected"};
+    if (names.twice()) return Failure{readWanted, name, *names.twice() + " stands there twice"};
+    if (!json.is_object()) return Failure{readWanted, name, "an object of settings and their values is expected"};
     return json;
   } catch (const Json::parse_error& error) {
-    return Failure{task, name, placeAndReason(error)};
+    return Failure{readWanted, name, placeAndReason(error)};
   }
 }
 
@@ -115,17 +115,18 @@ Result<std::vector<WantedSetting>> wantedIn(std::string_view text, const std::st
   if (!json) return json.failure();
   const auto status = json->find("settings");
   const auto& members = status == json->end() ? *json : *status;
-  if (!members.is_object()) return Failure{task, name, "settings: an object is expected"};
+  if (!members.is_object()) return Failure{readWanted, name, "settings: an object is expected"};
   std::vector<WantedSetting> wanted;
   for (const auto& [key, member] : members.items()) {
     const auto* setting = settingMeantBy(key);
     if (isLeftOut(setting, member)) continue;
-    if (!setting) return Failure{task, name, "there is no setting " + key};
+    if (!setting) return Failure{readWanted, name, "there is no setting " + key};
     if (std::ranges::find(wanted, setting, &WantedSetting::setting) != wanted.end())
-      return Failure{task, name, std::string(setting->name) + " stands there twice"};
-    if (isTwofold(member)) return Failure{task, name, key + ": live and stored differ; leave out what is not wanted"};
+      return Failure{readWanted, name, std::string(setting->name) + " stands there twice"};
+    if (isTwofold(member))
+      return Failure{readWanted, name, key + ": live and stored differ; leave out what is not wanted"};
     auto found = wantedBy(*setting, member);
-    if (!found) return Failure{task, name, key + ": " + found.failure().why};
+    if (!found) return Failure{readWanted, name, key + ": " + found.failure().why};
     wanted.push_back(std::move(found).value());
   }
   return wanted;
@@ -136,7 +137,7 @@ Result<std::vector<WantedSetting>> wantedInFile(const std::string& path) {
   const FileDescriptor file(isInput ? ::fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, 0)
                                     : ::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NOCTTY));
   const std::string name = isInput ? "standard input" : path;
-  if (!file) return systemFailure(task, name, errno);
+  if (!file) return systemFailure(readWanted, name, errno);
   const auto text = readAll(file, largestFile, name);
   if (!text) return text.failure();
   return wantedIn(*text, name);

@@ -58,11 +58,6 @@ std::string reasonOf(const WordResult& result) {
   return worst != result.effects.end() ? describe(*worst->failure) : escaped(trimmed(result.printed));
 }
 
-bool lasts(const std::optional<std::string>& live, const std::optional<std::string>& stored,
-           const std::string& undoneBy) {
-  return undoneBy.empty() && (!live || !stored || *live == *stored);
-}
-
 WordRunner::WordRunner(Host& host, EffectSink& effects, RunLoop& runLoop)
     : _effects(effects), _frame(host, runLoop), _settings(_frame.context(), effects, &_gatherer) {
   _effects.addChannel(_gatherer);

@@ -44,10 +44,6 @@ Verdict verdictOf(const Effect& effect);
 /// Why it is refused, not supported or has failed, for people; empty when it is none of these.
 std::string reasonOf(const WordResult& result);
 
-/// Whether what a change or a getter found in force is what will be after a restart, as far as anybody knows.
-bool lasts(const std::optional<std::string>& live, const std::optional<std::string>& stored,
-           const std::string& undoneBy);
-
 /// Runs words of tavisk on a machine as tavisk runs them, after its administrator check and under its authorization,
 /// one after the other. What they print is kept, and nobody is asked for confirmation.
 class WordRunner final {
