@@ -32,7 +32,7 @@ class Startup(server.Server):
     def __init__(self):
         self._monitor_path = trees.WORK / "startup-monitor"
         devices = _devices(trees.WORK / "startup-disks", self._monitor_path)
-        super().__init__("startup", ["efibootmgr", "strace"], devices)
+        super().__init__("startup", ["e2fsprogs", "efibootmgr", "strace"], devices)
 
     def equip(self, tree):
         lines = [f"LABEL={label} {point.replace(' ', chr(92) + '040')} {kind} nofail,X-mount.mkdir 0 0\n"
