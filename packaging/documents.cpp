@@ -9,8 +9,9 @@
 //   @kind      for each kind of argument that has words: kind, words
 //   @key       for each key of a machine file: path, type, default, meaning; all for roff
 //   @setting   for each setting that a machine can refuse: name, for roff
-//   @control   for each command of taviskctl: name, summary, options (its own)
-//   @option    for each option of such a command: command, name, long (without hyphens), summary
+//   @control   for each command of taviskctl: name, summary, kind (of its operands: settings, words), options (its own)
+//   @option    for each option of such a command: command, name, long (without hyphens), kind (of its value: file,
+//              none), summary
 //   @common    for each option that all of them have: name, long, summary
 //   @managed   for each setting that taviskctl shows: name, word (as it is typed)
 // {newline} ends a line of a mark's.
@@ -155,6 +156,7 @@ std::vector<Row> settingRows() {
 Row optionRow(const control::OptionRow& option) {
   return {{"{name}", std::string(option.name)},
           {"{long}", std::string(option.name.substr(option.name.find_first_not_of('-')))},
+          {"{kind}", option.value.empty() ? "none" : "file"},
           {"{summary}", std::string(option.summary)}};
 }
 
@@ -177,8 +179,10 @@ std::vector<Row> controlRows() {
   for (const auto& command : control::commandRows()) {
     std::string options;
     for (const auto& option : command.options) options.append(options.empty() ? "" : " ").append(option.name);
-    rows.push_back(
-        {{"{name}", std::string(command.name)}, {"{summary}", std::string(command.summary)}, {"{options}", options}});
+    rows.push_back({{"{name}", std::string(command.name)},
+                    {"{summary}", std::string(command.summary)},
+                    {"{kind}", command.kind == control::OperandKind::words ? "words" : "settings"},
+                    {"{options}", options}});
   }
   return rows;
 }

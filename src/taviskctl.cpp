@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include <unistd.h>
 
+#include <algorithm>
+#include <atomic>
 #include <cerrno>
 #include <cstdio>
 #include <exception>
@@ -23,6 +25,15 @@ void complainOfControl(std::string_view text) {
   static_cast<void>(std::fprintf(stderr, "taviskctl: %.*s\n", static_cast<int>(text.size()), text.data()));
 }
 
+/// Over the line that stands there, without a newline. Also a terminal that knows no commands goes back to its margin.
+void showProgress(std::string_view text) {
+  static std::atomic<std::size_t> shown = 0;
+  const auto width = shown.exchange(text.size());
+  const auto rest = static_cast<int>(std::max(width, text.size()) - text.size());
+  static_cast<void>(std::fprintf(stderr, "\r%.*s%*s%s", static_cast<int>(text.size()), text.data(), rest, "",
+                                 text.empty() ? "\r" : ""));
+}
+
 /// Who closes the pipe early has seen enough, and is not told.
 Status afterOutput(Output& output, Status status) {
   const auto lostBy = output.finish();
@@ -32,10 +43,12 @@ Status afterOutput(Output& output, Status status) {
 }
 
 Status runOn(Output& output, const std::vector<std::string>& words) {
-  const HostRemark remark = isatty(STDERR_FILENO) != 0 ? complainOfControl : HostRemark();
+  const bool isWatched = isatty(STDERR_FILENO) != 0;
+  const HostRemark remark = isWatched ? complainOfControl : HostRemark();
+  const auto progress = isWatched ? showProgress : control::ShowProgress();
   const auto openHost = [&](EffectSink& effects, RunLoop& runLoop) { return openChosenHost(effects, runLoop, remark); };
   try {
-    return control::run(words, {openHost, output, complainOfControl});
+    return control::run(words, {openHost, output, complainOfControl, progress});
   } catch (const Output::Lost&) {
     return Status::incomplete;  // afterOutput() says why
   }

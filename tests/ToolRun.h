@@ -39,7 +39,7 @@ inline std::string textOf(std::FILE* stream) {
 struct RunOptions {
   std::string_view typed = {};  ///< standard input
   LineSource* input = nullptr;  ///< instead of it
-  Report* report = nullptr;     ///< must be a channel of the machine's effects already
+  RunRecord* report = nullptr;  ///< must be a channel of the machine's effects already
   std::string_view commandTable = CommandTable::text();
   std::FILE* output = nullptr;  ///< instead of ToolResult::output
   std::chrono::milliseconds longestCommand{15000};

@@ -58,6 +58,14 @@ JsonObject& JsonObject::text(std::string_view name, std::string_view value) {
   return *this;
 }
 
+JsonObject& JsonObject::textIfKnown(std::string_view name, const std::optional<std::string>& value) {
+  return value ? text(name, *value) : *this;
+}
+
+JsonObject& JsonObject::textUnlessEmpty(std::string_view name, std::string_view value) {
+  return value.empty() ? *this : text(name, value);
+}
+
 JsonObject& JsonObject::integer(std::string_view name, std::int64_t value) {
   return json(name, std::to_string(value));
 }

@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <initializer_list>
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -17,6 +18,9 @@ class JsonObject {
   /// Written into the room of the text, which is dropped: no memory is asked for as long as that suffices.
   explicit JsonObject(std::string room = {}) : _members(std::move(room)) { _members.assign(1, '{'); }
   JsonObject& text(std::string_view name, std::string_view value);
+  /// Nothing where there is none, or the empty one.
+  JsonObject& textIfKnown(std::string_view name, const std::optional<std::string>& value);
+  JsonObject& textUnlessEmpty(std::string_view name, std::string_view value);
   JsonObject& integer(std::string_view name, std::int64_t value);
   JsonObject& boolean(std::string_view name, bool value);
   /// A value that is JSON already: an object, an array.

@@ -20,10 +20,19 @@ constexpr OptionRow statusOptions[] = {
     {"--json", "Print one JSON object instead of a table."},
 };
 
+constexpr OptionRow applyOptions[] = {
+    {"--from", "Take settings and values from a JSON file; '-' is standard input.", "FILE"},
+    {"--skip-unsupported", "What this machine cannot have does not count."},
+    {"--allow-lockout", "Turn remote login off too, where that is asked for."},
+    {"--json", "Print one JSON object instead of a table."},
+};
+
 constexpr CommandRow commands[] = {
     {"status", "[SETTING...]", OperandKind::settings,
      "Show settings: what is in force, what will be after a restart, where it is kept and what may undo it.",
      statusOptions},
+    {"apply", "WORDS... | --from FILE", OperandKind::words,
+     "Give settings the values asked for, where they differ, and tell what became of each.", applyOptions},
 };
 
 const OptionRow* findOption(std::span<const OptionRow> options, std::string_view name) {

@@ -16,7 +16,7 @@ namespace tavisk::control {
 struct OptionRow {
   std::string_view name;  ///< "--json"
   std::string_view summary;
-  std::string_view value = "";  ///< how the help names its value, "FILE"; empty: it has none
+  std::string_view value = {};  ///< how the help names its value, "FILE"; empty: it has none
 };
 
 /// What stands in the place of a command's operands.

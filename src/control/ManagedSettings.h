@@ -7,11 +7,23 @@
 
 namespace tavisk::control {
 
+/// What the values of a setting are.
+enum class ValueKind {
+  moment,        ///< seconds since 1970, set by a date and a time of day
+  onOff,         ///< a switch: "on", "off"
+  minutes,       ///< a number of them, of which 0 is never
+  startupDelay,  ///< units of 30 seconds, set in seconds
+  architecture,  ///< of the kernel
+  text,          ///< a name, an address
+  startupDisk,   ///< a disk, set by its folder or its name
+};
+
 /// A setting as the words of tavisk reach it.
 struct ManagedSetting {
   std::string_view name;    ///< as effects and reports call it
   std::string_view getter;  ///< a word of the command table, "-gettimezone"
   std::string_view setter;
+  ValueKind kind;
   /// Its getter looks at every disk, which takes seconds: only when it is asked for.
   bool isSearched = false;
 };

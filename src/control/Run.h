@@ -11,6 +11,7 @@
 #include "base/Result.h"
 #include "base/RunLoop.h"
 #include "control/CommandLine.h"
+#include "control/ProgressLine.h"
 #include "effects/EffectSink.h"
 #include "frontend/Output.h"
 #include "platform/Host.h"
@@ -30,6 +31,7 @@ struct Tools {
   std::function<Result<std::unique_ptr<Host>>(EffectSink& effects, RunLoop& runLoop)> openHost;
   Output& output;                                  ///< standard output
   std::function<void(std::string_view)> complain;  ///< one line on standard error
+  ShowProgress showProgress = {};                  ///< empty: nobody watches
 };
 
 /// Does what the words after the program's name ask for.

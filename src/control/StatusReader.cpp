@@ -6,39 +6,18 @@
 
 #include <algorithm>
 #include <cerrno>
-#include <cstdio>
 #include <memory>
 #include <stdexcept>
 #include <utility>
 #include <variant>
 
-#include "base/NotificationCenter.h"
 #include "base/Text.h"
+#include "control/SilentFrame.h"
 #include "frontend/HandlerRegistry.h"
 #include "frontend/ServerCommands.h"
 
 namespace tavisk::control {
 namespace {
-
-/// Getters ask nobody.
-class NoInput final : public LineSource {
- public:
-  std::optional<std::string> readLine(const std::string& /*prompt*/, std::size_t /*room*/) override {
-    return std::nullopt;
-  }
-  void restoreTerminal() override {}
-};
-
-struct CloseStream {
-  void operator()(std::FILE* stream) const { static_cast<void>(std::fclose(stream)); }
-};
-using Stream = std::unique_ptr<std::FILE, CloseStream>;
-
-Stream nowhere() {
-  Stream stream(std::fopen("/dev/null", "we"));
-  if (!stream) throw std::runtime_error("/dev/null cannot be opened");
-  return stream;
-}
 
 void get(ServerCommands& commands, const CommandTable& table, std::string_view getter) {
   const auto* entry = table.find(std::string(getter));
@@ -65,20 +44,20 @@ bool isManaged(const std::string& name) {
 
 std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSetting*>& settings, Host& host,
                                              RunLoop& runLoop) {
-  auto table = CommandTable::parse(CommandTable::text());
-  if (!table) throw std::logic_error(describe(table.failure()));
-  const auto words = std::make_shared<const CommandTable>(std::move(table).value());
-  const auto stream = nowhere();
-  Output output(stream.get());
-  NoInput input;
-  NotificationCenter notifications;
-  const CommandContext context{host, runLoop, notifications, output, input};
-  ServerCommands commands(words, context);
+  const auto words = std::make_shared<const CommandTable>(productTable());
+  SilentFrame frame(host, runLoop);
+  ServerCommands commands(words, frame.context());
+  return read(settings, [&](const ManagedSetting& setting) {
+    const auto limit = runLoop.limitWaits(frame.context().longestCommand);
+    get(commands, *words, setting.getter);
+  });
+}
+
+std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSetting*>& settings, const Get& get) {
   for (const auto* setting : settings) {
     _current = setting;
     stateOf(std::string(setting->name));
-    const auto limit = runLoop.limitWaits(context.longestCommand);
-    get(commands, *words, setting->getter);
+    get(*setting);
   }
   _current = nullptr;
   return std::exchange(_states, {});

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -25,6 +26,9 @@ class StatusReader final : public EffectChannel {
   /// For each of the settings its own state, then those that its getter told besides and that no setting is named for.
   /// The host tells its effects to a sink of which this is a channel.
   std::vector<SettingState> read(const std::vector<const ManagedSetting*>& settings, Host& host, RunLoop& runLoop);
+  /// The same by who calls a setting's getter.
+  using Get = std::function<void(const ManagedSetting& setting)>;
+  std::vector<SettingState> read(const std::vector<const ManagedSetting*>& settings, const Get& get);
 
   void record(const Effect& effect) override;
   void observe(const SettingValue& value) override;

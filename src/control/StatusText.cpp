@@ -2,28 +2,20 @@
 // SPDX-License-Identifier: MIT
 #include "control/StatusText.h"
 
-#include <algorithm>
 #include <array>
+#include <cstdint>
 #include <cstdio>
 #include <string_view>
 
 #include "base/Calendar.h"
 #include "base/Json.h"
 #include "base/Text.h"
+#include "control/TextTable.h"
 
 namespace tavisk::control {
 namespace {
 
-constexpr std::string_view nothing = "-";
-constexpr std::size_t columns = 4;
-using Cells = std::array<std::string, columns>;
-
-/// Of a table: cells, or a text across all but the first of them; and what stands below.
-struct Line {
-  Cells cells;
-  std::string across;
-  std::vector<std::string> below;
-};
+constexpr const char* nothing = "-";
 
 std::string shownTime(std::int64_t secondsSince1970) {
   const auto local = localDateTime(secondsSince1970);
@@ -39,67 +31,27 @@ std::string shownUnits(std::int64_t units) {
   return std::to_string(static_cast<std::int64_t>(static_cast<std::uint64_t>(units) * secondsInUnit)) + " seconds";
 }
 
-std::string shown(const std::optional<std::string>& value, const std::string& unit) {
-  return value && !value->empty() ? escaped(shownValue(*value, unit)) : std::string(nothing);
-}
-
-Line lineOf(const SettingState& state) {
+void add(TextTable& table, const SettingState& state) {
   const auto& value = state.value;
-  Line line;
-  line.cells[0] = escaped(value.setting);
   const bool isKnown = value.live || value.stored;
   if (value.unsupported) {
-    line.across = "not supported: " + describe(*value.unsupported);
+    table.addRow({escaped(value.setting), "not supported: " + describe(*value.unsupported)});
   } else if (!isKnown && !state.failures.empty()) {
-    line.across = "not known";
+    table.addRow({escaped(value.setting), "not known"});
   } else {
-    line.cells[1] = shown(value.live, value.unit);
-    line.cells[2] = shown(value.stored, value.unit);
-    line.cells[3] = value.where.empty() ? nothing : escaped(value.where);
+    table.addRow({escaped(value.setting), shownAny(value.live, value.unit), shownAny(value.stored, value.unit),
+                  value.where.empty() ? nothing : escaped(value.where)});
   }
-  for (const auto& [name, fact] : value.facts) line.below.push_back(escaped(name) + ": " + escaped(fact));
-  if (!value.undoneBy.empty()) line.below.push_back("may be undone by " + escaped(value.undoneBy));
-  for (const auto& failure : state.failures) line.below.push_back("failed: " + describe(failure));
-  return line;
-}
-
-std::size_t widthOf(std::string_view text) {
-  return static_cast<std::size_t>(std::ranges::count_if(text, [](char c) { return !isContinuation(c); }));
-}
-
-std::array<std::size_t, columns> widthsOf(std::span<const Line> lines) {
-  std::array<std::size_t, columns> widths{};
-  for (const auto& line : lines)
-    for (std::size_t i = 0; i < columns; ++i) widths[i] = std::max(widths[i], widthOf(line.cells[i]));
-  return widths;
-}
-
-void pad(std::string& text, const std::string& cell, std::size_t width) {
-  constexpr std::size_t gap = 2;
-  text.append(cell).append(width - widthOf(cell) + gap, ' ');
-}
-
-void append(std::string& text, const Line& line, const std::array<std::size_t, columns>& widths) {
-  if (line.across.empty()) {
-    for (std::size_t i = 0; i + 1 < columns; ++i) pad(text, line.cells[i], widths[i]);
-    text += line.cells.back();
-  } else {
-    pad(text, line.cells.front(), widths.front());
-    text += line.across;
-  }
-  text += '\n';
-  for (const auto& remark : line.below) text.append("  ").append(remark).append("\n");
-}
-
-void addIfAny(JsonObject& object, std::string_view name, const std::string& value) {
-  if (!value.empty()) object.text(name, value);
+  for (const auto& [name, fact] : value.facts) table.addRemark(escaped(name) + ": " + escaped(fact));
+  if (!value.undoneBy.empty()) table.addRemark("may be undone by " + escaped(value.undoneBy));
+  for (const auto& failure : state.failures) table.addRemark("failed: " + describe(failure));
 }
 
 std::string toJson(const Failure& failure) {
   JsonObject object;
-  addIfAny(object, "tried", failure.tried);
-  addIfAny(object, "on", failure.on);
-  addIfAny(object, "why", failure.why);
+  object.textUnlessEmpty("tried", failure.tried);
+  object.textUnlessEmpty("on", failure.on);
+  object.textUnlessEmpty("why", failure.why);
   return object.str();
 }
 
@@ -115,9 +67,9 @@ std::string toJson(const SettingState& state) {
   object.boolean("supported", !value.unsupported);
   if (value.live) object.text("live", *value.live);
   if (value.stored) object.text("stored", *value.stored);
-  addIfAny(object, "unit", value.unit);
-  addIfAny(object, "where", value.where);
-  addIfAny(object, "undoneBy", value.undoneBy);
+  object.textUnlessEmpty("unit", value.unit);
+  object.textUnlessEmpty("where", value.where);
+  object.textUnlessEmpty("undoneBy", value.undoneBy);
   if (!value.facts.empty()) object.json("facts", toJson(value.facts));
   if (value.unsupported) object.json("unsupported", toJson(*value.unsupported));
   std::vector<std::string> failures;
@@ -138,13 +90,15 @@ std::string shownValue(const std::string& value, const std::string& unit) {
   return value + " " + (*number == 1 && unit == "minutes" ? "minute" : unit);
 }
 
+std::string shownAny(const std::optional<std::string>& value, const std::string& unit) {
+  return value && !value->empty() ? escaped(shownValue(*value, unit)) : nothing;
+}
+
 std::string statusTable(std::span<const SettingState> states) {
-  std::vector<Line> lines{{.cells = {"Setting", "Now", "After a restart", "Kept in"}, .across = {}, .below = {}}};
-  std::ranges::transform(states, std::back_inserter(lines), lineOf);
-  const auto widths = widthsOf(lines);
-  std::string text;
-  for (const auto& line : lines) append(text, line, widths);
-  return text;
+  TextTable table;
+  table.addRow({"Setting", "Now", "After a restart", "Kept in"});
+  for (const auto& state : states) add(table, state);
+  return table.str();
 }
 
 std::string statusJson(std::span<const SettingState> states) {

@@ -7,18 +7,10 @@
 namespace tavisk {
 namespace {
 
-void addIfKnown(JsonObject& object, std::string_view name, const std::optional<std::string>& value) {
-  if (value) object.text(name, *value);
-}
-
-void addIfAny(JsonObject& object, std::string_view name, const std::string& value) {
-  if (!value.empty()) object.text(name, value);
-}
-
 void addFailure(JsonObject& object, const Failure& failure) {
-  addIfAny(object, "tried", failure.tried);
-  addIfAny(object, "on", failure.on);
-  addIfAny(object, "why", failure.why);
+  object.textUnlessEmpty("tried", failure.tried);
+  object.textUnlessEmpty("on", failure.on);
+  object.textUnlessEmpty("why", failure.why);
 }
 
 }  // namespace
@@ -40,13 +32,13 @@ const char* nameOf(Outcome outcome) {
 std::string toJson(const Effect& effect) {
   JsonObject object;
   object.text("setting", effect.setting).text("outcome", nameOf(effect.outcome));
-  addIfKnown(object, "before", effect.before);
-  addIfKnown(object, "asked", effect.asked);
-  addIfKnown(object, "live", effect.live);
-  addIfKnown(object, "stored", effect.stored);
-  addIfAny(object, "where", effect.where);
-  addIfAny(object, "undoneBy", effect.undoneBy);
-  addIfAny(object, "note", effect.note);
+  object.textIfKnown("before", effect.before);
+  object.textIfKnown("asked", effect.asked);
+  object.textIfKnown("live", effect.live);
+  object.textIfKnown("stored", effect.stored);
+  object.textUnlessEmpty("where", effect.where);
+  object.textUnlessEmpty("undoneBy", effect.undoneBy);
+  object.textUnlessEmpty("note", effect.note);
   if (effect.failure) addFailure(object, *effect.failure);
   return object.str();
 }
@@ -54,9 +46,9 @@ std::string toJson(const Effect& effect) {
 std::string toJson(const SettingValue& value) {
   JsonObject object;
   object.text("setting", value.setting);
-  addIfKnown(object, "live", value.live);
-  addIfKnown(object, "stored", value.stored);
-  addIfAny(object, "unit", value.unit);
+  object.textIfKnown("live", value.live);
+  object.textIfKnown("stored", value.stored);
+  object.textUnlessEmpty("unit", value.unit);
   if (value.unsupported) {
     object.boolean("supported", false);
     addFailure(object, *value.unsupported);

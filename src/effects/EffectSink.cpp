@@ -27,6 +27,11 @@ void EffectSink::addChannel(EffectChannel& channel) {
   _channels.push_back(&channel);
 }
 
+void EffectSink::removeChannel(const EffectChannel& channel) {
+  const std::scoped_lock lock(_mutex);
+  std::erase(_channels, &channel);
+}
+
 void EffectSink::changeBegins(const std::string& setting, const std::string& asked) {
   const std::scoped_lock lock(_mutex);
   _open.push_back({setting, asked});

@@ -35,8 +35,9 @@ Effect unfinishedChange(const std::string& setting, const std::string& asked, co
 /// begun and not ended, so that a run which is ended in the middle leaves its trace.
 class EffectSink {
  public:
-  /// The channel is not owned and must outlive the sink's last use.
+  /// The channel is not owned and must outlive the sink's last use, or be removed.
   void addChannel(EffectChannel& channel);
+  void removeChannel(const EffectChannel& channel);
 
   void changeBegins(const std::string& setting, const std::string& asked);
   /// The end of the change that began under this name, or a failed read.

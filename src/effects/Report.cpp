@@ -77,7 +77,7 @@ void Report::commandEnds(bool failed, const std::string& output) {
 void Report::wordRefused(const std::string& word, bool failed, const std::string& output) {
   auto entry = takeEntry();
   entry.command = word;
-  entry.refused = "a command that -printcommands lists";
+  entry.refused = wordExpected;
   entry.error = "not a valid command";
   append(std::move(entry), failed, output);
 }
@@ -132,15 +132,12 @@ Report::Entry Report::takeEntry() {
 std::string Report::toJson(std::string room, const Entry& entry, bool failed, const std::string& output) {
   JsonObject object(std::move(room));
   object.integer("report", 1);
-  const auto textIfPresent = [&](const char* name, const std::optional<std::string>& value) {
-    if (value) object.text(name, *value);
-  };
-  textIfPresent("command", entry.command);
-  textIfPresent("argument", entry.argument);
-  textIfPresent("handler", entry.handler);
-  textIfPresent("refused", entry.refused);
-  textIfPresent("error", entry.error);
-  textIfPresent("signal", entry.signal);
+  object.textIfKnown("command", entry.command);
+  object.textIfKnown("argument", entry.argument);
+  object.textIfKnown("handler", entry.handler);
+  object.textIfKnown("refused", entry.refused);
+  object.textIfKnown("error", entry.error);
+  object.textIfKnown("signal", entry.signal);
   object.boolean("failed", failed);
   object.boolean("changed", entry.changed || !entry.unfinished.empty());
   object.array("values", {entry.values});

@@ -16,6 +16,7 @@
 #include "base/FileDescriptor.h"
 #include "base/Result.h"
 #include "effects/EffectSink.h"
+#include "effects/RunRecord.h"
 
 namespace tavisk {
 
@@ -40,26 +41,20 @@ namespace tavisk {
 ///   output     the printed text, at most its first MiB
 /// Where there is no memory for an object, its argument, values, effects and output are left out.
 /// Texts that are not UTF-8 have U+FFFD for the bytes in question.
-class Report final : public EffectChannel {
+class Report final : public EffectChannel, public RunRecord {
  public:
   /// `destination` is the path of a regular file, which is made (mode 0600) or appended to and must not be a link, or
   /// "fd:N" for a descriptor that is open for writing; that one is not closed here, but in programs that are started.
   static Result<std::unique_ptr<Report>> open(const std::string& destination);
 
-  /// From here to the end, effects and values belong to this command.
-  void commandBegins(const std::string& command, std::span<const std::string> arguments, const std::string& handler);
-  /// That the command took no argument but what is `expected`; from the thread that runs it.
-  void argumentRefused(const std::string& expected);
-  /// Does nothing when no command has begun.
-  void commandEnds(bool failed, const std::string& output);
-  void wordRefused(const std::string& word, bool failed, const std::string& output);
-  /// Also of a run that is broken off.
-  void runRefused(const std::string& error, const std::string& output);
-  /// From any thread.
-  void runEndedBySignal(const std::string& signal, bool failed, const std::string& output);
-
-  /// Whether an object could not be kept. From any thread.
-  bool isLost() const { return _isLost; }
+  void commandBegins(const std::string& command, std::span<const std::string> arguments,
+                     const std::string& handler) override;
+  void argumentRefused(const std::string& expected) override;
+  void commandEnds(bool failed, const std::string& output) override;
+  void wordRefused(const std::string& word, bool failed, const std::string& output) override;
+  void runRefused(const std::string& error, const std::string& output) override;
+  void runEndedBySignal(const std::string& signal, bool failed, const std::string& output) override;
+  bool isLost() const override { return _isLost; }
 
   void changeBegins(const std::string& setting, const std::string& asked) override;
   void record(const Effect& effect) override;

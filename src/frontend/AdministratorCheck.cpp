@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
 #include <algorithm>
-#include <chrono>
 
 #include "frontend/RemoteServerSettings.h"
 
@@ -27,11 +26,10 @@ bool RemoteServerSettings::authenticate() {
   if (!myIsAuthenticatedAsAdministrator()) {
     _context.output.putLine("You need administrator access to run this tool... exiting!");
     _context.host.authenticator().noteRefusal();
-    if (_context.report) _context.report->runRefused("not an administrator", _context.output.takePrinted());
+    if (_context.record) _context.record->runRefused("not an administrator", _context.output.takePrinted());
     return false;
   }
   takeAuthorization();
-  _startUp = _context.runLoop.after(std::chrono::seconds(0), [this] { adminDidAuthenticateNotification(); });
   return true;
 }
 

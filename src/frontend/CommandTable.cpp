@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "base/PropertyList.h"
+#include "base/Text.h"
 
 namespace tavisk {
 namespace {
@@ -96,6 +97,11 @@ Result<CommandTable> CommandTable::parse(std::string_view xml) {
 const CommandTable::Entry* CommandTable::find(const std::string& word) const {
   const auto entry = _entries.find(word);
   return entry == _entries.end() ? nullptr : &entry->second;
+}
+
+const CommandTable::Entry* CommandTable::findTyped(const std::string& word) const {
+  const auto key = lowerCased(word);
+  return find(key.starts_with('-') ? key : "-" + key);
 }
 
 }  // namespace tavisk

@@ -26,6 +26,8 @@ class CommandTable final {
 
   /// Null when the word is unknown.
   const Entry* find(const std::string& word) const;
+  /// The same of a word as users type it: in any case, and without its dash too.
+  const Entry* findTyped(const std::string& word) const;
   const std::unordered_map<std::string, Entry>& entries() const { return _entries; }
 
  private:

@@ -68,7 +68,7 @@ void RemoteServerSettings::parseCommand(const std::vector<std::string>& words) {
 
 std::optional<std::size_t> RemoteServerSettings::runFirst(std::span<const std::string> words) {
   const auto& word = words.front();
-  const auto* entry = findCommand(word);
+  const auto* entry = _commandDict->findTyped(word);
   if (!entry) {
     refuseWord(word);
     return std::nullopt;
@@ -88,27 +88,22 @@ std::optional<std::size_t> RemoteServerSettings::runFirst(std::span<const std::s
   return 1 + count;
 }
 
-const CommandTable::Entry* RemoteServerSettings::findCommand(const std::string& word) const {
-  const auto key = lowerCased(word);
-  return _commandDict->find(key.starts_with('-') ? key : "-" + key);
-}
-
 void RemoteServerSettings::callHandler(const std::string& word, const CommandTable::Entry& entry,
                                        std::span<const std::string> arguments) {
-  if (_context.report) {
+  if (_context.record) {
     _context.output.takePrinted();
-    _context.report->commandBegins(word, arguments, entry.selector);
+    _context.record->commandBegins(word, arguments, entry.selector);
   }
   const auto limit = _context.runLoop.limitWaits(_context.longestCommand);
   std::visit(Call{*_serverCommands, arguments}, handlerNamed(entry.selector));
-  if (_context.report) _context.report->commandEnds(_serverCommands->error(), _context.output.takePrinted());
+  if (_context.record) _context.record->commandEnds(_serverCommands->error(), _context.output.takePrinted());
   _effects.commandEnds();
 }
 
 void RemoteServerSettings::refuseWord(const std::string& word) {
   _context.output.takePrinted();
   _context.output.print("Error: %s is not a valid command\n", word.c_str());
-  if (_context.report) _context.report->wordRefused(word, _serverCommands->error(), _context.output.takePrinted());
+  if (_context.record) _context.record->wordRefused(word, _serverCommands->error(), _context.output.takePrinted());
   _effects.commandEnds();
 }
 

@@ -3,6 +3,7 @@
 #include "frontend/RemoteServerSettings.h"
 
 #include <cerrno>
+#include <chrono>
 #include <exception>
 #include <system_error>
 #include <thread>
@@ -11,11 +12,11 @@
 
 namespace tavisk {
 
-RemoteServerSettings::RemoteServerSettings(const CommandContext& context, EffectSink& effects, Report* report,
+RemoteServerSettings::RemoteServerSettings(const CommandContext& context, EffectSink& effects, RunRecord* record,
                                            std::string_view commandTable)
     : _context(context), _effects(effects), _commandTable(commandTable) {
-  _context.report = report;
-  if (_context.report) _context.output.keepPrinted();
+  _context.record = record;
+  if (_context.record) _context.output.keepPrinted();
 }
 
 RemoteServerSettings::~RemoteServerSettings() {
@@ -24,11 +25,33 @@ RemoteServerSettings::~RemoteServerSettings() {
 
 bool RemoteServerSettings::runTool(int argc, char** withArguments) {
   bool isStarted = false;
-  safely([&] { isStarted = setUp(argc, withArguments); });
+  safely([&] {
+    if (!setUp()) return;
+    setPromptUser(true);
+    _interactive = argc == 1;
+    if (!_interactive) {
+      _argc = argc;
+      _argv = withArguments;
+    }
+    _startUp = _context.runLoop.after(std::chrono::seconds(0), [this] { adminDidAuthenticateNotification(); });
+    isStarted = true;
+  });
   return isStarted;
 }
 
-bool RemoteServerSettings::setUp(int argc, char** withArguments) {
+bool RemoteServerSettings::startWithoutLoop() {
+  bool isStarted = false;
+  safely([&] { isStarted = setUp(); });
+  return isStarted;
+}
+
+std::optional<std::size_t> RemoteServerSettings::runOne(std::span<const std::string> words) {
+  std::optional<std::size_t> taken;
+  safely([&] { taken = runFirst(words); });
+  return taken;
+}
+
+bool RemoteServerSettings::setUp() {
   if (!loadCommands() || !authenticate()) {
     exit();
     return false;
@@ -38,12 +61,6 @@ bool RemoteServerSettings::setUp(int argc, char** withArguments) {
     _serverCommands = std::make_unique<ServerCommands>(_commandDict, _context);
   }
   _serverCommands->setParent(this);
-  setPromptUser(true);
-  _interactive = argc == 1;
-  if (!_interactive) {
-    _argc = argc;
-    _argv = withArguments;
-  }
   return true;
 }
 
@@ -66,7 +83,7 @@ void RemoteServerSettings::deauthenticate() {
 }
 
 void RemoteServerSettings::exit() {
-  if (_context.report) _context.report->commandEnds(hasFailed(), _context.output.takePrinted());
+  if (_context.record) _context.record->commandEnds(hasFailed(), _context.output.takePrinted());
   _exitStatus = statusSoFar();
   const auto lostBy = _context.output.finish();
   if (lostBy && *lostBy != EPIPE) {
@@ -96,7 +113,7 @@ void RemoteServerSettings::breakOff(std::string_view why) {
   doStep([this] { giveUpAuthorization(); });
   doStep([&] { _effects.interrupt(std::string(why)); });
   doStep([&] {
-    if (_context.report) _context.report->runRefused(std::string(why), _context.output.takePrinted());
+    if (_context.record) _context.record->runRefused(std::string(why), _context.output.takePrinted());
   });
   _context.output.finish();
   complain(why);
@@ -110,7 +127,7 @@ bool RemoteServerSettings::hasFailed() const {
 }
 
 int RemoteServerSettings::statusSoFar() const {
-  return hasFailed() || (_context.report && _context.report->isLost()) ? 1 : 0;
+  return hasFailed() || (_context.record && _context.record->isLost()) ? 1 : 0;
 }
 
 void RemoteServerSettings::endedBySignal(const std::string& signal) {
@@ -121,7 +138,7 @@ void RemoteServerSettings::endedBySignal(const std::string& signal) {
   doStep([&] { givingUp = std::jthread([this] { doStep([this] { giveUpAuthorization(); }); }); });
   doStep([&] { _effects.interrupt("the run was ended by " + signal); });
   doStep([&] {
-    if (_context.report) _context.report->runEndedBySignal(signal, hasFailed(), _context.output.takePrinted());
+    if (_context.record) _context.record->runEndedBySignal(signal, hasFailed(), _context.output.takePrinted());
   });
   _context.output.finish();
   if (!givingUp.joinable()) doStep([this] { giveUpAuthorization(); });

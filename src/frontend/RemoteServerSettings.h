@@ -14,7 +14,7 @@
 #include <vector>
 
 #include "effects/EffectSink.h"
-#include "effects/Report.h"
+#include "effects/RunRecord.h"
 #include "frontend/CommandTable.h"
 #include "frontend/ServerCommands.h"
 
@@ -23,8 +23,8 @@ namespace tavisk {
 /// One run of the tool, from the administrator check to the exit status.
 class RemoteServerSettings final {
  public:
-  /// Nothing is owned; `report` is null when none was asked for. The command table is given for tests.
-  RemoteServerSettings(const CommandContext& context, EffectSink& effects, Report* report,
+  /// Nothing is owned; `record` is null when none is kept. The command table is given for tests.
+  RemoteServerSettings(const CommandContext& context, EffectSink& effects, RunRecord* record,
                        std::string_view commandTable = CommandTable::text());
   ~RemoteServerSettings();
   RemoteServerSettings(const RemoteServerSettings&) = delete;
@@ -33,6 +33,12 @@ class RemoteServerSettings final {
   /// As main received them; the words must outlive the run. True: the run loop is to run now, and the run stops it at
   /// its end. False: the run is over.
   bool runTool(int argc, char** withArguments);
+  /// The same for who hands over one command after the other instead, and then ends the run with deauthenticate().
+  /// Nobody is asked for confirmation. False: the run is over.
+  bool startWithoutLoop();
+  /// Runs the first of the words with its arguments. How many words it took; absent when it was refused, or the run
+  /// broken off, and the rest is to be dropped.
+  std::optional<std::size_t> runOne(std::span<const std::string> words);
   /// Gives the authorization up and ends the run.
   void deauthenticate();
   /// Whether handlers may ask the user for confirmation.
@@ -49,7 +55,7 @@ class RemoteServerSettings final {
   int statusSoFar() const;
 
  private:
-  bool setUp(int argc, char** withArguments);
+  bool setUp();
   void startLoop();
   void executeTool();
   /// Completes report and standard output, sets the exit status, stops the run loop.
@@ -77,7 +83,6 @@ class RemoteServerSettings final {
   void parseCommand(const std::vector<std::string>& words);
   /// Runs the first of the words. How many words it took; absent when it was refused and the rest is to be dropped.
   std::optional<std::size_t> runFirst(std::span<const std::string> words);
-  const CommandTable::Entry* findCommand(const std::string& word) const;
   void callHandler(const std::string& word, const CommandTable::Entry& entry, std::span<const std::string> arguments);
   void refuseWord(const std::string& word);
 

@@ -4,7 +4,6 @@
 
 #include <utility>
 
-#include "effects/Report.h"
 #include "frontend/RemotePrefsExtra.h"
 
 namespace tavisk {
@@ -15,7 +14,7 @@ ServerCommands::ServerCommands(std::shared_ptr<const CommandTable> commandDict, 
 ServerCommands::~ServerCommands() = default;
 
 void ServerCommands::refuse(const std::string& expected) {
-  if (_context.report) _context.report->argumentRefused(expected);
+  if (_context.record) _context.record->argumentRefused(expected);
 }
 
 bool ServerCommands::checkForEmptyString(const std::string& value, const char* command, const char* withInfo,

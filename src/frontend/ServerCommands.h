@@ -10,6 +10,7 @@
 
 #include "base/NotificationCenter.h"
 #include "base/RunLoop.h"
+#include "effects/RunRecord.h"
 #include "frontend/CommandTable.h"
 #include "frontend/LineSource.h"
 #include "frontend/Output.h"
@@ -18,7 +19,6 @@
 namespace tavisk {
 
 class RemoteServerSettings;
-class Report;
 class SpecialPMUSettings;
 class SDController;
 class StartupDisk;
@@ -31,7 +31,7 @@ struct CommandContext {
   Output& output;
   LineSource& input;
   RunLoop::Clock::duration longestCommand = std::chrono::seconds(15);  ///< with all its waits, questions excepted
-  Report* report = nullptr;                                            ///< absent: none is kept
+  RunRecord* record = nullptr;                                         ///< absent: none is kept
 };
 
 /// Every command is a member function of this one object, reached by the name that the command table gives.
@@ -52,7 +52,7 @@ class ServerCommands final {
 
   /// The frame of the handlers
   const CommandContext& context() const { return _context; }
-  /// Tells the report that the argument is not taken, and what is expected in its place.
+  /// Tells the record that the argument is not taken, and what is expected in its place.
   void refuse(const std::string& expected);
   /// True when the value is empty: then the usage was printed and the error flag set.
   bool checkForEmptyString(const std::string& value, const char* command, const char* withInfo, const char* andUseage);

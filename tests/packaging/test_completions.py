@@ -45,6 +45,13 @@ CONTROL_CASES = [
     ("--v", ["--version"]),
     ("status --", ["--all", "--help", "--json", "--version"]),
     ("status --all tim", ["time", "time-zone"]),
+    ("apply --", ["--allow-lockout", "--from", "--help", "--json", "--skip-unsupported", "--version"]),
+    ("apply --json -gett", ["-gettime", "-gettimezone"]),
+    ("apply SETT", ["settime", "settimezone"]),
+    ("apply -settimezone europe/par", ["Europe/Paris"]),
+    ("apply -f -setcomputersleep 5 -setusingnetworktime ", ["Off", "On"]),
+    ("apply --from want", ["wanted.json"]),
+    ("apply --from wanted.json --j", ["--json"]),
 ]
 
 
@@ -69,6 +76,8 @@ def main(program, documents, sources):
     stop_without_terminals()
     with tempfile.TemporaryDirectory() as folder:
         machine = shutil.copytree(pathlib.Path(sources, "packaging/machines/two-systems"), pathlib.Path(folder, "m"))
+        pathlib.Path(folder, "wanted.json").touch()
+        os.chdir(folder)
         environment = {**os.environ, "PATH": f"{pathlib.Path(program).parent}:{os.environ['PATH']}", "TERM": "dumb",
                        "TAVISK_HOST": f"scratch:{machine}"}
         wrong = [*wrong_offers("tavisk", [*CASES, ("-", command_words(environment) + NOT_IN_HELP)], documents, environment),

@@ -1,0 +1,52 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "control/ApplyPlan.h"
+#include "control/StatusReader.h"
+#include "control/WordRunner.h"
+#include "platform/Host.h"
+
+namespace tavisk::control {
+
+/// What became of a setting. A text that is absent is not known or does not apply.
+struct AppliedSetting {
+  const ManagedSetting* setting;
+  std::string unit = {};  ///< see SettingValue
+  std::optional<std::string> wanted = {};
+  std::optional<std::string> before = {};  ///< in force, else stored
+  std::optional<std::string> after = {};   ///< the same, read again
+  std::optional<std::string> stored = {};  ///< what will be after a restart
+  Verdict verdict = Verdict::unchanged;
+  std::string reason = {};  ///< why it is refused, not supported or has failed; harmless for a terminal
+  std::string undoneBy = {};
+  std::vector<std::string> notes = {};
+  bool isChanged = false;  ///< the machine differs from before, whatever the verdict
+  bool lasts = true;       ///< it will be so after a restart, as far as anybody knows
+};
+
+/// Gives a machine what is asked for, by the words of tavisk, where it differs.
+class Applier final {
+ public:
+  /// Nothing is owned. Both tell of this host.
+  Applier(Host& host, WordRunner& runner, StatusReader& reader) : _host(host), _runner(runner), _reader(reader) {}
+
+  /// Looks at the settings of the step, runs its words unless all is as it is asked for, and looks again. One for each
+  /// setting.
+  std::vector<AppliedSetting> apply(const Step& step);
+  SettingState stateOf(const ManagedSetting& setting);
+
+ private:
+  std::vector<SettingState> statesOf(const Step& step);
+  std::vector<std::vector<std::string>> wordsOf(const Step& step, const SettingState& state);
+
+  Host& _host;
+  WordRunner& _runner;
+  StatusReader& _reader;
+};
+
+}  // namespace tavisk::control

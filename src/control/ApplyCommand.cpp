@@ -1,0 +1,103 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <algorithm>
+
+#include "base/Process.h"
+#include "control/Applier.h"
+#include "control/ApplyText.h"
+#include "control/Commands.h"
+#include "effects/SettingNames.h"
+
+namespace tavisk::control {
+namespace {
+
+Result<std::vector<Step>> wantedSteps(const Invocation& invocation) {
+  const bool isFile = invocation.has("--from");
+  const bool areWords = !invocation.operands.empty() && invocation.operands != std::vector<std::string>{"-f"};
+  if (isFile == areWords)
+    return Failure{"either words of tavisk or --from FILE are expected", "", "type 'taviskctl apply --help'"};
+  if (!isFile) return stepsOf(invocation.operands);
+  const auto wanted = wantedInFile(invocation.options.at("--from"));
+  if (!wanted) return wanted.failure();
+  return stepsFor(*wanted);
+}
+
+bool isOff(const SettingState& state) {
+  return state.value.unsupported || (state.value.live == "off" && state.value.stored.value_or("off") == "off");
+}
+
+/// Who has no way in already does not lose one.
+bool wouldLockOut(std::span<const Step> steps, Applier& applier) {
+  return std::ranges::any_of(steps, mayLockOut) && !isOff(applier.stateOf(*settingMeantBy(setting::remoteLogin)));
+}
+
+std::string titleOf(const Step& step) {
+  std::string title;
+  for (const auto& asked : step.asked) title.append(title.empty() ? "" : ", ").append(asked.setting->name);
+  return title + " ...";
+}
+
+std::vector<AppliedSetting> applied(std::span<const Step> steps, Applier& applier, const ShowProgress& show) {
+  std::vector<AppliedSetting> all;
+  for (const auto& step : steps) {
+    const ProgressLine progress(show, titleOf(step));
+    std::ranges::move(applier.apply(step), std::back_inserter(all));
+  }
+  return all;
+}
+
+bool isDone(const AppliedSetting& setting, bool isUnsupportedSkipped) {
+  if (setting.verdict == Verdict::notSupported) return isUnsupportedSkipped;
+  return setting.verdict <= Verdict::applied && setting.lasts;
+}
+
+Status apply(std::span<const Step> steps, Applier& applier, const Invocation& invocation, const Tools& tools) {
+  if (!invocation.has("--allow-lockout") && wouldLockOut(steps, applier)) {
+    tools.complain("Remote Login is not turned off without --allow-lockout; nothing was changed");
+    return Status::incomplete;
+  }
+  const auto settings = applied(steps, applier, tools.showProgress);
+  const bool isUnsupportedSkipped = invocation.has("--skip-unsupported");
+  const bool areAllDone =
+      std::ranges::all_of(settings, [&](const auto& setting) { return isDone(setting, isUnsupportedSkipped); });
+  const auto text = invocation.has("--json") ? appliedJson(settings, areAllDone) + "\n" : appliedTable(settings);
+  tools.output.print("%s", text.c_str());
+  return areAllDone ? Status::done : Status::incomplete;
+}
+
+}  // namespace
+
+Status applySettings(const Invocation& invocation, const Tools& tools) {
+  const auto steps = wantedSteps(invocation);
+  if (!steps) {
+    tools.complain(describe(steps.failure()));
+    return Status::misused;
+  }
+  const EndingSignals signals;
+  EffectSink effects;
+  StatusReader reader;
+  effects.addChannel(reader);
+  RunLoop runLoop;
+  const auto host = tools.openHost(effects, runLoop);
+  if (!host) {
+    tools.complain(describe(host.failure()));
+    return Status::incomplete;
+  }
+  WordRunner runner(**host, effects, runLoop);
+  const auto waiter = SignalWaiter::start(
+      signals,
+      [&](const std::string& signal) {
+        runner.endedBySignal(signal);
+        if (tools.showProgress) tools.showProgress("");
+      },
+      [] { return static_cast<int>(Status::incomplete); });
+  if (!waiter) signals.unblock();
+  if (const auto started = runner.start(); !started) {
+    tools.complain(describe(started.failure()));
+    return Status::incomplete;
+  }
+  Applier applier(**host, runner, reader);
+  return apply(*steps, applier, invocation, tools);
+}
+
+}  // namespace tavisk::control
