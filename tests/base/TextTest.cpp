@@ -51,7 +51,8 @@ TEST(Text, escapesWhatATerminalWouldObey) {
 
 TEST(Text, takesBackOnlyWhatWasEscaped) {
   EXPECT_EQ(unescaped("a\\\\n\\nb"), "a\\n\nb");
-  for (const char* text : {"\\", "\\t", "\\x4", "\\xg0", "\\x+1", "\\u{", "\\u{}", "\\u{0041}", "\\u0080", "\\u{12345}"})
+  for (const char* text :
+       {"\\", "\\t", "\\x4", "\\xg0", "\\x+1", "\\u{", "\\u{}", "\\u{0041}", "\\u0080", "\\u{12345}"})
     EXPECT_EQ(unescaped(text), std::nullopt) << text;
 }
 

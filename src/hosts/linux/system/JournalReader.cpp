@@ -75,8 +75,7 @@ Result<JournalState> stateOf(const SystemRoot& root) {
   const auto inMemory = countReadable(root, volatileFolder + name);
   if (!inMemory) return inMemory.failure();
   if (*lasting + *inMemory == 0)
-    return Failure{tried, journal, "there is none",
-                   std::make_error_code(std::errc::no_such_file_or_directory)};
+    return Failure{tried, journal, "there is none", std::make_error_code(std::errc::no_such_file_or_directory)};
   return JournalState{.isVolatile = *lasting == 0};
 }
 
