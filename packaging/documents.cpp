@@ -9,9 +9,10 @@
 //   @kind      for each kind of argument that has words: kind, words
 //   @key       for each key of a machine file: path, type, default, meaning; all for roff
 //   @setting   for each setting that a machine can refuse: name, for roff
-//   @control   for each command of taviskctl: name, summary, kind (of its operands: settings, words), options (its own)
+//   @control   for each command of taviskctl: name, summary, kind (of its operands: settings, words, none), options
+//   (its own)
 //   @option    for each option of such a command: command, name, long (without hyphens), kind (of its value: file,
-//              none), summary
+//              time, none), summary
 //   @common    for each option that all of them have: name, long, summary
 //   @managed   for each setting that taviskctl shows: name, word (as it is typed)
 // {newline} ends a line of a mark's.
@@ -153,10 +154,22 @@ std::vector<Row> settingRows() {
   return rows;
 }
 
+const char* nameOf(control::OperandKind kind) {
+  switch (kind) {
+    case control::OperandKind::settings:
+      return "settings";
+    case control::OperandKind::none:
+      return "none";
+    case control::OperandKind::words:
+      break;
+  }
+  return "words";
+}
+
 Row optionRow(const control::OptionRow& option) {
   return {{"{name}", std::string(option.name)},
           {"{long}", std::string(option.name.substr(option.name.find_first_not_of('-')))},
-          {"{kind}", option.value.empty() ? "none" : "file"},
+          {"{kind}", option.value.empty() ? "none" : lowerCased(option.value)},
           {"{summary}", std::string(option.summary)}};
 }
 
@@ -181,7 +194,7 @@ std::vector<Row> controlRows() {
     for (const auto& option : command.options) options.append(options.empty() ? "" : " ").append(option.name);
     rows.push_back({{"{name}", std::string(command.name)},
                     {"{summary}", std::string(command.summary)},
-                    {"{kind}", command.kind == control::OperandKind::words ? "words" : "settings"},
+                    {"{kind}", nameOf(command.kind)},
                     {"{options}", options}});
   }
   return rows;

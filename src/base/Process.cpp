@@ -51,6 +51,12 @@ bool prepareProcess() {
   return openMissingDescriptors();
 }
 
+std::string newRunName() {
+  timespec now{};
+  clock_gettime(CLOCK_REALTIME, &now);
+  return std::to_string(getpid()) + "-" + std::to_string(now.tv_sec) + "." + std::to_string(now.tv_nsec);
+}
+
 void complain(std::string_view text) {
   static_cast<void>(std::fprintf(stderr, "tavisk: %.*s\n", static_cast<int>(text.size()), text.data()));
 }

@@ -21,6 +21,9 @@ namespace tavisk {
 /// limit becomes an error. Of the environment, only TAVISK_*, LANG, LC_*, TERM, NO_COLOR and SUDO_UID are kept.
 bool prepareProcess();
 
+/// What tells this run apart from all others on this machine: the process id and the time of the call.
+std::string newRunName();
+
 /// One line on standard error: "tavisk: TEXT". Asks for no memory.
 void complain(std::string_view text);
 

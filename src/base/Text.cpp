@@ -84,6 +84,36 @@ char smallLetter(char letter) {
   return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter - 'A' + 'a') : letter;
 }
 
+std::optional<std::string> byteWith(std::string_view digits) {
+  const auto byte = parseNumber<std::uint8_t>(digits, 16);
+  if (digits.size() != 2 || !byte) return std::nullopt;
+  return std::string(1, static_cast<char>(*byte));
+}
+
+std::optional<std::string> controlWith(std::string_view digits) {
+  const auto control = parseNumber<std::uint16_t>(digits, 16);
+  if (!control || !isControl(*control)) return std::nullopt;
+  std::string text;
+  appendUtf8(text, *control);
+  return text;
+}
+
+/// What the escape sequence at the front stands for; it is taken off.
+std::optional<std::string> takeEscaped(std::string_view& text) {
+  const auto take = [&text](std::size_t length) {
+    const auto taken = text.substr(0, length);
+    text.remove_prefix(taken.size());
+    return taken;
+  };
+  const auto kind = take(2);
+  if (kind == "\\\\") return "\\";
+  if (kind == "\\n") return "\n";
+  if (kind == "\\x") return byteWith(take(2));
+  const auto end = text.find('}');
+  if (kind != "\\u" || !text.starts_with('{') || end == std::string_view::npos) return std::nullopt;
+  return controlWith(take(end + 1).substr(1, end - 1));
+}
+
 }  // namespace
 
 std::size_t sequenceLength(char first) {
@@ -185,6 +215,20 @@ std::string upperCased(std::string_view text) {
   std::ranges::transform(result, result.begin(), [](char letter) {
     return letter >= 'a' && letter <= 'z' ? static_cast<char>(letter - 'a' + 'A') : letter;
   });
+  return result;
+}
+
+std::optional<std::string> unescaped(std::string_view text) {
+  std::string result;
+  while (!text.empty()) {
+    const auto plain = text.substr(0, text.find('\\'));
+    result += plain;
+    text.remove_prefix(plain.size());
+    if (text.empty()) return result;
+    const auto bytes = takeEscaped(text);
+    if (!bytes) return std::nullopt;
+    result += *bytes;
+  }
   return result;
 }
 

@@ -43,6 +43,10 @@ bool isControl(char32_t codePoint);
 /// are not UTF-8 become \xNN or \u{NNNN}, a backslash is doubled. No control byte leaves it.
 std::string escaped(std::string_view text);
 
+/// The text of which escaped() has made this, where \n may stand for a newline too; absent when it is nothing of the
+/// kind.
+std::optional<std::string> unescaped(std::string_view text);
+
 /// Of ASCII, as all below.
 constexpr bool isDigit(char byte) {
   return byte >= '0' && byte <= '9';

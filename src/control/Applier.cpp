@@ -51,11 +51,13 @@ AppliedSetting seen(const AskedValue& asked, const SettingState& before, const S
   return applied;
 }
 
-/// What is in force may be less than what was asked for and is stored: a name without its domain.
+/// What is in force may be less than what was asked for and is stored: a name without its domain. In place of an empty
+/// name a getter tells another one.
 bool isLasting(const AppliedSetting& applied) {
   const bool isGranted = applied.verdict <= Verdict::applied && applied.setting->kind != ValueKind::startupDisk;
   const auto& target = isGranted && applied.wanted ? applied.wanted : applied.after;
-  const bool isStored = !applied.stored || !target || isSameValue(*applied.setting, *applied.stored, *target);
+  const bool isStored =
+      !applied.stored || !target || target->empty() || isSameValue(*applied.setting, *applied.stored, *target);
   return isStored && applied.undoneBy.empty();
 }
 
@@ -97,7 +99,8 @@ std::optional<std::string> expectedOf(const AppliedSetting& applied, const Resul
 /// Granted is what is seen afterwards. Of a startup disk effects tell another text.
 void checkBySight(AppliedSetting& applied, const SettingState& after, const Results& results) {
   const auto expected = expectedOf(applied, results);
-  const bool isComparable = applied.setting->kind != ValueKind::startupDisk && expected && applied.after;
+  const bool isText = expected && !expected->empty() && applied.after;
+  const bool isComparable = isText && applied.setting->kind != ValueKind::startupDisk;
   const bool isTold = std::ranges::any_of(results, [](const auto& result) { return !result.effects.empty(); });
   if (!after.failures.empty()) {
     fail(applied, describe(after.failures.front()));

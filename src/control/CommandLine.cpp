@@ -27,12 +27,23 @@ constexpr OptionRow applyOptions[] = {
     {"--json", "Print one JSON object instead of a table."},
 };
 
+constexpr OptionRow undoOptions[] = {
+    {"--last", "Take back what the last run that changed something has done, as without --since."},
+    {"--since", "Take back what was done since then: \"2026-11-22 14:30\", today, yesterday, -2h.", "TIME"},
+    {"--run", "Do it."},
+    {"--force", "Take back also what somebody else has changed since."},
+    {"--allow-lockout", "Turn remote login off too, where it was off before."},
+    {"--json", "Print one JSON object instead of a table."},
+};
+
 constexpr CommandRow commands[] = {
     {"status", "[SETTING...]", OperandKind::settings,
      "Show settings: what is in force, what will be after a restart, where it is kept and what may undo it.",
      statusOptions},
     {"apply", "WORDS... | --from FILE", OperandKind::words,
      "Give settings the values asked for, where they differ, and tell what became of each.", applyOptions},
+    {"undo", "", OperandKind::none, "Show what tavisk has changed and what each setting goes back to, or do it.",
+     undoOptions},
 };
 
 const OptionRow* findOption(std::span<const OptionRow> options, std::string_view name) {
@@ -59,8 +70,12 @@ Failure misused(const std::string& what, const CommandRow* command) {
   return {what, "", "type 'taviskctl " + name + "--help'"};
 }
 
+std::string behindBlank(std::string_view text) {
+  return (text.empty() ? "" : " ") + std::string(text);
+}
+
 std::string typed(const OptionRow& option) {
-  return std::string(option.name) + (option.value.empty() ? "" : " ") + std::string(option.value);
+  return std::string(option.name) + behindBlank(option.value);
 }
 
 std::string optionLines(std::span<const OptionRow> options) {
@@ -79,8 +94,7 @@ std::string commandLines() {
   for (const auto& command : commands)
     lines.append("  ")
         .append(command.name)
-        .append(" ")
-        .append(command.operands)
+        .append(behindBlank(command.operands))
         .append("\n      ")
         .append(command.summary)
         .append("\n");
@@ -124,6 +138,8 @@ Result<Invocation> readCommandLine(std::span<const std::string> words) {
   }
   if (valued) return misused(typed(*valued) + ": the value is missing", invocation.command);
   if (!invocation.command && invocation.options.empty()) return misused("a command is missing", nullptr);
+  if (invocation.command && invocation.command->kind == OperandKind::none && !invocation.operands.empty())
+    return misused("what is " + invocation.operands.front(), invocation.command);
   return invocation;
 }
 
@@ -132,7 +148,7 @@ std::string helpText(const CommandRow* command) {
   if (!command)
     return text + "COMMAND [OPTION...]\n\n" + commandLines() + "\n" + optionLines(common) +
            "\nThe manual is taviskctl(8).\n";
-  text.append(command->name).append(" [OPTION...] ").append(command->operands).append("\n\n");
+  text.append(command->name).append(" [OPTION...]").append(behindBlank(command->operands)).append("\n\n");
   text.append(command->summary).append("\n\n").append(optionLines(command->options)).append(optionLines(common));
   return text;
 }

@@ -22,6 +22,7 @@ struct OptionRow {
 /// What stands in the place of a command's operands.
 enum class OperandKind {
   settings,  ///< names of settings
+  none,
   words,  ///< words of tavisk and their values: from the first that does not begin with two hyphens, all are operands
 };
 

@@ -18,6 +18,7 @@ using Command = Status (*)(const Invocation&, const Tools&);
 constexpr std::pair<std::string_view, Command> functions[] = {
     {"status", showStatus},
     {"apply", applySettings},
+    {"undo", undoChanges},
 };
 
 Command commandNamed(std::string_view name) {

@@ -29,8 +29,7 @@ const char* nameOf(Outcome outcome) {
   return "failed";
 }
 
-std::string toJson(const Effect& effect) {
-  JsonObject object;
+void addMembers(JsonObject& object, const Effect& effect) {
   object.text("setting", effect.setting).text("outcome", nameOf(effect.outcome));
   object.textIfKnown("before", effect.before);
   object.textIfKnown("asked", effect.asked);
@@ -40,6 +39,11 @@ std::string toJson(const Effect& effect) {
   object.textUnlessEmpty("undoneBy", effect.undoneBy);
   object.textUnlessEmpty("note", effect.note);
   if (effect.failure) addFailure(object, *effect.failure);
+}
+
+std::string toJson(const Effect& effect) {
+  JsonObject object;
+  addMembers(object, effect);
   return object.str();
 }
 

@@ -54,6 +54,9 @@ struct SettingValue {
   bool operator==(const SettingValue&) const = default;
 };
 
+class JsonObject;
+
+void addMembers(JsonObject& object, const Effect& effect);
 /// One line of JSON without a newline; absent and empty members are left out.
 std::string toJson(const Effect& effect);
 std::string toJson(const SettingValue& value);

@@ -4,6 +4,7 @@
 
 #include "platform/Authorization.h"
 #include "platform/BootLoaderFile.h"
+#include "platform/ChangeHistory.h"
 #include "platform/ClockService.h"
 #include "platform/DiskEventSession.h"
 #include "platform/DiskManagementService.h"
@@ -30,6 +31,7 @@ class Host {
   virtual AdminAuthenticator& authenticator() = 0;
   virtual FileSystem& files() = 0;
   virtual SystemLog& systemLog() = 0;
+  virtual ChangeHistory& history() = 0;
   virtual ClockService& clock() = 0;
   virtual NetworkTimeService& networkTime() = 0;
   virtual PowerSettingsService& powerSettings() = 0;

@@ -43,7 +43,17 @@ TEST(Text, escapesWhatATerminalWouldObey) {
       {"\\x1B", "\\\\x1B"},
       {"\x9B\xC3(\xE2\x82", "\\x9B\\xC3(\\xE2\\x82"},
   };
-  for (const auto& [text, expected] : cases) EXPECT_EQ(escaped(text), expected);
+  for (const auto& [text, expected] : cases) {
+    EXPECT_EQ(escaped(text), expected);
+    EXPECT_EQ(unescaped(expected), text);
+  }
+}
+
+TEST(Text, takesBackOnlyWhatWasEscaped) {
+  EXPECT_EQ(unescaped("a\\\\n\\nb"), "a\\n\nb");
+  for (const char* text :
+       {"\\", "\\t", "\\x4", "\\xg0", "\\x+1", "\\u{", "\\u{}", "\\u{0041}", "\\u0080", "\\u{12345}"})
+    EXPECT_EQ(unescaped(text), std::nullopt) << text;
 }
 
 TEST(Text, readsLeadingIntegers) {

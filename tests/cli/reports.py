@@ -20,6 +20,10 @@ SCHEMA = json.loads((_PACKAGING / "report.schema.json").read_text())
 RECIPE_SETS = "-settimezone Europe/Paris"
 _OBJECTS = jsonschema.Draft202012Validator(SCHEMA)
 _EFFECTS = jsonschema.Draft202012Validator({"$defs": SCHEMA["$defs"], "$ref": "#/$defs/effect"})
+# What an effect has in an effects.log besides.
+_RECORD = jsonschema.Draft202012Validator({
+    "required": ["changed", "run", "time"], "additionalProperties": False,
+    "properties": {"changed": {"type": "boolean"}, "run": {"type": "string", "minLength": 1}, "time": {"type": "integer"}}})
 
 
 def _wrong(validator, found):
@@ -41,7 +45,9 @@ def faults(text):
 
 def faults_of_effects(effects):
     """What is wrong with the objects of an effects.log."""
-    return [fault for effect in effects for fault in _wrong(_EFFECTS, effect)]
+    record = lambda effect: {name: effect[name] for name in ("changed", "run", "time") if name in effect}
+    return [fault for effect in effects for fault in _wrong(_RECORD, record(effect)) +
+            _wrong(_EFFECTS, {name: effect[name] for name in effect if name not in record(effect)})]
 
 
 def recipe(words=RECIPE_SETS):

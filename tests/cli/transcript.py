@@ -9,6 +9,8 @@ usage: transcript.py PROGRAM TRANSCRIPT
     file /etc/motd some text           a file of the machine; \\n is a newline
     link /Backup /Volumes/Backup       a symbolic link of the machine
     environment TAVISK_LOG=stderr
+    earlier tavisk -setdate 01:01:70   a run before, of which nothing is looked at
+    then {"Clock": {"Time": 5}}        what somebody changes in the machine after the last of these
     $ tavisk -getdate -gettime         the program, which lies beside PROGRAM, and its words, quoted as in a shell;
                                        starts the run
     < -getdate                         a typed line, in order; `<|` types the text without a newline at the end
@@ -54,6 +56,7 @@ class Case:
         self.title = title
         self.description = self.program = self.words = None
         self.files, self.links, self.environment = [], [], {}
+        self.earlier, self.changes = [], {}
         self.typed, self.output = b"", b""
         self.wanted = {"error": [], "log": [], "plist": [], "status": ["0"], "machine": ["{}"], "effects": []}
 
@@ -69,6 +72,10 @@ class Case:
         elif keyword == "environment":
             name, _, value = rest.partition("=")
             self.environment[name] = value
+        elif keyword == "earlier":
+            self.earlier.append([bytes_of(word) for word in shlex.split(rest)])
+        elif keyword == "then":
+            self.changes = value_of(rest)
         elif keyword == "$":
             self.program, *words = shlex.split(rest)
             self.words = [bytes_of(word) for word in words]
@@ -109,6 +116,12 @@ class Case:
                 machine.file(path, content)
             for path, target in self.links:
                 machine.place(path).symlink_to(target)
+            for earlier, *words in self.earlier:
+                machine.program = os.path.join(os.path.dirname(program), earlier.decode())
+                machine.run(words)
+            if self.changes:
+                machine.change(self.changes)
+            machine.program = os.path.join(os.path.dirname(program), self.program)
             output, errors, status = machine.run(self.words, self.typed, {**environment, **self.environment})
             output = output.replace(bytes(machine.directory), b"DIR")
             errors = errors.decode(errors="replace").replace(str(machine.directory), "DIR").splitlines()

@@ -52,6 +52,10 @@ CONTROL_CASES = [
     ("apply -f -setcomputersleep 5 -setusingnetworktime ", ["Off", "On"]),
     ("apply --from want", ["wanted.json"]),
     ("apply --from wanted.json --j", ["--json"]),
+    ("undo --", ["--allow-lockout", "--force", "--help", "--json", "--last", "--run", "--since", "--version"]),
+    ("undo --since ", ["now", "today", "yesterday"]),
+    ("undo --since today --r", ["--run"]),
+    ("undo t", []),
 ]
 
 

@@ -12,6 +12,7 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _authenticator(_machine),
       _files(_root, effects),
       _systemLog(_root),
+      _history(_root),
       _clock(_machine),
       _networkTime(_machine),
       _remoteShell(_machine),

@@ -5,6 +5,7 @@
 #include <string>
 
 #include "hosts/linux/access/LinuxAuthorization.h"
+#include "hosts/linux/access/LinuxChangeHistory.h"
 #include "hosts/linux/access/LinuxRemoteAccess.h"
 #include "hosts/linux/clock/LinuxClockService.h"
 #include "hosts/linux/clock/LinuxNetworkTimeService.h"
@@ -38,6 +39,7 @@ class LinuxHost final : public Host {
   AdminAuthenticator& authenticator() override { return _authenticator; }
   FileSystem& files() override { return _systemFiles; }
   SystemLog& systemLog() override { return _systemLog; }
+  ChangeHistory& history() override { return _history; }
   ClockService& clock() override { return _clock; }
   NetworkTimeService& networkTime() override { return _networkTime; }
   PowerSettingsService& powerSettings() override { return _powerSettings; }
@@ -71,6 +73,7 @@ class LinuxHost final : public Host {
   LinuxAdminAuthenticator _authenticator;
   RootedFileSystem _files;
   LinuxSystemLog _systemLog;
+  LinuxChangeHistory _history;
   LinuxClockService _clock;
   LinuxNetworkTimeService _networkTime;
   LinuxRemoteShellService _remoteShell;

@@ -33,6 +33,7 @@ ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFi
       _users(*_machine),
       _authenticator(_settings),
       _systemLog(_machine->folder(), effects),
+      _history(_machine->folder()),
       _clock(_settings),
       _networkTime(_settings),
       _powerSettings(_settings),

@@ -43,6 +43,7 @@ class ScratchHost final : public Host {
   AdminAuthenticator& authenticator() override { return _authenticator; }
   FileSystem& files() override { return _files; }
   SystemLog& systemLog() override { return _systemLog; }
+  ChangeHistory& history() override { return _history; }
   ClockService& clock() override { return _clock; }
   NetworkTimeService& networkTime() override { return _networkTime; }
   PowerSettingsService& powerSettings() override { return _powerSettings; }
@@ -77,6 +78,7 @@ class ScratchHost final : public Host {
   ScratchUserDatabase _users;
   ScratchAdminAuthenticator _authenticator;
   ScratchSystemLog _systemLog;
+  ScratchChangeHistory _history;
   ScratchClockService _clock;
   ScratchNetworkTimeService _networkTime;
   ScratchPowerSettingsService _powerSettings;

@@ -7,13 +7,16 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <ctime>
+#include <nlohmann/json.hpp>
 
 #include "base/FileDescriptor.h"
+#include "base/Json.h"
+#include "base/Text.h"
 
 namespace tavisk {
 namespace {
 
-constexpr const char* effectsPath = "/effects.log";
 constexpr const char* systemPath = "/system.log";
 
 std::string oneLine(std::string_view message) {
@@ -44,18 +47,68 @@ Result<void> appendTo(const SystemRoot& root, const std::string& path, const std
   return {};
 }
 
+using Json = nlohmann::json;
+
+constexpr std::size_t longestLog = std::size_t{256} << 20U;
+
+/// Absent when there is no text of that name.
+std::optional<std::string> text(const Json& object, const char* name) {
+  const auto found = object.find(name);
+  if (found == object.end() || !found->is_string()) return std::nullopt;
+  return found->get<std::string>();
+}
+
+struct Line {
+  RecordedChange change;
+  bool hasChanged;
+};
+
+/// Absent when the line does not say what is needed: earlier releases did not.
+std::optional<Line> lineIn(const std::string& written) {
+  const auto object = Json::parse(written, nullptr, false);
+  if (!object.is_object() || !text(object, "setting") || !text(object, "run")) return std::nullopt;
+  const auto changed = object.find("changed");
+  const auto time = object.find("time");
+  if (changed == object.end() || !changed->is_boolean()) return std::nullopt;
+  if (time == object.end() || !time->is_number_integer()) return std::nullopt;
+  auto after = text(object, "live");
+  if (!after) after = text(object, "stored");
+  return Line{
+      {*text(object, "run"), time->get<std::int64_t>(), *text(object, "setting"), text(object, "before"), after},
+      changed->get<bool>()};
+}
+
 }  // namespace
 
 std::optional<Failure> EffectsLog::whyUnusable() const {
-  const auto file = orAbsent(_folder.open(effectsPath, O_PATH | O_NOFOLLOW));
+  const auto file = orAbsent(_folder.open(path, O_PATH | O_NOFOLLOW));
   if (!file) return file.failure();
   struct stat status {};
   const bool isLog = !*file || (::fstat((*file)->number(), &status) == 0 && S_ISREG(status.st_mode));
-  return isLog ? std::nullopt : std::optional(notALog(effectsPath));
+  return isLog ? std::nullopt : std::optional(notALog(path));
 }
 
 void EffectsLog::record(const Effect& effect) {
-  static_cast<void>(appendTo(_folder, effectsPath, toJson(effect)));
+  JsonObject line;
+  addMembers(line, effect);
+  line.boolean("changed", effect.changed).text("run", _run).integer("time", std::time(nullptr));
+  static_cast<void>(appendTo(_folder, path, line.str()));
+}
+
+Result<RecordedChanges> ScratchChangeHistory::changes() {
+  const auto log = orEmpty(_folder.read(EffectsLog::path, longestLog));
+  if (!log) return log.failure();
+  RecordedChanges found;
+  std::size_t unclear = 0;
+  for (const auto& written : split(*log, "\n")) {
+    auto line = written.empty() ? std::nullopt : lineIn(written);
+    if (!written.empty() && !line) ++unclear;
+    if (line && line->hasChanged) found.changes.push_back(std::move(line->change));
+  }
+  if (unclear > 0)
+    found.remarks.push_back("lines of effects.log that do not tell what has changed, or when: " +
+                            std::to_string(unclear));
+  return found;
 }
 
 void ScratchSystemLog::write(const std::string& message) {

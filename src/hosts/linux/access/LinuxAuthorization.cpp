@@ -3,8 +3,10 @@
 #include "hosts/linux/access/LinuxAuthorization.h"
 
 #include <grp.h>
+#include <pwd.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <utility>
 
@@ -16,6 +18,9 @@ namespace {
 
 // Groups with many thousands of members exist; beyond this the answer is not believed.
 constexpr std::size_t largestGroupEntry = std::size_t{64} << 20U;
+// A user's entry with all its texts.
+constexpr std::size_t roomForUser = 65536;
+constexpr const char* adminGroup = "admin";
 constexpr const char* action = "org.tavisk.manage";
 
 /// Polkit asks nobody outside a session of the login manager (loginctl(1)), at a terminal or not.
@@ -25,6 +30,17 @@ Failure refusal(const Authorization& answer, bool isAtTerminal) {
   if (!answer.isForTheAsking) return {"authorize", action, "polkit does not grant it to this user"};
   const std::string missing = isAtTerminal ? "this is no login session" : "there is no terminal to ask at";
   return {"authorize", action, "polkit asks for a password, and " + missing + ": sudo tavisk ..."};
+}
+
+std::vector<gid_t> groupsOf(const passwd& user) {
+  std::vector<gid_t> groups(64);
+  int count = static_cast<int>(groups.size());
+  while (::getgrouplist(user.pw_name, user.pw_gid, groups.data(), &count) < 0) {
+    groups.resize(std::max(groups.size() * 2, static_cast<std::size_t>(count)));
+    count = static_cast<int>(groups.size());
+  }
+  groups.resize(static_cast<std::size_t>(count));
+  return groups;
 }
 
 }  // namespace
@@ -51,6 +67,20 @@ std::optional<GroupId> LinuxUserDatabase::groupNamed(const std::string& name) {
   }
   if (!found) return std::nullopt;
   return found->gr_gid;
+}
+
+Result<bool> isAdministrator(UserId user) {
+  if (user == 0) return true;
+  passwd entry{};
+  passwd* found = nullptr;
+  std::vector<char> texts(roomForUser);
+  const int error = ::getpwuid_r(user, &entry, texts.data(), texts.size(), &found);
+  const bool isUnknown = error == 0 || error == ENOENT || error == ESRCH;
+  if (!found && !isUnknown) return systemFailure("look up", "user " + std::to_string(user), error);
+  const auto admin = found ? LinuxUserDatabase().groupNamed(adminGroup) : std::nullopt;
+  if (!admin) return false;
+  const auto groups = groupsOf(entry);
+  return std::ranges::find(groups, *admin) != groups.end();
 }
 
 void LinuxAdminAuthenticator::authenticate() {

@@ -23,6 +23,10 @@ class LinuxUserDatabase final : public UserDatabase {
   std::optional<GroupId> groupNamed(const std::string& name) override;
 };
 
+/// Whether a user may change the machine: root, and who is in group admin now. A user that there is not is none. A
+/// failure says that this could not be found out.
+Result<bool> isAdministrator(UserId user);
+
 /// Root is authorized as it is, and so is every administrator who only reads. Before each change of anyone but root
 /// polkit is asked for the tool's own action, where there is polkit.
 class LinuxAdminAuthenticator final : public AdminAuthenticator {

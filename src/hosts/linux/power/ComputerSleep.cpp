@@ -6,12 +6,12 @@
 #include <csignal>
 #include <memory>
 
+#include "base/TimeSpan.h"
 #include "effects/SettingNames.h"
 #include "effects/Warning.h"
 #include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/system/KernelFile.h"
-#include "hosts/linux/system/TimeSpan.h"
 
 namespace tavisk {
 namespace {

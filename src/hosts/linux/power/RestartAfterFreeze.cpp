@@ -10,6 +10,7 @@
 #include <memory>
 
 #include "base/Text.h"
+#include "base/TimeSpan.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/power/KernelParameter.h"
@@ -17,7 +18,6 @@
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
 #include "hosts/linux/system/Rights.h"
-#include "hosts/linux/system/TimeSpan.h"
 
 namespace tavisk {
 namespace {

@@ -11,6 +11,7 @@
 #include <array>
 #include <cstdlib>
 
+#include "base/Process.h"
 #include "base/Text.h"
 #include "hosts/linux/system/LocalSocket.h"
 
@@ -19,16 +20,12 @@ namespace {
 
 using Fields = std::vector<std::pair<std::string, std::string>>;
 
-constexpr const char* identifier = "tavisk";
 constexpr const char* journalSocket = "/run/systemd/journal/socket";
 constexpr const char* syslogSocket = "/dev/log";
 constexpr std::size_t loginIdLimit = 64;
-// The journal takes larger entries by another way only; nothing of ours needs it.
-constexpr std::size_t longestField = 16384;
-
 /// One line: what escaped() makes of the text, but a newline is the usual \n.
 std::string harmless(const std::string& text) {
-  auto rest = std::string_view(text).substr(0, longestField);
+  auto rest = std::string_view(text).substr(0, longestJournalField);
   std::string line;
   for (auto end = rest.find('\n'); end != std::string_view::npos; end = rest.find('\n')) {
     line += escaped(rest.substr(0, end)) + "\\n";
@@ -42,7 +39,7 @@ std::string journalDatagram(const JournalEntry& entry) {
   const auto add = [&datagram](const std::string& name, const std::string& value) {
     datagram.append(name).append("=").append(value).append("\n");
   };
-  add("SYSLOG_IDENTIFIER", identifier);
+  add("SYSLOG_IDENTIFIER", journalIdentifier);
   add("SYSLOG_PID", std::to_string(::getpid()));
   add("SYSLOG_FACILITY", std::to_string(LOG_FAC(entry.facility)));
   add("PRIORITY", std::to_string(entry.priority));
@@ -54,8 +51,8 @@ std::string journalDatagram(const JournalEntry& entry) {
 /// As syslog(3) writes it, without the time: who receives it puts in its own (RFC 3164, 4.3.2), and the rules of a
 /// local time are not to be read by a thread that ends the run.
 std::string syslogDatagram(const JournalEntry& entry) {
-  return "<" + std::to_string(entry.facility | entry.priority) + ">" + identifier + "[" + std::to_string(::getpid()) +
-         "]: " + harmless(entry.message);
+  return "<" + std::to_string(entry.facility | entry.priority) + ">" + journalIdentifier + "[" +
+         std::to_string(::getpid()) + "]: " + harmless(entry.message);
 }
 
 bool sendTo(const SystemRoot& root, const char* path, const std::string& datagram) {
@@ -88,15 +85,20 @@ std::string messageOf(const Effect& effect) {
 
 Fields fieldsOf(const Effect& effect) {
   Fields fields;
-  const auto add = [&fields](const char* name, const std::optional<std::string>& value) {
-    if (value && !value->empty()) fields.emplace_back(name, *value);
+  const auto add = [&fields](const char* name, const std::string& value) {
+    if (!value.empty()) fields.emplace_back(name, value);
   };
-  add("TAVISK_SETTING", effect.setting);
-  add("TAVISK_OUTCOME", nameOf(effect.outcome));
-  add("TAVISK_OLD", effect.before);
-  add("TAVISK_ASKED", effect.asked);
-  add("TAVISK_NEW", effect.live ? effect.live : effect.stored);
-  add("TAVISK_STORED", effect.stored);
+  // An empty value is another than none.
+  const auto addValue = [&fields](const char* name, const std::optional<std::string>& value) {
+    if (value) fields.emplace_back(name, *value);
+  };
+  add(journalfield::setting, effect.setting);
+  add(journalfield::outcome, nameOf(effect.outcome));
+  add(journalfield::changed, effect.changed ? "yes" : "no");
+  addValue(journalfield::before, effect.before);
+  addValue("TAVISK_ASKED", effect.asked);
+  addValue(journalfield::after, effect.live ? effect.live : effect.stored);
+  addValue("TAVISK_STORED", effect.stored);
   add("TAVISK_WHERE", effect.where);
   add("TAVISK_UNDONE_BY", effect.undoneBy);
   add("TAVISK_NOTE", effect.note);
@@ -148,11 +150,12 @@ void Journal::send(const JournalEntry& entry) const {
   if (!sendTo(_root, journalSocket, journalDatagram(entry))) sendTo(_root, syslogSocket, syslogDatagram(entry));
 }
 
-JournalLog::JournalLog(const SystemRoot& root) : _root(root), _journal(root), _sudoUser(sudoUser()) {}
+JournalLog::JournalLog(const SystemRoot& root)
+    : _root(root), _journal(root), _run(newRunName()), _sudoUser(sudoUser()) {}
 
 void JournalLog::changeBegins(const std::string& setting, const std::string& asked) {
   send(LOG_DEBUG, setting + ": change begins, asked \"" + asked + "\"",
-       {{"TAVISK_SETTING", setting}, {"TAVISK_OUTCOME", "begins"}, {"TAVISK_ASKED", asked}});
+       {{journalfield::setting, setting}, {journalfield::outcome, outcomeOfBeginning}, {"TAVISK_ASKED", asked}});
 }
 
 void JournalLog::record(const Effect& effect) {
@@ -161,7 +164,7 @@ void JournalLog::record(const Effect& effect) {
 
 void JournalLog::noteRefusedUser() const {
   const auto name = ownName();
-  Fields fields{{"TAVISK_OUTCOME", "refused"}};
+  Fields fields{{journalfield::outcome, "refused"}};
   if (name) fields.emplace_back("TAVISK_USER", *name);
   const auto user = std::to_string(::getuid()) + (name ? " (" + *name + ")" : "");
   send(LOG_WARNING, "refused: user " + user + " at " + terminal() + " is no administrator", std::move(fields));
@@ -170,6 +173,7 @@ void JournalLog::noteRefusedUser() const {
 void JournalLog::send(int priority, const std::string& message, Fields fields) const {
   const auto who = whoAsks(_root);
   fields.insert(fields.end(), who.begin(), who.end());
+  fields.emplace_back(journalfield::run, _run);
   if (!_sudoUser.empty()) fields.emplace_back("TAVISK_SUDO_UID", _sudoUser);
   _journal.send({LOG_AUTHPRIV, priority, message, std::move(fields)});
 }

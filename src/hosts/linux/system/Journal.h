@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstddef>
 #include <string>
 #include <utility>
 #include <vector>
@@ -11,6 +12,23 @@
 #include "platform/SystemLog.h"
 
 namespace tavisk {
+
+/// What all entries of this program are found by.
+inline constexpr const char* journalIdentifier = "tavisk";
+/// What is longer is cut: the journal takes larger entries by another way only.
+inline constexpr std::size_t longestJournalField = 16384;
+
+/// The fields of an effect by which changes are found again. Values are escaped(), with \n for a newline.
+namespace journalfield {
+inline constexpr const char* run = "TAVISK_RUN";
+inline constexpr const char* setting = "TAVISK_SETTING";
+inline constexpr const char* outcome = "TAVISK_OUTCOME";
+inline constexpr const char* changed = "TAVISK_CHANGED";  ///< "yes" or "no"
+inline constexpr const char* before = "TAVISK_OLD";
+inline constexpr const char* after = "TAVISK_NEW";
+}  // namespace journalfield
+/// In place of an outcome.
+inline constexpr const char* outcomeOfBeginning = "begins";
 
 /// One entry of the system log.
 struct JournalEntry {
@@ -50,6 +68,7 @@ class JournalLog final : public EffectChannel {
 
   const SystemRoot& _root;
   Journal _journal;
+  std::string _run;
   std::string _sudoUser;  ///< empty: unknown
 };
 

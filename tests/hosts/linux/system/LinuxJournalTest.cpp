@@ -36,10 +36,11 @@ TEST(JournalLog, TellsAChangeFieldByField) {
   EXPECT_THAT(journal.next(),
               AllOf(HasSubstr("SYSLOG_FACILITY=10\nPRIORITY=5\n"),
                     HasSubstr("MESSAGE=Time Zone: applied, was \"UTC\", asked \"Europe/Paris\"\n"),
-                    HasSubstr("TAVISK_SETTING=Time Zone\nTAVISK_OUTCOME=applied\nTAVISK_OLD=UTC\n"),
+                    HasSubstr("TAVISK_SETTING=Time Zone\nTAVISK_OUTCOME=applied\nTAVISK_CHANGED=yes\nTAVISK_OLD=UTC\n"),
                     HasSubstr("TAVISK_NEW=Europe/Paris\n"), HasSubstr("TAVISK_WHERE=/etc/localtime\n"),
                     HasSubstr("TAVISK_UID=" + std::to_string(::getuid()) + "\n"), HasSubstr("TAVISK_TERMINAL="),
-                    HasSubstr("TAVISK_LOGIN_UID=1000\n"), EndsWith("\n")));
+                    HasSubstr("TAVISK_LOGIN_UID=1000\n"), HasSubstr("TAVISK_RUN=" + std::to_string(::getpid()) + "-"),
+                    EndsWith("\n")));
   EXPECT_THAT(journal.next(), IsEmpty());
   EXPECT_THAT(syslog.next(), IsEmpty());
 }

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "hosts/linux/system/TimeSpan.h"
+#include "base/TimeSpan.h"
 
 #include <algorithm>
 #include <charconv>

@@ -1,0 +1,129 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <algorithm>
+#include <ctime>
+#include <utility>
+
+#include "base/Process.h"
+#include "control/Applier.h"
+#include "control/Commands.h"
+#include "control/SinceTime.h"
+#include "control/UndoPlan.h"
+#include "control/UndoText.h"
+
+namespace tavisk::control {
+namespace {
+
+using Since = std::optional<std::int64_t>;
+
+/// Absent: what the last run has done is meant.
+Result<Since> sinceOf(const Invocation& invocation) {
+  if (!invocation.has("--since")) return Since();
+  if (invocation.has("--last")) return Failure{"either --since or --last is expected", "", "both are given"};
+  const auto& text = invocation.options.at("--since");
+  const auto since = timeMeantBy(text, std::time(nullptr));
+  if (!since) return Failure{"--since " + text, "", "\"2026-11-22 14:30\", today, -2h or the like is expected"};
+  return since;
+}
+
+std::vector<WantedSetting> wantedOf(std::span<const UndoResult> results) {
+  std::vector<WantedSetting> wanted;
+  for (const auto& [planned, outcome] : results)
+    if (planned.step == UndoStep::set) wanted.push_back({planned.managed, *planned.back});
+  return wanted;
+}
+
+/// A machine, and what takes back changes on it.
+class Undoing final {
+ public:
+  /// Nothing is owned.
+  Undoing(const Tools& tools, const EndingSignals& signals, Host& host, EffectSink& effects, RunLoop& runLoop)
+      : _tools(tools), _signals(signals), _host(host), _effects(effects), _runLoop(runLoop) {
+    _effects.addChannel(_reader);
+  }
+
+  std::vector<UndoResult> plan(const std::vector<RecordedChange>& changes, UndoConsent consent) {
+    const auto states = _reader.read(settingsOf(changes), _host, _runLoop);
+    std::vector<UndoResult> results;
+    for (auto& planned : planUndo(changes, states, consent)) results.push_back({std::move(planned)});
+    return results;
+  }
+
+  /// The failure says why nothing was done.
+  Result<void> carryOut(std::vector<UndoResult>& results) {
+    const auto steps = stepsFor(wantedOf(results));
+    if (steps.empty()) return {};
+    WordRunner runner(_host, _effects, _runLoop);
+    const auto waiter = SignalWaiter::start(
+        _signals, [&](const std::string& signal) { end(runner, signal); },
+        [] { return static_cast<int>(Status::incomplete); });
+    if (!waiter) _signals.unblock();
+    if (auto started = runner.start(); !started) return started;
+    Applier applier(_host, runner, _reader);
+    for (const auto& step : steps) take(results, step, applier);
+    return {};
+  }
+
+ private:
+  void take(std::vector<UndoResult>& results, const Step& step, Applier& applier) {
+    const auto name = step.asked.front().setting->name;
+    const ProgressLine progress(_tools.showProgress, std::string(name) + " ...");
+    const auto result = std::ranges::find(results, name, [](const auto& of) { return of.planned.setting; });
+    result->outcome = applier.apply(step).front();
+  }
+
+  void end(WordRunner& runner, const std::string& signal) {
+    runner.endedBySignal(signal);
+    if (_tools.showProgress) _tools.showProgress("");
+  }
+
+  const Tools& _tools;
+  const EndingSignals& _signals;
+  Host& _host;
+  EffectSink& _effects;
+  RunLoop& _runLoop;
+  StatusReader _reader;
+};
+
+bool isWhole(const UndoResult& result) {
+  if (result.outcome) return result.outcome->verdict <= Verdict::applied && result.outcome->lasts;
+  return result.planned.step == UndoStep::set || result.planned.step == UndoStep::there;
+}
+
+Status complainOf(const Failure& failure, const Tools& tools, Status status) {
+  tools.complain(describe(failure));
+  return status;
+}
+
+Status undo(const RecordedChanges& recorded, Since since, Undoing& undoing, const Invocation& invocation,
+            const Tools& tools) {
+  const bool isRun = invocation.has("--run");
+  auto results = undoing.plan(chosenChanges(recorded.changes, since),
+                              {invocation.has("--force"), invocation.has("--allow-lockout")});
+  for (const auto& remark : recorded.remarks) tools.complain(remark);
+  if (isRun)
+    if (const auto done = undoing.carryOut(results); !done)
+      return complainOf(done.failure(), tools, Status::incomplete);
+  const auto text = invocation.has("--json") ? undoJson(results, recorded.remarks) + '\n' : undoTable(results, isRun);
+  tools.output.print("%s", text.c_str());
+  return std::ranges::all_of(results, isWhole) ? Status::done : Status::incomplete;
+}
+
+}  // namespace
+
+Status undoChanges(const Invocation& invocation, const Tools& tools) {
+  const auto since = sinceOf(invocation);
+  if (!since) return complainOf(since.failure(), tools, Status::misused);
+  const EndingSignals signals;
+  if (!invocation.has("--run")) signals.unblock();
+  EffectSink effects;
+  RunLoop runLoop;
+  const auto host = tools.openHost(effects, runLoop);
+  if (!host) return complainOf(host.failure(), tools, Status::incomplete);
+  const auto recorded = (*host)->history().changes();
+  if (!recorded) return complainOf(recorded.failure(), tools, Status::incomplete);
+  Undoing undoing(tools, signals, **host, effects, runLoop);
+  return undo(*recorded, *since, undoing, invocation, tools);
+}
+
+}  // namespace tavisk::control

@@ -1,0 +1,85 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include "control/UndoPlan.h"
+
+namespace tavisk::control {
+namespace {
+
+using Text = std::optional<std::string>;
+using testing::ElementsAre;
+
+std::vector<std::string> chosenBy(std::optional<std::int64_t> since) {
+  const RecordedChange changes[] = {
+      {"a", 10, "Time Zone", "UTC", "Asia/Tokyo"},
+      {"b", 20, "Display Sleep", "1", "2"},
+      {"a", 5, "Computer Sleep", "3", "4"},
+      {"b", 21, "Remote Login", "off", "on"},
+      {"c", 30, "Network Time Restart", std::nullopt, std::nullopt},
+  };
+  std::vector<std::string> names;
+  for (const auto& change : chosenChanges(changes, since)) names.push_back(change.setting);
+  return names;
+}
+
+TEST(UndoPlan, IsAboutARunOrATime) {
+  EXPECT_THAT(chosenBy(std::nullopt), ElementsAre("Display Sleep", "Remote Login"));
+  EXPECT_THAT(chosenBy(10), ElementsAre("Time Zone", "Display Sleep", "Remote Login"));
+  EXPECT_THAT(chosenBy(22), ElementsAre());
+}
+
+TEST(UndoPlan, AsksForConsentWhereAValueIsNotTavisksOwn) {
+  struct Case {
+    const char* setting;
+    Text before, after, now;
+    UndoStep step, forced;
+  };
+  const Case cases[] = {
+      {"Computer Sleep", "5", "10", "10", UndoStep::set, UndoStep::set},
+      {"Computer Sleep", "5", "10", "5", UndoStep::there, UndoStep::there},
+      {"Computer Sleep", "5", "10", "7", UndoStep::leave, UndoStep::set},
+      {"Computer Sleep", "5", "10", std::nullopt, UndoStep::leave, UndoStep::set},
+      {"Computer Sleep", "5", std::nullopt, "7", UndoStep::set, UndoStep::set},
+      {"Computer Sleep", std::nullopt, "10", "10", UndoStep::impossible, UndoStep::impossible},
+      {"Hard Disk Sleep", "10 on sda, 0 on sdb", "10", "10", UndoStep::impossible, UndoStep::impossible},
+      {"Restart After Freeze", "on after a kernel panic only", "off", "off", UndoStep::impossible,
+       UndoStep::impossible},
+      {"Restart After Freeze", "on", "off", "off", UndoStep::set, UndoStep::set},
+      {"Remote Login", "off", "on", "on", UndoStep::leave, UndoStep::leave},
+      {"Startup Delay", "4", "0", "0", UndoStep::set, UndoStep::set},
+      {"Local Subnet Name", "web-2, web in the kernel", "db", "db", UndoStep::impossible, UndoStep::impossible},
+      {"Local Subnet Name", "web.example.org", "db", "db", UndoStep::set, UndoStep::set},
+      {"Network Time Server", "", "a.example", "a.example", UndoStep::impossible, UndoStep::impossible},
+      {"Computer Name", "", "web", "web", UndoStep::set, UndoStep::set},
+      {"Computer Name", "web", "", "host", UndoStep::set, UndoStep::set},
+      {"Kernel Architecture", "default", "i386", "i386", UndoStep::set, UndoStep::set},
+      {"Kernel Architecture", "arm", "i386", "i386", UndoStep::impossible, UndoStep::impossible},
+      {"Startup Disk", "sda2", "sdb1", "sdb1 by GRUB", UndoStep::set, UndoStep::set},
+      {"Startup Disk", "sda2", "sdb1", "sdb2 by GRUB", UndoStep::leave, UndoStep::set},
+      {"Firmware Variable prev-lang:kbd", "en", "de", "de", UndoStep::impossible, UndoStep::impossible},
+      {"Network Time At Startup", "on", "off", "off", UndoStep::impossible, UndoStep::impossible},
+      {"Time", "1", "2", "3", UndoStep::impossible, UndoStep::impossible},
+  };
+  for (const auto& [setting, before, after, now, step, forced] : cases) {
+    const RecordedChange changes[] = {{"a", 1, setting, before, "earlier"}, {"a", 2, setting, "earlier", after}};
+    const std::string unit = setting == std::string("Startup Delay") ? "units of 30 seconds" : "";
+    const SettingState states[] = {
+        {{.setting = setting, .live = now, .unit = unit}, {}},
+        {{.setting = "Local Subnet Name", .live = "host", .stored = "host"}, {}},
+        {{.setting = "Network Time", .live = "on"}, {}},
+    };
+    auto seen = std::vector<SettingState>(std::begin(states), std::end(states));
+    if (!now) seen.front().failures.push_back({"read", "it", "down"});
+    const auto plan = planUndo(changes, seen, {});
+    ASSERT_EQ(plan.size(), 1) << setting;
+    EXPECT_EQ(plan.front().back, before) << setting;
+    EXPECT_EQ(plan.front().step, step) << setting << ": " << plan.front().why;
+    EXPECT_EQ(planUndo(changes, seen, {.toOthersChanges = true}).front().step, forced) << setting;
+    const auto allowed = planUndo(changes, seen, {.toOthersChanges = true, .toLockout = true}).front().step;
+    EXPECT_EQ(allowed, setting == std::string("Remote Login") ? UndoStep::set : forced);
+  }
+}
+
+}  // namespace
+}  // namespace tavisk::control
