@@ -43,15 +43,9 @@ class Change {
   }
 
   /// What write() and readBack() would find.
-  void foresee() {
-    _effect.outcome = Outcome::applied;
-    if (!isTaken()) return;
-    if (_steps.stored) become(_effect.stored, _steps.asked);
-    _effect.where = _steps.where;
-    const auto applied = _steps.foresee ? _steps.foresee() : Result<void>();
-    if (!applied) return fail(applied.failure());
-    if (_steps.live) become(_effect.live, _steps.askedLive);
-    if (!isRead()) _effect.changed = !_steps.leavesNoTrace;
+  void foresee(bool isNeeded) {
+    foreseeSteps();
+    if (!isNeeded) _effect.outcome = Outcome::unchanged;
   }
 
   void readBack() {
@@ -82,6 +76,16 @@ class Change {
     const auto taken = _steps.check ? _steps.check() : Result<void>();
     if (!taken) fail(taken.failure());
     return static_cast<bool>(taken);
+  }
+
+  void foreseeSteps() {
+    if (!isTaken()) return;
+    if (_steps.stored) become(_effect.stored, _steps.asked);
+    _effect.where = _steps.where;
+    const auto applied = _steps.foresee ? _steps.foresee() : Result<void>();
+    if (!applied) return fail(applied.failure());
+    if (_steps.live) become(_effect.live, _steps.askedLive);
+    if (!isRead()) _effect.changed = !_steps.leavesNoTrace;
   }
 
   void become(std::optional<std::string>& text, const std::string& value) {
@@ -176,8 +180,8 @@ Effect carryOut(const Steps& steps, EffectSink& effects, RunLoop& runLoop) {
 Effect foretell(const Steps& steps, EffectSink& effects) {
   Change change(steps);
   if (change.isSupported()) {
-    static_cast<void>(change.isNeeded());
-    change.foresee();
+    const bool isNeeded = change.isNeeded();
+    change.foresee(isNeeded);
   }
   change.remark();
   effects.record(change.effect());

@@ -102,7 +102,7 @@ Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>
                 RunLoop& runLoop);
 
 /// What carryOut() would come to, with nothing touched: supported, read, check, foresee. Its effect tells what would be
-/// read back, and says "applied" also where the value is there already.
+/// read back. One that is unchanged has a failure too where another value would have to be replaced and could not be.
 template <typename Value>
 Effect foretell(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, EffectSink& effects);
 
