@@ -41,7 +41,9 @@ class Answers final : public EffectChannel {
     const auto told = _values.find(setting);
     return told == _values.end() ? std::nullopt : told->second.stored;
   }
-  /// Why nothing is known of a setting, by its name.
+  /// Why something of a setting is not known, by its name.
+  const std::map<std::string, Failure>& failures() const { return _failures; }
+  /// The same where nothing is.
   std::map<std::string, Failure> unknown() const {
     auto unknown = _failures;
     std::erase_if(unknown, [this](const auto& failed) { return _values.contains(failed.first); });
@@ -159,10 +161,11 @@ Result<void> copyLoaderFile(BootLoaderFile& file, const std::string& directory) 
 
 }  // namespace
 
-Result<void> copyMachine(Host& machine, EffectSink& effects, const std::string& directory) {
+Result<void> copyMachine(Host& machine, EffectSink& effects, const std::string& directory, EffectSink& audience) {
   const Answers answers(effects);
   auto described = tavisk::described(machine, answers);
   if (auto copied = copyLoaderFile(machine.bootLoaderFile(), directory); !copied) return copied;
+  for (const auto& [setting, failure] : answers.failures()) audience.recordFailure(setting, failure);
   for (const auto& [setting, failure] : answers.unknown())
     described.dictionary("Refusals").set(setting + " (read)", describe(failure));
   EffectSink unwatched;

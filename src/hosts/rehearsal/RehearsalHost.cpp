@@ -11,7 +11,8 @@ namespace tavisk {
 
 Result<std::unique_ptr<RehearsalHost>> RehearsalHost::open(ForetellingMachine machine, const std::string& directory,
                                                            EffectSink& effects, RunLoop& runLoop) {
-  if (const auto copied = copyMachine(*machine.host, *machine.effects, directory); !copied) return copied.failure();
+  if (const auto copied = copyMachine(*machine.host, *machine.effects, directory, effects); !copied)
+    return copied.failure();
   Copy copy{std::make_unique<EffectSink>(), nullptr, nullptr};
   auto host = ScratchHost::open(directory, *copy.effects, runLoop);
   if (!host) return host.failure();

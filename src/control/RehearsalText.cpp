@@ -1,0 +1,108 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <algorithm>
+#include <iterator>
+
+#include "base/Json.h"
+#include "base/Text.h"
+#include "control/Rehearsal.h"
+#include "control/StatusText.h"
+#include "control/TextTable.h"
+
+namespace tavisk::control {
+namespace {
+
+std::string joined(std::span<const std::string> texts, const char* between) {
+  std::string all;
+  for (const auto& text : texts) all.append(all.empty() ? "" : between).append(text);
+  return all;
+}
+
+std::string outcomeOf(Verdict verdict, const std::string& reason) {
+  const std::string name = nameOf(verdict);
+  return reason.empty() ? name : name + ": " + reason;
+}
+
+void add(TextTable& table, const RehearsedSetting& setting) {
+  const auto name = escaped(setting.setting);
+  if (setting.verdict == Verdict::notSupported) return table.addRow({name, outcomeOf(setting.verdict, setting.reason)});
+  table.addRow({name, shownAny(setting.now, setting.unit), shownAny(setting.then, setting.unit),
+                setting.where.empty() ? "-" : escaped(setting.where)});
+  if (setting.verdict != Verdict::applied) table.addRemark(outcomeOf(setting.verdict, setting.reason));
+  if (setting.stored && setting.stored != setting.then)
+    table.addRemark("after a restart: " + shownAny(setting.stored, setting.unit));
+  if (!setting.undoneBy.empty()) table.addRemark("may be undone by " + escaped(setting.undoneBy));
+  for (const auto& note : setting.notes) table.addRemark(escaped(note));
+}
+
+/// What a setting's row does not say.
+bool isToldApart(const WordResult& word) {
+  const auto verdict = verdictOf(word);
+  if (verdict <= Verdict::applied) return false;
+  return std::ranges::none_of(word.effects, [&](const Effect& effect) {
+    return effect.asked && effect.failure && verdictOf(effect) == verdict;
+  });
+}
+
+void addIfKnown(JsonObject& object, std::string_view name, const std::optional<std::string>& value) {
+  if (value) object.text(name, *value);
+}
+
+void addIfAny(JsonObject& object, std::string_view name, const std::string& value) {
+  if (!value.empty()) object.text(name, value);
+}
+
+std::string toJson(const RehearsedSetting& setting) {
+  JsonObject object;
+  object.text("setting", setting.setting);
+  addIfKnown(object, "now", setting.now);
+  addIfKnown(object, "then", setting.then);
+  addIfKnown(object, "stored", setting.stored);
+  addIfAny(object, "unit", setting.unit);
+  addIfAny(object, "where", setting.where);
+  object.text("outcome", nameOf(setting.verdict));
+  addIfAny(object, "reason", setting.reason);
+  addIfAny(object, "undoneBy", setting.undoneBy);
+  addIfAny(object, "note", joined(setting.notes, "; "));
+  return object.str();
+}
+
+std::string toJson(const WordResult& word) {
+  JsonObject object;
+  object.text("command", word.words.front());
+  if (word.words.size() > 1) object.text("argument", joined(std::span(word.words).subspan(1), " "));
+  const auto reason = reasonOf(word);
+  object.text("outcome", nameOf(verdictOf(word)));
+  addIfAny(object, "reason", reason);
+  object.boolean("failed", word.isFlagUp).text("output", word.printed);
+  return object.str();
+}
+
+template <typename Parts>
+std::vector<std::string> jsonOfEach(const Parts& parts) {
+  std::vector<std::string> all;
+  std::ranges::transform(parts, std::back_inserter(all), [](const auto& part) { return toJson(part); });
+  return all;
+}
+
+}  // namespace
+
+std::string rehearsedTable(const Rehearsed& rehearsed) {
+  TextTable table;
+  table.addRow({"Setting", "Now", "Then", "Kept in"});
+  for (const auto& setting : rehearsed.settings) add(table, setting);
+  for (const auto& word : rehearsed.words)
+    if (isToldApart(word))
+      table.addRow({escaped(joined(word.words, " ")), escaped(outcomeOf(verdictOf(word), reasonOf(word)))});
+  return table.str();
+}
+
+std::string rehearsedJson(const Rehearsed& rehearsed, const std::string& folder) {
+  JsonObject object;
+  object.integer("rehearse", 1).boolean("done", isAllDone(rehearsed));
+  addIfAny(object, "folder", folder);
+  if (!rehearsed.words.empty()) object.array("commands", {jsonOfEach(rehearsed.words)});
+  return object.array("settings", {jsonOfEach(rehearsed.settings)}).str();
+}
+
+}  // namespace tavisk::control
