@@ -52,6 +52,8 @@ void addIfAny(JsonObject& object, std::string_view name, const std::string& valu
   if (!value.empty()) object.text(name, value);
 }
 
+using tavisk::toJson;
+
 std::string toJson(const RehearsedSetting& setting) {
   JsonObject object;
   object.text("setting", setting.setting);
@@ -67,6 +69,15 @@ std::string toJson(const RehearsedSetting& setting) {
   return object.str();
 }
 
+std::string toJson(const WordResult& word);
+
+template <typename Parts>
+std::vector<std::string> jsonOfEach(const Parts& parts) {
+  std::vector<std::string> all;
+  std::ranges::transform(parts, std::back_inserter(all), [](const auto& part) { return toJson(part); });
+  return all;
+}
+
 std::string toJson(const WordResult& word) {
   JsonObject object;
   object.text("command", word.words.front());
@@ -74,15 +85,8 @@ std::string toJson(const WordResult& word) {
   const auto reason = reasonOf(word);
   object.text("outcome", nameOf(verdictOf(word)));
   addIfAny(object, "reason", reason);
-  object.boolean("failed", word.isFlagUp).text("output", word.printed);
-  return object.str();
-}
-
-template <typename Parts>
-std::vector<std::string> jsonOfEach(const Parts& parts) {
-  std::vector<std::string> all;
-  std::ranges::transform(parts, std::back_inserter(all), [](const auto& part) { return toJson(part); });
-  return all;
+  object.boolean("failed", word.isFlagUp).array("effects", {jsonOfEach(word.effects)});
+  return object.text("output", word.printed).str();
 }
 
 }  // namespace
