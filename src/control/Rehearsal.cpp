@@ -5,14 +5,10 @@
 #include <algorithm>
 #include <utility>
 
-#include "base/Text.h"
 #include "control/ManagedSettings.h"
-#include "control/SilentFrame.h"
 
 namespace tavisk::control {
 namespace {
-
-constexpr const char* notRehearsed = "the startup disk is not rehearsed";
 
 std::string unitOf(const std::string& name) {
   const auto setting = std::ranges::find(managedSettings(), name, &ManagedSetting::name);
@@ -29,11 +25,6 @@ std::string unitOf(const std::string& name) {
   }
 }
 
-std::string withDash(const std::string& word) {
-  const auto typed = lowerCased(word);
-  return typed.starts_with('-') ? typed : "-" + typed;
-}
-
 void addOnce(std::vector<std::string>& texts, const std::string& text) {
   if (!text.empty() && std::ranges::find(texts, text) == texts.end()) texts.push_back(text);
 }
@@ -41,17 +32,6 @@ void addOnce(std::vector<std::string>& texts, const std::string& text) {
 /// What is done without any value, as when a daemon is told to read its files again, is no setting of the machine.
 bool isOfInterest(const Effect& effect) {
   return effect.asked && (effect.failure || effect.before || effect.live || effect.stored);
-}
-
-WordResult unrehearsed(std::span<const std::string> words, const CommandTable& table) {
-  const auto* entry = table.findTyped(words.front());
-  const std::size_t taken = entry ? static_cast<std::size_t>(entry->arguments) + 1 : 1;
-  const auto own = words.first(std::min(taken, words.size()));
-  WordResult result{.words = {own.begin(), own.end()}};
-  Effect effect{.setting = "Startup Disk", .outcome = Outcome::notSupported};
-  effect.failure = Failure{"rehearse", words.front(), notRehearsed};
-  result.effects.push_back(std::move(effect));
-  return result;
 }
 
 }  // namespace
@@ -80,20 +60,14 @@ std::string RehearsalNotes::whereKept(std::string_view setting) const {
   return noted == _settings.end() ? "" : noted->where;
 }
 
-bool isOfStartupDisk(const std::string& word) {
-  constexpr std::string_view words[] = {"-getstartupdisk", "-setstartupdisk", "-liststartupdisks"};
-  return std::ranges::find(words, withDash(word)) != std::end(words);
-}
-
-std::vector<WordResult> rehearseWords(std::span<const std::string> words, WordRunner& runner) {
-  const auto table = productTable();
-  std::vector<WordResult> results;
-  while (!words.empty()) {
-    results.push_back(isOfStartupDisk(words.front()) ? unrehearsed(words, table) : runner.run(words));
-    if (results.back().isLast) break;
-    words = words.subspan(results.back().words.size());
+Rehearsed rehearseWords(std::span<const std::string> words, WordRunner& runner) {
+  Rehearsed rehearsed;
+  while (!words.empty() && (rehearsed.words.empty() || !rehearsed.words.back().isLast)) {
+    rehearsed.words.push_back(runner.run(words));
+    words = words.subspan(rehearsed.words.back().words.size());
   }
-  return results;
+  rehearsed.dropped.assign(words.begin(), words.end());
+  return rehearsed;
 }
 
 RehearsedSetting rehearsed(const AppliedSetting& applied, const RehearsalNotes& notes) {
@@ -111,7 +85,8 @@ RehearsedSetting rehearsed(const AppliedSetting& applied, const RehearsalNotes& 
 
 bool isAllDone(const Rehearsed& rehearsed) {
   const auto isDone = [](Verdict verdict) { return verdict <= Verdict::applied; };
-  return std::ranges::all_of(rehearsed.words, [&](const auto& word) { return isDone(verdictOf(word)); }) &&
+  return rehearsed.dropped.empty() &&
+         std::ranges::all_of(rehearsed.words, [&](const auto& word) { return isDone(verdictOf(word)); }) &&
          std::ranges::all_of(rehearsed.settings, isDone, &RehearsedSetting::verdict);
 }
 

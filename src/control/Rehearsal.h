@@ -30,6 +30,7 @@ struct RehearsedSetting {
 /// What a rehearsal came to.
 struct Rehearsed {
   std::vector<WordResult> words = {};           ///< the commands in their order; of a file there are none
+  std::vector<std::string> dropped = {};        ///< words after one that ends the run
   std::vector<RehearsedSetting> settings = {};  ///< in the order in which they were first changed
 };
 
@@ -47,11 +48,8 @@ class RehearsalNotes final : public EffectChannel {
   std::vector<RehearsedSetting> _settings;
 };
 
-/// Whether words of tavisk are about the startup disk, which is not rehearsed.
-bool isOfStartupDisk(const std::string& word);
-
-/// Runs the words one after the other. Those about the startup disk are not supported.
-std::vector<WordResult> rehearseWords(std::span<const std::string> words, WordRunner& runner);
+/// Runs the words one after the other, until one ends the run.
+Rehearsed rehearseWords(std::span<const std::string> words, WordRunner& runner);
 
 /// A setting as it was applied to the copy of the machine.
 RehearsedSetting rehearsed(const AppliedSetting& applied, const RehearsalNotes& notes);

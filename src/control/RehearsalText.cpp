@@ -98,6 +98,7 @@ std::string rehearsedTable(const Rehearsed& rehearsed) {
   for (const auto& word : rehearsed.words)
     if (isToldApart(word))
       table.addRow({escaped(joined(word.words, " ")), escaped(outcomeOf(verdictOf(word), reasonOf(word)))});
+  if (!rehearsed.dropped.empty()) table.addRemark("not run: " + escaped(joined(rehearsed.dropped, " ")));
   return table.str();
 }
 
@@ -106,6 +107,7 @@ std::string rehearsedJson(const Rehearsed& rehearsed, const std::string& folder)
   object.integer("rehearse", 1).boolean("done", isAllDone(rehearsed));
   addIfAny(object, "folder", folder);
   if (!rehearsed.words.empty()) object.array("commands", {jsonOfEach(rehearsed.words)});
+  addIfAny(object, "dropped", joined(rehearsed.dropped, " "));
   return object.array("settings", {jsonOfEach(rehearsed.settings)}).str();
 }
 

@@ -10,7 +10,6 @@
 #include "control/Commands.h"
 #include "control/Rehearsal.h"
 #include "control/RehearsalFolder.h"
-#include "effects/SettingNames.h"
 
 namespace tavisk::control {
 namespace {
@@ -24,10 +23,6 @@ struct Part {
   std::vector<Step> steps;
 };
 
-bool isSearched(const WantedSetting& wanted) {
-  return wanted.setting->isSearched;
-}
-
 Result<Part> askedPart(const Invocation& invocation) {
   const bool isFile = invocation.has(from);
   if (isFile != invocation.operands.empty())
@@ -35,8 +30,6 @@ Result<Part> askedPart(const Invocation& invocation) {
   if (!isFile) return Part{invocation.operands, {}};
   const auto wanted = wantedInFile(invocation.options.at(from));
   if (!wanted) return wanted.failure();
-  if (std::ranges::any_of(*wanted, isSearched))
-    return Failure{"rehearse", setting::startupDisk, "it is not rehearsed: take it out of the file"};
   return Part{{}, stepsFor(*wanted)};
 }
 
@@ -46,8 +39,9 @@ std::optional<std::string> keptFolder(const Invocation& invocation) {
 
 Rehearsed rehearsedOn(Host& host, const Part& part, WordRunner& runner, StatusReader& reader, RehearsalNotes& notes) {
   if (part.steps.empty()) {
-    auto words = rehearseWords(part.words, runner);
-    return {std::move(words), notes.settings()};
+    auto all = rehearseWords(part.words, runner);
+    all.settings = notes.settings();
+    return all;
   }
   Applier applier(host, runner, reader);
   Rehearsed all;

@@ -37,6 +37,7 @@ RehearsalHost::RehearsalHost(ForetellingMachine machine, Copy copy, EffectSink& 
       _remoteEvents(_stage, &Host::remoteEvents, setting::remoteEvents, "Remote Events"),
       _hostConfiguration(_stage, _machine.showsHostName),
       _bootLoaderFile(_stage),
+      _diskManagement(_stage),
       _processes(_stage) {}
 
 }  // namespace tavisk

@@ -21,7 +21,8 @@ struct ForetellingMachine {
 };
 
 /// A machine and its copy in files, on which is done what the machine would do: what is changed is changed there alone.
-/// It has no startup disks.
+/// The
+/// copy has no startup disks: those are the machine's, of which one is chosen without writing it down.
 class RehearsalHost final : public Host {
  public:
   /// Copies the machine into the folder, which is there and empty. Effects are told as the machine would tell them.
@@ -30,7 +31,7 @@ class RehearsalHost final : public Host {
 
   UserDatabase& users() override { return _copy->users(); }
   AdminAuthenticator& authenticator() override { return _copy->authenticator(); }
-  FileSystem& files() override { return _copy->files(); }
+  FileSystem& files() override { return _machine.host->files(); }
   SystemLog& systemLog() override { return _copy->systemLog(); }
   ClockService& clock() override { return _clock; }
   NetworkTimeService& networkTime() override { return _networkTime; }
@@ -44,14 +45,14 @@ class RehearsalHost final : public Host {
   PreferencesStore& preferences() override { return _copy->preferences(); }
   ProcessUtilities& processes() override { return _processes; }
 
-  DiskEventSession& diskEvents() override { return _copy->diskEvents(); }
-  DiskManagementService& diskManagement() override { return _copy->diskManagement(); }
-  IORegistry& registry() override { return _copy->registry(); }
-  NetworkInterfaces& networkInterfaces() override { return _copy->networkInterfaces(); }
+  DiskEventSession& diskEvents() override { return _machine.host->diskEvents(); }
+  DiskManagementService& diskManagement() override { return _diskManagement; }
+  IORegistry& registry() override { return _machine.host->registry(); }
+  NetworkInterfaces& networkInterfaces() override { return _machine.host->networkInterfaces(); }
   KernelValues& kernel() override { return _copy->kernel(); }
   KeyboardInputService& keyboardInput() override { return _copy->keyboardInput(); }
-  UserDefaults& userDefaults() override { return _copy->userDefaults(); }
-  ProgramRunner& programs() override { return _copy->programs(); }
+  UserDefaults& userDefaults() override { return _machine.host->userDefaults(); }
+  ProgramRunner& programs() override { return _machine.host->programs(); }
   ProcessTermination& processTermination() override { return _copy->processTermination(); }
 
  private:
@@ -75,6 +76,7 @@ class RehearsalHost final : public Host {
   RehearsedRemoteAccess<RemoteEventsService> _remoteEvents;
   RehearsedHostConfiguration _hostConfiguration;
   RehearsedBootLoaderFile _bootLoaderFile;
+  RehearsedDiskManagement _diskManagement;
   RehearsedProcesses _processes;
 };
 

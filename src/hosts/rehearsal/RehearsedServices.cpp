@@ -128,10 +128,9 @@ ControllerStatus RehearsedPowerController::setProperties(const Connection& conne
 
 template <typename Service>
 RemoteAccessState RehearsedRemoteAccess<Service>::state() {
-  static_cast<void>((_stage.copy().*_service)().state());
-  if (!_ofMachine) _ofMachine = (_stage.machine().*_service)().state();
   const auto rehearsed = _stage.stateOf(_setting);
-  if (!rehearsed) return *_ofMachine;
+  if (!rehearsed) return (_stage.machine().*_service)().state();
+  static_cast<void>((_stage.copy().*_service)().state());
   if (rehearsed->live == rehearsed->stored)
     return rehearsed->live == "on" ? RemoteAccessState::on : RemoteAccessState::off;
   return RemoteAccessState::partly;
@@ -189,6 +188,31 @@ bool RehearsedHostConfiguration::hasComputerName() {
 
 bool RehearsedBootLoaderFile::write(const PropertyList::Dictionary& contents) {
   return !hasFailed(_stage.play([&](Host& host) { host.bootLoaderFile().write(contents); }));
+}
+
+BootSettings::BootPreference RehearsedDiskManagement::bootPreference() {
+  if (!_chosen) return machine().bootPreference();
+  _stage.tell(SettingValue{.setting = setting::startupDisk, .live = _chosen->text, .stored = _chosen->text});
+  return {0, _chosen};
+}
+
+/// Who has chosen a disk starts from it.
+BootSettings::NetworkBootPreference RehearsedDiskManagement::networkBootPreference() {
+  if (_chosen) return {};
+  return machine().networkBootPreference();
+}
+
+ServiceStatus RehearsedDiskManagement::setBootPreference(const BootChoice& choice) {
+  ServiceStatus status = 0;
+  _stage.playOnMachine([&](Host& host) { status = host.diskManagement().setBootPreference(choice); });
+  if (status == 0) _chosen = choice.disk;
+  return status;
+}
+
+ServiceStatus RehearsedDiskManagement::setFirmwareVariable(const std::string& name, const Result<std::string>& value) {
+  ServiceStatus status = 0;
+  _stage.playOnMachine([&](Host& host) { status = host.diskManagement().setFirmwareVariable(name, value); });
+  return status;
 }
 
 void RehearsedProcesses::sendSignal(int signal, ProcessId process) {

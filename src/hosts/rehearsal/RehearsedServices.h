@@ -10,6 +10,7 @@
 #include "hosts/rehearsal/Stage.h"
 #include "platform/BootLoaderFile.h"
 #include "platform/ClockService.h"
+#include "platform/DiskManagementService.h"
 #include "platform/NameServices.h"
 #include "platform/NetworkTimeService.h"
 #include "platform/PowerController.h"
@@ -107,7 +108,6 @@ class RehearsedRemoteAccess final : public Service {
   Service& (Host::*_service)();
   const char* _setting;
   const char* _section;
-  std::optional<RemoteAccessState> _ofMachine;
 };
 
 class RehearsedHostConfiguration final : public HostConfigService {
@@ -135,6 +135,31 @@ class RehearsedBootLoaderFile final : public BootLoaderFile {
 
  private:
   Stage& _stage;
+};
+
+/// The disks and the firmware are the machine's: the copy has none. What is chosen to start next is remembered.
+class RehearsedDiskManagement final : public DiskManagementService {
+ public:
+  explicit RehearsedDiskManagement(Stage& stage) : _stage(stage) {}
+
+  bool is(DiskTrait trait, const DiskName& disk) override { return machine().is(trait, disk); }
+  std::string protocolOf(const DiskName& disk) override { return machine().protocolOf(disk); }
+  std::string nameOf(DiskProtocol protocol) override { return machine().nameOf(protocol); }
+  int partitionScheme(const DiskName& disk) override { return machine().partitionScheme(disk); }
+  OpticalBootability opticalBootability(const DiskName& disk) override { return machine().opticalBootability(disk); }
+
+  int preBootEnvironment() override { return machine().preBootEnvironment(); }
+  LegacyBootSupport legacyBootSupport() override { return machine().legacyBootSupport(); }
+  BootPreference bootPreference() override;
+  NetworkBootPreference networkBootPreference() override;
+  ServiceStatus setBootPreference(const BootChoice& choice) override;
+  ServiceStatus setFirmwareVariable(const std::string& name, const Result<std::string>& value) override;
+
+ private:
+  DiskManagementService& machine() { return _stage.machine().diskManagement(); }
+
+  Stage& _stage;
+  std::optional<DiskName> _chosen;  ///< absent: what the machine starts
 };
 
 /// What is set of preferences and keyboards is foretold when it is written out.

@@ -19,7 +19,8 @@ bool isStored(const Effect& effect) {
 
 }  // namespace
 
-Stage::Stage(const Players& players, EffectSink& audience) : _players(players), _audience(audience) {
+Stage::Stage(const Players& players, EffectSink& audience)
+    : _players(players), _audience(audience), _foretold(audience) {
   _players.machineEffects.addChannel(_foretold);
   _players.copyEffects.addChannel(*this);
 }
@@ -52,7 +53,9 @@ Stage::Effects Stage::play(const Act& onMachine, const std::function<void(Host&,
 
 Stage::Effects Stage::foretold(const Act& act) {
   _foretold.effects.clear();
+  _foretold.isForetelling = true;
   act(_players.machine);
+  _foretold.isForetelling = false;
   auto effects = std::exchange(_foretold.effects, {});
   for (auto& effect : effects) effect = inViewOfState(std::move(effect));
   return effects;

@@ -44,6 +44,9 @@ class Stage final : public EffectChannel {
   /// What the machine says, and nothing more is done.
   Effects foretold(const Act& act);
   void tell(const Effects& effects);
+  void tell(const SettingValue& value) { _audience.observe(value); }
+  /// Of what the copy does not have.
+  void playOnMachine(const Act& act) { tell(foretold(act)); }
   /// Changes of the copy that no service makes.
   void edit(const MachineFile::Edit& edit);
 
@@ -62,10 +65,26 @@ class Stage final : public EffectChannel {
   bool wantsPlaces() const override { return _audience.wantsPlaces(); }
 
  private:
+  /// What the machine tells: kept while it foretells, and told on when it is asked what the copy does not have.
   class Foretold final : public EffectChannel {
    public:
-    void record(const Effect& effect) override { effects.push_back(effect); }
+    explicit Foretold(EffectSink& audience) : _audience(audience) {}
+
+    void record(const Effect& effect) override {
+      if (!isForetelling) return _audience.record(effect);
+      effects.push_back(effect);
+    }
+    void observe(const SettingValue& value) override {
+      if (!isForetelling) _audience.observe(value);
+    }
+    bool wantsValues() const override { return !isForetelling && _audience.wantsValues(); }
+    bool wantsPlaces() const override { return !isForetelling && _audience.wantsPlaces(); }
+
     Effects effects;
+    bool isForetelling = false;
+
+   private:
+    EffectSink& _audience;
   };
   Effect inViewOfState(Effect effect) const;
   void refuse(const Effects& effects);
