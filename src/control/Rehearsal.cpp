@@ -10,7 +10,7 @@
 namespace tavisk::control {
 namespace {
 
-std::string unitOf(const std::string& name) {
+std::string unitOfSetting(const std::string& name) {
   const auto setting = std::ranges::find(managedSettings(), name, &ManagedSetting::name);
   if (setting == managedSettings().end()) return {};
   switch (setting->kind) {
@@ -40,7 +40,7 @@ void RehearsalNotes::record(const Effect& effect) {
   if (!isOfInterest(effect)) return;
   auto noted = std::ranges::find(_settings, effect.setting, &RehearsedSetting::setting);
   if (noted == _settings.end()) {
-    _settings.push_back({.setting = effect.setting, .unit = unitOf(effect.setting)});
+    _settings.push_back({.setting = effect.setting, .unit = unitOfSetting(effect.setting)});
     noted = std::prev(_settings.end());
     noted->now = effect.before ? effect.before : effect.outcome == Outcome::applied ? std::nullopt : effect.stored;
   }

@@ -18,17 +18,18 @@ std::string joined(std::span<const std::string> texts, const char* between) {
   return all;
 }
 
-std::string outcomeOf(Verdict verdict, const std::string& reason) {
+std::string verdictText(Verdict verdict, const std::string& reason) {
   const std::string name = nameOf(verdict);
   return reason.empty() ? name : name + ": " + reason;
 }
 
-void add(TextTable& table, const RehearsedSetting& setting) {
+void addSetting(TextTable& table, const RehearsedSetting& setting) {
   const auto name = escaped(setting.setting);
-  if (setting.verdict == Verdict::notSupported) return table.addRow({name, outcomeOf(setting.verdict, setting.reason)});
+  if (setting.verdict == Verdict::notSupported)
+    return table.addRow({name, verdictText(setting.verdict, setting.reason)});
   table.addRow({name, shownAny(setting.now, setting.unit), shownAny(setting.then, setting.unit),
                 setting.where.empty() ? "-" : escaped(setting.where)});
-  if (setting.verdict != Verdict::applied) table.addRemark(outcomeOf(setting.verdict, setting.reason));
+  if (setting.verdict != Verdict::applied) table.addRemark(verdictText(setting.verdict, setting.reason));
   if (setting.stored && setting.stored != setting.then)
     table.addRemark("after a restart: " + shownAny(setting.stored, setting.unit));
   if (!setting.undoneBy.empty()) table.addRemark("may be undone by " + escaped(setting.undoneBy));
@@ -44,47 +45,49 @@ bool isToldApart(const WordResult& word) {
   });
 }
 
-void addIfKnown(JsonObject& object, std::string_view name, const std::optional<std::string>& value) {
+void addKnown(JsonObject& object, std::string_view name, const std::optional<std::string>& value) {
   if (value) object.text(name, *value);
 }
 
-void addIfAny(JsonObject& object, std::string_view name, const std::string& value) {
+void addAny(JsonObject& object, std::string_view name, const std::string& value) {
   if (!value.empty()) object.text(name, value);
 }
 
-using tavisk::toJson;
-
-std::string toJson(const RehearsedSetting& setting) {
+std::string partJson(const RehearsedSetting& setting) {
   JsonObject object;
   object.text("setting", setting.setting);
-  addIfKnown(object, "now", setting.now);
-  addIfKnown(object, "then", setting.then);
-  addIfKnown(object, "stored", setting.stored);
-  addIfAny(object, "unit", setting.unit);
-  addIfAny(object, "where", setting.where);
+  addKnown(object, "now", setting.now);
+  addKnown(object, "then", setting.then);
+  addKnown(object, "stored", setting.stored);
+  addAny(object, "unit", setting.unit);
+  addAny(object, "where", setting.where);
   object.text("outcome", nameOf(setting.verdict));
-  addIfAny(object, "reason", setting.reason);
-  addIfAny(object, "undoneBy", setting.undoneBy);
-  addIfAny(object, "note", joined(setting.notes, "; "));
+  addAny(object, "reason", setting.reason);
+  addAny(object, "undoneBy", setting.undoneBy);
+  addAny(object, "note", joined(setting.notes, "; "));
   return object.str();
 }
 
-std::string toJson(const WordResult& word);
+std::string partJson(const WordResult& word);
+
+std::string partJson(const Effect& effect) {
+  return toJson(effect);
+}
 
 template <typename Parts>
 std::vector<std::string> jsonOfEach(const Parts& parts) {
   std::vector<std::string> all;
-  std::ranges::transform(parts, std::back_inserter(all), [](const auto& part) { return toJson(part); });
+  std::ranges::transform(parts, std::back_inserter(all), [](const auto& part) { return partJson(part); });
   return all;
 }
 
-std::string toJson(const WordResult& word) {
+std::string partJson(const WordResult& word) {
   JsonObject object;
   object.text("command", word.words.front());
   if (word.words.size() > 1) object.text("argument", joined(std::span(word.words).subspan(1), " "));
   const auto reason = reasonOf(word);
   object.text("outcome", nameOf(verdictOf(word)));
-  addIfAny(object, "reason", reason);
+  addAny(object, "reason", reason);
   object.boolean("failed", word.isFlagUp).array("effects", {jsonOfEach(word.effects)});
   return object.text("output", word.printed).str();
 }
@@ -94,10 +97,10 @@ std::string toJson(const WordResult& word) {
 std::string rehearsedTable(const Rehearsed& rehearsed) {
   TextTable table;
   table.addRow({"Setting", "Now", "Then", "Kept in"});
-  for (const auto& setting : rehearsed.settings) add(table, setting);
+  for (const auto& setting : rehearsed.settings) addSetting(table, setting);
   for (const auto& word : rehearsed.words)
     if (isToldApart(word))
-      table.addRow({escaped(joined(word.words, " ")), escaped(outcomeOf(verdictOf(word), reasonOf(word)))});
+      table.addRow({escaped(joined(word.words, " ")), escaped(verdictText(verdictOf(word), reasonOf(word)))});
   if (!rehearsed.dropped.empty()) table.addRemark("not run: " + escaped(joined(rehearsed.dropped, " ")));
   return table.str();
 }
@@ -105,9 +108,9 @@ std::string rehearsedTable(const Rehearsed& rehearsed) {
 std::string rehearsedJson(const Rehearsed& rehearsed, const std::string& folder) {
   JsonObject object;
   object.integer("rehearse", 1).boolean("done", isAllDone(rehearsed));
-  addIfAny(object, "folder", folder);
+  addAny(object, "folder", folder);
   if (!rehearsed.words.empty()) object.array("commands", {jsonOfEach(rehearsed.words)});
-  addIfAny(object, "dropped", joined(rehearsed.dropped, " "));
+  addAny(object, "dropped", joined(rehearsed.dropped, " "));
   return object.array("settings", {jsonOfEach(rehearsed.settings)}).str();
 }
 
