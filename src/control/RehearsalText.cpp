@@ -45,26 +45,18 @@ bool isToldApart(const WordResult& word) {
   });
 }
 
-void addKnown(JsonObject& object, std::string_view name, const std::optional<std::string>& value) {
-  if (value) object.text(name, *value);
-}
-
-void addAny(JsonObject& object, std::string_view name, const std::string& value) {
-  if (!value.empty()) object.text(name, value);
-}
-
 std::string partJson(const RehearsedSetting& setting) {
   JsonObject object;
   object.text("setting", setting.setting);
-  addKnown(object, "now", setting.now);
-  addKnown(object, "then", setting.then);
-  addKnown(object, "stored", setting.stored);
-  addAny(object, "unit", setting.unit);
-  addAny(object, "where", setting.where);
+  object.textIfKnown("now", setting.now);
+  object.textIfKnown("then", setting.then);
+  object.textIfKnown("stored", setting.stored);
+  object.textUnlessEmpty("unit", setting.unit);
+  object.textUnlessEmpty("where", setting.where);
   object.text("outcome", nameOf(setting.verdict));
-  addAny(object, "reason", setting.reason);
-  addAny(object, "undoneBy", setting.undoneBy);
-  addAny(object, "note", joined(setting.notes, "; "));
+  object.textUnlessEmpty("reason", setting.reason);
+  object.textUnlessEmpty("undoneBy", setting.undoneBy);
+  object.textUnlessEmpty("note", joined(setting.notes, "; "));
   return object.str();
 }
 
@@ -87,7 +79,7 @@ std::string partJson(const WordResult& word) {
   if (word.words.size() > 1) object.text("argument", joined(std::span(word.words).subspan(1), " "));
   const auto reason = reasonOf(word);
   object.text("outcome", nameOf(verdictOf(word)));
-  addAny(object, "reason", reason);
+  object.textUnlessEmpty("reason", reason);
   object.boolean("failed", word.isFlagUp).array("effects", {jsonOfEach(word.effects)});
   return object.text("output", word.printed).str();
 }
@@ -108,9 +100,9 @@ std::string rehearsedTable(const Rehearsed& rehearsed) {
 std::string rehearsedJson(const Rehearsed& rehearsed, const std::string& folder) {
   JsonObject object;
   object.integer("rehearse", 1).boolean("done", isAllDone(rehearsed));
-  addAny(object, "folder", folder);
+  object.textUnlessEmpty("folder", folder);
   if (!rehearsed.words.empty()) object.array("commands", {jsonOfEach(rehearsed.words)});
-  addAny(object, "dropped", joined(rehearsed.dropped, " "));
+  object.textUnlessEmpty("dropped", joined(rehearsed.dropped, " "));
   return object.array("settings", {jsonOfEach(rehearsed.settings)}).str();
 }
 

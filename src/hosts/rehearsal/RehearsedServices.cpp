@@ -50,7 +50,8 @@ void RehearsedNetworkTime::checkLaunchAtStartup(bool launch) {
 }
 
 void RehearsedNetworkTime::start() {
-  _stage.play([](Host& host) { host.networkTime().start(); });
+  const auto effects = _stage.play([](Host& host) { host.networkTime().start(); });
+  _isServerChanged = _isServerChanged && !isApplied(effects);
 }
 
 void RehearsedNetworkTime::stop() {
@@ -58,11 +59,18 @@ void RehearsedNetworkTime::stop() {
 }
 
 void RehearsedNetworkTime::setServer(const NetworkTimeServer& server) {
-  _stage.play([&](Host& host) { host.networkTime().setServer(server); });
+  const auto effects = _stage.play([&](Host& host) { host.networkTime().setServer(server); });
+  _isServerChanged = _isServerChanged || isApplied(effects);
 }
 
+/// The machine knows of no server that was rehearsed: whether its client has read it is said here.
 void RehearsedNetworkTime::restartAsynchronously() {
-  _stage.play([](Host& host) { host.networkTime().restartAsynchronously(); });
+  auto effects = _stage.foretold([](Host& host) { host.networkTime().restartAsynchronously(); });
+  for (auto& effect : effects)
+    if (!effect.failure && _stage.stateOf(setting::networkTimeServer))
+      effect.outcome = _isServerChanged ? Outcome::applied : Outcome::unchanged;
+  _isServerChanged = _isServerChanged && hasFailed(effects);
+  _stage.tell(effects);
 }
 
 Minutes RehearsedPowerSettings::untilSleep(SleepTimer timer, const PowerSource& source) {

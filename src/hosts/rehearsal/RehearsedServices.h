@@ -52,6 +52,7 @@ class RehearsedNetworkTime final : public NetworkTimeService {
 
  private:
   Stage& _stage;
+  bool _isServerChanged = false;  ///< since the client was last told to read it
 };
 
 class RehearsedPowerSettings final : public PowerSettingsService {

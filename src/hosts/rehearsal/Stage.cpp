@@ -91,7 +91,8 @@ Effect Stage::inViewOfState(Effect effect) const {
 }
 
 void Stage::remember(const Effect& effect) {
-  if (!effect.asked) return;
+  const bool isSetting = effect.asked && (effect.live || effect.stored);
+  if (!isSetting) return;
   if (effect.outcome == Outcome::applied)
     _states[effect.setting] = {*effect.asked, effect.live, effect.stored};
   else if (effect.outcome == Outcome::failed && isStored(effect))

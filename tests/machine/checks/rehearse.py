@@ -102,7 +102,7 @@ SETS = f"""
 -setstartupdisk Nowhere -getstartupdisk -setstartupdisk ''
 nonsense -settimezone Europe/Rome
 """.strip().splitlines()
-AT_ONCE = 18  # a check has its time
+AT_ONCE = 19  # a check has its time
 # Texts, flags and outcomes in their order; then the status.
 COMPARE = """told() { grep -o -e '"failed":[a-z]*' -e '{"setting":"[^"]*","outcome":"[^"]*"' -e '"output":"[^"]*"' "$1"; }
 while IFS= read -r words; do
