@@ -36,7 +36,7 @@ bool isOf(const Effect& effect, const ManagedSetting& setting) {
 }
 
 /// The results with nothing but the effects of one setting.
-Results resultsOf(const ManagedSetting& setting, Results results) {
+Results resultsFor(const ManagedSetting& setting, Results results) {
   for (auto& result : results)
     std::erase_if(result.effects, [&](const Effect& effect) { return !isOf(effect, setting); });
   return results;
@@ -64,8 +64,17 @@ void fail(AppliedSetting& applied, std::string reason) {
   applied.reason = std::move(reason);
 }
 
-void addTold(AppliedSetting& applied, const Results& results) {
-  for (const auto& result : results) {
+/// The setting itself stands without what only goes along with it.
+bool isUnsupportedCompanion(const Effect& effect, const ManagedSetting& setting) {
+  return effect.setting != setting.name && effect.outcome == Outcome::notSupported;
+}
+
+void addTold(AppliedSetting& applied, Results results) {
+  for (auto& result : results) {
+    for (const auto& effect : result.effects)
+      if (isUnsupportedCompanion(effect, *applied.setting))
+        applied.notes.push_back(effect.setting + " is not supported: " + describe(effect.failure.value_or(Failure())));
+    std::erase_if(result.effects, [&](const auto& effect) { return isUnsupportedCompanion(effect, *applied.setting); });
     const auto verdict = verdictOf(result);
     if (verdict > applied.verdict) applied.reason = reasonOf(result);
     applied.verdict = std::max(applied.verdict, verdict);
@@ -135,7 +144,7 @@ std::vector<AppliedSetting> Applier::apply(const Step& step) {
   const auto after = isNeeded ? statesOf(step) : before;
   std::vector<AppliedSetting> applied;
   for (std::size_t i = 0; i < step.asked.size(); ++i)
-    applied.push_back(judged(step.asked[i], before[i], after[i], resultsOf(*step.asked[i].setting, results)));
+    applied.push_back(judged(step.asked[i], before[i], after[i], resultsFor(*step.asked[i].setting, results)));
   return applied;
 }
 
