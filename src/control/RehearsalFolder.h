@@ -15,6 +15,8 @@ class RehearsalFolder final {
   /// `kept` is made, or is there and empty, and stays; without it there is a temporary folder.
   static Result<RehearsalFolder> make(const std::optional<std::string>& kept);
   RehearsalFolder(RehearsalFolder&& other) noexcept;
+  RehearsalFolder(const RehearsalFolder&) = delete;
+  RehearsalFolder& operator=(const RehearsalFolder&) = delete;
   RehearsalFolder& operator=(RehearsalFolder&&) = delete;
   /// Removes a temporary folder.
   ~RehearsalFolder();

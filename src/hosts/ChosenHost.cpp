@@ -52,22 +52,22 @@ HostOrFailure openForecastingScratchHost(const std::string& directory, EffectSin
 }  // namespace
 
 HostOrFailure openChosenHost(EffectSink& effects, RunLoop& runLoop, const HostRemark& remark) {
-  return openNamed({[&] { return std::make_unique<LinuxHost>(effects, runLoop); },
+  return openNamed({[&] { return std::unique_ptr<Host>(std::make_unique<LinuxHost>(effects, runLoop)); },
                     [&](const auto& directory) { return openScratchHost(directory, effects, runLoop, remark); }});
 }
 
 HostOrFailure openRehearsal(const std::string& directory, EffectSink& effects, RunLoop& runLoop) {
-  ForetellingMachine machine{std::make_unique<EffectSink>(), nullptr, false};
-  auto& told = *machine.effects;
+  auto told = std::make_unique<EffectSink>();
+  bool showsHostName = false;
   const auto openLinuxHost = [&] {
-    machine.showsHostName = true;
-    return std::make_unique<LinuxHost>(told, runLoop, "/", Conduct::forecast);
+    showsHostName = true;
+    return std::unique_ptr<Host>(std::make_unique<LinuxHost>(*told, runLoop, "/", Conduct::forecast));
   };
-  auto host =
-      openNamed({openLinuxHost, [&](const auto& source) { return openForecastingScratchHost(source, told, runLoop); }});
-  if (!host) return host.failure();
-  machine.host = std::move(host).value();
-  auto rehearsal = RehearsalHost::open(std::move(machine), directory, effects, runLoop);
+  auto machine = openNamed(
+      {openLinuxHost, [&](const auto& source) { return openForecastingScratchHost(source, *told, runLoop); }});
+  if (!machine) return machine.failure();
+  auto rehearsal =
+      RehearsalHost::open({std::move(told), std::move(machine).value(), showsHostName}, directory, effects, runLoop);
   if (!rehearsal) return rehearsal.failure();
   return std::unique_ptr<Host>(std::move(rehearsal).value());
 }

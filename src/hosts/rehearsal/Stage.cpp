@@ -52,11 +52,7 @@ Stage::Effects Stage::play(const Act& onMachine, const std::function<void(Host&,
 }
 
 Stage::Effects Stage::foretold(const Act& act) {
-  _foretold.effects.clear();
-  _foretold.isForetelling = true;
-  act(_players.machine);
-  _foretold.isForetelling = false;
-  auto effects = std::exchange(_foretold.effects, {});
+  auto effects = _foretold.during([&] { act(_players.machine); });
   for (auto& effect : effects) effect = inViewOfState(std::move(effect));
   return effects;
 }

@@ -6,6 +6,7 @@
 #include <map>
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "effects/EffectSink.h"
@@ -71,20 +72,27 @@ class Stage final : public EffectChannel {
     explicit Foretold(EffectSink& audience) : _audience(audience) {}
 
     void record(const Effect& effect) override {
-      if (!isForetelling) return _audience.record(effect);
-      effects.push_back(effect);
+      if (!_isForetelling) return _audience.record(effect);
+      _effects.push_back(effect);
     }
     void observe(const SettingValue& value) override {
-      if (!isForetelling) _audience.observe(value);
+      if (!_isForetelling) _audience.observe(value);
     }
-    bool wantsValues() const override { return !isForetelling && _audience.wantsValues(); }
-    bool wantsPlaces() const override { return !isForetelling && _audience.wantsPlaces(); }
+    bool wantsValues() const override { return !_isForetelling && _audience.wantsValues(); }
+    bool wantsPlaces() const override { return !_isForetelling && _audience.wantsPlaces(); }
 
-    Effects effects;
-    bool isForetelling = false;
+    /// What is told while this is done.
+    Effects during(const std::function<void()>& asked) {
+      _isForetelling = true;
+      asked();
+      _isForetelling = false;
+      return std::exchange(_effects, {});
+    }
 
    private:
     EffectSink& _audience;
+    Effects _effects;
+    bool _isForetelling = false;
   };
   Effect inViewOfState(Effect effect) const;
   void refuse(const Effects& effects);
