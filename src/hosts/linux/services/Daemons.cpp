@@ -175,7 +175,7 @@ Result<void> DaemonGroup::foreseeStartAll() const {
   for (const auto& member : _members) {
     const auto is = isReady(member);
     if (!is) return is.failure();
-    const auto started = *is ? Result<void>() : _daemons.foreseeStart(member);
+    auto started = *is ? Result<void>() : _daemons.foreseeStart(member);
     if (!started) return started;
   }
   return {};
