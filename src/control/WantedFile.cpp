@@ -77,11 +77,17 @@ const Json* memberOf(const Json& object, const char* name) {
   return found == object.end() ? nullptr : &*found;
 }
 
+/// In force is the first label of a name alone.
+bool isNameWithin(const Json& live, const Json& stored) {
+  return live.is_string() && stored.is_string() && stored.get<std::string>().starts_with(live.get<std::string>() + ".");
+}
+
 /// Of a reading, what is in force, else what is stored.
 const Json* valueIn(const Json& member) {
   if (!member.is_object()) return &member;
   const auto* live = memberOf(member, "live");
-  return live ? live : memberOf(member, "stored");
+  const auto* stored = memberOf(member, "stored");
+  return live && !(stored && isNameWithin(*live, *stored)) ? live : stored;
 }
 
 /// Both are there, and only one of them can be wanted.

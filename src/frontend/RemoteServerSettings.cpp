@@ -26,8 +26,7 @@ RemoteServerSettings::~RemoteServerSettings() {
 bool RemoteServerSettings::runTool(int argc, char** withArguments) {
   bool isStarted = false;
   safely([&] {
-    isStarted = setUp();
-    if (!isStarted) return;
+    if (!setUp()) return;
     setPromptUser(true);
     _interactive = argc == 1;
     if (!_interactive) {
@@ -35,6 +34,7 @@ bool RemoteServerSettings::runTool(int argc, char** withArguments) {
       _argv = withArguments;
     }
     _startUp = _context.runLoop.after(std::chrono::seconds(0), [this] { adminDidAuthenticateNotification(); });
+    isStarted = true;
   });
   return isStarted;
 }

@@ -26,6 +26,7 @@ TEST(WantedFile, IsReadInItsOrderOrRefusedWithTheReason) {
       {R"({"remote-login": "on", "Time Zone": "Europe/Paris"})", "Remote Login=on; Time Zone=Europe/Paris; "},
       {R"({"settings": {"timezone": {"live": "a", "stored": "a"}}})", "Time Zone=a; "},
       {R"({"Kernel Architecture": {"supported": true, "stored": "default"}})", "Kernel Architecture=default; "},
+      {R"({"localsubnetname": {"supported": true, "live": "a", "stored": "a.org"}})", "Local Subnet Name=a.org; "},
       {R"({"timezone": {"supported": true, "live": "a", "stored": "b"}})", "timezone: live and stored differ"},
       {R"({"Wake On Modem": {}})", "Wake On Modem: \"on\" or \"off\" is expected"},
       {R"({"Keyboard Lock": "off"})", "there is no setting Keyboard Lock"},
