@@ -20,6 +20,12 @@ constexpr OptionRow statusOptions[] = {
     {"--json", "Print one JSON object instead of a table."},
 };
 
+constexpr OptionRow rehearseOptions[] = {
+    {"--from", "Take settings and values from a JSON file; '-' is standard input.", "FILE"},
+    {"--keep", "Make the copy of the machine in this folder, and leave it there.", "DIR"},
+    {"--json", "Print one JSON object instead of a table."},
+};
+
 constexpr OptionRow applyOptions[] = {
     {"--from", "Take settings and values from a JSON file; '-' is standard input.", "FILE"},
     {"--skip-unsupported", "What this machine cannot have does not count."},
@@ -40,6 +46,9 @@ constexpr CommandRow commands[] = {
     {"status", "[SETTING...]", OperandKind::settings,
      "Show settings: what is in force, what will be after a restart, where it is kept and what may undo it.",
      statusOptions},
+    {"rehearse", "WORDS... | --from FILE", OperandKind::words,
+     "Do it to a copy of the machine in files, and tell what would change, and what would be refused and why.",
+     rehearseOptions},
     {"apply", "WORDS... | --from FILE", OperandKind::words,
      "Give settings the values asked for, where they differ, and tell what became of each.", applyOptions},
     {"undo", "", OperandKind::none, "Show what tavisk has changed and what each setting goes back to, or do it.",

@@ -9,6 +9,7 @@ namespace tavisk::control {
 
 /// The commands, each as its row tells: they complain of what they cannot do, and say how they ended.
 Status showStatus(const Invocation& invocation, const Tools& tools);
+Status rehearseChanges(const Invocation& invocation, const Tools& tools);
 Status applySettings(const Invocation& invocation, const Tools& tools);
 Status undoChanges(const Invocation& invocation, const Tools& tools);
 

@@ -17,6 +17,7 @@ using Command = Status (*)(const Invocation&, const Tools&);
 
 constexpr std::pair<std::string_view, Command> functions[] = {
     {"status", showStatus},
+    {"rehearse", rehearseChanges},
     {"apply", applySettings},
     {"undo", undoChanges},
 };

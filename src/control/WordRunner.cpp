@@ -130,6 +130,7 @@ void WordRunner::Gatherer::runEndedBySignal(const std::string& signal, bool fail
 void WordRunner::Gatherer::end(bool failed, const std::string& output) {
   const std::scoped_lock lock(_mutex);
   _result.hasRaisedFlag = failed && !_isFlagUp;
+  _result.isFlagUp = failed;
   _isFlagUp = failed;
   _result.printed += output;
 }

@@ -30,6 +30,7 @@ struct WordResult {
   std::vector<std::string> words = {};          ///< it and its arguments, as they were given
   std::optional<std::string> refused = {};      ///< what was expected in place of the word or of its argument
   std::optional<std::string> brokenOffBy = {};  ///< what ended the run in it ("out of memory")
+  bool isFlagUp = false;                        ///< the error flag, of which tavisk makes its status
   bool hasRaisedFlag = false;                   ///< the error flag is up, and was not before
   bool isLast = false;                          ///< the words after it are dropped
   std::string printed = {};

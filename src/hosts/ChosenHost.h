@@ -19,4 +19,8 @@ using HostRemark = std::function<void(std::string_view line)>;
 /// The host that TAVISK_HOST names: unset is the machine that the program runs on, "scratch:DIR" one of files.
 Result<std::unique_ptr<Host>> openChosenHost(EffectSink& effects, RunLoop& runLoop, const HostRemark& remark);
 
+/// A copy of that machine in a folder, which is there and empty: whatever is done to the host is done to the copy, as
+/// far as the machine would do it, and told as the machine would tell it. The machine itself is left alone.
+Result<std::unique_ptr<Host>> openRehearsal(const std::string& directory, EffectSink& effects, RunLoop& runLoop);
+
 }  // namespace tavisk

@@ -4,11 +4,11 @@
 
 namespace tavisk {
 
-LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& root)
+LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& root, Conduct conduct)
     : _root(root),
       _journalLog(_root),
       _services(_root, runLoop),
-      _machine{_root, effects, runLoop, _services, [this] { return _authenticator.authorizeChange(); }},
+      _machine{_root, effects, runLoop, _services, [this] { return _authenticator.authorizeChange(); }, conduct},
       _authenticator(_machine),
       _files(_root, effects),
       _systemLog(_root),
@@ -40,7 +40,7 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _processTermination(_machine),
       _preferences(_machine, _controller),
       _processes(_machine, _preferences) {
-  effects.addChannel(_journalLog);
+  if (conduct == Conduct::change) effects.addChannel(_journalLog);
 }
 
 /// Why a system is not listed, as the search itself tells.

@@ -32,8 +32,8 @@ class LinuxHost final : public Host {
  public:
   /// Adds the system log to the channels of `effects`; the host must be alive whenever effects are told. With a root
   /// other than "/" the files, sockets and processes are those beneath that folder; the users and the clock are this
-  /// machine's, and the clock is not set.
-  LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& root = "/");
+  /// machine's, and the clock is not set. A forecast is told to `effects` alone.
+  LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& root = "/", Conduct conduct = Conduct::change);
 
   UserDatabase& users() override { return _users; }
   AdminAuthenticator& authenticator() override { return _authenticator; }

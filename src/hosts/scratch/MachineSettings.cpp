@@ -46,6 +46,7 @@ void MachineSettings::observeUnsupported(const std::string& setting) {
 }
 
 void MachineSettings::note(const MachineSetting<bool>& setting, bool asked) {
+  if (_conduct == Conduct::forecast) return;
   const auto refusal = refused("set", refusalNamed(setting.name));
   const auto written = refusal ? *refusal : parts(setting).store(asked);
   if (!written) _effects.recordFailure(setting.name, written.failure(), textOf(asked));

@@ -41,8 +41,8 @@ void countUp(MachineFile::Dictionary& dictionary, std::string_view key);
 /// Reads and changes the settings of the machine, and tells the effects. The one place that heeds "Refusals".
 class MachineSettings {
  public:
-  MachineSettings(MachineFile& file, EffectSink& effects, RunLoop& runLoop)
-      : _file(file), _effects(effects), _runLoop(runLoop) {}
+  MachineSettings(MachineFile& file, EffectSink& effects, RunLoop& runLoop, Conduct conduct = Conduct::change)
+      : _file(file), _effects(effects), _runLoop(runLoop), _conduct(conduct) {}
 
   /// What is no setting is read here: no refusal applies and no effect is told.
   MachineSection section(std::string_view name) { return _file.section(name); }
@@ -73,7 +73,9 @@ class MachineSettings {
   }
   template <typename Value>
   Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked) {
-    return tavisk::carryOut(heedingRefusals(setting), asked, _effects, _runLoop);
+    const auto heeding = heedingRefusals(setting);
+    if (_conduct == Conduct::forecast) return tavisk::foretell(heeding, asked, _effects);
+    return tavisk::carryOut(heeding, asked, _effects, _runLoop);
   }
   /// What is given must outlive the parts.
   template <typename Value>
@@ -90,6 +92,7 @@ class MachineSettings {
   MachineFile& _file;
   EffectSink& _effects;
   RunLoop& _runLoop;
+  Conduct _conduct;
 };
 
 template <typename Value>
@@ -112,7 +115,7 @@ Setting<Value> MachineSettings::heedingRefusals(Setting<Value> setting) {
     for (auto* read : {&setting.live, &setting.stored})
       if (*read) *read = [=] { return *refused; };
   }
-  if (const auto refused = refusedChange(setting.name)) setting.store = [=](const Value&) { return *refused; };
+  if (const auto refused = refusedChange(setting.name)) setting.check = [=](const Value&) { return *refused; };
   return setting;
 }
 

@@ -125,18 +125,19 @@ ServiceStatus ScratchDiskManagement::change(const MachineSetting<Value>& setting
                                             const char* statusKey) {
   auto status = failed;  // what a refusal leaves
   auto parts = _settings.parts(setting);
-  parts.store = [&, write = parts.store](const Value& value) -> Result<void> {
+  parts.check = [&](const Value&) -> Result<void> {
     const auto answer = static_cast<ServiceStatus>(_machine.section(firmwareSection).integer(statusKey));
-    if (answer != 0) {
-      status = answer;
-      return Failure{"set", "the rehearsed firmware", "status " + std::to_string(answer)};
-    }
+    if (answer == 0) return {};
+    status = answer;
+    return Failure{"set", "the rehearsed firmware", "status " + std::to_string(answer)};
+  };
+  parts.store = [&, write = parts.store](const Value& value) {
     auto written = write(value);
     if (written) status = 0;
     return written;
   };
-  _settings.carryOut(parts, asked);
-  return status;
+  const auto effect = _settings.carryOut(parts, asked);
+  return effect.outcome == Outcome::failed ? status : 0;
 }
 
 }  // namespace tavisk

@@ -8,10 +8,11 @@
 namespace tavisk {
 
 Result<std::unique_ptr<ScratchHost>> ScratchHost::open(const std::string& directory, EffectSink& effects,
-                                                       RunLoop& runLoop) {
+                                                       RunLoop& runLoop, Conduct conduct) {
   auto machine = MachineFile::open(directory, effects);
   if (!machine) return machine.failure();
-  std::unique_ptr<ScratchHost> host(new ScratchHost(directory, std::move(machine).value(), effects, runLoop));
+  std::unique_ptr<ScratchHost> host(new ScratchHost(directory, std::move(machine).value(), effects, runLoop, conduct));
+  if (conduct == Conduct::forecast) return host;
   effects.addChannel(host->_effectsLog);
   if (const auto unusable = host->_effectsLog.whyUnusable()) effects.recordFailure("Effects Log", *unusable);
   return host;
@@ -24,9 +25,9 @@ std::string ScratchHost::misspellings() const {
 }
 
 ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFile> machine, EffectSink& effects,
-                         RunLoop& runLoop)
+                         RunLoop& runLoop, Conduct conduct)
     : _machine(std::move(machine)),
-      _settings(*_machine, effects, runLoop),
+      _settings(*_machine, effects, runLoop, conduct),
       _effectsLog(_machine->folder()),
       _root(directory + "/root"),
       _files(_root, effects),

@@ -34,7 +34,9 @@ class ScratchHost final : public Host {
  public:
   /// Fails when DIR is no folder or its machine.plist is not sound. Adds the effects.log to the channels of `effects`;
   /// the host must be alive whenever effects are told.
-  static Result<std::unique_ptr<ScratchHost>> open(const std::string& directory, EffectSink& effects, RunLoop& runLoop);
+  /// A forecast is told to `effects` alone.
+  static Result<std::unique_ptr<ScratchHost>> open(const std::string& directory, EffectSink& effects, RunLoop& runLoop,
+                                                   Conduct conduct = Conduct::change);
 
   /// In one line, the names in machine.plist that seem to be misspelt; empty when there is none.
   std::string misspellings() const;
@@ -67,8 +69,8 @@ class ScratchHost final : public Host {
   ProcessTermination& processTermination() override { return _processTermination; }
 
  private:
-  ScratchHost(const std::string& directory, std::unique_ptr<MachineFile> machine, EffectSink& effects,
-              RunLoop& runLoop);
+  ScratchHost(const std::string& directory, std::unique_ptr<MachineFile> machine, EffectSink& effects, RunLoop& runLoop,
+              Conduct conduct);
 
   std::unique_ptr<MachineFile> _machine;
   MachineSettings _settings;

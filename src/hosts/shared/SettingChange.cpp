@@ -35,11 +35,17 @@ class Change {
   }
 
   void write(RunLoop& runLoop) {
-    const bool isStored = succeeds(_steps.store);
+    const bool isStored = isTaken() && succeeds(_steps.store);
     const bool isApplied = isStored && succeeds(_steps.apply);
     if (isApplied && _steps.settled && !runLoop.runUntil(RunLoop::Clock::now() + longestSettling, _steps.settled))
       fail({"change", _steps.name, "did not settle in time", std::make_error_code(std::errc::timed_out)});
     tellPlaces(_steps.store ? isStored : isApplied);
+  }
+
+  /// What write() and readBack() would find.
+  void foresee(bool isNeeded) {
+    foreseeSteps();
+    if (!isNeeded) _effect.outcome = Outcome::unchanged;
   }
 
   void readBack() {
@@ -65,6 +71,27 @@ class Change {
   static constexpr std::chrono::seconds longestSettling{3};
 
   bool isRead() const { return _steps.live || _steps.stored; }
+
+  bool isTaken() {
+    const auto taken = _steps.check ? _steps.check() : Result<void>();
+    if (!taken) fail(taken.failure());
+    return static_cast<bool>(taken);
+  }
+
+  void foreseeSteps() {
+    if (!isTaken()) return;
+    if (_steps.stored) become(_effect.stored, _steps.asked);
+    _effect.where = _steps.where;
+    const auto applied = _steps.foresee ? _steps.foresee() : Result<void>();
+    if (!applied) return fail(applied.failure());
+    if (_steps.live) become(_effect.live, _steps.askedLive);
+    if (!isRead()) _effect.changed = !_steps.leavesNoTrace;
+  }
+
+  void become(std::optional<std::string>& text, const std::string& value) {
+    _effect.changed = _effect.changed || text != value;
+    text = value;
+  }
 
   void tellPlaces(bool areAllWritten) {
     _effect.where = _steps.written ? _steps.written() : areAllWritten ? _steps.where : "";
@@ -144,6 +171,17 @@ Effect carryOut(const Steps& steps, EffectSink& effects, RunLoop& runLoop) {
     effects.changeBegins(steps.name, steps.asked);
     change.write(runLoop);
     change.readBack();
+  }
+  change.remark();
+  effects.record(change.effect());
+  return change.effect();
+}
+
+Effect foretell(const Steps& steps, EffectSink& effects) {
+  Change change(steps);
+  if (change.isSupported()) {
+    const bool isNeeded = change.isNeeded();
+    change.foresee(isNeeded);
   }
   change.remark();
   effects.record(change.effect());

@@ -47,6 +47,9 @@ struct NotSupported {
 /// Whether a machine can have a setting: absent, it can. A failure says that this could not be found out.
 using Support = Result<std::optional<NotSupported>>;
 
+/// Whether what is asked of a machine is done, or only foretold: found out as far as that goes without touching it.
+enum class Conduct { change, forecast };
+
 /// A remark that is the same whatever is asked.
 inline auto saying(std::string text) {
   return [text = std::move(text)](const auto&) { return text; };
@@ -74,8 +77,12 @@ struct Setting {
   std::function<Support()> supported;
   Read live;
   Read stored;
+  /// Why the value is not taken: found out without touching anything, before `store` and by a forecast.
+  Write check;
   Write store;
   Write apply;
+  /// Why the value would be stored and then not applied, as far as that shows beforehand; for a forecast alone.
+  Write foresee;
   /// The live value that comes of a value asked for, where the machine cannot do quite that; empty: the same.
   std::function<Value(const Value& asked)> liveFor;
   /// Whether the live value has reached what was asked; asked again after each event, for at most 3 s.
@@ -88,11 +95,16 @@ struct Setting {
   bool leavesNoTrace = false;
 };
 
-/// The one order of a change: supported, read, return when live and stored both have the value, store, apply, wait
-/// until settled, read both back. Whatever happens is told to the sink, and returned.
+/// The one order of a change: supported, read, return when live and stored both have the value, check, store, apply,
+/// wait until settled, read both back. Whatever happens is told to the sink, and returned.
 template <typename Value>
 Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, EffectSink& effects,
                 RunLoop& runLoop);
+
+/// What carryOut() would come to, with nothing touched: supported, read, check, foresee. Its effect tells what would be
+/// read back. One that is unchanged has a failure too where another value would have to be replaced and could not be.
+template <typename Value>
+Effect foretell(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, EffectSink& effects);
 
 /// Reads the live value (the stored one where there is no live one) and tells it to the sink, beside the stored one
 /// and the places where somebody wants to know, or that the machine cannot have it. A read that fails is recorded as a
@@ -113,14 +125,17 @@ struct Steps {
   std::string name;
   std::string where;
   std::string asked;
+  std::string askedLive;  ///< the live value that is to come of it
   std::function<std::string()> written;
   std::function<std::string()> undoneBy;
   std::function<std::string()> note;
   std::function<Support()> supported;
   std::function<Result<Sight>()> live;
   std::function<Result<Sight>()> stored;
+  std::function<Result<void>()> check;
   std::function<Result<void>()> store;
   std::function<Result<void>()> apply;
+  std::function<Result<void>()> foresee;
   std::function<bool()> settled;
   std::function<Result<void>()> takeBack;
   bool always = false;
@@ -128,6 +143,7 @@ struct Steps {
 };
 
 Effect carryOut(const Steps& steps, EffectSink& effects, RunLoop& runLoop);
+Effect foretell(const Steps& steps, EffectSink& effects);
 
 template <typename Value>
 std::string textOfReading(const Reading<Value>& reading) {
@@ -160,29 +176,43 @@ auto about(const Step& step, const Value& value) {
   return step ? Bound([&step, &value] { return step(value); }) : Bound();
 }
 
+/// All of what is given must outlive the steps.
+template <typename Value>
+Steps stepsOf(const Setting<Value>& setting, const Value& asked) {
+  const auto live = setting.liveFor ? setting.liveFor(asked) : asked;
+  return {
+      .name = setting.name,
+      .where = setting.where,
+      .asked = textOf(asked),
+      .askedLive = textOf(live),
+      .written = setting.written,
+      .undoneBy = about(setting.undoneBy, asked),
+      .note = about(setting.note, asked),
+      .supported = setting.supported,
+      .live = looking(setting.live, live),
+      .stored = looking(setting.stored, asked),
+      .check = about(setting.check, asked),
+      .store = about(setting.store, asked),
+      .apply = about(setting.apply, asked),
+      .foresee = about(setting.foresee, asked),
+      .settled = about(setting.settled, asked),
+      .takeBack = setting.takeBack,
+      .always = setting.always,
+      .leavesNoTrace = setting.leavesNoTrace,
+  };
+}
+
 }  // namespace change
 
 template <typename Value>
 Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, EffectSink& effects,
                 RunLoop& runLoop) {
-  const change::Steps steps{
-      .name = setting.name,
-      .where = setting.where,
-      .asked = textOf(asked),
-      .written = setting.written,
-      .undoneBy = change::about(setting.undoneBy, asked),
-      .note = change::about(setting.note, asked),
-      .supported = setting.supported,
-      .live = change::looking(setting.live, setting.liveFor ? setting.liveFor(asked) : asked),
-      .stored = change::looking(setting.stored, asked),
-      .store = change::about(setting.store, asked),
-      .apply = change::about(setting.apply, asked),
-      .settled = change::about(setting.settled, asked),
-      .takeBack = setting.takeBack,
-      .always = setting.always,
-      .leavesNoTrace = setting.leavesNoTrace,
-  };
-  return change::carryOut(steps, effects, runLoop);
+  return change::carryOut(change::stepsOf(setting, asked), effects, runLoop);
+}
+
+template <typename Value>
+Effect foretell(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, EffectSink& effects) {
+  return change::foretell(change::stepsOf(setting, asked), effects);
 }
 
 namespace change {

@@ -77,6 +77,33 @@ TEST_F(SettingChangeTest, storesThenAppliesThenReadsBack) {
   EXPECT_THAT(log.begun, ElementsAre("Sleep 9"));
 }
 
+TEST_F(SettingChangeTest, refusesBeforeAnythingIsStored) {
+  const Failure failure{"set", "disk", "out of range"};
+  setting.check = [&](const std::string&) { return failure; };
+  EXPECT_EQ(change("9"), effectOf(Outcome::failed, "", false, "5", "5", "5", failure));
+  EXPECT_THAT(steps, IsEmpty());
+}
+
+TEST_F(SettingChangeTest, foretellsWhatWouldBeReadBackAndTouchesNothing) {
+  const Failure failure{"set", "disk", "out of range"};
+  const auto foretold = [&](const std::string& asked) { return foretell(setting, asked, sink); };
+  EXPECT_EQ(foretold("9"), effectOf(Outcome::applied, place, true, "5", "9", "9"));
+  setting.liveFor = [](const std::string&) { return "8"; };
+  EXPECT_EQ(foretold("9"), effectOf(Outcome::applied, place, true, "5", "8", "9"));
+  setting.foresee = [&](const std::string&) { return failure; };
+  EXPECT_EQ(foretold("9"), effectOf(Outcome::failed, place, true, "5", "5", "9", failure));
+  setting.check = [&](const std::string&) { return failure; };
+  EXPECT_EQ(foretold("9"), effectOf(Outcome::failed, "", false, "5", "5", "5", failure));
+  live = "8";
+  stored = "9";
+  EXPECT_EQ(foretold("9"), effectOf(Outcome::unchanged, "", false, "8", "8", "9", failure))
+      << "nothing has to be taken";
+  setting.supported = [&]() -> Support { return NotSupported{failure}; };
+  EXPECT_EQ(foretold("9").outcome, Outcome::notSupported);
+  EXPECT_THAT(steps, IsEmpty());
+  EXPECT_THAT(log.begun, IsEmpty());
+}
+
 TEST_F(SettingChangeTest, writesNothingThatIsThereAlready) {
   live = stored = "9";
   EXPECT_EQ(change("9"), effectOf(Outcome::unchanged, "", false, "9", "9", "9"));

@@ -22,6 +22,7 @@ constexpr const char* sshFolder = "/etc/ssh";
 constexpr const char* sshConfig = "/etc/ssh/sshd_config";
 // The sessions of the server are processes of the same name: its own is in the file.
 constexpr const char* sshProcessFile = "/run/sshd.pid";
+constexpr const char* makeKeys = "make host keys";
 constexpr const char* keyMaker = "/usr/bin/ssh-keygen";
 constexpr const char* partlyOn = "partly on";
 
@@ -153,6 +154,8 @@ void LinuxRemoteShellService::setEnabled(bool enabled) {
   auto setting = remoteLogin();
   setting.note = [&](bool) { return trace.hasStopped ? "open sessions stay open" : ""; };
   setting.written = [&] { return trace.written.text(); };
+  setting.check = [this](bool on) { return check(on); };
+  setting.foresee = [this](bool on) { return on ? foreseeStart() : Result<void>(); };
   setting.store = [&](bool on) { return store(on, trace); };
   setting.apply = [&](bool on) { return apply(on, trace); };
   setting.settled = [this](bool) { return withServer<bool>(&hasSettled).valueOr(false); };
@@ -169,10 +172,36 @@ Result<void> LinuxRemoteShellService::store(bool enabled, Trace& trace) {
 }
 
 Result<void> LinuxRemoteShellService::startAtBoot(const DaemonGroup& server, WrittenPlaces& written) {
-  const auto starting = server.startingAtBoot();
-  if (!starting) return starting.failure();
-  if (!starting->empty()) return {};
+  const auto isStarting = server.isAnyStartingAtBoot();
+  if (!isStarting) return isStarting.failure();
+  if (*isStarting) return {};
   return _machine.services.daemons().setStartAtBoot({server.members().front()}, true, written);
+}
+
+Result<void> LinuxRemoteShellService::check(bool enabled) {
+  const auto needsNone = enabled ? needsNoHostKey(_machine.root) : Result<bool>(true);
+  if (!needsNone) return needsNone.failure();
+  const auto failure = *needsNone ? std::nullopt : whyNeedsRoot(makeKeys, sshFolder);
+  if (failure) return *failure;
+  return withServer<void>([&](const DaemonGroup& server) -> Result<void> {
+    const auto starting = enabled ? server.startingAtBoot() : server.toSetAtBoot(false);
+    if (!starting) return starting.failure();
+    auto& daemons = _machine.services.daemons();
+    if (!enabled) return daemons.checkSetStartAtBoot(*starting, false);
+    return starting->empty() ? daemons.checkSetStartAtBoot({server.members().front()}, true) : Result<void>();
+  });
+}
+
+/// What apply() would start.
+Result<void> LinuxRemoteShellService::foreseeStart() {
+  return withServer<void>([&](const DaemonGroup& server) -> Result<void> {
+    const auto running = server.running();
+    if (!running) return running.failure();
+    if (!running->empty()) return {};
+    const auto starting = server.startingAtBoot();
+    if (!starting) return starting.failure();
+    return _machine.services.daemons().foreseeStart(starting->empty() ? server.members().front() : starting->front());
+  });
 }
 
 /// Starts what will start with the machine too.
@@ -190,11 +219,9 @@ Result<void> LinuxRemoteShellService::apply(bool enabled, Trace& trace) {
 }
 
 Result<void> LinuxRemoteShellService::ensureHostKeys(Trace& trace) {
-  constexpr const char* tried = "make host keys";
   const auto needsNone = needsNoHostKey(_machine.root);
   if (!needsNone) return needsNone.failure();
   if (*needsNone) return {};
-  if (auto failure = whyNeedsRoot(tried, sshFolder)) return *failure;
   const auto before = hostKeyFiles(_machine.root);
   if (!before) return before.failure();
   const auto made = runProgram(_machine.root, {keyMaker, "-A"}, _machine.runLoop);
@@ -204,7 +231,7 @@ Result<void> LinuxRemoteShellService::ensureHostKeys(Trace& trace) {
   if (!made) return made.failure();
   if (!after) return after.failure();
   if (hasKey(*after)) return {};
-  return Failure{tried, keyMaker, "it reported success, but there is no key in /etc/ssh"};
+  return Failure{makeKeys, keyMaker, "it reported success, but there is no key in /etc/ssh"};
 }
 
 Result<DaemonGroup> LinuxRemoteEventsService::units() {
@@ -273,8 +300,17 @@ void LinuxRemoteEventsService::setEnabled(bool enabled) {
   WrittenPlaces written;
   auto setting = remoteEvents();
   setting.written = [&] { return written.text(); };
+  setting.check = [this](bool on) {
+    return withUnits<void>([&](const DaemonGroup& units) -> Result<void> {
+      const auto others = units.toSetAtBoot(on);
+      return others ? _machine.services.daemons().checkSetStartAtBoot(*others, on) : others.failure();
+    });
+  };
   setting.store = [&](bool on) {
     return withUnits<void>([&](const DaemonGroup& units) { return units.setAllStartAtBoot(on, written); });
+  };
+  setting.foresee = [this](bool on) {
+    return withUnits<void>([on](const DaemonGroup& units) { return on ? units.foreseeStartAll() : Result<void>(); });
   };
   setting.apply = [this](bool on) {
     return withUnits<void>([on](const DaemonGroup& units) { return on ? units.startAll() : units.stopAll(); });

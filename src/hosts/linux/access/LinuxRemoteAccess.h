@@ -35,6 +35,8 @@ class LinuxRemoteShellService final : public RemoteShellService {
   template <typename Answer, typename Use>
   Result<Answer> withServer(Use use);
   Support supported();
+  Result<void> check(bool enabled);
+  Result<void> foreseeStart();
   Result<void> store(bool enabled, Trace& trace);
   Result<void> startAtBoot(const DaemonGroup& server, WrittenPlaces& written);
   Result<void> apply(bool enabled, Trace& trace);

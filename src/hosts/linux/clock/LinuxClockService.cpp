@@ -108,6 +108,7 @@ void LinuxClockService::setTime(std::int64_t secondsSince1970) {
   } else {
     time.note = saying("without a hardware clock the machine forgets the time when it is off");
   }
+  time.check = [this](std::int64_t seconds) { return checkTime(seconds); };
   time.apply = [&](std::int64_t) {
     auto set = changeTime(asked);
     asked.isSet();
@@ -117,8 +118,17 @@ void LinuxClockService::setTime(std::int64_t secondsSince1970) {
   carryOut(time, secondsSince1970, _machine);
 }
 
+Result<void> LinuxClockService::checkTime(std::int64_t seconds) {
+  if (const auto failure = whyOutOfClockRange(seconds)) return *failure;
+  if (!maySetSystemTime() && mayNobodySetSystemTime(_machine.root))
+    return Failure{"set the clock", "CLOCK_REALTIME", inContainer};
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return bus.failure();
+  const auto failure = *bus ? std::nullopt : whyNoClock();
+  return failure ? Result<void>(*failure) : Result<void>();
+}
+
 Result<void> LinuxClockService::changeTime(const AskedTime& asked) {
-  if (const auto failure = whyOutOfClockRange(asked.seconds())) return *failure;
   const auto bus = systemBusIfAny(_machine.services);
   if (!bus) return bus.failure();
   if (*bus) {
@@ -183,14 +193,20 @@ void LinuxClockService::setTimeZone(const ZoneName& zone) {
   };
   WrittenPlaces written;
   setting.written = [&] { return written.text(); };
+  setting.check = [this](const ZoneName& asked) { return checkTimeZone(asked); };
   setting.store = [&](const ZoneName& asked) { return changeTimeZone(asked, written); };
   carryOut(setting, zoneOfPath(zone.file()).value_or(zone), _machine);
 }
 
-/// What needs root is asked before the daemon moves the link. One that fails, or answers too late, may have moved it.
-Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone, WrittenPlaces& written) {
+/// What needs root is asked before the daemon moves the link.
+Result<void> LinuxClockService::checkTimeZone(const ZoneName& zone) const {
   if (auto failure = whyNoZone(_machine.root, zone)) return *failure;
   if (auto failure = whyZoneNeedsRoot(_machine.root, zone)) return *failure;
+  return {};
+}
+
+/// A daemon that fails, or answers too late, may have moved the link.
+Result<void> LinuxClockService::changeTimeZone(const ZoneName& zone, WrittenPlaces& written) {
   const auto isThere = goesBy(zone);
   if (!isThere) return isThere.failure();
   auto linked = *isThere ? Result<void>() : linkZone(zone, written);

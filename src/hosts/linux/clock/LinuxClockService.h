@@ -28,12 +28,14 @@ class LinuxClockService final : public ClockService {
   Setting<std::int64_t> timeSetting() const;
   std::optional<Failure> whyNoClock() const;
   std::string whoCorrectsTheClock();
+  Result<void> checkTime(std::int64_t secondsSince1970);
   Result<void> changeTime(const AskedTime& asked);
   Result<void> changeTimeDirectly(const AskedTime& asked) const;
   Result<bool> goesBy(const ZoneName& zone);
   Result<bool> setZoneByDaemon(const ZoneName& zone);
   Result<void> moveLink(const ZoneName& zone);
   Result<void> linkZone(const ZoneName& zone, WrittenPlaces& written);
+  Result<void> checkTimeZone(const ZoneName& zone) const;
   Result<void> changeTimeZone(const ZoneName& zone, WrittenPlaces& written);
 
   LinuxMachine _machine;

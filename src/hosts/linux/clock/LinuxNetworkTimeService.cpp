@@ -87,8 +87,19 @@ Setting<Value> LinuxNetworkTimeService::named(const char* name) {
 Setting<bool> LinuxNetworkTimeService::runningSetting() {
   auto setting = named<bool>(setting::networkTime);
   setting.live = [this] { return runs(client()); };
+  // The other half of the switch, setLaunchAtStartup().
+  setting.check = [this](bool isOn) {
+    return withClient<void>(
+        [&](const TimeDaemon& client) { return daemons().checkMayStartAtBoot(client.daemon, isOn); });
+  };
   setting.apply = [this](bool isOn) {
-    return withClient<void>([&](const TimeDaemon& client) { return run(client.daemon, isOn); });
+    return withClient<void>([&](const TimeDaemon& client) {
+      return isOn ? daemons().start(client.daemon) : daemons().stop(client.daemon);
+    });
+  };
+  setting.foresee = [this](bool isOn) {
+    return withClient<void>(
+        [&](const TimeDaemon& client) { return isOn ? daemons().foreseeStart(client.daemon) : Result<void>(); });
   };
   setting.settled = [this](bool) {
     const auto isChanging =
@@ -96,12 +107,6 @@ Setting<bool> LinuxNetworkTimeService::runningSetting() {
     return isChanging && !*isChanging;
   };
   return setting;
-}
-
-Result<void> LinuxNetworkTimeService::run(const Daemon& daemon, bool isOn) {
-  // The other half of the switch, setLaunchAtStartup().
-  if (auto may = daemons().checkMayStartAtBoot(daemon, isOn); !may) return may;
-  return isOn ? daemons().start(daemon) : daemons().stop(daemon);
 }
 
 bool LinuxNetworkTimeService::isRunning() {
@@ -139,6 +144,10 @@ void LinuxNetworkTimeService::setLaunchAtStartup(bool launch) {
   setting.stored = [this] { return startsAtBoot(client()); };
   WrittenPlaces written;
   setting.written = [&] { return written.text(); };
+  setting.check = [this](bool starts) {
+    return withClient<void>(
+        [&](const TimeDaemon& client) { return daemons().checkSetStartAtBoot({client.daemon}, starts); });
+  };
   setting.store = [&, this](bool starts) {
     return withClient<void>(
         [&](const TimeDaemon& client) { return daemons().setStartAtBoot({client.daemon}, starts, written); });
@@ -243,18 +252,19 @@ void LinuxNetworkTimeService::setServer(const NetworkTimeServer& server) {
       const auto lines = orAbsent(_machine.root.read(client->serverFile, configurationLimit));
       if (!lines) return lines.failure();
       before = *lines;
-      return storeServer(*client, address);
+      return _machine.root.write(client->serverFile, client->serverLines(address));
     };
+    setting.check = [=](const std::string& address) { return checkServer(*client, address); };
   }
   _isServerChanged = carryOut(setting, server.address, _machine).changed || _isServerChanged;
 }
 
-Result<void> LinuxNetworkTimeService::storeServer(const TimeDaemon& client, const std::string& address) {
+Result<void> LinuxNetworkTimeService::checkServer(const TimeDaemon& client, const std::string& address) {
   constexpr const char* tried = "set the server";
   if (!isHostNameOrAddress(address))
     return Failure{tried, client.serverFile, "only a host name or an address is stored"};
   if (auto failure = whyNeedsRoot(tried, client.serverFile)) return *failure;
-  return _machine.root.write(client.serverFile, client.serverLines(address));
+  return {};
 }
 
 Result<void> LinuxNetworkTimeService::putBack(const TimeDaemon& client, const std::optional<std::string>& lines) {

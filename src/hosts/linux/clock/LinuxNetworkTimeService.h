@@ -34,8 +34,6 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   template <typename Answer, typename Use>
   Result<Answer> withClient(Use use);
   Support isSupported();
-  /// What an administrator who is not root reads where the client would run, or not, until the next start only.
-  Result<void> run(const Daemon& daemon, bool isOn);
   template <typename Value>
   Setting<Value> named(const char* name);
   Setting<bool> runningSetting();
@@ -46,7 +44,7 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   Setting<std::string>::Found liveServer();
   Setting<std::string>::Found storedServer(const TimeDaemon& client) const;
   std::string whatIsConfiguredElsewhere(const TimeDaemon& client, const std::string& address) const;
-  Result<void> storeServer(const TimeDaemon& client, const std::string& address);
+  static Result<void> checkServer(const TimeDaemon& client, const std::string& address);
   Result<void> putBack(const TimeDaemon& client, const std::optional<std::string>& lines);
   Result<void> reload(const TimeDaemon& client);
 

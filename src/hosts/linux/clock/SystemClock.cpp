@@ -84,6 +84,18 @@ bool maySetSystemTime() {
   return (sets[CAP_TO_INDEX(CAP_SYS_TIME)].effective & CAP_TO_MASK(CAP_SYS_TIME)) != 0;
 }
 
+bool mayNobodySetSystemTime(const SystemRoot& root) {
+  constexpr std::string_view title = "CapBnd:";
+  constexpr std::size_t limit = 65536;
+  const auto status = root.read("/proc/1/status", limit).valueOr("");
+  for (const auto& line : split(status, "\n")) {
+    if (!line.starts_with(title)) continue;
+    const auto rights = parseNumber<std::uint64_t>(trimmed(std::string_view(line).substr(title.size())), 16);
+    return rights && ((*rights >> unsigned{CAP_SYS_TIME}) & 1U) == 0;
+  }
+  return false;
+}
+
 Result<void> setSystemTime(std::chrono::microseconds since1970) {
   const auto whole = std::chrono::floor<std::chrono::seconds>(since1970);
   timespec time{};

@@ -23,6 +23,9 @@ std::optional<Failure> whyOutOfClockRange(std::int64_t secondsSince1970);
 /// Whether this process may set the clock (CAP_SYS_TIME, capabilities(7)).
 bool maySetSystemTime();
 
+/// Whether nothing on this machine may: its first process cannot pass the right on to any other (proc(5), CapBnd).
+/// False also where that cannot be read.
+bool mayNobodySetSystemTime(const SystemRoot& root);
 /// Sets the kernel's clock, of the whole machine.
 Result<void> setSystemTime(std::chrono::microseconds since1970);
 

@@ -161,10 +161,11 @@ void EnclosureLock::setDisablesKeyboard(bool disables, const MachineHold& held) 
   const auto asked = disables && engaged.valueOr(false) ? KeyboardState::disabled : KeyboardState::enabled;
   auto setting = keyboardsUnder(engaged, found, _machine.root);
   setting.note = saying(remarkOn(engaged));
-  setting.apply = [&](KeyboardState state) -> Result<void> {
+  setting.check = [](KeyboardState) -> Result<void> {
     if (const auto failure = whyNotSwitched()) return *failure;
-    return setAll(_machine.root, *found, state);
+    return {};
   };
+  setting.apply = [&](KeyboardState state) { return setAll(_machine.root, *found, state); };
   carryOut(setting, asked, _machine, held);
 }
 

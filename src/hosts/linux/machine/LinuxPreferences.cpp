@@ -50,13 +50,19 @@ void LinuxPreferencesStore::writeOut() {
     WrittenPlaces written;
     auto setting = preference(key);
     setting.written = [&] { return written.text(); };
+    setting.check = [this](bool) { return check(); };
     setting.store = [this, &key = key, &written](bool isOn) { return store(key, isOn, written); };
     carryOut(setting, value, _machine, held);
   }
 }
 
-Result<void> LinuxPreferencesStore::store(const std::string& key, bool value, WrittenPlaces& written) {
+Result<void> LinuxPreferencesStore::check() const {
   if (const auto failure = whyNeedsRoot("write", _file.path())) return *failure;
+  const auto present = _file.readToChange();
+  return present ? Result<void>() : present.failure();
+}
+
+Result<void> LinuxPreferencesStore::store(const std::string& key, bool value, WrittenPlaces& written) {
   if (auto made = _machine.root.makeFolders(folder); !made) return made;
   auto preferences = _file.readToChange();
   if (!preferences) return preferences.failure();

@@ -35,6 +35,7 @@ class LinuxPreferencesStore final : public PreferencesStore {
 
  private:
   Setting<bool> preference(const std::string& key);
+  Result<void> check() const;
   Result<void> store(const std::string& key, bool value, WrittenPlaces& written);
 
   LinuxMachine _machine;

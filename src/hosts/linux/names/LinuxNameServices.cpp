@@ -113,6 +113,7 @@ void LinuxHostConfigService::setComputerName(const std::string& name) {
   setting.where = prettyNameFile;
   setting.live = [this] { return serviceComputerName(); };
   setting.stored = [this] { return prettyHostName(_machine.root); };
+  setting.check = [this](const std::string& value) { return checkComputerName(value); };
   setting.store = [this](const std::string& value) { return storeComputerName(value); };
   carryOut(setting, name, _machine);
 }
@@ -128,8 +129,20 @@ Result<LinuxHostConfigService::Value> LinuxHostConfigService::serviceComputerNam
   return name.failure();
 }
 
-Result<void> LinuxHostConfigService::storeComputerName(const std::string& name) {
+Result<void> LinuxHostConfigService::checkComputerName(const std::string& name) {
   if (auto failure = whyNotStorable(name)) return *failure;
+  return checkFile(setComputer, prettyNameFile);
+}
+
+/// Without the service it is left to the file, which only root writes.
+Result<void> LinuxHostConfigService::checkFile(const char* tried, const char* file) {
+  const auto bus = systemBusIfAny(_machine.services);
+  if (!bus) return bus.failure();
+  const auto failure = *bus ? std::nullopt : whyNeedsRoot(tried, file);
+  return failure ? Result<void>(*failure) : Result<void>();
+}
+
+Result<void> LinuxHostConfigService::storeComputerName(const std::string& name) {
   const auto set = setByService("SetPrettyHostname", name);
   if (!set) return set.failure();
   if (*set) return {};
@@ -148,6 +161,7 @@ void LinuxHostConfigService::setLocalNetworkName(const std::string& name) {
   setting.stored = [this] { return storedLocalName(); };
   WrittenPlaces written;
   setting.written = [&] { return written.text(); };
+  setting.check = [this](const std::string& value) { return checkLocalName(value); };
   setting.store = [&](const std::string& value) { return storeLocalName(value, written); };
   setting.apply = [this](const std::string& value) { return applyLocalName(value); };
   setting.settled = [this](const std::string&) { return _announcer.hasRegistered().valueOr(false); };
@@ -180,30 +194,42 @@ Setting<std::string>::Found LinuxHostConfigService::storedLocalName() {
   return std::optional(Reading(**name, stale));
 }
 
-/// The name is refused here before it reaches a service that would cut it off.
-Result<void> LinuxHostConfigService::storeLocalName(const std::string& name, WrittenPlaces& written) {
-  if (name.empty() || name.size() > longestKernelHostName)
-    return Failure{setLocal, staticNameFile, "the kernel holds names of 1 to 64 bytes"};
+/// The file of hosts with the name in place of the ones that the machine had.
+Result<LinuxHostConfigService::Renamed> LinuxHostConfigService::hostsRenamed(const std::string& name) const {
   const auto stored = staticHostName(_machine.root);
   if (!stored) return stored.failure();
   const auto kernels = kernelHostName(_machine.root);
   if (!kernels) return kernels.failure();
   const auto hosts = hostsOf(_machine.root);
   if (!hosts) return hosts.failure();
-  if (auto failure = whyAnnouncingNeedsRoot(name)) return *failure;
   const std::vector<std::string> before{stored->value_or(""), kernels->value_or("")};
   const auto own = ownAddresses(*hosts, before);
   if (!own) return own.failure();
+  return Renamed{*stored == name, *hosts, hostsWithName(*hosts, before, name, *own)};
+}
+
+/// The name is refused here before it reaches a service that would cut it off.
+Result<void> LinuxHostConfigService::checkLocalName(const std::string& name) {
+  if (name.empty() || name.size() > longestKernelHostName)
+    return Failure{setLocal, staticNameFile, "the kernel holds names of 1 to 64 bytes"};
+  const auto renamed = hostsRenamed(name);
+  if (!renamed) return renamed.failure();
+  if (auto failure = whyAnnouncingNeedsRoot(name)) return *failure;
+  const auto failure = renamed->after != renamed->before ? whyNeedsRoot(setLocal, hostsFile) : std::nullopt;
+  return failure ? Result<void>(*failure) : checkFile(setLocal, staticNameFile);
+}
+
+Result<void> LinuxHostConfigService::storeLocalName(const std::string& name, WrittenPlaces& written) {
+  const auto renamed = hostsRenamed(name);
+  if (!renamed) return renamed.failure();
   // Before the name itself: when a run ends in between, setting the name again completes the change.
-  const auto renamed = hostsWithName(*hosts, before, name, *own);
-  if (renamed != *hosts) {
-    if (auto failure = whyNeedsRoot(setLocal, hostsFile)) return *failure;
-    if (auto changed = _machine.root.write(hostsFile, renamed); !changed) return changed;
+  if (renamed->after != renamed->before) {
+    if (auto changed = _machine.root.write(hostsFile, renamed->after); !changed) return changed;
     written.add(hostsFile);
   }
-  if (*stored == name) return {};
+  if (renamed->isStored) return {};
   const auto set = storeStaticName(name);
-  if (!set) return putBackHosts(*hosts, name, set.failure(), written);
+  if (!set) return putBackHosts(renamed->before, name, set.failure(), written);
   written.add(staticNameFile);
   return {};
 }

@@ -30,9 +30,17 @@ class LinuxHostConfigService final : public HostConfigService {
   /// The service's answer, or false where it is left to the files.
   Result<bool> setByService(const char* member, const std::string& name);
   Result<Value> serviceComputerName();
+  Result<void> checkComputerName(const std::string& name);
+  Result<void> checkFile(const char* tried, const char* file);
   Result<void> storeComputerName(const std::string& name);
   Setting<std::string>::Found liveLocalName(const std::string& asked);
   Setting<std::string>::Found storedLocalName();
+  struct Renamed {
+    bool isStored;  ///< the machine's own file has the name already
+    std::string before, after;
+  };
+  Result<Renamed> hostsRenamed(const std::string& name) const;
+  Result<void> checkLocalName(const std::string& name);
   Result<void> storeLocalName(const std::string& name, WrittenPlaces& written);
   Failure putBackHosts(const std::string& hosts, const std::string& name, Failure cause, WrittenPlaces& written);
   bool isStoredAfterAll(const std::string& name, const Failure& cause) const;

@@ -296,6 +296,7 @@ Setting<Minutes> ComputerSleep::computerSleep() {
   setting.supported = [this] { return sleepSupported(); };
   setting.live = [this] { return liveMinutes(); };
   setting.stored = [this] { return besideOwn(storedMinutes(), ownMinutes(), _ownFile.path()); };
+  setting.check = [this](Minutes asked) { return _ownFile.check(whatHidesMinutes(asked)); };
   keepIn(_ownFile, setting, [this](Minutes asked) { return storeMinutes(asked); });
   setting.apply = [this](Minutes asked) { return restartService(asked); };
   return setting;
@@ -308,6 +309,7 @@ Setting<bool> ComputerSleep::powerButtonSleep() {
   setting.supported = [this] { return buttonSupported(); };
   setting.live = [this] { return liveButton(); };
   setting.stored = [this] { return besideOwn(storedButton(), ownButton(), _ownFile.path()); };
+  setting.check = [this](bool sleeps) { return _ownFile.check(whatHidesButton(sleeps)); };
   keepIn(_ownFile, setting, [this](bool sleeps) { return storeButton(sleeps); });
   setting.apply = [this](bool) { return applyButton(); };
   setting.settled = onceButtonReads();

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 
+#include "base/Path.h"
 #include "base/Text.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/KernelParameter.h"
@@ -97,6 +98,13 @@ std::string DisplaySleep::whatHides() const {
   return line && *line && (*line)->file != _file.path() ? (*line)->file : "";
 }
 
+Result<void> DisplaySleep::check(Minutes asked) const {
+  const auto line = firstLine();
+  if (!line) return line.failure();
+  const bool isHidden = *line && baseName((*line)->file) < baseName(_file.path()) && (*line)->minutes != asked;
+  return _file.check(isHidden ? (*line)->file : "");
+}
+
 Result<void> DisplaySleep::store(Minutes asked) const {
   const auto isHeeded = [&]() -> Result<bool> {
     const auto minutes = storedMinutes();
@@ -128,6 +136,7 @@ Setting<Minutes> DisplaySleep::displaySleep() const {
   setting.liveFor = limited;
   if (!_machine.services.hasServiceManager()) return setting;
   setting.stored = [this] { return besideOwn(storedMinutes(), ownMinutes(), _file.path()); };
+  setting.check = [this](Minutes asked) { return check(asked); };
   keepIn(_file, setting, [this](Minutes asked) { return store(asked); });
   return setting;
 }

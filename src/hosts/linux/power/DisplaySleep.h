@@ -53,6 +53,7 @@ class DisplaySleep {
   Result<std::optional<Minutes>> ownMinutes() const;
   std::string whatHides() const;
   std::string noteOn(Minutes asked) const;
+  Result<void> check(Minutes asked) const;
   Result<void> store(Minutes asked) const;
 
   LinuxMachine _machine;

@@ -17,6 +17,7 @@ constexpr const char* deviceClass = "/sys/class";
 constexpr const char* controllers = "/sys/class/ipmi/";
 constexpr const char* controllerClass = "VelmarKCS";
 constexpr const char* delayProperty = "ServerID";
+constexpr const char* toSetDelay = "set the start-up delay";
 constexpr std::uint32_t secondsEach = 30;
 /// Kept for controllers that do not tell their delay.
 constexpr const char* wishFile = "/var/lib/tavisk/startup-delay";
@@ -104,11 +105,15 @@ Result<std::optional<std::int64_t>> LinuxPowerController::keptWish() const {
   return parseNumber<std::int64_t>(*wish);
 }
 
-Result<void> LinuxPowerController::sendDelay(const StartupDelayRequests& requests, std::uint32_t units) {
-  constexpr const char* tried = "set the start-up delay";
+Result<ControllerRequest> LinuxPowerController::requestFor(const StartupDelayRequests& requests, std::uint32_t units) {
   const auto request = requests.setting(units * secondsEach);
-  if (!request) return invalid(tried, "it cannot have a delay of this length");
-  const auto answer = _controller.ask(tried, *request);
+  if (!request) return invalid(toSetDelay, "it cannot have a delay of this length");
+  return *request;
+}
+
+Result<void> LinuxPowerController::sendDelay(const StartupDelayRequests& requests, std::uint32_t units) {
+  const auto request = requestFor(requests, units);
+  const auto answer = request ? _controller.ask(toSetDelay, *request) : request.failure();
   return answer ? Result<void>() : answer.failure();
 }
 
@@ -159,6 +164,10 @@ ControllerStatus LinuxPowerController::setDelay(std::uint8_t units, std::int64_t
   Result<void> sent;
   Result<void> kept;
   auto delay = delaySetting(known);
+  delay.check = [&](std::int64_t) {
+    if (const auto request = requestFor(*known, units); !request) sent = request.failure();
+    return sent;
+  };
   delay.apply = [&](std::int64_t) {
     sent = sendDelay(*known, units);
     if (sent && !known->get) kept = _machine.root.write(wishFile, textOf(std::int64_t{units}) + "\n");

@@ -36,6 +36,7 @@ class LinuxPowerController final : public PowerController {
   Setting<std::int64_t> delaySetting(const Result<StartupDelayRequests>& requests);
   Result<std::int64_t> askDelay(const StartupDelayRequests& requests);
   Result<std::optional<std::int64_t>> keptWish() const;
+  static Result<ControllerRequest> requestFor(const StartupDelayRequests& requests, std::uint32_t units);
   Result<void> sendDelay(const StartupDelayRequests& requests, std::uint32_t units);
   ControllerStatus setDelay(std::uint8_t units, std::int64_t asked);
   /// The failure goes to the effects; its code is the status.

@@ -26,6 +26,12 @@ Result<void> OwnFile::putBack(const std::optional<std::string>& contents) const 
   return contents ? _root.write(_path, *contents) : _root.remove(_path);
 }
 
+Result<void> OwnFile::check(const std::string& hiding) const {
+  if (auto failure = whyNeedsRoot("write", _path)) return *failure;
+  if (!hiding.empty()) return Failure{"write", _path, hiding + " says otherwise"};
+  return {};
+}
+
 Result<void> OwnFile::changeIfHeeded(const Change& change) const {
   if (auto failure = whyNeedsRoot("write", _path)) return *failure;
   const auto former = contents();

@@ -30,13 +30,17 @@ class OwnFile {
   /// Makes the file what contents() said.
   Result<void> putBack(const std::optional<std::string>& contents) const;
 
+  /// Why it would not be changed: by whoever runs this, or as another file, `hiding`, has the last word; empty: none
+  /// has.
+  Result<void> check(const std::string& hiding = "") const;
+
   /// A change of the file, where other files have a say in the same matter.
   struct Change {
     std::function<Result<void>()> write;
     std::function<Result<bool>()> isHeeded;   ///< asked of all files afterwards
     std::function<std::string()> hidingFile;  ///< empty: it is not known
   };
-  /// A change that another file hides is a failure, and the file is put back as it was.
+  /// A change that another file hides all the same is a failure, and the file is put back as it was.
   Result<void> changeIfHeeded(const Change& change) const;
   /// Does this to the file, and adds it to the places when that was done, or has left other contents all the same.
   Result<void> noting(WrittenPlaces& written, const std::function<Result<void>()>& step) const;

@@ -9,6 +9,7 @@
 #include <cerrno>
 #include <memory>
 
+#include "base/Path.h"
 #include "base/Text.h"
 #include "base/TimeSpan.h"
 #include "effects/SettingNames.h"
@@ -121,7 +122,7 @@ Result<RestartAfterFreeze::StoredPanic> RestartAfterFreeze::storedPanic() const 
   auto inOrder = std::move(files).value();
   if (!_machine.services.hasServiceManager()) inOrder.emplace_back(mainPanicFile);
   StoredPanic found;
-  if (*parameter) found = {**parameter, kernelCommandLine, std::nullopt, **parameter};
+  if (*parameter) found = {**parameter, kernelCommandLine, std::nullopt, **parameter, kernelCommandLine};
   for (const auto& file : inOrder) {
     const auto text = orEmpty(_machine.root.read(file, configurationLimit));
     if (!text) return text.failure();
@@ -129,7 +130,12 @@ Result<RestartAfterFreeze::StoredPanic> RestartAfterFreeze::storedPanic() const 
     if (!value) continue;
     found.seconds = *value;
     found.from = file;
-    (file == _panicFile.path() ? found.own.emplace() : found.others) = *value;
+    if (file == _panicFile.path()) {
+      found.own = *value;
+    } else {
+      found.others = *value;
+      found.othersFrom = file;
+    }
   }
   return found;
 }
@@ -172,14 +178,42 @@ Setting<bool>::Found RestartAfterFreeze::stored() const {
 }
 
 /// Where others have a value to restart there is no need of the tool's own.
+Result<void> RestartAfterFreeze::checkPanic(bool restarts) const {
+  const auto before = storedPanic();
+  if (!before) return before.failure();
+  const auto& others = before->othersFrom;
+  if (restarts && !isOnPanic(before->others)) {
+    const bool isLater = others == mainPanicFile || baseName(others) > baseName(_panicFile.path());
+    return _panicFile.check(isLater && others != kernelCommandLine ? others : "");
+  }
+  const auto failure = before->own ? whyNeedsRoot("remove", _panicFile.path()) : std::nullopt;
+  return failure ? Result<void>(*failure) : Result<void>();
+}
+
+Result<bool> RestartAfterFreeze::isWatchdogKept(bool restarts) const {
+  const auto stored = isWatchdogStored();
+  if (!stored) return stored.failure();
+  const auto own = isWatchdogInOwn();
+  if (!own) return own.failure();
+  return *stored == restarts && own->value_or(restarts) == restarts;
+}
+
+Result<void> RestartAfterFreeze::checkWatchdog(bool restarts) const {
+  const auto isKept = isWatchdogKept(restarts);
+  if (!isKept) return isKept.failure();
+  return *isKept ? Result<void>() : _watchdogFile.check(whatHidesWatchdog(restarts));
+}
+
+Result<void> RestartAfterFreeze::check(bool restarts) const {
+  if (auto panic = checkPanic(restarts); !panic) return panic;
+  return _machine.services.hasServiceManager() ? checkWatchdog(restarts) : Result<void>();
+}
+
 Result<void> RestartAfterFreeze::storePanic(bool restarts) const {
   const auto before = storedPanic();
   if (!before) return before.failure();
-  if (!restarts || isOnPanic(before->others)) {
-    if (!before->own) return {};
-    if (auto failure = whyNeedsRoot("remove", _panicFile.path())) return *failure;
-    return _machine.root.remove(_panicFile.path());
-  }
+  if (!restarts || isOnPanic(before->others))
+    return before->own ? _machine.root.remove(_panicFile.path()) : Result<void>();
   const auto hidingFile = [&] {
     const auto after = storedPanic();
     return after ? after->from : "";
@@ -191,11 +225,9 @@ Result<void> RestartAfterFreeze::storePanic(bool restarts) const {
 }
 
 Result<void> RestartAfterFreeze::storeWatchdog(bool restarts) const {
-  const auto stored = isWatchdogStored();
-  if (!stored) return stored.failure();
-  const auto own = isWatchdogInOwn();
-  if (!own) return own.failure();
-  if (*stored == restarts && own->value_or(restarts) == restarts) return {};
+  const auto isKept = isWatchdogKept(restarts);
+  if (!isKept) return isKept.failure();
+  if (*isKept) return {};
   const auto isHeeded = [&]() -> Result<bool> {
     const auto then = isWatchdogStored();
     if (!then) return then.failure();
@@ -224,14 +256,20 @@ Result<void> RestartAfterFreeze::store(bool restarts, WrittenPlaces& written) co
   return panic ? watchdog : panic;
 }
 
-/// The manager does not take up the file over a value that was set, so it gets both. To set 0 is to go back to the file
-/// as it was when it was read. A watchdog that cannot be stopped would soon reset the machine.
-Result<void> RestartAfterFreeze::turnWatchdogOff() const {
+/// A watchdog that cannot be stopped would soon reset the machine.
+Result<void> RestartAfterFreeze::checkWatchdogStops() const {
   const auto isForGood =
       allHold({[this] { return isWatchdog("nowayout", "1"); }, [this] { return isWatchdog("state", "active"); },
                [this] { return isWatchdogUsed(); }});
   if (!isForGood) return isForGood.failure();
   if (*isForGood) return Failure{"turn off", "/dev/watchdog0", "it cannot be stopped before the restart (nowayout)"};
+  return {};
+}
+
+/// The manager does not take up the file over a value that was set, so it gets both. To set 0 is to go back to the file
+/// as it was when it was read.
+Result<void> RestartAfterFreeze::turnWatchdogOff() const {
+  if (auto stops = checkWatchdogStops(); !stops) return stops;
   if (auto set = setWatchdogTime(std::chrono::seconds(0)); !set) return set;
   const auto isUsed = isWatchdogUsed();
   if (!isUsed) return isUsed.failure();
@@ -300,6 +338,10 @@ Setting<bool> RestartAfterFreeze::restartAfterFreeze() const {
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.stored = [this] { return stored(); };
+  setting.check = [this](bool restarts) { return check(restarts); };
+  setting.foresee = [this](bool restarts) {
+    return restarts || !_machine.services.hasServiceManager() ? Result<void>() : checkWatchdogStops();
+  };
   setting.store = [this, written](bool restarts) { return store(restarts, *written); };
   setting.apply = [this](bool restarts) { return apply(restarts); };
   return setting;

@@ -44,10 +44,18 @@ class RestartAfterFreeze {
     std::string from;  ///< the file that has the last word; empty: none says anything
     std::optional<std::string> own;
     std::string others = "0";  ///< what it would be without the tool's own file
+    std::string othersFrom;    ///< the file that says so; empty: none does
   };
   Result<StoredPanic> storedPanic() const;
   Result<bool> isPanicStored() const;
 
+  Result<void> check(bool restarts) const;
+  Result<void> checkPanic(bool restarts) const;
+  Result<void> checkWatchdog(bool restarts) const;
+  /// Whether both are as asked and nothing of it has to be written.
+  Result<bool> isWatchdogKept(bool restarts) const;
+  /// Why the watchdog cannot be turned off now.
+  Result<void> checkWatchdogStops() const;
   /// The places that were written are added.
   Result<void> store(bool restarts, WrittenPlaces& written) const;
   Result<void> storePanic(bool restarts) const;

@@ -68,10 +68,11 @@ Setting<bool> RestartAfterPowerFailure::ofFirmware(const FirmwareAttribute& attr
   setting.where = attribute.folder + "current_value";
   setting.note = saying("the firmware takes it up at the next start");
   setting.stored = [this, attribute] { return attribute.isOn(_machine.root); };
-  setting.store = [this, attribute](bool restarts) -> Result<void> {
+  setting.check = [attribute](bool) -> Result<void> {
     if (auto failure = whyNeedsRoot("write", attribute.folder)) return *failure;
-    return attribute.set(_machine.root, restarts);
+    return {};
   };
+  setting.store = [this, attribute](bool restarts) { return attribute.set(_machine.root, restarts); };
   return setting;
 }
 

@@ -26,6 +26,7 @@ class UdevRule {
   const std::string& file() const { return _file.path(); }
   /// Absent when there is no such file, or when somebody has changed it.
   Result<std::optional<Value>> value() const;
+  Result<void> check() const { return _file.check(); }
   Result<void> write(Value value) const;
 
  private:
@@ -53,6 +54,7 @@ void keepBy(const UdevRule<Value>& rule, const SystemRoot& root, Setting<Value>&
   }
   setting.where = rule.file();
   setting.stored = [&rule] { return rule.value(); };
+  setting.check = [&rule](Value) { return rule.check(); };
   setting.store = [&rule](Value value) { return rule.write(value); };
 }
 

@@ -204,6 +204,12 @@ Result<void> WakeOnNetworkAccess::storeIn(const std::string& linkFile, bool wake
   });
 }
 
+Result<void> WakeOnNetworkAccess::check(bool wakes) const {
+  return setEach(linkFiles(), [&](const std::string& file) {
+    return OwnFile(_machine.root, configOf(_machine.root, file).ownDropIn()).check(whatHides(file, wakes));
+  });
+}
+
 Result<void> WakeOnNetworkAccess::store(bool wakes, WrittenPlaces& written) const {
   return setEach(linkFiles(), [&](const std::string& file) { return storeIn(file, wakes, written); });
 }
@@ -236,6 +242,7 @@ Setting<bool> WakeOnNetworkAccess::wakeOnNetworkAccess() const {
   setting.where = ownfile::linkDropIn(usualLinkFile);
   setting.written = [written] { return written->text(); };
   setting.stored = [this] { return stored(); };
+  setting.check = [this](bool wakes) { return check(wakes); };
   setting.store = [this, written](bool wakes) { return store(wakes, *written); };
   return setting;
 }

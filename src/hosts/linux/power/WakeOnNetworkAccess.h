@@ -60,6 +60,7 @@ class WakeOnNetworkAccess {
   Support supported() const;
   Setting<bool>::Found live() const;
   Setting<bool>::Found stored() const;
+  Result<void> check(bool wakes) const;
   /// The places that were written are added.
   Result<void> store(bool wakes, WrittenPlaces& written) const;
   Result<void> apply(bool wakes) const;

@@ -51,6 +51,23 @@ Result<void> Daemons::checkMayStartAtBoot(const Daemon& daemon, bool start) {
   return *starts == start ? Result<void>() : *forRoot;
 }
 
+Result<void> Daemons::checkSetStartAtBoot(const std::vector<Daemon>& daemons, bool start) {
+  if (daemons.empty()) return {};
+  if (const auto forRoot = whyNeedsRoot(start ? "enable" : "disable", daemons.front().unit)) return *forRoot;
+  if (!start) return {};
+  const auto found = presences(daemons);
+  if (!found) return found.failure();
+  const auto masked = std::ranges::find(*found, Presence::masked);
+  if (masked == found->end()) return {};
+  return Failure{"EnableUnitFiles", daemons[static_cast<std::size_t>(masked - found->begin())].unit, "it is masked"};
+}
+
+Result<void> Daemons::foreseeStart(const Daemon& daemon) {
+  const auto found = presence(daemon);
+  if (!found) return found.failure();
+  return *found == Presence::masked ? Result<void>(Failure{"StartUnit", daemon.unit, "it is masked"}) : Result<void>();
+}
+
 DaemonGroup::DaemonGroup(Daemons& daemons, std::vector<std::string> units)
     : _daemons(daemons), _units(std::make_shared<const std::vector<std::string>>(std::move(units))) {
   for (const auto& unit : *_units) _members.push_back({unit.c_str(), "", ""});
@@ -136,7 +153,7 @@ Result<bool> DaemonGroup::isChanging() const {
   return !changing->empty();
 }
 
-Result<void> DaemonGroup::setAllStartAtBoot(bool start, WrittenPlaces& written) const {
+Result<std::vector<Daemon>> DaemonGroup::toSetAtBoot(bool start) const {
   std::vector<Daemon> others;
   for (const auto& member : _members) {
     const auto starts = _daemons.startsAtBoot(member);
@@ -145,7 +162,23 @@ Result<void> DaemonGroup::setAllStartAtBoot(bool start, WrittenPlaces& written) 
     if (!isLinked) return isLinked.failure();
     if (*isLinked != start) others.push_back(member);
   }
-  return others.empty() ? Result<void>() : _daemons.setStartAtBoot(others, start, written);
+  return others;
+}
+
+Result<void> DaemonGroup::setAllStartAtBoot(bool start, WrittenPlaces& written) const {
+  const auto others = toSetAtBoot(start);
+  if (!others) return others.failure();
+  return others->empty() ? Result<void>() : _daemons.setStartAtBoot(*others, start, written);
+}
+
+Result<void> DaemonGroup::foreseeStartAll() const {
+  for (const auto& member : _members) {
+    const auto is = isReady(member);
+    if (!is) return is.failure();
+    auto started = *is ? Result<void>() : _daemons.foreseeStart(member);
+    if (!started) return started;
+  }
+  return {};
 }
 
 Result<void> DaemonGroup::startAll() const {

@@ -44,6 +44,11 @@ class Daemons {
   /// One after the other; the first failure ends it. Only root may; whoever is not is refused before anything changes.
   /// The links that are made and removed are added to `written`.
   virtual Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start, WrittenPlaces& written) = 0;
+  /// Why setStartAtBoot() would refuse, asked of each before anything changes: one is masked, or the caller is not
+  /// root.
+  Result<void> checkSetStartAtBoot(const std::vector<Daemon>& daemons, bool start);
+  /// Why start() would fail, as far as that shows beforehand: it is masked, or a condition of it does not hold.
+  virtual Result<void> foreseeStart(const Daemon& daemon);
   /// Success means that the daemon runs: one that was started and ended at once, or never began, is a failure.
   virtual Result<void> start(const Daemon& daemon) = 0;
   virtual Result<void> stop(const Daemon& daemon) = 0;
@@ -83,8 +88,12 @@ class DaemonGroup {
   /// Whether a member starts or stops at this moment.
   Result<bool> isChanging() const;
 
-  /// Each member that is not so already; the first failure ends it.
+  /// The members that are not so already.
+  Result<std::vector<Daemon>> toSetAtBoot(bool start) const;
+  /// Each of them; the first failure ends it.
   Result<void> setAllStartAtBoot(bool start, WrittenPlaces& written) const;
+  /// Why startAll() would fail.
+  Result<void> foreseeStartAll() const;
   /// Those that are not ready, sockets first: a socket is not started beside its running service.
   Result<void> startAll() const;
   /// Sockets first, so that none starts its service again, and the last one first.

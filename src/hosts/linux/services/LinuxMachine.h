@@ -22,13 +22,16 @@ struct LinuxMachine {
   ServiceAccess& services;
   /// Whether this run's user may change something; asks the user if need be. Empty: yes.
   std::function<Result<void>()> authorizeChange = {};
+  Conduct conduct = Conduct::change;
 };
 
 /// While it lives this run may change the machine, and no other run does; or why that could not be had.
 using MachineHold = Result<FileDescriptor>;
 
-/// The user is asked before the lock is taken: an answer takes its time, and nobody else is to wait for it.
+/// The user is asked before the lock is taken: an answer takes its time, and nobody else is to wait for it. A forecast
+/// needs neither.
 inline MachineHold hold(const LinuxMachine& machine) {
+  if (machine.conduct == Conduct::forecast) return FileDescriptor();
   const auto authorized = machine.authorizeChange ? machine.authorizeChange() : Result<void>();
   if (!authorized) return authorized.failure();
   return MachineLock(machine.root, machine.runLoop).hold();
@@ -38,6 +41,7 @@ inline MachineHold hold(const LinuxMachine& machine) {
 template <typename Value>
 Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, const LinuxMachine& machine,
                 const MachineHold& held) {
+  if (machine.conduct == Conduct::forecast) return foretell(setting, asked, machine.effects);
   if (held) return carryOut(setting, asked, machine.effects, machine.runLoop);
   Effect effect{.setting = setting.name, .outcome = Outcome::failed, .asked = textOf(asked), .failure = held.failure()};
   machine.effects.record(effect);

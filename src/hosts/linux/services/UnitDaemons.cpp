@@ -8,10 +8,12 @@
 #include <map>
 #include <vector>
 
+#include "base/Text.h"
 #include "hosts/linux/services/ServiceAccess.h"
 #include "hosts/linux/services/SystemServices.h"
 #include "hosts/linux/services/UnitFiles.h"
 #include "hosts/linux/system/CommaList.h"
+#include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
@@ -39,6 +41,22 @@ std::string firstUnmet(BusMessage& conditions) {
     conditions.exit();
   }
   return unmet;
+}
+
+Failure notRunning(const Daemon& daemon, const std::string& unmet) {
+  const auto reason = unmet.empty() ? "" : ": the condition " + unmet + " does not hold";
+  return {"StartUnit", daemon.unit, "its job is done, but the unit does not run" + reason};
+}
+
+/// Of what systemd-analyze(1) prints, "NAME.service: ConditionVirtualization=!container failed."; empty: it names none.
+std::string unmetConditionIn(const std::string& printed) {
+  constexpr std::string_view ending = " failed.";
+  for (const auto& line : split(printed, "\n")) {
+    const auto start = line.find("Condition");
+    if (start == std::string::npos || !line.ends_with(ending) || line.find('=', start) == std::string::npos) continue;
+    return line.substr(start, line.size() - ending.size() - start);
+  }
+  return {};
 }
 
 /// Notes the jobs that end (the manager's signal JobRemoved) from its beginning on.
@@ -252,9 +270,7 @@ Result<void> UnitDaemons::runJob(const Daemon& daemon, const char* method) {
 
 /// A job can be "done" and the unit not run: a condition of it may not hold, as in a container.
 Failure UnitDaemons::whyNotRunning(const Daemon& daemon) {
-  const auto unmet = unmetCondition(daemon);
-  const auto reason = unmet ? ": the condition " + *unmet + " does not hold" : "";
-  return {"StartUnit", daemon.unit, "its job is done, but the unit does not run" + reason};
+  return notRunning(daemon, unmetCondition(daemon).value_or(""));
 }
 
 std::optional<std::string> UnitDaemons::unmetCondition(const Daemon& daemon) {
@@ -272,6 +288,18 @@ Result<void> UnitDaemons::start(const Daemon& daemon) {
   if (!running) return running.failure();
   if (!*running) return whyNotRunning(daemon);
   return {};
+}
+
+/// The service manager tells of conditions only what they were when it last tried: a program of it asks them anew.
+Result<void> UnitDaemons::foreseeStart(const Daemon& daemon) {
+  constexpr const char* asker = "/usr/bin/systemd-analyze";
+  if (auto known = Daemons::foreseeStart(daemon); !known) return known;
+  const auto isThere = _root.isThere(asker);
+  if (!isThere || !*isThere) return {};
+  const auto asked = outputOfProgram(_root, {asker, "condition", std::string("--unit=") + daemon.unit}, _runLoop);
+  if (!asked || asked->exitStatus == 0) return {};
+  const auto unmet = unmetConditionIn(asked->text);
+  return unmet.empty() ? Result<void>() : Result<void>(notRunning(daemon, unmet));
 }
 
 Result<void> UnitDaemons::stop(const Daemon& daemon) {

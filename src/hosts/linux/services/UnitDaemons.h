@@ -36,6 +36,7 @@ class UnitDaemons final : public Daemons {
   Result<bool> startsUntilRestart(const Daemon& daemon) override;
   Result<bool> staysOffAtBoot(const Daemon& daemon) override;
   Result<void> setStartAtBoot(const std::vector<Daemon>& daemons, bool start, WrittenPlaces& written) override;
+  Result<void> foreseeStart(const Daemon& daemon) override;
   Result<void> start(const Daemon& daemon) override;
   Result<void> stop(const Daemon& daemon) override;
   Result<void> restart(const Daemon& daemon) override;

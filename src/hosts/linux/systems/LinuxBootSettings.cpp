@@ -187,8 +187,15 @@ ServiceStatus LinuxBootSettings::setSystem(const BootChoice& choice) {
     if (!system) return system.failure();
     return *system ? std::optional(Reading((*system)->volume.text)) : std::nullopt;
   };
-  parts.store = [&](const std::string&) { return way ? start(*way, written) : way.failure(); };
+  parts.check = [&](const std::string&) { return way ? check(*way) : way.failure(); };
+  parts.store = [&](const std::string&) { return start(*way, written); };
   return change(std::move(parts), choice.disk.text, held);
+}
+
+Result<void> LinuxBootSettings::check(const WayToSystem& way) const {
+  const auto option = way.machine.isUefi ? optionFor(way.loader.place, *way.machine.volumes) : EfiLoadOption();
+  if (!option) return option.failure();
+  return way.needsDefault ? _choice.checkDefault(way) : Result<void>();
 }
 
 /// The order of entries comes last: until then the machine starts what it would have started.
@@ -258,8 +265,8 @@ ServiceStatus LinuxBootSettings::setFile(const BootChoice& choice) {
     if (!*entry) return std::nullopt;
     return Reading(targetText((*entry)->option));
   };
-  parts.store = [&](const std::string&) -> Result<void> {
-    if (!option) return option.failure();
+  parts.check = [&](const std::string&) { return option ? Result<void>() : option.failure(); };
+  parts.store = [&](const std::string&) {
     return _entries.putFirst(
         *option, [&](const auto& order) { return keepOrder(order, written); }, written);
   };
@@ -330,9 +337,9 @@ ServiceStatus LinuxBootSettings::keepVariable(Setting<std::string> parts, const 
 /// Only root writes variables.
 ServiceStatus LinuxBootSettings::change(Setting<std::string> parts, const std::string& asked,
                                         const MachineHold& held) const {
-  parts.store = [where = parts.where, store = parts.store](const std::string& value) -> Result<void> {
+  parts.check = [where = parts.where, check = parts.check](const std::string& value) -> Result<void> {
     if (const auto failure = whyNeedsRoot("write", where)) return *failure;
-    return store(value);
+    return check ? check(value) : Result<void>();
   };
   const auto effect = carryOut(parts, asked, _machine, held);
   const bool isDone = effect.outcome == Outcome::applied || effect.outcome == Outcome::unchanged;

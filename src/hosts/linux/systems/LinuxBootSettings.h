@@ -52,6 +52,7 @@ class LinuxBootSettings final : public BootSettings {
             const std::function<Support()>& supported) const;
   ServiceStatus setFile(const BootChoice& choice);
   ServiceStatus setSystem(const BootChoice& choice);
+  Result<void> check(const WayToSystem& way) const;
   Result<void> start(const WayToSystem& way, WrittenPlaces& written) const;
   Result<void> setDefault(const WayToSystem& way, WrittenPlaces& written,
                           const std::function<Result<void>()>& goOn) const;

@@ -140,6 +140,14 @@ Result<WayToSystem> SystemChoice::wayTo(const DiskName& volume) const {
   return why;
 }
 
+Result<void> SystemChoice::checkDefault(const WayToSystem& way) const {
+  const auto& place = way.loader.reading->keeps;
+  if (place.kind == LoaderDefault::Kind::none) return Failure{choose, way.start.root.text, "its loader has no default"};
+  const auto path =
+      place.kind == LoaderDefault::Kind::environmentBlock ? pathOf(place.volume, place.path) : Result<std::string>("");
+  return path ? Result<void>() : path.failure();
+}
+
 Result<SystemChoice::PutBack> SystemChoice::setDefault(const WayToSystem& way, WrittenPlaces& written) const {
   const auto& place = way.loader.reading->keeps;
   switch (place.kind) {

@@ -54,6 +54,8 @@ class SystemChoice {
   /// The best way: a loader of which the system is the default, else one whose default can be set; of either one that
   /// has a boot entry. Fails, with the reason, when there is none.
   Result<WayToSystem> wayTo(const DiskName& volume) const;
+  /// Why setDefault() would fail, as far as that shows beforehand.
+  Result<void> checkDefault(const WayToSystem& way) const;
   /// Writes the loader's default as its own tool would: in one step, and to the disk. What comes back puts the default
   /// back that it has replaced.
   using PutBack = std::function<Result<void>()>;

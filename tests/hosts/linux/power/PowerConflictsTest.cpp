@@ -60,9 +60,14 @@ TEST(PowerConflictsOfFiles, WhatAnotherFileHidesIsNotLeftInOursAndOffTakesItOut)
   for (const auto& each : hidden) {
     SCOPED_TRACE(each.what);
     PowerTree tree;
-    EXPECT_EQ(each.setFirst(tree).outcome, Outcome::applied);
+    const auto foretold = tree.foretell(each.setFirst);
+    EXPECT_FALSE(std::filesystem::exists(tree.at(each.ours)));
+    const auto first = each.setFirst(tree);
+    EXPECT_EQ(first.outcome, Outcome::applied);
+    EXPECT_EQ(std::pair(foretold.live, foretold.stored), std::pair(first.live, first.stored));
     const auto before = tree.file(each.ours);
     tree.write(each.file, each.text);
+    EXPECT_THAT(tree.foretell(each.set), FailedFor(std::string(each.file) + " says otherwise"));
     const auto refused = each.set(tree);
     EXPECT_THAT(refused, FailedFor(std::string(each.file) + " says otherwise"));
     EXPECT_EQ(refused.undoneBy, each.file);

@@ -149,16 +149,24 @@ class PowerTree : public LinuxTree {
 
   /// Changes a setting, whatever feeds the machine, and tells what came of it.
   Effect set(SleepTimer timer, Minutes minutes) {
-    _power.setUntilSleep(timer, mains, minutes);
+    acting().setUntilSleep(timer, mains, minutes);
     return lastEffect();
   }
   Effect turn(PowerSwitch which, bool on) {
-    _power.setOn(which, mains, on);
+    acting().setOn(which, mains, on);
     return lastEffect();
   }
   Effect setRestartsAfterFreeze(bool restarts) {
-    _power.setRestartsAfterFreeze(restarts);
+    acting().setRestartsAfterFreeze(restarts);
     return lastEffect();
+  }
+
+  /// What such a change would come to.
+  Effect foretell(const std::function<Effect(PowerTree&)>& change) {
+    _isForecast = true;
+    auto effect = change(*this);
+    _isForecast = false;
+    return effect;
   }
 
   const PowerSource mains{"AC Power"};
@@ -176,8 +184,14 @@ class PowerTree : public LinuxTree {
       write(words[0], words.at(2) + "\n");
   }
 
+  LinuxPowerSettingsService& acting() { return _isForecast ? _foreteller : _power; }
+
+  bool _isForecast = false;
   ManagementController _controller{controllerLink};
   LinuxPowerSettingsService _power{machine, {console, cards, _controller}};
+  LinuxPowerSettingsService _foreteller{
+      {machine.root, machine.effects, machine.runLoop, machine.services, {}, Conduct::forecast},
+      {console, cards, _controller}};
   LinuxPowerController _delays{machine, _controller};
 };
 

@@ -1,0 +1,112 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <algorithm>
+#include <optional>
+#include <utility>
+
+#include "base/Process.h"
+#include "control/Applier.h"
+#include "control/ApplyPlan.h"
+#include "control/Commands.h"
+#include "control/Rehearsal.h"
+#include "control/RehearsalFolder.h"
+
+namespace tavisk::control {
+namespace {
+
+constexpr const char* from = "--from";
+constexpr const char* keep = "--keep";
+
+/// Words, or the steps of a file.
+struct Part {
+  std::vector<std::string> words;
+  std::vector<Step> steps;
+};
+
+Result<Part> askedPart(const Invocation& invocation) {
+  const bool isFile = invocation.has(from);
+  if (isFile != invocation.operands.empty())
+    return Failure{"either words of tavisk or --from FILE are expected", "", "type 'taviskctl rehearse --help'"};
+  if (!isFile) return Part{invocation.operands, {}};
+  const auto wanted = wantedInFile(invocation.options.at(from));
+  if (!wanted) return wanted.failure();
+  return Part{{}, stepsFor(*wanted)};
+}
+
+std::optional<std::string> keptFolder(const Invocation& invocation) {
+  return invocation.has(keep) ? std::optional(invocation.options.at(keep)) : std::nullopt;
+}
+
+Rehearsed rehearsedOn(Host& host, const Part& part, WordRunner& runner, StatusReader& reader, RehearsalNotes& notes) {
+  if (part.steps.empty()) {
+    auto all = rehearseWords(part.words, runner);
+    all.settings = notes.settings();
+    return all;
+  }
+  Applier applier(host, runner, reader);
+  Rehearsed all;
+  for (const auto& step : part.steps)
+    for (const auto& applied : applier.apply(step)) all.settings.push_back(rehearsed(applied, notes));
+  return all;
+}
+
+Status show(const Rehearsed& rehearsed, const Invocation& invocation, const Tools& tools) {
+  const auto folder = keptFolder(invocation).value_or("");
+  const auto text = invocation.has("--json") ? rehearsedJson(rehearsed, folder) + "\n" : rehearsedTable(rehearsed);
+  tools.output.print("%s", text.c_str());
+  return isAllDone(rehearsed) ? Status::done : Status::incomplete;
+}
+
+Status complain(const Failure& failure, Status status, const Tools& tools) {
+  tools.complain(describe(failure));
+  return status;
+}
+
+/// What could not be read of the machine is told, and not rehearsed.
+class LookFailures final : public EffectChannel {
+ public:
+  void record(const Effect& effect) override {
+    if (effect.failure) _failures.push_back(effect.setting + ": " + describe(*effect.failure));
+  }
+  void tell(const Tools& tools) const {
+    for (const auto& failure : _failures) tools.complain("not read: " + failure);
+  }
+
+ private:
+  std::vector<std::string> _failures;
+};
+
+}  // namespace
+
+Status rehearseChanges(const Invocation& invocation, const Tools& tools) {
+  const auto part = askedPart(invocation);
+  if (!part) return complain(part.failure(), Status::misused, tools);
+  const EndingSignals signals;
+  const auto folder = RehearsalFolder::make(keptFolder(invocation));
+  if (!folder) return complain(folder.failure(), Status::incomplete, tools);
+  const auto waiter = SignalWaiter::start(
+      signals,
+      [&](const std::string&) {
+        folder->removeTemporary();
+        if (tools.showProgress) tools.showProgress("");
+      },
+      [] { return static_cast<int>(Status::incomplete); });
+  if (!waiter) signals.unblock();
+  EffectSink effects;
+  LookFailures failures;
+  StatusReader reader;
+  RehearsalNotes notes;
+  RunLoop runLoop;
+  effects.addChannel(failures);
+  const auto host = tools.openRehearsal(folder->path(), effects, runLoop);
+  effects.removeChannel(failures);
+  failures.tell(tools);
+  if (!host) return complain(host.failure(), Status::incomplete, tools);
+  effects.addChannel(reader);
+  effects.addChannel(notes);
+  WordRunner runner(**host, effects, runLoop);
+  if (const auto started = runner.start(); !started) return complain(started.failure(), Status::incomplete, tools);
+  return show(rehearsedOn(**host, *part, runner, reader, notes), invocation, tools);
+}
+
+}  // namespace tavisk::control

@@ -1,0 +1,43 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include "hosts/rehearsal/RehearsalHost.h"
+
+#include <utility>
+
+#include "effects/SettingNames.h"
+#include "hosts/rehearsal/MachineCopy.h"
+
+namespace tavisk {
+
+Result<std::unique_ptr<RehearsalHost>> RehearsalHost::open(ForetellingMachine machine, const std::string& directory,
+                                                           EffectSink& effects, RunLoop& runLoop) {
+  if (const auto copied = copyMachine(*machine.host, *machine.effects, directory, effects); !copied)
+    return copied.failure();
+  Copy copy{std::make_unique<EffectSink>(), nullptr, nullptr};
+  auto host = ScratchHost::open(directory, *copy.effects, runLoop);
+  if (!host) return host.failure();
+  copy.host = std::move(host).value();
+  auto file = MachineFile::open(directory, *copy.effects);
+  if (!file) return file.failure();
+  copy.file = std::move(file).value();
+  return std::unique_ptr<RehearsalHost>(new RehearsalHost(std::move(machine), std::move(copy), effects));
+}
+
+RehearsalHost::RehearsalHost(ForetellingMachine machine, Copy copy, EffectSink& effects)
+    : _machine(std::move(machine)),
+      _copyEffects(std::move(copy.effects)),
+      _copy(std::move(copy.host)),
+      _copyFile(std::move(copy.file)),
+      _stage({*_machine.host, *_machine.effects, *_copy, *_copyEffects, *_copyFile}, effects),
+      _clock(_stage),
+      _networkTime(_stage),
+      _powerSettings(_stage),
+      _powerController(_stage),
+      _remoteShell(_stage, &Host::remoteShell, setting::remoteLogin, "Remote Shell"),
+      _remoteEvents(_stage, &Host::remoteEvents, setting::remoteEvents, "Remote Events"),
+      _hostConfiguration(_stage, _machine.showsHostName),
+      _bootLoaderFile(_stage),
+      _diskManagement(_stage),
+      _processes(_stage) {}
+
+}  // namespace tavisk
