@@ -5,7 +5,7 @@
 #include <utility>
 
 #include "base/Calendar.h"
-#include "control/SinceTime.h"
+#include "control/undo/SinceTime.h"
 
 namespace tavisk::control {
 namespace {

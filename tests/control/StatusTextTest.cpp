@@ -3,7 +3,7 @@
 #include <gmock/gmock.h>
 
 #include "base/Calendar.h"
-#include "control/StatusText.h"
+#include "control/status/StatusText.h"
 
 namespace tavisk::control {
 namespace {

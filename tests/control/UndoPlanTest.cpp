@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include "control/UndoPlan.h"
+#include "control/undo/UndoPlan.h"
 
 namespace tavisk::control {
 namespace {

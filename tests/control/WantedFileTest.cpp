@@ -4,8 +4,8 @@
 
 #include <string>
 
-#include "control/ApplyPlan.h"
-#include "control/WantedFile.h"
+#include "control/apply/ApplyPlan.h"
+#include "control/apply/WantedFile.h"
 
 namespace tavisk::control {
 namespace {

@@ -26,7 +26,7 @@ RULES = [
     ("no library but the standard one here", CORE + r"|src/platform/|src/(base|effects)/.*\.h$", r"#include <[^>]*[./]"),
     ("pugixml is hidden in the XML of PropertyList", r"src/(?!base/PropertyListXml).*\.(cpp|h)$", r"pugi"),
     ("the JSON library is hidden in what reads wanted values and logs",
-     r"src/(?!control/WantedFile\.cpp|hosts/scratch/ScratchLogs\.cpp)", r"nlohmann"),
+     r"src/(?!control/apply/WantedFile\.cpp|hosts/scratch/ScratchLogs\.cpp)", r"nlohmann"),
     ("every wait goes through RunLoop", r"src/(?!base/RunLoop)", r"#include <sys/(epoll|eventfd|timerfd)\.h>"),
     ("one source asks which host it is", r"src/(?!hosts/ChosenHost\.)", r"TAVISK_HOST"),
     ("handlers print on the stream they are given, and never end the process", CORE,

@@ -7,8 +7,8 @@
 #include <string>
 #include <vector>
 
-#include "control/Applier.h"
-#include "control/UndoPlan.h"
+#include "control/apply/Applier.h"
+#include "control/undo/UndoPlan.h"
 
 namespace tavisk::control {
 

@@ -5,11 +5,11 @@
 #include <utility>
 
 #include "base/Process.h"
-#include "control/Applier.h"
 #include "control/Commands.h"
-#include "control/SinceTime.h"
-#include "control/UndoPlan.h"
-#include "control/UndoText.h"
+#include "control/apply/Applier.h"
+#include "control/undo/SinceTime.h"
+#include "control/undo/UndoPlan.h"
+#include "control/undo/UndoText.h"
 
 namespace tavisk::control {
 namespace {

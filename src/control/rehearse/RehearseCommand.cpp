@@ -5,11 +5,11 @@
 #include <utility>
 
 #include "base/Process.h"
-#include "control/Applier.h"
-#include "control/ApplyPlan.h"
 #include "control/Commands.h"
-#include "control/Rehearsal.h"
-#include "control/RehearsalFolder.h"
+#include "control/apply/Applier.h"
+#include "control/apply/ApplyPlan.h"
+#include "control/rehearse/Rehearsal.h"
+#include "control/rehearse/RehearsalFolder.h"
 
 namespace tavisk::control {
 namespace {

@@ -7,8 +7,8 @@
 #include <string>
 #include <vector>
 
-#include "control/Applier.h"
 #include "control/WordRunner.h"
+#include "control/apply/Applier.h"
 #include "effects/EffectSink.h"
 
 namespace tavisk::control {

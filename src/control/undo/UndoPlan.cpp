@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/UndoPlan.h"
+#include "control/undo/UndoPlan.h"
 
 #include <algorithm>
 #include <iterator>

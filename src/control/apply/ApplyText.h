@@ -5,7 +5,7 @@
 #include <span>
 #include <string>
 
-#include "control/Applier.h"
+#include "control/apply/Applier.h"
 
 namespace tavisk::control {
 

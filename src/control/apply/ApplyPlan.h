@@ -8,7 +8,7 @@
 
 #include "base/Result.h"
 #include "control/SettingValues.h"
-#include "control/WantedFile.h"
+#include "control/apply/WantedFile.h"
 
 namespace tavisk::control {
 

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/StatusText.h"
+#include "control/status/StatusText.h"
 
 #include <array>
 #include <cstdint>

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/Rehearsal.h"
+#include "control/rehearse/Rehearsal.h"
 
 #include <algorithm>
 #include <utility>

@@ -3,9 +3,9 @@
 #include <algorithm>
 
 #include "base/Process.h"
-#include "control/Applier.h"
-#include "control/ApplyText.h"
 #include "control/Commands.h"
+#include "control/apply/Applier.h"
+#include "control/apply/ApplyText.h"
 #include "effects/SettingNames.h"
 
 namespace tavisk::control {

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/ApplyPlan.h"
+#include "control/apply/ApplyPlan.h"
 
 #include <algorithm>
 

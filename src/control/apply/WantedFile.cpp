@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/WantedFile.h"
+#include "control/apply/WantedFile.h"
 
 #include <fcntl.h>
 #include <unistd.h>

@@ -1,14 +1,14 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/ApplyText.h"
+#include "control/apply/ApplyText.h"
 
 #include <algorithm>
 #include <iterator>
 
 #include "base/Json.h"
 #include "base/Text.h"
-#include "control/StatusText.h"
 #include "control/TextTable.h"
+#include "control/status/StatusText.h"
 
 namespace tavisk::control {
 namespace {

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/Applier.h"
+#include "control/apply/Applier.h"
 
 #include <algorithm>
 #include <span>

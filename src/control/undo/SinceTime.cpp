@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/SinceTime.h"
+#include "control/undo/SinceTime.h"
 
 #include <ctime>
 #include <string_view>

@@ -1,14 +1,14 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/UndoText.h"
+#include "control/undo/UndoText.h"
 
 #include <string_view>
 #include <utility>
 
 #include "base/Json.h"
 #include "base/Text.h"
-#include "control/StatusText.h"
 #include "control/TextTable.h"
+#include "control/status/StatusText.h"
 
 namespace tavisk::control {
 namespace {

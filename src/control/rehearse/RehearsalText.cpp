@@ -5,9 +5,9 @@
 
 #include "base/Json.h"
 #include "base/Text.h"
-#include "control/Rehearsal.h"
-#include "control/StatusText.h"
 #include "control/TextTable.h"
+#include "control/rehearse/Rehearsal.h"
+#include "control/status/StatusText.h"
 
 namespace tavisk::control {
 namespace {

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include "control/RehearsalFolder.h"
+#include "control/rehearse/RehearsalFolder.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>

@@ -6,9 +6,9 @@
 #include <string>
 #include <vector>
 
-#include "control/ApplyPlan.h"
 #include "control/StatusReader.h"
 #include "control/WordRunner.h"
+#include "control/apply/ApplyPlan.h"
 #include "platform/Host.h"
 
 namespace tavisk::control {

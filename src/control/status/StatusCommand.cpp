@@ -5,7 +5,7 @@
 #include "control/Commands.h"
 #include "control/ManagedSettings.h"
 #include "control/StatusReader.h"
-#include "control/StatusText.h"
+#include "control/status/StatusText.h"
 
 namespace tavisk::control {
 namespace {
