@@ -4,6 +4,7 @@
 #include <gmock/gmock.h>
 #include <systemd/sd-bus.h>
 
+#include <cstdlib>
 #include <mutex>
 
 #include "effects/EffectMatchers.h"
@@ -138,6 +139,8 @@ TEST(PolkitAgent, IsReadyOrToldToBeNone) {
       {nullptr, "No such file"},
   };
   for (const auto& [script, why] : cases) {
+    // An emulator's vfork(2) is a fork: a program that there is not is one that ended.
+    if (!script && std::getenv("TAVISK_ARCHITECTURE")) continue;
     LinuxTree tree;
     if (script) tree.writeProgram("/usr/bin/pkttyagent", std::string("#!/bin/sh\n") + script);
     const auto limit = tree.runLoop.limitWaits(2s);
