@@ -8,6 +8,17 @@
 #include "hosts/rehearsal/MachineCopy.h"
 
 namespace tavisk {
+namespace {
+
+RemoteShellService& remoteShellOf(Host& host) {
+  return host.remoteShell();
+}
+
+RemoteEventsService& remoteEventsOf(Host& host) {
+  return host.remoteEvents();
+}
+
+}  // namespace
 
 Result<std::unique_ptr<RehearsalHost>> RehearsalHost::open(ForetellingMachine machine, const std::string& directory,
                                                            EffectSink& effects, RunLoop& runLoop) {
@@ -33,8 +44,8 @@ RehearsalHost::RehearsalHost(ForetellingMachine machine, Copy copy, EffectSink& 
       _networkTime(_stage),
       _powerSettings(_stage),
       _powerController(_stage),
-      _remoteShell(_stage, &Host::remoteShell, setting::remoteLogin, "Remote Shell"),
-      _remoteEvents(_stage, &Host::remoteEvents, setting::remoteEvents, "Remote Events"),
+      _remoteShell(_stage, remoteShellOf, setting::remoteLogin, "Remote Shell"),
+      _remoteEvents(_stage, remoteEventsOf, setting::remoteEvents, "Remote Events"),
       _hostConfiguration(_stage, _machine.showsHostName),
       _bootLoaderFile(_stage),
       _diskManagement(_stage),

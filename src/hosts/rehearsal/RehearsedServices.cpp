@@ -137,8 +137,8 @@ ControllerStatus RehearsedPowerController::setProperties(const Connection& conne
 template <typename Service>
 RemoteAccessState RehearsedRemoteAccess<Service>::state() {
   const auto rehearsed = _stage.stateOf(_setting);
-  if (!rehearsed) return (_stage.machine().*_service)().state();
-  static_cast<void>((_stage.copy().*_service)().state());
+  if (!rehearsed) return _serviceOf(_stage.machine()).state();
+  static_cast<void>(_serviceOf(_stage.copy()).state());
   if (rehearsed->live == rehearsed->stored)
     return rehearsed->live == "on" ? RemoteAccessState::on : RemoteAccessState::off;
   return RemoteAccessState::partly;
@@ -146,7 +146,7 @@ RemoteAccessState RehearsedRemoteAccess<Service>::state() {
 
 template <typename Service>
 void RehearsedRemoteAccess<Service>::setEnabled(bool enabled) {
-  _stage.play([&](Host& host) { (host.*_service)().setEnabled(enabled); });
+  _stage.play([&](Host& host) { _serviceOf(host).setEnabled(enabled); });
   if (!_stage.stateOf(_setting)) return;
   const bool isEnabled = isOn(state());
   _stage.edit([&](PropertyList::Dictionary& machine) { machine.dictionary(_section).set("Enabled", isEnabled); });

@@ -97,16 +97,19 @@ class RehearsedPowerController final : public PowerController {
 template <typename Service>
 class RehearsedRemoteAccess final : public Service {
  public:
-  /// `service` is the host's, `setting` its name and `section` that of the copy's file.
-  RehearsedRemoteAccess(Stage& stage, Service& (Host::*service)(), const char* setting, const char* section)
-      : _stage(stage), _service(service), _setting(setting), _section(section) {}
+  /// The service of a host.
+  using Finder = Service& (*)(Host& host);
+
+  /// `setting` is its name and `section` that of the copy's file.
+  RehearsedRemoteAccess(Stage& stage, Finder serviceOf, const char* setting, const char* section)
+      : _stage(stage), _serviceOf(serviceOf), _setting(setting), _section(section) {}
 
   RemoteAccessState state() override;
   void setEnabled(bool enabled) override;
 
  private:
   Stage& _stage;
-  Service& (Host::*_service)();
+  Finder _serviceOf;
   const char* _setting;
   const char* _section;
 };
