@@ -232,7 +232,7 @@ std::optional<std::string> unescaped(std::string_view text) {
   return result;
 }
 
-std::string quoted(std::string_view text) {
+std::string inQuotes(std::string_view text) {
   return "\"" + std::string(text) + "\"";
 }
 

@@ -59,7 +59,7 @@ constexpr bool isLetterOrDigit(char byte) {
 }
 
 /// Between quotation marks, as it is.
-std::string quoted(std::string_view text);
+std::string inQuotes(std::string_view text);
 
 /// Letters in lower or capital letters; all other bytes stay.
 std::string lowerCased(std::string_view text);

@@ -239,8 +239,8 @@ std::optional<std::string> whyWrongAt(std::string_view place, const PropertyList
   for (const auto& [key, value] : values) {
     const auto* row = findKey(place, key);
     if (!row) continue;
-    if (!fits(value, row->type)) return quoted(key) + ": expected " + shapeOf(row->type).words;
-    if (const auto wrong = whyWrongInside(*row, value)) return quoted(key) + " " + *wrong;
+    if (!fits(value, row->type)) return inQuotes(key) + ": expected " + shapeOf(row->type).words;
+    if (const auto wrong = whyWrongInside(*row, value)) return inQuotes(key) + " " + *wrong;
   }
   return std::nullopt;
 }

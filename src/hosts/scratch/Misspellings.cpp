@@ -90,7 +90,7 @@ const KeyRow* rowLike(std::string_view place, std::string_view written) {
 }
 
 std::string isMeant(std::string_view name) {
-  return " (is " + quoted(name) + " meant?)";
+  return " (is " + inQuotes(name) + " meant?)";
 }
 
 bool isSetting(std::string_view name) {
@@ -106,7 +106,7 @@ void addRefusals(const PropertyList::Dictionary& refused, Names& names) {
     if (isSetting(name)) continue;
     const auto* meant = std::ranges::find_if(settings, [&](auto setting) { return isLike(name, setting); });
     const auto note = meant == std::end(settings) ? " (no setting is called so)" : isMeant(*meant);
-    names.push_back(quoted(refusals) + " " + quoted(key) + note);
+    names.push_back(inQuotes(refusals) + " " + inQuotes(key) + note);
   }
 }
 
@@ -123,10 +123,10 @@ void addNamesInside(const KeyRow& row, const std::string& way, const PropertyLis
 void addNamesAt(std::string_view place, const std::string& way, const PropertyList::Dictionary& values, Names& names) {
   for (const auto& [key, value] : values) {
     if (const auto* row = findKey(place, key)) {
-      addNamesInside(*row, way + quoted(key) + " ", value, names);
+      addNamesInside(*row, way + inQuotes(key) + " ", value, names);
       continue;
     }
-    if (const auto* meant = rowLike(place, key)) names.push_back(way + quoted(key) + isMeant(meant->key));
+    if (const auto* meant = rowLike(place, key)) names.push_back(way + inQuotes(key) + isMeant(meant->key));
   }
 }
 
