@@ -36,6 +36,10 @@ bool hasChanged(const FoundJournalEntry& entry) {
   return changed ? *changed == "yes" : entry.field(journalfield::before) != entry.field(journalfield::after);
 }
 
+std::string unknownUser(const std::string& user, const std::string& why) {
+  return "left out are changes by user " + user + ", as it is not known who that is: " + why;
+}
+
 std::string listed(const std::set<std::string>& users) {
   std::string list;
   for (const auto& user : users) list.append(list.empty() ? "" : ", ").append(user);
@@ -65,8 +69,7 @@ class Changes {
     if (!_strangers.empty())
       found.remarks.push_back("left out are changes in tavisk's name by users who are no administrators: " +
                               listed(_strangers));
-    for (const auto& [user, why] : _unknown)
-      found.remarks.push_back("left out are changes by user " + user + ", as it is not known who that is: " + why);
+    for (const auto& [user, why] : _unknown) found.remarks.push_back(unknownUser(user, why));
     return found;
   }
 
