@@ -53,13 +53,17 @@ Failure journalFailure(int result) {
 }
 
 /// The library leaves out files that it may not read, and says nothing.
+std::string inFolder(const std::string& folder, const std::string& name) {
+  return folder + "/" + name;
+}
+
 Result<std::size_t> countReadable(const SystemRoot& root, const std::string& folder) {
   const auto names = orEmpty(root.list(folder));
   if (!names) return names.failure();
   std::size_t count = 0;
   for (const auto& name : *names) {
     if (!name.ends_with(".journal") && !name.ends_with(".journal~")) continue;
-    const auto file = orAbsent(root.openRegular(folder + "/" + name));
+    const auto file = orAbsent(root.openRegular(inFolder(folder, name)));
     if (!file) return file.failure();
     if (*file) ++count;
   }
