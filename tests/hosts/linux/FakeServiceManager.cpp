@@ -106,7 +106,7 @@ int FakeServiceManager::answerUnits(sd_bus_message* message) {
     const auto state = known == _units.end() ? FakeUnit{"not-found"} : known->second;
     std::this_thread::sleep_for(state.delay);
     sd_bus_message_append(reply, "(ssssssouso)", unit, "", state.load.c_str(), state.active.c_str(), "", "",
-                          pathOf(unit).c_str(), 0U, "", "/");
+                          pathOf(unit).c_str(), state.job.empty() ? 0U : 1U, state.job.c_str(), "/");
   }
   sd_bus_message_close_container(reply);
   const int sent = sd_bus_send(nullptr, reply, nullptr);

@@ -20,6 +20,7 @@ struct FakeUnit {
   std::string file = "disabled";
   std::string jobResult = "done";        ///< empty: the job never ends
   bool conditionHolds = true;            ///< else a job is done and the unit stays as it is
+  std::string job = "";                  ///< the kind of the one that it has
   std::chrono::milliseconds delay = {};  ///< of each answer about its state
 };
 

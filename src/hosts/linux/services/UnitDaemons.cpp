@@ -100,14 +100,20 @@ void addLinks(BusMessage& changes, WrittenPlaces& written) {
   }
 }
 
+/// While it is started anew it stops first: its job tells what it comes to.
+bool isToRun(const UnitState& state) {
+  const auto& [load, active, job] = state;
+  return active == "active" || active == "activating" || active == "reloading" || job == "start" || job == "restart";
+}
+
 /// One unit of the manager's list: name, description, both states, more of both, and the job that it has.
 UnitState takeState(BusMessage& list) {
   list.readText();
   list.readText();
-  UnitState state{list.readText(), list.readText()};
+  UnitState state{list.readText(), list.readText(), ""};
   for (int more = 0; more < 3; ++more) list.readText();
   list.readUint32();
-  list.readText();
+  state.job = list.readText();
   list.readText();
   list.exit();
   return state;
@@ -176,8 +182,7 @@ Result<std::vector<bool>> UnitDaemons::areRunning(const std::vector<Daemon>& dae
   const auto found = states(daemons);
   if (!found) return found.failure();
   std::vector<bool> are;
-  for (const auto& [load, active] : *found)
-    are.push_back(active == "active" || active == "activating" || active == "reloading");
+  std::ranges::transform(*found, std::back_inserter(are), isToRun);
   return are;
 }
 

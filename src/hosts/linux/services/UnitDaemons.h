@@ -19,6 +19,7 @@ class ServiceAccess;
 struct UnitState {
   std::string load;
   std::string active;
+  std::string job;  ///< the kind of the one that it has, empty without any
 };
 
 /// Daemons of a machine with the service manager: its units, and the links by which they start

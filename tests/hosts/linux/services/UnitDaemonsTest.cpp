@@ -4,6 +4,8 @@
 #include <sys/syscall.h>
 #include <unistd.h>
 
+#include <tuple>
+
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/LinuxContractMachines.h"
 #include "hosts/linux/services/ServicesConfig.h"
@@ -76,6 +78,18 @@ TEST_F(ManagedDaemons, HaveDoneAJobThatEndedSo) {
     const auto done = (daemons.*method)(daemon);
     ASSERT_FALSE(done);
     EXPECT_EQ(done.failure().why, "its job ended with: dependency");
+  }
+}
+
+TEST_F(ManagedDaemons, RunWhileTheyAreStartedAnew) {
+  const std::tuple<const char*, const char*, bool> cases[] = {
+      {"deactivating", "restart", true}, {"inactive", "start", true}, {"failed", "restart", true},
+      {"deactivating", "", false},       {"inactive", "stop", false}, {"reloading", "", true},
+  };
+  for (const auto& [active, job, runs] : cases) {
+    tree.manager.set(daemon.unit, {.active = active, .job = job});
+    const auto running = daemons.isRunning(daemon);
+    EXPECT_TRUE(running && *running == runs) << active << " " << job;
   }
 }
 
