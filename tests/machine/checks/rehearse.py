@@ -51,7 +51,7 @@ SETS = f"""
 -setnetworktimeserver time.example
 -setnetworktimeserver 'two words'
 -setnetworktimeserver ''
--setnetworktimeserver a.example -setnetworktimeserver a.example -setnetworktimeserver b.example -getnetworktimeserver
+-setnetworktimeserver a.example -setnetworktimeserver b.example -getnetworktimeserver
 -setsleep 20 -getsleep
 -setsleep never
 -setsleep 181
