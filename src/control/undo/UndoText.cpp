@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "control/undo/UndoText.h"
 
+#include <algorithm>
+#include <iterator>
 #include <string_view>
 #include <utility>
 
@@ -51,9 +53,13 @@ std::string resultObject(const UndoResult& result) {
   return object.str();
 }
 
+std::string remarkObject(const std::string& remark) {
+  return JsonObject().text("text", remark).str();
+}
+
 std::vector<std::string> remarkObjects(const std::vector<std::string>& remarks) {
   std::vector<std::string> objects;
-  for (const auto& remark : remarks) objects.push_back(JsonObject().text("text", remark).str());
+  std::ranges::transform(remarks, std::back_inserter(objects), remarkObject);
   return objects;
 }
 
