@@ -55,12 +55,18 @@ std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSett
 
 std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSetting*>& settings, const Get& get) {
   for (const auto* setting : settings) {
-    _current = setting;
-    stateOf(std::string(setting->name));
+    begin(*setting);
     get(*setting);
   }
+  const std::scoped_lock lock(_mutex);
   _current = nullptr;
   return std::exchange(_states, {});
+}
+
+void StatusReader::begin(const ManagedSetting& setting) {
+  const std::scoped_lock lock(_mutex);
+  _current = &setting;
+  stateOf(std::string(setting.name));
 }
 
 SettingState& StatusReader::stateOf(const std::string& setting) {
@@ -71,6 +77,7 @@ SettingState& StatusReader::stateOf(const std::string& setting) {
 
 /// A getter looks at other settings too, which have their own.
 void StatusReader::observe(const SettingValue& value) {
+  const std::scoped_lock lock(_mutex);
   if (!_current || (value.setting != _current->name && isManaged(value.setting))) return;
   auto told = value;
   told.where = existing(value.where);
@@ -78,6 +85,7 @@ void StatusReader::observe(const SettingValue& value) {
 }
 
 void StatusReader::record(const Effect& effect) {
+  const std::scoped_lock lock(_mutex);
   if (!_current || !effect.failure || (effect.setting != _current->name && isManaged(effect.setting))) return;
   auto& failures = stateOf(effect.setting).failures;
   if (std::ranges::find(failures, *effect.failure) == failures.end()) failures.push_back(*effect.failure);

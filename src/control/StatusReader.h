@@ -3,6 +3,7 @@
 #pragma once
 
 #include <functional>
+#include <mutex>
 #include <string>
 #include <vector>
 
@@ -20,7 +21,8 @@ struct SettingState {
   std::vector<Failure> failures;  ///< of its reads
 };
 
-/// Reads settings by their getters, and keeps what those tell instead of what they print.
+/// Reads settings by their getters, and keeps what those tell instead of what they print. Others than the thread that
+/// reads may tell as well, as when a signal ends the process.
 class StatusReader final : public EffectChannel {
  public:
   /// For each of the settings its own state, then those that its getter told besides and that no setting is named for.
@@ -36,8 +38,10 @@ class StatusReader final : public EffectChannel {
   bool wantsPlaces() const override { return true; }
 
  private:
+  void begin(const ManagedSetting& setting);
   SettingState& stateOf(const std::string& setting);
 
+  std::mutex _mutex;                         // guards what follows
   const ManagedSetting* _current = nullptr;  ///< whose getter is called
   std::vector<SettingState> _states;
 };
