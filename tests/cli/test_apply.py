@@ -14,8 +14,7 @@ from machine import ScratchMachine, program_and_arguments
 from terminal import Terminal, stop_without_terminals
 
 PATIENCE = 10  # seconds
-# As long as somebody has to wait for it.
-WORDS = ["apply", *["-settimezone", "Europe/Paris", "-settimezone", "Asia/Kolkata"] * 40]
+TO_AND_FRO = ["-settimezone", "Europe/Paris", "-settimezone", "Asia/Kolkata"]
 
 
 class Long(unittest.TestCase):
@@ -30,7 +29,7 @@ class Long(unittest.TestCase):
             time.sleep(0.001)
 
     def test_a_terminal_shows_what_takes_long_and_then_nothing_of_it(self):
-        terminal = Terminal(self.machine, WORDS)
+        terminal = Terminal(self.machine, ["apply", *TO_AND_FRO * 10])
         self.addCleanup(terminal.close)
         self.wait_until_begun()
         with open(self.machine.directory / "machine.lock") as lock:
@@ -39,7 +38,7 @@ class Long(unittest.TestCase):
         self.assertRegex(terminal.wait_for("Setting"), r"^\r *\rSetting$")
 
     def test_a_signal_ends_it_and_gives_the_authorization_up(self):
-        with self.machine.start(WORDS, stdout=subprocess.PIPE) as process:
+        with self.machine.start(["apply", *TO_AND_FRO * 40], stdout=subprocess.PIPE) as process:
             self.wait_until_begun()
             process.send_signal(signal.SIGTERM)
             self.assertEqual((process.wait(PATIENCE), process.stdout.read()), (1, b""))
