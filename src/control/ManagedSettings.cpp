@@ -51,6 +51,11 @@ std::span<const ManagedSetting> managedSettings() {
   return settings;
 }
 
+const ManagedSetting* managedNamed(std::string_view name) {
+  const auto* const found = std::ranges::find(settings, name, &ManagedSetting::name);
+  return found == std::end(settings) ? nullptr : found;
+}
+
 const ManagedSetting* settingMeantBy(std::string_view text) {
   constexpr auto prefix = std::string_view("-get").size();
   const auto meant = bare(text);

@@ -31,6 +31,9 @@ struct ManagedSetting {
 /// Every setting, in the order in which they are shown.
 std::span<const ManagedSetting> managedSettings();
 
+/// The one that effects and reports call so; null when there is none.
+const ManagedSetting* managedNamed(std::string_view name);
+
 /// The setting that a user means: by its name, or by what follows "get" in its word; without regard to case, spaces,
 /// hyphens and underscores. Null when there is none.
 const ManagedSetting* settingMeantBy(std::string_view text);

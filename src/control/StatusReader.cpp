@@ -36,10 +36,6 @@ std::string existing(const std::string& places) {
   return kept;
 }
 
-bool isManaged(const std::string& name) {
-  return std::ranges::find(managedSettings(), name, &ManagedSetting::name) != managedSettings().end();
-}
-
 }  // namespace
 
 std::vector<SettingState> StatusReader::read(const std::vector<const ManagedSetting*>& settings, Host& host,
@@ -78,7 +74,7 @@ SettingState& StatusReader::stateOf(const std::string& setting) {
 /// A getter looks at other settings too, which have their own.
 void StatusReader::observe(const SettingValue& value) {
   const std::scoped_lock lock(_mutex);
-  if (!_current || (value.setting != _current->name && isManaged(value.setting))) return;
+  if (!_current || (value.setting != _current->name && managedNamed(value.setting))) return;
   auto told = value;
   told.where = existing(value.where);
   stateOf(value.setting).value = std::move(told);
@@ -86,7 +82,7 @@ void StatusReader::observe(const SettingValue& value) {
 
 void StatusReader::record(const Effect& effect) {
   const std::scoped_lock lock(_mutex);
-  if (!_current || !effect.failure || (effect.setting != _current->name && isManaged(effect.setting))) return;
+  if (!_current || !effect.failure || (effect.setting != _current->name && managedNamed(effect.setting))) return;
   auto& failures = stateOf(effect.setting).failures;
   if (std::ranges::find(failures, *effect.failure) == failures.end()) failures.push_back(*effect.failure);
 }

@@ -31,8 +31,7 @@ bool areAllAsAsked(const Step& step, std::span<const SettingState> states) {
 
 /// What else a word of a setting changes is a part of that.
 bool isOf(const Effect& effect, const ManagedSetting& setting) {
-  return effect.setting == setting.name ||
-         std::ranges::find(managedSettings(), effect.setting, &ManagedSetting::name) == managedSettings().end();
+  return effect.setting == setting.name || !managedNamed(effect.setting);
 }
 
 /// The results with nothing but the effects of one setting.

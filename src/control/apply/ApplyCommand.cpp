@@ -2,8 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 
-#include "base/Process.h"
 #include "control/Commands.h"
+#include "control/Ending.h"
 #include "control/apply/Applier.h"
 #include "control/apply/ApplyText.h"
 #include "effects/SettingNames.h"
@@ -69,33 +69,18 @@ Status apply(std::span<const Step> steps, Applier& applier, const Invocation& in
 
 Status applySettings(const Invocation& invocation, const Tools& tools) {
   const auto steps = wantedSteps(invocation);
-  if (!steps) {
-    tools.complain(describe(steps.failure()));
-    return Status::misused;
-  }
+  if (!steps) return endBy(steps.failure(), Status::misused, tools);
   const EndingSignals signals;
   EffectSink effects;
   StatusReader reader;
   effects.addChannel(reader);
   RunLoop runLoop;
   const auto host = tools.openHost(effects, runLoop);
-  if (!host) {
-    tools.complain(describe(host.failure()));
-    return Status::incomplete;
-  }
+  if (!host) return endBy(host.failure(), Status::incomplete, tools);
   WordRunner runner(**host, effects, runLoop);
-  const auto waiter = SignalWaiter::start(
-      signals,
-      [&](const std::string& signal) {
-        runner.endedBySignal(signal);
-        if (tools.showProgress) tools.showProgress("");
-      },
-      [] { return static_cast<int>(Status::incomplete); });
-  if (!waiter) signals.unblock();
-  if (const auto started = runner.start(); !started) {
-    tools.complain(describe(started.failure()));
-    return Status::incomplete;
-  }
+  const auto waiter = endBySignal(
+      signals, [&](const std::string& signal) { runner.endedBySignal(signal); }, tools);
+  if (const auto started = runner.start(); !started) return endBy(started.failure(), Status::incomplete, tools);
   Applier applier(**host, runner, reader);
   return apply(*steps, applier, invocation, tools);
 }

@@ -22,11 +22,7 @@ void addApplied(TextTable& table, const AppliedSetting& applied) {
   table.addRow({escaped(applied.setting->name), shownAny(applied.before, applied.unit),
                 shownAny(applied.after, applied.unit), outcomeOf(applied)});
   for (const auto& note : applied.notes) table.addRemark(escaped(note));
-  if (applied.lasts || applied.verdict == Verdict::notSupported) return;
-  if (applied.undoneBy.empty())
-    table.addRemark("after a restart: " + shownAny(applied.stored, applied.unit));
-  else
-    table.addRemark("may be undone by " + escaped(applied.undoneBy));
+  if (!applied.lasts && applied.verdict != Verdict::notSupported) addWhatUndoes(table, applied);
 }
 
 std::string jsonOf(const AppliedSetting& applied) {
@@ -48,6 +44,13 @@ std::string jsonOf(const AppliedSetting& applied) {
 }
 
 }  // namespace
+
+void addWhatUndoes(TextTable& table, const AppliedSetting& applied) {
+  if (applied.undoneBy.empty())
+    table.addRemark("after a restart: " + shownAny(applied.stored, applied.unit));
+  else
+    table.addRemark("may be undone by " + escaped(applied.undoneBy));
+}
 
 std::string appliedTable(std::span<const AppliedSetting> settings) {
   TextTable table;

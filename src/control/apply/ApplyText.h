@@ -5,6 +5,7 @@
 #include <span>
 #include <string>
 
+#include "control/TextTable.h"
 #include "control/apply/Applier.h"
 
 namespace tavisk::control {
@@ -12,6 +13,9 @@ namespace tavisk::control {
 /// A table with a line of headings: what each setting was, what it is now, and what became of it. Harmless for a
 /// terminal.
 std::string appliedTable(std::span<const AppliedSetting> settings);
+
+/// What becomes of a setting that does not last, below its row.
+void addWhatUndoes(TextTable& table, const AppliedSetting& applied);
 
 /// One JSON object without a newline; see taviskctl(8). `isDone`: everything was done.
 std::string appliedJson(std::span<const AppliedSetting> settings, bool isDone);

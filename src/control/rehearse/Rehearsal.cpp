@@ -11,8 +11,8 @@ namespace tavisk::control {
 namespace {
 
 std::string unitOfSetting(const std::string& name) {
-  const auto setting = std::ranges::find(managedSettings(), name, &ManagedSetting::name);
-  if (setting == managedSettings().end()) return {};
+  const auto* setting = managedNamed(name);
+  if (!setting) return {};
   switch (setting->kind) {
     case ValueKind::moment:
       return "seconds since 1970";

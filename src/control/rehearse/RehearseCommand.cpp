@@ -4,8 +4,8 @@
 #include <optional>
 #include <utility>
 
-#include "base/Process.h"
 #include "control/Commands.h"
+#include "control/Ending.h"
 #include "control/apply/Applier.h"
 #include "control/apply/ApplyPlan.h"
 #include "control/rehearse/Rehearsal.h"
@@ -57,11 +57,6 @@ Status show(const Rehearsed& rehearsed, const Invocation& invocation, const Tool
   return isAllDone(rehearsed) ? Status::done : Status::incomplete;
 }
 
-Status complain(const Failure& failure, Status status, const Tools& tools) {
-  tools.complain(describe(failure));
-  return status;
-}
-
 /// What could not be read of the machine is told, and not rehearsed.
 class LookFailures final : public EffectChannel {
  public:
@@ -80,18 +75,12 @@ class LookFailures final : public EffectChannel {
 
 Status rehearseChanges(const Invocation& invocation, const Tools& tools) {
   const auto part = askedPart(invocation);
-  if (!part) return complain(part.failure(), Status::misused, tools);
+  if (!part) return endBy(part.failure(), Status::misused, tools);
   const EndingSignals signals;
   const auto folder = RehearsalFolder::make(keptFolder(invocation));
-  if (!folder) return complain(folder.failure(), Status::incomplete, tools);
-  const auto waiter = SignalWaiter::start(
-      signals,
-      [&](const std::string&) {
-        folder->removeTemporary();
-        if (tools.showProgress) tools.showProgress("");
-      },
-      [] { return static_cast<int>(Status::incomplete); });
-  if (!waiter) signals.unblock();
+  if (!folder) return endBy(folder.failure(), Status::incomplete, tools);
+  const auto waiter = endBySignal(
+      signals, [&](const std::string&) { folder->removeTemporary(); }, tools);
   EffectSink effects;
   LookFailures failures;
   StatusReader reader;
@@ -101,11 +90,11 @@ Status rehearseChanges(const Invocation& invocation, const Tools& tools) {
   const auto host = tools.openRehearsal(folder->path(), effects, runLoop);
   effects.removeChannel(failures);
   failures.tell(tools);
-  if (!host) return complain(host.failure(), Status::incomplete, tools);
+  if (!host) return endBy(host.failure(), Status::incomplete, tools);
   effects.addChannel(reader);
   effects.addChannel(notes);
   WordRunner runner(**host, effects, runLoop);
-  if (const auto started = runner.start(); !started) return complain(started.failure(), Status::incomplete, tools);
+  if (const auto started = runner.start(); !started) return endBy(started.failure(), Status::incomplete, tools);
   return show(rehearsedOn(**host, *part, runner, reader, notes), invocation, tools);
 }
 

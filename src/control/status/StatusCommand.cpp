@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "control/Commands.h"
+#include "control/Ending.h"
 #include "control/ManagedSettings.h"
 #include "control/StatusReader.h"
 #include "control/status/StatusText.h"
@@ -38,19 +39,13 @@ bool isWholly(const SettingState& state) {
 
 Status showStatus(const Invocation& invocation, const Tools& tools) {
   const auto settings = chosenSettings(invocation.operands, invocation.has("--all"));
-  if (!settings) {
-    tools.complain(describe(settings.failure()));
-    return Status::misused;
-  }
+  if (!settings) return endBy(settings.failure(), Status::misused, tools);
   EffectSink effects;
   StatusReader reader;
   effects.addChannel(reader);
   RunLoop runLoop;
   const auto host = tools.openHost(effects, runLoop);
-  if (!host) {
-    tools.complain(describe(host.failure()));
-    return Status::incomplete;
-  }
+  if (!host) return endBy(host.failure(), Status::incomplete, tools);
   const auto states = reader.read(*settings, **host, runLoop);
   tools.output.print("%s",
                      invocation.has("--json") ? (statusJson(states) + '\n').c_str() : statusTable(states).c_str());

@@ -4,8 +4,8 @@
 #include <ctime>
 #include <utility>
 
-#include "base/Process.h"
 #include "control/Commands.h"
+#include "control/Ending.h"
 #include "control/apply/Applier.h"
 #include "control/undo/SinceTime.h"
 #include "control/undo/UndoPlan.h"
@@ -54,10 +54,8 @@ class Undoing final {
     const auto steps = stepsFor(wantedOf(results));
     if (steps.empty()) return {};
     WordRunner runner(_host, _effects, _runLoop);
-    const auto waiter = SignalWaiter::start(
-        _signals, [&](const std::string& signal) { end(runner, signal); },
-        [] { return static_cast<int>(Status::incomplete); });
-    if (!waiter) _signals.unblock();
+    const auto waiter = endBySignal(
+        _signals, [&](const std::string& signal) { runner.endedBySignal(signal); }, _tools);
     if (auto started = runner.start(); !started) return started;
     Applier applier(_host, runner, _reader);
     for (const auto& step : steps) take(results, step, applier);
@@ -70,11 +68,6 @@ class Undoing final {
     const ProgressLine progress(_tools.showProgress, std::string(name) + " ...");
     const auto result = std::ranges::find(results, name, [](const auto& of) { return of.planned.setting; });
     result->outcome = applier.apply(step).front();
-  }
-
-  void end(WordRunner& runner, const std::string& signal) {
-    runner.endedBySignal(signal);
-    if (_tools.showProgress) _tools.showProgress("");
   }
 
   const Tools& _tools;
@@ -90,11 +83,6 @@ bool isWhole(const UndoResult& result) {
   return result.planned.step == UndoStep::set || result.planned.step == UndoStep::there;
 }
 
-Status complainOf(const Failure& failure, const Tools& tools, Status status) {
-  tools.complain(describe(failure));
-  return status;
-}
-
 Status undo(const RecordedChanges& recorded, Since since, Undoing& undoing, const Invocation& invocation,
             const Tools& tools) {
   const bool isRun = invocation.has("--run");
@@ -102,8 +90,7 @@ Status undo(const RecordedChanges& recorded, Since since, Undoing& undoing, cons
                               {invocation.has("--force"), invocation.has("--allow-lockout")});
   for (const auto& remark : recorded.remarks) tools.complain(remark);
   if (isRun)
-    if (const auto done = undoing.carryOut(results); !done)
-      return complainOf(done.failure(), tools, Status::incomplete);
+    if (const auto done = undoing.carryOut(results); !done) return endBy(done.failure(), Status::incomplete, tools);
   const auto text = invocation.has("--json") ? undoJson(results, recorded.remarks) + '\n' : undoTable(results, isRun);
   tools.output.print("%s", text.c_str());
   return std::ranges::all_of(results, isWhole) ? Status::done : Status::incomplete;
@@ -113,15 +100,15 @@ Status undo(const RecordedChanges& recorded, Since since, Undoing& undoing, cons
 
 Status undoChanges(const Invocation& invocation, const Tools& tools) {
   const auto since = sinceOf(invocation);
-  if (!since) return complainOf(since.failure(), tools, Status::misused);
+  if (!since) return endBy(since.failure(), Status::misused, tools);
   const EndingSignals signals;
   if (!invocation.has("--run")) signals.unblock();
   EffectSink effects;
   RunLoop runLoop;
   const auto host = tools.openHost(effects, runLoop);
-  if (!host) return complainOf(host.failure(), tools, Status::incomplete);
+  if (!host) return endBy(host.failure(), Status::incomplete, tools);
   const auto recorded = (*host)->history().changes();
-  if (!recorded) return complainOf(recorded.failure(), tools, Status::incomplete);
+  if (!recorded) return endBy(recorded.failure(), Status::incomplete, tools);
   Undoing undoing(tools, signals, **host, effects, runLoop);
   return undo(*recorded, *since, undoing, invocation, tools);
 }

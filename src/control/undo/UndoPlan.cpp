@@ -36,12 +36,6 @@ const Companion* companionNamed(std::string_view name) {
   return found == std::end(companions) ? nullptr : &*found;
 }
 
-const ManagedSetting* managedNamed(std::string_view name) {
-  const auto settings = managedSettings();
-  const auto found = std::ranges::find(settings, name, &ManagedSetting::name);
-  return found == settings.end() ? nullptr : &*found;
-}
-
 const SettingState* stateOf(std::span<const SettingState> states, std::string_view setting) {
   const auto found = std::ranges::find(states, setting, [](const auto& state) { return state.value.setting; });
   return found == states.end() ? nullptr : &*found;

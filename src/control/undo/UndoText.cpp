@@ -10,6 +10,7 @@
 #include "base/Json.h"
 #include "base/Text.h"
 #include "control/TextTable.h"
+#include "control/apply/ApplyText.h"
 #include "control/status/StatusText.h"
 
 namespace tavisk::control {
@@ -24,11 +25,7 @@ std::string remarkOn(const PlannedUndo& planned, bool isRun) {
 /// What has come to nothing is as it was.
 void addRemarks(TextTable& table, const AppliedSetting& applied) {
   if (!applied.reason.empty()) table.addRemark(applied.reason);
-  if (applied.verdict > Verdict::applied || applied.lasts) return;
-  if (applied.undoneBy.empty())
-    table.addRemark("after a restart: " + shownAny(applied.stored, applied.unit));
-  else
-    table.addRemark("may be undone by " + escaped(applied.undoneBy));
+  if (applied.verdict <= Verdict::applied && !applied.lasts) addWhatUndoes(table, applied);
 }
 
 void addRow(TextTable& table, const UndoResult& result, bool isRun) {

@@ -21,8 +21,7 @@ struct ForetellingMachine {
 };
 
 /// A machine and its copy in files, on which is done what the machine would do: what is changed is changed there alone.
-/// The
-/// copy has no startup disks: those are the machine's, of which one is chosen without writing it down.
+/// The copy has no startup disks: those are the machine's, of which one is chosen without writing it down.
 class RehearsalHost final : public Host {
  public:
   /// Copies the machine into the folder, which is there and empty. Effects are told as the machine would tell them.
