@@ -16,7 +16,7 @@ endif()
 if(CMAKE_UNITY_BUILD)
   # Every source is an included file then: names of others are hidden in it, and its classes have members whose types are
   # from an unnamed namespace.
-  add_compile_options(-Wno-shadow -Wno-subobject-linkage)
+  add_compile_options(-Wno-shadow $<$<CXX_COMPILER_ID:GNU>:-Wno-subobject-linkage>)
 endif()
 
 # The same sources give the same bytes, whichever folder they are built in.

@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <sys/mman.h>
+
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
@@ -21,9 +23,13 @@ struct CloseStream {
 };
 using Stream = std::unique_ptr<std::FILE, CloseStream>;
 
+inline Stream streamInMemory() {
+  return Stream(::fdopen(::memfd_create("stream", MFD_CLOEXEC), "w+"));
+}
+
 /// A stream to read the text from.
 inline Stream streamOf(std::string_view text) {
-  Stream stream(std::tmpfile());
+  Stream stream = streamInMemory();
   if (!text.empty()) std::fwrite(text.data(), 1, text.size(), stream.get());
   std::rewind(stream.get());
   return stream;
@@ -53,7 +59,7 @@ struct ToolResult {
 /// One run of the tool on the machine, in this process: all that the program does but for hosts and signals.
 template <typename Machine>
 ToolResult runTool(Machine& machine, std::vector<std::string> words, const RunOptions& options = {}) {
-  const Stream printed(std::tmpfile());
+  const Stream printed = streamInMemory();
   const Stream typed = streamOf(options.typed);
   Output output(options.output ? options.output : printed.get());
   StreamLineSource stream(typed.get(), output);

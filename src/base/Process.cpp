@@ -13,6 +13,7 @@
 #include <new>
 #include <string_view>
 #include <system_error>
+#include <thread>
 #include <utility>
 
 namespace tavisk {
@@ -39,6 +40,10 @@ void keepKnownVariables() {
     if (isKept(*variable)) *end++ = *variable;
   }
   *end = nullptr;
+}
+
+[[noreturn]] void sleepForGood() {
+  while (true) pause();
 }
 
 }  // namespace
@@ -79,36 +84,34 @@ void EndingSignals::unblock() const {
 }
 
 std::unique_ptr<SignalWaiter> SignalWaiter::start(const EndingSignals& signals, End end, Status status) {
+  const auto run = std::make_shared<Run>();
+  run->end = std::move(end);
+  run->status = std::move(status);
   try {
-    return std::unique_ptr<SignalWaiter>(new SignalWaiter(signals, std::move(end), std::move(status)));
+    std::thread([run, set = signals.set()] { wait(set, *run); }).detach();
   } catch (const std::system_error&) {
     return nullptr;
   }
+  return std::unique_ptr<SignalWaiter>(new SignalWaiter(run));
 }
-
-SignalWaiter::SignalWaiter(const EndingSignals& signals, End end, Status status)
-    : _signals(signals.set()), _end(std::move(end)), _status(std::move(status)), _thread([this] { wait(); }) {}
 
 SignalWaiter::~SignalWaiter() {
-  auto expected = State::waiting;
-  if (_state.compare_exchange_strong(expected, State::stopped)) pthread_kill(_thread.native_handle(), SIGINT);
-  _thread.join();
+  if (_run->isOver.exchange(true)) sleepForGood();
 }
 
-void SignalWaiter::wait() {
+void SignalWaiter::wait(const sigset_t& signals, Run& run) {
   sigset_t all;
   sigfillset(&all);
   pthread_sigmask(SIG_BLOCK, &all, nullptr);
   int signal = 0;
-  sigwait(&_signals, &signal);
-  auto expected = State::waiting;
-  if (_state.compare_exchange_strong(expected, State::ending)) endProcess(std::string("SIG") + sigabbrev_np(signal));
+  sigwait(&signals, &signal);
+  if (!run.isOver.exchange(true)) endProcess(std::string("SIG") + sigabbrev_np(signal), run);
 }
 
-void SignalWaiter::endProcess(const std::string& signal) {
-  const auto end = [this, signal] {
-    doStep([&] { _end(signal); });
-    _exit(_status());
+void SignalWaiter::endProcess(const std::string& signal, const Run& run) {
+  const auto end = [&run, signal] {
+    doStep([&] { run.end(signal); });
+    _exit(run.status());
   };
   try {
     std::thread(end).detach();
@@ -117,7 +120,7 @@ void SignalWaiter::endProcess(const std::string& signal) {
   }
   // Every signal is blocked in this thread: it sleeps for all of the time.
   nanosleep(&endTakesAtMost, nullptr);
-  _exit(_status());
+  _exit(run.status());
 }
 
 }  // namespace tavisk

@@ -9,7 +9,7 @@
 #include <memory>
 #include <string>
 #include <string_view>
-#include <thread>
+#include <utility>
 
 namespace tavisk {
 
@@ -54,7 +54,8 @@ class EndingSignals {
 };
 
 /// A thread that waits for the ending signals and then ends the process within 100 ms, wherever the other threads are:
-/// what takes longer is left undone. Further signals change nothing.
+/// what takes longer is left undone. Further signals change nothing. One a process: when it is not needed any more, its
+/// thread is left alone, which costs less than to wait for it, and still takes signals away from others.
 class SignalWaiter {
  public:
   /// What is done before the end, given the name of the signal ("SIGTERM"). Called in a thread of its own.
@@ -64,23 +65,24 @@ class SignalWaiter {
 
   /// Null when the system gives no thread.
   static std::unique_ptr<SignalWaiter> start(const EndingSignals& signals, End end, Status status);
-  /// Ends the thread. Does not return when a signal is ending the process already.
+  /// From here on signals do nothing. Does not return when one is ending the process already.
   ~SignalWaiter();
   SignalWaiter(const SignalWaiter&) = delete;
   SignalWaiter& operator=(const SignalWaiter&) = delete;
 
  private:
-  enum class State { waiting, stopped, ending };
+  /// What the thread knows, which may outlive the waiter.
+  struct Run {
+    End end;
+    Status status;
+    std::atomic<bool> isOver = false;  ///< or is being ended
+  };
 
-  SignalWaiter(const EndingSignals& signals, End end, Status status);
-  void wait();
-  [[noreturn]] void endProcess(const std::string& signal);
+  explicit SignalWaiter(std::shared_ptr<Run> run) : _run(std::move(run)) {}
+  static void wait(const sigset_t& signals, Run& run);
+  [[noreturn]] static void endProcess(const std::string& signal, const Run& run);
 
-  const sigset_t _signals;
-  const End _end;
-  const Status _status;
-  std::atomic<State> _state = State::waiting;
-  std::thread _thread;
+  const std::shared_ptr<Run> _run;
 };
 
 }  // namespace tavisk

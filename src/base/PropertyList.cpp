@@ -17,7 +17,7 @@ const PropertyList* PropertyList::Dictionary::find(std::string_view key) const {
     const auto entry = std::ranges::find(_entries, key, &Entry::first);
     return entry == _entries.end() ? nullptr : &entry->second;
   }
-  const auto place = _places.find(std::string(key));
+  const auto place = _places.find(key);
   return place == _places.end() ? nullptr : &_entries[place->second].second;
 }
 
@@ -27,7 +27,11 @@ PropertyList* PropertyList::Dictionary::find(std::string_view key) {
 
 PropertyList& PropertyList::Dictionary::set(std::string_view key, PropertyList value) {
   if (auto* present = find(key)) return *present = std::move(value);
-  _entries.emplace_back(key, std::move(value));
+  return append(std::string(key), std::move(value));
+}
+
+PropertyList& PropertyList::Dictionary::append(std::string key, PropertyList value) {
+  _entries.emplace_back(std::move(key), std::move(value));
   if (_entries.size() > fewEntries || !_places.empty())
     for (auto place = _places.size(); place < _entries.size(); ++place) _places.emplace(_entries[place].first, place);
   return _entries.back().second;

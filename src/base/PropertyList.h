@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <memory>
 #include <string>
 #include <string_view>
@@ -36,14 +37,21 @@ class PropertyList {
     PropertyList* find(std::string_view key);
     /// Replaces the value in its place, or appends the key.
     PropertyList& set(std::string_view key, PropertyList value);
+    /// Appends a key that is not there yet.
+    PropertyList& append(std::string key, PropertyList value);
+    void reserve(std::size_t size) { _entries.reserve(size); }
     void remove(std::string_view key);
     /// The dictionary under the key; one is put there when the key is absent or holds another type.
     Dictionary& dictionary(std::string_view key);
     bool operator==(const Dictionary& other) const { return _entries == other._entries; }
 
    private:
+    struct Hash : std::hash<std::string_view> {
+      using is_transparent = void;  // NOLINT(readability-identifier-naming): the library's word
+    };
+
     std::vector<Entry> _entries;
-    std::unordered_map<std::string, std::size_t> _places;
+    std::unordered_map<std::string, std::size_t, Hash, std::equal_to<>> _places;
   };
   using Array = std::vector<PropertyList>;
   using Data = std::vector<std::uint8_t>;

@@ -2,7 +2,6 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <chrono>
 #include <pugixml.hpp>
 #include <stdexcept>
@@ -42,6 +41,12 @@ pugi::xml_node elementFrom(pugi::xml_node node) {
     }
   }
   return node;
+}
+
+std::size_t childrenOf(pugi::xml_node element) {
+  std::size_t count = 0;
+  for (auto child = element.first_child(); child; child = child.next_sibling()) ++count;
+  return count;
 }
 
 char32_t numericReference(std::string_view digits) {
@@ -113,11 +118,9 @@ double realOf(pugi::xml_node element) {
   const auto text = textOf(element);
   auto digits = trimmed(text);
   if (digits.starts_with('+') && !digits.starts_with("+-")) digits.remove_prefix(1);
-  double value = 0;
-  const auto* last = digits.data() + digits.size();
-  const auto [end, error] = std::from_chars(digits.data(), last, value);
-  if (error != std::errc() || end != last) throw malformed(element, "a real number");
-  return value;
+  const auto value = parseReal(digits);
+  if (!value) throw malformed(element, "a real number");
+  return *value;
 }
 
 PropertyList::Date dateIn(pugi::xml_node element) {
@@ -211,16 +214,17 @@ class Reader {
 
   PropertyList dictionary(pugi::xml_node element, std::size_t depth) {
     PropertyList::Dictionary dictionary;
+    dictionary.reserve(childrenOf(element) / 2);
     for (auto key = elementFrom(element.first_child()); key;) {
       if (key.name() != std::string_view("key")) throw malformed(key, "a key");
       count(key);
-      const auto name = textOf(key);
+      auto name = textOf(key);
       const bool isRepeated = dictionary.find(name) != nullptr;
       if (isRepeated && !_limits.takesFirstKey) throw malformed(key, "a key that has not occurred yet");
       const auto content = elementFrom(key.next_sibling());
       if (!content) throw malformed(key, "a value after the key");
       auto read = value(content, depth + 1);
-      if (!isRepeated) dictionary.set(name, std::move(read));
+      if (!isRepeated) dictionary.append(std::move(name), std::move(read));
       key = elementFrom(content.next_sibling());
     }
     return dictionary;

@@ -1,11 +1,10 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include <array>
-#include <charconv>
 #include <chrono>
 #include <stdexcept>
 
 #include "base/PropertyList.h"
+#include "base/Text.h"
 #include "base/XmlText.h"
 
 namespace tavisk {
@@ -39,12 +38,6 @@ std::string xmlText(const std::string& text) {
     }
   }
   return result;
-}
-
-std::string realText(double value) {
-  std::array<char, 32> text{};
-  const auto [end, error] = std::to_chars(text.data(), text.data() + text.size(), value);
-  return {text.data(), end};
 }
 
 std::string padded(std::int64_t value, std::size_t width) {

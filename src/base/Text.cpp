@@ -4,7 +4,11 @@
 
 #include <algorithm>
 #include <array>
+#include <cerrno>
 #include <charconv>
+#include <cmath>
+#include <cstdio>
+#include <cstdlib>
 #include <limits>
 
 namespace tavisk {
@@ -112,6 +116,26 @@ std::optional<std::string> takeEscaped(std::string_view& text) {
   const auto end = text.find('}');
   if (kind != "\\u" || !text.starts_with('{') || end == std::string_view::npos) return std::nullopt;
   return controlWith(take(end + 1).substr(1, end - 1));
+}
+
+/// Of numbers whose power of ten is at most some 40.
+using Digits = std::array<char, 64>;
+
+std::string inScientificNotation(double number, int decimals) {
+  Digits digits{};
+  static_cast<void>(std::snprintf(digits.data(), digits.size(), "%.*e", decimals, number));
+  return digits.data();
+}
+
+std::string withoutExponent(double number, int decimals) {
+  Digits digits{};
+  static_cast<void>(std::snprintf(digits.data(), digits.size(), "%.*f", decimals, number));
+  return digits.data();
+}
+
+bool isInDecimalDigits(std::string_view text) {
+  return !text.empty() && text.find_first_of("+-") != 0 &&
+         text.find_first_not_of("0123456789.eE+-") == std::string_view::npos;
 }
 
 }  // namespace
@@ -243,7 +267,10 @@ std::string lowerCased(std::string_view text) {
 }
 
 int compareIgnoringCase(std::string_view left, std::string_view right) {
-  return lowerCased(left).compare(lowerCased(right));
+  const auto small = [](char letter) { return static_cast<unsigned char>(smallLetter(letter)); };
+  const auto [here, there] = std::ranges::mismatch(left, right, {}, small, small);
+  if (here == left.end() || there == right.end()) return (here != left.end() ? 1 : 0) - (there != right.end() ? 1 : 0);
+  return small(*here) - small(*there);
 }
 
 bool beginsIgnoringCase(std::string_view text, std::string_view beginning) {
@@ -266,6 +293,32 @@ std::int64_t leadingInteger(std::string_view text) {
   const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), value);
   if (error != std::errc::result_out_of_range) return value;
   return isNegative ? std::numeric_limits<std::int64_t>::min() : std::numeric_limits<std::int64_t>::max();
+}
+
+std::optional<double> parseReal(std::string_view text) {
+  const auto magnitude = text.substr(text.starts_with('-') ? 1 : 0);
+  const auto word = lowerCased(magnitude);
+  if (!isInDecimalDigits(magnitude) && word != "inf" && word != "infinity" && word != "nan") return std::nullopt;
+  const std::string ended(text);
+  char* end = nullptr;
+  errno = 0;
+  const double number = std::strtod(ended.c_str(), &end);
+  const bool isOutOfRange = errno == ERANGE && (number == 0 || std::isinf(number));
+  return *end == '\0' && !isOutOfRange ? std::optional(number) : std::nullopt;
+}
+
+std::string realText(double number) {
+  constexpr int mostDecimals = std::numeric_limits<double>::max_digits10 - 1;
+  int decimals = 0;
+  while (decimals < mostDecimals && parseReal(inScientificNotation(number, decimals)) != number) ++decimals;
+  auto text = inScientificNotation(number, decimals);
+  const auto exponent = text.find('e');
+  if (exponent == std::string::npos) return text;
+  const auto power = static_cast<int>(leadingInteger(std::string_view(text).substr(exponent + 1)));
+  // Beyond these, the text with an exponent is the shorter one.
+  if (std::abs(power) > 2 * mostDecimals) return text;
+  auto plain = withoutExponent(number, std::max(decimals - power, 0));
+  return plain.size() <= text.size() ? plain : text;
 }
 
 std::string_view trimmed(std::string_view text) {

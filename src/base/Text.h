@@ -88,6 +88,13 @@ std::optional<Number> parseNumber(std::string_view text, int base = 10) {
   return error == std::errc() && end == last ? std::optional(number) : std::nullopt;
 }
 
+/// The whole text as a real number: decimal digits, point and exponent, or "inf", "infinity", "nan", with "-" before
+/// them; absent when it is anything else or too large or too small for one.
+std::optional<double> parseReal(std::string_view text);
+
+/// The shortest text that parseReal() reads as the same number, with an exponent only where that makes it shorter.
+std::string realText(double number);
+
 /// In hexadecimal digits, small letters, at least so many of them.
 std::string hexDigits(std::uint64_t number, std::size_t leastDigits = 1);
 

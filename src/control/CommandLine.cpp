@@ -42,6 +42,10 @@ constexpr OptionRow undoOptions[] = {
     {"--json", "Print one JSON object instead of a table."},
 };
 
+constexpr OptionRow resetOptions[] = {
+    {"--json", "Print one JSON object instead of a table."},
+};
+
 constexpr CommandRow commands[] = {
     {"status", "[SETTING...]", OperandKind::settings,
      "Show settings: what is in force, what will be after a restart, where it is kept and what may undo it.",
@@ -53,6 +57,8 @@ constexpr CommandRow commands[] = {
      "Give settings the values asked for, where they differ, and tell what became of each.", applyOptions},
     {"undo", "", OperandKind::none, "Show what tavisk has changed and what each setting goes back to, or do it.",
      undoOptions},
+    {"reset", "SETTING...", OperandKind::settings,
+     "Take away what tavisk itself stores of settings, back to what the packages give.", resetOptions},
 };
 
 const OptionRow* findOption(std::span<const OptionRow> options, std::string_view name) {

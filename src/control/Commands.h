@@ -12,5 +12,6 @@ Status showStatus(const Invocation& invocation, const Tools& tools);
 Status rehearseChanges(const Invocation& invocation, const Tools& tools);
 Status applySettings(const Invocation& invocation, const Tools& tools);
 Status undoChanges(const Invocation& invocation, const Tools& tools);
+Status resetSettings(const Invocation& invocation, const Tools& tools);
 
 }  // namespace tavisk::control

@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <array>
-#include <string>
 
 #include "base/Text.h"
 #include "effects/SettingNames.h"
@@ -62,6 +61,16 @@ const ManagedSetting* settingMeantBy(std::string_view text) {
   const auto* const found = std::ranges::find_if(
       settings, [&](const auto& row) { return bare(row.name) == meant || row.getter.substr(prefix) == meant; });
   return found == std::end(settings) ? nullptr : found;
+}
+
+Result<std::vector<const ManagedSetting*>> settingsMeantBy(std::span<const std::string> texts) {
+  std::vector<const ManagedSetting*> meant;
+  for (const auto& text : texts) {
+    const auto* setting = settingMeantBy(text);
+    if (!setting) return Failure{"there is no setting " + text, "", "'taviskctl status --all' shows the names"};
+    if (std::ranges::find(meant, setting) == meant.end()) meant.push_back(setting);
+  }
+  return meant;
 }
 
 }  // namespace tavisk::control

@@ -3,7 +3,11 @@
 #pragma once
 
 #include <span>
+#include <string>
 #include <string_view>
+#include <vector>
+
+#include "base/Result.h"
 
 namespace tavisk::control {
 
@@ -37,5 +41,8 @@ const ManagedSetting* managedNamed(std::string_view name);
 /// The setting that a user means: by its name, or by what follows "get" in its word; without regard to case, spaces,
 /// hyphens and underscores. Null when there is none.
 const ManagedSetting* settingMeantBy(std::string_view text);
+
+/// Those that a user means, once each. The failure says which text means none.
+Result<std::vector<const ManagedSetting*>> settingsMeantBy(std::span<const std::string> texts);
 
 }  // namespace tavisk::control

@@ -16,10 +16,8 @@ namespace {
 using Command = Status (*)(const Invocation&, const Tools&);
 
 constexpr std::pair<std::string_view, Command> functions[] = {
-    {"status", showStatus},
-    {"rehearse", rehearseChanges},
-    {"apply", applySettings},
-    {"undo", undoChanges},
+    {"status", showStatus}, {"rehearse", rehearseChanges}, {"apply", applySettings},
+    {"undo", undoChanges},  {"reset", resetSettings},
 };
 
 Command commandNamed(std::string_view name) {

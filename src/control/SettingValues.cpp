@@ -26,8 +26,8 @@ bool isOneOf(std::string_view text, std::initializer_list<std::string_view> word
 Value switchMeantBy(const WrittenValue& written) {
   if (const auto* isOn = std::get_if<bool>(&written)) return *isOn ? "on" : "off";
   const auto* word = std::get_if<std::string>(&written);
-  if (word && isOneOf(*word, {"on", "yes"})) return "on";
-  if (word && isOneOf(*word, {"off", "no"})) return "off";
+  if (word && isOneOf(*word, {"on", "yes", "true"})) return "on";
+  if (word && isOneOf(*word, {"off", "no", "false"})) return "off";
   return std::nullopt;
 }
 
@@ -41,9 +41,15 @@ std::optional<std::int64_t> countMeantBy(const WrittenValue& written,
   return isCount ? parseNumber<std::int64_t>(parts.front()) : std::nullopt;
 }
 
-Value minutesMeantBy(const WrittenValue& written) {
+/// YAML makes a boolean of an off without quotes.
+bool isNever(const WrittenValue& written) {
+  const auto* isOn = std::get_if<bool>(&written);
   const auto* word = std::get_if<std::string>(&written);
-  if (word && isOneOf(*word, {"never", "off"})) return "0";
+  return (isOn && !*isOn) || (word && isOneOf(*word, {"never", "off"}));
+}
+
+Value minutesMeantBy(const WrittenValue& written) {
+  if (isNever(written)) return "0";
   const auto minutes = countMeantBy(written, {"minute", "minutes"});
   return minutes && *minutes >= 0 ? Value(std::to_string(*minutes)) : std::nullopt;
 }

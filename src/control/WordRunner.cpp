@@ -3,6 +3,7 @@
 #include "control/WordRunner.h"
 
 #include <algorithm>
+#include <exception>
 #include <utility>
 
 #include "base/Process.h"
@@ -80,6 +81,23 @@ WordResult WordRunner::run(std::span<const std::string> words) {
   const auto own = words.first(std::min(taken.value_or(1), words.size()));
   result.words.assign(own.begin(), own.end());
   result.isLast = !taken;
+  return result;
+}
+
+WordResult WordRunner::run(const std::function<void(Host& host)>& act) {
+  static_cast<void>(_gatherer.take());
+  const auto& context = _frame.context();
+  const auto limit = context.runLoop.limitWaits(context.longestCommand);
+  std::optional<std::string> brokenOffBy;
+  try {
+    act(context.host);
+  } catch (const std::exception& error) {
+    brokenOffBy.emplace(tavisk::reasonOf(error));
+    _effects.interrupt(*brokenOffBy);
+  }
+  _effects.commandEnds();
+  auto result = _gatherer.take();
+  result.brokenOffBy = std::move(brokenOffBy);
   return result;
 }
 

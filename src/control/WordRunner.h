@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <mutex>
 #include <optional>
 #include <span>
@@ -60,6 +61,9 @@ class WordRunner final {
   Result<void> start();
   /// Runs the first of the words, of which there is one at least, with its arguments.
   WordResult run(std::span<const std::string> words);
+
+  /// Does something else than a word, with what it changes told as by one, also when it throws.
+  WordResult run(const std::function<void(Host& host)>& act);
 
   /// What is to be done before a signal ends the process; see RemoteServerSettings.
   void endedBySignal(const std::string& signal) { _settings.endedBySignal(signal); }

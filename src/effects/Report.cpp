@@ -61,6 +61,7 @@ void Report::commandBegins(const std::string& command, std::span<const std::stri
   const std::scoped_lock lock(_mutex);
   _entry.command = command;
   _entry.handler = handler;
+  _entry.signal.reset();
   if (!arguments.empty()) _entry.argument = arguments.front();
 }
 
@@ -71,7 +72,7 @@ void Report::argumentRefused(const std::string& expected) {
 
 void Report::commandEnds(bool failed, const std::string& output) {
   auto entry = takeEntry();
-  if (entry.command) append(std::move(entry), failed, output);
+  if (entry.command && (!entry.signal || !entry.effects.empty())) append(std::move(entry), failed, output);
 }
 
 void Report::wordRefused(const std::string& word, bool failed, const std::string& output) {
@@ -89,9 +90,7 @@ void Report::runRefused(const std::string& error, const std::string& output) {
 }
 
 void Report::runEndedBySignal(const std::string& signal, bool failed, const std::string& output) {
-  auto entry = takeEntry();
-  entry.signal = signal;
-  append(std::move(entry), failed, output);
+  append(takeInterruptedEntry(signal), failed, output);
 }
 
 void Report::changeBegins(const std::string& setting, const std::string& asked) {
@@ -127,6 +126,20 @@ void Report::observe(const SettingValue& value) {
 Report::Entry Report::takeEntry() {
   const std::scoped_lock lock(_mutex);
   return std::exchange(_entry, {});
+}
+
+/// What the command does until the process has ended has a line of its own.
+Report::Entry Report::takeInterruptedEntry(const std::string& signal) {
+  const std::scoped_lock lock(_mutex);
+  auto entry = std::exchange(_entry, {});
+  entry.signal = signal;
+  if (!entry.command) return entry;
+  try {
+    _entry = {.command = entry.command, .argument = entry.argument, .handler = entry.handler, .signal = signal};
+  } catch (const std::bad_alloc&) {
+    // Without memory nothing more is told of the command.
+  }
+  return entry;
 }
 
 std::string Report::toJson(std::string room, const Entry& entry, bool failed, const std::string& output) {

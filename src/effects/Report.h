@@ -65,17 +65,18 @@ class Report final : public EffectChannel, public RunRecord {
  private:
   /// What is gathered for the next object. A text that is absent is left out.
   struct Entry {
-    std::optional<std::string> command, argument, handler, refused, error, signal;
+    std::optional<std::string> command = {}, argument = {}, handler = {}, refused = {}, error = {}, signal = {};
     bool changed = false;
-    std::vector<std::string> values;      ///< JSON
-    std::vector<std::string> effects;     ///< JSON
-    std::vector<std::string> open;        ///< settings whose change has begun
-    std::vector<std::string> unfinished;  ///< JSON: what becomes of those if nothing more is heard of them
+    std::vector<std::string> values = {};      ///< JSON
+    std::vector<std::string> effects = {};     ///< JSON
+    std::vector<std::string> open = {};        ///< settings whose change has begun
+    std::vector<std::string> unfinished = {};  ///< JSON: what becomes of those if nothing more is heard of them
   };
 
   explicit Report(FileDescriptor file);
   static std::string toJson(std::string room, const Entry& entry, bool failed, const std::string& output);
   Entry takeEntry();
+  Entry takeInterruptedEntry(const std::string& signal);
   std::string shortened(Entry entry, bool failed);
   void append(Entry entry, bool failed, const std::string& output);
   void lose(std::string_view why);

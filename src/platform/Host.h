@@ -18,6 +18,7 @@
 #include "platform/Preferences.h"
 #include "platform/Processes.h"
 #include "platform/RemoteAccess.h"
+#include "platform/ResetService.h"
 #include "platform/SystemLog.h"
 
 namespace tavisk {
@@ -43,6 +44,7 @@ class Host {
   virtual BootLoaderFile& bootLoaderFile() = 0;
   virtual PreferencesStore& preferences() = 0;
   virtual ProcessUtilities& processes() = 0;
+  virtual ResetService& resets() = 0;
 
   virtual DiskEventSession& diskEvents() = 0;
   virtual DiskManagementService& diskManagement() = 0;

@@ -2,17 +2,9 @@
 // SPDX-License-Identifier: MIT
 #include "platform/PowerSettingsService.h"
 
-#include <algorithm>
-#include <cstdint>
-
 #include "effects/SettingNames.h"
 
 namespace tavisk {
-
-Minutes Minutes::covering(std::chrono::microseconds time) {
-  const auto minutes = std::chrono::ceil<std::chrono::minutes>(time).count();
-  return {static_cast<unsigned long>(std::max<std::int64_t>(minutes, 0))};
-}
 
 std::string textOf(Minutes minutes) {
   return std::to_string(minutes.count);

@@ -2,8 +2,10 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <algorithm>
 #include <chrono>
 #include <compare>
+#include <cstdint>
 #include <string>
 
 namespace tavisk {
@@ -17,7 +19,11 @@ struct Minutes {
   unsigned long count = 0;  ///< 0 is never
 
   /// What is begun counts as a whole one, so that only no time at all is never; so is one below 0.
-  static Minutes covering(std::chrono::microseconds time);
+  template <typename Period>
+  static Minutes covering(std::chrono::duration<std::int64_t, Period> time) {
+    const auto minutes = std::chrono::ceil<std::chrono::minutes>(time).count();
+    return {static_cast<unsigned long>(std::max<std::int64_t>(minutes, 0))};
+  }
 
   bool isNever() const { return count == 0; }
   std::chrono::minutes duration() const { return std::chrono::minutes(count); }

@@ -4,6 +4,7 @@
 
 #include <array>
 #include <charconv>
+#include <cstdio>
 #include <limits>
 
 namespace tavisk {
@@ -13,8 +14,8 @@ constexpr std::string_view conversions = "@sdxf";
 
 std::string wholeNumber(double number) {
   std::array<char, std::numeric_limits<double>::max_exponent10 + 8> digits{};
-  const auto end = std::to_chars(digits.data(), digits.data() + digits.size(), number, std::chars_format::fixed, 0);
-  return {digits.data(), end.ptr};
+  static_cast<void>(std::snprintf(digits.data(), digits.size(), "%.0f", number));
+  return digits.data();
 }
 
 struct TextOf {

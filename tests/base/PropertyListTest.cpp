@@ -12,7 +12,6 @@ namespace {
 using Array = PropertyList::Array;
 using Data = PropertyList::Data;
 using Date = PropertyList::Date;
-using Dictionary = PropertyList::Dictionary;
 
 std::string repeated(const std::string& text, int times) {
   std::string result;
@@ -52,52 +51,21 @@ TEST(PropertyList, copiesDeeply) {
   EXPECT_EQ(original, PropertyList(keys({{"k", 2}}))) << "a value may take the place of the one that holds it";
 }
 
-TEST(PropertyListXml, readsEveryKindOfValueAlsoAsItWroteIt) {
+// All else that is read is compared with what another reader reads, in tests/fuzz.
+TEST(PropertyListXml, readsWhatIsSeldomWritten) {
   const std::pair<const char*, PropertyList> cases[] = {
-      {"<dict/>", Dictionary()},
-      {"<array> </array>", Array()},
-      {"<string/>", ""},
       {"<string> a&lt;&gt;&amp;&quot;&apos;&#65;&#x1F600;\n</string>", " a<>&\"'A\U0001F600\n"},
       {"<string>a<!-- c -->b<?pi?><![CDATA[<&amp;]]> </string>", "ab<&amp; "},
-      {"<string>a\r\nb\rc&#13;&#10;</string>", "a\nb\nc\r\n"},
-      {"<string>]]>\t\uFEFF\u0085</string>", "]]>\t\uFEFF\u0085"},
-      {"<integer> -42 </integer>", -42},
+      {"<string>a\r\nb\rc&#13;&#10;]]>\uFEFF\u0085</string>", "a\nb\nc\r\n]]>\uFEFF\u0085"},
       {"<integer>+0x2a</integer>", 42},
-      {"<integer>9223372036854775807</integer>", std::numeric_limits<std::int64_t>::max()},
-      {"<integer>-9223372036854775808</integer>", std::numeric_limits<std::int64_t>::min()},
-      {"<real>+1.5e3</real>", 1500.0},
-      {"<real>0.30000000000000004</real>", 0.1 + 0.2},
-      {"<real>-5e-324</real>", -5e-324},
       {"<real>-inf</real>", -std::numeric_limits<double>::infinity()},
-      {"<true/>", true},
-      {"<false></false>", false},
-      {"<date>2000-02-29T23:59:58Z</date>", Date{951868798}},
-      {"<date>0001-01-01T00:00:00Z</date>", Date{-62135596800}},
-      {"<data> AAEC\n\t/w== </data>", Data{0, 1, 2, 255}},
-      {"<data/>", Data()},
-      {"<dict><key>&lt;&#13;</key><array><false/><dict/></array></dict>", keys({{"<\r", Array{false, Dictionary()}}})},
+      {"\xEF\xBB\xBF<?xml version=\"1.0\" encoding=\"UTF-8\"?>\r\n<!DOCTYPE plist PUBLIC \"-//X//DTD 1.0//EN\" "
+       "\"http://nowhere.invalid/x.dtd\">\n<!-- c --><plist version=\"1.0\"><data> AAEC\n/w== </data></plist>\n<!-- c "
+       "-->",
+       Data{0, 1, 2, 255}},
   };
-  for (const auto& [xml, expected] : cases) {
-    const auto read = parsePropertyList(xml, foreignFileLimits);
-    ASSERT_TRUE(read) << xml << ": " << read.failure().why;
-    EXPECT_EQ(*read, expected) << xml;
-    EXPECT_EQ(*parsePropertyList(writePropertyList(*read).value(), ownFileLimits), expected) << xml;
-  }
-}
-
-TEST(PropertyListXml, readsAFileWithAndWithoutItsFrame) {
-  const PropertyList expected = keys({{"b", Array{1, "x"}}, {"a", keys({{"", true}})}});
-  const std::string bare =
-      "<dict> <key>b</key><array><integer>1</integer>\t<string>x</string></array>\n"
-      "<key>a</key><!-- c --><dict><key/><true/></dict></dict>";
-  const std::string declaration = "\xEF\xBB\xBF<?xml version=\"1.0\" encoding=\"UTF-8\"?>\r\n";
-  const std::string type = "<!DOCTYPE plist PUBLIC \"-//X//DTD 1.0//EN\" \"http://nowhere.invalid/x.dtd\">\n";
-  for (const std::string& xml : {bare, "\n<!-- c -->" + bare + "\n", declaration + bare,
-                                 declaration + type + "<plist version=\"1.0\">" + bare + "</plist>\n<!-- c -->"}) {
-    const auto read = parsePropertyList(xml, foreignFileLimits);
-    ASSERT_TRUE(read) << xml << ": " << read.failure().why;
-    EXPECT_EQ(*read, expected) << xml;
-  }
+  for (const auto& [xml, expected] : cases)
+    EXPECT_EQ(parsePropertyList(xml, foreignFileLimits).valueOr("none"), expected) << xml;
 }
 
 TEST(PropertyListXml, refusesWhatIsMalformedAndSaysWhere) {

@@ -2,7 +2,12 @@
 // SPDX-License-Identifier: MIT
 #include <gtest/gtest.h>
 
+#include <bit>
+#include <cfloat>
+#include <charconv>
+#include <cmath>
 #include <limits>
+#include <random>
 
 #include "base/DnsName.h"
 #include "base/Json.h"
@@ -74,6 +79,32 @@ TEST(Text, readsLeadingIntegers) {
       {"-99999999999999999999999", least},
   };
   for (const auto& [text, expected] : cases) EXPECT_EQ(leadingInteger(text), expected) << text;
+}
+
+// The library's own conversions, which would bring their tables into the program.
+TEST(Text, readsAndWritesRealNumbersAsTheLibraryDoes) {
+  std::mt19937_64 random(1);
+  const auto asLibrary = [](double number) {
+    std::array<char, 400> text{};
+    return std::string(text.data(), std::to_chars(text.data(), text.data() + text.size(), number).ptr);
+  };
+  std::vector<double> numbers{0,      -0.0,     1e22,      1e23,    100000, 1234567890123456789.0,
+                              5e-324, HUGE_VAL, -HUGE_VAL, DBL_MAX, 0.0001};
+  for (int i = 0; i < 5000; ++i) {
+    numbers.push_back(std::bit_cast<double>(random()));
+    numbers.push_back(static_cast<double>(random() % 1'000'000) / 1000);
+  }
+  for (const double number : numbers) EXPECT_EQ(realText(number), asLibrary(number));
+
+  for (int i = 0; i < 50'000; ++i) {
+    std::string text(random() % 6 + 1, ' ');
+    for (auto& byte : text) byte = "0159.eE+-xinfa "[random() % 15];
+    double number = 0;
+    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    const bool isNumber = error == std::errc() && end == text.data() + text.size();
+    const auto read = parseReal(text);
+    EXPECT_EQ(read ? asLibrary(*read) : "none", isNumber ? asLibrary(number) : "none") << text;
+  }
 }
 
 TEST(Text, comparesAsciiLettersWithoutCase) {

@@ -106,7 +106,7 @@ TEST(TimeSyncDaemon, TellsTheServerInUseWhereNoneIsConfigured) {
 
 TEST(ServiceManager, ThatEndedDuringACallIsNotTakenForSilent) {
   ChronyBusTree tree;
-  tree.manager.breakNext("ListUnitsByNames", FakeServiceManager::Fault::hangUp);
+  tree.manager.breakNext("ListUnitsByPatterns", FakeServiceManager::Fault::hangUp);
   EXPECT_FALSE(tree.host().networkTime().isRunning());
   EXPECT_THAT(tree.lastEffect(), FailedFor("DBus.Error.NoReply"));
   EXPECT_FALSE(tree.host().networkTime().isRunning());

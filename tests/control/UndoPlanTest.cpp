@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
-#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include "control/undo/UndoPlan.h"
 
@@ -8,26 +8,6 @@ namespace tavisk::control {
 namespace {
 
 using Text = std::optional<std::string>;
-using testing::ElementsAre;
-
-std::vector<std::string> chosenBy(std::optional<std::int64_t> since) {
-  const RecordedChange changes[] = {
-      {"a", 10, "Time Zone", "UTC", "Asia/Tokyo"},
-      {"b", 20, "Display Sleep", "1", "2"},
-      {"a", 5, "Computer Sleep", "3", "4"},
-      {"b", 21, "Remote Login", "off", "on"},
-      {"c", 30, "Network Time Restart", std::nullopt, std::nullopt},
-  };
-  std::vector<std::string> names;
-  for (const auto& change : chosenChanges(changes, since)) names.push_back(change.setting);
-  return names;
-}
-
-TEST(UndoPlan, IsAboutARunOrATime) {
-  EXPECT_THAT(chosenBy(std::nullopt), ElementsAre("Display Sleep", "Remote Login"));
-  EXPECT_THAT(chosenBy(10), ElementsAre("Time Zone", "Display Sleep", "Remote Login"));
-  EXPECT_THAT(chosenBy(22), ElementsAre());
-}
 
 TEST(UndoPlan, AsksForConsentWhereAValueIsNotTavisksOwn) {
   struct Case {

@@ -5,6 +5,8 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <thread>
+
 #include "ToolRun.h"
 #include "effects/Report.h"
 #include "platform/BootLoaderFile.h"
@@ -61,32 +63,6 @@ TEST_F(ReportTest, tellsEachCommand) {
           "\"output\":\"Error: bogus\xef\xbf\xbd is not a valid command\\n\"}"));
 }
 
-TEST_F(ReportTest, tellsEachArgumentThatIsNotTaken) {
-  static constexpr std::pair<const char*, const char*> refused[] = {
-      {"-setdate", "1"},
-      {"-settime", ""},
-      {"-settimezone", "Mars/Base"},
-      {"-setusingnetworktime", "maybe"},
-      {"-setnetworktimeserver", ""},
-      {"-setsleep", "181"},
-      {"-setharddisksleep", "-1"},
-      {"-setrestartfreeze", "1"},
-      {"-setwaitforstartupafterpowerfailure", "45"},
-      {"-setremotelogin", "yes"},
-      {"-setremotevelmarevents", ""},
-      {"-setlocalsubnetname", "db_4"},
-      {"-setkernelbootarchitecture", "sparc"},
-      {"-setdisablekeyboardwhenenclosurelockisengaged", "maybe"},
-      {"-setallowpowerbuttontosleepcomputer", ""},
-      {"-setstartupdisk", "None"},
-  };
-  std::vector<std::string> words;
-  for (const auto& [command, value] : refused) words.insert(words.end(), {command, value});
-  const auto objects = run(words);
-  EXPECT_EQ(objects.size(), std::size(refused));
-  EXPECT_THAT(objects, ::testing::Each(HasSubstr(R"(,"refused":")")));
-}
-
 TEST_F(ReportTest, tellsThatAFileCannotBeReadInsteadOfARefusal) {
   machine.writeFile(BootLoaderFile::path, "damaged");
   EXPECT_THAT(run({"-setkernelbootarchitecture", "default"}).back(),
@@ -111,6 +87,28 @@ TEST_F(ReportTest, tellsTheCommandThatASignalInterrupted) {
   EXPECT_THAT(linesOf(path), ElementsAre(::testing::AllOf(
                                  HasSubstr(R"("handler":"setTime:","signal":"SIGTERM","failed":true,"changed":true,)"),
                                  HasSubstr(R"("asked":"0")"), HasSubstr(R"("why":"gone"}],"output":"half"})"))));
+}
+
+TEST_F(ReportTest, isWholeWhenASignalComesAtAnyMoment) {
+  constexpr int times = 300;
+  const auto kept = Report::open(path).value();
+  std::thread signal([&] {
+    for (int time = 0; time < times; ++time) kept->runEndedBySignal("SIGTERM", false, "");
+  });
+  for (int time = 0; time < times; ++time) {
+    kept->commandBegins("-gettime", {}, "getTime");
+    kept->record({.setting = "Time", .outcome = Outcome::failed});
+    kept->commandEnds(false, "");
+  }
+  signal.join();
+  kept->runRefused("the end", "");
+  int effects = 0;
+  for (const auto& line : linesOf(path)) {
+    EXPECT_TRUE(line.starts_with(R"({"report":1,)") && line.ends_with(R"("output":""})")) << line;
+    for (auto at = line.find(R"("setting")"); at != std::string::npos; at = line.find(R"("setting")", at + 1))
+      ++effects;
+  }
+  EXPECT_EQ(effects, times);
 }
 
 TEST_F(ReportTest, keepsNoMoreThanAMiBOfTheOutput) {

@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
+#include <thread>
+
 #include "startupdisk/StartupDiskTest.h"
 
 namespace tavisk {
@@ -45,6 +47,24 @@ TEST(DiskRecord, ADiskHasOneContextForAllItsRecords) {
   record->removeObjectForKey(recordkey::volumeName);
   EXPECT_EQ(second->volumeName(), "Data");
   EXPECT_FALSE(machine.volume("disk0")->contextObject());
+}
+
+TEST(DiskRecord, ContextsAreOfAllThreads) {
+  constexpr int times = 500;
+  StartupMachine machine;
+  auto& environment = machine.environment();
+  const auto learn = [&](const std::string& disk) {
+    for (int time = 0; time < times; ++time)
+      SDDisk(environment.diskServices(), DiskName{disk + std::to_string(time)})
+          .setObject(std::int64_t{time}, recordkey::systemVersionMajor);
+  };
+  std::thread other(learn, "disk1s");
+  learn("disk0s");
+  other.join();
+  for (const char* disk : {"disk0s", "disk1s"}) {
+    const auto last = machine.volume(disk + std::to_string(times - 1));
+    EXPECT_EQ(last->integerForKey(recordkey::systemVersionMajor), times - 1) << disk;
+  }
 }
 
 TEST(DiskRecord, IsMadeFromAnyPathOfItsVolume) {

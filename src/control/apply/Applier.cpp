@@ -6,6 +6,7 @@
 #include <span>
 #include <utility>
 
+#include "control/Ending.h"
 #include "effects/SettingNames.h"
 
 namespace tavisk::control {
@@ -44,6 +45,7 @@ Results resultsFor(const ManagedSetting& setting, Results results) {
 AppliedSetting seen(const AskedValue& asked, const SettingState& before, const SettingState& after) {
   AppliedSetting applied{.setting = asked.setting, .unit = after.value.unit, .wanted = asked.value};
   applied.before = valueOf(before);
+  if (before.value.stored != applied.before) applied.storedBefore = before.value.stored;
   applied.after = valueOf(after);
   applied.stored = after.value.stored;
   applied.undoneBy = after.value.undoneBy;
@@ -113,6 +115,13 @@ void checkBySight(AppliedSetting& applied, const SettingState& after, const Resu
   }
 }
 
+/// Where a reset has taken something away.
+void addPlacesLeft(AppliedSetting& applied, const WordResult& result) {
+  for (const auto& effect : result.effects)
+    if (effect.setting == applied.setting->name && effect.changed && !effect.where.empty())
+      applied.notes.insert(applied.notes.begin(), "no longer kept in " + effect.where);
+}
+
 AppliedSetting judged(const AskedValue& asked, const SettingState& before, const SettingState& after,
                       const Results& results) {
   auto applied = seen(asked, before, after);
@@ -150,6 +159,19 @@ std::vector<AppliedSetting> Applier::apply(const Step& step) {
   return applied;
 }
 
+AppliedSetting Applier::reset(const ManagedSetting& setting) {
+  const auto before = stateOf(setting);
+  const auto result = _runner.run([&](Host& host) { host.resets().reset(std::string(setting.name)); });
+  const auto after = stateOf(setting);
+  auto applied = seen({&setting, std::nullopt}, before, after);
+  applied.undoneBy.clear();
+  addTold(applied, {result});
+  addPlacesLeft(applied, result);
+  if (applied.verdict <= Verdict::applied && !after.failures.empty()) fail(applied, describe(after.failures.front()));
+  applied.lasts = applied.verdict <= Verdict::applied || isLasting(applied);
+  return applied;
+}
+
 /// What a searched setting's getter asks in the end is asked without a search: it keeps the answer for the whole run.
 SettingState Applier::stateOf(const ManagedSetting& setting) {
   const auto states = _reader.read({&setting}, [this](const ManagedSetting& asked) {
@@ -176,6 +198,22 @@ std::vector<std::vector<std::string>> Applier::wordsOf(const Step& step, const S
   if (*value == "on" && isOnUntilRestart(*setting, state))
     words.insert(words.begin(), setterWords(*setting, "off").front());
   return words;
+}
+
+Status withApplier(const Tools& tools, const std::function<Status(Applier& applier)>& change) {
+  const EndingSignals signals;
+  EffectSink effects;
+  StatusReader reader;
+  effects.addChannel(reader);
+  RunLoop runLoop;
+  const auto host = tools.openHost(effects, runLoop);
+  if (!host) return endBy(host.failure(), Status::incomplete, tools);
+  WordRunner runner(**host, effects, runLoop);
+  const auto waiter = endBySignal(
+      signals, [&](const std::string& signal) { runner.endedBySignal(signal); }, tools);
+  if (const auto started = runner.start(); !started) return endBy(started.failure(), Status::incomplete, tools);
+  Applier applier(**host, runner, reader);
+  return change(applier);
 }
 
 }  // namespace tavisk::control

@@ -2,10 +2,12 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <optional>
 #include <string>
 #include <vector>
 
+#include "control/Commands.h"
 #include "control/StatusReader.h"
 #include "control/WordRunner.h"
 #include "control/apply/ApplyPlan.h"
@@ -18,9 +20,10 @@ struct AppliedSetting {
   const ManagedSetting* setting;
   std::string unit = {};  ///< see SettingValue
   std::optional<std::string> wanted = {};
-  std::optional<std::string> before = {};  ///< in force, else stored
-  std::optional<std::string> after = {};   ///< the same, read again
-  std::optional<std::string> stored = {};  ///< what will be after a restart
+  std::optional<std::string> before = {};        ///< in force, else stored
+  std::optional<std::string> storedBefore = {};  ///< where another value was in force
+  std::optional<std::string> after = {};         ///< the same, read again
+  std::optional<std::string> stored = {};        ///< what will be after a restart
   Verdict verdict = Verdict::unchanged;
   std::string reason = {};  ///< why it is refused, not supported or has failed; harmless for a terminal
   std::string undoneBy = {};
@@ -38,6 +41,9 @@ class Applier final {
   /// Looks at the settings of the step, runs its words unless all is as it is asked for, and looks again. One for each
   /// setting.
   std::vector<AppliedSetting> apply(const Step& step);
+  /// Takes away what tavisk itself stores of the setting, and looks at it before and afterwards. Who else may change it
+  /// is among those to whom it goes back: it lasts.
+  AppliedSetting reset(const ManagedSetting& setting);
   SettingState stateOf(const ManagedSetting& setting);
 
  private:
@@ -48,5 +54,9 @@ class Applier final {
   WordRunner& _runner;
   StatusReader& _reader;
 };
+
+/// Opens the machine, hands over what changes it, and ends by its status; where that cannot be had, by saying why. An
+/// ending signal gives the authorization up.
+Status withApplier(const Tools& tools, const std::function<Status(Applier& applier)>& change);
 
 }  // namespace tavisk::control

@@ -60,7 +60,8 @@ Status apply(std::span<const Step> steps, Applier& applier, const Invocation& in
   const bool isUnsupportedSkipped = invocation.has("--skip-unsupported");
   const bool areAllDone =
       std::ranges::all_of(settings, [&](const auto& setting) { return isDone(setting, isUnsupportedSkipped); });
-  const auto text = invocation.has("--json") ? appliedJson(settings, areAllDone) + "\n" : appliedTable(settings);
+  const auto text =
+      invocation.has("--json") ? appliedJson("apply", settings, areAllDone) + "\n" : appliedTable(settings);
   tools.output.print("%s", text.c_str());
   return areAllDone ? Status::done : Status::incomplete;
 }
@@ -70,19 +71,7 @@ Status apply(std::span<const Step> steps, Applier& applier, const Invocation& in
 Status applySettings(const Invocation& invocation, const Tools& tools) {
   const auto steps = wantedSteps(invocation);
   if (!steps) return endBy(steps.failure(), Status::misused, tools);
-  const EndingSignals signals;
-  EffectSink effects;
-  StatusReader reader;
-  effects.addChannel(reader);
-  RunLoop runLoop;
-  const auto host = tools.openHost(effects, runLoop);
-  if (!host) return endBy(host.failure(), Status::incomplete, tools);
-  WordRunner runner(**host, effects, runLoop);
-  const auto waiter = endBySignal(
-      signals, [&](const std::string& signal) { runner.endedBySignal(signal); }, tools);
-  if (const auto started = runner.start(); !started) return endBy(started.failure(), Status::incomplete, tools);
-  Applier applier(**host, runner, reader);
-  return apply(*steps, applier, invocation, tools);
+  return withApplier(tools, [&](Applier& applier) { return apply(*steps, applier, invocation, tools); });
 }
 
 }  // namespace tavisk::control

@@ -30,6 +30,7 @@ std::string jsonOf(const AppliedSetting& applied) {
   object.text("setting", applied.setting->name);
   object.textIfKnown("wanted", applied.wanted);
   object.textIfKnown("before", applied.before);
+  object.textIfKnown("storedBefore", applied.storedBefore);
   object.textIfKnown("after", applied.after);
   object.textIfKnown("stored", applied.stored);
   object.textUnlessEmpty("unit", applied.unit);
@@ -59,11 +60,11 @@ std::string appliedTable(std::span<const AppliedSetting> settings) {
   return table.str();
 }
 
-std::string appliedJson(std::span<const AppliedSetting> settings, bool isDone) {
+std::string appliedJson(std::string_view command, std::span<const AppliedSetting> settings, bool isDone) {
   std::vector<std::string> outcomes;
   std::ranges::transform(settings, std::back_inserter(outcomes), jsonOf);
   JsonObject object;
-  object.integer("apply", 1).boolean("done", isDone);
+  object.integer(command, 1).boolean("done", isDone);
   object.boolean("changed", std::ranges::any_of(settings, &AppliedSetting::isChanged));
   return object.array("settings", {outcomes}).str();
 }

@@ -4,6 +4,7 @@
 
 #include <span>
 #include <string>
+#include <string_view>
 
 #include "control/TextTable.h"
 #include "control/apply/Applier.h"
@@ -17,7 +18,8 @@ std::string appliedTable(std::span<const AppliedSetting> settings);
 /// What becomes of a setting that does not last, below its row.
 void addWhatUndoes(TextTable& table, const AppliedSetting& applied);
 
-/// One JSON object without a newline; see taviskctl(8). `isDone`: everything was done.
-std::string appliedJson(std::span<const AppliedSetting> settings, bool isDone);
+/// One JSON object without a newline; see taviskctl(8). `command` is what was done, its first member; `isDone`:
+/// everything was done.
+std::string appliedJson(std::string_view command, std::span<const AppliedSetting> settings, bool isDone);
 
 }  // namespace tavisk::control

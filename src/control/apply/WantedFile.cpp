@@ -39,12 +39,14 @@ class NamesOnce {
   std::optional<std::string> _twice;
 };
 
-/// What the library says behind its own name and number: "at line 3, column 5: ...".
-std::string placeAndReason(const Json::parse_error& error) {
-  constexpr std::string_view before = "parse error ";
+/// What the library says behind its own name and number: "at line 3, column 5: ...", or of a number that no type holds
+/// "number overflow parsing '1e999'".
+std::string placeAndReason(const Json::exception& error) {
   const std::string_view told = error.what();
-  const auto at = told.find(before);
-  return std::string(at == std::string_view::npos ? told : told.substr(at + before.size()));
+  for (const std::string_view before : {"parse error ", "] "})
+    if (const auto at = told.find(before); at != std::string_view::npos)
+      return std::string(told.substr(at + before.size()));
+  return std::string(told);
 }
 
 Result<Json> parsed(std::string_view text, const std::string& name) {
@@ -54,7 +56,7 @@ Result<Json> parsed(std::string_view text, const std::string& name) {
     if (names.twice()) return Failure{readWanted, name, *names.twice() + " stands there twice"};
     if (!json.is_object()) return Failure{readWanted, name, "an object of settings and their values is expected"};
     return json;
-  } catch (const Json::parse_error& error) {
+  } catch (const Json::exception& error) {
     return Failure{readWanted, name, placeAndReason(error)};
   }
 }

@@ -74,13 +74,16 @@ RehearsedSetting rehearsed(const AppliedSetting& applied, const RehearsalNotes& 
   return {.setting = std::string(applied.setting->name),
           .unit = applied.unit,
           .now = applied.before,
+          .storedNow = applied.storedBefore,
           .then = applied.after,
           .stored = applied.stored,
           .where = notes.whereKept(applied.setting->name),
           .verdict = applied.verdict,
           .reason = applied.reason,
           .undoneBy = applied.undoneBy,
-          .notes = applied.notes};
+          .notes = applied.notes,
+          .isChanged = applied.isChanged,
+          .lasts = applied.lasts};
 }
 
 bool isAllDone(const Rehearsed& rehearsed) {

@@ -18,6 +18,7 @@ struct RehearsedSetting {
   std::string setting = {};  ///< as effects call it
   std::string unit = {};     ///< see SettingValue
   std::optional<std::string> now = {};
+  std::optional<std::string> storedNow = {};  ///< of a file's setting: where another value is in force
   std::optional<std::string> then = {};
   std::optional<std::string> stored = {};  ///< what it would be after a restart
   std::string where = {};                  ///< the places in which it would be kept
@@ -25,6 +26,8 @@ struct RehearsedSetting {
   std::string reason = {};  ///< why it would be refused or fail, or is not supported
   std::string undoneBy = {};
   std::vector<std::string> notes = {};
+  std::optional<bool> isChanged = {};  ///< of a file's setting: the machine would differ, in whole or in part
+  std::optional<bool> lasts = {};      ///< of a file's setting: it would be so after a restart
 };
 
 /// What a rehearsal came to.

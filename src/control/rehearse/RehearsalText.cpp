@@ -49,12 +49,15 @@ std::string partJson(const RehearsedSetting& setting) {
   JsonObject object;
   object.text("setting", setting.setting);
   object.textIfKnown("now", setting.now);
+  object.textIfKnown("storedNow", setting.storedNow);
   object.textIfKnown("then", setting.then);
   object.textIfKnown("stored", setting.stored);
   object.textUnlessEmpty("unit", setting.unit);
   object.textUnlessEmpty("where", setting.where);
   object.text("outcome", nameOf(setting.verdict));
   object.textUnlessEmpty("reason", setting.reason);
+  if (setting.isChanged) object.boolean("changed", *setting.isChanged);
+  if (setting.lasts) object.boolean("lasts", *setting.lasts);
   object.textUnlessEmpty("undoneBy", setting.undoneBy);
   object.textUnlessEmpty("note", joined(setting.notes, "; "));
   return object.str();

@@ -22,12 +22,8 @@ Settings managed(bool withSearched) {
 
 /// Without names all of them, but those that are searched for.
 Result<Settings> chosenSettings(const std::vector<std::string>& names, bool areAllWanted) {
-  Settings chosen;
-  for (const auto& name : names) {
-    const auto* setting = settingMeantBy(name);
-    if (!setting) return Failure{"there is no setting " + name, "", "'taviskctl status --all' shows the names"};
-    if (std::ranges::find(chosen, setting) == chosen.end()) chosen.push_back(setting);
-  }
+  auto chosen = settingsMeantBy(names);
+  if (!chosen) return chosen;
   return names.empty() || areAllWanted ? managed(areAllWanted) : chosen;
 }
 

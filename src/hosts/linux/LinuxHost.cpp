@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/LinuxHost.h"
 
+#include "effects/SettingNames.h"
+
 namespace tavisk {
 
 LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& root, Conduct conduct)
@@ -39,7 +41,8 @@ LinuxHost::LinuxHost(EffectSink& effects, RunLoop& runLoop, const std::string& r
       _programs(_machine),
       _processTermination(_machine),
       _preferences(_machine, _controller),
-      _processes(_machine, _preferences) {
+      _processes(_machine, _preferences),
+      _resets(effects, [this] { return resetRowsOf(_networkTime, _powerSettings, _bootLoaderFile, _preferences); }) {
   if (conduct == Conduct::change) effects.addChannel(_journalLog);
 }
 

@@ -22,6 +22,7 @@
 #include "hosts/linux/system/Journal.h"
 #include "hosts/linux/systems/LinuxDiskManagementService.h"
 #include "hosts/linux/systems/SystemFiles.h"
+#include "hosts/shared/Resets.h"
 #include "hosts/shared/RootedFileSystem.h"
 #include "platform/Host.h"
 
@@ -51,6 +52,7 @@ class LinuxHost final : public Host {
   BootLoaderFile& bootLoaderFile() override { return _bootLoaderFile; }
   PreferencesStore& preferences() override { return _preferences; }
   ProcessUtilities& processes() override { return _processes; }
+  ResetService& resets() override { return _resets; }
 
   DiskEventSession& diskEvents() override { return _diskEvents; }
   DiskManagementService& diskManagement() override { return _diskManagement; }
@@ -101,6 +103,7 @@ class LinuxHost final : public Host {
   LinuxProcessTermination _processTermination;
   LinuxPreferencesStore _preferences;
   LinuxProcessUtilities _processes;
+  Resets _resets;
 };
 
 }  // namespace tavisk

@@ -43,6 +43,8 @@ class RehearsalHost final : public Host {
   BootLoaderFile& bootLoaderFile() override { return _bootLoaderFile; }
   PreferencesStore& preferences() override { return _copy->preferences(); }
   ProcessUtilities& processes() override { return _processes; }
+  /// Foretold by the machine: no word resets.
+  ResetService& resets() override { return _machine.host->resets(); }
 
   DiskEventSession& diskEvents() override { return _machine.host->diskEvents(); }
   DiskManagementService& diskManagement() override { return _diskManagement; }

@@ -18,10 +18,13 @@ bool isApplied(const Stage::Effects& effects) {
   return std::ranges::any_of(effects, [](const Effect& effect) { return effect.outcome == Outcome::applied; });
 }
 
-/// The live value that comes of a change; absent where it is not made.
+/// The live value that comes of a change, or is there already; absent where it is not made.
 std::optional<std::string> liveAfter(const Stage::Effects& effects) {
-  const auto applied = std::ranges::find(effects, Outcome::applied, &Effect::outcome);
-  return applied == effects.end() ? std::nullopt : applied->live;
+  for (const auto outcome : {Outcome::applied, Outcome::unchanged}) {
+    const auto granted = std::ranges::find(effects, outcome, &Effect::outcome);
+    if (granted != effects.end()) return granted->live;
+  }
+  return std::nullopt;
 }
 
 }  // namespace
@@ -169,12 +172,12 @@ void RehearsedHostConfiguration::setComputerName(const std::string& name) {
   if (isApplied(effects) && name.empty() && _showsHostName) showHostName();
 }
 
-/// The network may know less of the name than was asked for.
+/// The network may know less of the name than was asked for, also where that is stored already.
 void RehearsedHostConfiguration::setLocalNetworkName(const std::string& name) {
   const auto effects = _stage.play([&](Host& host) { host.hostConfiguration().setLocalNetworkName(name); });
-  if (!isApplied(effects)) return;
-  const auto shown = liveAfter(effects).value_or(name);
-  _stage.edit([&](PropertyList::Dictionary& machine) { machine.dictionary(live).set(localName, shown); });
+  const auto shown = liveAfter(effects);
+  if (!shown) return;
+  _stage.edit([&](PropertyList::Dictionary& machine) { machine.dictionary(live).set(localName, *shown); });
   if (_showsHostName && !hasComputerName()) showHostName();
 }
 

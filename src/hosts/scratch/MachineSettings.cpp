@@ -32,9 +32,25 @@ MachineSetting<std::string> countAt(std::string name, const std::string& section
           }};
 }
 
+MachineOwn ownAt(const std::string& section, const std::string& key) {
+  return {[=](MachineFile& machine) { return machine.section(section).find(key) != nullptr; },
+          [=](MachineFile::Dictionary& machine) { machine.dictionary(section).remove(key); }};
+}
+
 void countUp(MachineFile::Dictionary& dictionary, std::string_view key) {
   const auto* count = dictionary.find(key);
   dictionary.set(key, (count ? *count->asInteger() : 0) + 1);
+}
+
+OwnPart MachineSettings::ownPart(const MachineOwn& own) {
+  const auto takeAway = [this, removal = own.removal](WrittenPlaces& taken) {
+    auto changed = _file.change(removal);
+    if (changed) taken.add(_file.path());
+    return changed;
+  };
+  return {.isThere = [this, isThere = own.isThere]() -> Result<bool> { return isThere(_file); },
+          .check = nullptr,
+          .takeAway = takeAway};
 }
 
 void MachineSettings::recordUnsupported(const std::string& setting) {

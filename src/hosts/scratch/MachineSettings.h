@@ -12,6 +12,7 @@
 #include "effects/EffectSink.h"
 #include "hosts/scratch/MachineFile.h"
 #include "hosts/shared/SettingChange.h"
+#include "hosts/shared/SettingReset.h"
 
 namespace tavisk {
 
@@ -34,6 +35,14 @@ MachineSetting<bool> switchAt(std::string name, const std::string& section, cons
 MachineSetting<std::string> textAt(std::string name, const std::string& section, const std::string& key);
 /// What is only done and counted, under a key which may be at the top; its effects call it by the word that is asked.
 MachineSetting<std::string> countAt(std::string name, const std::string& section, const std::string& key);
+
+/// What a machine file has of a setting apart from its default.
+struct MachineOwn {
+  std::function<bool(MachineFile& machine)> isThere;
+  MachineFile::Edit removal;
+};
+/// One key of a dictionary at the top.
+MachineOwn ownAt(const std::string& section, const std::string& key);
 
 /// Adds one to a count.
 void countUp(MachineFile::Dictionary& dictionary, std::string_view key);
@@ -58,6 +67,13 @@ class MachineSettings {
   Effect change(const MachineSetting<Value>& setting, const std::type_identity_t<Value>& asked) {
     return carryOut(parts(setting), asked);
   }
+  /// As reset(): the machine goes by its default again.
+  template <typename Value>
+  Effect reset(const MachineSetting<Value>& setting, const MachineOwn& own) {
+    auto resettable = parts(setting);
+    resettable.own = ownPart(own);
+    return reset(resettable);
+  }
   /// That a setting was to be changed which the machine cannot have.
   void recordUnsupported(const std::string& setting);
   /// The same of one that was to be read.
@@ -77,11 +93,16 @@ class MachineSettings {
     if (_conduct == Conduct::forecast) return tavisk::foretell(heeding, asked, _effects);
     return tavisk::carryOut(heeding, asked, _effects, _runLoop);
   }
+  template <typename Value>
+  Effect reset(const Setting<Value>& setting) {
+    return tavisk::reset(heedingRefusals(setting), _effects, _runLoop, _conduct);
+  }
   /// What is given must outlive the parts.
   template <typename Value>
   Setting<Value> parts(const MachineSetting<Value>& setting);
 
  private:
+  OwnPart ownPart(const MachineOwn& own);
   template <typename Value>
   Setting<Value> heedingRefusals(Setting<Value> setting);
   /// Why the setting is not set, or not read.
@@ -115,7 +136,10 @@ Setting<Value> MachineSettings::heedingRefusals(Setting<Value> setting) {
     for (auto* read : {&setting.live, &setting.stored})
       if (*read) *read = [=] { return *refused; };
   }
-  if (const auto refused = refusedChange(setting.name)) setting.check = [=](const Value&) { return *refused; };
+  if (const auto refused = refusedChange(setting.name)) {
+    setting.check = [=](const Value&) { return *refused; };
+    setting.own.check = [=] { return *refused; };
+  }
   return setting;
 }
 

@@ -23,4 +23,13 @@ bool ScratchBootLoaderFile::write(const PropertyList::Dictionary& contents) {
   return effect.outcome != Outcome::failed;
 }
 
+void ScratchBootLoaderFile::reset() {
+  auto setting = kernelArchitecture(_file);
+  setting.own.takeAway = [this, takeAway = setting.own.takeAway](WrittenPlaces& taken) -> Result<void> {
+    const auto held = _machine.lock();
+    return held ? takeAway(taken) : held.failure();
+  };
+  _settings.reset(setting);
+}
+
 }  // namespace tavisk

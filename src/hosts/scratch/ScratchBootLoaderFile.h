@@ -17,6 +17,9 @@ class ScratchBootLoaderFile final : public BootLoaderFile {
   Result<std::optional<PropertyList::Dictionary>> read() override;
   bool write(const PropertyList::Dictionary& contents) override;
 
+  /// Takes the architecture out of the file; see ResetService.
+  void reset();
+
  private:
   PropertyListFile _file;
   const MachineFile& _machine;

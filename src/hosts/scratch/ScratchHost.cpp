@@ -54,6 +54,7 @@ ScratchHost::ScratchHost(const std::string& directory, std::unique_ptr<MachineFi
       _kernel(*_machine),
       _keyboardInput(*_machine),
       _userDefaults(*_machine),
-      _programs(*_machine) {}
+      _programs(*_machine),
+      _resets(effects, [this] { return resetRowsOf(_networkTime, _powerSettings, _bootLoaderFile, _preferences); }) {}
 
 }  // namespace tavisk

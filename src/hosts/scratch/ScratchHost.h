@@ -23,6 +23,7 @@
 #include "hosts/scratch/ScratchPreferences.h"
 #include "hosts/scratch/ScratchProcesses.h"
 #include "hosts/scratch/ScratchRemoteAccess.h"
+#include "hosts/shared/Resets.h"
 #include "hosts/shared/RootedFileSystem.h"
 #include "platform/Host.h"
 
@@ -57,6 +58,7 @@ class ScratchHost final : public Host {
   BootLoaderFile& bootLoaderFile() override { return _bootLoaderFile; }
   PreferencesStore& preferences() override { return _preferences; }
   ProcessUtilities& processes() override { return _processes; }
+  ResetService& resets() override { return _resets; }
 
   DiskEventSession& diskEvents() override { return _diskEvents; }
   DiskManagementService& diskManagement() override { return _diskManagement; }
@@ -102,6 +104,7 @@ class ScratchHost final : public Host {
   ScratchUserDefaults _userDefaults;
   ScratchProgramRunner _programs;
   ScratchProcessTermination _processTermination;
+  Resets _resets;
 };
 
 }  // namespace tavisk

@@ -8,13 +8,14 @@ namespace tavisk {
 namespace {
 
 constexpr const char* networkTimeSection = "Network Time";
+constexpr const char* serverKey = "Server";
 
 MachineSetting<bool> running() {
   return switchAt(setting::networkTime, networkTimeSection, "Running");
 }
 
 MachineSetting<std::string> address() {
-  return textAt(setting::networkTimeServer, networkTimeSection, "Server");
+  return textAt(setting::networkTimeServer, networkTimeSection, serverKey);
 }
 
 MachineSetting<bool> atStartup() {
@@ -49,6 +50,11 @@ NetworkTimeServer ScratchNetworkTimeService::server() {
 
 void ScratchNetworkTimeService::setServer(const NetworkTimeServer& server) {
   _settings.change(address(), server.address);
+}
+
+void ScratchNetworkTimeService::resetServer() {
+  const auto effect = _settings.reset(address(), ownAt(networkTimeSection, serverKey));
+  if (effect.changed && _settings.section(networkTimeSection).boolean("Running")) restartAsynchronously();
 }
 
 void ScratchNetworkTimeService::restartAsynchronously() {

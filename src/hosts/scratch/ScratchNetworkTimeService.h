@@ -22,6 +22,9 @@ class ScratchNetworkTimeService final : public NetworkTimeService {
   void setServer(const NetworkTimeServer& server) override;
   void restartAsynchronously() override;
 
+  /// Takes the key out of the machine file; see ResetService.
+  void resetServer();
+
  private:
   MachineSettings& _settings;
 };

@@ -10,6 +10,14 @@ namespace tavisk {
 namespace {
 
 constexpr const char* sources = "Power Sources";
+constexpr const char* powerSection = "Power";
+constexpr const char* restartKey = "Restart On Hang";
+/// The source whose settings the words read and change.
+constexpr const char* mains = "AC Power";
+
+MachineSection ofMains(MachineFile& machine) {
+  return machine.section(sources).section(mains);
+}
 
 const char* keyOf(SleepTimer timer) {
   switch (timer) {
@@ -69,7 +77,7 @@ MachineSetting<bool> settingOf(PowerSwitch which, const PowerSource& source) {
 }
 
 MachineSetting<bool> restartAfterFreeze() {
-  return switchAt(setting::restartAfterFreeze, "Power", "Restart On Hang");
+  return switchAt(setting::restartAfterFreeze, powerSection, restartKey);
 }
 
 }  // namespace
@@ -112,6 +120,29 @@ bool ScratchPowerSettingsService::restartsAfterFreeze() {
 
 void ScratchPowerSettingsService::setRestartsAfterFreeze(bool restarts) {
   _settings.change(restartAfterFreeze(), restarts);
+}
+
+void ScratchPowerSettingsService::reset(SleepTimer timer) {
+  const MachineOwn own{[key = keyOf(timer)](MachineFile& machine) { return ofMains(machine).find(key) != nullptr; },
+                       [key = keyOf(timer)](MachineFile::Dictionary& machine) {
+                         machine.dictionary(sources).dictionary(mains).remove(key);
+                       }};
+  _settings.reset(settingOf(timer, {mains}), own);
+}
+
+void ScratchPowerSettingsService::reset(PowerSwitch which) {
+  const auto setting = settingOf(which, {mains});
+  const MachineOwn own{[key = keyOf(which)](MachineFile& machine) {
+                         const auto section = ofMains(machine);
+                         const auto* value = section.find(key);
+                         return value && *value->asBoolean();
+                       },
+                       [&](MachineFile::Dictionary& machine) { setting.write(machine, false); }};
+  _settings.reset(setting, own);
+}
+
+void ScratchPowerSettingsService::resetRestartAfterFreeze() {
+  _settings.reset(restartAfterFreeze(), ownAt(powerSection, restartKey));
 }
 
 }  // namespace tavisk

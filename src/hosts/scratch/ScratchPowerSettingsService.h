@@ -22,6 +22,12 @@ class ScratchPowerSettingsService final : public PowerSettingsService {
   bool restartsAfterFreeze() override;
   void setRestartsAfterFreeze(bool restarts) override;
 
+  /// Takes the keys out of the machine file: those of mains; see ResetService. A switch that the machine
+  /// has stays, and is off.
+  void reset(SleepTimer timer);
+  void reset(PowerSwitch which);
+  void resetRestartAfterFreeze();
+
  private:
   bool has(PowerSwitch which, const PowerSource& source);
 

@@ -22,6 +22,10 @@ MachineSetting<bool> preference(const std::string& key) {
 
 }  // namespace
 
+MachineSetting<bool> keyboardsDisabled() {
+  return switchAt(setting::keyboardLock, "Enclosure Lock", "Keyboard Disabled");
+}
+
 std::optional<PropertyList> ScratchPreferencesStore::value(const std::string& key) {
   if (!_settings.read(preference(key))) return std::nullopt;
   const auto preferences = _settings.section(preferencesSection);
@@ -31,6 +35,14 @@ std::optional<PropertyList> ScratchPreferencesStore::value(const std::string& ke
 
 void ScratchPreferencesStore::setBoolean(const std::string& key, bool value) {
   _settings.change(preference(key), value);
+}
+
+void ScratchPreferencesStore::resetKeyboardLock() {
+  const std::string key = DunmereLockEnclosureStateKey;
+  const auto effect = _settings.reset(preference(key), ownAt(preferencesSection, key));
+  if (effect.outcome != Outcome::applied) return;
+  _settings.change(keyboardsDisabled(), false);
+  writeOut();
 }
 
 void ScratchPreferencesStore::writeOut() {

@@ -8,6 +8,9 @@
 
 namespace tavisk {
 
+/// Whether the keyboards are disabled now.
+MachineSetting<bool> keyboardsDisabled();
+
 /// "Preferences".
 class ScratchPreferencesStore final : public PreferencesStore {
  public:
@@ -17,6 +20,8 @@ class ScratchPreferencesStore final : public PreferencesStore {
   void setBoolean(const std::string& key, bool value);
   /// Counts it.
   void writeOut();
+  /// Takes the preference out of the machine file, and enables the keyboards; see ResetService.
+  void resetKeyboardLock();
 
  private:
   MachineSettings& _settings;

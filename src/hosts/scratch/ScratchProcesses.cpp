@@ -40,7 +40,7 @@ void ScratchProcessUtilities::sendSignal(int signal, ProcessId process) {
 }
 
 void ScratchProcessUtilities::setLockEnclosureState(bool disablesKeyboard) {
-  _settings.change(switchAt(setting::keyboardLock, "Enclosure Lock", "Keyboard Disabled"), disablesKeyboard);
+  _settings.change(keyboardsDisabled(), disablesKeyboard);
 }
 
 Result<ProgramOutput> ScratchProgramRunner::run(const std::string& program, const std::vector<std::string>& arguments) {

@@ -6,6 +6,7 @@
 #include <utility>
 
 #include "effects/SettingNames.h"
+#include "hosts/shared/SettingReset.h"
 
 namespace tavisk {
 namespace {
@@ -40,11 +41,17 @@ Setting<std::string> kernelArchitecture(const Contents& read) {
   return setting;
 }
 
-Setting<std::string> kernelArchitecture(const PropertyListFile& file, const PropertyList::Dictionary& contents) {
+Setting<std::string> kernelArchitecture(const PropertyListFile& file) {
   Setting<std::string> setting;
   setting.name = setting::kernelArchitecture;
   setting.where = file.path();
   setting.stored = [&file] { return architectureOf(file.read()); };
+  setting.own = ownKey(file, BootLoaderFile::architectureKey);
+  return setting;
+}
+
+Setting<std::string> kernelArchitecture(const PropertyListFile& file, const PropertyList::Dictionary& contents) {
+  auto setting = kernelArchitecture(file);
   const auto places = std::make_shared<WrittenPlaces>();
   setting.written = [places] { return places->text(); };
   setting.store = [&file, &contents, places](const std::string&) -> Result<void> {

@@ -17,6 +17,8 @@ namespace tavisk {
 /// the architecture of `contents` into the file as it is then, and what else they have where the file lacks it.
 Setting<std::string> kernelArchitecture(const Result<std::optional<PropertyList::Dictionary>>& read);
 Setting<std::string> kernelArchitecture(const PropertyListFile& file, const PropertyList::Dictionary& contents);
+/// The same to be reset; its own part needs nobody's leave.
+Setting<std::string> kernelArchitecture(const PropertyListFile& file);
 /// The value that a change of kernelArchitecture to these contents asks for.
 std::string architectureIn(const PropertyList::Dictionary& contents);
 

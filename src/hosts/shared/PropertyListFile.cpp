@@ -46,6 +46,17 @@ Result<void> PropertyListFile::write(const PropertyList::Dictionary& contents, W
   return put(_path, *text, written);
 }
 
+Result<void> PropertyListFile::removeKey(const std::string& key, WrittenPlaces& written) const {
+  auto present = read();
+  if (!present) return present.failure();
+  auto kept = std::move(present).value().value_or(PropertyList::Dictionary());
+  kept.remove(key);
+  if (!kept.empty()) return write(kept, written);
+  auto removed = _root.remove(_path);
+  if (removed) written.add(_path);
+  return removed;
+}
+
 Result<void> PropertyListFile::put(const std::string& path, const std::string& text, WrittenPlaces& written) const {
   auto done = _root.write(path, text);
   if (done) written.add(path);

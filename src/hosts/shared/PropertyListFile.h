@@ -27,6 +27,8 @@ class PropertyListFile {
   /// Replaces the file whole, or makes it and its folders. What read() cannot understand is kept beside it first, as
   /// NAME.damaged. The files that are written are added to `written`.
   Result<void> write(const PropertyList::Dictionary& contents, WrittenPlaces& written) const;
+  /// Takes the key out of the file, and the file away when it has no other. One that read() cannot understand is left.
+  Result<void> removeKey(const std::string& key, WrittenPlaces& written) const;
 
  private:
   /// Absent when there is no file.

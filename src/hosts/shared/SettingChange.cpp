@@ -68,8 +68,6 @@ class Change {
   using Look = std::function<Result<Sight>()>;
   using Before = std::optional<Sight>;  ///< absent: there was nothing to look at, or the look failed
 
-  static constexpr std::chrono::seconds longestSettling{3};
-
   bool isRead() const { return _steps.live || _steps.stored; }
 
   bool isTaken() {

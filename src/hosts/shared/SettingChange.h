@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <concepts>
 #include <cstdint>
 #include <functional>
@@ -13,6 +14,7 @@
 #include "base/Result.h"
 #include "base/RunLoop.h"
 #include "effects/EffectSink.h"
+#include "hosts/shared/WrittenPlaces.h"
 
 namespace tavisk {
 
@@ -49,6 +51,15 @@ using Support = Result<std::optional<NotSupported>>;
 
 /// Whether what is asked of a machine is done, or only foretold: found out as far as that goes without touching it.
 enum class Conduct { change, forecast };
+
+/// What the tool itself stores of a setting, apart from what others do. Without `isThere` it has no place of its own.
+struct OwnPart {
+  std::function<Result<bool>()> isThere;
+  /// Why it would not be taken away: found out without touching anything.
+  std::function<Result<void>()> check;
+  /// The places from which it was taken are added, whatever comes of the rest.
+  std::function<Result<void>(WrittenPlaces& taken)> takeAway;
+};
 
 /// A remark that is the same whatever is asked.
 inline auto saying(std::string text) {
@@ -87,6 +98,11 @@ struct Setting {
   std::function<Value(const Value& asked)> liveFor;
   /// Whether the live value has reached what was asked; asked again after each event, for at most 3 s.
   std::function<bool(const Value& value)> settled;
+  OwnPart own;
+  /// Puts into force what is stored, where that is more than apply() of its value; empty: it is not.
+  std::function<Result<void>()> applyStored;
+  /// What is in force after a restart where nothing is stored; absent: it is not known.
+  std::optional<Value> withoutStored;
   /// Puts back what store() has replaced, when the value has not become what was asked; empty: what is stored stays.
   std::function<Result<void>()> takeBack;
   /// Write although live and stored already have the value (a machine that counts its operations).
@@ -114,6 +130,8 @@ std::optional<Value> observe(const Setting<Value>& setting, EffectSink& effects)
 
 /// What is behind the two, with the values as texts.
 namespace change {
+
+inline constexpr std::chrono::seconds longestSettling{3};
 
 /// What a read came to: its text, absent without a value, and whether it is what was asked for.
 struct Sight {

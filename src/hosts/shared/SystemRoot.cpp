@@ -35,6 +35,15 @@ Result<void> needsRegularFile(const FileDescriptor& file, const std::string& pat
   return {};
 }
 
+/// The same as SystemRoot::isThere() where no link can lead out, in one call for its three.
+Result<bool> isInSystem(const std::string& path) {
+  if (auto why = whyUnusable(path)) return *why;
+  if (::faccessat(AT_FDCWD, path.c_str(), F_OK, AT_EACCESS) == 0) return true;
+  auto failure = systemFailure("look for", path, errno);
+  if (isAbsent(failure)) return false;
+  return failure;
+}
+
 /// The path as names with "/" before them, where one look is enough for it: it exists, without a link in it.
 std::optional<std::string> plainPath(const FileDescriptor& prefix, const std::string& path) {
   std::string plain;
@@ -96,6 +105,18 @@ Result<bool> SystemRoot::isThere(const std::string& path) const {
   const auto found = orAbsent(open(path, O_PATH));
   if (!found) return retold(found.failure(), "look for", path);
   return found->has_value();
+}
+
+Result<std::vector<std::string>> SystemRoot::thoseThere(std::vector<std::string> paths) const {
+  std::optional<Failure> failure;
+  std::erase_if(paths, [&](const auto& path) {
+    if (failure) return false;
+    const auto found = _prefix == "/" ? isInSystem(path) : isThere(path);
+    if (!found) failure = found.failure();
+    return found && !*found;
+  });
+  if (failure) return *failure;
+  return paths;
 }
 
 std::optional<FileStamp> SystemRoot::stamp(const std::string& path) const {

@@ -39,6 +39,8 @@ class SystemRoot {
   /// Whether something is at the path; a link that leads nowhere is nothing. Absent is what isAbsent() says: whatever
   /// else keeps it from being looked at is a failure.
   Result<bool> isThere(const std::string& path) const;
+  /// Those of the paths where something is, in their order; none of them is in /proc.
+  Result<std::vector<std::string>> thoseThere(std::vector<std::string> paths) const;
   /// Absent when there is no such file or it cannot be looked at. Links among the folders of the path are followed out
   /// of the prefix too: this only tells whether to read again, and is asked often.
   std::optional<FileStamp> stamp(const std::string& path) const;

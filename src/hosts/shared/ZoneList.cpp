@@ -4,7 +4,7 @@
 
 #include <algorithm>
 #include <set>
-#include <sstream>
+#include <string_view>
 
 #include "base/Text.h"
 
@@ -22,26 +22,31 @@ Result<std::string> readTable(const SystemRoot& root, const char* name) {
   return orEmpty(root.read(ZoneName{name}.file(), largestTable));
 }
 
-/// The fields of each line, as white space separates them.
 template <typename Use>
-void forEachLine(const std::string& text, Use use) {
-  std::istringstream lines(text);
-  for (std::string line; std::getline(lines, line);) use(split(line, " \t"));
+void forEachLine(std::string_view text, Use use) {
+  while (!text.empty()) {
+    const auto line = text.substr(0, text.find('\n'));
+    text.remove_prefix(std::min(line.size() + 1, text.size()));
+    use(line);
+  }
 }
 
-Names namesOfSource(const std::string& text) {
+Names namesOfSource(std::string_view text) {
   Names names;
-  forEachLine(text, [&](const std::vector<std::string>& fields) {
+  forEachLine(text, [&](std::string_view line) {
+    if (!line.starts_with('Z') && !line.starts_with('L')) return;
+    const auto fields = split(line, " \t");
     if (fields.size() > 1 && fields[0] == "Z") names.insert(fields[1]);
     if (fields.size() > 2 && fields[0] == "L") names.insert(fields[2]);
   });
   return names;
 }
 
-Names namesOfTable(const std::string& text) {
+Names namesOfTable(std::string_view text) {
   Names names;
   if (!text.empty()) names.insert("UTC");
-  forEachLine(text, [&](const std::vector<std::string>& fields) {
+  forEachLine(text, [&](std::string_view line) {
+    const auto fields = split(line, " \t");
     if (fields.size() > 2 && !fields[0].starts_with('#')) names.insert(fields[2]);
   });
   return names;
@@ -49,13 +54,14 @@ Names namesOfTable(const std::string& text) {
 
 /// Those that have a file: the source and the table also name zones that a package of their own brings.
 Result<Names> installedOf(const SystemRoot& root, const Names& names) {
-  Names installed;
+  std::vector<std::string> files;
   for (const auto& name : names) {
-    if (!ZoneName{name}.isWellFormed()) continue;
-    const auto there = root.isThere(ZoneName{name}.file());
-    if (!there) return there.failure();
-    if (*there) installed.insert(name);
+    if (const ZoneName zone{name}; zone.isWellFormed()) files.push_back(zone.file());
   }
+  const auto there = root.thoseThere(std::move(files));
+  if (!there) return there.failure();
+  Names installed;
+  for (const auto& file : *there) installed.insert(installed.end(), file.substr(ZoneName::folder.size()));
   return installed;
 }
 
@@ -94,7 +100,7 @@ Result<Names> compiledZones(const SystemRoot& root) {
   return names;
 }
 
-Result<Names> zonesNamedBy(const SystemRoot& root, const char* table, Names (*namesOf)(const std::string& text)) {
+Result<Names> zonesNamedBy(const SystemRoot& root, const char* table, Names (*namesOf)(std::string_view text)) {
   const auto text = readTable(root, table);
   if (!text) return text.failure();
   return installedOf(root, namesOf(*text));

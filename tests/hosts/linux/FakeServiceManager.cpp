@@ -84,7 +84,11 @@ int FakeServiceManager::answerFault(sd_bus_message* message, Fault fault) {
 int FakeServiceManager::answer(sd_bus_message* message, const std::string& member) {
   if (member == "Get") return answerProperty(message);
   if (member == "GetAll") return answerAllProperties(message);
-  if (member == "ListUnitsByNames") return answerUnits(message);
+  if (member == "ListUnitsByNames") return answerUnits(message, true);
+  if (member == "ListUnitsByPatterns") {
+    sd_bus_message_skip(message, "as");  // states
+    return answerUnits(message, false);
+  }
   if (member == "LoadUnit") return sd_bus_reply_method_return(message, "o", pathOf(firstText(message)).c_str());
   if (member == "GetUnitFileState")
     return sd_bus_reply_method_return(message, "s", _units[firstText(message)].file.c_str());
@@ -95,7 +99,7 @@ int FakeServiceManager::answer(sd_bus_message* message, const std::string& membe
   return member.ends_with("Files") ? answerFiles(message, member) : answerJob(message, member);
 }
 
-int FakeServiceManager::answerUnits(sd_bus_message* message) {
+int FakeServiceManager::answerUnits(sd_bus_message* message, bool loads) {
   sd_bus_message* reply = nullptr;
   sd_bus_message_new_method_return(message, &reply);
   sd_bus_message_open_container(reply, 'a', "(ssssssouso)");
@@ -103,6 +107,7 @@ int FakeServiceManager::answerUnits(sd_bus_message* message) {
   const char* unit = nullptr;
   while (sd_bus_message_read_basic(message, 's', &unit) > 0) {
     const auto known = _units.find(unit);
+    if (known == _units.end() && !loads) continue;
     const auto state = known == _units.end() ? FakeUnit{"not-found"} : known->second;
     std::this_thread::sleep_for(state.delay);
     sd_bus_message_append(reply, "(ssssssouso)", unit, "", state.load.c_str(), state.active.c_str(), "", "",

@@ -48,7 +48,7 @@ class FakeServiceManager {
   int receive(sd_bus_message* message, const std::string& member);
   int answer(sd_bus_message* message, const std::string& member);
   int answerFault(sd_bus_message* message, Fault fault);
-  int answerUnits(sd_bus_message* message);
+  int answerUnits(sd_bus_message* message, bool loads);
   int answerProperty(sd_bus_message* message);
   int answerAllProperties(sd_bus_message* message);
   FakeUnit unitOf(sd_bus_message* message);

@@ -54,6 +54,11 @@ rm -f "$root/etc/rc2.d/"*"$1"
     std::filesystem::remove_all(at(path));
     link(path, at(path).filename());
   }
+  /// Where its message bus is: from now on it is a machine whose services are managed.
+  std::filesystem::path socketOfServices() {
+    write("/run/systemd/system/x", "");
+    return at("/run/dbus/system_bus_socket");
+  }
   std::filesystem::path at(const std::string& path) const {
     return _folder.path() / std::filesystem::path(path).relative_path();
   }

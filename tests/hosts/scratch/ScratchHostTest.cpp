@@ -7,7 +7,6 @@
 #include "ScratchMachine.h"
 #include "base/FileDescriptor.h"
 #include "base/Keys.h"
-#include "platform/AdminAuthenticatorContract.h"
 #include "platform/BootLoaderFileContract.h"
 #include "platform/ClockContract.h"
 #include "platform/DiskEventsContract.h"
@@ -33,9 +32,6 @@ struct ScratchService {
   const std::vector<SettingValue>& values() { return machine.log.values; }
   ScratchMachine machine;
 };
-
-using ScratchAuthenticator = ScratchService<&Host::authenticator>;
-INSTANTIATE_TYPED_TEST_SUITE_P(Scratch, AdminAuthenticatorContract, ScratchAuthenticator);
 
 struct ScratchClock : ScratchService<&Host::clock> {
   static constexpr bool setsClock = true;

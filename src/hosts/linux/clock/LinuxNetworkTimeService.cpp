@@ -9,6 +9,7 @@
 #include "hosts/linux/clock/SystemClock.h"
 #include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/ConfigurationLines.h"
+#include "hosts/linux/system/OwnFiles.h"
 #include "hosts/linux/system/Program.h"
 #include "hosts/linux/system/Rights.h"
 
@@ -269,6 +270,38 @@ Result<void> LinuxNetworkTimeService::checkServer(const TimeDaemon& client, cons
 
 Result<void> LinuxNetworkTimeService::putBack(const TimeDaemon& client, const std::optional<std::string>& lines) {
   return lines ? _machine.root.write(client.serverFile, *lines) : _machine.root.remove(client.serverFile);
+}
+
+OwnPart LinuxNetworkTimeService::ownServerFiles() const {
+  const auto isThere = [this]() -> Result<bool> {
+    for (const auto* file : ownfile::timeServers)
+      if (auto there = _machine.root.isThere(file); !there || *there) return there;
+    return false;
+  };
+  const auto takeAway = [this](WrittenPlaces& taken) -> Result<void> {
+    for (const auto* file : ownfile::timeServers) {
+      const auto there = _machine.root.isThere(file);
+      if (!there) return there.failure();
+      if (!*there) continue;
+      if (auto removed = _machine.root.remove(file); !removed) return removed;
+      taken.add(file);
+    }
+    return {};
+  };
+  const auto check = []() -> Result<void> {
+    if (auto failure = whyNeedsRoot("remove", ownfile::name)) return *failure;
+    return {};
+  };
+  return {.isThere = isThere, .check = check, .takeAway = takeAway};
+}
+
+void LinuxNetworkTimeService::resetServer() {
+  auto setting = serverSetting();
+  setting.own = ownServerFiles();
+  _isServerChanged = reset(setting, _machine).changed || _isServerChanged;
+  if (!_isServerChanged) return;
+  const auto running = runs(client());
+  if (!running || *running) restartAsynchronously();
 }
 
 /// A client that has read its servers as they are goes on undisturbed.

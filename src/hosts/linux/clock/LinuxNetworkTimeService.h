@@ -26,6 +26,9 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   void setServer(const NetworkTimeServer& server) override;
   void restartAsynchronously() override;
 
+  /// Takes the tool's own files away, those that other clients would read too; see ResetService.
+  void resetServer();
+
  private:
   Daemons& daemons();
   /// The first daemon that is installed, else the first that is masked, else none.
@@ -47,6 +50,7 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   static Result<void> checkServer(const TimeDaemon& client, const std::string& address);
   Result<void> putBack(const TimeDaemon& client, const std::optional<std::string>& lines);
   Result<void> reload(const TimeDaemon& client);
+  OwnPart ownServerFiles() const;
 
   LinuxMachine _machine;
   bool _isServerChanged = false;  ///< since the client was last told to read it

@@ -21,10 +21,11 @@ Result<std::optional<std::string>> localTimeTarget(const SystemRoot& root) {
   return isNoLink ? Result<std::optional<std::string>>(std::nullopt) : orAbsent(target);
 }
 
+/// A failure without a code is that of what is no zone: a folder, or too large.
 Result<bool> hasRules(const SystemRoot& root, const ZoneName& zone, const std::string& rules) {
   const auto its = orAbsent(root.read(zone.file(), largestZone));
-  if (!its) return its.failure();
-  return *its == rules;
+  if (!its && its.failure().code) return its.failure();
+  return its && *its == rules;
 }
 
 /// As the second copy of the name says; UTC where that names none.

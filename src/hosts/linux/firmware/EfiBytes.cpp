@@ -71,7 +71,11 @@ std::string toUtf16(std::string_view text) {
 }
 
 std::string fromUtf16(std::string_view bytes) {
-  return decodedText(std::string(byteOrderMark).append(bytes));
+  constexpr std::string_view nul("\0\0", 2);
+  std::string text;
+  // Behind the mark it would make that of UTF-32.
+  for (; bytes.starts_with(nul); bytes.remove_prefix(nul.size())) text += '\0';
+  return text + decodedText(std::string(byteOrderMark).append(bytes));
 }
 
 std::optional<std::string> guidBytes(std::string_view text) {

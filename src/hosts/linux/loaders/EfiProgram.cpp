@@ -41,12 +41,12 @@ std::string untilZero(std::string_view bytes) {
 /// The first ".efi" file of GRUB that is named in UTF-16, as shim keeps the name of the loader that it starts.
 std::string loaderNamedIn(std::string_view data) {
   const auto beginning = toUtf16("\\grub");
-  const auto ending = toUtf16(".efi");
+  constexpr std::string_view ending = ".efi";
   constexpr std::size_t longestName = 64;
   for (auto found = data.find(beginning); found != std::string_view::npos; found = data.find(beginning, found + 1)) {
-    const auto name = data.substr(found + 2, longestName);
-    if (const auto end = name.find(ending); end != std::string_view::npos)
-      return fromUtf16(name.substr(0, end + ending.size()));
+    const auto text = fromUtf16(data.substr(found + 2, longestName));
+    const auto name = text.substr(0, text.find('\0'));
+    if (const auto end = name.find(ending); end != std::string::npos) return name.substr(0, end + ending.size());
   }
   return {};
 }

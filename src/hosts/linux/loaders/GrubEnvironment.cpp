@@ -2,7 +2,6 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/loaders/GrubEnvironment.h"
 
-#include <algorithm>
 #include <utility>
 #include <vector>
 
@@ -20,28 +19,30 @@ struct Line {
 };
 using Lines = std::vector<Line>;
 
-/// A value's newline and backslash are written behind a backslash.
-std::string takeLine(std::string_view& rest) {
+/// A value's newline and backslash are written behind a backslash. Absent when the line has no end.
+std::optional<std::string> takeLine(std::string_view& rest) {
   std::string line;
   std::size_t size = 0;
   while (size < rest.size() && rest[size] != '\n') {
     if (rest[size] == '\\' && size + 1 < rest.size()) ++size;
     line += rest[size++];
   }
-  rest.remove_prefix(std::min(size + 1, rest.size()));
+  if (size >= rest.size()) return std::nullopt;
+  rest.remove_prefix(size + 1);
   return line;
 }
 
-/// Absent when it is neither a remark nor a variable.
+/// Absent when it is neither a remark nor a variable, or has no end.
 std::optional<Line> nextLine(std::string_view& rest) {
   const auto whole = rest;
   const auto text = takeLine(rest);
+  if (!text) return std::nullopt;
   Line line{whole.substr(0, whole.size() - rest.size()), "", ""};
   if (whole.front() == filler) return line;
-  const auto sign = text.find('=');
+  const auto sign = text->find('=');
   if (sign == std::string::npos || sign == 0) return std::nullopt;
-  line.name = text.substr(0, sign);
-  line.value = text.substr(sign + 1);
+  line.name = text->substr(0, sign);
+  line.value = text->substr(sign + 1);
   return line;
 }
 
@@ -49,7 +50,6 @@ std::optional<Line> nextLine(std::string_view& rest) {
 std::optional<Lines> linesIn(std::string_view block) {
   if (block.size() != environmentSize || !block.starts_with(signature)) return std::nullopt;
   auto rest = block.substr(0, block.find_last_not_of(filler) + 1);
-  if (rest.back() != '\n') return std::nullopt;
   rest.remove_prefix(signature.size());
   Lines lines;
   while (!rest.empty()) {

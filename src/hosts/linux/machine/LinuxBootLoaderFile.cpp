@@ -16,12 +16,20 @@ Result<std::optional<PropertyList::Dictionary>> LinuxBootLoaderFile::read() {
 bool LinuxBootLoaderFile::write(const PropertyList::Dictionary& contents) {
   auto setting = kernelArchitecture(_file, contents);
   setting.note = saying("stored; no boot loader here reads it");
-  setting.check = [](const std::string&) {
-    const auto failure = whyNeedsRoot("write", path);
-    return failure ? Result<void>(*failure) : Result<void>();
-  };
+  setting.check = [](const std::string&) { return check(); };
   const auto effect = carryOut(setting, architectureIn(contents), _machine);
   return effect.outcome != Outcome::failed;
+}
+
+void LinuxBootLoaderFile::reset() {
+  auto setting = kernelArchitecture(_file);
+  setting.own.check = check;
+  tavisk::reset(setting, _machine);
+}
+
+Result<void> LinuxBootLoaderFile::check() {
+  const auto failure = whyNeedsRoot("write", path);
+  return failure ? Result<void>(*failure) : Result<void>();
 }
 
 }  // namespace tavisk

@@ -16,7 +16,12 @@ class LinuxBootLoaderFile final : public BootLoaderFile {
   Result<std::optional<PropertyList::Dictionary>> read() override;
   bool write(const PropertyList::Dictionary& contents) override;
 
+  /// Takes the architecture out of the file; see ResetService.
+  void reset();
+
  private:
+  static Result<void> check();
+
   LinuxMachine _machine;
   PropertyListFile _file;
 };

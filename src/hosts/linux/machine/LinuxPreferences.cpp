@@ -56,6 +56,15 @@ void LinuxPreferencesStore::writeOut() {
   }
 }
 
+void LinuxPreferencesStore::resetKeyboardLock() {
+  const auto held = hold(_machine);
+  auto setting = preference(DunmereLockEnclosureStateKey);
+  setting.own = ownKey(_file, DunmereLockEnclosureStateKey);
+  setting.own.check = [this] { return check(); };
+  const auto effect = reset(setting, _machine, held);
+  if (effect.outcome == Outcome::applied) _lock.setDisablesKeyboard(false, held);
+}
+
 Result<void> LinuxPreferencesStore::check() const {
   if (const auto failure = whyNeedsRoot("write", _file.path())) return *failure;
   const auto present = _file.readToChange();

@@ -32,6 +32,8 @@ class LinuxPreferencesStore final : public PreferencesStore {
   void setDisablesKeyboard(bool disables) { _disablesKeyboard = disables; }
   void setBoolean(const std::string& key, bool value) { _pending.emplace_back(key, value); }
   void writeOut();
+  /// Takes the preference out of the file, and enables the keyboards; see ResetService.
+  void resetKeyboardLock();
 
  private:
   Setting<bool> preference(const std::string& key);

@@ -44,8 +44,10 @@ std::vector<std::string> namesAfter(const std::vector<std::string>& names, const
   const auto add = [&result](const std::string& name) {
     if (std::ranges::find(result, name) == result.end()) result.push_back(name);
   };
+  const auto isOther = [&](const std::string& name) { return name != before && firstLabel(name) != oldLabel; };
+  if (std::ranges::all_of(names, isOther)) return names;
   for (const auto& name : names) {
-    if (name != before && firstLabel(name) != oldLabel) {
+    if (isOther(name)) {
       add(name);
     } else if (now != newLabel) {
       add(now);
@@ -99,11 +101,12 @@ bool nameIt(const std::vector<std::string>& names, const std::string& machine) {
 }
 
 /// The names of a line that has none which is known: the machine's own in front of them. They may be somebody's
-/// aliases.
+/// aliases. Each name stands once.
 std::vector<std::string> namesWithOwn(const std::vector<std::string>& names, const std::string& now) {
   std::vector<std::string> all{now};
   if (now != firstLabel(now)) all.push_back(firstLabel(now));
-  all.insert(all.end(), names.begin(), names.end());
+  for (const auto& name : names)
+    if (std::ranges::find(all, name) == all.end()) all.push_back(name);
   return all;
 }
 

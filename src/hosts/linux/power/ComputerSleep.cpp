@@ -217,6 +217,15 @@ Result<void> ComputerSleep::store(const std::map<std::string, std::string>& valu
       {.write = [&] { return _config.setOwn(loginSection, values); }, .isHeeded = isHeeded, .hidingFile = hidingFile});
 }
 
+OwnPart ComputerSleep::ownPart(const std::vector<std::string>& keys) const {
+  const auto takeAway = [this, keys](WrittenPlaces& taken) {
+    return _ownFile.notingChange(taken, [&] { return _config.removeOwn(loginSection, keys); });
+  };
+  return {.isThere = [this, keys] { return _config.hasOwn(loginSection, keys); },
+          .check = [this] { return _ownFile.check(); },
+          .takeAway = takeAway};
+}
+
 Result<void> ComputerSleep::storeMinutes(Minutes asked) {
   const auto isHeeded = [&]() -> Result<bool> {
     const auto minutes = storedMinutes();
@@ -297,6 +306,7 @@ Setting<Minutes> ComputerSleep::computerSleep() {
   setting.live = [this] { return liveMinutes(); };
   setting.stored = [this] { return besideOwn(storedMinutes(), ownMinutes(), _ownFile.path()); };
   setting.check = [this](Minutes asked) { return _ownFile.check(whatHidesMinutes(asked)); };
+  setting.own = ownPart({action, actionTime});
   keepIn(_ownFile, setting, [this](Minutes asked) { return storeMinutes(asked); });
   setting.apply = [this](Minutes asked) { return restartService(asked); };
   return setting;
@@ -310,6 +320,7 @@ Setting<bool> ComputerSleep::powerButtonSleep() {
   setting.live = [this] { return liveButton(); };
   setting.stored = [this] { return besideOwn(storedButton(), ownButton(), _ownFile.path()); };
   setting.check = [this](bool sleeps) { return _ownFile.check(whatHidesButton(sleeps)); };
+  setting.own = ownPart({powerKey});
   keepIn(_ownFile, setting, [this](bool sleeps) { return storeButton(sleeps); });
   setting.apply = [this](bool) { return applyButton(); };
   setting.settled = onceButtonReads();

@@ -43,6 +43,8 @@ class ComputerSleep {
   std::string whatHidesButton(bool sleeps) const;
   Result<void> store(const std::map<std::string, std::string>& values, const std::function<Result<bool>()>& isHeeded,
                      const std::function<std::string()>& hidingFile);
+  /// These keys of the own drop-in.
+  OwnPart ownPart(const std::vector<std::string>& keys) const;
   Result<void> storeMinutes(Minutes asked);
   Result<void> storeButton(bool sleeps);
   std::string whoUndoesMinutes(Minutes asked);

@@ -134,6 +134,7 @@ Setting<Minutes> DisplaySleep::displaySleep() const {
   setting.live = [this] { return live(); };
   setting.apply = [this](Minutes asked) { return _console.write("\033[9;" + textOf(limited(asked)) + "]"); };
   setting.liveFor = limited;
+  setting.own = _file.asPart();
   if (!_machine.services.hasServiceManager()) return setting;
   setting.stored = [this] { return besideOwn(storedMinutes(), ownMinutes(), _file.path()); };
   setting.check = [this](Minutes asked) { return check(asked); };

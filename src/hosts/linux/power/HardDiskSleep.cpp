@@ -116,6 +116,8 @@ Setting<Minutes> HardDiskSleep::hardDiskSleep() const {
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.apply = [this](Minutes asked) { return apply(asked); };
+  // The kernel lets no disk sleep by itself.
+  setting.withoutStored = Minutes{};
   keepBy(_rule, _machine.root, setting);
   return setting;
 }

@@ -96,4 +96,16 @@ void LinuxPowerSettingsService::setRestartsAfterFreeze(bool restarts) {
   carryOut(_restartAfterFreeze.restartAfterFreeze(), restarts, _machine);
 }
 
+void LinuxPowerSettingsService::reset(SleepTimer timer) {
+  tavisk::reset(settingOf(timer), _machine);
+}
+
+void LinuxPowerSettingsService::reset(PowerSwitch which) {
+  tavisk::reset(settingOf(which), _machine);
+}
+
+void LinuxPowerSettingsService::resetRestartAfterFreeze() {
+  tavisk::reset(_restartAfterFreeze.restartAfterFreeze(), _machine);
+}
+
 }  // namespace tavisk

@@ -35,6 +35,11 @@ class LinuxPowerSettingsService final : public PowerSettingsService {
   bool restartsAfterFreeze() override;
   void setRestartsAfterFreeze(bool restarts) override;
 
+  /// Takes the tool's own files away; see ResetService.
+  void reset(SleepTimer timer);
+  void reset(PowerSwitch which);
+  void resetRestartAfterFreeze();
+
  private:
   Setting<Minutes> settingOf(SleepTimer timer);
   Setting<bool> settingOf(PowerSwitch which);

@@ -26,6 +26,18 @@ Result<void> OwnFile::putBack(const std::optional<std::string>& contents) const 
   return contents ? _root.write(_path, *contents) : _root.remove(_path);
 }
 
+OwnPart OwnFile::asPart() const {
+  const auto isThere = [this]() -> Result<bool> {
+    const auto present = contents();
+    if (!present) return present.failure();
+    return present->has_value();
+  };
+  const auto takeAway = [this](WrittenPlaces& taken) {
+    return notingChange(taken, [this] { return _root.remove(_path); });
+  };
+  return {.isThere = isThere, .check = [this] { return check(); }, .takeAway = takeAway};
+}
+
 Result<void> OwnFile::check(const std::string& hiding) const {
   if (auto failure = whyNeedsRoot("write", _path)) return *failure;
   if (!hiding.empty()) return Failure{"write", _path, hiding + " says otherwise"};
@@ -46,10 +58,17 @@ Result<void> OwnFile::changeIfHeeded(const Change& change) const {
 }
 
 Result<void> OwnFile::noting(WrittenPlaces& written, const std::function<Result<void>()>& step) const {
+  WrittenPlaces changed;
+  auto done = notingChange(changed, step);
+  if (done || !changed.text().empty()) written.add(_path);
+  return done;
+}
+
+Result<void> OwnFile::notingChange(WrittenPlaces& written, const std::function<Result<void>()>& step) const {
   const auto former = contents();
   auto done = step();
   const auto now = contents();
-  if (done || (former && (!now || *now != *former))) written.add(_path);
+  if (former && (!now || *now != *former)) written.add(_path);
   return done;
 }
 

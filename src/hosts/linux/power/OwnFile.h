@@ -30,6 +30,9 @@ class OwnFile {
   /// Makes the file what contents() said.
   Result<void> putBack(const std::optional<std::string>& contents) const;
 
+  /// The whole file as what the tool itself stores of a setting, for which it must outlive that.
+  OwnPart asPart() const;
+
   /// Why it would not be changed: by whoever runs this, or as another file, `hiding`, has the last word; empty: none
   /// has.
   Result<void> check(const std::string& hiding = "") const;
@@ -44,6 +47,8 @@ class OwnFile {
   Result<void> changeIfHeeded(const Change& change) const;
   /// Does this to the file, and adds it to the places when that was done, or has left other contents all the same.
   Result<void> noting(WrittenPlaces& written, const std::function<Result<void>()>& step) const;
+  /// Does this to the file, and adds it to the places when that has left other contents.
+  Result<void> notingChange(WrittenPlaces& written, const std::function<Result<void>()>& step) const;
 
  private:
   const SystemRoot& _root;

@@ -9,16 +9,12 @@
 #include <cerrno>
 #include <memory>
 
-#include "base/Path.h"
 #include "base/Text.h"
 #include "base/TimeSpan.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/DeviceValues.h"
-#include "hosts/linux/power/KernelParameter.h"
 #include "hosts/linux/services/SystemServices.h"
-#include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/KernelFile.h"
-#include "hosts/linux/system/Rights.h"
 
 namespace tavisk {
 namespace {
@@ -26,31 +22,11 @@ namespace {
 constexpr const char* managerSection = "Manager";
 constexpr const char* watchdogKey = "RuntimeWatchdogSec";
 constexpr const char* watchdogFacts = "/sys/class/watchdog/watchdog0/";
-constexpr const char* panicFile = "/proc/sys/kernel/panic";
 constexpr std::chrono::seconds watchdogTime{60};
-
-constexpr const char* ownPanicSeconds = "10";
-/// Read last where no service manager does it (sysctl(8), --system).
-constexpr const char* mainPanicFile = "/etc/sysctl.conf";
 
 Reading<bool> together(bool byWatchdog, bool onPanic) {
   if (byWatchdog == onPanic) return onPanic;
   return {true, onPanic ? "on after a kernel panic only" : "on by the watchdog only"};
-}
-
-bool isOnPanic(const std::string& seconds) {
-  return leadingInteger(seconds) != 0;
-}
-
-/// The value of kernel.panic in a file of sysctl.d(5).
-std::optional<std::string> panicIn(const std::string& text) {
-  constexpr std::string_view names[] = {"kernel.panic", "kernel/panic", "-kernel.panic", "-kernel/panic"};
-  std::optional<std::string> value;
-  for (const auto& line : configurationLines(text, "#;")) {
-    const auto words = split(line, " \t=");
-    if (words.size() == 2 && std::ranges::find(names, words[0]) != std::end(names)) value = words[1];
-  }
-  return value;
 }
 
 /// Absent when it is no time.
@@ -113,39 +89,6 @@ Result<bool> RestartAfterFreeze::isWatchdog(const char* fact, const char* word) 
   return *said == word;
 }
 
-Result<RestartAfterFreeze::StoredPanic> RestartAfterFreeze::storedPanic() const {
-  const auto parameter = kernelParameter(_machine.root, "panic");
-  if (!parameter) return parameter.failure();
-  auto files = configurationFiles(
-      _machine.root, {"/etc/sysctl.d/", "/run/sysctl.d/", "/usr/local/lib/sysctl.d/", "/usr/lib/sysctl.d/"});
-  if (!files) return files.failure();
-  auto inOrder = std::move(files).value();
-  if (!_machine.services.hasServiceManager()) inOrder.emplace_back(mainPanicFile);
-  StoredPanic found;
-  if (*parameter) found = {**parameter, kernelCommandLine, std::nullopt, **parameter, kernelCommandLine};
-  for (const auto& file : inOrder) {
-    const auto text = orEmpty(_machine.root.read(file, configurationLimit));
-    if (!text) return text.failure();
-    const auto value = panicIn(*text);
-    if (!value) continue;
-    found.seconds = *value;
-    found.from = file;
-    if (file == _panicFile.path()) {
-      found.own = *value;
-    } else {
-      found.others = *value;
-      found.othersFrom = file;
-    }
-  }
-  return found;
-}
-
-Result<bool> RestartAfterFreeze::isPanicStored() const {
-  const auto panic = storedPanic();
-  if (!panic) return panic.failure();
-  return isOnPanic(panic->seconds);
-}
-
 Result<bool> RestartAfterFreeze::isWatchdogStored() const {
   const auto time = _config.last(managerSection, watchdogKey);
   if (!time) return time.failure();
@@ -162,7 +105,7 @@ Result<std::optional<bool>> RestartAfterFreeze::isWatchdogInOwn() const {
 }
 
 Setting<bool>::Found RestartAfterFreeze::stored() const {
-  const auto panic = storedPanic();
+  const auto panic = _panic.stored();
   if (!panic) return panic.failure();
   const bool onPanic = isOnPanic(panic->seconds);
   const bool isManaged = _machine.services.hasServiceManager();
@@ -172,22 +115,9 @@ Setting<bool>::Found RestartAfterFreeze::stored() const {
   if (!ownWatchdog) return ownWatchdog.failure();
   auto found = together(*watchdog, onPanic);
   if (panic->own && isOnPanic(*panic->own) != onPanic)
-    found = whileWaits(found, isOnPanic(*panic->own), _panicFile.path());
+    found = whileWaits(found, isOnPanic(*panic->own), _panic.file().path());
   if (*ownWatchdog && **ownWatchdog != *watchdog) found = whileWaits(found, **ownWatchdog, _watchdogFile.path());
   return found;
-}
-
-/// Where others have a value to restart there is no need of the tool's own.
-Result<void> RestartAfterFreeze::checkPanic(bool restarts) const {
-  const auto before = storedPanic();
-  if (!before) return before.failure();
-  const auto& others = before->othersFrom;
-  if (restarts && !isOnPanic(before->others)) {
-    const bool isLater = others == mainPanicFile || baseName(others) > baseName(_panicFile.path());
-    return _panicFile.check(isLater && others != kernelCommandLine ? others : "");
-  }
-  const auto failure = before->own ? whyNeedsRoot("remove", _panicFile.path()) : std::nullopt;
-  return failure ? Result<void>(*failure) : Result<void>();
 }
 
 Result<bool> RestartAfterFreeze::isWatchdogKept(bool restarts) const {
@@ -205,23 +135,8 @@ Result<void> RestartAfterFreeze::checkWatchdog(bool restarts) const {
 }
 
 Result<void> RestartAfterFreeze::check(bool restarts) const {
-  if (auto panic = checkPanic(restarts); !panic) return panic;
+  if (auto panic = _panic.check(restarts); !panic) return panic;
   return _machine.services.hasServiceManager() ? checkWatchdog(restarts) : Result<void>();
-}
-
-Result<void> RestartAfterFreeze::storePanic(bool restarts) const {
-  const auto before = storedPanic();
-  if (!before) return before.failure();
-  if (!restarts || isOnPanic(before->others))
-    return before->own ? _machine.root.remove(_panicFile.path()) : Result<void>();
-  const auto hidingFile = [&] {
-    const auto after = storedPanic();
-    return after ? after->from : "";
-  };
-  return _panicFile.changeIfHeeded(
-      {.write = [&] { return _panicFile.replace(std::string("kernel.panic = ") + ownPanicSeconds + "\n"); },
-       .isHeeded = [&] { return isPanicStored(); },
-       .hidingFile = hidingFile});
 }
 
 Result<void> RestartAfterFreeze::storeWatchdog(bool restarts) const {
@@ -244,16 +159,34 @@ Result<void> RestartAfterFreeze::storeWatchdog(bool restarts) const {
 
 /// Both files, or none of them.
 Result<void> RestartAfterFreeze::store(bool restarts, WrittenPlaces& written) const {
-  const auto formerPanic = _panicFile.contents();
+  const auto formerPanic = _panic.file().contents();
   if (!formerPanic) return formerPanic.failure();
   const auto formerWatchdog = _watchdogFile.contents();
   if (!formerWatchdog) return formerWatchdog.failure();
-  const auto panic = storePanic(restarts);
+  const auto panic = _panic.store(restarts);
   const auto watchdog = panic && _machine.services.hasServiceManager() ? storeWatchdog(restarts) : Result<void>();
-  if (panic && !watchdog) static_cast<void>(_panicFile.putBack(*formerPanic));
-  for (const auto& [file, former] : {std::pair(&_watchdogFile, *formerWatchdog), {&_panicFile, *formerPanic}})
+  if (panic && !watchdog) static_cast<void>(_panic.file().putBack(*formerPanic));
+  for (const auto& [file, former] : {std::pair(&_watchdogFile, *formerWatchdog), {&_panic.file(), *formerPanic}})
     if (const auto now = file->contents(); !now || *now != former) written.add(file->path());
   return panic ? watchdog : panic;
+}
+
+Result<bool> RestartAfterFreeze::hasOwn() const {
+  const auto panic = _panic.file().contents();
+  if (!panic) return panic.failure();
+  return *panic ? true : _config.hasOwn(managerSection, {watchdogKey});
+}
+
+/// Both files, or none of them.
+Result<void> RestartAfterFreeze::takeOwnAway(WrittenPlaces& taken) const {
+  const auto formerPanic = _panic.file().contents();
+  if (!formerPanic) return formerPanic.failure();
+  if (auto panic = _machine.root.remove(_panic.file().path()); !panic) return panic;
+  auto watchdog =
+      _watchdogFile.notingChange(taken, [this] { return _config.removeOwn(managerSection, {watchdogKey}); });
+  const bool isPutBack = !watchdog && *formerPanic && _panic.file().putBack(*formerPanic);
+  if (*formerPanic && !isPutBack) taken.add(_panic.file().path());
+  return watchdog;
 }
 
 /// A watchdog that cannot be stopped would soon reset the machine.
@@ -293,20 +226,20 @@ Result<void> RestartAfterFreeze::turnWatchdogOn() const {
   return *isUsed && !*isIdle ? Result<void>() : setWatchdogTime(watchdogTime);
 }
 
-Result<void> RestartAfterFreeze::applyPanic(bool restarts) const {
-  const auto seconds = readKernelFile(_machine.root, panicFile);
-  if (!seconds) return seconds.failure();
-  if (restarts && isOnPanic(*seconds)) return {};
-  const auto panic = storedPanic();
-  if (!panic) return panic.failure();
-  const auto wanted = isOnPanic(panic->others) ? panic->others : restarts ? ownPanicSeconds : "0";
-  return wanted == *seconds ? Result<void>() : writeKernelFile(_machine.root, panicFile, wanted);
-}
-
 Result<void> RestartAfterFreeze::apply(bool restarts) const {
-  auto panic = applyPanic(restarts);
+  auto panic = _panic.apply(restarts);
   if (!_machine.services.hasServiceManager()) return panic;
   const auto watchdog = restarts ? turnWatchdogOn() : turnWatchdogOff();
+  return panic ? watchdog : panic;
+}
+
+/// Others may have left the one on and the other off.
+Result<void> RestartAfterFreeze::applyStored() const {
+  auto panic = _panic.applyStored();
+  const auto isManaged = _machine.services.hasServiceManager();
+  const auto isStored = isManaged ? isWatchdogStored() : Result<bool>(false);
+  if (!isStored) return isStored.failure();
+  const auto watchdog = !isManaged ? Result<void>() : *isStored ? turnWatchdogOn() : turnWatchdogOff();
   return panic ? watchdog : panic;
 }
 
@@ -318,15 +251,15 @@ std::string RestartAfterFreeze::whatHidesWatchdog(bool restarts) const {
 std::string RestartAfterFreeze::whatUndoes(bool restarts) const {
   auto file = whatHidesWatchdog(restarts);
   if (!file.empty()) return file;
-  const auto panic = storedPanic();
-  return panic && panic->from != _panicFile.path() && isOnPanic(panic->seconds) != restarts ? panic->from : "";
+  const auto panic = _panic.stored();
+  return panic && panic->from != _panic.file().path() && isOnPanic(panic->seconds) != restarts ? panic->from : "";
 }
 
 Setting<bool> RestartAfterFreeze::restartAfterFreeze() const {
   const auto written = std::make_shared<WrittenPlaces>();
   Setting<bool> setting;
   setting.name = setting::restartAfterFreeze;
-  setting.where = _panicFile.path();
+  setting.where = _panic.file().path();
   if (_machine.services.hasServiceManager()) setting.where = _config.ownDropIn() + ", " + setting.where;
   setting.written = [written] { return written->text(); };
   setting.undoneBy = [this](bool restarts) { return whatUndoes(restarts); };
@@ -344,6 +277,10 @@ Setting<bool> RestartAfterFreeze::restartAfterFreeze() const {
   };
   setting.store = [this, written](bool restarts) { return store(restarts, *written); };
   setting.apply = [this](bool restarts) { return apply(restarts); };
+  setting.own = {.isThere = [this] { return hasOwn(); },
+                 .check = [this] { return _panic.file().check(); },
+                 .takeAway = [this](WrittenPlaces& taken) { return takeOwnAway(taken); }};
+  setting.applyStored = [this] { return applyStored(); };
   return setting;
 }
 

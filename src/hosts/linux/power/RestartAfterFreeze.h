@@ -2,9 +2,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include "hosts/linux/power/KernelPanic.h"
 #include "hosts/linux/power/OwnFile.h"
 #include "hosts/linux/services/LinuxMachine.h"
-#include "hosts/linux/system/OwnFiles.h"
 #include "hosts/linux/system/SystemdConfig.h"
 #include "hosts/shared/SettingChange.h"
 
@@ -20,7 +20,7 @@ class RestartAfterFreeze {
       : _machine(machine),
         _config(machine.root, "system.conf"),
         _watchdogFile(machine.root, _config.ownDropIn()),
-        _panicFile(machine.root, ownfile::kernelPanic) {}
+        _panic(machine) {}
 
   /// Refers to the object.
   Setting<bool> restartAfterFreeze() const;
@@ -38,19 +38,7 @@ class RestartAfterFreeze {
   /// Absent when the tool's own drop-in does not say.
   Result<std::optional<bool>> isWatchdogInOwn() const;
 
-  /// What is told the kernel about kernel.panic when it starts.
-  struct StoredPanic {
-    std::string seconds = "0";
-    std::string from;  ///< the file that has the last word; empty: none says anything
-    std::optional<std::string> own;
-    std::string others = "0";  ///< what it would be without the tool's own file
-    std::string othersFrom;    ///< the file that says so; empty: none does
-  };
-  Result<StoredPanic> storedPanic() const;
-  Result<bool> isPanicStored() const;
-
   Result<void> check(bool restarts) const;
-  Result<void> checkPanic(bool restarts) const;
   Result<void> checkWatchdog(bool restarts) const;
   /// Whether both are as asked and nothing of it has to be written.
   Result<bool> isWatchdogKept(bool restarts) const;
@@ -58,10 +46,11 @@ class RestartAfterFreeze {
   Result<void> checkWatchdogStops() const;
   /// The places that were written are added.
   Result<void> store(bool restarts, WrittenPlaces& written) const;
-  Result<void> storePanic(bool restarts) const;
   Result<void> storeWatchdog(bool restarts) const;
   Result<void> apply(bool restarts) const;
-  Result<void> applyPanic(bool restarts) const;
+  Result<bool> hasOwn() const;
+  Result<void> takeOwnAway(WrittenPlaces& taken) const;
+  Result<void> applyStored() const;
   Result<void> turnWatchdogOn() const;
   Result<void> turnWatchdogOff() const;
   Result<void> setWatchdogTime(std::chrono::microseconds time) const;
@@ -71,7 +60,7 @@ class RestartAfterFreeze {
   LinuxMachine _machine;
   SystemdConfig _config;
   OwnFile _watchdogFile;
-  OwnFile _panicFile;
+  KernelPanic _panic;
 };
 
 }  // namespace tavisk

@@ -28,6 +28,7 @@ class UdevRule {
   Result<std::optional<Value>> value() const;
   Result<void> check() const { return _file.check(); }
   Result<void> write(Value value) const;
+  OwnPart asPart() const { return _file.asPart(); }
 
  private:
   std::string linesFor(Value value) const;
@@ -48,6 +49,7 @@ std::string whyNoRuleLasts(const SystemRoot& root);
 /// Has the rule keep the setting, where a device manager reads it. The rule must outlive the setting.
 template <typename Value>
 void keepBy(const UdevRule<Value>& rule, const SystemRoot& root, Setting<Value>& setting) {
+  setting.own = rule.asPart();
   if (const auto reason = whyNoRuleLasts(root); !reason.empty()) {
     setting.note = saying(reason);
     return;

@@ -78,6 +78,8 @@ Setting<bool> WakeOnModem::wakeOnModem() const {
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.apply = [this](bool wakes) { return apply(wakes); };
+  // The kernel has no port wake the machine by itself.
+  setting.withoutStored = false;
   keepBy(_rule, _machine.root, setting);
   return setting;
 }

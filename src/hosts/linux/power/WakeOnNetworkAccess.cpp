@@ -17,7 +17,6 @@
 #include "effects/SettingNames.h"
 #include "hosts/linux/power/DeviceValues.h"
 #include "hosts/linux/power/OtherOwners.h"
-#include "hosts/linux/power/OwnFile.h"
 #include "hosts/linux/power/PowerLimits.h"
 #include "hosts/linux/power/UdevRule.h"
 #include "hosts/linux/system/ConfigurationLines.h"
@@ -33,6 +32,7 @@ namespace {
 static_assert(magicPacket == WAKE_MAGIC);
 
 constexpr const char* cardFolder = "/sys/class/net/";
+constexpr const char* linkFolder = "/etc/systemd/network";
 constexpr const char* usualLinkFile = "99-default.link";
 constexpr const char* linkSection = "Link";
 constexpr const char* wakeKey = "WakeOnLan";
@@ -204,6 +204,30 @@ Result<void> WakeOnNetworkAccess::storeIn(const std::string& linkFile, bool wake
   });
 }
 
+Result<std::vector<OwnFile>> WakeOnNetworkAccess::ownDropIns() const {
+  return ofEachIn(_machine.root, linkFolder, [this](const std::string& name) -> Result<std::optional<OwnFile>> {
+    constexpr std::string_view ending = ".d";
+    if (!name.ends_with(".link.d")) return std::nullopt;
+    const OwnFile file(_machine.root, ownfile::linkDropIn(name.substr(0, name.size() - ending.size())));
+    const auto contents = file.contents();
+    if (!contents) return contents.failure();
+    return *contents ? std::optional(file) : std::nullopt;
+  });
+}
+
+OwnPart WakeOnNetworkAccess::ownPart() const {
+  const auto isThere = [this]() -> Result<bool> {
+    const auto files = ownDropIns();
+    if (!files) return files.failure();
+    return !files->empty();
+  };
+  const auto check = [this] { return setEach(ownDropIns(), [](const OwnFile& file) { return file.check(); }); };
+  const auto takeAway = [this](WrittenPlaces& taken) {
+    return setEach(ownDropIns(), [&](const OwnFile& file) { return file.asPart().takeAway(taken); });
+  };
+  return {.isThere = isThere, .check = check, .takeAway = takeAway};
+}
+
 Result<void> WakeOnNetworkAccess::check(bool wakes) const {
   return setEach(linkFiles(), [&](const std::string& file) {
     return OwnFile(_machine.root, configOf(_machine.root, file).ownDropIn()).check(whatHides(file, wakes));
@@ -235,6 +259,7 @@ Setting<bool> WakeOnNetworkAccess::wakeOnNetworkAccess() const {
   setting.supported = [this] { return supported(); };
   setting.live = [this] { return live(); };
   setting.apply = [this](bool wakes) { return apply(wakes); };
+  setting.own = ownPart();
   if (const auto reason = whyItDoesNotLast(); !reason.empty()) {
     setting.note = saying(reason);
     return setting;

@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "hosts/linux/power/OwnFile.h"
 #include "hosts/linux/services/LinuxMachine.h"
 #include "hosts/shared/SettingChange.h"
 #include "hosts/shared/WrittenPlaces.h"
@@ -69,6 +70,9 @@ class WakeOnNetworkAccess {
   Result<bool> isMasked(const std::string& linkFile) const;
   Result<std::string> linkFileOf(const std::string& card) const;
   Result<void> storeIn(const std::string& linkFile, bool wakes, WrittenPlaces& written) const;
+  /// All drop-ins of the tool's, also beside link files that no card goes by any more.
+  Result<std::vector<OwnFile>> ownDropIns() const;
+  OwnPart ownPart() const;
   std::string whatHides(const std::string& linkFile, bool wakes) const;
   std::string whatUndoes(bool wakes) const;
   std::string whyItDoesNotLast() const;

@@ -187,7 +187,11 @@ Result<BusMessage> Bus::exchange(const BusObject& object, const char* member, co
 
 Result<BusMessage> Bus::property(const BusObject& object, const char* name, const char* signature) {
   const BusObject properties{object.service, object.path, propertiesInterface};
-  auto reply = call(properties, "Get", "v", object.interface, name);
+  const auto ask = [&] { return call(properties, "Get", "v", object.interface, name); };
+  auto reply = ask();
+  // A service that was about to leave, to be started anew, when it was asked.
+  if (!reply && reply.failure().code == std::errc::timed_out && !wasSilent(object))
+    if (auto second = ask()) reply = std::move(second);
   if (!reply) return retold(reply.failure(), name, object.path);
   auto value = std::move(reply).value();
   if (!value.enter('v', signature)) return Failure{name, object.path, "the value has another type than expected"};

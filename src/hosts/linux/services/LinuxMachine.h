@@ -10,6 +10,7 @@
 #include "hosts/linux/services/ServiceAccess.h"
 #include "hosts/linux/system/MachineLock.h"
 #include "hosts/shared/SettingChange.h"
+#include "hosts/shared/SettingReset.h"
 #include "hosts/shared/SystemRoot.h"
 
 namespace tavisk {
@@ -52,6 +53,19 @@ Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>
 template <typename Value>
 Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>& asked, const LinuxMachine& machine) {
   return carryOut(setting, asked, machine, hold(machine));
+}
+
+/// The same of reset().
+template <typename Value>
+Effect reset(const Setting<Value>& setting, const LinuxMachine& machine, const MachineHold& held) {
+  if (held) return reset(setting, machine.effects, machine.runLoop, machine.conduct);
+  Effect effect{.setting = setting.name, .outcome = Outcome::failed, .asked = resetAsked, .failure = held.failure()};
+  machine.effects.record(effect);
+  return effect;
+}
+template <typename Value>
+Effect reset(const Setting<Value>& setting, const LinuxMachine& machine) {
+  return reset(setting, machine, hold(machine));
 }
 
 }  // namespace tavisk

@@ -29,7 +29,7 @@ bool ServiceAccess::hasServiceManager() {
 
 Result<const SystemdLibrary*> ServiceAccess::library() {
   if (!_library) {
-    const auto opened = openSystemdLibrary();
+    const auto opened = _openLibrary();
     if (!opened) return opened.failure();
     _library = *opened;
   }

@@ -17,8 +17,10 @@ namespace tavisk {
 /// is down, or, where the machine has no service manager, by files and programs.
 class ServiceAccess {
  public:
-  /// Both must outlive the object.
-  ServiceAccess(const SystemRoot& root, RunLoop& runLoop) : _root(root), _runLoop(runLoop) {}
+  using OpenLibrary = Result<SystemdLibrary> (*)();
+  /// Root and loop must outlive the object. `openLibrary` is called at the first use of the bus.
+  ServiceAccess(const SystemRoot& root, RunLoop& runLoop, OpenLibrary openLibrary = openSystemdLibrary)
+      : _root(root), _runLoop(runLoop), _openLibrary(openLibrary) {}
 
   /// Whether the service manager runs the machine (sd_booted(3)). Yes too where that cannot be found out: whatever is
   /// then asked of the manager, its daemons and the bus fails with the reason, and no other way is taken.
@@ -50,6 +52,7 @@ class ServiceAccess {
 
   const SystemRoot& _root;
   RunLoop& _runLoop;
+  OpenLibrary _openLibrary;
   std::optional<SystemdLibrary> _library;
   Connection _systemBus{"/run/dbus/system_bus_socket", Bus::Kind::messageBus};
   Connection _manager{"/run/systemd/private", Bus::Kind::straightToService};

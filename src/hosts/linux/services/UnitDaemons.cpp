@@ -20,6 +20,7 @@ namespace tavisk {
 namespace {
 
 constexpr const char* enabledUntilRestart = "enabled-runtime";
+constexpr const char* notFound = "not-found";
 constexpr std::chrono::seconds longestJob{3};
 
 /// What failed was asked about this unit, not about the manager as a whole.
@@ -107,8 +108,8 @@ bool isToRun(const UnitState& state) {
 }
 
 /// One unit of the manager's list: name, description, both states, more of both, and the job that it has.
-UnitState takeState(BusMessage& list) {
-  list.readText();
+std::pair<std::string, UnitState> takeState(BusMessage& list) {
+  auto name = list.readText();
   list.readText();
   UnitState state{list.readText(), list.readText(), ""};
   for (int more = 0; more < 3; ++more) list.readText();
@@ -116,7 +117,7 @@ UnitState takeState(BusMessage& list) {
   state.job = list.readText();
   list.readText();
   list.exit();
-  return state;
+  return {std::move(name), std::move(state)};
 }
 
 }  // namespace
@@ -149,21 +150,50 @@ Result<BusMessage> UnitDaemons::unitProperty(const Daemon& daemon, const char* n
   return value;
 }
 
-/// Loads what is not loaded yet, as any question about a unit does.
-Result<std::vector<UnitState>> UnitDaemons::states(const std::vector<Daemon>& daemons) {
-  constexpr const char* member = "ListUnitsByNames";
-  std::vector<std::string> units;
-  std::ranges::transform(daemons, std::back_inserter(units), &Daemon::unit);
+/// What the manager tells of units when it is asked so, by their own names.
+template <typename... Arguments>
+Result<std::vector<UnitDaemons::NamedState>> UnitDaemons::listed(const char* member,
+                                                                 const std::vector<std::string>& units,
+                                                                 const Arguments&... arguments) {
   const auto bus = _services.serviceManager();
   if (!bus) return bus.failure();
-  auto reply = (*bus)->call(serviceManager(), member, "a(ssssssouso)", units);
+  auto reply = (*bus)->call(serviceManager(), member, "a(ssssssouso)", arguments..., units);
   if (!reply) return retold(reply.failure(), member, commaList(units));
   auto list = std::move(reply).value();
-  std::vector<UnitState> states;
+  std::vector<NamedState> states;
   list.enter('a', "(ssssssouso)");
   while (list.enter('r', "ssssssouso")) states.push_back(takeState(list));
-  if (states.size() != units.size()) return Failure{member, commaList(units), "it does not tell of each of them"};
   return states;
+}
+
+/// To look for a unit that does not exist costs the manager more than all else: by their names it is asked only for
+/// units that have a file, of those that it has not loaded, has not found so far or knows by another name.
+Result<std::vector<UnitState>> UnitDaemons::states(const std::vector<Daemon>& daemons) {
+  std::vector<std::string> units;
+  std::ranges::transform(daemons, std::back_inserter(units), &Daemon::unit);
+  const auto loaded = listed("ListUnitsByPatterns", units, std::vector<std::string>());
+  if (!loaded) return loaded.failure();
+  std::map<std::string, UnitState> states(loaded->begin(), loaded->end());
+
+  auto rest = units;
+  std::erase_if(rest, [&](const auto& unit) {
+    const auto known = states.find(unit);
+    return known != states.end() && known->second.load != notFound;
+  });
+  const auto installed = unitsWithFiles(_root, rest);
+  if (!installed) return installed.failure();
+  const auto named = installed->empty() ? Result<std::vector<NamedState>>(std::vector<NamedState>())
+                                        : listed("ListUnitsByNames", *installed);
+  if (!named) return named.failure();
+  if (named->size() != installed->size())
+    return Failure{"ListUnitsByNames", commaList(*installed), "it does not tell of each of them"};
+  for (std::size_t place = 0; place < named->size(); ++place) states[(*installed)[place]] = (*named)[place].second;
+
+  std::vector<UnitState> inOrder;
+  std::ranges::transform(units, std::back_inserter(inOrder), [&](const auto& unit) {
+    return states.try_emplace(unit, UnitState{notFound, "inactive", ""}).first->second;
+  });
+  return inOrder;
 }
 
 /// A unit whose file can no longer be understood is there: it may run still, and be enabled.
@@ -172,9 +202,9 @@ Result<std::vector<Daemons::Presence>> UnitDaemons::presences(const std::vector<
   if (!found) return found.failure();
   std::vector<Presence> presences;
   for (const auto& state : *found)
-    presences.push_back(state.load == "masked"      ? Presence::masked
-                        : state.load == "not-found" ? Presence::absent
-                                                    : Presence::installed);
+    presences.push_back(state.load == "masked"   ? Presence::masked
+                        : state.load == notFound ? Presence::absent
+                                                 : Presence::installed);
   return presences;
 }
 

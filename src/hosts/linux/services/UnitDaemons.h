@@ -4,6 +4,7 @@
 
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "base/RunLoop.h"
@@ -50,6 +51,10 @@ class UnitDaemons final : public Daemons {
   template <typename... Arguments>
   Result<BusMessage> order(const Daemon& daemon, const char* member, const char* replySignature,
                            const Arguments&... arguments);
+  using NamedState = std::pair<std::string, UnitState>;
+  template <typename... Arguments>
+  Result<std::vector<NamedState>> listed(const char* member, const std::vector<std::string>& units,
+                                         const Arguments&... arguments);
   /// Of each unit, in the same order.
   Result<std::vector<UnitState>> states(const std::vector<Daemon>& daemons);
   Result<BusMessage> unitProperty(const Daemon& daemon, const char* name, const char* signature);

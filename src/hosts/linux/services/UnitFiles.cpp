@@ -3,12 +3,16 @@
 #include "hosts/linux/services/UnitFiles.h"
 
 #include <algorithm>
+#include <iterator>
 #include <vector>
 
 namespace tavisk {
 namespace {
 
 constexpr const char* administratorFolder = "/etc/systemd/system";
+// The second is the same folder but on a machine that was not merged.
+constexpr const char* foldersAfter[] = {"/usr/lib/systemd/system", "/lib/systemd/system",
+                                        "/run/systemd/generator.late"};
 constexpr const char* packageFolder = "/usr/lib/systemd/system";
 // Where a file, or a link that masks the unit, would count before that of the package (systemd.unit(5)).
 constexpr const char* foldersBefore[] = {administratorFolder,
@@ -36,6 +40,14 @@ bool holdsLinks(const std::string& folder) {
   return folder.ends_with(".wants") || folder.ends_with(".requires");
 }
 
+/// Its own, and of "NAME@INSTANCE.service" the template's, "NAME@.service".
+std::vector<std::string> fileNamesOf(const std::string& unit) {
+  const auto instance = unit.find('@');
+  const auto ending = unit.rfind('.');
+  if (instance == std::string::npos || ending == std::string::npos || ending < instance) return {unit};
+  return {unit, unit.substr(0, instance + 1).append(unit, ending)};
+}
+
 }  // namespace
 
 bool isEnabledBeyondDoubt(const SystemRoot& root, const std::string& unit) {
@@ -47,6 +59,26 @@ bool isEnabledBeyondDoubt(const SystemRoot& root, const std::string& unit) {
   return std::ranges::any_of(names, [&](const std::string& name) {
     return holdsLinks(name) && isLink(root, std::string(administratorFolder).append("/").append(name + "/" + unit));
   });
+}
+
+Result<std::vector<std::string>> unitsWithFiles(const SystemRoot& root, const std::vector<std::string>& units) {
+  std::vector<std::string> paths;
+  for (const auto& unit : units) {
+    for (const auto& name : fileNamesOf(unit)) {
+      const auto inFolder = [&name](const char* folder) { return std::string(folder).append("/").append(name); };
+      std::ranges::transform(foldersBefore, std::back_inserter(paths), inFolder);
+      std::ranges::transform(foldersAfter, std::back_inserter(paths), inFolder);
+    }
+  }
+  const auto there = root.thoseThere(std::move(paths));
+  if (!there) return there.failure();
+  std::vector<std::string> found = units;
+  std::erase_if(found, [&](const auto& unit) {
+    return std::ranges::none_of(fileNamesOf(unit), [&](const auto& name) {
+      return std::ranges::any_of(*there, [&](const auto& path) { return path.ends_with("/" + name); });
+    });
+  });
+  return found;
 }
 
 }  // namespace tavisk

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
 #include "hosts/shared/SystemRoot.h"
 
@@ -12,5 +13,9 @@ namespace tavisk {
 /// file is the one that counts, and the administrator's folder has a link by which another unit pulls it in. False is
 /// no answer: the manager knows more ways.
 bool isEnabledBeyondDoubt(const SystemRoot& root, const std::string& unit);
+
+/// Those of the units that a file, or a link, is there for where the service manager looks for units (systemd.unit(5)),
+/// or one of the template that they are instances of.
+Result<std::vector<std::string>> unitsWithFiles(const SystemRoot& root, const std::vector<std::string>& units);
 
 }  // namespace tavisk

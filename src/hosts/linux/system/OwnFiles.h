@@ -16,6 +16,7 @@ inline constexpr const char* name = "60-tavisk";
 inline constexpr const char* chronyServer = "/etc/chrony/sources.d/60-tavisk.sources";
 inline constexpr const char* ntpsecServer = "/etc/ntpsec/ntp.d/60-tavisk.conf";
 inline constexpr const char* timesyncdServer = "/etc/systemd/timesyncd.conf.d/60-tavisk.conf";
+inline constexpr const char* timeServers[] = {chronyServer, ntpsecServer, timesyncdServer};
 /// Written to the console at each start (tmpfiles.d(5), "w").
 inline constexpr const char* consoleBlanking = "/etc/tmpfiles.d/60-tavisk.conf";
 inline constexpr const char* kernelPanic = "/etc/sysctl.d/60-tavisk.conf";

@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include "hosts/linux/system/SystemdConfig.h"
 
+#include <algorithm>
+
 #include "base/Path.h"
 #include "base/Text.h"
 #include "hosts/linux/system/ConfigurationLines.h"
@@ -150,13 +152,41 @@ Result<std::string> SystemdConfig::whatHides(std::string_view section, std::stri
 }
 
 Result<void> SystemdConfig::setOwn(const std::string& section, const std::map<std::string, std::string>& values) const {
-  const auto present = orEmpty(_root.read(ownDropIn(), configurationLimit));
+  const auto present = ownValues(section);
   if (!present) return present.failure();
   auto merged = values;
-  for (const auto& [key, value] : allAssignments(*present, section)) merged.emplace(key, value);
+  merged.insert(present->begin(), present->end());
+  return writeOwn(section, merged);
+}
+
+Result<std::map<std::string, std::string>> SystemdConfig::ownValues(const std::string& section) const {
+  const auto text = orEmpty(_root.read(ownDropIn(), configurationLimit));
+  if (!text) return text.failure();
+  std::map<std::string, std::string> values;
+  for (const auto& [key, value] : allAssignments(*text, section)) values.insert_or_assign(key, value);
+  return values;
+}
+
+Result<void> SystemdConfig::writeOwn(const std::string& section,
+                                     const std::map<std::string, std::string>& values) const {
   auto text = ownfile::header + ("[" + section + "]\n");
-  for (const auto& [key, value] : merged) text += std::string(key).append("=").append(value).append("\n");
+  for (const auto& [key, value] : values) text += std::string(key).append("=").append(value).append("\n");
   return _root.write(ownDropIn(), text);
+}
+
+Result<bool> SystemdConfig::hasOwn(const std::string& section, const std::vector<std::string>& keys) const {
+  const auto present = ownValues(section);
+  if (!present) return present.failure();
+  return std::ranges::any_of(keys, [&](const auto& key) { return present->contains(key); });
+}
+
+Result<void> SystemdConfig::removeOwn(const std::string& section, const std::vector<std::string>& keys) const {
+  const auto present = ownValues(section);
+  if (!present) return present.failure();
+  auto kept = *present;
+  for (const auto& key : keys) kept.erase(key);
+  if (kept.size() == present->size()) return {};
+  return kept.empty() ? _root.remove(ownDropIn()) : writeOwn(section, kept);
 }
 
 std::string SystemdConfig::ownDropIn() const {

@@ -42,8 +42,15 @@ class SystemdConfig {
   /// Writes these keys into the own drop-in, which has this one section; its other keys stay. One that cannot
   /// be read is left as it is. Reads and writes: not to be called by two at once (MachineLock).
   Result<void> setOwn(const std::string& section, const std::map<std::string, std::string>& values) const;
+  /// Whether the own drop-in assigns one of the keys.
+  Result<bool> hasOwn(const std::string& section, const std::vector<std::string>& keys) const;
+  /// Takes these keys out of the own drop-in, and the file away when it has no other.
+  Result<void> removeOwn(const std::string& section, const std::vector<std::string>& keys) const;
 
  private:
+  /// The keys of the own drop-in in one section, with their last values.
+  Result<std::map<std::string, std::string>> ownValues(const std::string& section) const;
+  Result<void> writeOwn(const std::string& section, const std::map<std::string, std::string>& values) const;
   Result<std::vector<std::string>> files() const;
   static std::vector<std::string> wordsOf(const std::vector<Assignment>& assigned);
   /// The values of a key in each of the files, in order.

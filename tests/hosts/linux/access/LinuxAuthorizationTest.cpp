@@ -11,7 +11,6 @@
 #include "hosts/linux/BusPeer.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/access/Polkit.h"
-#include "platform/AdminAuthenticatorContract.h"
 
 namespace tavisk {
 namespace {
@@ -46,9 +45,7 @@ struct PolkitTree : LinuxTree {
   Answer answer = Answer::granted;
   std::mutex mutex;  ///< guards the calls
   std::vector<std::uint32_t> calls;
-  BusPeer peer{(write("/run/systemd/system/x", ""), at("/run/dbus/system_bus_socket")),
-               {},
-               [this](sd_bus_message* call, const std::string&) { return answerCall(call); }};
+  BusPeer peer{socketOfServices(), {}, [this](sd_bus_message* call, const std::string&) { return answerCall(call); }};
 };
 
 TEST(Polkit, AsksTheUserOnlyThroughAnAgent) {
@@ -112,6 +109,8 @@ TEST(LinuxAdminAuthenticator, AsksPolkitForAChangeOnlyAndOnceWhereItRefuses) {
       EXPECT_TRUE(!why || isBecauseOf(effect, Outcome::failed, why)) << toJson(effect);
     }
     EXPECT_EQ(member.tree.callsSoFar().size(), asked);
+    member.authenticator.deauthenticate();
+    EXPECT_FALSE(member.authenticator.isAuthenticated());
   }
 }
 
@@ -160,12 +159,6 @@ TEST(LinuxUserDatabase, AnswersForTheProcessAndTheMachine) {
   EXPECT_EQ(users.groupNamed("root"), 0U);
   for (const char* name : {"", "Root", "root ", "no such group"}) EXPECT_EQ(users.groupNamed(name), std::nullopt);
 }
-
-struct LinuxAuthenticator {
-  AdminAuthenticator& service() { return tree.host().authenticator(); }
-  LinuxTree tree;
-};
-INSTANTIATE_TYPED_TEST_SUITE_P(Linux, AdminAuthenticatorContract, LinuxAuthenticator);
 
 }  // namespace
 }  // namespace tavisk

@@ -184,7 +184,7 @@ TEST(RemoteLogin, SaysWhatStandsAgainstIt) {
     tree.write("/etc/tavisk/services.conf", config);
     tree.manager.set("ssh.service", unit);
     tree.manager.set("ssh.socket", {.load = "not-found"});
-    if (fault) tree.manager.breakNext("ListUnitsByNames", *fault);
+    if (fault) tree.manager.breakNext("ListUnitsByPatterns", *fault);
     tree.host().remoteShell().setEnabled(true);
     EXPECT_TRUE(isBecauseOf(tree.lastEffect(), outcome, why)) << toJson(tree.lastEffect());
     EXPECT_EQ(tree.lastEffect().setting, setting::remoteLogin);

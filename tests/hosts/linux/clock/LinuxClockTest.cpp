@@ -98,9 +98,8 @@ TEST(LocalTime, KeepsLinkAndNameFileInLine) {
 
 TEST(LocalTime, IsChangedWhereHalfOfItIs) {
   LinuxTree tree;
-  tree.write("/run/systemd/system/x", "");
   tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif2");
-  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+  const BusPeer bus(tree.socketOfServices(), {}, [&](sd_bus_message* call, const std::string& member) {
     if (member == "Get") return sd_bus_reply_method_return(call, "v", "s", "Europe/Paris");
     tree.link("/etc/localtime", "../usr/share/zoneinfo/" + firstText(call));
     tree.makeUnreadable("/etc/timezone");
@@ -114,10 +113,9 @@ TEST(LocalTime, IsChangedWhereHalfOfItIs) {
 
 TEST(LocalTime, FollowsADaemonThatFailsWhenItHasMovedTheLink) {
   LinuxTree tree;
-  tree.write("/run/systemd/system/x", "");
   tree.write("/usr/share/zoneinfo/Europe/Paris", "TZif2");
   tree.write("/etc/timezone", "UTC\n");
-  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+  const BusPeer bus(tree.socketOfServices(), {}, [&](sd_bus_message* call, const std::string& member) {
     if (member == "Get") return sd_bus_reply_method_return(call, "v", "s", "UTC");
     tree.link("/etc/localtime", "../usr/share/zoneinfo/" + firstText(call));
     return sd_bus_reply_method_errorf(call, SD_BUS_ERROR_FAILED, "too late");
@@ -158,9 +156,8 @@ TEST(LocalTime, IsNotHalfSetByWhoIsNotRoot) {
   LinuxTree tree;
   auto& clock = tree.host().clock();
   std::atomic<int> calls = 0;
-  tree.write("/run/systemd/system/x", "");
   tree.write("/run/tavisk/lock", "");
-  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+  const BusPeer bus(tree.socketOfServices(), {}, [&](sd_bus_message* call, const std::string& member) {
     if (member == "Get") return sd_bus_reply_method_return(call, "v", "s", calls == 0 ? "UTC" : "Europe/Paris");
     ++calls;
     tree.link("/etc/localtime", "../usr/share/zoneinfo/" + firstText(call));
@@ -198,8 +195,7 @@ TEST(LinuxClock, LeavesTheClockOfThisMachineAloneAndNamesWhatWouldSetItBack) {
 TEST(LocalTime, IsSetAnewWhereTheDaemonGoesByAnother) {
   LinuxTree tree;
   std::string daemons = "Asia/Tokyo";
-  tree.write("/run/systemd/system/x", "");
-  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+  const BusPeer bus(tree.socketOfServices(), {}, [&](sd_bus_message* call, const std::string& member) {
     if (member == "Get") return sd_bus_reply_method_return(call, "v", "s", daemons.c_str());
     daemons = firstText(call);
     return sd_bus_reply_method_return(call, "");
@@ -231,9 +227,8 @@ TEST(LinuxClock, ReadsTheHardwareClockInTheTimeThatItKeeps) {
 TEST(LinuxClock, CountsFromTheMomentInWhichItIsAsked) {
   using std::chrono::microseconds;
   LinuxTree tree;
-  tree.write("/run/systemd/system/x", "");
   std::atomic<std::int64_t> ahead = 0;
-  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+  const BusPeer bus(tree.socketOfServices(), {}, [&](sd_bus_message* call, const std::string& member) {
     if (member == "Get") return sd_bus_reply_method_return(call, "v", "b", 0);
     std::int64_t number = 0;
     sd_bus_message_read_basic(call, 'x', &number);

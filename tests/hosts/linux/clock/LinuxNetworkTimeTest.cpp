@@ -4,6 +4,7 @@
 #include <systemd/sd-bus.h>
 
 #include "effects/EffectMatchers.h"
+#include "effects/SettingNames.h"
 #include "hosts/linux/LinuxContractMachines.h"
 #include "hosts/linux/LinuxTree.h"
 #include "hosts/linux/clock/TimeDaemons.h"
@@ -23,7 +24,7 @@ struct ChronyTree : LinuxTree {
 root=${0%/usr/bin/chronyc}
 [ "$1" = reload ] || { cat "$root/known"; exit; }
 echo "$@" "$(env | grep -v -e ^PWD= -e ^SHLVL= -e ^_= | sort)" > "$root/reloaded"
-sed -n 's/^server \([^ ]*\).*/^,?,\1,0,6/p' "$root/etc/chrony/sources.d/60-tavisk.sources" > "$root/known"
+cat "$root"/etc/chrony/sources.d/*.sources 2> /dev/null | sed -n 's/^server \([^ ]*\).*/^,?,\1,0,6/p' > "$root/known"
 )sh");
   }
 };
@@ -114,7 +115,7 @@ TEST(LinuxNetworkTime, HasNotChangedWhileTheClientStartsOrStops) {
 TEST(LinuxNetworkTime, AsksForTheClientOnceWhenItLooksAtTheNextStart) {
   ManagedTree tree;
   haveChrony(tree);
-  tree.manager.breakNext("ListUnitsByNames", FakeServiceManager::Fault::error);
+  tree.manager.breakNext("ListUnitsByPatterns", FakeServiceManager::Fault::error);
   tree.host().networkTime().checkLaunchAtStartup(true);
   EXPECT_THAT(tree.lastEffect(), FailedFor("AccessDenied"));
 }
@@ -159,6 +160,30 @@ TEST(LinuxNetworkTime, TakesBackAServerThatALaterFileHides) {
     EXPECT_EQ(tree.lastEffect().where, "");
     EXPECT_EQ(tree.has(own) ? tree.file(own) : "", kept);
   }
+}
+
+TEST_F(ChronyTest, GoesBackToTheServersOfOthers) {
+  constexpr const char* files[] = {"/etc/chrony/sources.d/60-tavisk.sources", "/etc/ntpsec/ntp.d/60-tavisk.conf",
+                                   "/etc/systemd/timesyncd.conf.d/60-tavisk.conf"};
+  tree.write("/etc/openntpd/ntpd.conf", "servers pool.example\n");
+  tree.write("/etc/chrony/chrony.conf", "sourcedir /etc/chrony/sources.d\npool pool.example iburst\n");
+  for (const bool isRunning : {false, true}) {
+    for (const auto* file : files) tree.write(file, "server time.example iburst prefer\n");
+    if (isRunning) client.start();
+    tree.log.effects.clear();
+    tree.host().resets().reset(setting::networkTimeServer);
+    ASSERT_EQ(tree.log.effects.size(), isRunning ? 2U : 1U);
+    const auto& reset = tree.log.effects.front();
+    EXPECT_EQ(reset.outcome, Outcome::applied);
+    EXPECT_EQ(reset.before, "time.example");
+    EXPECT_EQ(reset.stored, "pool.example");
+    EXPECT_EQ(reset.where, commaList({std::begin(files), std::end(files)}));
+    for (const auto* file : files) EXPECT_FALSE(tree.has(file)) << file;
+    EXPECT_EQ(tree.has("/reloaded"), isRunning);
+  }
+  EXPECT_TRUE(tree.has("/etc/openntpd/ntpd.conf")) << "it is the administrator's";
+  tree.host().resets().reset(setting::networkTimeServer);
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::unchanged);
 }
 
 TEST_F(ChronyTest, WritesNoServerThatTheClientDoesNotRead) {

@@ -37,23 +37,6 @@ TEST(EfiLoadOption, HasTheBytesThatFirmwareReads) {
     EXPECT_FALSE(partitionNode({nameless, 1, 1, 1})) << nameless;
 }
 
-TEST(EfiLoadOption, IsNeverReadBeyondItsBytes) {
-  const auto whole = fromHex(gptOption);
-  for (std::size_t size = 0; size < whole.size(); ++size)
-    EXPECT_FALSE(parseLoadOption(whole.substr(0, size))) << size << " bytes";
-  for (std::size_t place = 0; place < whole.size(); ++place) {
-    for (const char byte : {'\0', '\1', '\x7f', '\xff'}) {
-      auto damaged = whole;
-      damaged[place] = byte;
-      const auto option = parseLoadOption(damaged);
-      const auto path = option ? parseDevicePath(option->paths) : std::nullopt;
-      if (path) {
-        EXPECT_EQ(parseDevicePath(bytesOf(*path)), path) << "byte " << place;
-      }
-    }
-  }
-}
-
 TEST(EfiDevicePath, TellsWhatIsNoPathFromWhatItDoesNotKnow) {
   const std::pair<const char*, std::optional<std::string>> cases[] = {
       {"7fff0400", ""},                          // nothing but an end

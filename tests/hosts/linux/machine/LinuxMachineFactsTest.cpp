@@ -127,5 +127,14 @@ TEST(LinuxPrograms, AnswerWithAnyStatus) {
   EXPECT_FALSE(machine.host().programs().run("/usr/sbin/none", {}));
 }
 
+TEST(LinuxPrograms, AreNotWaitedForBeyondTheCommandsTime) {
+  LinuxTree machine;
+  machine.writeProgram("/usr/sbin/hanging", "#!/bin/sh\nexec sleep 10\n");
+  const auto limit = machine.runLoop.limitWaits(std::chrono::milliseconds(100));
+  const auto output = machine.host().programs().run("/usr/sbin/hanging", {});
+  ASSERT_FALSE(output);
+  EXPECT_EQ(output.failure().code, std::errc::timed_out);
+}
+
 }  // namespace
 }  // namespace tavisk

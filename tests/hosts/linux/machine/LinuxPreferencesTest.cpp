@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
+#include <tuple>
+
 #include "effects/EffectMatchers.h"
 #include "effects/SettingNames.h"
 #include "hosts/linux/LinuxTree.h"
@@ -68,6 +70,37 @@ TEST(LinuxPreferences, ReadAsNoneOutOfADamagedFileAndAreKeptBesideIt) {
   const auto damaged = std::string(preferencesFile) + ".damaged";
   EXPECT_EQ(tree.file(damaged), "<dict>");
   EXPECT_EQ(tree.lastEffect().where, damaged + ", " + preferencesFile);
+}
+
+/// The preference of keyboards, and the kernel's architecture.
+TEST(LinuxPropertyLists, LoseTheirKeyInAReset) {
+  for (const auto& [name, file, key, before, without] :
+       {std::tuple(setting::keyboardLockPreference, preferencesFile, DunmereLockEnclosureStateKey, "off", ""),
+        {setting::kernelArchitecture, BootLoaderFile::path, BootLoaderFile::architectureKey, "x86_64", "default"}}) {
+    const auto value = name == std::string(setting::kernelArchitecture) ? "<string>x86_64</string>" : "<false/>";
+    const auto own = std::string("<key>") + key + "</key>" + value;
+    const std::string other = "<key>Timeout</key><integer>5</integer>";
+    for (const bool hasOthers : {true, false}) {
+      LinuxTree tree;
+      tree.write(file, "<plist><dict>" + own + (hasOthers ? other : "") + "</dict></plist>");
+      for (const auto outcome : {Outcome::applied, Outcome::unchanged}) {
+        tree.log.effects.clear();
+        tree.host().resets().reset(name);
+        const auto& effect = tree.log.effects.at(0);
+        EXPECT_EQ(effect.outcome, outcome) << toJson(effect);
+        EXPECT_EQ(effect.before.value_or(""), outcome == Outcome::applied ? before : without) << name;
+        EXPECT_EQ(effect.stored.value_or(""), without) << name;
+        EXPECT_EQ(tree.has(file), hasOthers) << name;
+      }
+      if (!hasOthers) continue;
+      EXPECT_THAT(tree.file(file), AllOf(HasSubstr("Timeout"), Not(HasSubstr(key))));
+    }
+    LinuxTree damaged;
+    damaged.write(file, "<dict>");
+    damaged.host().resets().reset(name);
+    EXPECT_THAT(damaged.log.effects.at(0), FailedFor(file));
+    EXPECT_EQ(damaged.file(file), "<dict>");
+  }
 }
 
 /// What a signal to a process of this machine comes to. A whole host would tell the journal of the machine too.

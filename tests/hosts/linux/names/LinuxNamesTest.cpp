@@ -105,11 +105,9 @@ TEST_F(NamesTest, TellWhenNothingOnTheMachineResolvesThem) {
 }
 
 TEST_F(NamesTest, AreLeftToTheFilesOnABusWithoutTheirService) {
-  tree.write("/run/systemd/system/x", "");
-  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {},
-                    [](sd_bus_message* call, const std::string& /*member*/) {
-                      return sd_bus_reply_method_errorf(call, SD_BUS_ERROR_SERVICE_UNKNOWN, "no such name");
-                    });
+  const BusPeer bus(tree.socketOfServices(), {}, [](sd_bus_message* call, const std::string& /*member*/) {
+    return sd_bus_reply_method_errorf(call, SD_BUS_ERROR_SERVICE_UNKNOWN, "no such name");
+  });
   names.setComputerName("Mail Server 2");
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied);
   EXPECT_EQ(tree.lastEffect().live, "Mail Server 2");
@@ -149,8 +147,7 @@ TEST(LinuxNames, CompleteAChangeThatWasCutOffAnywhere) {
 }
 
 TEST_F(NamesTest, PutHostsBackWhenTheNameIsNotStored) {
-  tree.write("/run/systemd/system/x", "");
-  const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [](sd_bus_message* call, const std::string& member) {
+  const BusPeer bus(tree.socketOfServices(), {}, [](sd_bus_message* call, const std::string& member) {
     if (member == "NameHasOwner") return sd_bus_reply_method_return(call, "b", 0);
     return sd_bus_reply_method_errorf(call, "org.freedesktop.hostname1.ReadOnlyFilesystem", "no");
   });
@@ -161,10 +158,9 @@ TEST_F(NamesTest, PutHostsBackWhenTheNameIsNotStored) {
 }
 
 TEST_F(NamesTest, KeepTheHostsOfANameThatIsStoredAfterItsAnswerWasLost) {
-  tree.write("/run/systemd/system/x", "");
   std::thread storing;
   BusPeer* service = nullptr;
-  BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+  BusPeer bus(tree.socketOfServices(), {}, [&](sd_bus_message* call, const std::string& member) {
     if (member == "NameHasOwner") return sd_bus_reply_method_return(call, "b", 0);
     service->hangUp();
     storing = std::thread([&] {
@@ -184,9 +180,8 @@ TEST_F(NamesTest, KeepTheHostsOfANameThatIsStoredAfterItsAnswerWasLost) {
 TEST(LinuxNames, LookOnceMoreWhenTheResponderIsLate) {
   for (const int state : {1, 2}) {
     NamedTree tree;
-    tree.write("/run/systemd/system/x", "");
     std::string announced = "machine";
-    const BusPeer bus(tree.at("/run/dbus/system_bus_socket"), {}, [&](sd_bus_message* call, const std::string& member) {
+    const BusPeer bus(tree.socketOfServices(), {}, [&](sd_bus_message* call, const std::string& member) {
       if (member == "NameHasOwner") return sd_bus_reply_method_return(call, "b", 1);
       if (member == "GetHostName") return sd_bus_reply_method_return(call, "s", announced.c_str());
       if (member == "GetState") return sd_bus_reply_method_return(call, "i", state);

@@ -58,9 +58,7 @@ class FakePowerServices {
     if (member == "CanSuspend" && std::strchr(canSuspend, '.'))
       return sd_bus_reply_method_errorf(call, canSuspend, "No such file or directory");
     if (member == "CanSuspend") return sd_bus_reply_method_return(call, "s", canSuspend.load());
-    if (member == "ListUnitsByNames")
-      return sd_bus_reply_method_return(call, "a(ssssssouso)", 1, "", "", unitState.load(), "inactive", "", "", "/", 0U,
-                                        "", "/");
+    if (member == "ListUnitsByPatterns") return answerUnit(call);
     if (member == "Reload") {
       readManager();
       return sd_bus_reply_method_return(call, "");
@@ -74,7 +72,15 @@ class FakePowerServices {
     return member == "KillUnit" ? sd_bus_reply_method_return(call, "") : answerRestart(call);
   }
 
-  /// The value of a key in the folder, in /etc or else in /run; what it was before when no file has it.
+  /// One is asked for, after an empty list of states.
+  int answerUnit(sd_bus_message* call) {
+    sd_bus_message_skip(call, "as");
+    sd_bus_message_enter_container(call, 'a', "s");
+    return sd_bus_reply_method_return(call, "a(ssssssouso)", 1, firstText(call).c_str(), "", unitState.load(),
+                                      "inactive", "", "", "/", 0U, "", "/");
+  }
+
+  /// The value of a key in the folder, in /etc or else in /run; as it is when no file has it.
   void readKey(const char* folder, const std::string& key, std::string& value) const {
     for (const auto* file : {"etc/60-tavisk.conf", "run/70-other.conf", "etc/70-other.conf"}) {
       const auto path = std::filesystem::path(file);
@@ -83,6 +89,9 @@ class FakePowerServices {
     }
   }
   void readLogin() {
+    _idleAction = "ignore";
+    _idleMinutes = "30";
+    _powerKey = "poweroff";
     readKey("systemd/logind.conf.d", "IdleAction", _idleAction);
     readKey("systemd/logind.conf.d", "IdleActionSec", _idleMinutes);
     readKey("systemd/logind.conf.d", "HandlePowerKey", _powerKey);

@@ -75,6 +75,15 @@ TEST(PowerFaults, ComputerSleepThatIsHalfMadeIsCompleted) {
   EXPECT_EQ(tree.bus.sleepsAfter(), "20min") << "the service tells this time, so it has to go by it";
 }
 
+TEST(PowerFaults, RestartAfterFreezeIsInBothFilesOrInNone) {
+  PowerTree tree;
+  tree.write("/etc/systemd/system.conf.d", "in the place of the folder");
+  const auto effect = tree.setRestartsAfterFreeze(true);
+  EXPECT_THAT(effect, FailedFor("Not a directory"));
+  EXPECT_EQ(effect.where, "");
+  EXPECT_FALSE(tree.has("/etc/sysctl.d/60-tavisk.conf"));
+}
+
 TEST(PowerFaults, RestartAfterFreezeIsNothingThatAContainerCanHave) {
   PowerTree tree;
   const bool isProven = withOwnMounts([&tree] {

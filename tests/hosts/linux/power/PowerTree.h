@@ -94,7 +94,8 @@ class PowerTree : public LinuxTree {
   /// With the devices of a machine that tests/machine/record.sh has looked at.
   explicit PowerTree(const std::string& recording) {
     addServices();
-    for (const auto& line : linesOf(std::filesystem::path(TAVISK_RECORDINGS) / recording)) replay(split(line, " "));
+    for (const auto& line : linesOf(std::filesystem::path(TAVISK_RECORDINGS "/disks/recordings") / recording))
+      replay(split(line, " "));
   }
 
   void addServices() {
@@ -146,6 +147,8 @@ class PowerTree : public LinuxTree {
 
   LinuxPowerSettingsService& power() { return _power; }
   LinuxPowerController& delays() { return _delays; }
+  /// What is asked of this one is foretold.
+  LinuxPowerSettingsService& foreteller() { return _foreteller; }
 
   /// Changes a setting, whatever feeds the machine, and tells what came of it.
   Effect set(SleepTimer timer, Minutes minutes) {

@@ -51,6 +51,7 @@ TEST(UnitDaemons, TellsWhyAUnitDoesNotRun) {
       {{.jobResult = ""}, std::nullopt, "its job has not ended in time"},
       {{.conditionHolds = false}, std::nullopt, "the condition ConditionVirtualization=!container does not hold"},
       {{}, Fault::error, "org.freedesktop.DBus.Error.AccessDenied: not today"},
+      {{}, Fault::question, "InteractiveAuthorizationRequired"},
       {{}, Fault::wrongType, "the reply has other types than expected"},
       {{}, Fault::hangUp, "Connection"},
   };
@@ -91,6 +92,29 @@ TEST_F(ManagedDaemons, RunWhileTheyAreStartedAnew) {
     const auto running = daemons.isRunning(daemon);
     EXPECT_TRUE(running && *running == runs) << active << " " << job;
   }
+}
+
+TEST_F(ManagedDaemons, AreLookedForByTheManagerOnlyWhereAFileIs) {
+  tree.manager.set("missed.service", {.load = "not-found"});
+  const std::tuple<const char*, const char*> cases[] = {
+      {"b.service", "/run/systemd/transient/b.service"},
+      {"b@one.service", "/usr/lib/systemd/system/b@.service"},
+      {"missed.service", "/etc/systemd/system/missed.service"},
+  };
+  for (const auto& [unit, file] : cases) {
+    const Daemon other{unit, "", ""};
+    tree.manager.breakNext("ListUnitsByNames", Fault::error);
+    const auto absent = daemons.presence(other);
+    EXPECT_TRUE(absent && *absent == Daemons::Presence::absent) << unit;
+    tree.write(file, "");
+    EXPECT_FALSE(daemons.presence(other)) << "the manager was not asked about " << unit;
+  }
+}
+
+TEST_F(ManagedDaemons, RunOnWhenTheirFileIsGone) {
+  tree.manager.set(daemon.unit, {.load = "not-found", .active = "active"});
+  const auto running = daemons.isRunning(daemon);
+  EXPECT_TRUE(running && *running);
 }
 
 TEST_F(ManagedDaemons, HaveNotBegunWhatNoTimeWasLeftFor) {
@@ -146,20 +170,13 @@ TEST(UnitFiles, ShowWhatIsEnabledWhereNothingStandsInTheWay) {
   }
 }
 
-TEST_F(ManagedDaemons, HaveTheUserAskedNothing) {
-  tree.manager.breakNext("StartUnit", Fault::question);
-  const auto started = daemons.start(daemon);
-  ASSERT_FALSE(started);
-  EXPECT_THAT(started.failure().why, HasSubstr("InteractiveAuthorizationRequired"));
-}
-
 TEST_F(UnitDaemonsTest, TellOfAManagerThatRefusesAndWaitOnceForOneThatIsSilent) {
   tree.manager.breakNext("EnableUnitFiles", Fault::error);
   client.setLaunchAtStartup(true);
   EXPECT_THAT(tree.lastEffect(), FailedFor("EnableUnitFiles on chrony.service"));
   EXPECT_EQ(tree.lastEffect().failure->code, BusErrorCode::accessDenied);
   const auto began = RunLoop::Clock::now();
-  tree.manager.breakNext("ListUnitsByNames", Fault::silence);
+  tree.manager.breakNext("ListUnitsByPatterns", Fault::silence);
   client.start();
   EXPECT_THAT(tree.lastEffect(), FailedFor("timed out"));
   EXPECT_LT(RunLoop::Clock::now() - began, Bus::usualTime + std::chrono::milliseconds(500));

@@ -5,8 +5,11 @@
 #include <sys/socket.h>
 #include <unistd.h>
 
+#include <cstdlib>
+
 #include "hosts/linux/BusPeer.h"
 #include "hosts/linux/LinuxTree.h"
+#include "hosts/linux/system/Journal.h"
 
 namespace tavisk {
 namespace {
@@ -52,6 +55,23 @@ TEST(JournalLog, LetsNoForeignTextMakeFieldsOrControlATerminal) {
   journal.next();
   EXPECT_THAT(journal.next(),
               AllOf(HasSubstr(R"(TAVISK_ASKED=x\nPRIORITY=0\n\x1B[2J\xFF)"), Not(HasSubstr("\nPRIORITY=0"))));
+}
+
+TEST(JournalLog, BelievesRootAloneWhoHasUsedSudo) {
+  if (::getuid() != 0) GTEST_SKIP() << "only root becomes others";
+  constexpr uid_t nobody = 65534;
+  ::setenv("SUDO_UID", "1000", 1);
+  for (const uid_t user : {uid_t{0}, nobody}) {
+    LinuxTree tree;
+    const LogSocket journal{socketAt(tree.at("/run/systemd/journal/socket"), SOCK_DGRAM)};
+    ASSERT_EQ(::setreuid(user, 0), 0);
+    JournalLog(tree.root).record({.setting = "Time"});
+    ASSERT_EQ(::setreuid(0, 0), 0);
+    const auto entry = journal.next();
+    EXPECT_THAT(entry, HasSubstr("TAVISK_UID=" + std::to_string(user) + "\n"));
+    EXPECT_EQ(entry.find("TAVISK_SUDO_UID=1000\n") != std::string::npos, user == 0);
+  }
+  ::unsetenv("SUDO_UID");
 }
 
 TEST(JournalLog, TellsWhoWasNotLetIn) {

@@ -211,7 +211,7 @@ TEST(LinuxSystems, AreToldAnewWhenTheyAreProvenLater) {
   systems.end();
 }
 
-TEST(LinuxSystems, AreNotChosenWhereTheLoaderWouldNotFollow) {
+TEST(LinuxSystems, AreNotChosenWhereTheLoaderOrTheFirmwareWouldNotFollow) {
   if (::geteuid() != 0) GTEST_SKIP() << "only root changes what starts";
   struct Case {
     const char* why;
@@ -224,6 +224,13 @@ TEST(LinuxSystems, AreNotChosenWhereTheLoaderWouldNotFollow) {
          putIntoOneMenu(tree, "${saved_entry}");
          auto mounts = tree.file("/proc/thread-self/mountinfo");
          tree.setMounts(mounts.replace(mounts.find(" rw -"), 5, " ro -"));
+       }},
+      {"Not a directory",  // where the order of before is kept, after the saved entry is written
+       [](auto& tree) {
+         putIntoOneMenu(tree, "${saved_entry}");
+         tree.setEntry(3, {fileNode(R"(\EFI\other\other.efi)")});
+         tree.setOrder({3, 1});
+         tree.write("/var/lib/tavisk", "in the place of the folder");
        }},
       {"no loader that firmware can start",
        [](auto& tree) { tree.setMenu("/mnt/second", menu("0", entry("x", "aaaa", "UUID=aaaa"))); }},
@@ -275,6 +282,25 @@ TEST(LinuxSystems, AreTheOldOnesOrTheNewOneWhicheverCallFailsOrIsTheLast) {
     }
     EXPECT_GT(call, 2) << "the work was not traced";
   }
+}
+
+bool flushesAFile(pid_t process) {
+  return isOneOf(callOf(process), {SYS_fsync});
+}
+
+TEST(LinuxSystems, AreNotChosenBeforeThatIsOnTheDisk) {
+  if (!canTraceCalls()) GTEST_SKIP() << "calls cannot be traced here";
+  if (::geteuid() != 0) GTEST_SKIP() << "only root changes what starts";
+  InstalledTree tree(false);
+  putIntoOneMenu(tree, "${saved_entry}");
+  tree.watch();
+  const auto before = tree.file(InstalledTree::firstBlock);
+  const auto doSet = [&] { return tree.choose("sdb2", InstalledTree::secondFolder); };
+  EXPECT_EQ(doSet(), 0);
+  tree.write(InstalledTree::firstBlock, before);
+  const auto run = runWithFault(0, EIO, &flushesAFile, doSet);
+  EXPECT_TRUE(run.wentWrong);
+  EXPECT_NE(run.status, 0);
 }
 
 TEST(LinuxSystems, DelayNobodyWhoseVolumeDoesNotAnswer) {

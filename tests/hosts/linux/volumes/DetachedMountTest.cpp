@@ -1,6 +1,8 @@
 // SPDX-FileCopyrightText: 2026 The tavisk developers
 // SPDX-License-Identifier: MIT
+#include <fcntl.h>
 #include <gmock/gmock.h>
+#include <sys/statvfs.h>
 
 #include "LoopDevice.h"
 #include "OwnMounts.h"
@@ -62,6 +64,14 @@ void takeAtWork(const Image& image, const char* type) {
   std::ofstream(image.path(), std::ios::binary) << bytes;
 }
 
+/// Whether what is on the volume can be neither written nor started, and is no device.
+bool isForLookingAlone(const SystemRoot& files) {
+  constexpr unsigned long all = ST_RDONLY | ST_NOSUID | ST_NODEV | ST_NOEXEC;
+  struct statvfs status {};
+  const auto top = files.open("/", O_RDONLY | O_DIRECTORY);
+  return top && ::fstatvfs(top->number(), &status) == 0 && (status.f_flag & all) == all;
+}
+
 TEST(DetachedMount, LeavesNoTraceOfTheLook) {
   const auto obstacle = withRealVolumes([](const TemporaryFolder& folder) {
     for (const auto& [type, maker] :
@@ -78,6 +88,7 @@ TEST(DetachedMount, LeavesNoTraceOfTheLook) {
         ASSERT_TRUE(files) << describe(files.failure());
         EXPECT_EQ(opener.open(volumeOf(device, type))->prefix(), files->prefix());
         EXPECT_FALSE(files->write("/new", ""));
+        EXPECT_TRUE(isForLookingAlone(*files));
         EXPECT_EQ(mountInfo(), mounts);
         EXPECT_FALSE(image.mount(device, type)) << "for writing, while it is looked at";
         opener.close();
@@ -109,6 +120,7 @@ TEST(DetachedMount, SeesWhatLiesBeneathAnotherMount) {
     EXPECT_EQ(files->read("/boot/beneath", 10).valueOr("unread"), "inside");
     EXPECT_FALSE(files->isThere("/boot/above").valueOr(true));
     EXPECT_FALSE(files->write("/new", ""));
+    EXPECT_TRUE(isForLookingAlone(*files)) << "a copy of the mount";
     EXPECT_EQ(mountDetached(device.node(), "ext4").failure().code, std::errc::device_or_resource_busy);
     EXPECT_FALSE(mountDetached(device.node(), "ntfs3"));
   });

@@ -1,0 +1,91 @@
+// SPDX-FileCopyrightText: 2026 The tavisk developers
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <map>
+
+#include "hosts/linux/access/LinuxChangeHistory.h"
+#include "hosts/linux/disks/DiskTree.h"
+#include "hosts/linux/system/Journal.h"
+
+namespace tavisk {
+namespace {
+
+using testing::ElementsAre;
+
+constexpr const char* machineId = "0123456789abcdef0123456789abcdef";
+constexpr const char* maker = "/lib/systemd/systemd-journal-remote";
+
+/// A machine with a journal. Entries are given as journalctl(1) exports them, the trusted fields included.
+class JournalTree : public LinuxTree {
+ public:
+  using Fields = std::map<std::string, std::string>;
+
+  JournalTree() { write("/etc/machine-id", machineId); }
+
+  /// One of root's run "a" after the other, a second apart; the fields in place of the usual ones.
+  void add(Fields fields) {
+    const auto time = std::to_string(++_seconds) + "000000";
+    fields.merge(Fields{{"__REALTIME_TIMESTAMP", time},
+                        {"__MONOTONIC_TIMESTAMP", time},
+                        {"_BOOT_ID", machineId},
+                        {"_PID", "7"},
+                        {"_UID", "0"},
+                        {"_TRANSPORT", "journal"},
+                        {"SYSLOG_IDENTIFIER", "tavisk"},
+                        {"TAVISK_RUN", "a"},
+                        {"TAVISK_OUTCOME", "applied"},
+                        {"TAVISK_CHANGED", "yes"}});
+    for (const auto& [name, value] : fields) _entries.append(name).append("=").append(value).append("\n");
+    _entries += "\n";
+  }
+
+  /// "TIME SETTING: BEFORE > AFTER" of each.
+  std::vector<std::string> changes(std::vector<std::string>& remarks) {
+    const auto file = "/var/log/journal/" + std::string(machineId) + "/system.journal";
+    write("/entries", _entries);
+    write(file, "");
+    std::filesystem::remove(at(file));
+    EXPECT_TRUE(runTool((std::string(maker) + " -o ").append(at(file)).append(" ").append(at("/entries"))));
+    const auto found = LinuxChangeHistory(root).changes();
+    if (!found) return {describe(found.failure())};
+    remarks = found->remarks;
+    std::vector<std::string> lines;
+    for (const auto& change : found->changes)
+      lines.push_back(std::to_string(change.time) + " " + change.setting + ": " + change.before.value_or("?") + " > " +
+                      change.after.value_or("?") + (change.isEnded ? "" : " ..."));
+    return lines;
+  }
+
+ private:
+  std::int64_t _seconds = 0;
+  std::string _entries;
+};
+
+TEST(LinuxChangeHistory, IsWhatTheJournalKnowsOfAdministratorsAlone) {
+  if (!std::filesystem::exists(maker)) GTEST_SKIP() << "there is no " << maker;
+  JournalTree tree;
+  tree.add({{"TAVISK_SETTING", "Time Zone"}, {"TAVISK_OUTCOME", "begins"}});
+  tree.add({{"TAVISK_SETTING", "Time Zone"}, {"TAVISK_OLD", "UTC"}, {"TAVISK_NEW", "Etc/UTC"}});
+  tree.add({{"TAVISK_SETTING", "Display Sleep"}, {"TAVISK_OUTCOME", "begins"}, {"TAVISK_RUN", "b"}});
+  tree.add({{"TAVISK_SETTING", "Display Sleep"}, {"TAVISK_OLD", "1"}, {"TAVISK_NEW", "2"}});
+  tree.add({{"TAVISK_SETTING", "Remote Login"}, {"TAVISK_OUTCOME", "failed"}, {"TAVISK_CHANGED", "no"}});
+  tree.add({{"TAVISK_SETTING", "Computer Name"}, {"TAVISK_OLD", R"(a\nb\\)"}, {"TAVISK_NEW", ""}});
+  tree.add({{"TAVISK_SETTING", "Computer Name"}, {"TAVISK_OLD", std::string(longestJournalField, 'x')}});
+  const auto forged = [](const char* field, const char* value) {
+    return JournalTree::Fields{{"TAVISK_SETTING", "Remote Login"}, {"TAVISK_OLD", "on"}, {field, value}};
+  };
+  tree.add(forged("_UID", "4242"));
+  tree.add(forged("_UID", "nobody"));
+  tree.add(forged("_TRANSPORT", "stdout"));
+  tree.add(forged("SYSLOG_IDENTIFIER", "other"));
+  std::vector<std::string> remarks;
+  EXPECT_THAT(tree.changes(remarks),
+              ElementsAre("2 Time Zone: UTC > Etc/UTC", "3 Display Sleep: ? > ? ...", "4 Display Sleep: 1 > 2",
+                          "6 Computer Name: a\nb\\ > ", "7 Computer Name: ? > ?"));
+  EXPECT_THAT(remarks, ElementsAre("left out are changes in tavisk's name by users who are no administrators: "
+                                   "4242, nobody"));
+}
+
+}  // namespace
+}  // namespace tavisk
