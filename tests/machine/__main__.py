@@ -11,9 +11,11 @@ import bench
 import check
 import container
 import faults
+import fleet
 import guard
 import guest
 import machine
+import powercuts
 import purge
 import server
 import startup
@@ -26,14 +28,17 @@ KINDS = {
     "container": [lambda: faults.FewFaults("systemd-timesyncd", *REMOTE), lambda: container.Container("chrony"),
                   lambda: container.Container("ntpsec")],
     "guest": [guest.Guest],
-    "server": [server.Server],
+    "server": [lambda: server.Server(packages=["ansible-core"], own=["tavisk", trees.COLLECTION])],
     "startup": [startup.Startup],
+    "fleet": [fleet.Fleet],
     "systems": [systems.Grub, systems.BootEntries, systems.SavedDefault],
     "upgrade": [lambda: upgrade.Upgrade("systemd-timesyncd", *REMOTE)],
     "sweep": [faults.Faults],
+    "powercuts": [powercuts.PowerCuts],
     "bench": [lambda: bench.Bench(*REMOTE)],
 }
-ALONE = ("systems", "upgrade", "sweep", "bench")  # take long, and are run only when they are asked for
+# take long, and are run only when they are asked for
+ALONE = ("systems", "fleet", "upgrade", "sweep", "powercuts", "bench")
 
 
 def arguments():

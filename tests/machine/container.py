@@ -18,11 +18,13 @@ ANSWER_SECONDS = 120
 class Container(machine.Machine):
     cannot = "set a clock, let a time daemon correct one, reach firmware or devices"
 
-    def __init__(self, time_daemon, *packages, release=trees.RELEASE):
-        self.name = f"container with {time_daemon}"
-        self.has = frozenset({"bus", "container", time_daemon, *packages})
-        self._tree = trees.layered(f"container-{time_daemon}", [time_daemon, *packages], release)
-        self._log = trees.WORK / f"container-{time_daemon}.log"
+    def __init__(self, *packages, name="", release=trees.RELEASE, own=("tavisk",)):
+        """Without a name it has that of the first package."""
+        self.name = name or f"container with {packages[0]}"
+        self.has = frozenset({"bus", "container", *packages})
+        layer = self.name.replace(" ", "-")
+        self._tree = trees.layered(layer, packages, release, own)
+        self._log = trees.WORK / f"{layer}.log"
         self._manager = None
         self._first_process = None
         self._commands = itertools.count()
@@ -30,7 +32,7 @@ class Container(machine.Machine):
     def start(self):
         with open(self._log, "a") as log:
             self._manager = subprocess.Popen(
-                ["systemd-nspawn", "--register=no", "--keep-unit", "--private-network", "--machine=tavisk-container",
+                ["systemd-nspawn", "--register=no", "--keep-unit", "--private-network", f"--machine=tavisk-{self._log.stem}",
                  "--drop-capability=CAP_SYS_TIME", "--timezone=off", "--resolv-conf=off", "--link-journal=no", "-D", self._tree, "-b"],
                 stdin=subprocess.DEVNULL, stdout=log, stderr=log)
         self._first_process = machine.wait_until(self._find_first_process, 20, "the container's first process")

@@ -16,7 +16,8 @@ def prove(machine, results):
     made = machine.run(MADE).output.splitlines()
     in_force = machine.run(IN_FORCE).output
     problems = [] if any(path.startswith("/etc/") for path in made) else ["nothing was made that could be left behind"]
-    purged = machine.run("dpkg --purge tavisk")
+    # The collection's package too, where it is installed.
+    purged = machine.run("dpkg --purge $(dpkg-query --show --showformat '${Package} ' '*tavisk*')")
     if purged.status:
         problems.append(purged.output + purged.errors)
     problems += ["left: " + path for path in machine.run(MADE).output.splitlines()]

@@ -41,9 +41,10 @@ class Server(emulator.Emulated):
     cannot = "sleep and wake, lose its power"
     reboot = "systemctl reboot"
 
-    def __init__(self, kind="server", packages=(), devices=()):
+    def __init__(self, kind="server", packages=(), devices=(), own=("tavisk",)):
         """With devices of its own it has none for power settings."""
-        tree = trees.layered(f"{kind}-tree", [*trees.SERVER, *packages])
+        self.has |= {trees.COLLECTION} & set(own)
+        tree = trees.layered(f"{kind}-tree", [*trees.SERVER, *packages], own=own)
         disk = trees.WORK / f"{kind}.img"
         variables = trees.WORK / f"{kind}-variables.fd"
         super().__init__(kind, [

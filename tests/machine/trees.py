@@ -15,6 +15,7 @@ COMMON = ["dbus", "libblkid1", "libedit2", "libpam-systemd", "login", "polkitd",
 SERVER = ["busybox-static", "ethtool", "initramfs-tools", "kmod", "linux-image-amd64", "systemd-boot-efi", "systemd-timesyncd",
           "udev", "zstd"]
 HOOK = pathlib.Path(__file__).with_name("tree-hook.sh")
+COLLECTION = "ansible-collection-tavisk-settings"
 CACHE = pathlib.Path(os.environ.get("TAVISK_CACHE", "/var/cache/tavisk"))
 WORK = CACHE / "work"
 
@@ -38,29 +39,30 @@ def _cached(release, packages):
     return pathlib.Path(made.stdout.strip())
 
 
-def layered(name, packages, release=RELEASE):
-    """A tree with these packages and the program installed, to be changed at will."""
+def layered(name, packages, release=RELEASE, own=("tavisk",)):
+    """A tree with these packages and those of our own installed, to be changed at will."""
     clean = _cached(release, packages)
     layer = WORK / name
     for part in ("upper", "work", "tree"):
         (layer / part).mkdir(parents=True)
     run("mount", "-t", "overlay", "-o", f"lowerdir={clean},upperdir={layer}/upper,workdir={layer}/work", "overlay",
         layer / "tree")
-    install_package(layer / "tree", release)
+    install_packages(layer / "tree", release, own)
     return layer / "tree"
 
 
-def package(release=RELEASE):
+def package(release=RELEASE, name="tavisk"):
     """The file, which script/test-machine has made."""
-    (package,) = pathlib.Path("dist" if release == OWN_RELEASE else f"dist/{release}").glob("tavisk_*.deb")
+    (package,) = pathlib.Path("dist" if release == OWN_RELEASE else f"dist/{release}").glob(f"{name}_*.deb")
     return package
 
 
-def install_package(tree, release):
-    """And beside it the test that comes with the package's sources."""
-    shutil.copy(package(release), tree / "root/tavisk.deb")
+def install_packages(tree, release, own):
+    """And beside them the test that comes with the package's sources."""
+    for name in own:
+        shutil.copy(package(release, name), tree / f"root/{name}.deb")
     shutil.copy("debian/tests/smoke", tree / "root/smoke-test")
-    run("chroot", tree, "dpkg", "--install", "/root/tavisk.deb",
+    run("chroot", tree, "dpkg", "--install", *(f"/root/{name}.deb" for name in own),
         env={**os.environ, "PATH": "/usr/sbin:/usr/bin:/sbin:/bin"})
 
 

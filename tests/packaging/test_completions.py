@@ -56,6 +56,8 @@ CONTROL_CASES = [
     ("undo --since ", ["now", "today", "yesterday"]),
     ("undo --since today --r", ["--run"]),
     ("undo t", []),
+    ("reset --", ["--help", "--json", "--version"]),
+    ("reset displaysleep tim", ["time", "time-zone"]),
 ]
 
 

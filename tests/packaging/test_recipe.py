@@ -47,7 +47,7 @@ NOT_TAKEN = [
     "-setcomputersleep soon", "-setdisplaysleep -1", "-setharddisksleep ''", "-setwakeonmodem yes", "-setrestartfreeze 1",
     "-setwaitforstartupafterpowerfailure 45", "-setremotelogin perhaps", "-setlocalsubnetname db_4",
     "-setkernelbootarchitecture sparc", "-setdisablekeyboardwhenenclosurelockisengaged maybe", "-setstartupdisk Nowhere",
-    "-settimezone Mars/Base -settimezone Etc/UTC", "", "-settime abc", "-settime 9:x", "-setdate 1:1:x",
+    "-setremotevelmarevents ''", "-setallowpowerbuttontosleepcomputer ''", "-settimezone Mars/Base -settimezone Etc/UTC", "", "-settime abc", "-settime 9:x", "-setdate 1:1:x",
     "-setwaitforstartupafterpowerfailure soon",
 ]
 WHERE_ALL_IS_REFUSED = [

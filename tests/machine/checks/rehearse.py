@@ -2,6 +2,7 @@
 # SPDX-License-Identifier: MIT
 """What is rehearsed is what the machine then does."""
 
+import pathlib
 import re
 
 from check import Check
@@ -26,82 +27,8 @@ rm -rf /run/copy
 """
 
 KEYBOARD = "disablekeyboardwhenenclosurelockisengaged"
-LONG_NAME = ".".join(["a" * 40] * 2)
-SETS = f"""
--settimezone Europe/Paris
--settimezone Europe/Paris -gettimezone
--settimezone Nowhere/Land
--settimezone europe/rome -gettimezone
--settimezone ''
--settimezone ../../etc/passwd
--settimezone Asia/Tokyo -gettimezone -settimezone Asia/Tokyo -settimezone Europe/Rome -gettimezone
--setdate 1/1/1950
--setdate 13/1/2030
--setdate ''
--setdate 1/2/2031 -settime 3:4:5
--settime 25:0:0
--settime noon
--setusingnetworktime off -settime 1:2:3
--setusingnetworktime off
--setusingnetworktime on -getusingnetworktime -settime 1:2:3
--setusingnetworktime on -setusingnetworktime off -getusingnetworktime -setusingnetworktime off
--setusingnetworktime maybe
--setusingnetworktime ''
--setnetworktimeserver time.example -getnetworktimeserver
--setnetworktimeserver time.example
--setnetworktimeserver 'two words'
--setnetworktimeserver ''
--setnetworktimeserver a.example -setnetworktimeserver b.example -getnetworktimeserver
--setsleep 20 -getsleep
--setsleep never
--setsleep 181
--setcomputersleep 30
--setcomputersleep soon
--setdisplaysleep 10 -getdisplaysleep
--setharddisksleep -5
--setharddisksleep ''
--setwakeonmodem on
--setwakeonmodem off
--setwakeonnetworkaccess on
--setwakeonnetworkaccess maybe
--setrestartpowerfailure on
--setrestartpowerfailure off
--setrestartfreeze on -getrestartfreeze
--setrestartfreeze off
--setrestartfreeze maybe
--setallowpowerbuttontosleepcomputer on
--setallowpowerbuttontosleepcomputer off
--setwaitforstartupafterpowerfailure 30
--setwaitforstartupafterpowerfailure 999990
--setwaitforstartupafterpowerfailure soon
--setremotelogin on -getremotelogin
--setremotelogin on
--setremotelogin off -getremotelogin -setremotelogin off
--setremotelogin maybe
--setremotelogin on -setremotelogin off -setremotelogin on -getremotelogin
--setremotevelmarevents on -getremotevelmarevents
--setremotevelmarevents off
--setremotevelmarevents maybe
--setcomputername 'A machine' -getcomputername
--setcomputername 'A machine'
--setcomputername 'Z\u00fcrich, "2" of $HOME' -getcomputername
--setcomputername "$(printf 'a\\001b')" -getcomputername
--setcomputername '' -getcomputername -setlocalsubnetname mail.example -getlocalsubnetname -getcomputername
--setlocalsubnetname host-a -getlocalsubnetname
--setlocalsubnetname host-a
--setlocalsubnetname host-a.example -getlocalsubnetname -setcomputername Front -getcomputername
--setlocalsubnetname 'bad name'
--setlocalsubnetname {LONG_NAME}
--setkernelbootarchitecture i386 -getkernelbootarchitecturesetting
--setkernelbootarchitecture default -getkernelbootarchitecturesetting -setkernelbootarchitecture x86_64
--setkernelbootarchitecture ppc
--set{KEYBOARD} yes -get{KEYBOARD}
--set{KEYBOARD} yes -set{KEYBOARD} no -get{KEYBOARD}
--set{KEYBOARD} maybe
--liststartupdisks -getstartupdisk
--setstartupdisk Nowhere -getstartupdisk -setstartupdisk ''
-nonsense -settimezone Europe/Rome
-""".strip().splitlines()
+# Words of one run, a line each, quoted as in a shell.
+SETS = pathlib.Path(__file__).with_name("rehearsed.words").read_text(encoding="utf-8").splitlines()
 AT_ONCE = 19  # a check has its time
 # Texts, flags and outcomes in their order; then the status.
 COMPARE = """told() { grep -o -e '"failed":[a-z]*' -e '{"setting":"[^"]*","outcome":"[^"]*"' -e '"output":"[^"]*"' "$1"; }
