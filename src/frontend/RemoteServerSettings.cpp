@@ -5,8 +5,10 @@
 #include <cerrno>
 #include <chrono>
 #include <exception>
+#include <future>
 #include <system_error>
 #include <thread>
+#include <utility>
 
 #include "base/Process.h"
 
@@ -134,14 +136,20 @@ void RemoteServerSettings::endedBySignal(const std::string& signal) {
   _ended = true;
   _context.input.restoreTerminal();
   // Beside the rest: a slow service must not keep what was printed, nor a full pipe the authorization.
-  std::jthread givingUp;
-  doStep([&] { givingUp = std::jthread([this] { doStep([this] { giveUpAuthorization(); }); }); });
+  std::future<void> givenUp;
+  doStep([&] {
+    std::packaged_task<void()> givingUp([this] { giveUpAuthorization(); });
+    auto whenDone = givingUp.get_future();
+    std::thread(std::move(givingUp)).detach();
+    givenUp = std::move(whenDone);
+  });
   doStep([&] { _effects.interrupt("the run was ended by " + signal); });
   doStep([&] {
     if (_context.record) _context.record->runEndedBySignal(signal, hasFailed(), _context.output.takePrinted());
   });
   _context.output.finish();
-  if (!givingUp.joinable()) doStep([this] { giveUpAuthorization(); });
+  if (givenUp.valid()) return givenUp.wait();
+  doStep([this] { giveUpAuthorization(); });
 }
 
 }  // namespace tavisk

@@ -62,6 +62,15 @@ class Faults(unittest.TestCase):
             self.assertRegex(self.place.trace(), rf'(?s)write\(\d+<{file}>.*?fsync\(\d+<{file}>.*?'
                              rf'renameat\(\d+<{folder}>, "{name}",((?!openat).)*fsync\(\d+<{folder}>')
 
+    def test_what_did_not_get_to_the_disk_is_told(self):
+        told = []
+        for call in range(1, 7):
+            self.place.run(COMMANDS[1].set("i386"), "-y", "-e", f"inject=fsync:error=EIO:when={call}")
+            if re.search(r"fsync\(\d+<.*/SystemConfiguration.*INJECTED", self.place.trace()):
+                (entry,) = self.place.report()
+                told += [effect.get("why", effect["outcome"]) for effect in entry["effects"]]
+        self.assertEqual(told, ["Input/output error", "Input/output error; the new value may not survive a power cut"])
+
     def test_a_write_that_is_interrupted_is_made_again(self):
         self.place.run(COMMANDS[1].set("i386"), "-y", "-e", "inject=write:error=EINTR:when=1..3+2")
         self.assertEqual(len(re.findall(r"write\(\d+<.*/\.tavisk-.*INJECTED", self.place.trace())), 2)
