@@ -32,17 +32,20 @@ ERRORS = {
 WALKED = "/share/zoneinfo"  # file by file: each 20th of these calls is enough
 MISSED = "did not come about"
 LEFTOVER = "/.tavisk-"
+MARKS = "/var/lib/tavisk/resets"
 CHANGING = ("write", "fsync", "renameat", "symlinkat", "mkdirat", "unlinkat", "ftruncate")
+RESETTING = (*CHANGING, "sendmsg", "ioctl")
 
 
 @dataclasses.dataclass(frozen=True)
 class Command:
-    """A setting with two values, and the word that tells it. One that is `slow` meets one error a call."""
+    """A setting with two values, the word that tells it, and its name for a reset. One that is `slow` meets one error a call."""
     setting: str
     old: str
     new: str
     slow: bool = False
     get: str = ""
+    reset: str = ""
 
     def set(self, value):
         return ["-set" + self.setting, value]
@@ -78,8 +81,14 @@ class Place:
 
     def run(self, words, *strace):
         self._at(self._work + "/report").unlink(missing_ok=True)
+        return self._start_program([self._program, "-f", *words], strace)
+
+    def reset(self, name, *strace):
+        return self._start_program([self._program + "ctl", "reset", name], strace)
+
+    def _start_program(self, words, strace):
         traced = ["strace", "-f", "-qq", "-o", self._work + "/trace", *strace] if strace else []
-        command = [*self._start, f"TAVISK_REPORT={self._work}/report", *traced, self._program, "-f", *words]
+        command = [*self._start, f"TAVISK_REPORT={self._work}/report", *traced, *words]
         return subprocess.run(command, stdin=subprocess.DEVNULL, capture_output=True, timeout=60).returncode
 
     def state(self):
@@ -231,6 +240,37 @@ def _differing(state, *others):
 
 def _leftovers(state, kind):
     return [(kind, path) for path in sorted(state) if LEFTOVER in path]
+
+
+def _after_reset(place, command):
+    """The files, and the value that is told."""
+    state = place.state()
+    place.run([command.look])
+    return state, place.report()[0]["output"]
+
+
+def wrong_resets(place, command):
+    """(count of runs, what was wrong): a reset is killed before each call that changes something, and is given again."""
+    place.run(command.set(command.new))
+    before = place.state()
+    place.reset(command.reset, "-e", "trace=" + ",".join(RESETTING))
+    calls = collections.Counter(re.findall(r"^\d+ +(\w+)\(", place.trace(), re.MULTILINE))
+    right = _after_reset(place, command)
+    if not _differing(before, right[0]):
+        return 0, [f"{command.setting}: a reset changes nothing"]
+    wrong, runs = [], 0
+    for name, which in [(name, which) for name, count in calls.items() for which in range(1, count + 1)]:
+        place.run(command.set(command.new))
+        if place.reset(command.reset, "-e", f"trace={name}", "-e", f"inject={name}:signal={KILL}:when={which}") not in (137, -9):
+            continue
+        runs += 1
+        torn = [path for path in _differing(place.state(), before, right[0]) if not path.startswith(MARKS)]
+        place.reset(command.reset)
+        state, text = _after_reset(place, command)
+        left = [path for path in _differing(state, right[0]) if path != MARKS] + [path for path in state if LEFTOVER in path]
+        if torn or left or text != right[1]:
+            wrong.append(f"{command.setting}: {name} {which}: {torn} {left} {text!r}")
+    return runs, wrong if runs else [f"{command.setting}: nothing was killed"]
 
 
 def sweep(place, command, choose=list, done=(), tell=lambda *_: None):

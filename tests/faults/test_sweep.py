@@ -15,8 +15,9 @@ import injection
 PLIST = "/machine.plist"
 COMMANDS = [
     injection.Command("computername", "Old", "New"),
-    injection.Command("kernelbootarchitecture", "i386", "x86_64", get="-getkernelbootarchitecturesetting"),
-    injection.Command("networktimeserver", "192.0.2.1", "192.0.2.2"),
+    injection.Command("kernelbootarchitecture", "i386", "x86_64", get="-getkernelbootarchitecturesetting",
+                      reset="kernelarchitecture"),
+    injection.Command("networktimeserver", "192.0.2.1", "192.0.2.2", reset="networktimeserver"),
 ]
 
 
@@ -50,6 +51,13 @@ class Faults(unittest.TestCase):
                 runs, found = injection.sweep(self.place, command, injection.few_of)
                 print(f"{command.setting}: {runs} runs", flush=True)
                 self.assertEqual([f"{kind}: {detail}" for kind, details in found.items() for detail in details], [])
+
+    def test_a_reset_that_was_killed_is_ended_by_the_next(self):
+        for command in COMMANDS[1:]:
+            with self.subTest(command.setting):
+                runs, wrong = injection.wrong_resets(self.place, command)
+                self.assertGreater(runs, 5)
+                self.assertEqual(wrong, [])
 
     def test_a_new_file_is_on_the_disk_before_it_takes_the_old_one_s_place_and_then_its_name(self):
         self.place.run(COMMANDS[1].set("i386"), "-y", "-e", "trace=openat,write,fsync,renameat")

@@ -50,18 +50,18 @@ tavisk -setcomputersleep 30 -setallowpowerbuttontosleepcomputer on
 """
 # These need nothing that a container lacks.
 PLAIN = [
-    Command("kernelbootarchitecture", "i386", "x86_64", get="-getkernelbootarchitecturesetting"),
-    Command("disablekeyboardwhenenclosurelockisengaged", "yes", "no"),
+    Command("kernelbootarchitecture", "i386", "x86_64", get="-getkernelbootarchitecturesetting", reset="kernelarchitecture"),
+    Command("disablekeyboardwhenenclosurelockisengaged", "no", "yes", reset="keyboardlockpreference"),
     Command("computername", "Old", "New"),
 ]
 COMMANDS = [
-    Command("networktimeserver", "192.0.2.1", "192.0.2.2"),
+    Command("networktimeserver", "192.0.2.1", "192.0.2.2", reset="networktimeserver"),
     Command("localsubnetname", "old-name", "new-name"),
-    Command("displaysleep", "5", "10"),
-    Command("harddisksleep", "never", "10"),
-    Command("restartfreeze", "off", "on"),
-    Command("allowpowerbuttontosleepcomputer", "off", "on"),
-    Command("computersleep", "20", "40", slow=True),
+    Command("displaysleep", "5", "10", reset="displaysleep"),
+    Command("harddisksleep", "never", "10", reset="harddisksleep"),
+    Command("restartfreeze", "off", "on", reset="restartafterfreeze"),
+    Command("allowpowerbuttontosleepcomputer", "off", "on", reset="powerbuttonsleep"),
+    Command("computersleep", "20", "40", slow=True, reset="computersleep"),
     Command("remotelogin", "off", "on", slow=True),
     *PLAIN,
     Command("timezone", "Europe/Paris", "Asia/Tokyo"),
@@ -116,6 +116,12 @@ class FewFaults(container.Container):
     def prove_more(self, results):
         for command in PLAIN:
             self.sweep(command, results, choose=injection.few_of)
+        self.prove_resets(PLAIN, results)
+
+    def prove_resets(self, commands, results):
+        for command in (command for command in commands if command.reset):
+            runs, wrong = injection.wrong_resets(Inside(self._first_process), command)
+            results.add(f"{self.name}: {command.reset} reset, killed {runs} times", wrong[:5])
 
     def sweep(self, command, results, **how):
         began = time.monotonic()
@@ -145,6 +151,7 @@ class Faults(FewFaults):
         self._prove_that_who_waits_is_told(results)
         for pair in AT_ONCE:
             self._prove_two_at_once(pair, results)
+        self.prove_resets(COMMANDS, results)
         self._done.touch()
         done = [json.loads(line) for line in self._done.read_text().splitlines()]
         with open(self._done, "a", buffering=1) as file:

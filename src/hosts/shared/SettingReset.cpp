@@ -54,7 +54,7 @@ class Reset {
     WrittenPlaces taken;
     const auto away = _steps.own.takeAway(taken);
     _effect.where = taken.text();
-    _effect.changed = !_effect.where.empty();
+    _effect.changed = away || !_effect.where.empty();
     if (!away) fail(away.failure());
     if (_lack)
       _effect.note = "this machine cannot have the setting: " + describe(*_lack);

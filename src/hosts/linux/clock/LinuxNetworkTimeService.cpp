@@ -297,11 +297,14 @@ OwnPart LinuxNetworkTimeService::ownServerFiles() const {
 
 void LinuxNetworkTimeService::resetServer() {
   auto setting = serverSetting();
-  setting.own = ownServerFiles();
-  _isServerChanged = reset(setting, _machine).changed || _isServerChanged;
+  const ResetMark mark(_machine.root, setting.name);
+  setting.own = mark.around(ownServerFiles());
+  const auto effect = reset(setting, _machine, hold(_machine));
+  _isServerChanged = effect.changed || _isServerChanged;
   if (!_isServerChanged) return;
   const auto running = runs(client());
   if (!running || *running) restartAsynchronously();
+  if (running && (!*running || !_isServerChanged)) unmark(mark, effect, _machine);
 }
 
 /// A client that has read its servers as they are goes on undisturbed.

@@ -59,10 +59,13 @@ void LinuxPreferencesStore::writeOut() {
 void LinuxPreferencesStore::resetKeyboardLock() {
   const auto held = hold(_machine);
   auto setting = preference(DunmereLockEnclosureStateKey);
-  setting.own = ownKey(_file, DunmereLockEnclosureStateKey);
+  const ResetMark mark(_machine.root, setting.name);
+  setting.own = mark.around(ownKey(_file, DunmereLockEnclosureStateKey));
   setting.own.check = [this] { return check(); };
   const auto effect = reset(setting, _machine, held);
-  if (effect.outcome == Outcome::applied) _lock.setDisablesKeyboard(false, held);
+  if (effect.outcome != Outcome::applied) return;
+  _lock.setDisablesKeyboard(false, held);
+  unmark(mark, effect, _machine);
 }
 
 Result<void> LinuxPreferencesStore::check() const {

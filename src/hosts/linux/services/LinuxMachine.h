@@ -4,11 +4,13 @@
 
 #include <functional>
 #include <type_traits>
+#include <utility>
 
 #include "base/RunLoop.h"
 #include "effects/EffectSink.h"
 #include "hosts/linux/services/ServiceAccess.h"
 #include "hosts/linux/system/MachineLock.h"
+#include "hosts/linux/system/ResetMark.h"
 #include "hosts/shared/SettingChange.h"
 #include "hosts/shared/SettingReset.h"
 #include "hosts/shared/SystemRoot.h"
@@ -55,7 +57,7 @@ Effect carryOut(const Setting<Value>& setting, const std::type_identity_t<Value>
   return carryOut(setting, asked, machine, hold(machine));
 }
 
-/// The same of reset().
+/// reset() as a part of what is done while the machine is held.
 template <typename Value>
 Effect reset(const Setting<Value>& setting, const LinuxMachine& machine, const MachineHold& held) {
   if (held) return reset(setting, machine.effects, machine.runLoop, machine.conduct);
@@ -63,9 +65,19 @@ Effect reset(const Setting<Value>& setting, const LinuxMachine& machine, const M
   machine.effects.record(effect);
   return effect;
 }
+/// When all of a reset is done, and not only foretold.
+inline void unmark(const ResetMark& mark, const Effect& effect, const LinuxMachine& machine) {
+  if (machine.conduct == Conduct::change && effect.outcome == Outcome::applied) mark.remove();
+}
+
+/// reset() by a user who may, while no other run changes this machine; one that was cut short is ended.
 template <typename Value>
-Effect reset(const Setting<Value>& setting, const LinuxMachine& machine) {
-  return reset(setting, machine, hold(machine));
+Effect reset(Setting<Value> setting, const LinuxMachine& machine) {
+  const ResetMark mark(machine.root, setting.name);
+  setting.own = mark.around(std::move(setting.own));
+  auto effect = reset(setting, machine, hold(machine));
+  unmark(mark, effect, machine);
+  return effect;
 }
 
 }  // namespace tavisk

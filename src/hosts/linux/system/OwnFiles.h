@@ -25,6 +25,11 @@ inline constexpr const char* kernelPanic = "/etc/sysctl.d/60-tavisk.conf";
 inline constexpr const char* machineLockFolder = "/run/tavisk";
 inline constexpr const char* machineLock = "/run/tavisk/lock";
 
+/// While a reset is under way (ResetMark).
+inline std::string resetMark(const std::string& setting) {
+  return "/var/lib/tavisk/resets/" + setting;
+}
+
 /// Beside the main file of one of the service manager's daemons: "timesyncd.conf".
 inline std::string systemdDropIn(const std::string& mainFile) {
   return "/etc/systemd/" + mainFile + ".d/60-tavisk.conf";

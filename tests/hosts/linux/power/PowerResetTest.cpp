@@ -74,6 +74,40 @@ TEST(PowerReset, TakesTheOwnFilesAwayAndPutsIntoForceWhatIsLeft) {
   }
 }
 
+TEST(PowerReset, EndsWhatWasCutShort) {
+  for (const auto& each : resets()) {
+    PowerTree tree;
+    const auto mark = std::string("/var/lib/tavisk/resets/") + each.name;
+    each.set(tree);
+    tree.write(mark, "");
+    for (const auto& file : filesOf(tree)) std::filesystem::remove(file);
+    each.reset(tree.foreteller());
+    EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied) << each.name;
+    EXPECT_TRUE(tree.has(mark)) << each.name;
+    each.reset(tree.power());
+    EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied) << each.name;
+    EXPECT_EQ(tree.lastEffect().live, each.live) << each.name;
+    EXPECT_FALSE(tree.has(mark)) << each.name;
+    each.reset(tree.power());
+    EXPECT_EQ(tree.lastEffect().outcome, Outcome::unchanged) << each.name;
+  }
+}
+
+TEST(PowerReset, EndsWhatHasFailedAfterTheFileWasGone) {
+  constexpr const char* control = "/sys/block/sda/device/power/control";
+  PowerTree tree;
+  tree.set(SleepTimer::hardDisk, {20});
+  tree.makeUnreadable(control);
+  tree.power().reset(SleepTimer::hardDisk);
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
+  EXPECT_THAT(filesOf(tree), IsEmpty());
+  tree.remove(control);
+  tree.write(control, "auto\n");
+  tree.power().reset(SleepTimer::hardDisk);
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::applied) << toJson(tree.lastEffect());
+  EXPECT_EQ(tree.file(control), "on");
+}
+
 TEST(PowerReset, NeedsRootAndLeavesWhatItForetellsOrCannotLookAt) {
   for (const auto& each : resets()) {
     PowerTree tree;
