@@ -30,8 +30,10 @@ struct Tools {
   /// Opens the machine, which tells its effects to the sink.
   std::function<Result<std::unique_ptr<Host>>(EffectSink& effects, RunLoop& runLoop)> openHost;
   /// Opens a copy of that machine, made in a folder that is there and empty: what is done to it is what the machine
-  /// would do, and is told so; what cannot be read of the machine is told to the sink too.
-  std::function<Result<std::unique_ptr<Host>>(const std::string& directory, EffectSink& effects, RunLoop& runLoop)>
+  /// would do, and is told so; what cannot be read of the machine is told to the sink too. `withDisks`: it has disks,
+  /// and of the files on them what is looked at.
+  std::function<Result<std::unique_ptr<Host>>(const std::string& directory, bool withDisks, EffectSink& effects,
+                                              RunLoop& runLoop)>
       openRehearsal;
   Output& output;                                  ///< standard output
   std::function<void(std::string_view)> complain;  ///< one line on standard error

@@ -56,7 +56,7 @@ HostOrFailure openChosenHost(EffectSink& effects, RunLoop& runLoop, const HostRe
                     [&](const auto& directory) { return openScratchHost(directory, effects, runLoop, remark); }});
 }
 
-HostOrFailure openRehearsal(const std::string& directory, EffectSink& effects, RunLoop& runLoop) {
+HostOrFailure openRehearsal(const std::string& directory, bool withDisks, EffectSink& effects, RunLoop& runLoop) {
   auto told = std::make_unique<EffectSink>();
   bool showsHostName = false;
   const auto openLinuxHost = [&] {
@@ -66,8 +66,8 @@ HostOrFailure openRehearsal(const std::string& directory, EffectSink& effects, R
   auto machine = openNamed(
       {openLinuxHost, [&](const auto& source) { return openForecastingScratchHost(source, *told, runLoop); }});
   if (!machine) return machine.failure();
-  auto rehearsal =
-      RehearsalHost::open({std::move(told), std::move(machine).value(), showsHostName}, directory, effects, runLoop);
+  auto rehearsal = RehearsalHost::open({std::move(told), std::move(machine).value(), showsHostName},
+                                       {directory, withDisks}, effects, runLoop);
   if (!rehearsal) return rehearsal.failure();
   return std::unique_ptr<Host>(std::move(rehearsal).value());
 }

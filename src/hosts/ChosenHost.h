@@ -21,6 +21,8 @@ Result<std::unique_ptr<Host>> openChosenHost(EffectSink& effects, RunLoop& runLo
 
 /// A copy of that machine in a folder, which is there and empty: whatever is done to the host is done to the copy, as
 /// far as the machine would do it, and told as the machine would tell it. The machine itself is left alone.
-Result<std::unique_ptr<Host>> openRehearsal(const std::string& directory, EffectSink& effects, RunLoop& runLoop);
+/// `withDisks`: the copy has disks too, and the files of them that are looked at.
+Result<std::unique_ptr<Host>> openRehearsal(const std::string& directory, bool withDisks, EffectSink& effects,
+                                            RunLoop& runLoop);
 
 }  // namespace tavisk

@@ -30,6 +30,7 @@ KINDS = {
     "guest": [guest.Guest],
     "server": [lambda: server.Server(packages=["ansible-core"], own=["tavisk", trees.COLLECTION])],
     "startup": [startup.Startup],
+    "rehearsal": [server.Rehearsal],
     "fleet": [fleet.Fleet],
     "systems": [systems.Grub, systems.BootEntries, systems.SavedDefault],
     "upgrade": [lambda: upgrade.Upgrade("systemd-timesyncd", *REMOTE)],
@@ -38,7 +39,7 @@ KINDS = {
     "bench": [lambda: bench.Bench(*REMOTE)],
 }
 # take long, and are run only when they are asked for
-ALONE = ("systems", "fleet", "upgrade", "sweep", "powercuts", "bench")
+ALONE = ("rehearsal", "systems", "fleet", "upgrade", "sweep", "powercuts", "bench")
 
 
 def arguments():

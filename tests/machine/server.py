@@ -67,6 +67,14 @@ class Server(emulator.Emulated):
         return super().run(command)
 
 
+class Rehearsal(Server):
+    """What is rehearsed is compared with what is done where there is more to set than in a container."""
+    has = own = frozenset({"rehearsal"})
+
+    def __init__(self):
+        super().__init__("rehearsal", ["jq", "openssh-server"])
+
+
 def _power_devices():
     """A disk with a motor and one without, a watchdog, and the way to the controller."""
     devices = ["-device", "i6300esb", "-chardev", f"socket,id=controller,path={CONTROLLER},reconnect=10",

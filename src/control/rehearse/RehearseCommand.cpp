@@ -57,18 +57,25 @@ Status show(const Rehearsed& rehearsed, const Invocation& invocation, const Tool
   return isAllDone(rehearsed) ? Status::done : Status::incomplete;
 }
 
+/// What is kept has the files that the search for startup disks looks at.
+void searchStartupDisks(WordRunner& runner) {
+  for (const auto* const word : {"-liststartupdisks", "-getstartupdisk"}) {
+    const std::string words[] = {word};
+    runner.run(words);
+  }
+}
+
 /// What could not be read of the machine is told, and not rehearsed.
 class LookFailures final : public EffectChannel {
  public:
+  explicit LookFailures(const Tools& tools) : _tools(tools) {}
+
   void record(const Effect& effect) override {
-    if (effect.failure) _failures.push_back(effect.setting + ": " + describe(*effect.failure));
-  }
-  void tell(const Tools& tools) const {
-    for (const auto& failure : _failures) tools.complain("not read: " + failure);
+    if (effect.failure) _tools.complain("not read: " + effect.setting + ": " + describe(*effect.failure));
   }
 
  private:
-  std::vector<std::string> _failures;
+  const Tools& _tools;
 };
 
 }  // namespace
@@ -82,19 +89,19 @@ Status rehearseChanges(const Invocation& invocation, const Tools& tools) {
   const auto waiter = endBySignal(
       signals, [&](const std::string&) { folder->removeTemporary(); }, tools);
   EffectSink effects;
-  LookFailures failures;
+  LookFailures failures(tools);
   StatusReader reader;
   RehearsalNotes notes;
   RunLoop runLoop;
   effects.addChannel(failures);
-  const auto host = tools.openRehearsal(folder->path(), effects, runLoop);
-  effects.removeChannel(failures);
-  failures.tell(tools);
+  const auto host = tools.openRehearsal(folder->path(), invocation.has(keep), effects, runLoop);
   if (!host) return endBy(host.failure(), Status::incomplete, tools);
-  effects.addChannel(reader);
-  effects.addChannel(notes);
   WordRunner runner(**host, effects, runLoop);
   if (const auto started = runner.start(); !started) return endBy(started.failure(), Status::incomplete, tools);
+  if (invocation.has(keep)) searchStartupDisks(runner);
+  effects.removeChannel(failures);
+  effects.addChannel(reader);
+  effects.addChannel(notes);
   return show(rehearsedOn(**host, *part, runner, reader, notes), invocation, tools);
 }
 

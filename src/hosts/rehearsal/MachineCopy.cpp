@@ -12,6 +12,7 @@
 
 #include "base/PropertyList.h"
 #include "effects/SettingNames.h"
+#include "hosts/rehearsal/DiskCopy.h"
 #include "hosts/scratch/MachineFile.h"
 
 namespace tavisk {
@@ -161,15 +162,16 @@ Result<void> copyLoaderFile(BootLoaderFile& file, const std::string& directory) 
 
 }  // namespace
 
-Result<void> copyMachine(Host& machine, EffectSink& effects, const std::string& directory, EffectSink& audience) {
-  const Answers answers(effects);
-  auto described = tavisk::described(machine, answers);
-  if (auto copied = copyLoaderFile(machine.bootLoaderFile(), directory); !copied) return copied;
+Result<void> copyMachine(const MachineToCopy& machine, const PlaceOfCopy& place, EffectSink& audience) {
+  const Answers answers(machine.effects);
+  auto described = tavisk::described(machine.host, answers);
+  if (place.hasDisks) copyDisks(machine.host, machine.runLoop, described);
+  if (auto copied = copyLoaderFile(machine.host.bootLoaderFile(), place.directory); !copied) return copied;
   for (const auto& [setting, failure] : answers.failures()) audience.recordFailure(setting, failure);
   for (const auto& [setting, failure] : answers.unknown())
     described.dictionary("Refusals").set(setting + " (read)", describe(failure));
   EffectSink unwatched;
-  const auto file = MachineFile::open(directory, unwatched);
+  const auto file = MachineFile::open(place.directory, unwatched);
   if (!file) return file.failure();
   return (*file)->change([&](Dictionary& written) { written = std::move(described); });
 }

@@ -5,7 +5,6 @@
 #include <utility>
 
 #include "effects/SettingNames.h"
-#include "hosts/rehearsal/MachineCopy.h"
 
 namespace tavisk {
 namespace {
@@ -20,17 +19,19 @@ RemoteEventsService& remoteEventsOf(Host& host) {
 
 }  // namespace
 
-Result<std::unique_ptr<RehearsalHost>> RehearsalHost::open(ForetellingMachine machine, const std::string& directory,
+Result<std::unique_ptr<RehearsalHost>> RehearsalHost::open(ForetellingMachine machine, const PlaceOfCopy& place,
                                                            EffectSink& effects, RunLoop& runLoop) {
-  if (const auto copied = copyMachine(*machine.host, *machine.effects, directory, effects); !copied)
+  if (const auto copied = copyMachine({*machine.host, *machine.effects, runLoop}, place, effects); !copied)
     return copied.failure();
-  Copy copy{std::make_unique<EffectSink>(), nullptr, nullptr};
-  auto host = ScratchHost::open(directory, *copy.effects, runLoop);
+  Copy copy{std::make_unique<EffectSink>(), nullptr, nullptr, nullptr};
+  auto host = ScratchHost::open(place.directory, *copy.effects, runLoop);
   if (!host) return host.failure();
   copy.host = std::move(host).value();
-  auto file = MachineFile::open(directory, *copy.effects);
+  auto file = MachineFile::open(place.directory, *copy.effects);
   if (!file) return file.failure();
   copy.file = std::move(file).value();
+  if (place.hasDisks)
+    copy.files = std::make_unique<CopiedFiles>(machine.host->files(), SystemRoot(place.directory + "/root"), effects);
   return std::unique_ptr<RehearsalHost>(new RehearsalHost(std::move(machine), std::move(copy), effects));
 }
 
@@ -39,6 +40,7 @@ RehearsalHost::RehearsalHost(ForetellingMachine machine, Copy copy, EffectSink& 
       _copyEffects(std::move(copy.effects)),
       _copy(std::move(copy.host)),
       _copyFile(std::move(copy.file)),
+      _copiedFiles(std::move(copy.files)),
       _stage({*_machine.host, *_machine.effects, *_copy, *_copyEffects, *_copyFile}, effects),
       _clock(_stage),
       _networkTime(_stage),

@@ -5,6 +5,8 @@
 #include <memory>
 #include <string>
 
+#include "hosts/rehearsal/CopiedFiles.h"
+#include "hosts/rehearsal/MachineCopy.h"
 #include "hosts/rehearsal/RehearsedServices.h"
 #include "hosts/rehearsal/Stage.h"
 #include "hosts/scratch/MachineFile.h"
@@ -21,16 +23,19 @@ struct ForetellingMachine {
 };
 
 /// A machine and its copy in files, on which is done what the machine would do: what is changed is changed there alone.
-/// The copy has no startup disks: those are the machine's, of which one is chosen without writing it down.
+/// Which disks and files there are the machine is asked; a copy that has disks gets the files that are looked at.
 class RehearsalHost final : public Host {
  public:
-  /// Copies the machine into the folder, which is there and empty. Effects are told as the machine would tell them.
-  static Result<std::unique_ptr<RehearsalHost>> open(ForetellingMachine machine, const std::string& directory,
+  /// Copies the machine there. Effects are told as the machine would tell them.
+  static Result<std::unique_ptr<RehearsalHost>> open(ForetellingMachine machine, const PlaceOfCopy& place,
                                                      EffectSink& effects, RunLoop& runLoop);
 
   UserDatabase& users() override { return _copy->users(); }
   AdminAuthenticator& authenticator() override { return _copy->authenticator(); }
-  FileSystem& files() override { return _machine.host->files(); }
+  FileSystem& files() override {
+    if (_copiedFiles) return *_copiedFiles;
+    return _machine.host->files();
+  }
   SystemLog& systemLog() override { return _copy->systemLog(); }
   ClockService& clock() override { return _clock; }
   NetworkTimeService& networkTime() override { return _networkTime; }
@@ -62,6 +67,7 @@ class RehearsalHost final : public Host {
     std::unique_ptr<EffectSink> effects;
     std::unique_ptr<Host> host;
     std::unique_ptr<MachineFile> file;
+    std::unique_ptr<CopiedFiles> files;
   };
   RehearsalHost(ForetellingMachine machine, Copy copy, EffectSink& effects);
 
@@ -69,6 +75,7 @@ class RehearsalHost final : public Host {
   std::unique_ptr<EffectSink> _copyEffects;
   std::unique_ptr<Host> _copy;
   std::unique_ptr<MachineFile> _copyFile;
+  std::unique_ptr<CopiedFiles> _copiedFiles;  ///< null: the copy has no disks
   Stage _stage;
   RehearsedClock _clock;
   RehearsedNetworkTime _networkTime;

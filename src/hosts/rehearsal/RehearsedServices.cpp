@@ -214,15 +214,22 @@ BootSettings::NetworkBootPreference RehearsedDiskManagement::networkBootPreferen
 }
 
 ServiceStatus RehearsedDiskManagement::setBootPreference(const BootChoice& choice) {
-  ServiceStatus status = 0;
-  _stage.playOnMachine([&](Host& host) { status = host.diskManagement().setBootPreference(choice); });
+  const auto status = change([&](DiskManagementService& service) { return service.setBootPreference(choice); });
   if (status == 0) _chosen = choice.disk;
   return status;
 }
 
 ServiceStatus RehearsedDiskManagement::setFirmwareVariable(const std::string& name, const Result<std::string>& value) {
+  return change([&](DiskManagementService& service) { return service.setFirmwareVariable(name, value); });
+}
+
+/// The status is the machine's.
+ServiceStatus RehearsedDiskManagement::change(const std::function<ServiceStatus(DiskManagementService&)>& set) {
   ServiceStatus status = 0;
-  _stage.playOnMachine([&](Host& host) { status = host.diskManagement().setFirmwareVariable(name, value); });
+  _stage.play([&](Host& host) { status = set(host.diskManagement()); },
+              [&](Host& copy, const Stage::Effects&) {
+                if (status == 0) set(copy.diskManagement());
+              });
   return status;
 }
 

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <optional>
 #include <string>
 #include <utility>
@@ -141,7 +142,7 @@ class RehearsedBootLoaderFile final : public BootLoaderFile {
   Stage& _stage;
 };
 
-/// The disks and the firmware are the machine's: the copy has none. What is chosen to start next is remembered.
+/// The disks and the firmware are the machine's. What is chosen to start next is remembered, and written to the copy.
 class RehearsedDiskManagement final : public DiskManagementService {
  public:
   explicit RehearsedDiskManagement(Stage& stage) : _stage(stage) {}
@@ -161,6 +162,7 @@ class RehearsedDiskManagement final : public DiskManagementService {
 
  private:
   DiskManagementService& machine() { return _stage.machine().diskManagement(); }
+  ServiceStatus change(const std::function<ServiceStatus(DiskManagementService&)>& set);
 
   Stage& _stage;
   std::optional<DiskName> _chosen;  ///< absent: what the machine starts

@@ -46,8 +46,6 @@ class Stage final : public EffectChannel {
   Effects foretold(const Act& act);
   void tell(const Effects& effects);
   void tell(const SettingValue& value) { _audience.observe(value); }
-  /// Of what the copy does not have.
-  void playOnMachine(const Act& act) { tell(foretold(act)); }
   /// Changes of the copy that no service makes.
   void edit(const MachineFile::Edit& edit);
 

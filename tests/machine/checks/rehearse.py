@@ -8,11 +8,13 @@ import re
 from check import Check
 
 CONTAINER = frozenset({"container"})
+SERVER = frozenset({"rehearsal"})
+DISKS = frozenset({"startup"})
 GETTERS = ("-gettimezone -listtimezones -getusingnetworktime -getnetworktimeserver -getsleep -getcomputersleep -getdisplaysleep "
            "-getharddisksleep -getwakeonmodem -getwakeonnetworkaccess -getrestartpowerfailure -getrestartfreeze "
            "-getallowpowerbuttontosleepcomputer -getwaitforstartupafterpowerfailure -getremotelogin -getremotevelmarevents "
            "-getcomputername -getlocalsubnetname -getkernelbootarchitecturesetting "
-           "-getdisablekeyboardwhenenclosurelockisengaged")
+           "-getdisablekeyboardwhenenclosurelockisengaged -liststartupdisks -getstartupdisk")
 # Every getter by itself, as one that fails says so in the status.
 SAME_ANSWERS = f"""rm -rf /run/copy
 taviskctl rehearse --keep /run/copy -getdate >/run/rehearsed || cat /run/rehearsed
@@ -29,7 +31,9 @@ rm -rf /run/copy
 KEYBOARD = "disablekeyboardwhenenclosurelockisengaged"
 # Words of one run, a line each, quoted as in a shell.
 SETS = pathlib.Path(__file__).with_name("rehearsed.words").read_text(encoding="utf-8").splitlines()
-AT_ONCE = 19  # a check has its time
+CHOICES = ("-setstartupdisk Backup -getstartupdisk", "-setstartupdisk Stick -liststartupdisks -setstartupdisk Stick",
+           "-setstartupdisk Archive -getstartupdisk", "-setstartupdisk Backup")
+AT_ONCE = {CONTAINER: 19, SERVER: 6}  # a check has its time
 # Texts, flags and outcomes in their order; then the status.
 COMPARE = """told() { grep -o -e '"failed":[a-z]*' -e '{"setting":"[^"]*","outcome":"[^"]*"' -e '"output":"[^"]*"' "$1"; }
 while IFS= read -r words; do
@@ -69,7 +73,9 @@ def compared(lines):
 
 
 CHECKS = [
-    Check("the copy answers what the machine answers", needs=CONTAINER, do=SAME_ANSWERS, prints="700\n"),
+    Check("the copy answers what the machine answers", needs=needs, do=SAME_ANSWERS, prints="700\n")
+    for needs in (CONTAINER, SERVER, DISKS)
+] + [
     Check("a rehearsal changes nothing of the machine", needs=CONTAINER,
           do="applied() { journalctl --sync; journalctl -b -t tavisk -o cat | grep -c applied; }; before=$(applied); touch /run/mark; "
              "sleep 0.1; taviskctl rehearse -settimezone Asia/Tokyo -setcomputername X -setremotelogin off -setlocalsubnetname y "
@@ -77,8 +83,11 @@ CHECKS = [
              "find /etc /var/lib/tavisk /Library -newer /run/mark 2>/dev/null; [ $before = $(applied) ] && echo as before; "
              "grep -c -e Asia/Tokyo -e ' X ' /run/rehearsed", prints="as before\n2\n"),
 ] + [
-    Check(f"sets {start + 1} and more of {len(SETS)} end as it was rehearsed", needs=CONTAINER,
-          do=compared("\n".join(SETS[start:start + AT_ONCE]))) for start in range(0, len(SETS), AT_ONCE)
+    Check(f"sets {start + 1} and more of {len(SETS)} end as it was rehearsed", needs=needs,
+          do=compared("\n".join(SETS[start:start + at_once])))
+    for needs, at_once in AT_ONCE.items() for start in range(0, len(SETS), at_once)
+] + [
+    Check("a startup disk is chosen as it was rehearsed", needs=DISKS, do=COMPARE + "\n".join(CHOICES) + "\nEND\n"),
 ] + [
     Check(f"what stands in the way is foretold: {first}", needs=CONTAINER | {"openssh-server"},
           do=f"{first}\n{compared(words)}{last}") for first, words, last in IN_THE_WAY
