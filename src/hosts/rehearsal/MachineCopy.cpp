@@ -13,6 +13,7 @@
 #include "base/PropertyList.h"
 #include "effects/SettingNames.h"
 #include "hosts/scratch/MachineFile.h"
+#include "hosts/scratch/MachineSettings.h"
 
 namespace tavisk {
 namespace {
@@ -167,7 +168,7 @@ Result<void> copyMachine(Host& machine, EffectSink& effects, const std::string& 
   if (auto copied = copyLoaderFile(machine.bootLoaderFile(), directory); !copied) return copied;
   for (const auto& [setting, failure] : answers.failures()) audience.recordFailure(setting, failure);
   for (const auto& [setting, failure] : answers.unknown())
-    described.dictionary("Refusals").set(setting + " (read)", describe(failure));
+    described.dictionary("Refusals").set(setting + " (read)", refusalTelling(failure));
   EffectSink unwatched;
   const auto file = MachineFile::open(directory, unwatched);
   if (!file) return file.failure();
