@@ -56,6 +56,22 @@ class Kept(unittest.TestCase):
         self.assertEqual(self.copy.place("/Volumes/Backup").readlink().name, "backup")
         self.assertEqual(self.copy.read("/mnt/backup" + CORE + "/SystemVersion.plist"), {"ProductName": "Debian"})
 
+    def test_links_and_folders_on_the_way_are_as_on_the_machine(self):
+        self.machine.change({"Disks": {"disk5": {"Mount Point": "/Volumes/Empty"}, "disk6": {"Mount Point": "/deep/../far"},
+                                       "disk7": {"Mount Point": "/Volumes/Folder"}, "disk8": {"Mount Point": "/Volumes/Folder/mach_kernel"}},
+                             "Firmware": {"Boot Preference": {"Disk": "disk5"}}})
+        self.machine.file("/mnt/empty/x")
+        self.machine.place("/Volumes/Empty").symlink_to("/mnt/empty")
+        self.machine.file("/deep/x")
+        for volume in ("/far", "/Volumes/Folder", "/Volumes/Folder/mach_kernel"):
+            self.machine.file(volume + CORE + "/boot.efi")
+            self.machine.file(volume + CORE + "/mach_kernel")
+        self.assertEqual(self.rehearse("-getdate")[1], b"")
+        listed = self.machine.run(WORDS)
+        self.assertIn(b"/mnt/empty/WINNT", listed[0])
+        self.assertIn(b"\n/far" + CORE.encode(), listed[0])
+        self.assertEqual(self.copy.run(WORDS), listed)
+
     def test_what_is_chosen_is_chosen_there(self):
         before = self.machine.read()
         self.rehearse(*CHOOSE)

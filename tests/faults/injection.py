@@ -32,7 +32,7 @@ ERRORS = {
 WALKED = "/share/zoneinfo"  # file by file: each 20th of these calls is enough
 MISSED = "did not come about"
 LEFTOVER = "/.tavisk-"
-MARKS = "/var/lib/tavisk/resets"
+MARKS = "/run/tavisk/resets"
 CHANGING = ("write", "fsync", "renameat", "symlinkat", "mkdirat", "unlinkat", "ftruncate")
 RESETTING = (*CHANGING, "sendmsg", "ioctl")
 
@@ -265,11 +265,11 @@ def wrong_resets(place, command):
             continue
         runs += 1
         torn = [path for path in _differing(place.state(), before, right[0]) if not path.startswith(MARKS)]
-        place.reset(command.reset)
+        status = place.reset(command.reset)
         state, text = _after_reset(place, command)
         left = [path for path in _differing(state, right[0]) if path != MARKS] + [path for path in state if LEFTOVER in path]
-        if torn or left or text != right[1]:
-            wrong.append(f"{command.setting}: {name} {which}: {torn} {left} {text!r}")
+        if status or torn or left or text != right[1]:
+            wrong.append(f"{command.setting}: {name} {which}: {status} {torn} {left} {text!r}")
     return runs, wrong if runs else [f"{command.setting}: nothing was killed"]
 
 

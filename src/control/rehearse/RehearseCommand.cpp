@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 #include <optional>
+#include <set>
+#include <string>
 #include <utility>
 
 #include "control/Commands.h"
@@ -64,17 +66,20 @@ void searchStartupDisks(WordRunner& runner) {
   }
 }
 
-/// What could not be read of the machine is told, and not rehearsed.
+/// What could not be read of the machine is told once, and not rehearsed.
 class LookFailures final : public EffectChannel {
  public:
   explicit LookFailures(const Tools& tools) : _tools(tools) {}
 
   void record(const Effect& effect) override {
-    if (effect.failure) _tools.complain("not read: " + effect.setting + ": " + describe(*effect.failure));
+    if (!effect.failure) return;
+    const auto line = "not read: " + effect.setting + ": " + describe(*effect.failure);
+    if (_told.insert(line).second) _tools.complain(line);
   }
 
  private:
   const Tools& _tools;
+  std::set<std::string> _told;
 };
 
 }  // namespace

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <mutex>
+#include <set>
 #include <string>
 
 #include "effects/EffectSink.h"
@@ -12,8 +13,8 @@
 namespace tavisk {
 
 /// The files of a machine. Those that are looked at and are there are put into a copy of it as well, with the links
-/// that lead to them, so that whoever looks there finds the same; of what is only asked for there is an empty file.
-/// What cannot be put there is told to the effects once. From any thread.
+/// that lead to them, so that whoever looks there finds the same; what is only asked for is an empty file there, until
+/// it shows to be a folder. What cannot be put there is told to the effects once. From any thread.
 class CopiedFiles final : public FileSystem {
  public:
   /// `copy` is the root of the copy. Neither the files nor the effects are owned.
@@ -28,13 +29,17 @@ class CopiedFiles final : public FileSystem {
 
  private:
   Result<std::string> copyWayTo(const std::string& path);
+  Result<void> copyLink(const std::string& path, const std::string& target);
+  Result<void> makeFolder(const std::string& path);
   void copyFile(const std::string& path, const std::string& contents);
+  Result<void> write(const std::string& path, const std::string& contents);
   void tell(const Result<void>& copied);
 
   FileSystem& _files;
   SystemRoot _copy;
   EffectSink& _effects;
-  std::mutex _mutex;  ///< guards the copy
+  std::mutex _mutex;                ///< guards the copy
+  std::set<std::string> _unopened;  ///< the empty files
   bool _isTold = false;
 };
 

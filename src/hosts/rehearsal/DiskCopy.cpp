@@ -11,6 +11,9 @@
 #include <utility>
 #include <vector>
 
+#include "base/Text.h"
+#include "base/XmlText.h"
+
 namespace tavisk {
 namespace {
 
@@ -35,8 +38,12 @@ std::vector<DiskName> disksOf(DiskEventSession& session, RunLoop& runLoop) {
   return disks;
 }
 
+bool isWritable(const std::string& text) {
+  return !offsetOfNonXml(text);
+}
+
 void setWhereKnown(Section& section, const char* key, const std::optional<std::string>& text) {
-  if (text) section.set(key, *text);
+  if (text) section.set(key, isWritable(*text) ? *text : escaped(*text));
 }
 
 void describe(const DiskDescription& disk, Section& copied) {
@@ -131,12 +138,16 @@ void copyInterfaces(Host& machine, Section& registry) {
 
 }  // namespace
 
-void copyDisks(Host& machine, RunLoop& runLoop, Section& copy) {
+void copyDisks(Host& machine, RunLoop& runLoop, Section& copy, EffectSink& audience) {
   auto& session = machine.diskEvents();
   auto& disks = copy.dictionary("Disks");
   for (const auto& name : disksOf(session, runLoop)) {
     const auto description = session.description(name);
     if (!description) continue;
+    if (!isWritable(name.text) || !isWritable(description->volumePath.value_or(""))) {
+      audience.recordFailure("Disks", {"copy", name.text, "no property list can hold where it is mounted"});
+      continue;
+    }
     auto& copied = disks.dictionary(name.text);
     describe(*description, copied);
     describe(machine.diskManagement(), name, copied);

@@ -166,7 +166,7 @@ Result<void> copyLoaderFile(BootLoaderFile& file, const std::string& directory) 
 Result<void> copyMachine(const MachineToCopy& machine, const PlaceOfCopy& place, EffectSink& audience) {
   const Answers answers(machine.effects);
   auto described = tavisk::described(machine.host, answers);
-  if (place.hasDisks) copyDisks(machine.host, machine.runLoop, described);
+  if (place.hasDisks) copyDisks(machine.host, machine.runLoop, described, audience);
   if (auto copied = copyLoaderFile(machine.host.bootLoaderFile(), place.directory); !copied) return copied;
   for (const auto& [setting, failure] : answers.failures()) audience.recordFailure(setting, failure);
   for (const auto& [setting, failure] : answers.unknown())

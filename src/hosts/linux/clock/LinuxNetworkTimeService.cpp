@@ -304,25 +304,32 @@ void LinuxNetworkTimeService::resetServer() {
   auto setting = serverSetting();
   const ResetMark mark(_machine.root, setting.name);
   setting.own = mark.around(ownServerFiles());
-  const auto effect = reset(setting, _machine, hold(_machine));
+  const auto held = hold(_machine);
+  const auto effect = reset(setting, _machine, held);
   _isServerChanged = effect.changed || _isServerChanged;
   if (!_isServerChanged) return;
   const auto running = runs(client());
-  if (!running || *running) restartAsynchronously();
-  if (running && (!*running || !_isServerChanged)) unmark(mark, effect, _machine);
+  const bool mayRun = !running || *running;
+  if (mayRun) haveServersRead(held);
+  if (!mayRun || !_isServerChanged) unmark(mark, effect, _machine);
 }
 
 /// A client that has read its servers as they are goes on undisturbed.
 void LinuxNetworkTimeService::restartAsynchronously() {
+  const auto isRead = withClient<bool>([this](const TimeDaemon& client) { return hasReadServers(client, _machine); });
+  if (isRead && *isRead && !_isServerChanged)
+    return _machine.effects.record(
+        {.setting = setting::networkTimeRestart, .outcome = Outcome::unchanged, .asked = restart});
+  haveServersRead(hold(_machine));
+}
+
+void LinuxNetworkTimeService::haveServersRead(const MachineHold& held) {
   auto setting = named<std::string>(setting::networkTimeRestart);
   setting.leavesNoTrace = true;
   setting.apply = [this](const std::string&) {
     return withClient<void>([&](const TimeDaemon& client) { return reload(client); });
   };
-  const auto isRead = withClient<bool>([this](const TimeDaemon& client) { return hasReadServers(client, _machine); });
-  if (isRead && *isRead && !_isServerChanged)
-    return _machine.effects.record({.setting = setting.name, .outcome = Outcome::unchanged, .asked = restart});
-  _isServerChanged = carryOut(setting, restart, _machine).outcome != Outcome::applied;
+  _isServerChanged = carryOut(setting, restart, _machine, held).outcome != Outcome::applied;
 }
 
 Result<void> LinuxNetworkTimeService::reload(const TimeDaemon& client) {

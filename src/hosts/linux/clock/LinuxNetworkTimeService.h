@@ -49,6 +49,7 @@ class LinuxNetworkTimeService final : public NetworkTimeService {
   std::string whatIsConfiguredElsewhere(const TimeDaemon& client, const std::string& address) const;
   static Result<void> checkServer(const TimeDaemon& client, const std::string& address);
   Result<void> putBack(const TimeDaemon& client, const std::optional<std::string>& lines);
+  void haveServersRead(const MachineHold& held);
   Result<void> reload(const TimeDaemon& client);
   OwnPart ownServerFiles() const;
 

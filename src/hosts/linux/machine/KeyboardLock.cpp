@@ -154,7 +154,7 @@ Result<bool> EnclosureLock::isEngaged() {
   return ((*status)[2] & frontPanelLockout) != 0;
 }
 
-void EnclosureLock::setDisablesKeyboard(bool disables, const MachineHold& held) {
+Effect EnclosureLock::setDisablesKeyboard(bool disables, const MachineHold& held) {
   // The controller may take seconds to answer.
   const auto engaged = held ? isEngaged() : Result<bool>(held.failure());
   const auto found = keyboards(_machine.root);
@@ -166,7 +166,7 @@ void EnclosureLock::setDisablesKeyboard(bool disables, const MachineHold& held) 
     return {};
   };
   setting.apply = [&](KeyboardState state) { return setAll(_machine.root, *found, state); };
-  carryOut(setting, asked, _machine, held);
+  return carryOut(setting, asked, _machine, held);
 }
 
 void EnclosureLock::tellKeyboards() {

@@ -29,7 +29,8 @@ class EnclosureLock {
       : _machine(machine), _controller(controller) {}
 
   /// Looks at the lock once. Keyboards are disabled if it is engaged and they are to be disabled then, else enabled.
-  void setDisablesKeyboard(bool disables, const MachineHold& held);
+  /// Gives back what was told.
+  Effect setDisablesKeyboard(bool disables, const MachineHold& held);
   /// Tells whether they are disabled now to whoever keeps values.
   void tellKeyboards();
 

@@ -64,8 +64,7 @@ void LinuxPreferencesStore::resetKeyboardLock() {
   setting.own.check = [this] { return check(); };
   const auto effect = reset(setting, _machine, held);
   if (effect.outcome != Outcome::applied) return;
-  _lock.setDisablesKeyboard(false, held);
-  unmark(mark, effect, _machine);
+  if (_lock.setDisablesKeyboard(false, held).outcome != Outcome::failed) unmark(mark, effect, _machine);
 }
 
 Result<void> LinuxPreferencesStore::check() const {

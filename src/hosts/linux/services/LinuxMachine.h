@@ -75,7 +75,8 @@ template <typename Value>
 Effect reset(Setting<Value> setting, const LinuxMachine& machine) {
   const ResetMark mark(machine.root, setting.name);
   setting.own = mark.around(std::move(setting.own));
-  auto effect = reset(setting, machine, hold(machine));
+  const auto held = hold(machine);
+  auto effect = reset(setting, machine, held);
   unmark(mark, effect, machine);
   return effect;
 }

@@ -25,9 +25,9 @@ inline constexpr const char* kernelPanic = "/etc/sysctl.d/60-tavisk.conf";
 inline constexpr const char* machineLockFolder = "/run/tavisk";
 inline constexpr const char* machineLock = "/run/tavisk/lock";
 
-/// While a reset is under way (ResetMark).
+/// While a reset is under way (ResetMark). After a restart what is stored is in force in any case.
 inline std::string resetMark(const std::string& setting) {
-  return "/var/lib/tavisk/resets/" + setting;
+  return "/run/tavisk/resets/" + setting;
 }
 
 /// Beside the main file of one of the service manager's daemons: "timesyncd.conf".

@@ -10,8 +10,8 @@
 
 namespace tavisk {
 
-/// Says on the disk that a reset has begun: one that is killed, or fails after the tool's own part is gone, is ended by
-/// the next, which would find nothing to do otherwise.
+/// Says that a reset has begun: one that is killed, or fails after the tool's own part is gone, is ended by the next,
+/// which would find nothing to do otherwise.
 class ResetMark final {
  public:
   /// The root is not owned.

@@ -186,6 +186,16 @@ TEST_F(ChronyTest, GoesBackToTheServersOfOthers) {
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::unchanged);
 }
 
+TEST_F(ChronyTest, ReadsItsServersWhereAResetWasCutShort) {
+  constexpr const char* mark = "/run/tavisk/resets/Network Time Server";
+  tree.write("/etc/chrony/chrony.conf", "pool pool.example iburst\n");
+  client.start();
+  tree.write(mark, "");
+  tree.host().resets().reset(setting::networkTimeServer);
+  EXPECT_TRUE(tree.has("/reloaded"));
+  EXPECT_FALSE(tree.has(mark));
+}
+
 TEST_F(ChronyTest, NamesTheOwnFileThatWhoeverIsNotRootWouldRemove) {
   constexpr const char* own = "/etc/ntpsec/ntp.d/60-tavisk.conf";
   tree.write("/run/tavisk/lock", "");

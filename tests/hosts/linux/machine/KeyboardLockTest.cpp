@@ -62,6 +62,26 @@ class PanelTree : public LinuxTree {
   Panel panel;
 };
 
+TEST(KeyboardLock, IsResetAgainAfterKeyboardsThatStayedDisabled) {
+  constexpr const char* inhibited = "/sys/class/input/input1/inhibited";
+  constexpr const char* preferences = "/etc/tavisk/preferences/AnyApplication.plist";
+  PanelTree tree;
+  ManagementController controller(tree.panel);
+  tree.write(preferences,
+             std::string("<plist><dict><key>") + DunmereLockEnclosureStateKey + "</key><true/></dict></plist>");
+  tree.makeUnreadable(inhibited);
+  LinuxPreferencesStore(tree.machine, controller).resetKeyboardLock();
+  EXPECT_FALSE(tree.has(preferences));
+  EXPECT_EQ(tree.lastEffect().outcome, Outcome::failed);
+  std::filesystem::remove(tree.at(inhibited));
+  tree.write(inhibited, "1\n");
+  LinuxPreferencesStore(tree.machine, controller).resetKeyboardLock();
+  EXPECT_EQ(tree.inhibited("input1"), "0");
+  tree.log.effects.clear();
+  LinuxPreferencesStore(tree.machine, controller).resetKeyboardLock();
+  EXPECT_EQ(tree.log.effects.size(), 1U) << "nothing is left to do";
+}
+
 TEST(EnclosureLock, DisablesKeyboardsWhileItIsEngaged) {
   struct Case {
     std::uint8_t state;

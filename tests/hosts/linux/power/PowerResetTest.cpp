@@ -77,7 +77,7 @@ TEST(PowerReset, TakesTheOwnFilesAwayAndPutsIntoForceWhatIsLeft) {
 TEST(PowerReset, EndsWhatWasCutShort) {
   for (const auto& each : resets()) {
     PowerTree tree;
-    const auto mark = std::string("/var/lib/tavisk/resets/") + each.name;
+    const auto mark = std::string("/run/tavisk/resets/") + each.name;
     each.set(tree);
     tree.write(mark, "");
     for (const auto& file : filesOf(tree)) std::filesystem::remove(file);
