@@ -80,6 +80,12 @@ bool isOption(std::string_view word, const CommandRow* command) {
   return word.starts_with(takesWords(command) ? "--" : "-");
 }
 
+/// By this word of tavisk nobody is asked anything, which here is so without it.
+void dropPromptWord(Invocation& invocation) {
+  auto& words = invocation.operands;
+  if (takesWords(invocation.command) && !words.empty() && words.front() == "-f") words.erase(words.begin());
+}
+
 Failure misused(const std::string& what, const CommandRow* command) {
   const std::string name = command ? std::string(command->name) + " " : "";
   return {what, "", "type 'taviskctl " + name + "--help'"};
@@ -151,6 +157,7 @@ Result<Invocation> readCommandLine(std::span<const std::string> words) {
       invocation.operands.push_back(word);
     }
   }
+  dropPromptWord(invocation);
   if (valued) return misused(typed(*valued) + ": the value is missing", invocation.command);
   if (!invocation.command && invocation.options.empty()) return misused("a command is missing", nullptr);
   if (invocation.command && invocation.command->kind == OperandKind::none && !invocation.operands.empty())

@@ -23,7 +23,8 @@ struct OptionRow {
 enum class OperandKind {
   settings,  ///< names of settings
   none,
-  words,  ///< words of tavisk and their values: from the first that does not begin with two hyphens, all are operands
+  words,  ///< words of tavisk and their values: from the first that does not begin with two hyphens, all are operands,
+          ///< but "-f" in front of them, which is passed over
 };
 
 /// A command of taviskctl.

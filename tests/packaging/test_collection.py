@@ -99,6 +99,19 @@ class Module(unittest.TestCase):
                          ("20", ["Computer Name: read on the rehearsed machine: the line is down"]))
         self.assertFalse(answer.get("failed"))
 
+    def test_tells_what_was_changed_when_facts_cannot_be_gathered(self):
+        with ScratchMachine(PROGRAM, {}) as machine, tempfile.TemporaryDirectory() as folder:
+            program = pathlib.Path(folder, "taviskctl")
+            program.write_text(f"""#!/bin/sh
+[ "$1" != status ] || {{ echo "the machine is gone" >&2; exit 1; }}
+exec {PROGRAM.parent}/taviskctl "$@"
+""")
+            program.chmod(0o755)
+            answer = ask(machine, {"settings": {"Display Sleep": 20, "Computer Sleep": 200}, "gather": True},
+                         path=f"{folder}:{SYSTEM_PATH}")
+        self.assertEqual(changed(answer), ["Display Sleep"])
+        self.assertRegex(answer["msg"], "^Computer Sleep: refused: .*; the machine is gone$")
+
     def test_says_what_is_not_installed_and_who_may_not(self):
         with ScratchMachine(PROGRAM, {"User": {"ID": 1000}}) as machine:
             self.assertIn("Debian package tavisk", ask(machine, {"gather": True}, path=SYSTEM_PATH)["msg"])

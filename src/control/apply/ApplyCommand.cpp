@@ -13,8 +13,7 @@ namespace {
 
 Result<std::vector<Step>> wantedSteps(const Invocation& invocation) {
   const bool isFile = invocation.has("--from");
-  const bool areWords = !invocation.operands.empty() && invocation.operands != std::vector<std::string>{"-f"};
-  if (isFile == areWords)
+  if (isFile != invocation.operands.empty())
     return Failure{"either words of tavisk or --from FILE are expected", "", "type 'taviskctl apply --help'"};
   if (!isFile) return stepsOf(invocation.operands);
   const auto wanted = wantedInFile(invocation.options.at("--from"));

@@ -35,7 +35,6 @@ std::pair<int, const ManagedSetting*> placeOf(const Step& step) {
 Result<std::vector<Step>> stepsOf(std::span<const std::string> words) {
   const auto table = productTable();
   std::vector<Step> steps;
-  if (!words.empty() && words.front() == "-f") words = words.subspan(1);
   while (!words.empty()) {
     const auto& word = words.front();
     const auto* entry = table.findTyped(word);

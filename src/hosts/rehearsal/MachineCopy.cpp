@@ -14,6 +14,7 @@
 #include "effects/SettingNames.h"
 #include "hosts/rehearsal/DiskCopy.h"
 #include "hosts/scratch/MachineFile.h"
+#include "hosts/scratch/MachineSettings.h"
 
 namespace tavisk {
 namespace {
@@ -169,7 +170,7 @@ Result<void> copyMachine(const MachineToCopy& machine, const PlaceOfCopy& place,
   if (auto copied = copyLoaderFile(machine.host.bootLoaderFile(), place.directory); !copied) return copied;
   for (const auto& [setting, failure] : answers.failures()) audience.recordFailure(setting, failure);
   for (const auto& [setting, failure] : answers.unknown())
-    described.dictionary("Refusals").set(setting + " (read)", describe(failure));
+    described.dictionary("Refusals").set(setting + " (read)", refusalTelling(failure));
   EffectSink unwatched;
   const auto file = MachineFile::open(place.directory, unwatched);
   if (!file) return file.failure();

@@ -5,6 +5,8 @@
 #include <algorithm>
 #include <utility>
 
+#include "hosts/scratch/MachineSettings.h"
+
 namespace tavisk {
 namespace {
 
@@ -107,7 +109,7 @@ void Stage::refuse(const Effects& effects) {
   for (const auto& effect : effects) {
     if (!effect.asked) continue;
     if (isRefused(effect) && effect.failure)
-      refusals.set(effect.setting, describe(*effect.failure));
+      refusals.set(effect.setting, refusalTelling(*effect.failure));
     else
       refusals.remove(effect.setting);
   }

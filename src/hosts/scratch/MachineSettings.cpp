@@ -15,6 +15,10 @@ std::optional<Failure> refused(const char* tried, const std::optional<std::strin
 
 }  // namespace
 
+std::string refusalTelling(const Failure& failure) {
+  return failure.on == machineName ? failure.why : describe(failure);
+}
+
 MachineSetting<bool> switchAt(std::string name, const std::string& section, const std::string& key) {
   return {std::move(name), "", [=](MachineFile& machine) { return machine.section(section).boolean(key); },
           [=](MachineFile::Dictionary& machine, bool isOn) { machine.dictionary(section).set(key, isOn); }};

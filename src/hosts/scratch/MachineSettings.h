@@ -44,6 +44,10 @@ struct MachineOwn {
 /// One key of a dictionary at the top.
 MachineOwn ownAt(const std::string& section, const std::string& key);
 
+/// The reason in "Refusals" by which a machine fails as another one has. Where that was such a machine it is the same
+/// reason; else it says what failed where.
+std::string refusalTelling(const Failure& failure);
+
 /// Adds one to a count.
 void countUp(MachineFile::Dictionary& dictionary, std::string_view key);
 

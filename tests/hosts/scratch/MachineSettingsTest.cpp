@@ -118,6 +118,16 @@ TEST(Refusals, ofReadsAndOfOtherNamesLetASetBeDone) {
   EXPECT_EQ(machine.log.effects.back().failure, (Failure{"read", "the rehearsed machine", "blind"}));
 }
 
+TEST(Refusals, tellAgainWhatAnotherMachineHasTold) {
+  EXPECT_EQ(refusalTelling({"open", "/proc/a", "Permission denied"}), "open on /proc/a: Permission denied");
+  RefusingMachine machine;
+  machine.refuse(setting::time, "no clock");
+  sets[0].carryOut(machine.host());
+  machine.refuse(setting::time, refusalTelling(machine.log.effects.at(0).failure.value()));
+  machine.log.effects.clear();
+  machine.expectRefused(sets[0], "set", "no clock");
+}
+
 TEST(Refusals, ofTheAuthorizationAreByItsNameOnly) {
   RefusingMachine machine;
   machine.refuse("*", "maintenance");

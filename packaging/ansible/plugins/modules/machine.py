@@ -185,17 +185,25 @@ NAMES = {"now": "before", "storedNow": "stored_before", "storedBefore": "stored_
 FROM_INPUT = ("--from", "-")
 
 
+class Unanswered(Exception):
+    """Why taviskctl has told nothing, and the status with which it ended, if it ran."""
+
+    def __init__(self, why, status=None):
+        super().__init__(why)
+        self.told = {} if status is None else {"rc": status}
+
+
 def ask(module, words, typed=None):
-    """Runs taviskctl, and returns its status and the object that it prints; without one the task has failed."""
+    """Runs taviskctl, and returns its status and the object that it prints."""
     program = module.get_bin_path("taviskctl", opt_dirs=["/usr/local/bin"])
     if not program:
-        module.fail_json(msg="taviskctl is not installed on this server; it is in the Debian package tavisk")
+        raise Unanswered("taviskctl is not installed on this server; it is in the Debian package tavisk")
     status, output, errors = module.run_command([program, *words], data=typed)
     complaint = errors.strip()
     try:
         answer = json.loads(output)
     except ValueError:
-        module.fail_json(msg=complaint or f"taviskctl ended with status {status} and told nothing", rc=status)
+        raise Unanswered(complaint or f"taviskctl ended with status {status} and told nothing", status) from None
     for line in complaint.splitlines():
         module.warn(line)
     return status, answer
@@ -283,9 +291,15 @@ def main():
     wants_change = module.params["settings"] is not None
     if not wants_change and not module.params["gather"]:
         module.fail_json(msg="nothing is asked for: give settings, or gather: true")
-    result, problems = change(module) if wants_change else ({"changed": False}, [])
-    if module.params["gather"]:
-        result.update(gathered(module))
+    result, problems = {} if wants_change else {"changed": False}, []
+    try:
+        if wants_change:
+            result, problems = change(module)
+        if module.params["gather"]:
+            result.update(gathered(module))
+    except Unanswered as failure:
+        result.update(failure.told)
+        problems.append(str(failure))
     if problems:
         module.fail_json(msg="; ".join(problems), **result)
     module.exit_json(**result)

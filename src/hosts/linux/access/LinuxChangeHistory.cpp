@@ -66,6 +66,8 @@ class Changes {
     if (state.isVolatile)
       found.remarks.emplace_back(
           "the journal is kept in memory: what was changed before the last start of this machine is not in it");
+    for (const auto& failure : state.leftOut)
+      found.remarks.push_back("left out is a part of the journal: " + describe(failure));
     if (!_strangers.empty())
       found.remarks.push_back("left out are changes in tavisk's name by users who are no administrators: " +
                               listed(_strangers));

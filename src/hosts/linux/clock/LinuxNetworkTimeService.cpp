@@ -288,8 +288,13 @@ OwnPart LinuxNetworkTimeService::ownServerFiles() const {
     }
     return {};
   };
-  const auto check = []() -> Result<void> {
-    if (auto failure = whyNeedsRoot("remove", ownfile::name)) return *failure;
+  const auto check = [this]() -> Result<void> {
+    const auto* const file = std::ranges::find_if(ownfile::timeServers, [this](const auto* path) {
+      const auto there = _machine.root.isThere(path);
+      return there && *there;
+    });
+    const bool isKnown = file != std::end(ownfile::timeServers);
+    if (auto failure = whyNeedsRoot("remove", isKnown ? *file : "what tavisk stores of it")) return *failure;
     return {};
   };
   return {.isThere = isThere, .check = check, .takeAway = takeAway};

@@ -11,7 +11,7 @@
 namespace tavisk {
 namespace {
 
-using testing::ElementsAre;
+using testing::ElementsAre, testing::HasSubstr, testing::Lt;
 
 constexpr const char* machineId = "0123456789abcdef0123456789abcdef";
 constexpr const char* maker = "/lib/systemd/systemd-journal-remote";
@@ -40,13 +40,18 @@ class JournalTree : public LinuxTree {
     _entries += "\n";
   }
 
-  /// "TIME SETTING: BEFORE > AFTER" of each.
-  std::vector<std::string> changes(std::vector<std::string>& remarks) {
-    const auto file = "/var/log/journal/" + std::string(machineId) + "/system.journal";
+  static std::string pathOf(const std::string& name) { return "/var/log/journal/" + (machineId + ("/" + name)); }
+
+  void makeJournal() {
+    const auto file = pathOf("system.journal");
     write("/entries", _entries);
     write(file, "");
     std::filesystem::remove(at(file));
     EXPECT_TRUE(runTool((std::string(maker) + " -o ").append(at(file)).append(" ").append(at("/entries"))));
+  }
+
+  /// "TIME SETTING: BEFORE > AFTER" of each.
+  std::vector<std::string> changes(std::vector<std::string>& remarks) const {
     const auto found = LinuxChangeHistory(root).changes();
     if (!found) return {describe(found.failure())};
     remarks = found->remarks;
@@ -79,12 +84,52 @@ TEST(LinuxChangeHistory, IsWhatTheJournalKnowsOfAdministratorsAlone) {
   tree.add(forged("_UID", "nobody"));
   tree.add(forged("_TRANSPORT", "stdout"));
   tree.add(forged("SYSLOG_IDENTIFIER", "other"));
+  tree.makeJournal();
   std::vector<std::string> remarks;
   EXPECT_THAT(tree.changes(remarks),
               ElementsAre("2 Time Zone: UTC > Etc/UTC", "3 Display Sleep: ? > ? ...", "4 Display Sleep: 1 > 2",
                           "6 Computer Name: a\nb\\ > ", "7 Computer Name: ? > ?"));
   EXPECT_THAT(remarks, ElementsAre("left out are changes in tavisk's name by users who are no administrators: "
                                    "4242, nobody"));
+}
+
+TEST(LinuxChangeHistory, IsNotEmptyWhereTheJournalCannotBeRead) {
+  const std::pair<std::string, const char*> cases[] = {
+      {"", "it is cut short"},
+      {std::string(4096, 'x'), "it is damaged"},
+      {"LPKSHHRH" + std::string(4, '\0') + std::string(4, '\xff') + std::string(4096, '\0'), "does not know"}};
+  const auto file = JournalTree::pathOf("system.journal");
+  JournalTree tree;
+  EXPECT_THAT(LinuxChangeHistory(tree.root).changes().failure().why, "there is none");
+  for (const auto& [contents, why] : cases) {
+    tree.write(file, contents);
+    const auto found = LinuxChangeHistory(tree.root).changes();
+    ASSERT_FALSE(found) << why;
+    EXPECT_THAT(describe(found.failure()), AllOf(HasSubstr(file), HasSubstr(why)));
+    EXPECT_FALSE(isAbsent(found.failure())) << why;
+  }
+}
+
+TEST(LinuxChangeHistory, SaysWhatIsMissingForDamage) {
+  if (!std::filesystem::exists(maker)) GTEST_SKIP() << "there is no " << maker;
+  constexpr std::size_t count = 100;
+  JournalTree tree;
+  for (std::size_t i = 0; i < count; ++i)
+    tree.add({{"TAVISK_SETTING", "Time Zone"}, {"TAVISK_OLD", std::to_string(i)}});
+  tree.makeJournal();
+  tree.write(JournalTree::pathOf("system@1.journal~"), "LPKSHHRH");
+  std::vector<std::string> remarks;
+  EXPECT_EQ(tree.changes(remarks).size(), count);
+  EXPECT_THAT(remarks, ElementsAre("left out is a part of the journal: read on " +
+                                   JournalTree::pathOf("system@1.journal~") + ": it is cut short"));
+
+  std::filesystem::remove(tree.at(JournalTree::pathOf("system@1.journal~")));
+  auto contents = tree.file(JournalTree::pathOf("system.journal"));
+  const auto middle = contents.find("TAVISK_OLD=" + std::to_string(count / 2));
+  contents.replace(middle, 4096, std::string(4096, '\xff'));
+  tree.write(JournalTree::pathOf("system.journal"), contents);
+  EXPECT_THAT(tree.changes(remarks).size(), Lt(count));
+  EXPECT_THAT(remarks, ElementsAre(HasSubstr("a file of it is damaged")));
 }
 
 }  // namespace

@@ -186,6 +186,16 @@ TEST_F(ChronyTest, GoesBackToTheServersOfOthers) {
   EXPECT_EQ(tree.lastEffect().outcome, Outcome::unchanged);
 }
 
+TEST_F(ChronyTest, NamesTheOwnFileThatWhoeverIsNotRootWouldRemove) {
+  constexpr const char* own = "/etc/ntpsec/ntp.d/60-tavisk.conf";
+  tree.write("/run/tavisk/lock", "");
+  tree.write(own, "server time.example iburst prefer\n");
+  const AsMember member(tree);
+  tree.host().resets().reset(setting::networkTimeServer);
+  EXPECT_THAT(tree.lastEffect(), FailedFor("remove on " + std::string(own) + ": needs root"));
+  EXPECT_TRUE(tree.has(own));
+}
+
 TEST_F(ChronyTest, WritesNoServerThatTheClientDoesNotRead) {
   client.setServer({"time.example"});
   tree.write("/etc/chrony/chrony.conf", "pool pool.example iburst\n");
