@@ -11,6 +11,12 @@ Status endBy(const Failure& failure, Status status, const Tools& tools) {
   return status;
 }
 
+Status endWith(const std::string& text, Status status, const Tools& tools) {
+  tools.output.print("%s", text.c_str());
+  tools.output.flush();
+  return status;
+}
+
 std::unique_ptr<SignalWaiter> endBySignal(const EndingSignals& signals, SignalWaiter::End end, const Tools& tools) {
   auto waiter = SignalWaiter::start(
       signals,

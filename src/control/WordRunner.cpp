@@ -70,8 +70,9 @@ WordRunner::~WordRunner() {
 }
 
 Result<void> WordRunner::start() {
-  if (_settings.startWithoutLoop()) return {};
+  const bool isStarted = _settings.startWithoutLoop();
   const auto result = _gatherer.take();
+  if (isStarted) return {};
   return Failure{"run words of tavisk", "", result.brokenOffBy.value_or(std::string(trimmed(result.printed)))};
 }
 

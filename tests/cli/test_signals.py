@@ -2,6 +2,7 @@
 # SPDX-License-Identifier: MIT
 """INT, TERM and HUP end the run at once, wherever it waits; what was printed is out, the authorization given up once."""
 
+import contextlib
 import json
 import os
 import signal
@@ -16,6 +17,11 @@ from machine import SANITIZER_OPTIONS, ScratchMachine, program_and_arguments
 AT_ONCE = 2 if SANITIZER_OPTIONS or "TAVISK_ARCHITECTURE" in os.environ else 0.5  # seconds; without a limit it never ends
 PATIENCE = 10
 BANNER = b"> tavisk\n> type -help for help.\n> "
+
+
+def signal_mask(pid):
+    with open(f"/proc/{pid}/status", encoding="ascii") as status:
+        return next(int(line.split()[1], 16) for line in status if line.startswith("SigBlk:"))
 
 
 class Run(unittest.TestCase):
@@ -61,6 +67,46 @@ class Ending(Run):
 
     def test_while_the_output_is_stuck_in_a_full_pipe(self):
         self.assertEqual(self.end(["-listtimezones"] * 40, signal.SIGTERM), 0)
+
+
+class StuckControl(Run):
+    """taviskctl, whose reader has stopped reading before it begins."""
+
+    def full_pipe(self):
+        """Where to write."""
+        reading, writing = os.pipe()
+        self.addCleanup(os.close, reading)
+        self.addCleanup(os.close, writing)
+        os.set_blocking(writing, False)
+        with contextlib.suppress(BlockingIOError):
+            while True:
+                os.write(writing, b".")
+        os.set_blocking(writing, True)
+        return writing
+
+    def wait_until_it_prints(self, process):
+        """An emulator has a mask of its own."""
+        deadline = time.monotonic() + PATIENCE
+        while "TAVISK_ARCHITECTURE" not in os.environ and not signal_mask(process.pid) & 1 << signal.SIGTERM - 1:
+            self.assertLess(time.monotonic(), deadline)
+            time.sleep(0.001)
+        time.sleep(2 if "TAVISK_ARCHITECTURE" in os.environ else 0.3)  # until it is stuck: there is no event for it
+
+    def test_a_signal_ends_each_command(self):
+        self.machine.program = os.path.join(os.path.dirname(PROGRAM), "taviskctl")
+        to_ten = ["-setdisplaysleep", "10"]
+        for words in (["apply", *to_ten], ["rehearse", *to_ten], ["undo", "--run"], ["undo", "--since", "@0", "--run"],
+                      ["reset", "Display Sleep"]):
+            with self.subTest(words), self.machine.start(words, stdout=self.full_pipe()) as process:
+                self.wait_until_it_prints(process)
+                begin = time.monotonic()
+                process.send_signal(signal.SIGTERM)
+                try:
+                    self.assertEqual(process.wait(PATIENCE), 1)
+                finally:
+                    process.kill()
+                self.assertLess(time.monotonic() - begin, AT_ONCE)
+                self.assertFalse(self.machine.read()["Authorization"]["Authenticated"])
 
 
 class DeadOutput(Run):

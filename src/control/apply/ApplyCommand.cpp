@@ -61,8 +61,7 @@ Status apply(std::span<const Step> steps, Applier& applier, const Invocation& in
       std::ranges::all_of(settings, [&](const auto& setting) { return isDone(setting, isUnsupportedSkipped); });
   const auto text =
       invocation.has("--json") ? appliedJson("apply", settings, areAllDone) + "\n" : appliedTable(settings);
-  tools.output.print("%s", text.c_str());
-  return areAllDone ? Status::done : Status::incomplete;
+  return endWith(text, areAllDone ? Status::done : Status::incomplete, tools);
 }
 
 }  // namespace

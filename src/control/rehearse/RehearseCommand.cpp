@@ -53,8 +53,7 @@ Rehearsed rehearsedOn(Host& host, const Part& part, WordRunner& runner, StatusRe
 Status show(const Rehearsed& rehearsed, const Invocation& invocation, const Tools& tools) {
   const auto folder = keptFolder(invocation).value_or("");
   const auto text = invocation.has("--json") ? rehearsedJson(rehearsed, folder) + "\n" : rehearsedTable(rehearsed);
-  tools.output.print("%s", text.c_str());
-  return isAllDone(rehearsed) ? Status::done : Status::incomplete;
+  return endWith(text, isAllDone(rehearsed) ? Status::done : Status::incomplete, tools);
 }
 
 /// What is kept has the files that the search for startup disks looks at.

@@ -36,8 +36,7 @@ Status resetSettings(const Invocation& invocation, const Tools& tools) {
     const auto results = resetAll(*settings, applier, tools.showProgress);
     const bool isDone = std::ranges::all_of(results, isWholly);
     const auto text = invocation.has("--json") ? appliedJson("reset", results, isDone) + "\n" : appliedTable(results);
-    tools.output.print("%s", text.c_str());
-    return isDone ? Status::done : Status::incomplete;
+    return endWith(text, isDone ? Status::done : Status::incomplete, tools);
   });
 }
 

@@ -43,9 +43,8 @@ Status showStatus(const Invocation& invocation, const Tools& tools) {
   const auto host = tools.openHost(effects, runLoop);
   if (!host) return endBy(host.failure(), Status::incomplete, tools);
   const auto states = reader.read(*settings, **host, runLoop);
-  tools.output.print("%s",
-                     invocation.has("--json") ? (statusJson(states) + '\n').c_str() : statusTable(states).c_str());
-  return std::ranges::all_of(states, isWholly) ? Status::done : Status::incomplete;
+  const auto text = invocation.has("--json") ? statusJson(states) + '\n' : statusTable(states);
+  return endWith(text, std::ranges::all_of(states, isWholly) ? Status::done : Status::incomplete, tools);
 }
 
 }  // namespace tavisk::control

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 #include <ctime>
+#include <memory>
 #include <utility>
 
 #include "control/Commands.h"
@@ -37,9 +38,15 @@ std::vector<WantedSetting> wantedOf(std::span<const UndoResult> results) {
 class Undoing final {
  public:
   /// Nothing is owned.
-  Undoing(const Tools& tools, const EndingSignals& signals, Host& host, EffectSink& effects, RunLoop& runLoop)
-      : _tools(tools), _signals(signals), _host(host), _effects(effects), _runLoop(runLoop) {
-    _effects.addChannel(_reader);
+  Undoing(const Tools& tools, Host& host, EffectSink& effects, RunLoop& runLoop)
+      : _tools(tools), _host(host), _runLoop(runLoop), _runner(host, effects, runLoop) {
+    effects.addChannel(_reader);
+  }
+
+  /// The waiter goes before this does.
+  std::unique_ptr<SignalWaiter> endBySignal(const EndingSignals& signals) {
+    return control::endBySignal(
+        signals, [this](const std::string& signal) { _runner.endedBySignal(signal); }, _tools);
   }
 
   std::vector<UndoResult> plan(const std::vector<RecordedChange>& changes, UndoConsent consent) {
@@ -53,11 +60,8 @@ class Undoing final {
   Result<void> carryOut(std::vector<UndoResult>& results) {
     const auto steps = stepsFor(wantedOf(results));
     if (steps.empty()) return {};
-    WordRunner runner(_host, _effects, _runLoop);
-    const auto waiter = endBySignal(
-        _signals, [&](const std::string& signal) { runner.endedBySignal(signal); }, _tools);
-    if (auto started = runner.start(); !started) return started;
-    Applier applier(_host, runner, _reader);
+    if (auto started = _runner.start(); !started) return started;
+    Applier applier(_host, _runner, _reader);
     for (const auto& step : steps) take(results, step, applier);
     return {};
   }
@@ -71,11 +75,10 @@ class Undoing final {
   }
 
   const Tools& _tools;
-  const EndingSignals& _signals;
   Host& _host;
-  EffectSink& _effects;
   RunLoop& _runLoop;
   StatusReader _reader;
+  WordRunner _runner;
 };
 
 bool isWhole(const UndoResult& result) {
@@ -92,8 +95,7 @@ Status undo(const RecordedChanges& recorded, Since since, Undoing& undoing, cons
   if (isRun)
     if (const auto done = undoing.carryOut(results); !done) return endBy(done.failure(), Status::incomplete, tools);
   const auto text = invocation.has("--json") ? undoJson(results, recorded.remarks) + '\n' : undoTable(results, isRun);
-  tools.output.print("%s", text.c_str());
-  return std::ranges::all_of(results, isWhole) ? Status::done : Status::incomplete;
+  return endWith(text, std::ranges::all_of(results, isWhole) ? Status::done : Status::incomplete, tools);
 }
 
 }  // namespace
@@ -101,15 +103,17 @@ Status undo(const RecordedChanges& recorded, Since since, Undoing& undoing, cons
 Status undoChanges(const Invocation& invocation, const Tools& tools) {
   const auto since = sinceOf(invocation);
   if (!since) return endBy(since.failure(), Status::misused, tools);
+  const bool isRun = invocation.has("--run");
   const EndingSignals signals;
-  if (!invocation.has("--run")) signals.unblock();
+  if (!isRun) signals.unblock();
   EffectSink effects;
   RunLoop runLoop;
   const auto host = tools.openHost(effects, runLoop);
   if (!host) return endBy(host.failure(), Status::incomplete, tools);
   const auto recorded = (*host)->history().changes();
   if (!recorded) return endBy(recorded.failure(), Status::incomplete, tools);
-  Undoing undoing(tools, signals, **host, effects, runLoop);
+  Undoing undoing(tools, **host, effects, runLoop);
+  const auto waiter = isRun ? undoing.endBySignal(signals) : nullptr;
   return undo(*recorded, *since, undoing, invocation, tools);
 }
 

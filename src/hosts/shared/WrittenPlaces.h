@@ -10,6 +10,9 @@ namespace tavisk {
 class WrittenPlaces {
  public:
   void add(const std::string& place) { _text += (_text.empty() ? "" : ", ") + place; }
+  void add(const WrittenPlaces& others) {
+    if (!others._text.empty()) add(others._text);
+  }
   const std::string& text() const { return _text; }
 
  private:

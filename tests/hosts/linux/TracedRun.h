@@ -90,12 +90,14 @@ inline bool canTraceCalls() {
 
 /// A run in a process of its own in which one call went wrong.
 struct TracedRun {
-  bool wentWrong = false;  ///< false: there were not so many calls
+  bool wentWrong = false;  ///< false: there were not so many calls before the first that was to
   int status = -1;         ///< what the work returned; -1: it was killed
 };
 
-/// The work's call of that number among the chosen ones fails with the error, or with error 0 is where it is killed.
-inline TracedRun runWithFault(int number, int error, bool (*isChosen)(pid_t), const std::function<int()>& work) {
+/// The work's call of that number among the chosen ones, and so many calls of them after it, fail with the error; with
+/// error 0 that is where it is killed.
+inline TracedRun runWithFault(int number, int error, bool (*isChosen)(pid_t), const std::function<int()>& work,
+                              int furtherFaults = 0) {
   const auto child = ::fork();
   if (child == 0) {
     ::ptrace(PTRACE_TRACEME, 0, nullptr, nullptr);
@@ -109,17 +111,22 @@ inline TracedRun runWithFault(int number, int error, bool (*isChosen)(pid_t), co
   };
   ::waitpid(child, &status, 0);
   ::ptrace(PTRACE_SETOPTIONS, child, nullptr, PTRACE_O_TRACESYSGOOD | PTRACE_O_EXITKILL);
-  while (WIFSTOPPED(status) && (!isChosen(child) || --number >= 0)) resume(PTRACE_SYSCALL);
-  const bool wentWrong = WIFSTOPPED(status);
+  const auto goToCall = [&](int which) {
+    while (WIFSTOPPED(status) && (!isChosen(child) || --which >= 0)) resume(PTRACE_SYSCALL);
+    return WIFSTOPPED(status);
+  };
+  const bool wentWrong = goToCall(number);
   if (wentWrong && error == 0) {
     ::kill(child, SIGKILL);
     ::waitpid(child, &status, 0);
-  } else if (wentWrong) {
+  }
+  for (int faults = 0; faults <= furtherFaults && goToCall(0); ++faults) {
     setCall(child, -1);  // none
     resume(PTRACE_SYSCALL);
     setAnswer(child, -error);
-    resume(PTRACE_CONT);
+    resume(PTRACE_SYSCALL);
   }
+  if (WIFSTOPPED(status)) resume(PTRACE_CONT);
   return {wentWrong, WIFEXITED(status) ? WEXITSTATUS(status) : -1};
 }
 

@@ -167,7 +167,8 @@ Result<std::vector<UnitDaemons::NamedState>> UnitDaemons::listed(const char* mem
 }
 
 /// To look for a unit that does not exist costs the manager more than all else: by their names it is asked only for
-/// units that have a file, of those that it has not loaded, has not found so far or knows by another name.
+/// units that have a file, of those that it has not loaded, has not found so far or knows by another name. Where this
+/// user cannot look for files, the manager can.
 Result<std::vector<UnitState>> UnitDaemons::states(const std::vector<Daemon>& daemons) {
   std::vector<std::string> units;
   std::ranges::transform(daemons, std::back_inserter(units), &Daemon::unit);
@@ -180,14 +181,13 @@ Result<std::vector<UnitState>> UnitDaemons::states(const std::vector<Daemon>& da
     const auto known = states.find(unit);
     return known != states.end() && known->second.load != notFound;
   });
-  const auto installed = unitsWithFiles(_root, rest);
-  if (!installed) return installed.failure();
-  const auto named = installed->empty() ? Result<std::vector<NamedState>>(std::vector<NamedState>())
-                                        : listed("ListUnitsByNames", *installed);
+  const auto installed = unitsWithFiles(_root, rest).valueOr(rest);
+  const auto named = installed.empty() ? Result<std::vector<NamedState>>(std::vector<NamedState>())
+                                       : listed("ListUnitsByNames", installed);
   if (!named) return named.failure();
-  if (named->size() != installed->size())
-    return Failure{"ListUnitsByNames", commaList(*installed), "it does not tell of each of them"};
-  for (std::size_t place = 0; place < named->size(); ++place) states[(*installed)[place]] = (*named)[place].second;
+  if (named->size() != installed.size())
+    return Failure{"ListUnitsByNames", commaList(installed), "it does not tell of each of them"};
+  for (std::size_t place = 0; place < named->size(); ++place) states[installed[place]] = (*named)[place].second;
 
   std::vector<UnitState> inOrder;
   std::ranges::transform(units, std::back_inserter(inOrder), [&](const auto& unit) {

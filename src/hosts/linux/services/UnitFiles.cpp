@@ -14,21 +14,19 @@ constexpr const char* administratorFolder = "/etc/systemd/system";
 constexpr const char* foldersAfter[] = {"/usr/lib/systemd/system", "/lib/systemd/system",
                                         "/run/systemd/generator.late"};
 constexpr const char* packageFolder = "/usr/lib/systemd/system";
-// Where a file, or a link that masks the unit, would count before that of the package (systemd.unit(5)).
-constexpr const char* foldersBefore[] = {administratorFolder,
-                                         "/etc/systemd/system.control",
-                                         "/etc/systemd/system.attached",
-                                         "/run/systemd/system",
-                                         "/run/systemd/system.control",
-                                         "/run/systemd/system.attached",
-                                         "/run/systemd/transient",
-                                         "/run/systemd/generator",
-                                         "/run/systemd/generator.early",
-                                         "/usr/local/lib/systemd/system"};
+// Where else a file, or a link that masks the unit, would count before that of the package (systemd.unit(5)).
+constexpr const char* foldersBefore[] = {
+    "/etc/systemd/system.control", "/etc/systemd/system.attached", "/run/systemd/system",
+    "/run/systemd/system.control", "/run/systemd/system.attached", "/run/systemd/transient",
+    "/run/systemd/generator",      "/run/systemd/generator.early", "/usr/local/lib/systemd/system"};
+
+bool has(const std::vector<std::string>& names, const std::string& name) {
+  return std::ranges::find(names, name) != names.end();
+}
 
 bool mayHave(const SystemRoot& root, const std::string& folder, const std::string& name) {
   const auto names = orEmpty(root.list(folder));
-  return !names || std::ranges::find(*names, name) != names->end();
+  return !names || has(*names, name);
 }
 
 bool isLink(const SystemRoot& root, const std::string& path) {
@@ -51,11 +49,12 @@ std::vector<std::string> fileNamesOf(const std::string& unit) {
 }  // namespace
 
 bool isEnabledBeyondDoubt(const SystemRoot& root, const std::string& unit) {
+  const auto names = root.list(administratorFolder).valueOr({});
+  if (has(names, unit)) return false;
   for (const char* folder : foldersBefore)
     if (mayHave(root, folder, unit)) return false;
   if (isLink(root, std::string(packageFolder) + "/" + unit)) return false;
   if (!root.isThere(std::string(packageFolder) + "/" + unit).valueOr(false)) return false;
-  const auto names = root.list(administratorFolder).valueOr({});
   return std::ranges::any_of(names, [&](const std::string& name) {
     return holdsLinks(name) && isLink(root, std::string(administratorFolder).append("/").append(name + "/" + unit));
   });
@@ -66,6 +65,7 @@ Result<std::vector<std::string>> unitsWithFiles(const SystemRoot& root, const st
   for (const auto& unit : units) {
     for (const auto& name : fileNamesOf(unit)) {
       const auto inFolder = [&name](const char* folder) { return std::string(folder).append("/").append(name); };
+      paths.push_back(inFolder(administratorFolder));
       std::ranges::transform(foldersBefore, std::back_inserter(paths), inFolder);
       std::ranges::transform(foldersAfter, std::back_inserter(paths), inFolder);
     }

@@ -219,14 +219,14 @@ Result<void> LinuxBootSettings::setDefault(const WayToSystem& way, WrittenPlaces
   if (!way.needsDefault) return goOn();
   WrittenPlaces places;
   const auto putBack = _choice.setDefault(way, places);
-  if (!putBack) return putBack.failure();
+  if (!putBack) {
+    written.add(places);
+    return putBack.failure();
+  }
   auto done = goOn();
   const auto back = done ? Result<void>() : (*putBack)();
-  if (done || !back) written.add(places.text());
-  if (back) return done;
-  auto why = done.failure();
-  why.why += "; the loader's default stays changed: " + describe(back.failure());
-  return why;
+  if (done || !back) written.add(places);
+  return back ? done : whileChanged(done.failure(), back.failure());
 }
 
 /// That of its boot entry, or of the one that is to be made; where firmware would not start the loader, why.

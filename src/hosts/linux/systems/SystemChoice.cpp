@@ -90,6 +90,11 @@ bool isRegular(const FileDescriptor& file) {
 
 }  // namespace
 
+Failure whileChanged(Failure why, const Failure& back) {
+  why.why += "; the loader's default may stay changed: " + describe(back);
+  return why;
+}
+
 Result<StartedSystem> SystemChoice::startedBy(const BootEntry& entry, StartTime time) const {
   auto machine = _systems.surroundings();
   if (!machine) return machine.failure();
@@ -208,9 +213,12 @@ Result<SystemChoice::PutBack> SystemChoice::saveEntry(const LoaderDefault& place
   if (!forgotten) return retold(forgotten.failure(), "write", *path);
   const auto changed = grub::withVariable(*forgotten, "saved_entry", choice);
   if (!changed) return retold(changed.failure(), "write", *path);
-  if (const auto done = writeBlock(*file, *changed, *path); !done) return done.failure();
-  written.add(*path);
-  return PutBack([file, old = *block, place = *path] { return writeBlock(*file, old, place); });
+  const auto done = writeBlock(*file, *changed, *path);
+  PutBack putBack = [file, old = *block, place = *path] { return writeBlock(*file, old, place); };
+  const auto back = done ? Result<void>() : putBack();
+  if (done || !back) written.add(*path);
+  if (done) return putBack;
+  return back ? done.failure() : whileChanged(done.failure(), back.failure());
 }
 
 }  // namespace tavisk

@@ -37,6 +37,9 @@ struct WayToSystem {
   LoaderSurroundings machine;  ///< as it was looked at
 };
 
+/// A failure after which the loader's default was to be put back, which failed too.
+Failure whileChanged(Failure why, const Failure& back);
+
 /// Which Linux systems loaders start by default, and how that is changed. The files are read anew at each question, for
 /// at most 3 s.
 class SystemChoice {
@@ -56,8 +59,8 @@ class SystemChoice {
   Result<WayToSystem> wayTo(const DiskName& volume) const;
   /// Why setDefault() would fail, as far as that shows beforehand.
   Result<void> checkDefault(const WayToSystem& way) const;
-  /// Writes the loader's default as its own tool would: in one step, and to the disk. What comes back puts the default
-  /// back that it has replaced.
+  /// Writes the loader's default as its own tool would: in one step, and to the disk; where it does not get there the
+  /// default is put back. What comes back puts the default back that it has replaced.
   using PutBack = std::function<Result<void>()>;
   Result<PutBack> setDefault(const WayToSystem& way, WrittenPlaces& written) const;
 

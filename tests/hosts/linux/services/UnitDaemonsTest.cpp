@@ -111,6 +111,15 @@ TEST_F(ManagedDaemons, AreLookedForByTheManagerOnlyWhereAFileIs) {
   }
 }
 
+TEST_F(ManagedDaemons, AreLookedForByTheManagerWhereAFolderCannotBeLookedInto) {
+  const std::string folder = "/run/systemd/transient";
+  tree.link(folder, folder);
+  const auto absent = daemons.presence({"b.service", "", ""});
+  EXPECT_TRUE(absent && *absent == Daemons::Presence::absent);
+  tree.manager.breakNext("ListUnitsByNames", Fault::error);
+  EXPECT_FALSE(daemons.presence({"b.service", "", ""})) << "nobody knows";
+}
+
 TEST_F(ManagedDaemons, RunOnWhenTheirFileIsGone) {
   tree.manager.set(daemon.unit, {.load = "not-found", .active = "active"});
   const auto running = daemons.isRunning(daemon);
