@@ -86,11 +86,6 @@ void dropPromptWord(Invocation& invocation) {
   if (takesWords(invocation.command) && !words.empty() && words.front() == "-f") words.erase(words.begin());
 }
 
-Failure misused(const std::string& what, const CommandRow* command) {
-  const std::string name = command ? std::string(command->name) + " " : "";
-  return {what, "", "type 'taviskctl " + name + "--help'"};
-}
-
 std::string behindBlank(std::string_view text) {
   return (text.empty() ? "" : " ") + std::string(text);
 }
@@ -101,6 +96,18 @@ std::string typed(const OptionRow& option) {
 
 std::string optionLines(std::span<const OptionRow> options) {
   constexpr std::size_t column = 20;
+/// The value of an option is the word after it.
+std::string whatIsUnknown(const std::string& word, const CommandRow* command) {
+  const auto* option = findOption(command, std::string_view(word).substr(0, word.find('=')));
+  return option && !option->value.empty() ? word + ": its value stands apart, " + typed(*option)
+                                          : "there is no option " + word;
+}
+
+Failure misused(const std::string& what, const CommandRow* command) {
+  const std::string name = command ? std::string(command->name) + " " : "";
+  return {what, "", "type 'taviskctl " + name + "--help'"};
+}
+
   std::string lines;
   for (const auto& option : options) {
     const auto words = typed(option);
@@ -143,7 +150,7 @@ Result<Invocation> readCommandLine(std::span<const std::string> words) {
       areOptionsOver = true;
     } else if (!areOptionsOver && isOption(word, invocation.command)) {
       const auto* option = findOption(invocation.command, word);
-      if (!option) return misused("there is no option " + word, invocation.command);
+      if (!option) return misused(whatIsUnknown(word, invocation.command), invocation.command);
       if (option->value.empty())
         invocation.options.try_emplace(option->name);
       else
