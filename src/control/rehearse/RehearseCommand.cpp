@@ -83,6 +83,9 @@ Status rehearseChanges(const Invocation& invocation, const Tools& tools) {
   const auto part = askedPart(invocation);
   if (!part) return endBy(part.failure(), Status::misused, tools);
   const EndingSignals signals;
+  if (const auto kept = keptFolder(invocation))
+    if (const auto checked = tools.checkPlaceOfCopy(*kept); !checked)
+      return endBy(checked.failure(), Status::incomplete, tools);
   const auto folder = RehearsalFolder::make(keptFolder(invocation));
   if (!folder) return endBy(folder.failure(), Status::incomplete, tools);
   const auto waiter = endBySignal(
