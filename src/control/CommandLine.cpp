@@ -23,6 +23,8 @@ constexpr OptionRow statusOptions[] = {
 constexpr OptionRow rehearseOptions[] = {
     {"--from", "Take settings and values from a JSON file; '-' is standard input.", "FILE"},
     {"--keep", "Make the copy of the machine in this folder, and leave it there.", "DIR"},
+    {"--skip-unsupported", "What this machine cannot have does not count."},
+    {"--allow-lockout", "Turn remote login off too, where that is asked for."},
     {"--json", "Print one JSON object instead of a table."},
 };
 
@@ -94,8 +96,6 @@ std::string typed(const OptionRow& option) {
   return std::string(option.name) + behindBlank(option.value);
 }
 
-std::string optionLines(std::span<const OptionRow> options) {
-  constexpr std::size_t column = 20;
 /// The value of an option is the word after it.
 std::string whatIsUnknown(const std::string& word, const CommandRow* command) {
   const auto* option = findOption(command, std::string_view(word).substr(0, word.find('=')));
@@ -108,6 +108,8 @@ Failure misused(const std::string& what, const CommandRow* command) {
   return {what, "", "type 'taviskctl " + name + "--help'"};
 }
 
+std::string optionLines(std::span<const OptionRow> options) {
+  constexpr std::size_t column = 20;
   std::string lines;
   for (const auto& option : options) {
     const auto words = typed(option);
