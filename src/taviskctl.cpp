@@ -48,7 +48,7 @@ Status runOn(Output& output, const std::vector<std::string>& words) {
   const auto progress = isWatched ? showProgress : control::ShowProgress();
   const auto openHost = [&](EffectSink& effects, RunLoop& runLoop) { return openChosenHost(effects, runLoop, remark); };
   try {
-    return control::run(words, {openHost, openRehearsal, output, complainOfControl, progress});
+    return control::run(words, {openHost, openRehearsal, checkPlaceOfCopy, output, complainOfControl, progress});
   } catch (const Output::Lost&) {
     return Status::incomplete;  // afterOutput() says why
   }

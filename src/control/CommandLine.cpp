@@ -23,6 +23,8 @@ constexpr OptionRow statusOptions[] = {
 constexpr OptionRow rehearseOptions[] = {
     {"--from", "Take settings and values from a JSON file; '-' is standard input.", "FILE"},
     {"--keep", "Make the copy of the machine in this folder, and leave it there.", "DIR"},
+    {"--skip-unsupported", "What this machine cannot have does not count."},
+    {"--allow-lockout", "Turn remote login off too, where that is asked for."},
     {"--json", "Print one JSON object instead of a table."},
 };
 
@@ -86,17 +88,24 @@ void dropPromptWord(Invocation& invocation) {
   if (takesWords(invocation.command) && !words.empty() && words.front() == "-f") words.erase(words.begin());
 }
 
-Failure misused(const std::string& what, const CommandRow* command) {
-  const std::string name = command ? std::string(command->name) + " " : "";
-  return {what, "", "type 'taviskctl " + name + "--help'"};
-}
-
 std::string behindBlank(std::string_view text) {
   return (text.empty() ? "" : " ") + std::string(text);
 }
 
 std::string typed(const OptionRow& option) {
   return std::string(option.name) + behindBlank(option.value);
+}
+
+/// The value of an option is the word after it.
+std::string whatIsUnknown(const std::string& word, const CommandRow* command) {
+  const auto* option = findOption(command, std::string_view(word).substr(0, word.find('=')));
+  return option && !option->value.empty() ? word + ": its value stands apart, " + typed(*option)
+                                          : "there is no option " + word;
+}
+
+Failure misused(const std::string& what, const CommandRow* command) {
+  const std::string name = command ? std::string(command->name) + " " : "";
+  return {what, "", "type 'taviskctl " + name + "--help'"};
 }
 
 std::string optionLines(std::span<const OptionRow> options) {
@@ -143,7 +152,7 @@ Result<Invocation> readCommandLine(std::span<const std::string> words) {
       areOptionsOver = true;
     } else if (!areOptionsOver && isOption(word, invocation.command)) {
       const auto* option = findOption(invocation.command, word);
-      if (!option) return misused("there is no option " + word, invocation.command);
+      if (!option) return misused(whatIsUnknown(word, invocation.command), invocation.command);
       if (option->value.empty())
         invocation.options.try_emplace(option->name);
       else

@@ -35,6 +35,8 @@ struct Tools {
   std::function<Result<std::unique_ptr<Host>>(const std::string& directory, bool withDisks, EffectSink& effects,
                                               RunLoop& runLoop)>
       openRehearsal;
+  /// Why no copy of that machine may be made in a folder, which need not be there yet: the machine would change.
+  std::function<Result<void>(const std::string& directory)> checkPlaceOfCopy;
   Output& output;                                  ///< standard output
   std::function<void(std::string_view)> complain;  ///< one line on standard error
   ShowProgress showProgress = {};                  ///< empty: nobody watches

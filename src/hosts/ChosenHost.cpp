@@ -3,8 +3,11 @@
 #include "hosts/ChosenHost.h"
 
 #include <cstdlib>
+#include <filesystem>
 #include <functional>
+#include <optional>
 #include <string>
+#include <system_error>
 #include <utility>
 
 #include "base/Text.h"
@@ -15,6 +18,7 @@
 namespace tavisk {
 namespace {
 
+constexpr const char* hostVariable = "TAVISK_HOST";
 constexpr std::string_view scratchPrefix = "scratch:";
 
 using HostOrFailure = Result<std::unique_ptr<Host>>;
@@ -25,12 +29,28 @@ struct Openers {
   std::function<HostOrFailure(const std::string& directory)> scratch;
 };
 
+/// Absent: that of no machine of files.
+std::optional<std::string> scratchFolder(const std::string& name) {
+  return name.starts_with(scratchPrefix) ? std::optional(name.substr(scratchPrefix.size())) : std::nullopt;
+}
+
 HostOrFailure openNamed(const Openers& openers) {
-  const auto* variable = std::getenv("TAVISK_HOST");
+  const auto* variable = std::getenv(hostVariable);
   if (!variable) return openers.linux();
   const std::string name = variable;
-  if (name.starts_with(scratchPrefix)) return openers.scratch(name.substr(scratchPrefix.size()));
+  if (const auto folder = scratchFolder(name)) return openers.scratch(*folder);
   return Failure{"use TAVISK_HOST=" + name, "", "unset or scratch:DIR is expected"};
+}
+
+/// Whatever names the two have. What is not there yet lies in nothing but the folders above it.
+bool liesIn(const std::filesystem::path& folder, const std::string& directory) {
+  std::error_code error;
+  auto place = std::filesystem::weakly_canonical(std::filesystem::absolute(directory, error), error);
+  while (!std::filesystem::equivalent(place, folder, error)) {
+    if (!place.has_relative_path()) return false;
+    place = place.parent_path();
+  }
+  return true;
 }
 
 HostOrFailure openScratchHost(const std::string& directory, EffectSink& effects, RunLoop& runLoop,
@@ -70,6 +90,15 @@ HostOrFailure openRehearsal(const std::string& directory, bool withDisks, Effect
                                        {directory, withDisks}, effects, runLoop);
   if (!rehearsal) return rehearsal.failure();
   return std::unique_ptr<Host>(std::move(rehearsal).value());
+}
+
+Result<void> checkPlaceOfCopy(const std::string& directory) {
+  const auto* variable = std::getenv(hostVariable);
+  const auto machine = scratchFolder(variable ? variable : "");
+  if (machine && liesIn(*machine, directory))
+    return Failure{"make the folder of the rehearsal", directory,
+                   "it is in the folder of the machine itself, which would change"};
+  return {};
 }
 
 }  // namespace tavisk

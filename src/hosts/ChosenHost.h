@@ -25,4 +25,7 @@ Result<std::unique_ptr<Host>> openChosenHost(EffectSink& effects, RunLoop& runLo
 Result<std::unique_ptr<Host>> openRehearsal(const std::string& directory, bool withDisks, EffectSink& effects,
                                             RunLoop& runLoop);
 
+/// Why no copy of that machine may be made in the folder, which need not be there: it is in that of the machine.
+Result<void> checkPlaceOfCopy(const std::string& directory);
+
 }  // namespace tavisk

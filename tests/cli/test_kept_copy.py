@@ -1,6 +1,6 @@
 # SPDX-FileCopyrightText: 2026 The tavisk developers
 # SPDX-License-Identifier: MIT
-"""What a machine refuses and cannot read its kept copy refuses and cannot read for the same reason.
+"""A kept copy refuses, and cannot read, what its machine does, and is not made within that.
 
 usage: test_kept_copy.py PROGRAM
 """
@@ -21,6 +21,16 @@ class KeptCopy(unittest.TestCase):
             copy.run(["-settimezone", "Europe/Paris", "-getdisplaysleep"])
             told = {effect["setting"]: effect["why"] for effect in copy.effects() if "why" in effect}
         self.assertEqual(told, {name.removesuffix(" (read)"): reason for name, reason in REFUSALS.items()})
+
+    def test_is_not_made_in_its_machine(self):
+        with ScratchMachine(PROGRAM + "ctl") as machine:
+            (machine.directory / "link").symlink_to(".")
+            before = sorted(machine.directory.iterdir())
+            for folder in ("", "copy", "copy/of/it", "link/copy"):
+                told = machine.run(["rehearse", "--keep", str(machine.directory / folder), "-getdate"])
+                self.assertIn(b"in the folder of the machine itself", told[1])
+                self.assertEqual(told[2], 1)
+            self.assertEqual(sorted(machine.directory.iterdir()), before)
 
 
 if __name__ == "__main__":

@@ -132,6 +132,10 @@ AppliedSetting judged(const AskedValue& asked, const SettingState& before, const
   return applied;
 }
 
+bool isOff(const SettingState& state) {
+  return state.value.unsupported || (state.value.live == "off" && state.value.stored.value_or("off") == "off");
+}
+
 bool isOnUntilRestart(const ManagedSetting& setting, const SettingState& state) {
   return setting.name == setting::networkTime && state.value.live == "on" && state.value.stored == "off";
 }
@@ -198,6 +202,18 @@ std::vector<std::vector<std::string>> Applier::wordsOf(const Step& step, const S
   if (*value == "on" && isOnUntilRestart(*setting, state))
     words.insert(words.begin(), setterWords(*setting, "off").front());
   return words;
+}
+
+bool isLockoutRefused(std::span<const Step> steps, Applier& applier, const Invocation& invocation, const Tools& tools) {
+  if (invocation.has("--allow-lockout") || std::ranges::none_of(steps, mayLockOut)) return false;
+  if (isOff(applier.stateOf(*managedNamed(setting::remoteLogin)))) return false;
+  tools.complain("Remote Login is not turned off without --allow-lockout; nothing was changed");
+  return true;
+}
+
+bool isDone(Verdict verdict, bool lasts, const Invocation& invocation) {
+  if (verdict == Verdict::notSupported) return invocation.has("--skip-unsupported");
+  return verdict <= Verdict::applied && lasts;
 }
 
 Status withApplier(const Tools& tools, const std::function<Status(Applier& applier)>& change) {

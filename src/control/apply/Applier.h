@@ -4,6 +4,7 @@
 
 #include <functional>
 #include <optional>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -54,6 +55,13 @@ class Applier final {
   WordRunner& _runner;
   StatusReader& _reader;
 };
+
+/// Complains, and is true, where --allow-lockout is not given and the steps would close the way in: who has none
+/// already does not lose one.
+bool isLockoutRefused(std::span<const Step> steps, Applier& applier, const Invocation& invocation, const Tools& tools);
+
+/// Whether a setting counts as what was asked for, by --skip-unsupported too.
+bool isDone(Verdict verdict, bool lasts, const Invocation& invocation);
 
 /// Opens the machine, hands over what changes it, and ends by its status; where that cannot be had, by saying why. An
 /// ending signal gives the authorization up.

@@ -6,7 +6,6 @@
 #include "control/Ending.h"
 #include "control/apply/Applier.h"
 #include "control/apply/ApplyText.h"
-#include "effects/SettingNames.h"
 
 namespace tavisk::control {
 namespace {
@@ -19,15 +18,6 @@ Result<std::vector<Step>> wantedSteps(const Invocation& invocation) {
   const auto wanted = wantedInFile(invocation.options.at("--from"));
   if (!wanted) return wanted.failure();
   return stepsFor(*wanted);
-}
-
-bool isOff(const SettingState& state) {
-  return state.value.unsupported || (state.value.live == "off" && state.value.stored.value_or("off") == "off");
-}
-
-/// Who has no way in already does not lose one.
-bool wouldLockOut(std::span<const Step> steps, Applier& applier) {
-  return std::ranges::any_of(steps, mayLockOut) && !isOff(applier.stateOf(*settingMeantBy(setting::remoteLogin)));
 }
 
 std::string titleOf(const Step& step) {
@@ -45,20 +35,11 @@ std::vector<AppliedSetting> applied(std::span<const Step> steps, Applier& applie
   return all;
 }
 
-bool isDone(const AppliedSetting& setting, bool isUnsupportedSkipped) {
-  if (setting.verdict == Verdict::notSupported) return isUnsupportedSkipped;
-  return setting.verdict <= Verdict::applied && setting.lasts;
-}
-
 Status apply(std::span<const Step> steps, Applier& applier, const Invocation& invocation, const Tools& tools) {
-  if (!invocation.has("--allow-lockout") && wouldLockOut(steps, applier)) {
-    tools.complain("Remote Login is not turned off without --allow-lockout; nothing was changed");
-    return Status::incomplete;
-  }
+  if (isLockoutRefused(steps, applier, invocation, tools)) return Status::incomplete;
   const auto settings = applied(steps, applier, tools.showProgress);
-  const bool isUnsupportedSkipped = invocation.has("--skip-unsupported");
-  const bool areAllDone =
-      std::ranges::all_of(settings, [&](const auto& setting) { return isDone(setting, isUnsupportedSkipped); });
+  const bool areAllDone = std::ranges::all_of(
+      settings, [&](const auto& setting) { return isDone(setting.verdict, setting.lasts, invocation); });
   const auto text =
       invocation.has("--json") ? appliedJson("apply", settings, areAllDone) + "\n" : appliedTable(settings);
   return endWith(text, areAllDone ? Status::done : Status::incomplete, tools);

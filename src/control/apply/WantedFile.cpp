@@ -116,16 +116,26 @@ Result<WantedSetting> wantedBy(const ManagedSetting& setting, const Json& member
   return WantedSetting{&setting, std::move(meant).value()};
 }
 
+/// The settings and their values: all of the text, or what status has told, in which nothing else is wanted.
+Result<const Json*> membersOf(const Json& json, const std::string& name) {
+  const auto* settings = memberOf(json, "settings");
+  if (!settings) return &json;
+  if (!settings->is_object()) return Failure{readWanted, name, "settings: an object is expected"};
+  for (const auto& [key, beside] : json.items())
+    if (key != "settings" && key != "status")
+      return Failure{readWanted, name, key + " stands beside settings, not there"};
+  return settings;
+}
+
 }  // namespace
 
 Result<std::vector<WantedSetting>> wantedIn(std::string_view text, const std::string& name) {
   const auto json = parsed(text, name);
   if (!json) return json.failure();
-  const auto status = json->find("settings");
-  const auto& members = status == json->end() ? *json : *status;
-  if (!members.is_object()) return Failure{readWanted, name, "settings: an object is expected"};
+  const auto members = membersOf(*json, name);
+  if (!members) return members.failure();
   std::vector<WantedSetting> wanted;
-  for (const auto& [key, member] : members.items()) {
+  for (const auto& [key, member] : (*members)->items()) {
     const auto* setting = settingMeantBy(key);
     if (isLeftOut(setting, member)) continue;
     if (!setting) return Failure{readWanted, name, "there is no setting " + key};

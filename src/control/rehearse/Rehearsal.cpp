@@ -86,11 +86,13 @@ RehearsedSetting rehearsed(const AppliedSetting& applied, const RehearsalNotes& 
           .lasts = applied.lasts};
 }
 
-bool isAllDone(const Rehearsed& rehearsed) {
-  const auto isDone = [](Verdict verdict) { return verdict <= Verdict::applied; };
-  return rehearsed.dropped.empty() &&
-         std::ranges::all_of(rehearsed.words, [&](const auto& word) { return isDone(verdictOf(word)); }) &&
-         std::ranges::all_of(rehearsed.settings, isDone, &RehearsedSetting::verdict);
+bool isAllDone(const Rehearsed& rehearsed, const Invocation& invocation) {
+  const auto isWordDone = [&](const WordResult& word) { return isDone(verdictOf(word), true, invocation); };
+  const auto isSettingDone = [&](const RehearsedSetting& setting) {
+    return isDone(setting.verdict, setting.lasts.value_or(true), invocation);
+  };
+  return rehearsed.dropped.empty() && std::ranges::all_of(rehearsed.words, isWordDone) &&
+         std::ranges::all_of(rehearsed.settings, isSettingDone);
 }
 
 }  // namespace tavisk::control

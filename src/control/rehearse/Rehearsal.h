@@ -57,13 +57,13 @@ Rehearsed rehearseWords(std::span<const std::string> words, WordRunner& runner);
 /// A setting as it was applied to the copy of the machine.
 RehearsedSetting rehearsed(const AppliedSetting& applied, const RehearsalNotes& notes);
 
-/// Whether all of it would be done.
-bool isAllDone(const Rehearsed& rehearsed);
+/// Whether all of it would be done, as apply tells it.
+bool isAllDone(const Rehearsed& rehearsed, const Invocation& invocation);
 
 /// Harmless for a terminal.
 std::string rehearsedTable(const Rehearsed& rehearsed);
 
 /// One JSON object without a newline; see taviskctl(8). `folder` is where the copy is kept; empty: it is not.
-std::string rehearsedJson(const Rehearsed& rehearsed, const std::string& folder);
+std::string rehearsedJson(const Rehearsed& rehearsed, bool isDone, const std::string& folder);
 
 }  // namespace tavisk::control

@@ -100,9 +100,9 @@ std::string rehearsedTable(const Rehearsed& rehearsed) {
   return table.str();
 }
 
-std::string rehearsedJson(const Rehearsed& rehearsed, const std::string& folder) {
+std::string rehearsedJson(const Rehearsed& rehearsed, bool isDone, const std::string& folder) {
   JsonObject object;
-  object.integer("rehearse", 1).boolean("done", isAllDone(rehearsed));
+  object.integer("rehearse", 1).boolean("done", isDone);
   object.textUnlessEmpty("folder", folder);
   if (!rehearsed.words.empty()) object.array("commands", {jsonOfEach(rehearsed.words)});
   object.textUnlessEmpty("dropped", joined(rehearsed.dropped, " "));

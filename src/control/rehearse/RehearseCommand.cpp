@@ -22,14 +22,14 @@ constexpr const char* keep = "--keep";
 /// Words, or the steps of a file.
 struct Part {
   std::vector<std::string> words;
-  std::vector<Step> steps;
+  std::vector<Step> steps;  ///< of words, those that set something
 };
 
 Result<Part> askedPart(const Invocation& invocation) {
   const bool isFile = invocation.has(from);
   if (isFile != invocation.operands.empty())
     return Failure{"either words of tavisk or --from FILE are expected", "", "type 'taviskctl rehearse --help'"};
-  if (!isFile) return Part{invocation.operands, {}};
+  if (!isFile) return Part{invocation.operands, settersAmong(invocation.operands)};
   const auto wanted = wantedInFile(invocation.options.at(from));
   if (!wanted) return wanted.failure();
   return Part{{}, stepsFor(*wanted)};
@@ -39,13 +39,12 @@ std::optional<std::string> keptFolder(const Invocation& invocation) {
   return invocation.has(keep) ? std::optional(invocation.options.at(keep)) : std::nullopt;
 }
 
-Rehearsed rehearsedOn(Host& host, const Part& part, WordRunner& runner, StatusReader& reader, RehearsalNotes& notes) {
-  if (part.steps.empty()) {
+Rehearsed rehearsedOn(const Part& part, Applier& applier, WordRunner& runner, RehearsalNotes& notes) {
+  if (!part.words.empty()) {
     auto all = rehearseWords(part.words, runner);
     all.settings = notes.settings();
     return all;
   }
-  Applier applier(host, runner, reader);
   Rehearsed all;
   for (const auto& step : part.steps)
     for (const auto& applied : applier.apply(step)) all.settings.push_back(rehearsed(applied, notes));
@@ -54,8 +53,10 @@ Rehearsed rehearsedOn(Host& host, const Part& part, WordRunner& runner, StatusRe
 
 Status show(const Rehearsed& rehearsed, const Invocation& invocation, const Tools& tools) {
   const auto folder = keptFolder(invocation).value_or("");
-  const auto text = invocation.has("--json") ? rehearsedJson(rehearsed, folder) + "\n" : rehearsedTable(rehearsed);
-  return endWith(text, isAllDone(rehearsed) ? Status::done : Status::incomplete, tools);
+  const bool areAllDone = isAllDone(rehearsed, invocation);
+  const auto text =
+      invocation.has("--json") ? rehearsedJson(rehearsed, areAllDone, folder) + "\n" : rehearsedTable(rehearsed);
+  return endWith(text, areAllDone ? Status::done : Status::incomplete, tools);
 }
 
 /// What is kept has the files that the search for startup disks looks at.
@@ -87,6 +88,9 @@ class LookFailures final : public EffectChannel {
 Status rehearseChanges(const Invocation& invocation, const Tools& tools) {
   const auto part = askedPart(invocation);
   if (!part) return endBy(part.failure(), Status::misused, tools);
+  if (const auto kept = keptFolder(invocation))
+    if (const auto checked = tools.checkPlaceOfCopy(*kept); !checked)
+      return endBy(checked.failure(), Status::incomplete, tools);
   const EndingSignals signals;
   const auto folder = RehearsalFolder::make(keptFolder(invocation));
   if (!folder) return endBy(folder.failure(), Status::incomplete, tools);
@@ -106,7 +110,9 @@ Status rehearseChanges(const Invocation& invocation, const Tools& tools) {
   effects.removeChannel(failures);
   effects.addChannel(reader);
   effects.addChannel(notes);
-  return show(rehearsedOn(**host, *part, runner, reader, notes), invocation, tools);
+  Applier applier(**host, runner, reader);
+  if (isLockoutRefused(part->steps, applier, invocation, tools)) return Status::incomplete;
+  return show(rehearsedOn(*part, applier, runner, notes), invocation, tools);
 }
 
 }  // namespace tavisk::control

@@ -19,6 +19,17 @@ bool isStored(const Effect& effect) {
   return effect.stored && effect.stored == effect.asked;
 }
 
+/// What was foretold, but for what has come of it on the copy.
+Effect failedAs(const Effect& copied, Effect effect) {
+  effect.outcome = Outcome::failed;
+  effect.failure = copied.failure;
+  effect.live = copied.live;
+  effect.stored = copied.stored;
+  effect.changed = copied.changed;
+  if (copied.where.empty()) effect.where.clear();
+  return effect;
+}
+
 }  // namespace
 
 Stage::Stage(const Players& players, EffectSink& audience)
@@ -45,9 +56,7 @@ Stage::Effects Stage::play(const Act& onMachine, const std::function<void(Host&,
   _isPlaying = false;
   for (auto& effect : effects) {
     const auto failed = _copyFailures.find(effect.setting);
-    if (isRefused(effect) || failed == _copyFailures.end()) continue;
-    effect.outcome = Outcome::failed;
-    effect.failure = failed->second;
+    if (!isRefused(effect) && failed != _copyFailures.end()) effect = failedAs(failed->second, std::move(effect));
   }
   tell(effects);
   return effects;
@@ -125,8 +134,7 @@ void Stage::edit(const MachineFile::Edit& edit) {
 /// What a getter of the copy could not read is told as it is; what became of a change the machine tells.
 void Stage::record(const Effect& effect) {
   if (!_isPlaying) return _audience.record(effect);
-  if (effect.outcome == Outcome::failed && effect.failure)
-    _copyFailures.insert_or_assign(effect.setting, *effect.failure);
+  if (effect.outcome == Outcome::failed && effect.failure) _copyFailures.insert_or_assign(effect.setting, effect);
 }
 
 void Stage::observe(const SettingValue& value) {

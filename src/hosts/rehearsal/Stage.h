@@ -100,7 +100,7 @@ class Stage final : public EffectChannel {
   EffectSink& _audience;
   Foretold _foretold;
   bool _isPlaying = false;
-  std::map<std::string, Failure> _copyFailures;  ///< while it plays
+  std::map<std::string, Effect> _copyFailures;  ///< while it plays
   std::map<std::string, State> _states;
 };
 

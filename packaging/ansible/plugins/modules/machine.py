@@ -213,20 +213,10 @@ def told(answer):
     return [{NAMES.get(name, name): value for name, value in setting.items()} for setting in answer["settings"]]
 
 
-def rehearse(module, wanted):
-    settings = told(ask(module, ["rehearse", "--json", *FROM_INPUT], wanted)[1])
-    if not module.params["allow_lockout"] and any(is_turned_off(setting) for setting in settings):
-        module.fail_json(msg="Remote Login is not turned off without allow_lockout; nothing would be changed")
-    return settings, faults(module, settings)
-
-
-def is_turned_off(setting):
-    return setting["setting"] == "Remote Login" and setting["changed"] and setting.get("after") == "off"
-
-
-def apply(module, wanted):
+def run(module, command, wanted):
+    """What came of each setting, and why that is not all, by taviskctl apply or rehearse."""
     options = [option for option in ("skip_unsupported", "allow_lockout") if module.params[option]]
-    words = ["apply", *("--" + option.replace("_", "-") for option in options), "--json", *FROM_INPUT]
+    words = [command, *("--" + option.replace("_", "-") for option in options), "--json", *FROM_INPUT]
     status, answer = ask(module, words, wanted)
     settings = told(answer)
     return settings, faults(module, settings) or ["not everything was done"] * bool(status)
@@ -266,7 +256,7 @@ def difference(settings):
 def change(module):
     """What was done, as a part of the result, and why that is not all."""
     wanted = json.dumps(module.params["settings"])
-    settings, problems = rehearse(module, wanted) if module.check_mode else apply(module, wanted)
+    settings, problems = run(module, "rehearse" if module.check_mode else "apply", wanted)
     result = {"settings": settings, "changed": any(setting["changed"] for setting in settings)}
     if module._diff:
         result["diff"] = difference(settings)
