@@ -3,7 +3,6 @@
 #include "control/apply/ApplyPlan.h"
 
 #include <algorithm>
-#include <utility>
 
 #include "base/Text.h"
 #include "control/SilentFrame.h"
@@ -48,19 +47,6 @@ Result<std::vector<Step>> stepsOf(std::span<const std::string> words) {
     if (asked.empty()) return Failure{readWords, word, "it sets nothing"};
     steps.push_back({asked, {own.begin(), own.end()}});
     words = words.subspan(taken);
-  }
-  return steps;
-}
-
-std::vector<Step> settersAmong(std::span<const std::string> words) {
-  const auto table = productTable();
-  std::vector<Step> steps;
-  while (!words.empty()) {
-    const auto* entry = table.findTyped(words.front());
-    const auto own = words.first(std::min(words.size(), entry ? static_cast<std::size_t>(1 + entry->arguments) : 1));
-    auto asked = own.size() > 1 ? askedBy(own.front(), own.back()) : std::vector<AskedValue>();
-    if (!asked.empty()) steps.push_back({std::move(asked), {own.begin(), own.end()}});
-    words = words.subspan(own.size());
   }
   return steps;
 }

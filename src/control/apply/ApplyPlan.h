@@ -23,9 +23,6 @@ struct Step {
 /// argument.
 Result<std::vector<Step>> stepsOf(std::span<const std::string> words);
 
-/// The same of words of any kind: those that set nothing or have no argument are passed over.
-std::vector<Step> settersAmong(std::span<const std::string> words);
-
 /// A step for each setting, in the order in which the machine can take them all: network time off before the clock is
 /// set and on after that, the zone before the time of day, the way in last.
 std::vector<Step> stepsFor(std::span<const WantedSetting> wanted);

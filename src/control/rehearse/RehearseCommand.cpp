@@ -22,14 +22,14 @@ constexpr const char* keep = "--keep";
 /// Words, or the steps of a file.
 struct Part {
   std::vector<std::string> words;
-  std::vector<Step> steps;  ///< of words, those that set something
+  std::vector<Step> steps;
 };
 
 Result<Part> askedPart(const Invocation& invocation) {
   const bool isFile = invocation.has(from);
   if (isFile != invocation.operands.empty())
     return Failure{"either words of tavisk or --from FILE are expected", "", "type 'taviskctl rehearse --help'"};
-  if (!isFile) return Part{invocation.operands, settersAmong(invocation.operands)};
+  if (!isFile) return Part{invocation.operands, {}};
   const auto wanted = wantedInFile(invocation.options.at(from));
   if (!wanted) return wanted.failure();
   return Part{{}, stepsFor(*wanted)};
