@@ -17,7 +17,7 @@ def prove(machine, results):
     in_force = machine.run(IN_FORCE).output
     problems = [] if any(path.startswith("/etc/") for path in made) else ["nothing was made that could be left behind"]
     # The collection's package too, where it is installed.
-    purged = machine.run("dpkg --purge $(dpkg-query --show --showformat '${Package} ' '*tavisk*')")
+    purged = machine.run("dpkg --purge $(dpkg-query --show '*tavisk*' | cut -f 1)")
     if purged.status:
         problems.append(purged.output + purged.errors)
     problems += ["left: " + path for path in machine.run(MADE).output.splitlines()]
