@@ -32,7 +32,7 @@ std::vector<DiskName> disksOf(DiskEventSession& session, RunLoop& runLoop) {
   };
   session.schedule(runLoop);
   session.registerCallback({note, &disks, DiskEvent::Kind::appeared, {}, {}});
-  runLoop.runUntil(RunLoop::Clock::now() + longestFirstReport, [&] { return !disks.empty(); });
+  static_cast<void>(runLoop.runUntil(RunLoop::Clock::now() + longestFirstReport, [&] { return !disks.empty(); }));
   session.unregisterCallback(note, &disks);
   session.unschedule();
   return disks;
