@@ -153,11 +153,23 @@ Result<void> FolderWriter::putInPlace(const Temporary& temporary, const std::str
 }
 
 Result<void> FolderWriter::rewrite(const std::string& name, std::string_view contents) {
-  const auto file = openNamed(_folder, name, O_WRONLY | O_NOFOLLOW | O_NONBLOCK);
+  const auto file = openNamed(_folder, name, O_RDWR | O_NOFOLLOW | O_NONBLOCK);
   if (!file) return retold(file.failure(), "open", _path);
-  if (auto written = writeAll(*file, contents, _path); !written) return written;
-  if (::ftruncate(file->number(), static_cast<off_t>(contents.size())) != 0) return failure("cut");
-  if (::fsync(file->number()) != 0) return failure("flush");
+  const auto old = readAll(*file, std::string::npos, _path);
+  if (!old) return old.failure();
+  const auto done = overwrite(*file, contents);
+  const auto back = done ? Result<void>() : overwrite(*file, *old);
+  if (back) return done;
+  auto why = done.failure();
+  why.why += "; the old contents are not back: " + describe(back.failure());
+  return why;
+}
+
+Result<void> FolderWriter::overwrite(const FileDescriptor& file, std::string_view contents) {
+  if (::lseek(file.number(), 0, SEEK_SET) != 0) return failure("go to the beginning of");
+  if (auto written = writeAll(file, contents, _path); !written) return written;
+  if (::ftruncate(file.number(), static_cast<off_t>(contents.size())) != 0) return failure("cut");
+  if (::fsync(file.number()) != 0) return failure("flush");
   return {};
 }
 

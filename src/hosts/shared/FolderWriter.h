@@ -34,6 +34,7 @@ class FolderWriter {
   Result<void> keepLabel(const FileDescriptor& fresh, const std::string& name);
   Result<void> putInPlace(const Temporary& temporary, const std::string& name, std::string_view contents);
   Result<void> rewrite(const std::string& name, std::string_view contents);
+  Result<void> overwrite(const FileDescriptor& file, std::string_view contents);
   Result<void> syncFolder();
   Failure failure(const char* tried) const;
 

@@ -59,7 +59,7 @@ class SystemRoot {
   /// Replaces a file, or makes it and the folders above it. Whoever reads, and whoever starts after a kill or a power
   /// cut, finds the old or the new contents whole; a success is on the disk. Owner, mode and security label of the old
   /// file are kept, a new one has `modeWhenNew` whatever the umask. Where a file is mounted on the path it is rewritten
-  /// in place. Temporary files that a killed run left in the folder are removed.
+  /// in place, and put back when that fails. Temporary files that a killed run left in the folder are removed.
   Result<void> write(const std::string& path, std::string_view contents, unsigned modeWhenNew = 0644) const;
   /// Puts a symbolic link at the path, in one step where a file or a link is there.
   Result<void> writeLink(const std::string& path, const std::string& target) const;

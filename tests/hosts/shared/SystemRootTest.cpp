@@ -168,6 +168,19 @@ TEST_F(SystemRootTest, rewritesInPlaceWhereAFileIsMounted) {
   if (!ran) GTEST_SKIP() << "may not have mounts of its own";
 }
 
+TEST_F(SystemRootTest, leavesAMountedFileAsItWasWhereItHasNoRoom) {
+  const bool ran = withOwnMounts([&] {
+    const auto mounted = folder.write("/etc/hosts", "");
+    fs::create_directory(at("/small"));
+    ASSERT_TRUE(mountMemory(at("/small"), "4k"));
+    const auto source = folder.write("/small/source", "old");
+    ASSERT_EQ(::mount(source.c_str(), mounted.c_str(), nullptr, MS_BIND, nullptr), 0);
+    EXPECT_FALSE(root.write("/etc/hosts", std::string(100'000, '.')));
+    EXPECT_EQ(contentsOf(source), "old");
+  });
+  if (!ran) GTEST_SKIP() << "may not have mounts of its own";
+}
+
 /// What is not to be done: to look, and then to open by the same path.
 std::string readAfterLook(const fs::path& folder, const fs::path& file) {
   if (fs::is_symlink(fs::symlink_status(folder))) return "none";
