@@ -25,6 +25,23 @@ int writeFrom(std::string_view& contents, const FileDescriptor& file) {
   return 0;
 }
 
+/// Fills so many bytes, or as many as there are, by reads that are told where to, how many at most and how many are
+/// there.
+template <typename Read>
+Result<std::string> filled(std::size_t length, const std::string& path, const Read& read) {
+  std::string bytes(length, '\0');
+  std::size_t size = 0;
+  while (size < length) {
+    const auto count = read(&bytes[size], length - size, size);
+    if (count < 0 && errno == EINTR) continue;
+    if (count < 0) return systemFailure("read", path, errno);
+    if (count == 0) break;
+    size += static_cast<std::size_t>(count);
+  }
+  bytes.resize(size);
+  return bytes;
+}
+
 /// A record lock on a whole file, as it tells two runs apart also where both have the descriptor from one parent.
 class AppendLock final {
  public:
@@ -93,32 +110,14 @@ Result<std::string> readAll(const FileDescriptor& file, std::size_t limit, const
 }
 
 Result<std::string> readBeginning(const FileDescriptor& file, std::size_t length, const std::string& path) {
-  std::string beginning(length, '\0');
-  std::size_t size = 0;
-  while (size < length) {
-    const auto count = ::read(file.number(), beginning.data() + size, length - size);
-    if (count < 0 && errno == EINTR) continue;
-    if (count < 0) return systemFailure("read", path, errno);
-    if (count == 0) break;
-    size += static_cast<std::size_t>(count);
-  }
-  beginning.resize(size);
-  return beginning;
+  return filled(length, path, [&](char* to, std::size_t room, std::size_t) { return ::read(file.number(), to, room); });
 }
 
 Result<std::string> readAt(const FileDescriptor& file, std::uint64_t place, std::size_t length,
                            const std::string& path) {
-  std::string bytes(length, '\0');
-  std::size_t size = 0;
-  while (size < length) {
-    const auto count = ::pread(file.number(), &bytes[size], length - size, static_cast<off_t>(place + size));
-    if (count < 0 && errno == EINTR) continue;
-    if (count < 0) return systemFailure("read", path, errno);
-    if (count == 0) break;
-    size += static_cast<std::size_t>(count);
-  }
-  bytes.resize(size);
-  return bytes;
+  return filled(length, path, [&](char* to, std::size_t room, std::size_t size) {
+    return ::pread(file.number(), to, room, static_cast<off_t>(place + size));
+  });
 }
 
 Result<void> writeAll(const FileDescriptor& file, std::string_view contents, const std::string& path) {
