@@ -89,10 +89,10 @@ Result<DaemonGroup> DaemonGroup::present() const {
   return found;
 }
 
-Result<std::vector<Daemon>> DaemonGroup::those(Result<bool> (Daemons::*are)(const Daemon&)) const {
+Result<std::vector<Daemon>> DaemonGroup::those(const std::function<Result<bool>(const Daemon&)>& are) const {
   std::vector<Daemon> found;
   for (const auto& member : _members) {
-    const auto is = (_daemons.*are)(member);
+    const auto is = are(member);
     if (!is) return is.failure();
     if (*is) found.push_back(member);
   }
@@ -123,21 +123,15 @@ Result<bool> DaemonGroup::isAnyStartingAtBoot() const {
 }
 
 Result<std::vector<Daemon>> DaemonGroup::startingAtBoot() const {
-  return those(&Daemons::startsAtBoot);
+  return those([this](const Daemon& member) { return _daemons.startsAtBoot(member); });
 }
 
 Result<std::vector<Daemon>> DaemonGroup::stayingOffAtBoot() const {
-  return those(&Daemons::staysOffAtBoot);
+  return those([this](const Daemon& member) { return _daemons.staysOffAtBoot(member); });
 }
 
 Result<std::vector<Daemon>> DaemonGroup::ready() const {
-  std::vector<Daemon> found;
-  for (const auto& member : _members) {
-    const auto is = isReady(member);
-    if (!is) return is.failure();
-    if (*is) found.push_back(member);
-  }
-  return found;
+  return those([this](const Daemon& member) { return isReady(member); });
 }
 
 Result<bool> DaemonGroup::isReady(const Daemon& member) const {
@@ -148,7 +142,7 @@ Result<bool> DaemonGroup::isReady(const Daemon& member) const {
 }
 
 Result<bool> DaemonGroup::isChanging() const {
-  const auto changing = those(&Daemons::isChanging);
+  const auto changing = those([this](const Daemon& member) { return _daemons.isChanging(member); });
   if (!changing) return changing.failure();
   return !changing->empty();
 }

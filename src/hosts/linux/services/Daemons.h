@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <string>
 #include <utility>
@@ -101,7 +102,7 @@ class DaemonGroup {
 
  private:
   Result<bool> isReady(const Daemon& member) const;
-  Result<std::vector<Daemon>> those(Result<bool> (Daemons::*are)(const Daemon&)) const;
+  Result<std::vector<Daemon>> those(const std::function<Result<bool>(const Daemon&)>& are) const;
 
   Daemons& _daemons;
   std::shared_ptr<const std::vector<std::string>> _units;  ///< keeps the texts
