@@ -14,6 +14,7 @@
 #include "hosts/linux/firmware/EfiBytes.h"
 #include "hosts/linux/loaders/GrubEnvironment.h"
 #include "hosts/linux/system/CommaList.h"
+#include "hosts/linux/volumes/MountedVolume.h"
 
 namespace tavisk {
 namespace {
@@ -186,9 +187,7 @@ Result<std::string> SystemChoice::pathOf(const DiskName& volume, const std::stri
   for (const auto& mount : mounts->mounts()) {
     const auto top = mount.root == "/" ? "" : mount.root;
     if (!mount.visible || mount.readOnly || !file.starts_with(top + "/")) continue;
-    const auto source = mount.device.major == 0 ? _disks.devices().withNode(mount.source) : device;
-    const bool isNumbered = *device && mount.device == (*device)->number;
-    if (!isNumbered && !(mount.device.major == 0 && source && *source && (*source)->name == volume)) continue;
+    if (!*device || !isMountOf(mount, _disks.devices(), **device).valueOr(false)) continue;
     const auto path = _machine.root.standardized((mount.point == "/" ? "" : mount.point) + file.substr(top.size()));
     if (!path) return path.failure();
     const auto* holding = mounts->holding(*path);
