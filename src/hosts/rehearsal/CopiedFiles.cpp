@@ -49,7 +49,7 @@ Result<std::string> CopiedFiles::copyWayTo(const std::string& path) {
   const auto parts = split(path, "/");
   std::string reached;
   for (const auto& part : parts) {
-    const auto here = reached + "/" + part;
+    const auto here = std::string(reached).append("/").append(part);
     const auto leadsTo = _files.standardized(here);
     if (!leadsTo) return leadsTo.failure();
     auto copied = *leadsTo == here ? Result<void>() : copyLink(here, *leadsTo);
