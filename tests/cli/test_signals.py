@@ -38,6 +38,7 @@ class Ending(Run):
         how = {"stdin": subprocess.PIPE, "stdout": subprocess.PIPE, "environment": {"TAVISK_REPORT": str(self.report)}}
         with self.machine.start(words, **how) as process:
             if words:
+                self.wait_until_it_may_change(process)
                 time.sleep(0.3)  # until the pipe is full: there is no event for it
             else:
                 self.assertEqual(process.stdout.read(len(BANNER)), BANNER)
@@ -51,6 +52,12 @@ class Ending(Run):
             self.assertLess(time.monotonic() - begin, AT_ONCE)
         self.assertEqual(self.machine.read()["Authorization"], {"Authenticated": False, "Deauthentications": 1})
         return status
+
+    def wait_until_it_may_change(self, process):
+        deadline = time.monotonic() + PATIENCE
+        while "Authorization" not in self.machine.read() and process.poll() is None:
+            self.assertLess(time.monotonic(), deadline)
+            time.sleep(0.001)
 
     def test_at_the_prompt_and_in_the_report(self):
         for number in (signal.SIGINT, signal.SIGTERM, signal.SIGHUP):
