@@ -34,8 +34,9 @@ def at_terminal(user, command, password):
     """By a user who is logged in and types a password once it is asked for. What the terminal showed is left in /run/screen."""
     login = f"systemd-run --quiet --pty --wait --collect -p PAMName=login -p User={user} env {command}"
     asked = "timeout 20 sh -c 'until grep -q -s Password /run/screen; do sleep 0.1; done'"
-    return (f"rm -f /run/screen; {{ {asked}; sleep 0.5; echo {password}; sleep 4; }} | "
-            f"script -q -e -f -c '{login}' /run/screen >/run/printed 2>&1; ")
+    ended = "timeout 30 sh -c 'until [ -e /run/ended ]; do sleep 0.1; done'"
+    return (f"rm -f /run/screen /run/ended; {{ {asked}; sleep 0.5; echo {password}; {ended}; }} | "
+            f"script -q -e -f -c '{login}; status=$?; touch /run/ended; exit $status' /run/screen >/run/printed 2>&1; ")
 
 
 CHECKS = [
