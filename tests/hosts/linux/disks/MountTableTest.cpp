@@ -60,6 +60,12 @@ TEST(MountTable, FollowsAPathIntoTheMountThatIsSeen) {
   EXPECT_EQ(pointOf(table.mountOf({8, 6})), "/whole");
 }
 
+#ifdef __SANITIZE_THREAD__
+constexpr std::chrono::seconds inItsStride(15);
+#else
+constexpr std::chrono::seconds inItsStride(3);
+#endif
+
 TEST(MountTable, TakesTenThousandMountsInItsStride) {
   std::string text = "27 1 8:1 / / rw - ext4 /dev/sda1 rw\n";
   for (int id = 100; id < 10100; ++id)
@@ -68,7 +74,7 @@ TEST(MountTable, TakesTenThousandMountsInItsStride) {
   const auto began = std::chrono::steady_clock::now();
   const MountTable table(text);
   EXPECT_EQ(pointOf(table.holding("/Volumes/some/folder/v9000/a")), "/Volumes/some/folder/v9000");
-  EXPECT_LT(std::chrono::steady_clock::now() - began, std::chrono::seconds(3));
+  EXPECT_LT(std::chrono::steady_clock::now() - began, inItsStride);
 }
 
 }  // namespace
