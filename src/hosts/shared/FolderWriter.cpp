@@ -157,7 +157,7 @@ Result<void> FolderWriter::rewrite(const std::string& name, std::string_view con
   if (!file) return retold(file.failure(), "open", _path);
   const auto old = readAll(*file, std::string::npos, _path);
   if (!old) return old.failure();
-  const auto done = overwrite(*file, contents);
+  auto done = overwrite(*file, contents);
   const auto back = done ? Result<void>() : overwrite(*file, *old);
   if (back) return done;
   auto why = done.failure();
