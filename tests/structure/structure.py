@@ -25,6 +25,8 @@ FULLEST_FOLDER = 42
 RULES = [
     ("no library but the standard one here", CORE + r"|src/platform/|src/(base|effects)/.*\.h$", r"#include <[^>]*[./]"),
     ("pugixml is hidden in the XML of PropertyList", r"src/(?!base/PropertyListXml).*\.(cpp|h)$", r"pugi"),
+    ("pugixml is linked without its streams and XPath", r"src/base/PropertyListXml", r"stream|xpath|select_node|\.(load|save)\("),
+    ("the program starts without streams", r"src/", r"#include <(\w*stream(buf)?|iomanip)>"),
     ("the JSON library is hidden in what reads wanted values and logs",
      r"src/(?!control/apply/WantedFile\.cpp|hosts/scratch/ScratchLogs\.cpp)", r"nlohmann"),
     ("every wait goes through RunLoop", r"src/(?!base/RunLoop)", r"#include <sys/(epoll|eventfd|timerfd)\.h>"),
