@@ -10,11 +10,13 @@ namespace tavisk {
 
 void LinuxDiskEventSession::schedule(RunLoop& runLoop) {
   _told = std::make_shared<DiskSnapshot>();
-  // What changes between this and the first report is told after it.
   watchDevices(runLoop);
   watchMounts(runLoop);
+  // Once for the watcher and for the first report: they are told what changes after it.
+  _disks.renew({{}, true});
+  _disks.forgetOld();
   if (_watcher) _watcher->begin(runLoop, [this] { tell({}); });
-  _firstReport = runLoop.after({}, [this] { tell({{}, true}); });
+  _firstReport = runLoop.after({}, [this] { tell({}); });
 }
 
 void LinuxDiskEventSession::watchDevices(RunLoop& runLoop) {
