@@ -9,6 +9,7 @@
 
 #include "base/Calendar.h"
 #include "base/Text.h"
+#include "effects/SettingNames.h"
 
 namespace tavisk::control {
 namespace {
@@ -195,6 +196,11 @@ Result<std::string> valueMeantBy(const ManagedSetting& setting, const WrittenVal
   auto value = meantBy(setting.kind, written, unit);
   if (!value) return Failure{"read", std::string(setting.name), expectation(setting.kind)};
   return std::move(*value);
+}
+
+SettingValue asSet(SettingValue value) {
+  if (value.setting == setting::networkTimeServer) value.live.reset();
+  return value;
 }
 
 bool isSameValue(const ManagedSetting& setting, const std::string& left, const std::string& right) {

@@ -10,6 +10,7 @@
 
 #include "base/Result.h"
 #include "control/ManagedSettings.h"
+#include "effects/Effect.h"
 
 namespace tavisk::control {
 
@@ -22,6 +23,10 @@ using WrittenValue = std::variant<bool, std::int64_t, std::string>;
 /// since 1970. The failure says what is expected.
 Result<std::string> valueMeantBy(const ManagedSetting& setting, const WrittenValue& written,
                                  const std::string& unit = "");
+
+/// What was read of a setting as far as it is what the setting was set to. The time server has nothing in force: a
+/// client may go by another one while that which it is told does not answer.
+SettingValue asSet(SettingValue value);
 
 /// Whether both texts are one value of the setting. Of moments those are that lie at most two seconds apart, as they
 /// pass while they are read; dates and times of day are those of the process's zone.

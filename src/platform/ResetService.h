@@ -2,9 +2,15 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <optional>
 #include <string>
 
+#include "base/Result.h"
+
 namespace tavisk {
+
+/// Why no machine has a place of the tool's own for a setting; absent: it may have one.
+std::optional<Failure> whyNeverOwn(const std::string& setting);
 
 /// Takes away what the tool itself stores of settings, so that what the machine has besides counts again.
 class ResetService {

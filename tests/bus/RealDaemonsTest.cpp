@@ -104,6 +104,15 @@ TEST(TimeSyncDaemon, TellsTheServerInUseWhereNoneIsConfigured) {
   }
 }
 
+TEST(TimeSyncDaemon, TellsHowFarTheClockIsFromItsServer) {
+  BusTree tree;
+  tree.log.wants = tree.log.wantsWhere = true;
+  tree.manager.set("systemd-timesyncd.service", {.active = "active"});
+  EXPECT_TRUE(tree.host().networkTime().isRunning());
+  EXPECT_EQ(tree.log.values.back().facts,
+            Facts({{"source", "fallback.example"}, {"milliseconds ahead of the source", "-1.500"}}));
+}
+
 TEST(ServiceManager, ThatEndedDuringACallIsNotTakenForSilent) {
   ChronyBusTree tree;
   tree.manager.breakNext("ListUnitsByPatterns", FakeServiceManager::Fault::hangUp);

@@ -11,7 +11,7 @@
 #include "control/WordRunner.h"
 #include "effects/EffectMatchers.h"
 #include "hosts/linux/LinuxTree.h"
-#include "hosts/shared/Resets.h"
+#include "platform/ResetService.h"
 
 namespace tavisk::control {
 namespace {

@@ -21,7 +21,9 @@ TEST(UndoPlan, AsksForConsentWhereAValueIsNotTavisksOwn) {
       {"Computer Sleep", "5", "10", "7", UndoStep::leave, UndoStep::set},
       {"Computer Sleep", "5", "10", std::nullopt, UndoStep::leave, UndoStep::set},
       {"Computer Sleep", "5", std::nullopt, "7", UndoStep::set, UndoStep::set},
-      {"Computer Sleep", std::nullopt, "10", "10", UndoStep::impossible, UndoStep::impossible},
+      {"Computer Sleep", std::nullopt, "10", "10", UndoStep::reset, UndoStep::reset},
+      {"Computer Sleep", std::nullopt, "10", "7", UndoStep::leave, UndoStep::reset},
+      {"Computer Name", std::nullopt, "web", "web", UndoStep::impossible, UndoStep::impossible},
       {"Hard Disk Sleep", "10 on sda, 0 on sdb", "10", "10", UndoStep::impossible, UndoStep::impossible},
       {"Restart After Freeze", "on after a kernel panic only", "off", "off", UndoStep::impossible,
        UndoStep::impossible},
@@ -30,7 +32,7 @@ TEST(UndoPlan, AsksForConsentWhereAValueIsNotTavisksOwn) {
       {"Startup Delay", "4", "0", "0", UndoStep::set, UndoStep::set},
       {"Local Subnet Name", "web-2, web in the kernel", "db", "db", UndoStep::impossible, UndoStep::impossible},
       {"Local Subnet Name", "web.example.org", "db", "db", UndoStep::set, UndoStep::set},
-      {"Network Time Server", "", "a.example", "a.example", UndoStep::impossible, UndoStep::impossible},
+      {"Network Time Server", "", "a.example", "a.example", UndoStep::reset, UndoStep::reset},
       {"Computer Name", "", "web", "web", UndoStep::set, UndoStep::set},
       {"Computer Name", "web", "", "host", UndoStep::set, UndoStep::set},
       {"Kernel Architecture", "default", "i386", "i386", UndoStep::set, UndoStep::set},
@@ -43,9 +45,11 @@ TEST(UndoPlan, AsksForConsentWhereAValueIsNotTavisksOwn) {
   };
   for (const auto& [setting, before, after, now, step, forced] : cases) {
     const RecordedChange changes[] = {{"a", 1, setting, before, "earlier"}, {"a", 2, setting, "earlier", after}};
+    const bool isServer = setting == std::string("Network Time Server");  // a client goes by whichever answers
     const std::string unit = setting == std::string("Startup Delay") ? "units of 30 seconds" : "";
     const SettingState states[] = {
-        {{.setting = setting, .live = now, .unit = unit}, {}},
+        {{.setting = setting, .live = isServer ? "pool.example" : now, .stored = isServer ? now : Text(), .unit = unit},
+         {}},
         {{.setting = "Local Subnet Name", .live = "host", .stored = "host"}, {}},
         {{.setting = "Network Time", .live = "on"}, {}},
     };

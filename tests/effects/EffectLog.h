@@ -31,11 +31,13 @@ class EffectLog final : public EffectChannel {
   void record(const Effect& effect) override { effects.push_back(effect); }
   void observe(const SettingValue& value) override { values.push_back(value); }
   bool wantsValues() const override { return wants; }
+  bool wantsPlaces() const override { return wantsWhere; }
 
   std::vector<std::string> begun;  ///< "SETTING ASKED"
   std::vector<Effect> effects;
   std::vector<SettingValue> values;
-  bool wants = false;  ///< what wantsValues() says
+  bool wants = false;       ///< what wantsValues() says
+  bool wantsWhere = false;  ///< what wantsPlaces() says
 };
 
 }  // namespace tavisk

@@ -205,7 +205,10 @@ void useTime(const LinuxMachine& machine) {
   look(time.server());
   time.setServer({"time.example"});
   time.start();
-  for (const auto& daemon : timeDaemons()) look(serverInUse(daemon, machine));
+  for (const auto& daemon : timeDaemons()) {
+    look(serverInUse(daemon, machine));
+    look(sourceInUse(daemon, machine));
+  }
 }
 
 void usePower(const LinuxMachine& machine) {

@@ -105,6 +105,7 @@ class Bench(container.Container):
         for group in SETS + SWITCHES:
             self._compare(group, max(runs // 10, 10))
         self._compare_all_getters(runs // 5)
+        self._measure_status(runs // 5)
         self._measure_memory()
         self._measure_prompt()
         self._measure_volumes()
@@ -140,6 +141,11 @@ class Bench(container.Container):
         for peer, name, most in ((sum(peers), f"{len(PEERS)} peers", 0.1), (true, TRUE, 6)):
             self._rows.append(Row("21 getters in one run", milliseconds(took), f"`{name}` {milliseconds(peer)}",
                                   f"{took / peer:.2f} of at most {most:g} times", took <= most * peer))
+
+    def _measure_status(self, runs):
+        most = 20_000
+        ((took, _),) = self._race(["taviskctl status"], runs)
+        self._rows.append(Row("`taviskctl status`", milliseconds(took), "", f"at most {milliseconds(most)}", took <= most))
 
     def _measure_memory(self):
         for words, most in (("tavisk -gettimezone", 4), ("tavisk -getremotelogin", 8)):

@@ -178,13 +178,15 @@ AppliedSetting Applier::reset(const ManagedSetting& setting) {
 
 /// What a searched setting's getter asks in the end is asked without a search: it keeps the answer for the whole run.
 SettingState Applier::stateOf(const ManagedSetting& setting) {
-  const auto states = _reader.read({&setting}, [this](const ManagedSetting& asked) {
+  auto states = _reader.read({&setting}, [this](const ManagedSetting& asked) {
     if (asked.isSearched)
       static_cast<void>(_host.diskManagement().bootPreference());
     else
       static_cast<void>(_runner.run(std::vector{std::string(asked.getter)}));
   });
-  return states.front();
+  auto& state = states.front();
+  state.value = asSet(std::move(state.value));
+  return std::move(state);
 }
 
 std::vector<SettingState> Applier::statesOf(const Step& step) {

@@ -102,11 +102,13 @@ Status rehearseChanges(const Invocation& invocation, const Tools& tools) {
   RehearsalNotes notes;
   RunLoop runLoop;
   effects.addChannel(failures);
+  std::optional<ProgressLine> progress(std::in_place, tools.showProgress, "Copying the machine ...");
   const auto host = tools.openRehearsal(folder->path(), invocation.has(keep), effects, runLoop);
   if (!host) return endBy(host.failure(), Status::incomplete, tools);
   WordRunner runner(**host, effects, runLoop);
   if (const auto started = runner.start(); !started) return endBy(started.failure(), Status::incomplete, tools);
   if (invocation.has(keep)) searchStartupDisks(runner);
+  progress.reset();
   effects.removeChannel(failures);
   effects.addChannel(reader);
   effects.addChannel(notes);

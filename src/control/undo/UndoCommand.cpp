@@ -34,6 +34,10 @@ std::vector<WantedSetting> wantedOf(std::span<const UndoResult> results) {
   return wanted;
 }
 
+bool isToDo(const UndoResult& result) {
+  return result.planned.step == UndoStep::set || result.planned.step == UndoStep::reset;
+}
+
 /// A machine, and what takes back changes on it.
 class Undoing final {
  public:
@@ -58,11 +62,12 @@ class Undoing final {
 
   /// The failure says why nothing was done.
   Result<void> carryOut(std::vector<UndoResult>& results) {
-    const auto steps = stepsFor(wantedOf(results));
-    if (steps.empty()) return {};
+    if (std::ranges::none_of(results, isToDo)) return {};
     if (auto started = _runner.start(); !started) return started;
     Applier applier(_host, _runner, _reader);
-    for (const auto& step : steps) take(results, step, applier);
+    for (const auto& step : stepsFor(wantedOf(results))) take(results, step, applier);
+    for (auto& result : results)
+      if (result.planned.step == UndoStep::reset) reset(result, applier);
     return {};
   }
 
@@ -74,6 +79,19 @@ class Undoing final {
     result->outcome = applier.apply(step).front();
   }
 
+  /// What others keep of the setting comes to light.
+  void reset(UndoResult& result, Applier& applier) {
+    const auto& planned = result.planned;
+    const ProgressLine progress(_tools.showProgress, planned.setting + " ...");
+    auto outcome = applier.reset(*planned.managed);
+    const auto back = planned.back.value_or("");
+    if (outcome.verdict <= Verdict::applied && outcome.after.value_or("") != back) {
+      outcome.verdict = Verdict::failed;
+      outcome.reason = describe({"read back", planned.setting, "reads " + *outcome.after});
+    }
+    result.outcome = std::move(outcome);
+  }
+
   const Tools& _tools;
   Host& _host;
   RunLoop& _runLoop;
@@ -83,7 +101,7 @@ class Undoing final {
 
 bool isWhole(const UndoResult& result) {
   if (result.outcome) return result.outcome->verdict <= Verdict::applied && result.outcome->lasts;
-  return result.planned.step == UndoStep::set || result.planned.step == UndoStep::there;
+  return isToDo(result) || result.planned.step == UndoStep::there;
 }
 
 Status undo(const RecordedChanges& recorded, Since since, Undoing& undoing, const Invocation& invocation,

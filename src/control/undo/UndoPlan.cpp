@@ -10,6 +10,7 @@
 #include "base/DnsName.h"
 #include "control/SettingValues.h"
 #include "effects/SettingNames.h"
+#include "platform/ResetService.h"
 
 namespace tavisk::control {
 namespace {
@@ -77,17 +78,30 @@ std::string whyNoWordGives(const ManagedSetting& setting, const std::string& val
   return meant && *meant == value && isName ? "" : "no word of tavisk gives it that value";
 }
 
+/// The same of the value from before.
+std::string whyNotSet(const ManagedSetting& setting, const RecordedChange& change, const std::string& unit) {
+  if (change.before) return whyNoWordGives(setting, *change.before, unit);
+  return change.isEnded ? "there was no value before, or it is not known"
+                        : "a run that was ended in the middle did not tell what it was before";
+}
+
+bool hadNone(const RecordedChange& change) {
+  return change.isEnded && change.before.value_or("").empty();
+}
+
 /// With what was read of it now.
 PlannedUndo planned(const RecordedChange& change, const SettingState* state) {
   PlannedUndo planned{.setting = change.setting, .back = change.before};
   if (!state) return planned;
-  planned.now = state->value.live ? state->value.live : state->value.stored;
-  planned.unit = state->value.unit;
+  const auto value = asSet(state->value);
+  planned.now = value.live ? value.live : value.stored;
+  planned.unit = value.unit;
   return planned;
 }
 
 /// Also after a restart, as far as anybody knows.
-bool isThere(const PlannedUndo& planned, const SettingValue& value) {
+bool isThere(const PlannedUndo& planned, const SettingValue& read) {
+  const auto value = asSet(read);
   return planned.now == planned.back && (!value.live || !value.stored || value.live == value.stored);
 }
 
@@ -126,16 +140,16 @@ PlannedUndo planManaged(const ManagedSetting& setting, const RecordedChange& cha
   auto plan = planned(change, &state);
   if (isDefaultName(plan, states)) plan.now = "";
   if (state.value.unsupported) return impossible(plan, "not supported: " + describe(*state.value.unsupported));
-  if (!change.before)
-    return impossible(plan, change.isEnded ? "there was no value before, or it is not known"
-                                           : "a run that was ended in the middle did not tell what it was before");
-  if (auto why = whyNoWordGives(setting, *change.before, plan.unit); !why.empty()) return impossible(plan, why);
+  const auto whyNot = whyNotSet(setting, change, plan.unit);
+  const bool isReset = !whyNot.empty() && hadNone(change) && !whyNeverOwn(change.setting);
+  if (!whyNot.empty() && !isReset) return impossible(plan, whyNot);
   if (isThere(plan, state.value)) {
     plan.step = UndoStep::there;
     return plan;
   }
   plan.why = whyLeft(plan, change, state, consent);
-  plan.step = plan.why.empty() ? UndoStep::set : UndoStep::leave;
+  const auto way = isReset ? UndoStep::reset : UndoStep::set;
+  plan.step = plan.why.empty() ? way : UndoStep::leave;
   plan.managed = &setting;
   return plan;
 }
@@ -147,12 +161,17 @@ std::optional<std::string> switchOf(const std::optional<std::string>& value) {
   return value;
 }
 
-/// Absent when the word that is run anyway gives it its value.
+/// Whether what becomes of the main setting gives the other its value too: what is reset goes off.
+bool goesAlong(const PlannedUndo& main, const RecordedChange& companion) {
+  if (main.step != UndoStep::set && main.step != UndoStep::reset) return false;
+  return companion.before && switchOf(companion.before) == (main.step == UndoStep::reset ? "off" : main.back);
+}
+
+/// Absent when what is done anyway gives it its value.
 std::optional<PlannedUndo> planCompanion(const Companion& companion, const RecordedChange& change,
                                          std::span<const PlannedUndo> plan, std::span<const SettingState> states) {
   const auto main = std::ranges::find(plan, companion.main, &PlannedUndo::setting);
-  if (main != plan.end() && main->step == UndoStep::set && change.before && switchOf(change.before) == main->back)
-    return std::nullopt;
+  if (main != plan.end() && goesAlong(*main, change)) return std::nullopt;
   auto own = planned(change, stateOf(states, companion.name));
   const auto* mainState = stateOf(states, companion.main);
   if (!own.now && mainState) own.now = mainState->value.stored;
@@ -169,6 +188,8 @@ const char* nameOf(UndoStep step) {
   switch (step) {
     case UndoStep::set:
       return "set";
+    case UndoStep::reset:
+      return "reset";
     case UndoStep::there:
       return "there already";
     case UndoStep::leave:

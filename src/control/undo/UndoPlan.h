@@ -17,12 +17,13 @@ namespace tavisk::control {
 /// What is to become of a setting that was changed.
 enum class UndoStep {
   set,        ///< it gets the value from before
+  reset,      ///< it had none before: what the tool keeps of it is taken away
   there,      ///< it has that value
   leave,      ///< it waits for consent
   impossible  ///< it cannot be taken back
 };
 
-/// "set", "there already", "left alone", "not possible".
+/// "set", "reset", "there already", "left alone", "not possible".
 const char* nameOf(UndoStep step);
 
 /// A setting that was changed, and the value that it had before.
@@ -33,7 +34,7 @@ struct PlannedUndo {
   std::optional<std::string> back = {};     ///< absent: there was none, or it is not known
   std::string unit = {};                    ///< of both; see SettingValue
   std::string why = {};                     ///< why it is left alone or cannot be taken back
-  const ManagedSetting* managed = nullptr;  ///< of what is to be set
+  const ManagedSetting* managed = nullptr;  ///< of what is to be set or reset
 };
 
 /// What is taken back only when it is asked for.

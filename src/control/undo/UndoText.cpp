@@ -18,6 +18,7 @@ namespace {
 
 /// What has not come to be, and why.
 std::string remarkOn(const PlannedUndo& planned, bool isRun) {
+  if (planned.step == UndoStep::reset) return isRun ? "" : "reset: what tavisk keeps of it is taken away";
   if (isRun || planned.step == UndoStep::set) return escaped(planned.why);
   return nameOf(planned.step) + (planned.why.empty() ? "" : ": " + escaped(planned.why));
 }

@@ -16,9 +16,6 @@
 
 namespace tavisk {
 
-/// Why no machine has a place of the tool's own for a setting; absent: it may have one.
-std::optional<Failure> whyNeverOwn(const std::string& setting);
-
 /// The resets of a host, each by the service that stores the setting.
 class Resets final : public ResetService {
  public:

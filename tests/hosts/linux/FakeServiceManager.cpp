@@ -135,6 +135,12 @@ int FakeServiceManager::answerProperty(sd_bus_message* message) {
   firstText(message);
   const auto name = firstText(message);
   if (name == "ServerName") return sd_bus_reply_method_return(message, "v", "s", "fallback.example");
+  // 1 ms each way, and 1 ms between: the clock is 1.5 ms behind.
+  if (name == "NTPMessage")
+    return sd_bus_reply_method_return(message, "v", "(uuuuittayttttbtt)", 0U, 4U, 4U, 1U, -20, std::uint64_t{0},
+                                      std::uint64_t{0}, 4, 192, 0, 2, 7, std::uint64_t{1'000'000},
+                                      std::uint64_t{1'002'500}, std::uint64_t{1'003'500}, std::uint64_t{1'003'000}, 0,
+                                      std::uint64_t{7}, std::uint64_t{0});
   if (name == "SystemNTPServers") return sd_bus_reply_method_return(message, "v", "as", 1, "time.example");
   if (name == "ConditionResult") return sd_bus_reply_method_return(message, "v", "b", state.conditionHolds ? 1 : 0);
   return sd_bus_reply_method_return(message, "v", "a(sbbsi)", 2, "ConditionCapability", 0, 0, "CAP_SYS_TIME", 1,

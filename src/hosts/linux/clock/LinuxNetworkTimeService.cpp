@@ -6,7 +6,7 @@
 
 #include "base/DnsName.h"
 #include "effects/SettingNames.h"
-#include "hosts/linux/clock/SystemClock.h"
+#include "hosts/linux/clock/NetworkTimeFacts.h"
 #include "hosts/linux/system/CommaList.h"
 #include "hosts/linux/system/ConfigurationLines.h"
 #include "hosts/linux/system/OwnFiles.h"
@@ -33,15 +33,6 @@ Failure noClient() {
 /// Empty where there is no client.
 std::string unitOf(const Result<const TimeDaemon*>& client) {
   return client && *client ? (*client)->daemon.unit : "";
-}
-
-/// The kernel's own account, which every client keeps.
-Facts clockFacts() {
-  const auto discipline = clockDiscipline();
-  if (!discipline) return {{"synchronized", "not known: " + describe(discipline.failure())}};
-  if (!*discipline) return {{"synchronized", "no"}};
-  const auto milliseconds = std::chrono::ceil<std::chrono::milliseconds>((*discipline)->largestError);
-  return {{"synchronized", "yes"}, {"milliseconds off at most", std::to_string(milliseconds.count())}};
 }
 
 }  // namespace
@@ -112,11 +103,12 @@ Setting<bool> LinuxNetworkTimeService::runningSetting() {
 
 bool LinuxNetworkTimeService::isRunning() {
   const auto found = client();
+  const auto running = runs(found);
   auto setting = runningSetting();
-  setting.live = [&] { return runs(found); };
+  setting.live = [&] { return running; };
   setting.stored = [&] { return startsAtBoot(found); };
   if (_machine.effects.wantsPlaces()) setting.where = unitOf(found);
-  if (_machine.root.prefix() == "/") setting.facts = clockFacts;
+  setting.facts = [&] { return networkTimeFacts(running && *running ? *found : nullptr, _machine); };
   return observe(setting, _machine.effects).value_or(false);
 }
 

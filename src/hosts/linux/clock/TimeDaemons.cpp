@@ -3,7 +3,10 @@
 #include "hosts/linux/clock/TimeDaemons.h"
 
 #include <algorithm>
+#include <cmath>
+#include <cstdint>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "base/Text.h"
@@ -22,6 +25,8 @@ constexpr const char* openntpdConfig = "/etc/openntpd/ntpd.conf";
 constexpr const char* chronyReload[] = {"/usr/bin/chronyc", "reload", "sources"};
 constexpr const char* chronySources[] = {"/usr/bin/chronyc", "-N", "-c", "sources", "-a"};
 constexpr std::string_view commentSigns = "#%;!";
+constexpr const char* exchangeTypes = "uuuuittayttttbtt";
+constexpr const char* exchangeSignature = "(uuuuittayttttbtt)";
 
 using Directives = std::vector<std::vector<std::string>>;
 using Servers = Result<TimeServers>;
@@ -222,11 +227,35 @@ Result<bool> printsItsServer(const TimeDaemon& daemon, const LinuxMachine& machi
   return std::ranges::all_of(*own, isKnown);
 }
 
-Result<std::string> printedServerInUse(const TimeDaemon& daemon, const LinuxMachine& machine) {
+std::optional<std::chrono::microseconds> asSpan(std::string_view seconds) {
+  constexpr double longest = 1e9;  // more than any clock is off; and it stays a number of microseconds
+  const auto number = parseReal(seconds);
+  if (!number || !(std::abs(*number) < longest)) return std::nullopt;
+  return std::chrono::round<std::chrono::microseconds>(std::chrono::duration<double>(*number));
+}
+
+Result<TimeSource> printedSourceInUse(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  constexpr std::size_t ahead = 7;
   const auto sources = printedSources(daemon, machine);
   if (!sources) return sources.failure();
   const auto used = std::ranges::find_if(*sources, [](const Fields& fields) { return fields[1] == "*"; });
-  return used == sources->end() ? std::string() : (*used)[2];
+  if (used == sources->end()) return TimeSource();
+  return TimeSource{(*used)[2], used->size() > ahead ? asSpan((*used)[ahead]) : std::nullopt};
+}
+
+/// By the times of a question and its answer: sent, received, answered, back (org.freedesktop.timesync1(5),
+/// NTPMessage; RFC 5905, section 8). Absent while there is none.
+std::optional<std::chrono::microseconds> aheadAt(BusMessage exchange) {
+  if (!exchange.enter('r', exchangeTypes)) return std::nullopt;
+  exchange.skip("uuuuittay");
+  const auto sent = exchange.readUint64();
+  const auto received = exchange.readUint64();
+  const auto answered = exchange.readUint64();
+  const auto back = exchange.readUint64();
+  exchange.skip("b");
+  const auto answers = exchange.readUint64();
+  const auto twiceAhead = static_cast<std::int64_t>((sent - received) + (back - answered));
+  return answers == 0 || exchange.error() ? std::nullopt : std::optional(std::chrono::microseconds(twiceAhead / 2));
 }
 
 Result<bool> hasStartedSince(const TimeDaemon& daemon, const LinuxMachine& machine) {
@@ -252,7 +281,10 @@ Result<bool> hasReadServers(const TimeDaemon& daemon, const LinuxMachine& machin
 }
 
 Result<std::string> serverInUse(const TimeDaemon& daemon, const LinuxMachine& machine) {
-  if (!daemon.sources.empty()) return printedServerInUse(daemon, machine);
+  if (!daemon.sources.empty()) {
+    auto source = printedSourceInUse(daemon, machine);
+    return source ? Result<std::string>(std::move(source).value().server) : source.failure();
+  }
   if (!daemon.busService) return std::string();
   const auto bus = systemBusIfAny(machine.services);
   if (!bus) return bus.failure();
@@ -261,6 +293,18 @@ Result<std::string> serverInUse(const TimeDaemon& daemon, const LinuxMachine& ma
   if (name) return std::move(name).value().readText();
   if (name.failure().code == BusErrorCode::serviceUnknown) return std::string();
   return name.failure();
+}
+
+Result<TimeSource> sourceInUse(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  if (!daemon.sources.empty()) return printedSourceInUse(daemon, machine);
+  auto server = serverInUse(daemon, machine);
+  if (!server) return server.failure();
+  if (server->empty()) return TimeSource();
+  const auto bus = machine.services.systemBus();
+  if (!bus) return bus.failure();
+  auto exchange = (*bus)->property(timeSyncManager(daemon.busService), "NTPMessage", exchangeSignature);
+  if (!exchange) return exchange.failure();
+  return TimeSource{std::move(server).value(), aheadAt(std::move(exchange).value())};
 }
 
 }  // namespace tavisk

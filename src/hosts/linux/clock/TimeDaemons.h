@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
+#include <optional>
 #include <span>
 #include <string>
 #include <vector>
@@ -35,7 +37,8 @@ struct TimeDaemon {
   /// Where it tells its servers, and the one that it uses (org.freedesktop.timesync1(5)); null: nowhere.
   const char* busService = nullptr;
   /// The program, with its arguments, that prints a line of comma-separated fields for each server: the second is "*"
-  /// for the one that it uses, the third the name as it was configured (chronyc(1)).
+  /// for the one that it uses, the third the name as it was configured, the eighth the seconds by which the clock is
+  /// ahead of it, by the last answer and what has been corrected since (chronyc(1)).
   std::span<const char* const> sources = {};
   /// The file that it writes each time it starts, before it reads its configuration; null: none.
   const char* startFile = nullptr;
@@ -48,6 +51,13 @@ Result<bool> hasReadServers(const TimeDaemon& daemon, const LinuxMachine& machin
 /// The server that a running daemon uses at the moment: empty when it has found none yet, or does not tell. ntpsec and
 /// openntpd are not asked.
 Result<std::string> serverInUse(const TimeDaemon& daemon, const LinuxMachine& machine);
+
+/// Where a running daemon has the time from.
+struct TimeSource {
+  std::string server;                              ///< as serverInUse() tells it
+  std::optional<std::chrono::microseconds> ahead;  ///< what the clock was at its last answer; absent: nobody tells
+};
+Result<TimeSource> sourceInUse(const TimeDaemon& daemon, const LinuxMachine& machine);
 
 /// The daemons that this host knows, the preferred one first.
 std::span<const TimeDaemon> timeDaemons();

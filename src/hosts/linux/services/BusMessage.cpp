@@ -118,4 +118,8 @@ void BusMessage::exit() {
   note(_library->sd_bus_message_exit_container(_message));
 }
 
+void BusMessage::skip(const char* types) {
+  note(_library->sd_bus_message_skip(_message, types));
+}
+
 }  // namespace tavisk

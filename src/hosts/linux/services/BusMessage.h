@@ -50,6 +50,8 @@ class BusMessage {
   /// False when there is no such value here, or a surrounding array is at its end.
   bool enter(char type, const char* contents);
   void exit();
+  /// Passes values of these types over.
+  void skip(const char* types);
 
  private:
   void append(char type, const void* value);

@@ -35,7 +35,8 @@ namespace tavisk {
   use(sd_bus_message_has_signature);   \
   use(sd_bus_message_read_basic);      \
   use(sd_bus_message_enter_container); \
-  use(sd_bus_message_exit_container)
+  use(sd_bus_message_exit_container);  \
+  use(sd_bus_message_skip)
 
 /// The functions of libsystemd, by their own names.
 struct SystemdLibrary {

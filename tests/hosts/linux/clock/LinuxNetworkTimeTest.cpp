@@ -91,13 +91,28 @@ TEST_F(ChronyTest, TellsWhatTheNextStartOfTheMachineWouldChange) {
   }
 }
 
-TEST_F(ChronyTest, TellsTheServerThatItUses) {
+TEST_F(ChronyTest, TellsTheServerThatItUsesAndHowFarTheClockIsFromIt) {
   client.setServer({"time.example"});
   client.start();
-  tree.write("/known", "^,?,time.example,0\n^,*,used.example,2\n");
-  tree.log.wants = true;
+  tree.write("/known",
+             "^,?,time.example,0,6,0,4294967295,0.0,0.0,0.0\n^,*,used.example,2,6,377,20,-0.0012349,0.5,0.03\n");
+  tree.log.wants = tree.log.wantsWhere = true;
   EXPECT_EQ(client.server().address, "time.example");
   EXPECT_EQ(tree.log.values.back().live, "used.example");
+  EXPECT_TRUE(client.isRunning());
+  EXPECT_EQ(tree.log.values.back().facts,
+            Facts({{"source", "used.example"}, {"milliseconds ahead of the source", "-1.235"}}));
+  for (const auto* line : {"^,*,used.example,2\n", "^,*,used.example,2,6,377,20,nan,0.5,0.03\n"}) {
+    tree.write("/known", line);
+    EXPECT_TRUE(client.isRunning());
+    EXPECT_EQ(tree.log.values.back().facts, Facts({{"source", "used.example"}})) << line;
+  }
+  tree.write("/known", "^,?,time.example,0,6,0,4294967295,0.0,0.0,0.0\n");
+  EXPECT_TRUE(client.isRunning());
+  EXPECT_EQ(tree.log.values.back().facts, Facts()) << "it has found none yet";
+  std::filesystem::remove(tree.at("/known"));
+  EXPECT_TRUE(client.isRunning());
+  EXPECT_THAT(tree.log.values.back().facts.at(0).second, testing::StartsWith("not known: "));
 }
 
 TEST(LinuxNetworkTime, HasNotChangedWhileTheClientStartsOrStops) {
