@@ -95,4 +95,29 @@ def where_it_runs(daemon):
     ]
 
 
-CHECKS = [check for daemon in WITHOUT_CLOCK for check in where_it_may_not_run(daemon) + where_it_runs(daemon)]
+# A daemon of our own that keeps no clock, and answers others.
+LOCAL_SERVER = """printf '%s\\n' 'local stratum 5' 'port 11123' 'bindaddress 127.0.0.1' 'allow 127.0.0.1' 'cmdport 0' 'bindcmdaddress /' \\
+  'pidfile /run/local.pid' 'driftfile /run/local.drift' >/run/local.conf
+chronyd -x -u root -f /run/local.conf
+echo 'server 127.0.0.1 port 11123 iburst minpoll 0 maxpoll 0' >/etc/chrony/sources.d/local.sources
+chronyc reload sources >/dev/null
+timeout 30 sh -c 'until chronyc -c sources | grep -q "^^,[*]"; do sleep 0.2; done'
+"""
+WITHOUT_IT = f"""kill $(cat /run/local.pid); rm /etc/chrony/sources.d/local.sources
+tavisk -setnetworktimeserver {SERVER} >/dev/null; chronyc reload sources >/dev/null
+"""
+OTHER = "192.0.2.98"
+FROM_ANOTHER = Check(
+    "a server that does not answer is set while another is in use, which is told", needs=frozenset({"container", "chrony"}),
+    do=LOCAL_SERVER + "taviskctl status networktime | grep source; "
+       f"taviskctl apply -setnetworktimeserver {OTHER}; taviskctl apply -setnetworktimeserver {OTHER} | sed 1d; "
+       "journalctl --sync; taviskctl undo --run; " + WITHOUT_IT,
+    prints=re.compile(r"  source: 127.0.0.1\n  milliseconds ahead of the source: -?0\.\d\d\d\n"
+                      r"Setting +Was +Is +Outcome\n"
+                      rf"Network Time Server +{SERVER} +{OTHER} +applied\n(  .*\n)*"
+                      rf"Network Time Server +{OTHER} +{OTHER} +unchanged\n(  .*\n)*"
+                      r"Setting +Was +Back to +Outcome\n"
+                      rf"Network Time Server +{OTHER} +{SERVER} +applied\n(  .*\n)*"))
+
+
+CHECKS = [check for daemon in WITHOUT_CLOCK for check in where_it_may_not_run(daemon) + where_it_runs(daemon)] + [FROM_ANOTHER]
