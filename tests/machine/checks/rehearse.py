@@ -37,6 +37,8 @@ AT_ONCE = {CONTAINER: 19, SERVER: 6}  # a check has its time
 # Texts, flags and outcomes in their order; then the status.
 COMPARE = """told() { grep -o -e '"failed":[a-z]*' -e '{"setting":"[^"]*","outcome":"[^"]*"' -e '"output":"[^"]*"' "$1"; }
 while IFS= read -r words; do
+  # A client that the last one restarts goes on with that.
+  timeout 5 sh -c 'while systemctl list-jobs --no-legend | grep -q .; do sleep 0.05; done'
   eval "taviskctl rehearse --json $words" >/run/foretold 2>&1 </dev/null
   rm -f /run/report; systemctl reset-failed  # no daemon is started too often
   eval "TAVISK_REPORT=/run/report tavisk -f $words" >/dev/null 2>&1 </dev/null; status=$?
