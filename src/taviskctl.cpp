@@ -21,17 +21,19 @@ namespace {
 
 using control::Status;
 
-void complainOfControl(std::string_view text) {
-  static_cast<void>(std::fprintf(stderr, "taviskctl: %.*s\n", static_cast<int>(text.size()), text.data()));
-}
+std::atomic<std::size_t> shownProgress = 0;
 
 /// Over the line that stands there, without a newline. Also a terminal that knows no commands goes back to its margin.
 void showProgress(std::string_view text) {
-  static std::atomic<std::size_t> shown = 0;
-  const auto width = shown.exchange(text.size());
+  const auto width = shownProgress.exchange(text.size());
   const auto rest = static_cast<int>(std::max(width, text.size()) - text.size());
   static_cast<void>(std::fprintf(stderr, "\r%.*s%*s%s", static_cast<int>(text.size()), text.data(), rest, "",
                                  text.empty() ? "\r" : ""));
+}
+
+void complainOfControl(std::string_view text) {
+  if (shownProgress != 0) showProgress("");
+  static_cast<void>(std::fprintf(stderr, "taviskctl: %.*s\n", static_cast<int>(text.size()), text.data()));
 }
 
 /// Who closes the pipe early has seen enough, and is not told.

@@ -32,6 +32,8 @@ struct Effect {
   /// Whether the machine differs from before, live or stored, whatever the outcome: half of a change that failed is
   /// one. True too where that could not be seen.
   bool changed = false;
+  /// False: what was there before could not be read, or nobody has looked. Tells that from a setting without a value.
+  bool isBeforeKnown = true;
 
   bool operator==(const Effect&) const = default;
 };

@@ -19,7 +19,8 @@ Effect unfinishedChange(const std::string& setting, const std::string& asked, co
           .asked = asked,
           .note = "it may be made, or a part of it",
           .failure = Failure{"change", setting, why},
-          .changed = true};
+          .changed = true,
+          .isBeforeKnown = false};
 }
 
 void EffectSink::addChannel(EffectChannel& channel) {

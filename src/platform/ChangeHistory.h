@@ -19,6 +19,8 @@ struct RecordedChange {
   std::optional<std::string> before;  ///< the live value before, else the stored one; absent: none, or not known
   std::optional<std::string> after;   ///< the same of after
   bool isEnded = true;                ///< false: a change was begun, and what became of it is not told
+  bool isBeforeKnown = true;          ///< tells the one from the other where it is absent
+  bool isAfterKnown = true;           ///< the same
 
   bool operator==(const RecordedChange&) const = default;
 };

@@ -23,7 +23,8 @@ _EFFECTS = jsonschema.Draft202012Validator({"$defs": SCHEMA["$defs"], "$ref": "#
 # What an effect has in an effects.log besides.
 _RECORD = jsonschema.Draft202012Validator({
     "required": ["changed", "run", "time"], "additionalProperties": False,
-    "properties": {"changed": {"type": "boolean"}, "run": {"type": "string", "minLength": 1}, "time": {"type": "integer"}}})
+    "properties": {"changed": {"type": "boolean"}, "run": {"type": "string", "minLength": 1}, "time": {"type": "integer"},
+                   "beforeUnknown": {"const": True}}})
 
 
 def _wrong(validator, found):
@@ -45,7 +46,7 @@ def faults(text):
 
 def faults_of_effects(effects):
     """What is wrong with the objects of an effects.log."""
-    record = lambda effect: {name: effect[name] for name in ("changed", "run", "time") if name in effect}
+    record = lambda effect: {name: effect[name] for name in _RECORD.schema["properties"] if name in effect}
     return [fault for effect in effects for fault in _wrong(_RECORD, record(effect)) +
             _wrong(_EFFECTS, {name: effect[name] for name in effect if name not in record(effect)})]
 

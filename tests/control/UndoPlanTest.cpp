@@ -9,6 +9,24 @@ namespace {
 
 using Text = std::optional<std::string>;
 
+TEST(UndoPlan, GoesByWhatIsKnown) {
+  const char* name = "Computer Sleep";
+  const SettingState at7[] = {{{.setting = name, .live = "7", .stored = "7"}, {}}};
+  const SettingState unread[] = {{{.setting = name}, {{"read", name, "down"}}}};
+  const RecordedChange cut{"a", 1, name, std::nullopt, std::nullopt, false, false, false};
+  const RecordedChange whole{"a", 2, name, "5", "7"};
+  const RecordedChange cleared{"a", 2, name, "5", std::nullopt};
+  const auto stepOf = [](std::vector<RecordedChange> changes, std::span<const SettingState> states) {
+    return planUndo(changes, states, {}).front().step;
+  };
+  EXPECT_EQ(stepOf({cut}, at7), UndoStep::impossible);
+  EXPECT_EQ(stepOf({cut, whole}, at7), UndoStep::impossible) << "what it was before the first is what counts";
+  EXPECT_EQ(stepOf({whole, cut}, at7), UndoStep::set) << "what it was left at is not told";
+  EXPECT_EQ(stepOf({cleared}, at7), UndoStep::leave) << "somebody has set it since";
+  EXPECT_EQ(stepOf({{"a", 2, name, "5", "5"}}, at7), UndoStep::leave);
+  EXPECT_EQ(stepOf({{"a", 2, name, std::nullopt, "7"}}, unread), UndoStep::leave) << "it may have none already";
+}
+
 TEST(UndoPlan, AsksForConsentWhereAValueIsNotTavisksOwn) {
   struct Case {
     const char* setting;
@@ -20,7 +38,7 @@ TEST(UndoPlan, AsksForConsentWhereAValueIsNotTavisksOwn) {
       {"Computer Sleep", "5", "10", "5", UndoStep::there, UndoStep::there},
       {"Computer Sleep", "5", "10", "7", UndoStep::leave, UndoStep::set},
       {"Computer Sleep", "5", "10", std::nullopt, UndoStep::leave, UndoStep::set},
-      {"Computer Sleep", "5", std::nullopt, "7", UndoStep::set, UndoStep::set},
+      {"Computer Sleep", "5", std::nullopt, "7", UndoStep::leave, UndoStep::set},
       {"Computer Sleep", std::nullopt, "10", "10", UndoStep::reset, UndoStep::reset},
       {"Computer Sleep", std::nullopt, "10", "7", UndoStep::leave, UndoStep::reset},
       {"Computer Name", std::nullopt, "web", "web", UndoStep::impossible, UndoStep::impossible},

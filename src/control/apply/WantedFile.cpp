@@ -13,6 +13,7 @@
 
 #include "base/FileDescriptor.h"
 #include "control/SettingValues.h"
+#include "effects/SettingNames.h"
 
 namespace tavisk::control {
 namespace {
@@ -84,18 +85,19 @@ bool isNameWithin(const Json& live, const Json& stored) {
   return live.is_string() && stored.is_string() && stored.get<std::string>().starts_with(live.get<std::string>() + ".");
 }
 
-/// Of a reading, what is in force, else what is stored.
-const Json* valueIn(const Json& member) {
+/// Of a reading, what is in force, else what is stored; see asSet().
+const Json* valueIn(const ManagedSetting& setting, const Json& member) {
   if (!member.is_object()) return &member;
   const auto* live = memberOf(member, "live");
   const auto* stored = memberOf(member, "stored");
+  if (setting.name == setting::networkTimeServer) return stored;
   return live && !(stored && isNameWithin(*live, *stored)) ? live : stored;
 }
 
 /// Both are there, and only one of them can be wanted.
-bool isTwofold(const Json& member) {
+bool isTwofold(const ManagedSetting& setting, const Json& member) {
   const auto* stored = member.is_object() ? memberOf(member, "stored") : nullptr;
-  return stored && *valueIn(member) != *stored;
+  return stored && *valueIn(setting, member) != *stored;
 }
 
 std::string unitOf(const Json& member) {
@@ -104,11 +106,11 @@ std::string unitOf(const Json& member) {
 }
 
 bool isLeftOut(const ManagedSetting* setting, const Json& member) {
-  return isReading(member) && (!setting || setting->kind == ValueKind::moment || !valueIn(member));
+  return isReading(member) && (!setting || setting->kind == ValueKind::moment || !valueIn(*setting, member));
 }
 
 Result<WantedSetting> wantedBy(const ManagedSetting& setting, const Json& member) {
-  const auto* value = valueIn(member);
+  const auto* value = valueIn(setting, member);
   const auto written = value ? writtenValue(*value) : std::nullopt;
   // What is no value at all is told in the words for the wrong one.
   auto meant = valueMeantBy(setting, written.value_or(std::string(1, '\0')), unitOf(member));
@@ -141,7 +143,7 @@ Result<std::vector<WantedSetting>> wantedIn(std::string_view text, const std::st
     if (!setting) return Failure{readWanted, name, "there is no setting " + key};
     if (std::ranges::find(wanted, setting, &WantedSetting::setting) != wanted.end())
       return Failure{readWanted, name, std::string(setting->name) + " stands there twice"};
-    if (isTwofold(member))
+    if (isTwofold(*setting, member))
       return Failure{readWanted, name, key + ": live and stored differ; leave out what is not wanted"};
     auto found = wantedBy(*setting, member);
     if (!found) return Failure{readWanted, name, key + ": " + found.failure().why};

@@ -22,9 +22,9 @@ Settings managed(bool withSearched) {
 
 /// Without names all of them, but those that are searched for.
 Result<Settings> chosenSettings(const std::vector<std::string>& names, bool areAllWanted) {
-  auto chosen = settingsMeantBy(names);
-  if (!chosen) return chosen;
-  return names.empty() || areAllWanted ? managed(areAllWanted) : chosen;
+  if (names.empty()) return managed(areAllWanted);
+  if (areAllWanted) return Failure{"either settings or --all are expected", "", "both are given"};
+  return settingsMeantBy(names);
 }
 
 bool isWholly(const SettingState& state) {

@@ -51,7 +51,7 @@ std::vector<RecordedChange> merged(std::span<const RecordedChange> changes) {
       merged.push_back(change);
     } else {
       known->after = change.after;
-      known->isEnded = change.isEnded;
+      known->isAfterKnown = change.isAfterKnown;
     }
   }
   return merged;
@@ -81,12 +81,13 @@ std::string whyNoWordGives(const ManagedSetting& setting, const std::string& val
 /// The same of the value from before.
 std::string whyNotSet(const ManagedSetting& setting, const RecordedChange& change, const std::string& unit) {
   if (change.before) return whyNoWordGives(setting, *change.before, unit);
-  return change.isEnded ? "there was no value before, or it is not known"
+  if (change.isBeforeKnown) return "there was no value before";
+  return change.isEnded ? "what it was before is not known"
                         : "a run that was ended in the middle did not tell what it was before";
 }
 
 bool hadNone(const RecordedChange& change) {
-  return change.isEnded && change.before.value_or("").empty();
+  return change.isBeforeKnown && change.before.value_or("").empty();
 }
 
 /// With what was read of it now.
@@ -100,24 +101,27 @@ PlannedUndo planned(const RecordedChange& change, const SettingState* state) {
 }
 
 /// Also after a restart, as far as anybody knows.
-bool isThere(const PlannedUndo& planned, const SettingValue& read) {
-  const auto value = asSet(read);
-  return planned.now == planned.back && (!value.live || !value.stored || value.live == value.stored);
+bool isThere(const PlannedUndo& planned, const SettingState& state) {
+  const auto value = asSet(state.value);
+  return state.failures.empty() && planned.now == planned.back &&
+         (!value.live || !value.stored || value.live == value.stored);
 }
 
 /// A disk may be told with what it starts, and by what, behind it.
-bool isSameTo(std::string_view setting, const std::optional<std::string>& now, const std::string& left) {
+bool isSameTo(std::string_view setting, const std::optional<std::string>& now, const std::optional<std::string>& left) {
+  if (!left) return now.value_or("").empty();
   if (setting != setting::startupDisk || !now) return now == left;
-  return now->substr(0, now->find(' ')) == left.substr(0, left.find(' '));
+  return now->substr(0, now->find(' ')) == left->substr(0, left->find(' '));
 }
 
 /// Why nobody but tavisk is known to have changed it; empty when that is known.
 std::string whyOthers(const PlannedUndo& planned, const RecordedChange& change, const SettingState& state) {
   if (!planned.now && !state.failures.empty())
     return "what it is now is not known: " + describe(state.failures.front());
-  const bool isTold = change.isEnded && change.after;
-  if (!isTold || isSameTo(planned.setting, planned.now, *change.after)) return "";
-  return "tavisk had left it at \"" + *change.after + "\": somebody else has changed it since, see --force";
+  const bool isTold = change.isAfterKnown;
+  if (!isTold || isSameTo(planned.setting, planned.now, change.after)) return "";
+  const auto left = change.after ? "at \"" + *change.after + "\"" : "without a value";
+  return "tavisk had left it " + left + ": somebody else has changed it since, see --force";
 }
 
 std::string whyLeft(const PlannedUndo& planned, const RecordedChange& change, const SettingState& state,
@@ -143,7 +147,7 @@ PlannedUndo planManaged(const ManagedSetting& setting, const RecordedChange& cha
   const auto whyNot = whyNotSet(setting, change, plan.unit);
   const bool isReset = !whyNot.empty() && hadNone(change) && !whyNeverOwn(change.setting);
   if (!whyNot.empty() && !isReset) return impossible(plan, whyNot);
-  if (isThere(plan, state.value)) {
+  if (isThere(plan, state)) {
     plan.step = UndoStep::there;
     return plan;
   }

@@ -58,6 +58,9 @@ std::optional<std::string> text(const Json& object, const char* name) {
   return found->get<std::string>();
 }
 
+/// A member of a line where what was there before could not be read.
+constexpr const char* beforeUnknown = "beforeUnknown";
+
 struct Line {
   RecordedChange change;
   bool hasChanged;
@@ -71,11 +74,14 @@ std::optional<Line> lineIn(const std::string& written) {
   const auto time = object.find("time");
   if (changed == object.end() || !changed->is_boolean()) return std::nullopt;
   if (time == object.end() || !time->is_number_integer()) return std::nullopt;
-  auto after = text(object, "live");
-  if (!after) after = text(object, "stored");
-  return Line{
-      {*text(object, "run"), time->get<std::int64_t>(), *text(object, "setting"), text(object, "before"), after},
-      changed->get<bool>()};
+  RecordedChange change{*text(object, "run"), time->get<std::int64_t>(), *text(object, "setting"), {}, {}};
+  change.before = text(object, "before");
+  change.after = text(object, "live");
+  if (!change.after) change.after = text(object, "stored");
+  const bool isDone = text(object, "outcome") == nameOf(Outcome::applied);
+  change.isBeforeKnown = change.before || (isDone && !object.contains(beforeUnknown));
+  change.isAfterKnown = change.after || isDone;
+  return Line{std::move(change), changed->get<bool>()};
 }
 
 }  // namespace
@@ -92,6 +98,7 @@ void EffectsLog::record(const Effect& effect) {
   JsonObject line;
   addMembers(line, effect);
   line.boolean("changed", effect.changed).text("run", _run).integer("time", std::time(nullptr));
+  if (effect.changed && !effect.isBeforeKnown) line.boolean(beforeUnknown, true);
   static_cast<void>(appendTo(_folder, path, line.str()));
 }
 

@@ -29,6 +29,7 @@ class Change {
     _live = lookAt(_steps.live, _effect.live);
     _stored = lookAt(_steps.stored, _effect.stored);
     _effect.before = _steps.live ? _effect.live : _effect.stored;
+    _effect.isBeforeKnown = _steps.live ? _live.has_value() : _stored.has_value() || !_steps.stored;
     const bool isThere = isRead() && (!_steps.live || isAsked(_live)) && (!_steps.stored || isAsked(_stored));
     _effect.outcome = isThere ? Outcome::unchanged : Outcome::applied;
     return _steps.always || _effect.outcome == Outcome::applied;

@@ -68,10 +68,15 @@ class Reset {
   void lookBefore() {
     const auto support = _steps.supported ? _steps.supported() : Support(std::nullopt);
     if (support && *support) _lack = (*support)->reason;
+    _effect.isBeforeKnown = !_lack;
     if (_lack) return;
-    _effect.live = lookAt(_steps.live);
-    _effect.stored = lookAt(_steps.stored);
-    _effect.before = _steps.live ? _effect.live : _effect.stored;
+    const auto live = lookAt(_steps.live);
+    const auto stored = lookAt(_steps.stored);
+    const auto& before = _steps.live ? live : stored;
+    _effect.live = live.valueOr(std::nullopt);
+    _effect.stored = stored.valueOr(std::nullopt);
+    _effect.before = before.valueOr(std::nullopt);
+    _effect.isBeforeKnown = static_cast<bool>(before);
   }
 
   void putIntoForce(bool isTakenAway, RunLoop& runLoop) {
@@ -105,13 +110,12 @@ class Reset {
     if (!_effect.failure) _effect.failure = failure;
   }
 
-  static std::optional<std::string> lookAt(const ResetSteps::Look& look) {
-    auto seen = look ? look() : Result<std::optional<std::string>>(std::nullopt);
-    return seen ? std::move(seen).value() : std::nullopt;
+  static Result<std::optional<std::string>> lookAt(const ResetSteps::Look& look) {
+    return look ? look() : Result<std::optional<std::string>>(std::nullopt);
   }
 
   std::optional<std::string> lookAgain(const ResetSteps::Look& look) {
-    auto seen = look ? look() : Result<std::optional<std::string>>(std::nullopt);
+    auto seen = lookAt(look);
     if (!seen) fail(seen.failure());
     return seen ? std::move(seen).value() : std::nullopt;
   }

@@ -8,6 +8,7 @@
 #include <utility>
 
 #include "base/Text.h"
+#include "effects/Effect.h"
 #include "hosts/linux/access/LinuxAuthorization.h"
 #include "hosts/linux/system/Journal.h"
 #include "hosts/linux/system/JournalReader.h"
@@ -36,6 +37,19 @@ bool hasChanged(const FoundJournalEntry& entry) {
   return changed ? *changed == "yes" : entry.field(journalfield::before) != entry.field(journalfield::after);
 }
 
+/// Without a value there was none where the change has come to its end, and all of it was read and fits in.
+RecordedChange changeIn(const FoundJournalEntry& entry, const std::string& run, const std::string& setting) {
+  const auto outcome = entry.field(journalfield::outcome);
+  const bool isDone = outcome == nameOf(Outcome::applied);
+  RecordedChange change{run, entry.time(), setting, {}, {}, outcome != outcomeOfBeginning};
+  change.before = valueIn(entry, journalfield::before);
+  change.after = valueIn(entry, journalfield::after);
+  const bool isNone = isDone && !entry.field(journalfield::before) && !entry.field(journalfield::beforeUnknown);
+  change.isBeforeKnown = change.before || isNone;
+  change.isAfterKnown = change.after || (isDone && !entry.field(journalfield::after));
+  return change;
+}
+
 std::string unknownUser(const std::string& user, const std::string& why) {
   return "left out are changes by user " + user + ", as it is not known who that is: " + why;
 }
@@ -56,9 +70,7 @@ class Changes {
     if (!isByAdministrator(entry, begins || hasChanged(entry))) return;
     const auto run = runOf(entry);
     if (!begins) end(run, *setting);
-    if (begins || hasChanged(entry))
-      _changes.push_back({run, entry.time(), *setting, valueIn(entry, journalfield::before),
-                          valueIn(entry, journalfield::after), !begins});
+    if (begins || hasChanged(entry)) _changes.push_back(changeIn(entry, run, *setting));
   }
 
   RecordedChanges found(const JournalState& state) && {

@@ -37,7 +37,10 @@ Facts sourceFacts(const Result<TimeSource>& source) {
   if (!source) return {{"source", notKnown(source.failure())}};
   if (source->server.empty()) return {};
   Facts facts{{"source", source->server}};
-  if (source->ahead) facts.emplace_back("milliseconds ahead of the source", inMilliseconds(*source->ahead));
+  constexpr const char* aheadOf = "milliseconds ahead of the source";
+  const auto& ahead = source->ahead;
+  if (!ahead) facts.emplace_back(aheadOf, notKnown(ahead.failure()));
+  if (ahead && *ahead) facts.emplace_back(aheadOf, inMilliseconds(**ahead));
   return facts;
 }
 

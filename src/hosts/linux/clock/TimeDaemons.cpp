@@ -205,6 +205,7 @@ Result<bool> tellsItsServers(const TimeDaemon& daemon, const LinuxMachine& machi
 }
 
 using Fields = std::vector<std::string>;
+using Ahead = Result<std::optional<std::chrono::microseconds>>;
 
 /// The printed lines that tell a server.
 Result<std::vector<Fields>> printedSources(const TimeDaemon& daemon, const LinuxMachine& machine) {
@@ -265,6 +266,14 @@ Result<bool> hasStartedSince(const TimeDaemon& daemon, const LinuxMachine& machi
   return !written || written->changed < started->modified;
 }
 
+Ahead lastAhead(const TimeDaemon& daemon, const LinuxMachine& machine) {
+  const auto bus = machine.services.systemBus();
+  if (!bus) return bus.failure();
+  auto exchange = (*bus)->property(timeSyncManager(daemon.busService), "NTPMessage", exchangeSignature);
+  if (!exchange) return exchange.failure();
+  return aheadAt(std::move(exchange).value());
+}
+
 }  // namespace
 
 std::span<const TimeDaemon> timeDaemons() {
@@ -300,11 +309,7 @@ Result<TimeSource> sourceInUse(const TimeDaemon& daemon, const LinuxMachine& mac
   auto server = serverInUse(daemon, machine);
   if (!server) return server.failure();
   if (server->empty()) return TimeSource();
-  const auto bus = machine.services.systemBus();
-  if (!bus) return bus.failure();
-  auto exchange = (*bus)->property(timeSyncManager(daemon.busService), "NTPMessage", exchangeSignature);
-  if (!exchange) return exchange.failure();
-  return TimeSource{std::move(server).value(), aheadAt(std::move(exchange).value())};
+  return TimeSource{std::move(server).value(), lastAhead(daemon, machine)};
 }
 
 }  // namespace tavisk

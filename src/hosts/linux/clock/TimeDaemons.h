@@ -54,8 +54,9 @@ Result<std::string> serverInUse(const TimeDaemon& daemon, const LinuxMachine& ma
 
 /// Where a running daemon has the time from.
 struct TimeSource {
-  std::string server;                              ///< as serverInUse() tells it
-  std::optional<std::chrono::microseconds> ahead;  ///< what the clock was at its last answer; absent: nobody tells
+  std::string server;  ///< as serverInUse() tells it
+  /// What the clock was at its last answer; absent: nobody tells.
+  Result<std::optional<std::chrono::microseconds>> ahead = std::optional<std::chrono::microseconds>();
 };
 Result<TimeSource> sourceInUse(const TimeDaemon& daemon, const LinuxMachine& machine);
 

@@ -96,6 +96,7 @@ Fields fieldsOf(const Effect& effect) {
   add(journalfield::outcome, nameOf(effect.outcome));
   add(journalfield::changed, effect.changed ? "yes" : "no");
   addValue(journalfield::before, effect.before);
+  if (!effect.isBeforeKnown) add(journalfield::beforeUnknown, "yes");
   addValue("TAVISK_ASKED", effect.asked);
   addValue(journalfield::after, effect.live ? effect.live : effect.stored);
   addValue("TAVISK_STORED", effect.stored);

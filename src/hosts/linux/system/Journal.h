@@ -26,6 +26,7 @@ inline constexpr const char* outcome = "TAVISK_OUTCOME";
 inline constexpr const char* changed = "TAVISK_CHANGED";  ///< "yes" or "no"
 inline constexpr const char* before = "TAVISK_OLD";
 inline constexpr const char* after = "TAVISK_NEW";
+inline constexpr const char* beforeUnknown = "TAVISK_OLD_UNKNOWN";  ///< "yes": it could not be read
 }  // namespace journalfield
 /// In place of an outcome.
 inline constexpr const char* outcomeOfBeginning = "begins";

@@ -50,15 +50,16 @@ class JournalTree : public LinuxTree {
     EXPECT_TRUE(runTool((std::string(maker) + " -o ").append(at(file)).append(" ").append(at("/entries"))));
   }
 
-  /// "TIME SETTING: BEFORE > AFTER" of each.
+  /// "TIME SETTING: BEFORE > AFTER" of each; "?" is not known, "-" was none.
   std::vector<std::string> changes(std::vector<std::string>& remarks) const {
     const auto found = LinuxChangeHistory(root).changes();
     if (!found) return {describe(found.failure())};
     remarks = found->remarks;
     std::vector<std::string> lines;
     for (const auto& change : found->changes)
-      lines.push_back(std::to_string(change.time) + " " + change.setting + ": " + change.before.value_or("?") + " > " +
-                      change.after.value_or("?") + (change.isEnded ? "" : " ..."));
+      lines.push_back(std::to_string(change.time) + " " + change.setting + ": " +
+                      change.before.value_or(change.isBeforeKnown ? "-" : "?") + " > " +
+                      change.after.value_or(change.isAfterKnown ? "-" : "?") + (change.isEnded ? "" : " ..."));
     return lines;
   }
 
@@ -77,6 +78,14 @@ TEST(LinuxChangeHistory, IsWhatTheJournalKnowsOfAdministratorsAlone) {
   tree.add({{"TAVISK_SETTING", "Remote Login"}, {"TAVISK_OUTCOME", "failed"}, {"TAVISK_CHANGED", "no"}});
   tree.add({{"TAVISK_SETTING", "Computer Name"}, {"TAVISK_OLD", R"(a\nb\\)"}, {"TAVISK_NEW", ""}});
   tree.add({{"TAVISK_SETTING", "Computer Name"}, {"TAVISK_OLD", std::string(longestJournalField, 'x')}});
+  const JournalTree::Fields done = {
+      {"TAVISK_OUTCOME", "applied"}, {"TAVISK_CHANGED", "yes"}, {"TAVISK_SETTING", "Lock"}};
+  tree.add(done);
+  for (const auto& field : {std::pair("TAVISK_OLD_UNKNOWN", "yes"), {"TAVISK_OUTCOME", "failed"}}) {
+    auto fields = done;
+    fields.insert_or_assign(field.first, field.second);
+    tree.add(fields);
+  }
   const auto forged = [](const char* field, const char* value) {
     return JournalTree::Fields{{"TAVISK_SETTING", "Remote Login"}, {"TAVISK_OLD", "on"}, {field, value}};
   };
@@ -88,7 +97,8 @@ TEST(LinuxChangeHistory, IsWhatTheJournalKnowsOfAdministratorsAlone) {
   std::vector<std::string> remarks;
   EXPECT_THAT(tree.changes(remarks),
               ElementsAre("2 Time Zone: UTC > Etc/UTC", "3 Display Sleep: ? > ? ...", "4 Display Sleep: 1 > 2",
-                          "6 Computer Name: a\nb\\ > ", "7 Computer Name: ? > ?"));
+                          "6 Computer Name: a\nb\\ > ", "7 Computer Name: ? > -", "8 Lock: - > -", "9 Lock: ? > -",
+                          "10 Lock: ? > ?"));
   EXPECT_THAT(remarks, ElementsAre("left out are changes in tavisk's name by users who are no administrators: "
                                    "4242, nobody"));
 }
