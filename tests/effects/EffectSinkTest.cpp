@@ -29,7 +29,8 @@ TEST(EffectSink, closesOnlyOpenChangesWhenInterrupted) {
                   .asked = "x",
                   .note = "it may be made, or a part of it",
                   .failure = Failure{"change", name, "ended by SIGINT"},
-                  .changed = true};
+                  .changed = true,
+                  .isBeforeKnown = false};
   };
   EXPECT_THAT(log.effects, ElementsAre(ended("B"), ended("A")));
 
