@@ -21,18 +21,22 @@ namespace {
 
 using control::Status;
 
-std::atomic<std::size_t> shownProgress = 0;
+/// How long the line is that shows progress; 0: there is none.
+std::atomic<std::size_t>& widthOfProgress() {
+  static std::atomic<std::size_t> width = 0;
+  return width;
+}
 
 /// Over the line that stands there, without a newline. Also a terminal that knows no commands goes back to its margin.
 void showProgress(std::string_view text) {
-  const auto width = shownProgress.exchange(text.size());
+  const auto width = widthOfProgress().exchange(text.size());
   const auto rest = static_cast<int>(std::max(width, text.size()) - text.size());
   static_cast<void>(std::fprintf(stderr, "\r%.*s%*s%s", static_cast<int>(text.size()), text.data(), rest, "",
                                  text.empty() ? "\r" : ""));
 }
 
 void complainOfControl(std::string_view text) {
-  if (shownProgress != 0) showProgress("");
+  if (widthOfProgress() != 0) showProgress("");
   static_cast<void>(std::fprintf(stderr, "taviskctl: %.*s\n", static_cast<int>(text.size()), text.data()));
 }
 

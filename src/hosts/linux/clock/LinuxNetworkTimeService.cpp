@@ -103,7 +103,7 @@ Setting<bool> LinuxNetworkTimeService::runningSetting() {
 
 bool LinuxNetworkTimeService::isRunning() {
   const auto found = client();
-  const auto running = runs(found);
+  auto running = runs(found);
   auto setting = runningSetting();
   setting.live = [&] { return running; };
   setting.stored = [&] { return startsAtBoot(found); };
