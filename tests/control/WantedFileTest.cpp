@@ -46,7 +46,7 @@ TEST(WantedFile, IsReadInItsOrderOrRefusedWithTheReason) {
       {"[]", "an object of settings"},
       {"{\n\"timezone\" \"a\"}", "at line 2, column 14: "},
       {"{\"timezone\": \"\xff\"}", "invalid string: ill-formed UTF-8"},
-      {"", "input"},
+      {"", "at line 1, column 1: "},
   };
   for (const auto& [text, told] : files) EXPECT_THAT(read(text), HasSubstr(told)) << text;
   for (const auto* text :
