@@ -15,7 +15,7 @@ constexpr ManagedSetting settings[] = {
     {setting::time, "-gettime", "-settime", ValueKind::moment},
     {setting::timeZone, "-gettimezone", "-settimezone", ValueKind::text},
     {setting::networkTime, "-getusingnetworktime", "-setusingnetworktime", ValueKind::onOff},
-    {setting::networkTimeServer, "-getnetworktimeserver", "-setnetworktimeserver", ValueKind::text},
+    {setting::networkTimeServer, "-getnetworktimeserver", "-setnetworktimeserver", ValueKind::text, false, true},
     {setting::computerSleep, "-getcomputersleep", "-setcomputersleep", ValueKind::minutes},
     {setting::displaySleep, "-getdisplaysleep", "-setdisplaysleep", ValueKind::minutes},
     {setting::hardDiskSleep, "-getharddisksleep", "-setharddisksleep", ValueKind::minutes},

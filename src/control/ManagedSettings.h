@@ -30,6 +30,9 @@ struct ManagedSetting {
   ValueKind kind;
   /// Its getter looks at every disk, which takes seconds: only when it is asked for.
   bool isSearched = false;
+  /// What it is set to is what is stored: what status tells as in force may be something else meanwhile, such as the
+  /// time server that answers while the one that is set does not.
+  bool isWhatIsStored = false;
 };
 
 /// Every setting, in the order in which they are shown.

@@ -9,7 +9,6 @@
 
 #include "base/Calendar.h"
 #include "base/Text.h"
-#include "effects/SettingNames.h"
 
 namespace tavisk::control {
 namespace {
@@ -199,7 +198,8 @@ Result<std::string> valueMeantBy(const ManagedSetting& setting, const WrittenVal
 }
 
 SettingValue asSet(SettingValue value) {
-  if (value.setting == setting::networkTimeServer) value.live.reset();
+  const auto* setting = managedNamed(value.setting);
+  if (setting && setting->isWhatIsStored) value.live.reset();
   return value;
 }
 

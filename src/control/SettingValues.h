@@ -24,8 +24,7 @@ using WrittenValue = std::variant<bool, std::int64_t, std::string>;
 Result<std::string> valueMeantBy(const ManagedSetting& setting, const WrittenValue& written,
                                  const std::string& unit = "");
 
-/// What was read of a setting as far as it is what the setting was set to. The time server has nothing in force: a
-/// client may go by another one while that which it is told does not answer.
+/// What was read of a setting as far as it is what the setting was set to; see ManagedSetting::isWhatIsStored.
 SettingValue asSet(SettingValue value);
 
 /// Whether both texts are one value of the setting. Of moments those are that lie at most two seconds apart, as they

@@ -13,7 +13,6 @@
 
 #include "base/FileDescriptor.h"
 #include "control/SettingValues.h"
-#include "effects/SettingNames.h"
 
 namespace tavisk::control {
 namespace {
@@ -90,7 +89,7 @@ const Json* valueIn(const ManagedSetting& setting, const Json& member) {
   if (!member.is_object()) return &member;
   const auto* live = memberOf(member, "live");
   const auto* stored = memberOf(member, "stored");
-  if (setting.name == setting::networkTimeServer) return stored;
+  if (setting.isWhatIsStored) return stored;
   return live && !(stored && isNameWithin(*live, *stored)) ? live : stored;
 }
 

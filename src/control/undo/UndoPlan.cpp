@@ -94,15 +94,14 @@ bool hadNone(const RecordedChange& change) {
 PlannedUndo planned(const RecordedChange& change, const SettingState* state) {
   PlannedUndo planned{.setting = change.setting, .back = change.before};
   if (!state) return planned;
-  const auto value = asSet(state->value);
-  planned.now = value.live ? value.live : value.stored;
-  planned.unit = value.unit;
+  planned.now = state->value.live ? state->value.live : state->value.stored;
+  planned.unit = state->value.unit;
   return planned;
 }
 
 /// Also after a restart, as far as anybody knows.
 bool isThere(const PlannedUndo& planned, const SettingState& state) {
-  const auto value = asSet(state.value);
+  const auto& value = state.value;
   return state.failures.empty() && planned.now == planned.back &&
          (!value.live || !value.stored || value.live == value.stored);
 }
@@ -140,7 +139,8 @@ bool isDefaultName(const PlannedUndo& planned, std::span<const SettingState> sta
 
 PlannedUndo planManaged(const ManagedSetting& setting, const RecordedChange& change,
                         std::span<const SettingState> states, UndoConsent consent) {
-  const auto& state = *stateOf(states, setting.name);
+  auto state = *stateOf(states, setting.name);
+  state.value = asSet(std::move(state.value));
   auto plan = planned(change, &state);
   if (isDefaultName(plan, states)) plan.now = "";
   if (state.value.unsupported) return impossible(plan, "not supported: " + describe(*state.value.unsupported));
